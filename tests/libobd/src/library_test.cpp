@@ -1,0 +1,48 @@
+#include <common/logrecord.h>
+#include <gtest/gtest.h>
+#include <obd/library.h>
+
+#include <filesystem>
+#include <fstream>
+#include <unistd.h>
+
+namespace {
+
+std::filesystem::path logPath()
+{
+    return std::filesystem::temp_directory_path() / ("velmora-library-" + std::to_string(::getpid()));
+}
+
+std::string content(std::filesystem::path const& path)
+{
+    std::ifstream in(path);
+    return {std::istreambuf_iterator<char>(in), {}};
+}
+
+TEST(Library, OpenAndCloseAreLoggedAndLaterLinesAreDropped)
+{
+    EXPECT_TRUE(obd::LIBOBDOpen(logPath()));
+    EXPECT_TRUE(content(logPath()).ends_with(" INFO - Lib OBD init\n"));
+    obd::LIBOBDClose();
+    EXPECT_TRUE(content(logPath()).ends_with(" INFO - Lib OBD cleanup done\n"));
+    TERVEX_LOG(Info) << "after the end";
+    EXPECT_EQ(content(logPath()).find("after the end"), std::string::npos);
+    std::filesystem::remove(logPath());
+}
+
+TEST(Library, OpenSucceedsWithoutALog)
+{
+    EXPECT_TRUE(obd::LIBOBDOpen(""));
+    EXPECT_NO_THROW(TERVEX_LOG(Fatal) << "lost");
+    obd::LIBOBDClose();
+}
+
+TEST(Library, OpenSucceedsThoughTheFolderDoesNotExist)
+{
+    std::filesystem::path const missing = logPath() / "no" / "log.txt";
+    EXPECT_TRUE(obd::LIBOBDOpen(missing));
+    EXPECT_FALSE(std::filesystem::exists(missing));
+    obd::LIBOBDClose();
+}
+
+} // namespace
