@@ -1,0 +1,18 @@
+#pragma once
+
+#include <obd/obdprotocol.h>
+
+namespace obd {
+
+inline bool isCan(ObdProtocol protocol)
+{
+    return protocol == ObdProtocolCan11 || protocol == ObdProtocolCan29;
+}
+
+// The buses before CAN, whose frames hold at most 7 data bytes.
+inline bool isLegacy(ObdProtocol protocol)
+{
+    return protocol == ObdProtocolIso9141 || protocol == ObdProtocolIso14230 || protocol == ObdProtocolJ1850;
+}
+
+} // namespace obd
