@@ -1,0 +1,36 @@
+# Sourced by the other scripts: tells what is done, and installs what a fresh Debian 12 lacks.
+
+cd "$(dirname "${BASH_SOURCE[0]}")/.."
+
+say() { printf '\n== %s\n' "$*"; }
+
+as_root() {
+    if [[ $EUID -eq 0 ]]; then "$@"; else sudo "$@"; fi
+}
+
+# need PACKAGE...: installs the Debian packages that are not there yet.
+need() {
+    local missing=() package
+    for package in "$@"; do
+        dpkg-query -W -f='${Status}' "$package" 2>/dev/null | grep -q 'ok installed' || missing+=("$package")
+    done
+    [[ ${#missing[@]} -gt 0 ]] || return 0
+    say "Installing Debian packages: ${missing[*]}"
+    as_root apt-get update -qq
+    as_root env DEBIAN_FRONTEND=noninteractive apt-get install -y -qq --no-install-recommends "${missing[@]}"
+}
+
+build_packages=(g++ cmake ninja-build libasio-dev libcli11-dev nlohmann-json3-dev libfmt-dev libtomlplusplus-dev)
+test_packages=(libgtest-dev libgmock-dev libbenchmark-dev clang libclang-rt-14-dev clang-format clang-tidy)
+
+# build PRESET [TARGET...]: configures and builds.
+build() {
+    local preset=$1
+    shift
+    cmake --preset "$preset" >/dev/null
+    if [[ $# -gt 0 ]]; then
+        cmake --build --preset "$preset" --target "$@"
+    else
+        cmake --build --preset "$preset"
+    fi
+}
