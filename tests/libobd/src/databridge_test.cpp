@@ -296,8 +296,9 @@ TEST_F(DataBridge, TapsComeAndGoWhileTrafficFlows)
         void onDataReceived(Bytes const& /*data*/) override { ++taken; }
     };
     std::atomic<bool> running{true};
+    // Goes on until the last request is answered, so that nobody waits in vain.
     std::thread port([&] {
-        while (running) {
+        while (m_bridge.isValid()) {
             Bytes out;
             if (m_bridge.get(out)) {
                 out.push_back('>');
@@ -324,6 +325,7 @@ TEST_F(DataBridge, TapsComeAndGoWhileTrafficFlows)
     }
     running = false;
     library.join();
+    m_bridge.invalidate();
     port.join();
     EXPECT_GT(exchanges, 0);
     EXPECT_GT(seen, 0);
