@@ -326,6 +326,7 @@ TEST_F(DataBridge, TapsComeAndGoWhileTrafficFlows)
     running = false;
     library.join();
     m_bridge.invalidate();
+    m_bridge.send(bytes("\r")); // wakes the port
     port.join();
     EXPECT_GT(exchanges, 0);
     EXPECT_GT(seen, 0);
