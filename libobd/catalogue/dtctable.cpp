@@ -1,0 +1,18 @@
+#include "libobd/catalogue/dtctable.h"
+
+#include "libobd/catalogue/packeddtcrow.h"
+
+namespace obd {
+
+std::size_t DtcTable::size() noexcept
+{
+    return packedDtcRowCount;
+}
+
+DtcRow DtcTable::row(std::size_t index) noexcept
+{
+    const PackedDtcRow& packed = packedDtcRows[index];
+    return {packed.maker, packed.code, dtcTextBlocks[packed.textBlock] + packed.textOffset};
+}
+
+} // namespace obd

@@ -1,0 +1,213 @@
+#include "libobd/catalogue/dtctable.h"
+
+#include "tools/catalogue/makers.h"
+
+#include <algorithm>
+#include <array>
+#include <fstream>
+#include <iterator>
+#include <map>
+#include <set>
+#include <sstream>
+#include <string_view>
+#include <utility>
+
+namespace {
+
+using obd::DtcRow;
+using obd::DtcTable;
+
+// How the rows of one maker or one prefix are counted in the manifest.
+struct Count
+{
+    std::size_t target = 0; // the full shape of the table
+    std::size_t rows = 0;   // whose meaning is known
+};
+
+// "kind<TAB>name<TAB>target<TAB>rows" by kind and name; lines that begin with '#' are remarks.
+std::map<std::pair<std::string, std::string>, Count> readManifest()
+{
+    std::map<std::pair<std::string, std::string>, Count> counts;
+    std::ifstream input(VELMORA_SOURCE_DIR "/tests/libobd/catalogue/manifest.txt");
+    for (std::string line; std::getline(input, line);) {
+        if (line.empty() || line.front() == '#') {
+            continue;
+        }
+        std::istringstream fields(line);
+        std::string kind;
+        std::string name;
+        std::getline(fields, kind, '\t');
+        std::getline(fields, name, '\t');
+        Count& count = counts[{kind, name}];
+        fields >> count.target >> count.rows;
+        EXPECT_FALSE(fields.fail()) << line;
+    }
+    return counts;
+}
+
+std::map<std::pair<std::string, std::string>, std::size_t> countRows()
+{
+    std::map<std::pair<std::string, std::string>, std::size_t> counts;
+    std::set<std::string_view> codes;
+    std::set<std::string_view> texts;
+    for (const DtcRow& row : DtcTable()) {
+        ++counts[{"maker", std::string(catalogue::makerName(static_cast<std::size_t>(row.maker)))}];
+        ++counts[{row.maker == 0 ? "generic" : "makers", std::string(row.code, 2)}];
+        codes.insert(row.code);
+        texts.insert(row.text);
+    }
+    counts[{"all", "rows"}] = DtcTable::size();
+    counts[{"all", "codes"}] = codes.size();
+    counts[{"all", "texts"}] = texts.size();
+    return counts;
+}
+
+// The texts of one maker's code, in table order.
+std::vector<std::string> textsOf(std::string_view maker, std::string_view code)
+{
+    std::vector<std::string> texts;
+    for (const DtcRow& row : DtcTable()) {
+        if (catalogue::makerName(static_cast<std::size_t>(row.maker)) == maker && row.code == code) {
+            texts.emplace_back(row.text);
+        }
+    }
+    return texts;
+}
+
+bool isWellFormed(std::string_view code)
+{
+    return code.size() == 5 && std::string_view("PBCU").find(code[0]) != std::string_view::npos &&
+           code.find_first_not_of("0123456789ABCDEF", 1) == std::string_view::npos;
+}
+
+TEST(DtcTable, CountsAreThoseOfTheManifest)
+{
+    const auto manifest = readManifest();
+    auto counted = countRows();
+    ASSERT_FALSE(manifest.empty());
+    for (const auto& [key, count] : manifest) {
+        EXPECT_EQ(counted[key], count.rows) << key.first << ' ' << key.second;
+        counted.erase(key);
+    }
+    for (const auto& [key, rows] : counted) {
+        ADD_FAILURE() << key.first << ' ' << key.second << " has " << rows << " rows and no line in the manifest";
+    }
+}
+
+TEST(DtcTable, ManifestNamesEveryMaker)
+{
+    const auto manifest = readManifest();
+    for (std::size_t maker = 0; maker < catalogue::makerCount(); ++maker) {
+        EXPECT_EQ(manifest.count({"maker", std::string(catalogue::makerName(maker))}), 1U)
+            << catalogue::makerName(maker);
+    }
+}
+
+TEST(DtcTable, ShapeIsTheWholeOfEighteenThousandRows)
+{
+    std::size_t target = 0;
+    for (const auto& [key, count] : readManifest()) {
+        target += key.first == "maker" ? count.target : 0;
+    }
+    EXPECT_EQ(target, 18201U);
+}
+
+TEST(DtcTable, MakersRiseAndCodesRiseWithin)
+{
+    DtcRow previous = DtcTable::row(0);
+    for (const DtcRow& row : DtcTable()) {
+        ASSERT_LE(previous.maker, row.maker);
+        if (previous.maker == row.maker) {
+            ASSERT_LE(std::string_view(previous.code), std::string_view(row.code));
+        }
+        previous = row;
+    }
+}
+
+TEST(DtcTable, GenericCodesStandOnce)
+{
+    std::set<std::string_view> codes;
+    for (const DtcRow& row : DtcTable()) {
+        if (row.maker == 0) {
+            EXPECT_TRUE(codes.insert(row.code).second) << row.code;
+        }
+    }
+}
+
+TEST(DtcTable, TextsArePrintableAndOfTheRightLength)
+{
+    for (const DtcRow& row : DtcTable()) {
+        const std::string_view text = row.text;
+        EXPECT_TRUE(!text.empty() && text.size() <= 140) << row.code;
+        EXPECT_TRUE(std::all_of(text.begin(), text.end(), [](char c) { return c >= ' ' && c <= '~'; })) << text;
+        EXPECT_EQ(text.find_first_of("()[]{}#\""), std::string_view::npos) << row.code << ' ' << text;
+        EXPECT_EQ(text.find("  "), std::string_view::npos) << text;
+        EXPECT_TRUE(text.front() != ' ' && text.back() != ' ') << text;
+    }
+}
+
+TEST(DtcTable, EachTextIsStoredOnce)
+{
+    std::map<std::string_view, const char*> places;
+    for (const DtcRow& row : DtcTable()) {
+        const auto place = places.emplace(row.text, row.text).first->second;
+        EXPECT_EQ(place, row.text) << row.text;
+    }
+}
+
+TEST(DtcTable, GenericSamplesWordForWord)
+{
+    const std::pair<const char*, const char*> samples[] = {
+        {"B0001", "Driver Frontal Stage 1 Deployment Control"},
+        {"C0035", "Right Front Wheel Speed Sensor Supply"},
+        {"P0105", "Manifold Absolute Pressure/Barometric Pressure Sensor Circuit"},
+        {"P0300", "Random/Multiple Cylinder Misfire Detected"},
+        {"P0420", "Catalyst System Efficiency Below Threshold Bank 1"},
+        {"P0A0F", "Engine Failed to Start"},
+        {"U0101", "Lost Communication with TCM"},
+        {"U350C", "Control Module Cooling Fan Circuit/Open"},
+    };
+    for (const auto& [code, text] : samples) {
+        EXPECT_EQ(textsOf("Generic", code), std::vector<std::string>{text});
+    }
+}
+
+TEST(DtcTable, MakersSamplesWordForWord)
+{
+    const std::array<const char*, 3> samples[] = {
+        {"Buick", "P1300]", "Ignitor Circuit"},
+        {"Chrysler", "P1000", "Cooling System Heat Valve Control Circuit"},
+        {"Dodge", "P1000", "Cooling System Heat Valve Control Circuit"},
+        {"Ford", "P1000", "OBD-II Monitor Testing Incomplete"},
+        {"Jaguar", "P1000", "OBD Systems Readiness Test Not Complete"},
+        {"Jeep", "P1000", "Cooling System Heat Valve Control Circuit"},
+        {"Land Rover", "P1000", "Engine Control Module Memory Erased"},
+        {"Land Rover", "P15O9", "Idle Speed Control Short Circuit Fault"},
+        {"Volvo", "P1770", "CMP Sensor Intake/Exhaust Signal Error"},
+    };
+    for (const auto& [maker, code, text] : samples) {
+        EXPECT_EQ(textsOf(maker, code), std::vector<std::string>{text}) << maker << ' ' << code;
+    }
+}
+
+TEST(DtcTable, AllCodesButTwoAreWellFormed)
+{
+    std::set<std::string> malformed;
+    for (const DtcRow& row : DtcTable()) {
+        if (!isWellFormed(row.code)) {
+            malformed.emplace(row.code);
+        }
+    }
+    EXPECT_EQ(malformed, (std::set<std::string>{"P1300]", "P15O9"}));
+}
+
+TEST(DtcTable, IteratorWalksAllRows)
+{
+    const DtcTable table;
+    EXPECT_EQ(static_cast<std::size_t>(std::distance(table.begin(), table.end())), DtcTable::size());
+    auto second = table.begin();
+    EXPECT_EQ((*second++).code, DtcTable::row(0).code);
+    EXPECT_EQ((*second).code, DtcTable::row(1).code);
+}
+
+} // namespace
