@@ -1,0 +1,81 @@
+#include "libobd/powertrain/readinessmonitors.h"
+#include "tests/support/fakeecu.h"
+#include "tests/support/tablefile.h"
+
+#include <gtest/gtest.h>
+
+namespace {
+
+using namespace obd;
+using Bytes = std::vector<unsigned char>;
+using Model = ReadinessMonitorDataModel;
+
+std::shared_ptr<IEcu> const engine = std::make_shared<support::FakeEcu>(0x7E8);
+
+TEST(ReadinessMonitors, TableAgreesRowByRow)
+{
+    auto const rows = support::readTable("tests/libobd/powertrain/readinessmonitors.txt");
+    ASSERT_EQ(rows.size(), MonitorStatus::TEST_INFO_ARRAY_SIZE);
+    ASSERT_EQ(rows.size(), MonitorStatusThisCycle::TEST_INFO_ARRAY_SIZE);
+    for (std::size_t i = 0; i < rows.size(); ++i) {
+        MonitorTestInfo const& info = MonitorStatus::TEST_INFO_ARRAY[i];
+        EXPECT_EQ(rows[i],
+                  (std::vector<std::string>{std::to_string(info.test), std::to_string(info.availableBit),
+                                            std::to_string(info.completeBit), readinessMonitorText(info.test)}));
+    }
+}
+
+TEST(ReadinessMonitors, NumbersOutsideTheTableReadNa)
+{
+    EXPECT_EQ(readinessMonitorText(static_cast<ReadinessMonitorTest>(18)), "NA");
+    EXPECT_EQ(readinessMonitorText(static_cast<ReadinessMonitorTest>(-1)), "NA");
+}
+
+TEST(ReadinessMonitors, ListFollowsTheIgnitionType)
+{
+    using Tests = std::vector<ReadinessMonitorTest>;
+    EXPECT_EQ(readinessMonitorTests(IgnitionType::Spark),
+              (Tests{ReadinessMisfire, ReadinessFuelSystem, ReadinessComprehensiveComponent, ReadinessCatalyst,
+                     ReadinessHeatedCatalyst, ReadinessEvaporativeSystem, ReadinessSecondaryAirSystem,
+                     ReadinessGasolineParticulateFilter, ReadinessOxygenSensor, ReadinessOxygenSensorHeater,
+                     ReadinessEgrVvtSystem}));
+    EXPECT_EQ(readinessMonitorTests(IgnitionType::Compression),
+              (Tests{ReadinessMisfire, ReadinessFuelSystem, ReadinessComprehensiveComponent, ReadinessNmhcCatalyst,
+                     ReadinessNoxAftertreatment, ReadinessBoostPressure, ReadinessExhaustGasSensor, ReadinessPmFilter,
+                     ReadinessEgrVvtSystemCompression}));
+}
+
+TEST(ReadinessMonitors, StatusSinceCleared)
+{
+    MonitorStatus status;
+    ASSERT_TRUE(status.setResponseData(engine, Bytes{0x41, 0x01, 0x81, 0x07, 0x65, 0x04}));
+    EXPECT_EQ(readinessSinceCleared(*engine, status, ReadinessMisfire), Model::Complete);
+    EXPECT_EQ(readinessSinceCleared(*engine, status, ReadinessEvaporativeSystem), Model::NotComplete);
+    EXPECT_EQ(readinessSinceCleared(*engine, status, ReadinessHeatedCatalyst), Model::NotAvailable);
+}
+
+TEST(ReadinessMonitors, StatusThisCycle)
+{
+    MonitorStatus status;
+    MonitorStatusThisCycle thisCycle;
+    ASSERT_TRUE(status.setResponseData(engine, Bytes{0x41, 0x01, 0x00, 0x07, 0x07, 0x07}));
+    ASSERT_TRUE(thisCycle.setResponseData(engine, Bytes{0x41, 0x41, 0x00, 0x07, 0x0B, 0x02}));
+    EXPECT_EQ(readinessThisCycle(*engine, status, thisCycle, ReadinessCatalyst), Model::Complete);
+    EXPECT_EQ(readinessThisCycle(*engine, status, thisCycle, ReadinessHeatedCatalyst), Model::NotComplete);
+    EXPECT_EQ(readinessThisCycle(*engine, status, thisCycle, ReadinessEvaporativeSystem), Model::DisabledThisCycle);
+    // Enabled in the cycle's word, but the vehicle says that it has no such monitor.
+    EXPECT_EQ(readinessThisCycle(*engine, status, thisCycle, ReadinessSecondaryAirSystem), Model::NotAvailable);
+}
+
+TEST(ReadinessMonitors, StatusNumbersStandFirm)
+{
+    EXPECT_EQ(Model::Complete, 0);
+    EXPECT_EQ(Model::NotComplete, 1);
+    EXPECT_EQ(Model::DisabledThisCycle, 2);
+    EXPECT_EQ(Model::NotAvailable, 3);
+    Model const model("Catalyst", Model::DisabledThisCycle);
+    EXPECT_EQ(model.description, "Catalyst");
+    EXPECT_EQ(model.status, 2);
+}
+
+} // namespace
