@@ -1,5 +1,6 @@
 #pragma once
 
+#include <obd/ignitiontype.h>
 #include <obd/obdmode.h>
 #include <obd/obdprotocol.h>
 #include <obd/oxygensensorlocation.h>
@@ -8,12 +9,6 @@
 #include <vector>
 
 namespace obd {
-
-enum class IgnitionType : int
-{
-    Spark = 0,
-    Compression = 1
-};
 
 // The value of PID 0x1C as the vehicle reported it, 0 while unknown.
 using ObdStandard = int;
