@@ -1,0 +1,100 @@
+#pragma once
+
+#include "libobd/powertrain/fueltrim.h"
+#include "libobd/powertrain/numericparameters.h"
+
+#include <map>
+#include <memory>
+#include <string>
+
+namespace support {
+
+using MakeParameter = std::shared_ptr<obd::PowertrainParameter> (*)(obd::ObdMode mode, unsigned char frame);
+
+template <typename Parameter>
+std::shared_ptr<obd::PowertrainParameter> makeParameter(obd::ObdMode mode, unsigned char frame)
+{
+    return std::make_shared<Parameter>(mode, frame);
+}
+
+#define SUPPORT_PARAMETER(name)                                                                                        \
+    {                                                                                                                  \
+#name, makeParameter < obd::name>                                                                              \
+    }
+
+// Every PID class by its name.
+inline std::map<std::string, MakeParameter> const& parameterClasses()
+{
+    static std::map<std::string, MakeParameter> const classes{
+        SUPPORT_PARAMETER(CalculatedEngineLoad),
+        SUPPORT_PARAMETER(EngineCoolantTemperature),
+        SUPPORT_PARAMETER(ShortTermFuelTrimBank1),
+        SUPPORT_PARAMETER(LongTermFuelTrimBank1),
+        SUPPORT_PARAMETER(ShortTermFuelTrimBank2),
+        SUPPORT_PARAMETER(LongTermFuelTrimBank2),
+        SUPPORT_PARAMETER(FuelPressure),
+        SUPPORT_PARAMETER(ManifoldPressure),
+        SUPPORT_PARAMETER(EngineRpm),
+        SUPPORT_PARAMETER(VehicleSpeed),
+        SUPPORT_PARAMETER(TimingAdvance),
+        SUPPORT_PARAMETER(IntakeAirTemperature),
+        SUPPORT_PARAMETER(AirFlowRate),
+        SUPPORT_PARAMETER(ThrottlePosition),
+        SUPPORT_PARAMETER(EngineRuntime),
+        SUPPORT_PARAMETER(MilDistance),
+        SUPPORT_PARAMETER(RelativeFuelRailPressure),
+        SUPPORT_PARAMETER(FuelRailPressure),
+        SUPPORT_PARAMETER(CommandedEgr),
+        SUPPORT_PARAMETER(EgrError),
+        SUPPORT_PARAMETER(EvaporativePurge),
+        SUPPORT_PARAMETER(FuelLevelInput),
+        SUPPORT_PARAMETER(WarmUps),
+        SUPPORT_PARAMETER(DistanceTraveled),
+        SUPPORT_PARAMETER(VaporPressure),
+        SUPPORT_PARAMETER(BarometricPressure),
+        SUPPORT_PARAMETER(CatalystTemperatureBank1Sensor1),
+        SUPPORT_PARAMETER(CatalystTemperatureBank2Sensor1),
+        SUPPORT_PARAMETER(CatalystTemperatureBank1Sensor2),
+        SUPPORT_PARAMETER(CatalystTemperatureBank2Sensor2),
+        SUPPORT_PARAMETER(ControlModuleVoltage),
+        SUPPORT_PARAMETER(AbsoluteLoadValue),
+        SUPPORT_PARAMETER(CommandedFar),
+        SUPPORT_PARAMETER(RelativeThrottlePosition),
+        SUPPORT_PARAMETER(AmbientAirTemperature),
+        SUPPORT_PARAMETER(AbsoluteThrottlePositionB),
+        SUPPORT_PARAMETER(AbsoluteThrottlePositionC),
+        SUPPORT_PARAMETER(AcceleratorPedalPositionD),
+        SUPPORT_PARAMETER(AcceleratorPedalPositionE),
+        SUPPORT_PARAMETER(AcceleratorPedalPositionF),
+        SUPPORT_PARAMETER(CommandedThrottleActuatorControl),
+        SUPPORT_PARAMETER(EngineRuntimeMil),
+        SUPPORT_PARAMETER(EngineRuntimeDtc),
+        SUPPORT_PARAMETER(AlcoholFuelPercentage),
+        SUPPORT_PARAMETER(AbsoluteEvapSystemVaporPressure),
+        SUPPORT_PARAMETER(EvapSystemVaporPressure),
+        SUPPORT_PARAMETER(ShortTermSecondaryFuelTrimBank1),
+        SUPPORT_PARAMETER(LongTermSecondaryFuelTrimBank1),
+        SUPPORT_PARAMETER(ShortTermSecondaryFuelTrimBank2),
+        SUPPORT_PARAMETER(LongTermSecondaryFuelTrimBank2),
+        SUPPORT_PARAMETER(AbsoluteFuelRailPressure),
+        SUPPORT_PARAMETER(RelativeAcceleratorPedalPosition),
+        SUPPORT_PARAMETER(BatteryPackRemainingCharge),
+        SUPPORT_PARAMETER(EngineOilTemperature),
+        SUPPORT_PARAMETER(FuelInjectionTiming),
+        SUPPORT_PARAMETER(EngineFuelRate),
+        SUPPORT_PARAMETER(RequestedTorque),
+        SUPPORT_PARAMETER(ActualTorque),
+        SUPPORT_PARAMETER(ReferenceTorque),
+    };
+    return classes;
+}
+
+#undef SUPPORT_PARAMETER
+
+// A live reading of the class. Throws if there is none of that name.
+inline std::shared_ptr<obd::PowertrainParameter> liveParameter(std::string const& name)
+{
+    return parameterClasses().at(name)(obd::ObdMode::CurrentData, 0);
+}
+
+} // namespace support
