@@ -11,12 +11,6 @@ namespace obd {
 namespace {
 
 constexpr unsigned int maskLength = 4;
-constexpr unsigned char positiveReply = 0x40;
-
-std::vector<unsigned char> fillers(ObdProtocol protocol)
-{
-    return std::vector<unsigned char>(isLegacy(protocol) ? 5U : 0U, 0x00);
-}
 
 // A wrong filler is told, and the reply used all the same: real modules put anything there.
 unsigned int offsetWithFiller(IEcu const& ecu, std::vector<unsigned char> const& data, unsigned char filler)
@@ -31,10 +25,6 @@ unsigned int offsetWithFiller(IEcu const& ecu, std::vector<unsigned char> const&
 }
 
 } // namespace
-
-SupportedOids::SupportedOids(std::vector<unsigned char> lead, std::vector<unsigned char> tail)
-    : m_lead(std::move(lead)), m_tail(std::move(tail))
-{}
 
 unsigned int SupportedOids::timeout() const
 {
@@ -59,18 +49,6 @@ std::vector<unsigned char> SupportedOids::oids(IEcu const& ecu) const
 {
     auto const found = m_oids.find(ecu.id());
     return found != m_oids.end() ? found->second : std::vector<unsigned char>{};
-}
-
-void SupportedOids::getRequestData(std::vector<unsigned char>& data) const
-{
-    data = m_lead;
-    data.insert(data.end(), m_tail.begin(), m_tail.end());
-}
-
-void SupportedOids::getSignature(std::vector<unsigned char>& signature) const
-{
-    signature = m_lead;
-    signature.front() = static_cast<unsigned char>(signature.front() + positiveReply);
 }
 
 bool SupportedOids::fromBytes(std::shared_ptr<IEcu> const& ecu, std::vector<unsigned char> const& data)
@@ -128,7 +106,7 @@ unsigned int Service06Oids::payloadOffset(std::shared_ptr<IEcu> const& ecu,
 }
 
 Service08Oids::Service08Oids(unsigned char first, ObdProtocol protocol)
-    : SupportedOids({0x08, first}, fillers(protocol))
+    : SupportedOids({0x08, first}, requestFillers(protocol))
 {}
 
 unsigned int Service08Oids::payloadOffset(std::shared_ptr<IEcu> const& ecu,

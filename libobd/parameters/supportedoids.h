@@ -1,6 +1,6 @@
 #pragma once
 
-#include <obd/obdparameter.h>
+#include "libobd/parameters/fixedrequestparameter.h"
 
 #include <map>
 #include <memory>
@@ -10,7 +10,7 @@ namespace obd {
 
 // Asks for one range of 32 identifiers of a service. A reply's 4 mask bytes tell which of them a module supports; the
 // last bit tells whether a next range exists (SAE J1979).
-class SupportedOids : public ObdParameter
+class SupportedOids : public FixedRequestParameter
 {
 public:
     unsigned int timeout() const override; // 3500 ms: every module may answer
@@ -27,16 +27,11 @@ public:
     std::vector<unsigned char> oids(IEcu const& ecu) const;
 
 protected:
-    // lead: service, first identifier of the range, and what else the reply repeats; tail: fillers of the request.
-    explicit SupportedOids(std::vector<unsigned char> lead, std::vector<unsigned char> tail = {});
+    using FixedRequestParameter::FixedRequestParameter;
 
-    void getRequestData(std::vector<unsigned char>& data) const override;
-    void getSignature(std::vector<unsigned char>& signature) const override;
     bool fromBytes(std::shared_ptr<IEcu> const& ecu, std::vector<unsigned char> const& data) override;
 
 private:
-    std::vector<unsigned char> m_lead;
-    std::vector<unsigned char> m_tail;
     std::map<unsigned int, std::vector<unsigned char>> m_oids; // by module id
 };
 

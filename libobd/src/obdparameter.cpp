@@ -3,9 +3,8 @@
 #include <obd/iobdproxy.h>
 #include <obd/obdparameter.h>
 
+#include "libobd/src/bytereader.h"
 #include "libobd/src/hexformat.h"
-
-#include <algorithm>
 
 namespace obd {
 namespace {
@@ -21,12 +20,6 @@ std::string dump(std::vector<unsigned char> const& request, ResponseMap const& r
         text += ", response from 0x" + lowerHex(id) + ":" + hexDump(data);
     }
     return text;
-}
-
-bool startsWith(std::vector<unsigned char> const& data, std::vector<unsigned char> const& prefix, std::size_t position)
-{
-    return data.size() >= position + prefix.size() &&
-           std::equal(prefix.begin(), prefix.end(), data.begin() + static_cast<std::ptrdiff_t>(position));
 }
 
 } // namespace

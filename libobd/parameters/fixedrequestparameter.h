@@ -1,0 +1,27 @@
+#pragma once
+
+#include <obd/obdparameter.h>
+
+#include <vector>
+
+namespace obd {
+
+// A query whose request does not change: a lead of service, identifier and what else the reply repeats, and a tail that
+// it does not. A reply begins with the lead, its service raised by 0x40.
+class FixedRequestParameter : public ObdParameter
+{
+protected:
+    explicit FixedRequestParameter(std::vector<unsigned char> lead, std::vector<unsigned char> tail = {});
+
+    void getRequestData(std::vector<unsigned char>& data) const override;
+    void getSignature(std::vector<unsigned char>& signature) const override;
+
+private:
+    std::vector<unsigned char> m_lead;
+    std::vector<unsigned char> m_tail;
+};
+
+// The bytes by which requests of service 08 are filled up where their length is fixed: on the buses before CAN.
+std::vector<unsigned char> requestFillers(ObdProtocol protocol);
+
+} // namespace obd
