@@ -173,7 +173,8 @@ TEST(MonitorStatus, RepliesOfAnyLengthAreReadOrRefusedWithoutChange)
 {
     std::mt19937 random(20251121);
     for (unsigned int protocol = ObdProtocolIso9141; protocol <= ObdProtocolUnknown; ++protocol) {
-        auto const ecu = std::make_shared<support::FakeEcu>(0x10, static_cast<ObdProtocol>(protocol));
+        auto const ecu = std::make_shared<support::FakeEcu>(0x10);
+        ecu->setProtocol(static_cast<ObdProtocol>(protocol));
         for (std::size_t length = 0; length <= 40; ++length) {
             Bytes data(length);
             for (unsigned char& byte : data) {

@@ -1,0 +1,59 @@
+#include "libobd/parameters/calibrationverificationnumbers.h"
+
+#include "libobd/parameters/bytetext.h"
+#include "libobd/parameters/replychecks.h"
+#include "libobd/parameters/saelines.h"
+
+#include <common/logrecord.h>
+
+namespace obd {
+namespace {
+
+constexpr std::size_t headerLength = 3; // service, info type, number of items
+constexpr std::size_t itemLength = 4;
+
+} // namespace
+
+void CalibrationVerificationNumbers::clear()
+{
+    m_numbers.clear();
+}
+
+std::vector<std::string> CalibrationVerificationNumbers::verificationNumbers(std::shared_ptr<IEcu> const& ecu) const
+{
+    return findOrEmpty(m_numbers, *ecu);
+}
+
+bool CalibrationVerificationNumbers::fromCanSystem(unsigned int ecuId, std::vector<unsigned char> const& data)
+{
+    if (data.size() < headerLength + itemLength) {
+        return refuseLength(data);
+    }
+    unsigned int const count = data[2];
+    TERVEX_LOG(Info) << "Number of verification items: " << count;
+    if (headerLength + itemLength * count > data.size()) {
+        return refuseLength(data);
+    }
+    for (std::size_t item = 0; item < count; ++item) {
+        m_numbers[ecuId].push_back(hexText(slice(data, headerLength + item * itemLength, itemLength)));
+    }
+    return true;
+}
+
+bool CalibrationVerificationNumbers::fromSaeSystem(unsigned int ecuId, std::vector<unsigned char> const& data)
+{
+    if (data.size() < SaeLines::lineLength) {
+        return refuseLength(data);
+    }
+    int const checksumLength = findSaeChecksumLength(data);
+    if (checksumLength < 0) {
+        return refuse("Invalid data received");
+    }
+    SaeLines const lines(data, static_cast<std::size_t>(checksumLength));
+    for (std::size_t line = 0; line < lines.count(); ++line) {
+        m_numbers[ecuId].push_back(hexText(lines.data(line)));
+    }
+    return true;
+}
+
+} // namespace obd

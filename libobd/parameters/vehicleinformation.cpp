@@ -1,0 +1,26 @@
+#include "libobd/parameters/vehicleinformation.h"
+
+#include "libobd/parameters/saelines.h"
+#include "libobd/src/protocolfamily.h"
+
+#include <common/logrecord.h>
+
+namespace obd {
+
+bool VehicleInformation::fromBytes(std::shared_ptr<IEcu> const& ecu, std::vector<unsigned char> const& data)
+{
+    return isCan(ecu->protocol()) ? fromCanSystem(ecu->id(), data) : fromSaeSystem(ecu->id(), data);
+}
+
+std::size_t VehicleInformation::guessChecksumLength(std::vector<unsigned char> const& data,
+                                                    std::size_t linesPerItem) const
+{
+    std::size_t const plainSize = linesPerItem * SaeLines::lineLength;
+    std::size_t const checkedSize = linesPerItem * (SaeLines::lineLength + 1);
+    // Seven items with checksums are as long as eight without: there the beginnings of the lines decide.
+    bool const plain = data.size() % plainSize == 0 && (data.size() % checkedSize != 0 || verifySaeSignatures(data, 0));
+    TERVEX_LOG(Debug) << (plain ? "No checksum in use" : "Checksum in use");
+    return plain ? 0 : 1;
+}
+
+} // namespace obd

@@ -1,0 +1,25 @@
+#pragma once
+
+#include "libobd/parameters/fixedrequestparameter.h"
+
+namespace obd {
+
+// An item of service 09 (SAE J1979), kept by control module. On CAN a reply comes assembled, on the older buses as
+// numbered lines; see SaeLines.
+class VehicleInformation : public FixedRequestParameter
+{
+protected:
+    explicit VehicleInformation(unsigned char infoType) : FixedRequestParameter({0x09, infoType}) {}
+
+    bool fromBytes(std::shared_ptr<IEcu> const& ecu, std::vector<unsigned char> const& data) override;
+
+    // Bytes of checksum behind each line of a legacy reply whose items take `linesPerItem` lines each, judged by its
+    // size: 0 or 1. A reply that has neither size is taken to have checksums.
+    std::size_t guessChecksumLength(std::vector<unsigned char> const& data, std::size_t linesPerItem) const;
+
+private:
+    virtual bool fromCanSystem(unsigned int ecuId, std::vector<unsigned char> const& data) = 0;
+    virtual bool fromSaeSystem(unsigned int ecuId, std::vector<unsigned char> const& data) = 0;
+};
+
+} // namespace obd

@@ -1,0 +1,74 @@
+#pragma once
+
+#include "tests/support/fakeecu.h"
+#include "tests/support/hexbytes.h"
+
+#include <obd/obdparameter.h>
+
+#include <random>
+#include <string_view>
+
+// What the tests of the queries beyond service 01 share.
+namespace diagnosticsrig {
+
+using Bytes = std::vector<unsigned char>;
+
+inline std::shared_ptr<obd::IEcu> makeEcu(obd::ObdProtocol protocol, unsigned int id = 0x7E8)
+{
+    auto const ecu = std::make_shared<support::FakeEcu>(id);
+    ecu->setProtocol(protocol);
+    return ecu;
+}
+
+// Hands a parameter a reply such as "49 02 01 31" of a module.
+inline bool offer(obd::ObdParameter& parameter, std::shared_ptr<obd::IEcu> const& ecu, std::string_view reply)
+{
+    return parameter.setResponseData(ecu, support::hexBytes(reply));
+}
+
+inline Bytes requestOf(obd::ObdParameter const& parameter)
+{
+    Bytes request;
+    parameter.requestData(request);
+    return request;
+}
+
+// The reply of a bus before CAN with a byte of checksum behind each 7 byte line, as ISO 9141-2 and J1850 deliver it.
+inline Bytes withChecksums(Bytes const& lines)
+{
+    Bytes data;
+    unsigned char sum = 0;
+    for (std::size_t i = 0; i < lines.size(); ++i) {
+        data.push_back(lines[i]);
+        sum = static_cast<unsigned char>(sum + lines[i]);
+        if (i % 7 == 6) {
+            data.push_back(sum);
+            sum = 0;
+        }
+    }
+    return data;
+}
+
+// Random replies of every length up to 40 bytes that begin with the parameter's signature, and some that do not.
+template <typename Check>
+void forRandomReplies(Bytes const& signature, Check check)
+{
+    std::mt19937 random(3779);
+    for (int round = 0; round < 20; ++round) {
+        for (std::size_t length = 0; length <= 40; ++length) {
+            Bytes data(length);
+            for (unsigned char& byte : data) {
+                byte = static_cast<unsigned char>(random());
+            }
+            check(data);
+            std::copy_n(signature.begin(), std::min(signature.size(), length), data.begin());
+            check(data);
+        }
+    }
+}
+
+constexpr obd::ObdProtocol allProtocols[] = {obd::ObdProtocolIso9141, obd::ObdProtocolIso14230,
+                                             obd::ObdProtocolJ1850,   obd::ObdProtocolCan11,
+                                             obd::ObdProtocolCan29,   obd::ObdProtocolUnknown};
+
+} // namespace diagnosticsrig
