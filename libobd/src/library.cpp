@@ -1,3 +1,5 @@
+#include "libobd/src/dtcreader.h"
+
 #include <common/debuglogger.h>
 #include <common/logrecord.h>
 #include <obd/library.h>
@@ -18,11 +20,13 @@ bool LIBOBDOpen(std::string const& logPath)
 {
     processLogger().open(logPath);
     TERVEX_LOG(Info) << "Lib OBD init";
+    DtcReader::init();
     return true;
 }
 
 void LIBOBDClose()
 {
+    DtcReader::clean();
     TERVEX_LOG(Info) << "Lib OBD cleanup done";
     tervex::LogSink = nullptr;
 }

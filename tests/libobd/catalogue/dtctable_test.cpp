@@ -2,6 +2,8 @@
 
 #include "tools/catalogue/makers.h"
 
+#include <obd/manufacturer.h>
+
 #include <algorithm>
 #include <array>
 #include <fstream>
@@ -208,6 +210,16 @@ TEST(DtcTable, IteratorWalksAllRows)
     auto second = table.begin();
     EXPECT_EQ((*second++).code, DtcTable::row(0).code);
     EXPECT_EQ((*second).code, DtcTable::row(1).code);
+}
+
+// The tool that builds the table numbers the makers by a list of its own.
+TEST(DtcTable, MakersAreNumberedAsTheLibraryNumbersThem)
+{
+    ASSERT_EQ(catalogue::makerCount(), obd::Manufacturer::Volvo + 1U);
+    for (std::size_t maker = 0; maker < catalogue::makerCount(); ++maker) {
+        EXPECT_EQ(obd::Manufacturer::manufacturerToString(static_cast<obd::Manufacturer::AutoManufacturer>(maker)),
+                  catalogue::makerName(maker));
+    }
 }
 
 } // namespace

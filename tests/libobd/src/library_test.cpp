@@ -1,3 +1,5 @@
+#include "libobd/src/dtcreader.h"
+
 #include <common/logrecord.h>
 #include <gtest/gtest.h>
 #include <obd/library.h>
@@ -43,6 +45,16 @@ TEST(Library, OpenSucceedsThoughTheFolderDoesNotExist)
     EXPECT_TRUE(obd::LIBOBDOpen(missing));
     EXPECT_FALSE(std::filesystem::exists(missing));
     obd::LIBOBDClose();
+}
+
+TEST(Library, TroubleCodeTextsAreThereFromOpenToClose)
+{
+    auto const meaning = [] { return obd::DtcReader().getTroubleCodes("P0420").front()->description; };
+    EXPECT_EQ(meaning(), "ISO/SAE Reserved");
+    obd::LIBOBDOpen("");
+    EXPECT_EQ(meaning(), "Catalyst System Efficiency Below Threshold Bank 1");
+    obd::LIBOBDClose();
+    EXPECT_EQ(meaning(), "ISO/SAE Reserved");
 }
 
 } // namespace
