@@ -1,24 +1,28 @@
 #pragma once
 
 #include <obd/export.h>
+#include <obd/obdprotocol.h>
 #include <obd/vehicleprotocol.h>
 
 #include <string>
 
 namespace obd {
 
-// A bus protocol with its name, for a list to choose from.
-class ConnectionProtocol
+// A bus protocol to choose, with its name for people.
+class OBD_EXPORT ConnectionProtocol
 {
 public:
-    explicit ConnectionProtocol(VehicleProtocol protocol) : m_protocol(protocol) {}
+    explicit ConnectionProtocol(VehicleProtocol protocol);
 
-    VehicleProtocol protocol() const { return m_protocol; }
-    // Such as "ISO 15765-4 CAN (11bit, 500kb)"; empty for a number outside the enumeration.
-    OBD_EXPORT std::string description() const;
+    VehicleProtocol protocol() const;
+    // Such as "ISO 9141-2"; empty for a number that no protocol has.
+    std::string description() const;
 
 private:
     VehicleProtocol m_protocol;
 };
+
+// The bus family of a protocol; ObdProtocolUnknown for Automatic and for a number that no protocol has.
+OBD_EXPORT ObdProtocol toObdProtocol(VehicleProtocol protocol);
 
 } // namespace obd

@@ -3,22 +3,34 @@
 
 namespace {
 
-TEST(ConnectionProtocol, EveryProtocolHasItsName)
+TEST(ConnectionProtocol, EveryNumberHasItsNameAndFamily)
 {
-    std::vector<std::string> names;
-    for (int number = 0; number < 10; ++number) {
-        names.push_back(obd::ConnectionProtocol(static_cast<obd::VehicleProtocol>(number)).description());
+    struct Row
+    {
+        int number;
+        char const* description;
+        int family;
+    };
+    for (Row const row :
+         {Row{0, "Automatic", 5}, Row{1, "SAE J1850 PWM", 2}, Row{2, "SAE J1850 VPW", 2}, Row{3, "ISO 9141-2", 0},
+          Row{4, "ISO 14230-4 KWP (5 baud init)", 1}, Row{5, "ISO 14230-4 KWP (fast init)", 1},
+          Row{6, "ISO 15765-4 CAN (11bit, 500kb)", 3}, Row{7, "ISO 15765-4 CAN (29bit, 500kb)", 4},
+          Row{8, "ISO 15765-4 CAN (11bit, 250kb)", 3}, Row{9, "ISO 15765-4 CAN (29bit, 250kb)", 4}}) {
+        auto const number = static_cast<obd::VehicleProtocol>(row.number);
+        obd::ConnectionProtocol const protocol(number);
+        EXPECT_EQ(protocol.protocol(), number);
+        EXPECT_EQ(protocol.description(), row.description);
+        EXPECT_EQ(static_cast<int>(obd::toObdProtocol(number)), row.family) << row.number;
     }
-    EXPECT_EQ(names, (std::vector<std::string>{"Automatic", "SAE J1850 PWM", "SAE J1850 VPW", "ISO 9141-2",
-                                               "ISO 14230-4 KWP (5 baud init)", "ISO 14230-4 KWP (fast init)",
-                                               "ISO 15765-4 CAN (11bit, 500kb)", "ISO 15765-4 CAN (29bit, 500kb)",
-                                               "ISO 15765-4 CAN (11bit, 250kb)", "ISO 15765-4 CAN (29bit, 250kb)"}));
 }
 
-TEST(ConnectionProtocol, NumberOutsideTheTableHasNoName)
+TEST(ConnectionProtocol, OtherNumbersAreUnknown)
 {
-    EXPECT_EQ(obd::ConnectionProtocol(static_cast<obd::VehicleProtocol>(10)).description(), "");
-    EXPECT_EQ(obd::ConnectionProtocol(static_cast<obd::VehicleProtocol>(-1)).description(), "");
+    for (int number : {10, -1, 255}) {
+        auto const protocol = static_cast<obd::VehicleProtocol>(number);
+        EXPECT_EQ(obd::toObdProtocol(protocol), obd::ObdProtocolUnknown) << number;
+        EXPECT_EQ(obd::ConnectionProtocol(protocol).description(), "") << number;
+    }
 }
 
 } // namespace

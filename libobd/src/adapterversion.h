@@ -1,0 +1,20 @@
+#pragma once
+
+#include <compare>
+#include <string>
+
+namespace obd {
+
+// An adapter's firmware version. Adapters that tell none are taken for 1.0.
+struct AdapterVersion
+{
+    int majorNumber = 1;
+    int minorNumber = 0; // its first digit only: 4 for "1.45"
+
+    auto operator<=>(AdapterVersion const&) const = default;
+};
+
+// Reads "v1.5", "1.30" or "v2.1a". What is missing or no number is 0.
+AdapterVersion parseAdapterVersion(std::string word);
+
+} // namespace obd
