@@ -1,0 +1,71 @@
+#include "simulator/car/services.h"
+
+namespace obdsim {
+
+namespace {
+
+constexpr std::uint8_t positive = 0x40;
+constexpr std::size_t codesPerLine = 3;
+
+void append(Bytes& message, std::uint16_t code)
+{
+    message.push_back(static_cast<std::uint8_t>(code >> 8));
+    message.push_back(static_cast<std::uint8_t>(code & 0xFF));
+}
+
+Bytes countedCodes(std::uint8_t service, const std::vector<std::uint16_t>& codes)
+{
+    Bytes message = {service, static_cast<std::uint8_t>(codes.size())};
+    for (const auto code : codes) {
+        append(message, code);
+    }
+    return message;
+}
+
+/// Three codes a line, filled with zeros; one empty line if there are none.
+std::vector<Bytes> codeLines(std::uint8_t service, const std::vector<std::uint16_t>& codes)
+{
+    std::vector<Bytes> lines;
+    for (std::size_t at = 0; at == 0 || at < codes.size(); at += codesPerLine) {
+        Bytes line = {service};
+        for (std::size_t i = at; i < at + codesPerLine; ++i) {
+            append(line, i < codes.size() ? codes[i] : std::uint16_t{0});
+        }
+        lines.push_back(line);
+    }
+    return lines;
+}
+
+Answer tellCodes(const ServiceCall& call, const std::vector<std::uint16_t>& codes)
+{
+    const auto service = static_cast<std::uint8_t>(call.request[0] + positive);
+    return call.onCan() ? Answer{0, {countedCodes(service, codes)}} : Answer{0, codeLines(service, codes)};
+}
+
+} // namespace
+
+Answer storedCodes(const ServiceCall& call)
+{
+    return tellCodes(call, call.module.data().stored);
+}
+
+Answer pendingCodes(const ServiceCall& call)
+{
+    return tellCodes(call, call.module.data().pending);
+}
+
+Answer permanentCodes(const ServiceCall& call)
+{
+    return tellCodes(call, call.module.data().permanent);
+}
+
+Answer clearCodes(const ServiceCall& call)
+{
+    if (!call.module.data().clearsWhileRunning && call.module.engineRuns(call.now)) {
+        return {refusal::conditionsNotCorrect, {}};
+    }
+    call.module.clear(call.now);
+    return {0, {{static_cast<std::uint8_t>(call.request[0] + positive)}}};
+}
+
+} // namespace obdsim

@@ -1,0 +1,95 @@
+#include "simulator/car/services.h"
+
+#include <algorithm>
+
+namespace obdsim {
+
+namespace {
+
+constexpr std::uint8_t positive = 0x40;
+constexpr std::size_t pidsPerRequest = 6; // SAE J1979, on CAN only
+constexpr std::uint8_t freezeFrameCode = 0x02;
+
+std::set<std::uint8_t> currentIds(const Module& module)
+{
+    const auto pids = module.currentPids();
+    return {pids.begin(), pids.end()};
+}
+
+std::optional<Bytes> currentItem(const ServiceCall& call, std::uint8_t pid)
+{
+    return isRangeRequest(pid) ? supportedMask(currentIds(call.module), pid) : call.module.currentData(pid, call.now);
+}
+
+const FreezeFrame* findFrame(const ModuleData& data, std::uint8_t number)
+{
+    const auto frame = std::find_if(data.frames.begin(), data.frames.end(),
+                                    [number](const FreezeFrame& f) { return f.number == number; });
+    return frame == data.frames.end() ? nullptr : &*frame;
+}
+
+std::set<std::uint8_t> frameIds(const FreezeFrame& frame)
+{
+    std::set<std::uint8_t> ids(frame.pids.begin(), frame.pids.end());
+    ids.insert(freezeFrameCode);
+    for (const auto& [pid, data] : frame.values) {
+        ids.insert(pid);
+    }
+    return ids;
+}
+
+std::optional<Bytes> frameItem(const Module& module, const FreezeFrame& frame, std::uint8_t pid)
+{
+    if (isRangeRequest(pid)) {
+        return supportedMask(frameIds(frame), pid);
+    }
+    if (pid == freezeFrameCode) {
+        return Bytes{static_cast<std::uint8_t>(frame.code >> 8), static_cast<std::uint8_t>(frame.code & 0xFF)};
+    }
+    if (const auto value = frame.values.find(pid); value != frame.values.end()) {
+        return value->second;
+    }
+    const bool kept = std::find(frame.pids.begin(), frame.pids.end(), pid) != frame.pids.end();
+    return kept ? module.currentData(pid, frame.takenAt) : std::nullopt;
+}
+
+/// A module without a frame still tells that there is no code behind it.
+std::optional<Bytes> missingFrameItem(std::uint8_t pid)
+{
+    return pid == freezeFrameCode ? std::optional<Bytes>(Bytes{0, 0}) : std::nullopt;
+}
+
+} // namespace
+
+Answer currentData(const ServiceCall& call)
+{
+    Bytes message = {static_cast<std::uint8_t>(call.request[0] + positive)};
+    const std::size_t count = call.onCan() ? pidsPerRequest : 1;
+    for (std::size_t i = 1; i <= count && i < call.request.size(); ++i) {
+        const std::uint8_t pid = call.request[i];
+        if (const auto data = currentItem(call, pid)) {
+            message.push_back(pid);
+            message.insert(message.end(), data->begin(), data->end());
+        }
+    }
+    return message.size() > 1 ? Answer{0, {message}} : Answer{};
+}
+
+Answer freezeFrame(const ServiceCall& call)
+{
+    const auto pid = call.at(1);
+    const auto number = call.at(2);
+    if (!pid || !number) {
+        return {};
+    }
+    const FreezeFrame* frame = findFrame(call.module.data(), *number);
+    const auto data = frame == nullptr ? missingFrameItem(*pid) : frameItem(call.module, *frame, *pid);
+    if (!data) {
+        return {};
+    }
+    Bytes message = {static_cast<std::uint8_t>(call.request[0] + positive), *pid, *number};
+    message.insert(message.end(), data->begin(), data->end());
+    return {0, {message}};
+}
+
+} // namespace obdsim

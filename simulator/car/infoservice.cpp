@@ -1,0 +1,174 @@
+#include "simulator/car/services.h"
+
+#include <algorithm>
+
+namespace obdsim {
+
+namespace {
+
+constexpr std::uint8_t positive = 0x40;
+constexpr std::size_t lineData = 4; // data bytes in one numbered message
+
+/// An item of service 09: `data` holds `count` pieces one behind the other.
+struct Item
+{
+    std::uint8_t id;
+    std::uint8_t count;
+    Bytes data;
+};
+
+Bytes characters(const std::string& text)
+{
+    return {text.begin(), text.end()};
+}
+
+Bytes resized(Bytes data, std::size_t size)
+{
+    data.resize(size, 0);
+    return data;
+}
+
+/// Numbers stand at the end of their field on the buses without CAN.
+Bytes rightAligned(Bytes data, std::size_t size)
+{
+    data.insert(data.begin(), size > data.size() ? size - data.size() : 0, 0);
+    return data;
+}
+
+Item numberItem(std::uint8_t id, const std::string& text, bool onCan)
+{
+    constexpr std::size_t onCanSize = 17;
+    constexpr std::size_t onLinesSize = 20;
+    const Bytes data = rightAligned(characters(text), onCanSize);
+    return {id, 1, onCan ? data : rightAligned(data, onLinesSize)};
+}
+
+Item countersItem(std::uint8_t id, const std::vector<std::uint16_t>& counters)
+{
+    Item item{id, static_cast<std::uint8_t>(counters.size()), {}};
+    for (const auto counter : counters) {
+        item.data.push_back(static_cast<std::uint8_t>(counter >> 8));
+        item.data.push_back(static_cast<std::uint8_t>(counter & 0xFF));
+    }
+    return item;
+}
+
+Item calibrationsItem(const std::vector<std::string>& calibrations)
+{
+    constexpr std::size_t size = 16;
+    Item item{0x04, static_cast<std::uint8_t>(calibrations.size()), {}};
+    for (const auto& calibration : calibrations) {
+        const Bytes data = resized(characters(calibration), size);
+        item.data.insert(item.data.end(), data.begin(), data.end());
+    }
+    return item;
+}
+
+Item verificationsItem(const std::vector<Bytes>& verifications)
+{
+    Item item{0x06, static_cast<std::uint8_t>(verifications.size()), {}};
+    for (const auto& verification : verifications) {
+        item.data.insert(item.data.end(), verification.begin(), verification.end());
+    }
+    return item;
+}
+
+std::vector<Item> itemsOf(const VehicleInfo& info, bool onCan)
+{
+    constexpr std::size_t nameSize = 20;
+    std::vector<Item> items = {
+        numberItem(0x02, info.vin, onCan),
+        calibrationsItem(info.calibrations),
+        verificationsItem(info.verifications),
+        countersItem(0x08, info.sparkCounters),
+        {0x0A, 1, resized(characters(info.ecuName), nameSize)},
+        countersItem(0x0B, info.compressionCounters),
+        numberItem(0x0D, info.serial, onCan),
+        numberItem(0x0F, info.typeApproval, onCan),
+    };
+    const auto isEmpty = [](const Item& item) {
+        return std::all_of(item.data.begin(), item.data.end(), [](std::uint8_t byte) { return byte == 0; });
+    };
+    items.erase(std::remove_if(items.begin(), items.end(), isEmpty), items.end());
+    return items;
+}
+
+std::size_t lineCount(const Item& item)
+{
+    return (item.data.size() + lineData - 1) / lineData;
+}
+
+/// Off CAN the odd id before an item tells how many messages it takes.
+bool hasCountItem(const Item& item)
+{
+    return item.id <= 0x0A;
+}
+
+std::set<std::uint8_t> ids(const std::vector<Item>& items, bool onCan)
+{
+    std::set<std::uint8_t> result;
+    for (const auto& item : items) {
+        result.insert(item.id);
+        if (!onCan && hasCountItem(item)) {
+            result.insert(static_cast<std::uint8_t>(item.id - 1));
+        }
+    }
+    return result;
+}
+
+Answer tellItem(const ServiceCall& call, const Item& item)
+{
+    const Bytes head = {static_cast<std::uint8_t>(call.request[0] + positive), item.id};
+    if (call.onCan()) {
+        Bytes message = head;
+        message.push_back(item.count);
+        message.insert(message.end(), item.data.begin(), item.data.end());
+        return {0, {message}};
+    }
+    Answer answer;
+    const Bytes data = resized(item.data, lineCount(item) * lineData);
+    for (std::size_t line = 0; line < lineCount(item); ++line) {
+        Bytes message = head;
+        message.push_back(static_cast<std::uint8_t>(line + 1));
+        const auto from = data.begin() + static_cast<std::ptrdiff_t>(line * lineData);
+        message.insert(message.end(), from, from + static_cast<std::ptrdiff_t>(lineData));
+        answer.messages.push_back(message);
+    }
+    return answer;
+}
+
+Answer tellLineCount(const ServiceCall& call, const Item& item)
+{
+    const auto service = static_cast<std::uint8_t>(call.request[0] + positive);
+    return {0, {{service, static_cast<std::uint8_t>(item.id - 1), static_cast<std::uint8_t>(lineCount(item))}}};
+}
+
+} // namespace
+
+Answer vehicleInformation(const ServiceCall& call)
+{
+    const auto id = call.at(1);
+    if (!id) {
+        return {};
+    }
+    const auto items = itemsOf(call.module.data().info, call.onCan());
+    if (isRangeRequest(*id)) {
+        return tellRange(call, ids(items, call.onCan()));
+    }
+    for (const auto& item : items) {
+        if (item.id == *id) {
+            return tellItem(call, item);
+        }
+        if (!call.onCan() && hasCountItem(item) && item.id - 1 == *id) {
+            return tellLineCount(call, item);
+        }
+    }
+    return {};
+}
+
+bool hasVehicleInformation(const ModuleData& data)
+{
+    return !itemsOf(data.info, true).empty();
+}
+
+} // namespace obdsim

@@ -1,0 +1,62 @@
+#pragma once
+
+#include "simulator/car/livepids.h"
+#include "simulator/car/moduledata.h"
+
+namespace obdsim {
+
+/// The two layouts of service data: SAE J1979 splits long answers into numbered
+/// messages of at most seven bytes on the buses without CAN.
+enum class DataLayout : int
+{
+    Can,
+    Numbered
+};
+
+/// What a module has to say to a request: nothing, a refusal, or messages.
+struct Answer
+{
+    std::uint8_t refusal = 0; ///< response code of a 7F answer, 0 if none
+    std::vector<Bytes> messages;
+
+    bool isSilent() const { return messages.empty() && refusal == 0; }
+};
+
+/// A control module at work: its data from the vehicle file, and what the
+/// clearing of codes has changed since.
+class Module
+{
+public:
+    Module(ModuleData data, const EngineData& engine, DataLayout layout);
+
+    /// The answer to `request` (service byte first) at `now`.
+    Answer answer(const Bytes& request, Time now);
+
+    const ModuleData& data() const;
+    DataLayout layout() const;
+
+    /// Data bytes of a mode 01 PID; nothing if the module does not have it.
+    std::optional<Bytes> currentData(std::uint8_t pid, Time now) const;
+
+    /// The PIDs of mode 01 for which currentData() has something.
+    std::vector<std::uint8_t> currentPids() const;
+
+    /// True while the engine turns.
+    bool engineRuns(Time now) const;
+
+    /// Service 04: forgets codes, freeze frames and results, and starts the
+    /// counters and the monitors anew. Permanent codes stay.
+    void clear(Time now);
+
+private:
+    Answer fromServices(const Bytes& request, Time now);
+    Bytes monitorWord(bool thisCycle) const;
+    SinceCleared sinceCleared(const DriveState& drive) const;
+
+    ModuleData m_data;
+    DriveModel m_drive;
+    DataLayout m_layout;
+    std::optional<Time> m_clearedAt;
+};
+
+} // namespace obdsim

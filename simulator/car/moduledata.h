@@ -1,0 +1,125 @@
+#pragma once
+
+#include "simulator/bus/frame.h"
+#include "simulator/bytes.h"
+#include "simulator/car/drivemodel.h"
+
+#include <map>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace obdsim {
+
+/// Readiness of the monitors in bits of bytes B, C and D of PIDs 01 and 41: a
+/// monitor exists, and it has not completed. Byte B keeps them in its low and
+/// high nibble, C and D are all bits of one kind each.
+struct MonitorBits
+{
+    std::uint8_t continuous = 0;           ///< misfire, fuel system, components
+    std::uint8_t continuousIncomplete = 0; ///< the same three bits
+    std::uint8_t once = 0;                 ///< byte C
+    std::uint8_t onceIncomplete = 0;       ///< byte D
+};
+
+struct Monitors
+{
+    MonitorBits sinceCleared;
+    MonitorBits thisCycle;
+};
+
+/// What a module kept of the moment at which a code was stored (service 02).
+struct FreezeFrame
+{
+    std::uint8_t number = 0;
+    std::uint16_t code = 0;
+    Time takenAt{};                       ///< moment of the drive, for the live PIDs
+    std::vector<std::uint8_t> pids;       ///< taken from the drive model or the fixed values
+    std::map<std::uint8_t, Bytes> values; ///< given byte for byte
+};
+
+/// One result of service 05; the buses without CAN only.
+struct SensorTest
+{
+    std::uint8_t test = 0;
+    std::uint8_t sensor = 0;
+    Bytes value; ///< the value alone for a constant, or value, minimum, maximum
+};
+
+/// One result of service 06. On CAN `id` is the monitor and `test` the test
+/// within it; on the other buses `id` is the test and `test` the component.
+struct MonitorTest
+{
+    std::uint8_t id = 0;
+    std::uint8_t test = 0;
+    std::uint8_t scaling = 0;         ///< CAN only
+    std::vector<std::uint16_t> words; ///< CAN: value, minimum, maximum; else value, limit
+};
+
+/// One routine of service 08.
+struct Routine
+{
+    Bytes data;           ///< what follows the test id in the reply of the buses without CAN
+    std::uint8_t refusal; ///< response code of a refusal on CAN, 0 if accepted
+};
+
+/// Items of service 09.
+struct VehicleInfo
+{
+    std::string vin;
+    std::vector<std::string> calibrations;
+    std::vector<Bytes> verifications;
+    std::string ecuName; ///< up to 20 characters, such as "ECM\0-EngineControl"
+    std::string serial;
+    std::string typeApproval;
+    std::vector<std::uint16_t> sparkCounters;
+    std::vector<std::uint16_t> compressionCounters;
+};
+
+/// A request whose answer is announced by 7F xx 78 first.
+struct Pending
+{
+    int times = 1;
+    Time delay{100}; ///< before each further message
+};
+
+/// All that a vehicle file says of one control module.
+struct ModuleData
+{
+    std::uint32_t id = 0; ///< CAN identifier of its replies, or its address
+    Time latency{15};
+    bool refuses = false; ///< answers requests it does not know with 7F
+    bool lamp = false;
+    bool clearsWhileRunning = true;
+    int warmUps = 12;
+    double kilometresSinceCleared = 640;
+    std::vector<std::uint8_t> live;
+    std::map<std::uint8_t, Bytes> fixed;
+    std::optional<Monitors> monitors;
+    bool hasStored = false; ///< answers service 03; likewise the next two
+    bool hasPending = false;
+    bool hasPermanent = false;
+    std::vector<std::uint16_t> stored;
+    std::vector<std::uint16_t> pending;
+    std::vector<std::uint16_t> permanent;
+    std::vector<FreezeFrame> frames;
+    std::vector<SensorTest> sensorTests;
+    std::vector<MonitorTest> monitorTests;
+    std::map<std::uint8_t, Routine> routines;
+    VehicleInfo info;
+    std::map<Bytes, std::vector<Bytes>> raw; ///< recorded messages by request
+    std::map<Bytes, Pending> delays;
+};
+
+/// A whole vehicle file.
+struct VehicleData
+{
+    std::string name;
+    int protocol = 6;
+    std::optional<double> volts; ///< fixed adapter voltage; else that of the drive
+    Padding padding;
+    EngineData engine;
+    std::vector<ModuleData> modules;
+};
+
+} // namespace obdsim

@@ -1,0 +1,231 @@
+#include "simulator/car/modulereader.h"
+
+#include "simulator/car/livepids.h"
+#include "simulator/car/monitornames.h"
+
+#include <algorithm>
+
+namespace obdsim {
+
+namespace {
+
+constexpr int largestWord = 0xFFFF;
+constexpr int longestDelayMs = 60000;
+
+std::uint16_t readCode(TableReader& table, std::string_view key, const std::string& text)
+{
+    const auto code = parseCode(text);
+    if (!code) {
+        table.fail(key, "\"" + text + "\" is no trouble code such as P0133");
+    }
+    return *code;
+}
+
+std::vector<std::uint16_t> readCodes(TableReader& table, std::string_view key)
+{
+    std::vector<std::uint16_t> codes;
+    for (const auto& text : table.texts(key)) {
+        codes.push_back(readCode(table, key, text));
+    }
+    return codes;
+}
+
+void readMonitorNames(TableReader& table, std::string_view key, bool compression, bool incomplete, MonitorBits& bits)
+{
+    for (const auto& name : table.texts(key)) {
+        if (!markMonitor(name, compression, incomplete, bits)) {
+            table.fail(key, "\"" + name + "\" is no monitor of this kind of engine");
+        }
+    }
+}
+
+Monitors readMonitors(TableReader& table, bool compression)
+{
+    Monitors monitors;
+    readMonitorNames(table, "supported", compression, false, monitors.sinceCleared);
+    readMonitorNames(table, "incomplete", compression, true, monitors.sinceCleared);
+    readMonitorNames(table, "this_cycle", compression, false, monitors.thisCycle);
+    readMonitorNames(table, "this_cycle_incomplete", compression, true, monitors.thisCycle);
+    return monitors;
+}
+
+/// Key and value of tables such as { "1C" = "06" }.
+std::map<std::uint8_t, Bytes> readByteRows(TableReader& table)
+{
+    std::map<std::uint8_t, Bytes> rows;
+    table.entries([&](const Bytes& key, const std::vector<Bytes>& values) {
+        if (key.size() != 1 || values.size() != 1) {
+            table.fail(hexText(key), "a row is one byte and its data");
+        }
+        rows[key[0]] = values[0];
+    });
+    return rows;
+}
+
+FreezeFrame readFrame(TableReader& table)
+{
+    FreezeFrame frame;
+    frame.number = static_cast<std::uint8_t>(table.integer("number", 0, 0xFF, 0));
+    frame.code = readCode(table, "code", table.text("code"));
+    frame.takenAt = Time(static_cast<std::int64_t>(table.number("taken_at", 0) * 1000));
+    frame.pids = table.bytes("pids");
+    table.table("values", [&](TableReader& values) { frame.values = readByteRows(values); });
+    return frame;
+}
+
+MonitorTest readMonitorTest(TableReader& table, bool onCan)
+{
+    MonitorTest test;
+    test.id = table.byte(onCan ? "monitor" : "test");
+    test.test = table.byte(onCan ? "test" : "component");
+    test.scaling = onCan ? table.byte("scaling") : std::uint8_t{0};
+    using Keys = std::vector<std::string_view>;
+    for (const auto key : onCan ? Keys{"value", "minimum", "maximum"} : Keys{"value", "limit"}) {
+        test.words.push_back(static_cast<std::uint16_t>(table.integer(key, 0, largestWord)));
+    }
+    return test;
+}
+
+Bytes readVerification(TableReader& table, const std::string& text)
+{
+    constexpr std::size_t size = 4;
+    const auto value = parseHex(text);
+    if (!value || value->size() != size) {
+        table.fail("verifications", "a calibration verification number is four bytes");
+    }
+    return *value;
+}
+
+/// "ECM-EngineControl": the acronym fills four bytes, the dash is the fifth.
+std::string layOutName(const std::string& text)
+{
+    constexpr std::size_t acronymSize = 4;
+    std::string acronym = text.substr(0, text.find('-'));
+    const std::string rest = text.substr(acronym.size());
+    acronym.resize(std::max(acronymSize, acronym.size()), '\0');
+    return acronym + rest;
+}
+
+void checkLength(TableReader& table, std::string_view key, const std::string& text, std::size_t most)
+{
+    if (text.size() > most) {
+        table.fail(key, "\"" + std::string(key) + "\" is longer than " + std::to_string(most) + " characters");
+    }
+}
+
+VehicleInfo readInfo(TableReader& table)
+{
+    constexpr std::size_t numberSize = 17;
+    constexpr std::size_t calibrationSize = 16;
+    constexpr std::size_t nameSize = 20;
+    VehicleInfo info;
+    info.vin = table.text("vin", "");
+    info.serial = table.text("serial", "");
+    info.typeApproval = table.text("type_approval", "");
+    info.ecuName = layOutName(table.text("ecu_name", ""));
+    info.calibrations = table.texts("calibrations");
+    for (const auto& text : table.texts("verifications")) {
+        info.verifications.push_back(readVerification(table, text));
+    }
+    info.sparkCounters = table.words("spark_counters");
+    info.compressionCounters = table.words("compression_counters");
+    checkLength(table, "vin", info.vin, numberSize);
+    checkLength(table, "serial", info.serial, numberSize);
+    checkLength(table, "type_approval", info.typeApproval, numberSize);
+    checkLength(table, "ecu_name", info.ecuName, nameSize);
+    for (const auto& calibration : info.calibrations) {
+        checkLength(table, "calibrations", calibration, calibrationSize);
+    }
+    return info;
+}
+
+Routine readRoutine(TableReader& table)
+{
+    return {table.bytes("data"), table.has("refusal") ? table.byte("refusal") : std::uint8_t{0}};
+}
+
+std::vector<std::uint8_t> readLive(TableReader& table)
+{
+    const Bytes pids = table.bytes("live");
+    for (const auto pid : pids) {
+        if (!isLivePid(pid)) {
+            table.fail("live", "the drive model has no PID " + hexByte(pid));
+        }
+    }
+    return pids;
+}
+
+void readCodesOf(ModuleData& module, TableReader& table)
+{
+    module.lamp = table.flag("lamp", false);
+    module.clearsWhileRunning = table.flag("clears_while_running", true);
+    module.warmUps = table.integer("warm_ups", 0, 0xFF, module.warmUps);
+    module.kilometresSinceCleared = table.number("kilometres_since_cleared", module.kilometresSinceCleared);
+    module.hasStored = table.has("stored");
+    module.hasPending = table.has("pending");
+    module.hasPermanent = table.has("permanent");
+    module.stored = readCodes(table, "stored");
+    module.pending = readCodes(table, "pending");
+    module.permanent = readCodes(table, "permanent");
+    table.tables("frames", [&](TableReader& frame) { module.frames.push_back(readFrame(frame)); });
+}
+
+void readTestsOf(ModuleData& module, TableReader& table, bool onCan)
+{
+    table.tables("monitor_tests",
+                 [&](TableReader& test) { module.monitorTests.push_back(readMonitorTest(test, onCan)); });
+    table.tables("sensor_tests", [&](TableReader& test) {
+        const std::uint8_t id = test.byte("test");
+        module.sensorTests.push_back({id, test.byte("sensor"), test.bytes("value")});
+    });
+    table.tables("routines", [&](TableReader& routine) {
+        const std::uint8_t id = routine.byte("id");
+        module.routines[id] = readRoutine(routine);
+    });
+}
+
+void readRecordedOf(ModuleData& module, TableReader& table)
+{
+    table.table("raw", [&](TableReader& raw) {
+        raw.entries([&](const Bytes& request, const std::vector<Bytes>& messages) { module.raw[request] = messages; });
+    });
+    table.table("delays", [&](TableReader& delays) {
+        delays.tableEntries([&](const Bytes& request, TableReader& delay) {
+            module.delays[request] = {delay.integer("times", 1, 100, 1),
+                                      Time(delay.integer("milliseconds", 0, longestDelayMs, 100))};
+        });
+    });
+}
+
+std::uint32_t readId(TableReader& table, const Protocol& protocol)
+{
+    const std::string text = table.text("id");
+    const auto id = parseHexNumber(text);
+    const std::size_t digits = protocol.family == BusFamily::Can11 ? 3 : protocol.family == BusFamily::Can29 ? 8 : 2;
+    if (!id || text.size() != digits) {
+        table.fail("id", "\"id\" must have " + std::to_string(digits) + " hexadecimal digits on this bus");
+    }
+    return *id;
+}
+
+} // namespace
+
+ModuleData readModule(TableReader& table, const VehicleData& vehicle)
+{
+    const Protocol& protocol = *findProtocol(vehicle.protocol);
+    ModuleData module;
+    module.id = readId(table, protocol);
+    module.latency = Time(table.integer("latency", 0, longestDelayMs, static_cast<int>(module.latency.count())));
+    module.refuses = table.flag("refuses", false);
+    module.live = readLive(table);
+    table.table("fixed", [&](TableReader& fixed) { module.fixed = readByteRows(fixed); });
+    table.table("monitors",
+                [&](TableReader& monitors) { module.monitors = readMonitors(monitors, vehicle.engine.compression); });
+    table.table("info", [&](TableReader& info) { module.info = readInfo(info); });
+    readCodesOf(module, table);
+    readTestsOf(module, table, isCan(protocol));
+    readRecordedOf(module, table);
+    return module;
+}
+
+} // namespace obdsim

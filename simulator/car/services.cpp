@@ -1,0 +1,119 @@
+#include "simulator/car/services.h"
+
+#include <algorithm>
+#include <iterator>
+
+namespace obdsim {
+
+namespace {
+
+constexpr std::size_t range = 0x20;
+constexpr std::uint8_t positive = 0x40;
+
+const Service services[] = {
+    {0x01, currentData, [](const ModuleData& d) { return !d.live.empty() || !d.fixed.empty() || d.monitors; }},
+    {0x02, freezeFrame, [](const ModuleData& d) { return d.hasStored; }},
+    {0x03, storedCodes, [](const ModuleData& d) { return d.hasStored; }},
+    {0x04, clearCodes, [](const ModuleData& d) { return d.hasStored; }},
+    {0x05, sensorTests, [](const ModuleData& d) { return !d.sensorTests.empty(); }},
+    {0x06, monitorTests, [](const ModuleData& d) { return !d.monitorTests.empty(); }},
+    {0x07, pendingCodes, [](const ModuleData& d) { return d.hasPending; }},
+    {0x08, runRoutine, [](const ModuleData& d) { return !d.routines.empty(); }},
+    {0x09, vehicleInformation, hasVehicleInformation},
+    {0x0A, permanentCodes, [](const ModuleData& d) { return d.hasPermanent; }},
+};
+
+} // namespace
+
+bool ServiceCall::onCan() const
+{
+    return module.layout() == DataLayout::Can;
+}
+
+std::optional<std::uint8_t> ServiceCall::at(std::size_t index) const
+{
+    if (index >= request.size()) {
+        return std::nullopt;
+    }
+    return request[index];
+}
+
+const Service* findService(std::uint8_t id)
+{
+    const auto row =
+        std::find_if(std::begin(services), std::end(services), [id](const Service& s) { return s.id == id; });
+    return row == std::end(services) ? nullptr : &*row;
+}
+
+bool hasService(const Module& module, std::uint8_t id)
+{
+    const Service* service = findService(id);
+    return service != nullptr && service->present(module.data());
+}
+
+std::optional<Bytes> supportedMask(const std::set<std::uint8_t>& ids, std::uint8_t base)
+{
+    if (base != 0 && ids.upper_bound(base) == ids.end()) {
+        return std::nullopt;
+    }
+    Bytes mask(4, 0);
+    for (const auto id : ids) {
+        if (id <= base) {
+            continue;
+        }
+        const std::size_t place = std::min<std::size_t>(static_cast<std::size_t>(id - base), range) - 1;
+        mask[place / 8] |= static_cast<std::uint8_t>(0x80 >> place % 8);
+    }
+    return mask;
+}
+
+std::optional<std::uint8_t> rangeFiller(std::uint8_t service)
+{
+    switch (service) {
+    case 0x06:
+        return 0xFF;
+    case 0x08:
+        return 0x00;
+    case 0x09:
+        return 0x01; // number of the message
+    default:
+        return std::nullopt;
+    }
+}
+
+Answer tellRange(const ServiceCall& call, const std::set<std::uint8_t>& ids)
+{
+    const std::uint8_t base = call.request[1];
+    const auto mask = ids.empty() ? std::nullopt : supportedMask(ids, base);
+    if (!mask) {
+        return {};
+    }
+    Bytes message = {static_cast<std::uint8_t>(call.request[0] + positive), base};
+    const auto filler = rangeFiller(call.request[0]);
+    if (filler && !call.onCan()) {
+        message.push_back(*filler);
+    }
+    message.insert(message.end(), mask->begin(), mask->end());
+    return {0, {message}};
+}
+
+Answer recordedRange(const ServiceCall& call)
+{
+    if (call.request.size() < 2 || !isRangeRequest(call.request[1])) {
+        return {};
+    }
+    std::set<std::uint8_t> ids;
+    for (const auto& [request, messages] : call.module.data().raw) {
+        if (request.size() == 2 && request[0] == call.request[0]) {
+            ids.insert(request[1]);
+        }
+    }
+    return tellRange(call, ids);
+}
+
+bool isRangeRequest(std::uint8_t id)
+{
+    return id % range == 0;
+}
+
+} // namespace obdsim

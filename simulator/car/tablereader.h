@@ -1,0 +1,70 @@
+#pragma once
+
+#include "simulator/bytes.h"
+
+#include <toml++/toml.h>
+
+#include <functional>
+#include <set>
+#include <string>
+
+namespace obdsim {
+
+/// Reads one table of a vehicle file key by key. Whatever does not fit throws
+/// VehicleFileError with file and line; finish() does so for keys that nobody
+/// asked for, which are typing errors.
+class TableReader
+{
+public:
+    TableReader(const toml::table& table, std::string origin, std::string title);
+
+    bool has(std::string_view key);
+
+    std::string text(std::string_view key);
+    std::string text(std::string_view key, const std::string& otherwise);
+    bool flag(std::string_view key, bool otherwise);
+    double number(std::string_view key, double otherwise);
+    int integer(std::string_view key, int lowest, int highest);
+    int integer(std::string_view key, int lowest, int highest, int otherwise);
+
+    /// Bytes written as a text of hexadecimal digits; empty if the key is missing.
+    Bytes bytes(std::string_view key);
+
+    /// A single byte of hexadecimal digits.
+    std::uint8_t byte(std::string_view key);
+
+    std::vector<std::string> texts(std::string_view key);
+    std::vector<std::uint16_t> words(std::string_view key);
+
+    /// Calls `read` with the table at `key`, if it is there, and then finishes it.
+    void table(std::string_view key, const std::function<void(TableReader&)>& read);
+
+    /// The same for each table of an array.
+    void tables(std::string_view key, const std::function<void(TableReader&)>& read);
+
+    /// For tables whose keys are hexadecimal bytes: each key with its value,
+    /// which is one text or an array of texts.
+    void entries(const std::function<void(const Bytes& key, const std::vector<Bytes>& values)>& read);
+
+    /// The same for keys with a table behind each.
+    void tableEntries(const std::function<void(const Bytes& key, TableReader& value)>& read);
+
+    void finish();
+
+    [[noreturn]] void fail(std::string_view key, const std::string& what) const;
+
+private:
+    const toml::node* find(std::string_view key);
+    const toml::node& need(std::string_view key);
+    Bytes keyBytes(const toml::key& key);
+    Bytes hex(const toml::node& node) const;
+    std::string string(const toml::node& node, std::string_view key) const;
+    [[noreturn]] void failAt(const toml::node& node, const std::string& what) const;
+
+    const toml::table& m_table;
+    std::string m_origin;
+    std::string m_title;
+    std::set<std::string, std::less<>> m_known;
+};
+
+} // namespace obdsim

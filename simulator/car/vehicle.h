@@ -1,0 +1,40 @@
+#pragma once
+
+#include "simulator/car/module.h"
+
+namespace obdsim {
+
+/// One message of one module, before the bus cuts it into frames.
+struct ModuleMessage
+{
+    std::uint32_t source = 0;
+    Time delay{}; ///< from the end of the request
+    Bytes payload;
+};
+
+/// A car: its control modules on one bus.
+class Vehicle
+{
+public:
+    explicit Vehicle(const VehicleData& data);
+
+    const std::string& name() const;
+    const Protocol& protocol() const;
+    Padding padding() const;
+
+    /// Voltage at the diagnostic socket.
+    double volts(Time now) const;
+
+    /// What the modules say to a request, in the order of time.
+    std::vector<ModuleMessage> request(const Target& target, const Bytes& payload, Time now);
+
+private:
+    std::string m_name;
+    const Protocol& m_protocol;
+    Padding m_padding;
+    std::optional<double> m_volts;
+    DriveModel m_drive;
+    std::vector<Module> m_modules;
+};
+
+} // namespace obdsim

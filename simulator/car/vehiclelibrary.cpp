@@ -1,0 +1,47 @@
+#include "simulator/car/vehiclelibrary.h"
+
+#include "simulator/car/embeddedvehicles.h"
+
+#include <fstream>
+#include <iterator>
+
+namespace obdsim {
+
+namespace {
+
+std::string readFile(const std::string& path)
+{
+    std::ifstream file(path, std::ios::binary);
+    std::string text{std::istreambuf_iterator<char>(file), std::istreambuf_iterator<char>()};
+    if (!file.is_open() || file.bad()) {
+        std::string names;
+        for (const auto& name : vehicleNames()) {
+            names += names.empty() ? name : ", " + name;
+        }
+        throw VehicleFileError(path + ": no such file, and no vehicle of that name; the vehicles are " + names);
+    }
+    return text;
+}
+
+} // namespace
+
+std::vector<std::string> vehicleNames()
+{
+    std::vector<std::string> names;
+    for (std::size_t i = 0; i < embeddedVehicleCount; ++i) {
+        names.emplace_back(embeddedVehicles[i].name);
+    }
+    return names;
+}
+
+VehicleData loadVehicle(const std::string& nameOrPath)
+{
+    for (std::size_t i = 0; i < embeddedVehicleCount; ++i) {
+        if (nameOrPath == embeddedVehicles[i].name) {
+            return parseVehicle(embeddedVehicles[i].text, nameOrPath + ".toml");
+        }
+    }
+    return parseVehicle(readFile(nameOrPath), nameOrPath);
+}
+
+} // namespace obdsim
