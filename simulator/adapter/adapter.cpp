@@ -1,0 +1,339 @@
+#include "simulator/adapter/adapter.h"
+
+#include <algorithm>
+#include <utility>
+
+namespace obdsim {
+
+namespace {
+
+constexpr char carriageReturn = '\r';
+constexpr Time commandTime{4};
+constexpr Time slowPrompt{250};
+constexpr std::size_t longestLine = 254;
+constexpr std::size_t canDataLimit = 8;
+
+std::string chipCommand(const std::string& line)
+{
+    return line.substr(0, 2);
+}
+
+} // namespace
+
+Adapter::Adapter(AdapterProfile profile, std::shared_ptr<Vehicle> vehicle, std::shared_ptr<IScript> script)
+    : m_profile(std::move(profile)), m_script(std::move(script)), m_bus(std::move(vehicle), m_profile.quirks)
+{
+    m_settings.linefeeds = has(Quirk::LinefeedsOn);
+    connect();
+}
+
+void Adapter::receive(std::string_view bytes)
+{
+    if (m_profile.family == AdapterFamily::Silent) {
+        return;
+    }
+    for (const char character : bytes) {
+        receiveOne(character);
+    }
+}
+
+std::optional<Time> Adapter::nextOutput() const
+{
+    return m_output.next();
+}
+
+std::string Adapter::advanceTo(Time time)
+{
+    m_now = std::max(m_now, time);
+    return m_output.take(m_now);
+}
+
+Time Adapter::now() const
+{
+    return m_now;
+}
+
+void Adapter::connect()
+{
+    m_output.clear();
+    m_line.clear();
+    m_heldBack.clear();
+    m_state = State::Ready;
+    m_firstCommand = true;
+    if (has(Quirk::Greeting)) {
+        sayRaw(Time(20), "+CONNECTING<<00:00:00:00:00:00\r\n");
+    }
+}
+
+bool Adapter::linkIsUp() const
+{
+    return true;
+}
+
+const AdapterProfile& Adapter::profile() const
+{
+    return m_profile;
+}
+
+void Adapter::receiveOne(char character)
+{
+    settle();
+    switch (m_state) {
+    case State::Busy:
+    case State::Monitoring:
+        stop();
+        return;
+    case State::Resetting:
+        return;
+    case State::Asleep:
+        m_state = State::Ready;
+        answerReset({{m_profile.banner}, After::Reset, Time(100)});
+        return;
+    case State::AwaitingRate:
+        if (character == carriageReturn) {
+            confirmRate();
+        }
+        return;
+    case State::Ready:
+        break;
+    }
+    // NUL and line feed are no characters to the adapter.
+    if (character == '\0' || character == '\n') {
+        return;
+    }
+    if (m_settings.echo || has(Quirk::EchoStuck)) {
+        say(Time(0), std::string(1, character));
+    }
+    if (character != carriageReturn) {
+        m_line += character;
+        return;
+    }
+    sayRaw(Time(0), std::exchange(m_heldBack, ""));
+    execute(std::exchange(m_line, ""));
+}
+
+/// Ends states that last for a time only.
+void Adapter::settle()
+{
+    const bool timed = m_state == State::Busy || m_state == State::Resetting || m_state == State::AwaitingRate;
+    if (timed && m_now >= m_stateUntil) {
+        m_state = State::Ready;
+    }
+}
+
+void Adapter::stop()
+{
+    m_output.clear();
+    m_state = State::Ready;
+    say(commandTime, "STOPPED\r");
+    finish(commandTime);
+}
+
+void Adapter::execute(const std::string& line)
+{
+    std::string command = normaliseCommand(line);
+    const bool first = std::exchange(m_firstCommand, false);
+    if (first && has(Quirk::StoppedFirst)) {
+        answer(obdsim::line("STOPPED"));
+        return;
+    }
+    if (command.empty()) {
+        command = m_last;
+    }
+    if (command.empty() || line.size() > longestLine) {
+        answer(refused());
+        return;
+    }
+    m_last = command;
+    if (command.compare(0, 2, "AT") == 0) {
+        executeCommand(command);
+    } else if (chipCommand(command) == "ST" || chipCommand(command) == "VT") {
+        answerChip(command);
+    } else {
+        executeRequest(command);
+    }
+}
+
+void Adapter::executeCommand(const std::string& command)
+{
+    const Settings before = m_settings;
+    const CommandReply reply = run(command);
+    if (playScript(m_script ? m_script->toCommand(command, before) : std::nullopt)) {
+        return;
+    }
+    if (reply.after == After::Reset) {
+        m_last.clear();
+        answerReset(reply);
+        return;
+    }
+    if (command == "ATE0" && has(Quirk::PromptLate)) {
+        say(commandTime, reply.lines.front());
+        m_heldBack = "\r\r>";
+        return;
+    }
+    answer(reply);
+}
+
+CommandReply Adapter::run(const std::string& command)
+{
+    CommandContext context{m_profile, m_settings, m_bus, m_now};
+    if (const auto call = findCommand(m_profile, command.substr(2))) {
+        return call->command->handler(context, call->argument);
+    }
+    return has(Quirk::OkToAll) ? ok() : refused();
+}
+
+/// Commands of the STN chips, which begin with ST, and of the programs on them.
+void Adapter::answerChip(const std::string& command)
+{
+    if (playScript(m_script ? m_script->toCommand(command, m_settings) : std::nullopt)) {
+        return;
+    }
+    if (m_profile.family != AdapterFamily::Stn || chipCommand(command) == "VT") {
+        answer(refused());
+    } else {
+        answer(command == "STI" ? line(m_profile.chip) : ok());
+    }
+}
+
+void Adapter::executeRequest(const std::string& request)
+{
+    if (playScript(m_script ? m_script->toRequest(request, m_settings, m_bus) : std::nullopt)) {
+        return;
+    }
+    const bool counted = request.size() % 2 != 0;
+    const auto data = parseHex(counted ? request.substr(0, request.size() - 1) : request);
+    const bool countRefused = counted && has(Quirk::NoCountDigit);
+    if (!data || data->empty() || data->size() > canDataLimit || countRefused) {
+        answer(refused());
+        return;
+    }
+    BusRequest busRequest{*data, std::nullopt};
+    if (counted) {
+        busRequest.expected = static_cast<int>(parseHexNumber(request.substr(request.size() - 1)).value_or(1));
+    }
+    const BusReply reply = m_bus.request(busRequest, m_settings, m_now);
+    for (const auto& part : reply.texts) {
+        say(commandTime + part.delay, part.text);
+    }
+    m_state = State::Busy;
+    m_stateUntil = m_now + commandTime + reply.end;
+    const bool cutShort = !m_bus.isOpen() || reply.texts.empty() || reply.texts.back().text != "OK\r";
+    if (cutShort) {
+        finish(commandTime + reply.end);
+    }
+}
+
+bool Adapter::playScript(const std::optional<std::vector<TimedText>>& texts)
+{
+    if (!texts) {
+        return false;
+    }
+    for (const auto& part : *texts) {
+        sayRaw(commandTime + part.delay, part.text);
+    }
+    return true;
+}
+
+void Adapter::answer(const CommandReply& reply)
+{
+    const Time delay = commandTime + reply.delay;
+    if (reply.after == After::Monitor) {
+        m_state = State::Monitoring;
+        return;
+    }
+    for (const auto& text : reply.lines) {
+        say(delay, text + "\r");
+    }
+    if (reply.after == After::BaudRate) {
+        answerBaudRate();
+        return;
+    }
+    finish(delay);
+    if (reply.after == After::Sleep) {
+        m_state = State::Asleep;
+    }
+}
+
+void Adapter::answerReset(const CommandReply& reply)
+{
+    const Time delay = commandTime + reply.delay;
+    if (has(Quirk::QuestionBeforeBanner)) {
+        say(delay, "?\r");
+    }
+    sayRaw(delay, has(Quirk::JunkBeforeBanner) ? "\xFC" : "");
+    say(delay, "\r\r" + reply.lines.front() + "\r");
+    finish(delay);
+    if (has(Quirk::DoublePrompt)) {
+        finish(delay);
+    }
+    for (int i = 0; i < 10 && has(Quirk::LeftoverQuestions); ++i) {
+        say(delay, "?\r");
+        finish(delay);
+    }
+    m_state = State::Resetting;
+    m_stateUntil = m_now + delay;
+}
+
+/// ATBRD: OK at the old rate, the identity at the new one, then a CR from the
+/// host within ATBRT proves that it can read it. Without one the adapter goes
+/// back to the old rate and its prompt.
+void Adapter::answerBaudRate()
+{
+    constexpr Time switching{10};
+    say(commandTime + switching, m_profile.banner + "\r");
+    const Time wait = commandTime + switching + m_settings.baudWait;
+    finish(wait);
+    m_state = State::AwaitingRate;
+    m_stateUntil = m_now + wait;
+}
+
+void Adapter::confirmRate()
+{
+    m_output.clear();
+    m_state = State::Ready;
+    say(commandTime, "OK\r");
+    finish(commandTime);
+}
+
+/// The end of a reply: an empty line and the prompt.
+void Adapter::finish(Time delay)
+{
+    const Time prompt = delay + (has(Quirk::PromptSlow) ? slowPrompt : Time(0));
+    say(prompt, has(Quirk::SingleReturn) ? "" : "\r");
+    sayRaw(prompt, ">");
+}
+
+void Adapter::say(Time delay, const std::string& text)
+{
+    if (!m_settings.linefeeds) {
+        sayRaw(delay, text);
+        return;
+    }
+    std::string withFeeds;
+    for (const char character : text) {
+        withFeeds += character;
+        withFeeds += character == carriageReturn ? "\n" : "";
+    }
+    sayRaw(delay, withFeeds);
+}
+
+void Adapter::sayRaw(Time delay, const std::string& text)
+{
+    constexpr std::size_t piece = 5;
+    constexpr Time gap{15};
+    if (!has(Quirk::Pieces)) {
+        m_output.push(m_now + delay, text);
+        return;
+    }
+    for (std::size_t at = 0; at < text.size(); at += piece) {
+        m_output.push(std::max(m_now + delay, m_output.end(m_now)) + gap, text.substr(at, piece));
+    }
+}
+
+bool Adapter::has(Quirk quirk) const
+{
+    return m_profile.quirks.has(quirk);
+}
+
+} // namespace obdsim

@@ -1,0 +1,87 @@
+#pragma once
+
+#include "simulator/adapter/command.h"
+#include "simulator/outputqueue.h"
+
+namespace obdsim {
+
+/// Answers that stand ready before the adapter thinks of its own: a recorded
+/// dialogue. Commands come in capitals and without blanks.
+class IScript
+{
+public:
+    virtual ~IScript() = default;
+
+    /// The bytes that answer an AT command, without its echo; nothing to let the
+    /// adapter answer. The effect on its settings takes place either way;
+    /// `settings` are those before it.
+    virtual std::optional<std::vector<TimedText>> toCommand(const std::string& command, const Settings& settings) = 0;
+
+    /// The same for a request to the bus. `bus` may be told the protocol in use.
+    virtual std::optional<std::vector<TimedText>> toRequest(const std::string& request, const Settings& settings,
+                                                            BusLink& bus) = 0;
+};
+
+/// An emulated adapter of the ELM327 kind, byte for byte: echo, line ends, prompt,
+/// AT commands, bus requests.
+class Adapter : public IPeer
+{
+public:
+    /// `vehicle` may be null: nothing is plugged in.
+    Adapter(AdapterProfile profile, std::shared_ptr<Vehicle> vehicle, std::shared_ptr<IScript> script = nullptr);
+    Adapter(const Adapter&) = delete;
+    Adapter& operator=(const Adapter&) = delete;
+
+    void receive(std::string_view bytes) override;
+    std::optional<Time> nextOutput() const override;
+    std::string advanceTo(Time time) override;
+    Time now() const override;
+    void connect() override;
+    bool linkIsUp() const override;
+
+    const AdapterProfile& profile() const;
+
+private:
+    enum class State : int
+    {
+        Ready,
+        Busy,      ///< with the bus; a character interrupts
+        Resetting, ///< deaf until the banner is out
+        Monitoring,
+        Asleep,
+        AwaitingRate ///< for the CR that confirms a new line rate
+    };
+
+    void receiveOne(char character);
+    void settle();
+    void stop();
+    void execute(const std::string& line);
+    void executeCommand(const std::string& command);
+    void executeRequest(const std::string& request);
+    CommandReply run(const std::string& command);
+    bool playScript(const std::optional<std::vector<TimedText>>& texts);
+    void answer(const CommandReply& reply);
+    void answerReset(const CommandReply& reply);
+    void answerBaudRate();
+    void confirmRate();
+    void answerChip(const std::string& command);
+    void finish(Time delay);
+    void say(Time delay, const std::string& text);
+    void sayRaw(Time delay, const std::string& text);
+    bool has(Quirk quirk) const;
+
+    AdapterProfile m_profile;
+    std::shared_ptr<IScript> m_script;
+    Settings m_settings;
+    BusLink m_bus;
+    OutputQueue m_output;
+    std::string m_line;
+    std::string m_last;
+    std::string m_heldBack; ///< end of a reply that waits for the next command
+    Time m_now{};
+    Time m_stateUntil{};
+    State m_state = State::Ready;
+    bool m_firstCommand = true;
+};
+
+} // namespace obdsim

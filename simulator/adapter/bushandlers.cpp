@@ -1,0 +1,156 @@
+#include "simulator/adapter/handlers.h"
+
+namespace obdsim::handler {
+
+namespace {
+
+constexpr std::uint32_t largestProtocol = 0xC;
+
+/// The bytes of a header of 3, 6 or 8 digits; 11-bit identifiers take two bytes.
+Bytes headerBytes(const std::string& digits)
+{
+    return parseHex(digits.size() % 2 == 0 ? digits : "0" + digits).value_or(Bytes{});
+}
+
+CommandReply fromBus(const BusReply& reply)
+{
+    std::string text;
+    for (const auto& part : reply.texts) {
+        text += part.text;
+    }
+    text.pop_back();
+    return {{text}, After::Nothing, reply.end};
+}
+
+} // namespace
+
+CommandReply setProtocol(CommandContext& context, const std::string& argument)
+{
+    const bool searches = argument.size() > 1 && argument[0] == 'A';
+    const auto number = parseHexNumber(searches ? argument.substr(1) : argument).value_or(0);
+    if (number > largestProtocol) {
+        return refused();
+    }
+    context.bus.select(static_cast<int>(number), searches || number == 0);
+    return ok();
+}
+
+CommandReply describeProtocol(CommandContext& context, const std::string& /*argument*/)
+{
+    return line(context.bus.description());
+}
+
+CommandReply protocolNumber(CommandContext& context, const std::string& /*argument*/)
+{
+    return line(context.bus.numberText());
+}
+
+CommandReply closeProtocol(CommandContext& context, const std::string& /*argument*/)
+{
+    context.bus.close();
+    return ok();
+}
+
+CommandReply header(CommandContext& context, const std::string& argument)
+{
+    constexpr std::size_t fourBytes = 8;
+    if (argument.size() == fourBytes && context.profile.level < 20) {
+        return refused();
+    }
+    context.settings.header = headerBytes(argument);
+    return ok();
+}
+
+CommandReply priority(CommandContext& context, const std::string& argument)
+{
+    context.settings.priority = static_cast<std::uint8_t>(parseHexNumber(argument).value_or(0));
+    return ok();
+}
+
+CommandReply canFilter(CommandContext& context, const std::string& argument)
+{
+    context.settings.canFilter = parseHexNumber(argument);
+    return ok();
+}
+
+CommandReply canMask(CommandContext& context, const std::string& argument)
+{
+    context.settings.canMask = parseHexNumber(argument);
+    return ok();
+}
+
+/// Filter and mask in one; without an address back to hearing all.
+CommandReply canAddress(CommandContext& context, const std::string& argument)
+{
+    context.settings.canFilter = parseHexNumber(argument);
+    context.settings.canMask.reset();
+    return ok();
+}
+
+CommandReply receiveAddress(CommandContext& context, const std::string& argument)
+{
+    context.settings.receiveAddress = static_cast<std::uint8_t>(parseHexNumber(argument).value_or(0));
+    return ok();
+}
+
+CommandReply automaticReceive(CommandContext& context, const std::string& /*argument*/)
+{
+    context.settings.receiveAddress.reset();
+    context.settings.canFilter.reset();
+    context.settings.canMask.reset();
+    return ok();
+}
+
+CommandReply slowInit(CommandContext& context, const std::string& /*argument*/)
+{
+    return fromBus(context.bus.wake(BusInit::FiveBaud));
+}
+
+CommandReply fastInit(CommandContext& context, const std::string& /*argument*/)
+{
+    return fromBus(context.bus.wake(BusInit::Fast));
+}
+
+CommandReply monitor(CommandContext& /*context*/, const std::string& /*argument*/)
+{
+    return {{}, After::Monitor, Time(0)};
+}
+
+CommandReply canStatus(CommandContext& /*context*/, const std::string& /*argument*/)
+{
+    return line("T:00 R:00 ");
+}
+
+/// The adapter's message buffer: its length, and twelve bytes.
+CommandReply bufferDump(CommandContext& context, const std::string& /*argument*/)
+{
+    Bytes buffer(13, 0);
+    const Bytes* header = context.settings.header ? &*context.settings.header : nullptr;
+    buffer[0] = header == nullptr ? std::uint8_t{0} : static_cast<std::uint8_t>(header->size());
+    for (std::size_t i = 0; header != nullptr && i < header->size(); ++i) {
+        buffer[i + 1] = (*header)[i];
+    }
+    return line(hexText(buffer, " ") + " ");
+}
+
+/// Key words exist once a K line has been woken: 08 08 on ISO 9141-2, 8F E9 on KWP.
+CommandReply keywords(CommandContext& context, const std::string& /*argument*/)
+{
+    const Protocol* protocol = context.bus.protocol();
+    if (protocol == nullptr || protocol->init == BusInit::None || !context.bus.isOpen()) {
+        return line("1:-- 2:--");
+    }
+    return line(protocol->family == BusFamily::Kwp ? "1:E9 2:8F" : "1:08 2:08");
+}
+
+/// Diamex adapters repeat the chosen number: "6=ISO 15765-4 (CAN 11/500)".
+CommandReply diamexProtocol(CommandContext& context, const std::string& argument)
+{
+    const CommandReply reply = setProtocol(context, argument);
+    if (reply.lines.front() == "?") {
+        return reply;
+    }
+    return line(argument + "=" + context.bus.description());
+}
+
+} // namespace obdsim::handler

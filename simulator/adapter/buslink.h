@@ -1,0 +1,95 @@
+#pragma once
+
+#include "simulator/adapter/profile.h"
+#include "simulator/adapter/settings.h"
+#include "simulator/car/vehicle.h"
+
+#include <memory>
+
+namespace obdsim {
+
+/// Text of a reply and when it is said, counted from the request. Lines end in CR.
+struct TimedText
+{
+    Time delay{};
+    std::string text;
+};
+
+/// The text of one reply, without the final CR and prompt, and its duration.
+struct BusReply
+{
+    std::vector<TimedText> texts;
+    Time end{};
+};
+
+/// A frame and when it comes, counted from the end of the request.
+struct TimedFrame
+{
+    Time time{};
+    Frame frame;
+};
+
+/// A request from the host.
+struct BusRequest
+{
+    Bytes data;
+    std::optional<int> expected; ///< number of frames to wait for
+};
+
+/// The bus side of an adapter: the chosen protocol, the search, the wake-up of the
+/// K line, and the requests.
+class BusLink
+{
+public:
+    /// `vehicle` may be null: a socket without a car. `quirks` must outlive this.
+    BusLink(std::shared_ptr<Vehicle> vehicle, const Quirks& quirks);
+
+    /// ATSP and ATTP: 0 for automatic. `automatic`: search if it fails.
+    void select(int number, bool automatic);
+
+    /// ATPC: the next request starts the bus anew.
+    void close();
+
+    int number() const;
+    bool automatic() const;
+
+    /// ATDPN: "A6", "6".
+    std::string numberText() const;
+
+    /// ATDP.
+    std::string description() const;
+
+    /// The protocol whose formats are in use; null before a search has found it.
+    const Protocol* protocol() const;
+
+    BusReply request(const BusRequest& request, const Settings& settings, Time now);
+
+    /// ATSI and ATFI: wakes the bus.
+    BusReply wake(BusInit init);
+
+    /// A protocol found by other means than a search of this link.
+    void assume(int number);
+
+    /// The bus has been started and found alive.
+    bool isOpen() const;
+
+    double volts(Time now) const;
+
+private:
+    bool establish(BusReply& reply);
+    bool search(BusReply& reply);
+    bool start(BusReply& reply);
+    bool reaches(const Protocol& protocol) const;
+    BusReply exchange(const BusRequest& request, const Settings& settings, BusReply reply, Time now);
+    std::vector<TimedFrame> send(const BusRequest& request, const Settings& settings, Time at);
+    void fail(BusReply& reply) const;
+
+    std::shared_ptr<Vehicle> m_vehicle;
+    const Quirks& m_quirks;
+    int m_number = 0;
+    bool m_automatic = true;
+    bool m_open = false;
+    bool m_asked = false; ///< a request has been sent since the protocol was chosen
+};
+
+} // namespace obdsim

@@ -1,0 +1,64 @@
+#pragma once
+
+#include "simulator/adapter/buslink.h"
+
+namespace obdsim {
+
+/// What an adapter does beside answering.
+enum class After : int
+{
+    Nothing,
+    Reset,    ///< banner instead of a plain reply
+    BaudRate, ///< the confirmation dialogue of ATBRD
+    Sleep,    ///< low power until a character wakes it
+    Monitor   ///< listens until a character stops it
+};
+
+/// Answer of a command: lines without their CR.
+struct CommandReply
+{
+    std::vector<std::string> lines;
+    After after = After::Nothing;
+    Time delay{}; ///< before the answer
+};
+
+/// What a command may read and change.
+struct CommandContext
+{
+    const AdapterProfile& profile;
+    Settings& settings;
+    BusLink& bus;
+    Time now;
+};
+
+using CommandHandler = CommandReply (*)(CommandContext& context, const std::string& argument);
+
+/// One AT command.
+///
+/// `shape` tells what may follow the name, alternatives divided by "|": h stands
+/// for a hexadecimal digit, f for 0 or 1, t for 0 to 2, * for any hexadecimal
+/// digits, any other character for itself.
+struct Command
+{
+    const char* name;
+    const char* shape;
+    int level; ///< since this version of the ELM327, times ten
+    unsigned int families;
+    CommandHandler handler;
+};
+
+/// A command with what stands behind its name.
+struct CommandCall
+{
+    const Command* command;
+    std::string argument;
+};
+
+/// Finds the AT command in `text` (normalised, without "AT") for an adapter.
+std::optional<CommandCall> findCommand(const AdapterProfile& profile, const std::string& text);
+
+CommandReply ok();
+CommandReply refused();
+CommandReply line(std::string text);
+
+} // namespace obdsim

@@ -1,0 +1,97 @@
+#include "simulator/adapter/profile.h"
+
+#include <algorithm>
+#include <iterator>
+
+namespace obdsim {
+
+namespace {
+
+constexpr const char* elmDescription = "OBDII to RS232 Interpreter";
+
+// clang-format off
+const AdapterProfile profiles[] = {
+    {"elm327-v1.5", AdapterFamily::Elm, "ELM327 v1.5", elmDescription, "", 14, "", {}},
+    {"elm327-v1.2", AdapterFamily::Elm, "ELM327 v1.2", elmDescription, "", 12, "", {}},
+    {"elm327-v1.3a", AdapterFamily::Elm, "ELM327 v1.3a", elmDescription, "", 13, "", {}},
+    {"elm327-v1.4", AdapterFamily::Elm, "ELM327 v1.4", elmDescription, "", 14, "", {}},
+    {"elm327-v2.1", AdapterFamily::Elm, "ELM327 v2.1", elmDescription, "", 14, "", {}},
+    {"elm327-v2.2", AdapterFamily::Elm, "ELM327 v2.2", elmDescription, "", 22, "", {}},
+    {"elm327-v2.3", AdapterFamily::Elm, "ELM327 v2.3", elmDescription, "", 23, "", {}},
+    {"stn2120", AdapterFamily::Stn, "ELM327 v2.3", elmDescription, "", 23, "STN2120 v5.8.1", {}},
+    {"obdlink", AdapterFamily::Stn, "ELM327 v1.3a", elmDescription, "", 23, "STN1110 v4.2.0", {}},
+    {"clone-v1.5-fake", AdapterFamily::Elm, "ELM327 v1.5", elmDescription, "", 14, "",
+        {Quirk::OkToAll, Quirk::JunkBeforeBanner}},
+    {"clone-v2.1-poor", AdapterFamily::Elm, "ELM327 v2.1", elmDescription, "", 12, "",
+        {Quirk::FirstLettersOnly, Quirk::HeadersStuck, Quirk::NoCountDigit}},
+    {"obdkey", AdapterFamily::ObdKey, "OBDKey 1.30", "OBDKey Bluetooth", "KB-0130", 13, "", {}},
+    {"diamex", AdapterFamily::Diamex, "DIAMEX DXM v1.2", "DIAMEX DXM Module", "DX-20071", 13, "", {}},
+    {"kiwi", AdapterFamily::Kiwi, "PLXKiwi v1.4", "PLX Kiwi WiFi", "PLX-4711", 13, "", {}},
+    {"obdpros", AdapterFamily::ObdPros, "OBDPros v3.1", "OBDPros Scantool", "OP-3100", 12, "", {}},
+    {"unknown", AdapterFamily::Other, "CarWave Adapter 7", "CarWave Diagnostics", "CW-0007", 13, "", {}},
+    {"silent", AdapterFamily::Silent, "", "", "", 0, "", {}},
+};
+// clang-format on
+
+struct FamilyWord
+{
+    const char* word;
+    const char* key;
+};
+
+constexpr FamilyWord familyWords[] = {
+    {"ELM", "elm327-v1.5"}, {"OBDKEY", "obdkey"}, {"DIAMEX", "diamex"}, {"PLXKIWI", "kiwi"}, {"OBDPRO", "obdpros"},
+};
+
+std::string upperCase(std::string text)
+{
+    for (auto& character : text) {
+        if (character >= 'a' && character <= 'z') {
+            character = static_cast<char>(character - 0x20);
+        }
+    }
+    return text;
+}
+
+const AdapterProfile& familyProfile(const std::string& banner)
+{
+    const std::string text = upperCase(banner);
+    for (const auto& row : familyWords) {
+        if (text.find(row.word) != std::string::npos) {
+            return *findProfile(row.key);
+        }
+    }
+    return *findProfile("unknown");
+}
+
+} // namespace
+
+const AdapterProfile* findProfile(std::string_view key)
+{
+    const auto found =
+        std::find_if(std::begin(profiles), std::end(profiles), [key](const AdapterProfile& p) { return p.key == key; });
+    return found == std::end(profiles) ? nullptr : &*found;
+}
+
+std::vector<std::string> profileKeys()
+{
+    std::vector<std::string> keys;
+    for (const auto& profile : profiles) {
+        keys.push_back(profile.key);
+    }
+    return keys;
+}
+
+AdapterProfile profileForBanner(const std::string& banner)
+{
+    const auto same = std::find_if(std::begin(profiles), std::end(profiles),
+                                   [&](const AdapterProfile& p) { return !banner.empty() && p.banner == banner; });
+    if (same != std::end(profiles)) {
+        return *same;
+    }
+    AdapterProfile profile = banner.empty() ? profiles[0] : familyProfile(banner);
+    profile.banner = banner.empty() ? profile.banner : banner;
+    return profile;
+}
+
+} // namespace obdsim

@@ -1,0 +1,41 @@
+#pragma once
+
+#include "simulator/adapter/quirk.h"
+
+namespace obdsim {
+
+enum class AdapterFamily : unsigned int
+{
+    Elm = 0x01,
+    Stn = 0x02, ///< an ELM327 to its host, with ST commands of its own
+    ObdKey = 0x04,
+    Diamex = 0x08,
+    Kiwi = 0x10,
+    ObdPros = 0x20,
+    Other = 0x40,
+    Silent = 0x80 ///< nothing ever comes back
+};
+
+/// An adapter model.
+struct AdapterProfile
+{
+    std::string key; ///< its name in options
+    AdapterFamily family = AdapterFamily::Elm;
+    std::string banner;      ///< answer to ATI, ATZ and ATWS
+    std::string description; ///< answer to AT@1
+    std::string identifier;  ///< answer to AT@2; empty: "?"
+    int level = 14;          ///< knows the ELM327 commands up to version level / 10
+    std::string chip;        ///< answer to STI
+    Quirks quirks;
+};
+
+/// The profile of that key; null if there is none.
+const AdapterProfile* findProfile(std::string_view key);
+
+std::vector<std::string> profileKeys();
+
+/// The profile that a recorded banner such as "ELM327 v2.1" stands for: one of the
+/// table, or the nearest one of the same family with that banner put in.
+AdapterProfile profileForBanner(const std::string& banner);
+
+} // namespace obdsim
