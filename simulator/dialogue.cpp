@@ -1,0 +1,302 @@
+#include "simulator/dialogue.h"
+
+#include "simulator/bytes.h"
+
+#include <fstream>
+#include <iterator>
+#include <numeric>
+#include <sstream>
+#include <utility>
+
+namespace obdsim {
+
+namespace {
+
+constexpr long long longestPauseMs = 24LL * 3600 * 1000;
+
+struct HeadersName
+{
+    DialogueHeaders value;
+    const char* name;
+};
+
+constexpr HeadersName headersNames[] = {
+    {DialogueHeaders::Off, "off"}, {DialogueHeaders::On, "on"}, {DialogueHeaders::Late, "late"}};
+
+/// Reads a dialogue line by line.
+class Reader
+{
+public:
+    explicit Reader(std::string origin) : m_origin(std::move(origin)) {}
+
+    Dialogue read(const std::string& text)
+    {
+        std::istringstream lines(text);
+        std::string line;
+        while (std::getline(lines, line)) {
+            ++m_line;
+            if (!line.empty() && line.back() == '\r') {
+                line.pop_back();
+            }
+            readLine(line);
+        }
+        if (m_inHeader) {
+            fail("the header has no end: a blank line and the dialogue are missing");
+        }
+        if (m_pause != Time(0)) {
+            fail("no received line follows this pause");
+        }
+        return m_dialogue;
+    }
+
+private:
+    void readLine(const std::string& line)
+    {
+        if (!line.empty() && line[0] == '#') {
+            return;
+        }
+        if (line.empty()) {
+            m_inHeader = m_inHeader && !m_hasHeader;
+            return;
+        }
+        m_inHeader ? readHeader(line) : readTurn(line);
+    }
+
+    void readHeader(const std::string& line)
+    {
+        m_hasHeader = true;
+        const auto colon = line.find(": ");
+        if (colon == std::string::npos) {
+            fail("a header line is \"name: value\"");
+        }
+        const std::string name = line.substr(0, colon);
+        const std::string value = line.substr(colon + 2);
+        if (name == "vehicle") {
+            m_dialogue.vehicle = value;
+        } else if (name == "adapter") {
+            m_dialogue.adapter = value;
+        } else if (name == "protocol") {
+            m_dialogue.protocol = protocol(value);
+        } else if (name == "headers") {
+            m_dialogue.headers = headers(value);
+        } else if (name == "raw") {
+            m_dialogue.raw = yes(value);
+        } else {
+            fail("unknown header \"" + name + "\"");
+        }
+    }
+
+    void readTurn(const std::string& line)
+    {
+        const std::string mark = line.substr(0, 2);
+        const std::string rest = line.size() > 3 ? line.substr(3) : "";
+        const bool spaced = line.size() == 2 || line[2] == ' ';
+        if (mark == "->" && spaced) {
+            if (m_pause != Time(0)) {
+                fail("no received line follows the pause before");
+            }
+            m_dialogue.exchanges.push_back({unescape(rest), {}});
+        } else if (mark == "<-" && spaced) {
+            addReceived(unescape(rest));
+        } else if (mark == ".." && spaced) {
+            m_pause += pause(rest);
+        } else {
+            fail("a line begins with \"-> \", \"<- \" or \".. \"");
+        }
+    }
+
+    void addReceived(const std::string& bytes)
+    {
+        if (m_dialogue.exchanges.empty()) {
+            fail("bytes are received before anything is sent");
+        }
+        auto& chunks = m_dialogue.exchanges.back().chunks;
+        if (m_pause == Time(0) && !chunks.empty()) {
+            chunks.back().bytes += bytes;
+            return;
+        }
+        chunks.push_back({std::exchange(m_pause, Time(0)), bytes});
+    }
+
+    std::string unescape(const std::string& text) const
+    {
+        std::string bytes;
+        for (std::size_t i = 0; i < text.size(); ++i) {
+            bytes += text[i] == '\\' ? escaped(text, i) : text[i];
+        }
+        return bytes;
+    }
+
+    /// The character of the escape at `i`, which is moved to its last character.
+    char escaped(const std::string& text, std::size_t& i) const
+    {
+        ++i;
+        switch (i < text.size() ? text[i] : '\0') {
+        case 'r':
+            return '\r';
+        case 'n':
+            return '\n';
+        case 't':
+            return '\t';
+        case '\\':
+            return '\\';
+        case 'x': {
+            const std::string digits = text.substr(i + 1, 2);
+            const auto value = digits.size() == 2 ? parseHexNumber(digits) : std::nullopt;
+            if (value) {
+                i += 2;
+                return static_cast<char>(*value);
+            }
+            break;
+        }
+        default:
+            break;
+        }
+        fail("wrong escape; there are \\r \\n \\t \\\\ and \\xNN");
+    }
+
+    int protocol(const std::string& value) const
+    {
+        if (value.size() != 1 || value[0] < '0' || value[0] > '9') {
+            fail("the protocol is a number from 0 to 9");
+        }
+        return value[0] - '0';
+    }
+
+    DialogueHeaders headers(const std::string& value) const
+    {
+        for (const auto& row : headersNames) {
+            if (value == row.name) {
+                return row.value;
+            }
+        }
+        fail("headers are \"on\", \"off\" or \"late\"");
+    }
+
+    bool yes(const std::string& value) const
+    {
+        if (value != "yes" && value != "no") {
+            fail("raw is \"yes\" or \"no\"");
+        }
+        return value == "yes";
+    }
+
+    Time pause(const std::string& text) const
+    {
+        const bool digits =
+            !text.empty() && text.size() < 10 && text.find_first_not_of("0123456789") == std::string::npos;
+        if (!digits || std::stoll(text) > longestPauseMs) {
+            fail("a pause is \".. \" and a number of milliseconds up to a day");
+        }
+        return Time(std::stoll(text));
+    }
+
+    [[noreturn]] void fail(const std::string& what) const
+    {
+        throw DialogueError(m_origin + ":" + std::to_string(m_line) + ": " + what);
+    }
+
+    std::string m_origin;
+    Dialogue m_dialogue;
+    std::size_t m_line = 0;
+    Time m_pause{};
+    bool m_inHeader = true;
+    bool m_hasHeader = false;
+};
+
+/// Escapes what a text file cannot hold; blanks at the ends, which editors cut.
+std::string escape(const std::string& bytes)
+{
+    std::string text;
+    for (std::size_t i = 0; i < bytes.size(); ++i) {
+        const char character = bytes[i];
+        const bool atEnd = i == 0 || i + 1 == bytes.size();
+        switch (character) {
+        case '\r':
+            text += "\\r";
+            break;
+        case '\n':
+            text += "\\n";
+            break;
+        case '\t':
+            text += "\\t";
+            break;
+        case '\\':
+            text += "\\\\";
+            break;
+        default:
+            const bool plain = character > ' ' && character < '\x7F';
+            const bool blank = character == ' ' && !atEnd;
+            text += plain || blank ? std::string(1, character) : "\\x" + hexByte(static_cast<std::uint8_t>(character));
+        }
+    }
+    return text;
+}
+
+/// One "<-" line for each line of a reply; the prompt stays with the last.
+std::string receivedLines(const std::string& bytes)
+{
+    std::string text;
+    std::size_t from = 0;
+    while (from < bytes.size()) {
+        auto end = bytes.find_first_not_of("\r\n>", from);
+        end = end == std::string::npos ? bytes.size() : bytes.find_first_of("\r\n>", end);
+        end = end == std::string::npos ? bytes.size() : bytes.find_first_not_of("\r\n>", end);
+        end = end == std::string::npos ? bytes.size() : end;
+        text += "<- " + escape(bytes.substr(from, end - from)) + "\n";
+        from = end;
+    }
+    return text;
+}
+
+std::string headerText(const Dialogue& dialogue)
+{
+    std::string text = "vehicle: " + dialogue.vehicle + "\nadapter: " + dialogue.adapter +
+                       "\nprotocol: " + std::to_string(dialogue.protocol) + "\n";
+    for (const auto& row : headersNames) {
+        text += row.value == dialogue.headers ? std::string("headers: ") + row.name + "\n" : "";
+    }
+    return text + (dialogue.raw ? "raw: yes\n" : "");
+}
+
+} // namespace
+
+std::string Exchange::received() const
+{
+    return std::accumulate(chunks.begin(), chunks.end(), std::string(),
+                           [](std::string all, const DialogueChunk& chunk) { return std::move(all) + chunk.bytes; });
+}
+
+Dialogue parseDialogue(const std::string& text, const std::string& origin)
+{
+    return Reader(origin).read(text);
+}
+
+Dialogue loadDialogue(const std::string& path)
+{
+    std::ifstream file(path, std::ios::binary);
+    const std::string text{std::istreambuf_iterator<char>(file), std::istreambuf_iterator<char>()};
+    if (!file.is_open() || file.bad()) {
+        throw DialogueError(path + ": cannot be read");
+    }
+    return parseDialogue(text, path);
+}
+
+std::string formatDialogue(const Dialogue& dialogue, const std::vector<std::string>& comment)
+{
+    std::string text;
+    for (const auto& line : comment) {
+        text += "# " + line + "\n";
+    }
+    text += headerText(dialogue) + "\n";
+    for (const auto& exchange : dialogue.exchanges) {
+        text += exchange.sent.empty() ? "->\n" : "-> " + escape(exchange.sent) + "\n";
+        for (const auto& chunk : exchange.chunks) {
+            text += chunk.pause == Time(0) ? "" : ".. " + std::to_string(chunk.pause.count()) + "\n";
+            text += receivedLines(chunk.bytes);
+        }
+    }
+    return text;
+}
+
+} // namespace obdsim

@@ -1,0 +1,183 @@
+#include "simulator/fault.h"
+
+#include <algorithm>
+#include <iterator>
+#include <locale>
+#include <sstream>
+
+namespace obdsim {
+
+namespace {
+
+/// The forms of one kind of fault: NAME=P by chance, NAME@N at a place, NAME=MS.
+struct FaultForm
+{
+    const char* name;
+    FaultKind kind;
+    bool chance;
+    bool place;
+    bool time; ///< behind the place as ":MS", or alone as "=MS"
+};
+
+constexpr FaultForm forms[] = {
+    {"garbage", FaultKind::Garbage, true, false, false}, {"nul", FaultKind::Nul, true, false, false},
+    {"prompt", FaultKind::Prompt, true, true, false},    {"cut", FaultKind::Cut, false, true, false},
+    {"stall", FaultKind::Stall, false, true, true},      {"slow", FaultKind::Slow, false, false, true},
+    {"loss", FaultKind::Loss, false, true, false},       {"error", FaultKind::Error, true, true, false},
+};
+
+constexpr const char* usage =
+    "the faults are garbage=P, nul=P, prompt=P, prompt@COMMAND, cut@BYTE, stall@BYTE:MS, slow=MS, loss@BYTE, "
+    "error:WORDS@COMMAND, error:WORDS=P, echo, quirk:NAME and seed=N";
+
+[[noreturn]] void fail(const std::string& text, const std::string& why)
+{
+    throw FaultError("fault \"" + text + "\": " + why);
+}
+
+/// Splits at the last of `character`; the second part is empty if there is none.
+std::pair<std::string, std::string> splitAtLast(const std::string& text, char character)
+{
+    const auto at = text.rfind(character);
+    if (at == std::string::npos) {
+        return {text, ""};
+    }
+    return {text.substr(0, at), text.substr(at + 1)};
+}
+
+std::optional<std::uint64_t> wholeNumber(const std::string& text)
+{
+    const bool digits = !text.empty() && text.size() < 10 && text.find_first_not_of("0123456789") == std::string::npos;
+    return digits ? std::optional<std::uint64_t>(std::stoull(text)) : std::nullopt;
+}
+
+double probability(const std::string& fault, const std::string& text)
+{
+    std::istringstream stream(text);
+    stream.imbue(std::locale::classic());
+    double value = -1;
+    stream >> value;
+    if (!stream || !stream.eof() || value < 0 || value > 1) {
+        fail(fault, "a probability is a number from 0 to 1");
+    }
+    return value;
+}
+
+Time milliseconds(const std::string& fault, const std::string& text)
+{
+    const auto value = wholeNumber(text);
+    if (!value) {
+        fail(fault, "a time is a whole number of milliseconds");
+    }
+    return Time(*value);
+}
+
+std::uint64_t position(const std::string& fault, const std::string& text)
+{
+    const auto value = wholeNumber(text);
+    if (!value || *value == 0) {
+        fail(fault, "a place is a whole number from 1 on");
+    }
+    return *value;
+}
+
+Fault parseAtPlace(const std::string& text, const FaultForm& form, Fault fault, const std::string& place)
+{
+    if (!form.place) {
+        fail(text, usage);
+    }
+    const auto [number, time] = splitAtLast(place, ':');
+    fault.position = position(text, number);
+    if (form.time) {
+        fault.duration = milliseconds(text, time);
+    } else if (number != place) {
+        fail(text, usage);
+    }
+    return fault;
+}
+
+Fault parseByValue(const std::string& text, const FaultForm& form, Fault fault, const std::string& value)
+{
+    if (form.chance) {
+        fault.probability = probability(text, value);
+    } else if (form.time && !form.place) {
+        fault.duration = milliseconds(text, value);
+    } else {
+        fail(text, usage);
+    }
+    return fault;
+}
+
+Fault parseFault(const std::string& text)
+{
+    const auto mark = text.find_first_of("=@:");
+    const std::string name = text.substr(0, mark);
+    const auto form =
+        std::find_if(std::begin(forms), std::end(forms), [&](const FaultForm& f) { return f.name == name; });
+    if (form == std::end(forms) || mark == std::string::npos) {
+        fail(text, usage);
+    }
+    Fault fault;
+    fault.kind = form->kind;
+    std::string rest = text.substr(mark);
+    if (form->kind == FaultKind::Error) {
+        const auto end = rest.find_last_of("=@");
+        if (rest[0] != ':' || end == std::string::npos || end < 2) {
+            fail(text, usage);
+        }
+        fault.word = rest.substr(1, end - 1);
+        rest = rest.substr(end);
+    }
+    if (rest[0] == '@') {
+        return parseAtPlace(text, *form, fault, rest.substr(1));
+    }
+    if (rest[0] == '=') {
+        return parseByValue(text, *form, fault, rest.substr(1));
+    }
+    fail(text, usage);
+}
+
+Quirk parseQuirk(const std::string& text, const std::string& name)
+{
+    const auto quirk = findQuirk(name);
+    if (!quirk) {
+        std::string names;
+        for (const auto& known : quirkNames()) {
+            names += names.empty() ? known : ", " + known;
+        }
+        fail(text, "the quirks are " + names);
+    }
+    return *quirk;
+}
+
+std::uint32_t parseSeed(const std::string& text, const std::string& number)
+{
+    const auto value = wholeNumber(number);
+    if (!value) {
+        fail(text, "a seed is a whole number");
+    }
+    return static_cast<std::uint32_t>(*value);
+}
+
+} // namespace
+
+FaultPlan parseFaults(const std::vector<std::string>& texts)
+{
+    const std::string quirk = "quirk:";
+    const std::string seed = "seed=";
+    FaultPlan plan;
+    for (const auto& text : texts) {
+        if (text == "echo") {
+            plan.quirks.add(Quirk::EchoStuck);
+        } else if (text.compare(0, quirk.size(), quirk) == 0) {
+            plan.quirks.add(parseQuirk(text, text.substr(quirk.size())));
+        } else if (text.compare(0, seed.size(), seed) == 0) {
+            plan.seed = parseSeed(text, text.substr(seed.size()));
+        } else {
+            plan.faults.push_back(parseFault(text));
+        }
+    }
+    return plan;
+}
+
+} // namespace obdsim

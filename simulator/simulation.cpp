@@ -1,0 +1,59 @@
+#include "simulator/simulation.h"
+
+#include "simulator/car/vehiclelibrary.h"
+#include "simulator/faultypeer.h"
+#include "simulator/replayscript.h"
+
+namespace obdsim {
+
+namespace {
+
+AdapterProfile adapterProfile(const std::string& key)
+{
+    const AdapterProfile* profile = findProfile(key);
+    if (profile == nullptr) {
+        std::string keys;
+        for (const auto& known : profileKeys()) {
+            keys += keys.empty() ? known : ", " + known;
+        }
+        throw SimulatorError("no adapter \"" + key + "\"; the adapters are " + keys);
+    }
+    return *profile;
+}
+
+std::shared_ptr<IPeer> withFaults(std::shared_ptr<IPeer> peer, const FaultPlan& plan)
+{
+    return plan.empty() ? peer : std::make_shared<FaultyPeer>(std::move(peer), plan);
+}
+
+} // namespace
+
+std::shared_ptr<IPeer> simulate(const SimulationOptions& options)
+{
+    const FaultPlan plan = parseFaults(options.faults);
+    AdapterProfile profile = adapterProfile(options.adapter);
+    profile.quirks.add(plan.quirks);
+    auto vehicle = std::make_shared<Vehicle>(loadVehicle(options.vehicle));
+    return withFaults(std::make_shared<Adapter>(std::move(profile), std::move(vehicle)), plan);
+}
+
+std::shared_ptr<IPeer> replay(const std::string& path, const std::vector<std::string>& faults)
+{
+    const FaultPlan plan = parseFaults(faults);
+    auto script = std::make_shared<ReplayScript>(loadDialogue(path));
+    AdapterProfile profile = profileForBanner(script->banner());
+    profile.quirks.add(plan.quirks);
+    return withFaults(std::make_shared<Adapter>(std::move(profile), nullptr, std::move(script)), plan);
+}
+
+std::vector<std::string> simulatedVehicles()
+{
+    return vehicleNames();
+}
+
+std::vector<std::string> simulatedAdapters()
+{
+    return profileKeys();
+}
+
+} // namespace obdsim

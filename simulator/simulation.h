@@ -1,0 +1,30 @@
+#pragma once
+
+#include "simulator/peer.h"
+
+#include <memory>
+#include <string>
+#include <vector>
+
+namespace obdsim {
+
+/// What to simulate. The names are those of vehicleNames() and profileKeys().
+struct SimulationOptions
+{
+    std::string vehicle = "petrol-can11"; ///< or the path of a vehicle file
+    std::string adapter = "elm327-v1.5";
+    std::vector<std::string> faults; ///< in the forms of parseFaults()
+};
+
+/// An adapter with a car. Throws SimulatorError for a wrong name, file or fault.
+std::shared_ptr<IPeer> simulate(const SimulationOptions& options);
+
+/// A recorded dialogue in the part of the adapter; whatever it lacks is answered
+/// as an adapter of its kind would, requests to the bus with NO DATA.
+std::shared_ptr<IPeer> replay(const std::string& path, const std::vector<std::string>& faults = {});
+
+/// Names of the built-in vehicles and of the adapters, for help texts.
+std::vector<std::string> simulatedVehicles();
+std::vector<std::string> simulatedAdapters();
+
+} // namespace obdsim
