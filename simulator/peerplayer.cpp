@@ -1,0 +1,90 @@
+#include "simulator/peerplayer.h"
+
+#include <cmath>
+#include <utility>
+
+namespace obdsim {
+
+namespace {
+
+using Clock = std::chrono::steady_clock;
+using RealMs = std::chrono::duration<double, std::milli>;
+
+} // namespace
+
+PeerPlayer::PeerPlayer(asio::io_context& context, std::shared_ptr<IPeer> peer, double speed)
+    : m_peer(std::move(peer)), m_speed(speed), m_start(Clock::now()), m_offset(m_peer->now()), m_timer(context)
+{}
+
+void PeerPlayer::connect(Output output, LinkLost linkLost)
+{
+    m_output = std::move(output);
+    m_linkLost = std::move(linkLost);
+    m_peer->advanceTo(virtualNow());
+    m_peer->connect();
+    arm();
+}
+
+void PeerPlayer::receive(std::string_view bytes)
+{
+    const std::string before = m_peer->advanceTo(virtualNow());
+    if (m_output && !before.empty()) {
+        m_output(before);
+    }
+    m_peer->receive(bytes);
+    arm();
+}
+
+void PeerPlayer::disconnect()
+{
+    m_timer.cancel();
+    m_output = nullptr;
+    m_linkLost = nullptr;
+}
+
+Time PeerPlayer::virtualNow() const
+{
+    const RealMs passed = Clock::now() - m_start;
+    return m_offset + Time(static_cast<Time::rep>(std::floor(passed.count() * m_speed)));
+}
+
+/// Sets the timer to the peer's next output. A broken link is told at once.
+void PeerPlayer::arm()
+{
+    if (!m_output) {
+        return;
+    }
+    const auto next = m_peer->nextOutput();
+    if (!next && m_peer->linkIsUp()) {
+        m_timer.cancel();
+        return;
+    }
+    const RealMs wait{next ? static_cast<double>((*next - m_offset).count()) / m_speed : 0};
+    m_timer.expires_at(m_start + std::chrono::ceil<Clock::duration>(wait));
+    m_timer.async_wait([this](const asio::error_code& error) {
+        if (!error) {
+            play();
+        }
+    });
+}
+
+void PeerPlayer::play()
+{
+    if (!m_output) {
+        return;
+    }
+    const std::string bytes = m_peer->advanceTo(virtualNow());
+    if (!bytes.empty()) {
+        m_output(bytes);
+    }
+    if (!m_peer->linkIsUp() && !m_peer->nextOutput()) {
+        const LinkLost lost = std::exchange(m_linkLost, nullptr);
+        if (lost) {
+            lost();
+        }
+        return;
+    }
+    arm();
+}
+
+} // namespace obdsim

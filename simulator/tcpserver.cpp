@@ -1,0 +1,129 @@
+#include "simulator/serverloop.h"
+
+#include <asio/ip/tcp.hpp>
+#include <asio/write.hpp>
+
+#include <array>
+#include <deque>
+
+namespace obdsim {
+
+namespace {
+
+using asio::ip::tcp;
+
+/// Accepts a client when the one before has gone; the others wait in the queue of
+/// the system, as before a real adapter that speaks to one host at a time.
+class TcpServer : public ServerLoop
+{
+public:
+    TcpServer(std::shared_ptr<IPeer> peer, const std::string& host, std::uint16_t port, double speed)
+        : ServerLoop(std::move(peer), speed), m_acceptor(context()), m_socket(context())
+    {
+        listen(host, port);
+    }
+
+    ~TcpServer() override { stop(); }
+
+    std::string address() const override { return m_address; }
+
+protected:
+    void begin() override { accept(); }
+
+private:
+    static std::string textOf(const tcp::endpoint& endpoint)
+    {
+        const std::string host = endpoint.address().to_string();
+        return (endpoint.address().is_v6() ? "[" + host + "]" : host) + ":" + std::to_string(endpoint.port());
+    }
+
+    void listen(const std::string& host, std::uint16_t port)
+    {
+        try {
+            const auto endpoints = tcp::resolver(context()).resolve(host, std::to_string(port));
+            const tcp::endpoint endpoint = *endpoints.begin();
+            m_acceptor.open(endpoint.protocol());
+            m_acceptor.set_option(tcp::acceptor::reuse_address(true));
+            m_acceptor.bind(endpoint);
+            m_acceptor.listen();
+            m_address = textOf(m_acceptor.local_endpoint());
+        } catch (const std::system_error& error) {
+            throw ServerError("cannot listen on " + host + ":" + std::to_string(port) + ": " + error.code().message());
+        }
+    }
+
+    void accept()
+    {
+        m_acceptor.async_accept([this](const asio::error_code& error, tcp::socket socket) {
+            if (error) {
+                return;
+            }
+            m_socket = std::move(socket);
+            asio::error_code ignored;
+            m_socket.set_option(tcp::no_delay(true), ignored);
+            player().connect([this](std::string bytes) { send(std::move(bytes)); }, [this] { hangUp(); });
+            read();
+        });
+    }
+
+    void read()
+    {
+        m_socket.async_read_some(asio::buffer(m_buffer), [this](const asio::error_code& error, std::size_t size) {
+            if (error) {
+                hangUp();
+                accept();
+                return;
+            }
+            player().receive(std::string_view(m_buffer.data(), size));
+            read();
+        });
+    }
+
+    void send(std::string bytes)
+    {
+        m_unsent.push_back(std::move(bytes));
+        if (m_unsent.size() == 1) {
+            write();
+        }
+    }
+
+    void write()
+    {
+        asio::async_write(m_socket, asio::buffer(m_unsent.front()),
+                          [this](const asio::error_code& error, std::size_t /*size*/) {
+                              if (error || m_unsent.empty()) {
+                                  return; // the pending read sees the end, too
+                              }
+                              m_unsent.pop_front();
+                              if (!m_unsent.empty()) {
+                                  write();
+                              }
+                          });
+    }
+
+    /// Ends the conversation; the pending read then brings the next client in.
+    void hangUp()
+    {
+        player().disconnect();
+        asio::error_code ignored;
+        m_socket.shutdown(tcp::socket::shutdown_both, ignored);
+        m_socket.close(ignored);
+        m_unsent.clear();
+    }
+
+    tcp::acceptor m_acceptor;
+    tcp::socket m_socket;
+    std::string m_address;
+    std::array<char, 512> m_buffer{};
+    std::deque<std::string> m_unsent;
+};
+
+} // namespace
+
+std::unique_ptr<IServer> serveTcp(std::shared_ptr<IPeer> peer, const std::string& host, std::uint16_t port,
+                                  double speed)
+{
+    return std::make_unique<TcpServer>(std::move(peer), host, port, speed);
+}
+
+} // namespace obdsim
