@@ -53,11 +53,17 @@ bool extractEcuId(ObdProtocol protocol, ByteView& text, unsigned int& id)
 
 // How long the frame is only its own bytes tell. What stands behind it is decoded as far as one frame can reach and no
 // further, so that a long reply is not decoded anew for every frame.
+ByteView decodeFrame(ByteView text, std::array<unsigned char, CanResponse::MaxFrameBytes>& bytes)
+{
+    std::size_t const pciBytes = hexTextToBytes(text, std::span(bytes).first(1));
+    std::size_t const reach = pciBytes == 0 ? 0 : CanResponse::reach(bytes[0]);
+    return ByteView(bytes).first(hexTextToBytes(text, std::span(bytes).first(reach)));
+}
+
 bool extractPayload(ByteView& text, CanResponse& response)
 {
     std::array<unsigned char, CanResponse::MaxFrameBytes> bytes;
-    std::size_t const count = hexTextToBytes(text, bytes);
-    int const consumed = response.parse(ByteView(bytes.data(), count));
+    int const consumed = response.parse(decodeFrame(text, bytes));
     if (consumed < 0) {
         TERVEX_LOG(Fatal) << "Failed to parse message payload";
         return false;
@@ -98,9 +104,9 @@ bool parseCanMessages(ObdProtocol protocol, ByteView text, ResponseMap& response
     if (!parseCanFrames(protocol, text, messages)) {
         return false;
     }
-    for (auto const& [id, message] : messages) {
+    for (auto& [id, message] : messages) {
         std::vector<unsigned char> payload;
-        if (message.payload(payload)) {
+        if (std::move(message).payload(payload)) {
             responses[id] = std::move(payload);
         } else {
             tervex::TraceStream << "Invalid data received for 0x" << std::hex << id;

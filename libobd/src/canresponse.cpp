@@ -5,6 +5,7 @@
 
 #include <algorithm>
 #include <array>
+#include <utility>
 
 namespace obd {
 
@@ -49,6 +50,12 @@ int notEnoughData()
 
 } // namespace
 
+std::size_t CanResponse::reach(unsigned char pci)
+{
+    bool const isSingle = pci >> 4 == static_cast<int>(CanFrameType::Single);
+    return std::max<std::size_t>(canFrameBytes, isSingle ? pci + 1U : 0U);
+}
+
 int CanResponse::parse(std::vector<unsigned char> const& frame)
 {
     return parse(ByteView(frame));
@@ -71,13 +78,20 @@ int CanResponse::parse(ByteView frame)
     return rejected;
 }
 
-bool CanResponse::payload(std::vector<unsigned char>& out) const
+bool CanResponse::payload(std::vector<unsigned char>& out) const&
 {
-    if (m_length != m_received) {
-        return false;
+    if (isComplete()) {
+        out = m_payload;
     }
-    out = m_payload;
-    return true;
+    return isComplete();
+}
+
+bool CanResponse::payload(std::vector<unsigned char>& out) &&
+{
+    if (isComplete()) {
+        out = std::move(m_payload);
+    }
+    return isComplete();
 }
 
 // The reply's text no longer shows where a line ended, so a short frame's padding is told by its value.
@@ -111,7 +125,8 @@ int CanResponse::parseFirst(ByteView frame)
     std::uint32_t const expected = dividedUp(m_length - firstFrameData, consecutiveFrameData);
     tervex::TraceStream << "Expecting " << expected << " CAN CF frames";
     m_slotsFilled.resize(expected);
-    // Numbers repeat every 16 frames, yet a round is counted for every 15: one try more than the slots strictly need.
+    m_futileTries.fill(0);
+    // Numbers repeat every 16 frames. The rounds are counted by 15, since number 0 spends its first try before slot 0.
     m_sequenceRounds = dividedUp(expected, sequenceNumbers - 1);
     m_payload.resize(m_length);
     copyInto(m_payload, 0, slice(frame, 2, firstFrameData));
@@ -148,18 +163,16 @@ int CanResponse::parseConsecutive(ByteView frame)
 // filled. If none is free it is the last one tried.
 std::uint32_t CanResponse::claimOffset(unsigned char sequence)
 {
-    std::uint32_t slot = sequence - 1U;
-    for (std::uint32_t tries = 1; m_sequenceRounds != 0; ++tries) {
+    std::uint32_t const firstSlot = sequence - 1U;
+    for (unsigned char& tries = m_futileTries[sequence]; tries < m_sequenceRounds; ++tries) {
+        std::uint32_t const slot = firstSlot + sequenceNumbers * tries;
         if (slot < m_slotsFilled.size() && !m_slotsFilled[slot]) {
             m_slotsFilled[slot] = true;
-            break;
+            return slotOffset(slot);
         }
-        if (tries == m_sequenceRounds) {
-            break;
-        }
-        slot += sequenceNumbers;
     }
-    return slotOffset(slot);
+    std::uint32_t const lastRound = std::max(m_sequenceRounds, 1U) - 1;
+    return slotOffset(firstSlot + sequenceNumbers * lastRound);
 }
 
 } // namespace obd

@@ -2,6 +2,7 @@
 
 #include "libobd/src/checkedbytes.h"
 
+#include <array>
 #include <cstddef>
 #include <cstdint>
 #include <vector>
@@ -25,6 +26,9 @@ public:
     // No frame looks at more bytes than this: a PCI byte and the up to 15 that its nibble can tell.
     static constexpr std::size_t MaxFrameBytes = 16;
 
+    // How many bytes a frame that begins with this PCI byte looks at: those of a CAN frame, unless it tells more.
+    static std::size_t reach(unsigned char pci);
+
     // Takes in the frame at the start of the bytes, which begin with its PCI byte and may go on with other frames.
     // Returns how many bytes the frame took, or -1, mostly with a log line, if it is none or does not fit.
     int parse(std::vector<unsigned char> const& frame);
@@ -32,13 +36,16 @@ public:
 
     // True, with the message in out, if as many bytes came in as the message has; else out is left alone. A message of
     // which no frame was accepted counts as a complete empty one.
-    bool payload(std::vector<unsigned char>& out) const;
+    bool payload(std::vector<unsigned char>& out) const&;
+    // The same for a message that is not needed any more: moves it out.
+    bool payload(std::vector<unsigned char>& out) &&;
 
 private:
     int parseSingle(ByteView frame);
     int parseFirst(ByteView frame);
     int parseConsecutive(ByteView frame);
     std::uint32_t claimOffset(unsigned char sequence);
+    bool isComplete() const { return m_length == m_received; }
 
     CanFrameType m_frameType{};
     std::uint32_t m_length = 0;
@@ -46,6 +53,9 @@ private:
     std::vector<unsigned char> m_payload;
     std::vector<bool> m_slotsFilled;    // one for each consecutive frame expected
     std::uint32_t m_sequenceRounds = 1; // how often a sequence number may be tried against the slots
+    // By sequence number: how many tries in a row are known to find no free slot, since nothing frees one but a new
+    // first frame. Without it each frame of a long message would try all rounds before its own.
+    std::array<unsigned char, 16> m_futileTries{};
 };
 
 } // namespace obd

@@ -5,8 +5,10 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <optional>
 #include <string_view>
+#include <utility>
 
 namespace {
 
@@ -154,6 +156,26 @@ TEST_F(CanResponseTest, ASecondSingleFrameReplacesTheFirst)
     parse("03 41 0D 37");
     parse("04 41 0C 1A F8");
     EXPECT_EQ(payload(), hexBytes("41 0C 1A F8"));
+}
+
+TEST_F(CanResponseTest, AFrameReachesAsFarAsItsPciByteTells)
+{
+    for (unsigned char const pci : hexBytes("00 03 07 10 1F 21 2F 30 FF")) {
+        EXPECT_EQ(CanResponse::reach(pci), 8U) << static_cast<int>(pci);
+    }
+    EXPECT_EQ(CanResponse::reach(0x08), 9U);
+    EXPECT_EQ(CanResponse::reach(0x0F), CanResponse::MaxFrameBytes);
+}
+
+TEST_F(CanResponseTest, AMessageCanBeMovedOut)
+{
+    Bytes out = hexBytes("EE");
+    first(20);
+    EXPECT_FALSE(std::move(response).payload(out));
+    EXPECT_EQ(out, hexBytes("EE"));
+    parse("03 41 0D 37");
+    EXPECT_TRUE(std::move(response).payload(out));
+    EXPECT_EQ(out, hexBytes("41 0D 37"));
 }
 
 TEST_F(CanResponseTest, PayloadLeavesTheTargetAloneWhileIncomplete)
@@ -390,6 +412,34 @@ TEST_F(CanResponseTest, ASecondFirstFrameRestartsTheCountAndKeepsTheMarks)
     consecutive(1, 0x33);
     consecutive(2, 0x22);
     EXPECT_EQ(payload(), hexBytes("01 02 03 04 05 06 33 33 33 33 33 33 33 22 22 22 22 22 22 22"));
+}
+
+TEST_F(CanResponseTest, ALongerSecondFirstFrameHasNewSlotsAndNewRounds)
+{
+    first(13);
+    consecutive(1, 0x11);
+    EXPECT_EQ(consecutive(1, 0x11), 8);
+    EXPECT_EQ(first(6 + 17 * 7), 8);
+    for (unsigned int slot = 1; slot < 17; ++slot) {
+        EXPECT_EQ(consecutive(slot + 1, fillOf(slot)), 8);
+    }
+    EXPECT_EQ(consecutive(1, 0x77), 8);
+    EXPECT_EQ(log.lines(), Lines());
+    Bytes expected = message(6 + 17 * 7);
+    std::fill_n(expected.begin() + 6, 7, static_cast<unsigned char>(0x11));
+    std::fill_n(expected.end() - 7, 7, static_cast<unsigned char>(0x77));
+    EXPECT_EQ(payload(), expected);
+}
+
+TEST_F(CanResponseTest, ASlotOutsideAShortMessageIsFreeInALongerOne)
+{
+    first(13);
+    EXPECT_EQ(consecutive(2, 0x77), 8);
+    first(6 + 17 * 7);
+    for (unsigned int slot = 0; slot < 17; ++slot) {
+        EXPECT_EQ(consecutive(slot + 1, fillOf(slot)), 8);
+    }
+    EXPECT_EQ(payload(), message(6 + 17 * 7));
 }
 
 TEST_F(CanResponseTest, AFirstFrameBehindASingleFrameStartsAFreshMessage)

@@ -12,6 +12,7 @@
 #include <chrono>
 #include <random>
 #include <string_view>
+#include <utility>
 
 namespace {
 
@@ -200,6 +201,11 @@ TEST(ParserGarbage, EveryCutOfAGoodReplyIsSane)
     }
 }
 
+std::string hexDigit(unsigned int value)
+{
+    return {"0123456789ABCDEF"[value & 0xF]};
+}
+
 // A reply of likely pieces, so that frames are found, and break, in every way.
 Text likelyCanReply(Noise& noise, obd::ObdProtocol protocol)
 {
@@ -211,7 +217,7 @@ Text likelyCanReply(Noise& noise, obd::ObdProtocol protocol)
     for (unsigned int frames = noise.below(12); frames > 0; --frames) {
         text += protocol == obd::ObdProtocolCan11 ? noise.oneOf(ids11) : noise.oneOf(ids29);
         if (noise.below(2) == 0) {
-            text += {'2', "0123456789ABCDEF"[noise.below(4)]};
+            text += '2' + hexDigit(noise.below(4));
         } else {
             text += noise.oneOf(starts);
         }
@@ -237,6 +243,44 @@ TEST(ParserGarbage, CanRepliesGiveWhatThePlainReadingGives)
         readable += payloadBytes(responses) > 0 ? 1 : 0;
     }
     EXPECT_GT(readable, 4'000U) << "too few of the replies made up are readable";
+}
+
+// Long messages whose frames are lost, doubled and shuffled; now and then a new first frame comes between.
+Text shuffledLongMessage(Noise& noise)
+{
+    unsigned int const length = 6 + noise.below(noise.below(3) == 0 ? 4090 : 300);
+    std::string text = "7E81" + hexDigit(length >> 8) + hexDigit(length >> 4) + hexDigit(length) + "010203040506";
+    std::vector<std::string> frames;
+    for (unsigned int slot = 0; 6 + 7 * slot < length; ++slot) {
+        unsigned int const fate = noise.below(60);
+        Text const data = noise.characters("0123456789ABCDEF", 14);
+        std::string const frame = "7E82" + hexDigit(slot + 1) + std::string(data.begin(), data.end());
+        frames.insert(frames.end(), fate == 0 ? 2 : 1, fate == 1 ? text : frame);
+        if (frames.size() > 1 && noise.below(4) == 0) {
+            std::swap(frames.back(), frames[noise.below(static_cast<unsigned int>(frames.size()))]);
+        }
+    }
+    for (std::string const& frame : frames) {
+        text += frame;
+    }
+    return support::replyText(text);
+}
+
+TEST(ParserGarbage, ShuffledLongMessagesGiveWhatThePlainReadingGives)
+{
+    Noise noise(3);
+    support::LogCapture const quiet;
+    std::size_t readable = 0;
+    for (int round = 0; round < 100; ++round) {
+        Text const text = shuffledLongMessage(noise);
+        ResponseMap responses;
+        ResponseMap plain;
+        ASSERT_EQ(parse(obd::ObdProtocolCan11, text, responses),
+                  support::parsePlainly(obd::ObdProtocolCan11, text, plain));
+        ASSERT_EQ(responses, plain);
+        readable += payloadBytes(responses) > 0 ? 1 : 0;
+    }
+    EXPECT_GT(readable, 20U) << "too few of the replies made up are readable";
 }
 
 } // namespace
