@@ -5,6 +5,7 @@
 
 #include <memory>
 #include <string>
+#include <utility>
 
 namespace obd {
 
@@ -63,7 +64,7 @@ extern template class OBD_EXPORT ConcreateNumericSensorValue<double>;
 class OBD_EXPORT TextualSensorValue : public SensorValue
 {
 public:
-    TextualSensorValue(int uid, std::string const& text) : SensorValue(uid), m_text(text) {}
+    TextualSensorValue(int uid, std::string text) : SensorValue(uid), m_text(std::move(text)) {}
 
     std::string textualValue() override { return m_text; }
 
