@@ -32,8 +32,8 @@ constexpr ParameterRow fuelTrimRow(int pid, char const* title, int bank)
 {
     return {pid,
             1,
-            title,
             1,
+            title,
             {{bank == 1 ? "Bank 1" : "Bank 2", always, byteAt(0), formula::trim, &quantities::trim},
              {bank == 1 ? "Bank 3" : "Bank 4", always, byteAt(1), FuelTrim::secondTrim, &quantities::trim}}};
 }

@@ -70,14 +70,14 @@ struct ParameterRow
 
     int pid;
     unsigned char bytes; // the shortest payload that is accepted; more is ignored
-    char const* title;
     unsigned char zeros; // for a module that has not answered, so many of the first sensors read 0; the others, nothing
-    SensorRow sensors[maxSensors]; // those without a quantity at the end are not there
+    char const* title;
+    SensorRow sensors[maxSensors]; // those at the end without a field are not there
 
     constexpr std::size_t sensorCount() const
     {
         std::size_t count = 0;
-        while (count < maxSensors && sensors[count].quantity != nullptr) {
+        while (count < maxSensors && sensors[count].field.width != 0) {
             ++count;
         }
         return count;
@@ -86,7 +86,7 @@ struct ParameterRow
     constexpr bool holdsItsFields() const
     {
         for (std::size_t i = 0; i < sensorCount(); ++i) {
-            if (sensors[i].formula == nullptr || sensors[i].field.end() > bytes) {
+            if (sensors[i].field.end() > bytes) {
                 return false;
             }
         }
@@ -97,7 +97,7 @@ struct ParameterRow
 // The row of a parameter with one number, which has the name of its parameter.
 constexpr ParameterRow single(int pid, Field field, Formula formula, Quantity const& quantity, char const* title)
 {
-    return {pid, static_cast<unsigned char>(field.end()), title, 1, {{nullptr, always, field, formula, &quantity}}};
+    return {pid, static_cast<unsigned char>(field.end()), 1, title, {{nullptr, always, field, formula, &quantity}}};
 }
 
 // For compile time checks of tables.

@@ -35,7 +35,7 @@ ParameterIdentifier::Id TableParameter::pid() const
 
 int TableParameter::uid(std::size_t index) const
 {
-    return Pid2Uid(pid(), static_cast<int>(index));
+    return Pid2Uid(static_cast<ParameterIdentifier::Id>(m_row.pid), static_cast<int>(index));
 }
 
 std::string TableParameter::description(IEcu const& /*ecu*/)

@@ -37,21 +37,21 @@ constexpr Quantity longSeconds = quantities::digits(UnitSecond, 4294967295.0);
 constexpr ParameterRow rows[] = {
     {0x10,
      5,
-     "By availability",
      0,
+     "By availability",
      {{"Sensor A", bit(0), wordAt(1), formula::timesTen, &quantities::absoluteRailPressure},
       {"Sensor B", bit(1), byteAt(3), formula::celsius, &quantities::temperature},
       {"Control", bit(2), byteAt(4), lowTwoBits, &loop}}},
     {0x20,
      2,
-     "Narrow or wide",
      0,
+     "Narrow or wide",
      {{"Sensor", bit(0), byteAt(1), formula::plain, &quantities::barometricPressure, bit(4), formula::timesTen}}},
-    {0x30, 5, "Long", 0, {{"Total", bit(7), longAt(1), formula::plain, &longSeconds}}},
+    {0x30, 5, 0, "Long", {{"Total", bit(7), longAt(1), formula::plain, &longSeconds}}},
     {0x40,
      2,
-     "May be filled",
      1,
+     "May be filled",
      {{"First", always, byteAt(0), formula::percent, &quantities::percent},
       {"Second", always, byteAt(1), unlessFilled, &quantities::count}}},
 };
@@ -155,8 +155,8 @@ TEST(ReadField, IsBigEndianAndNeverReadsPastTheEnd)
 
 constexpr ParameterRow tooShort[] = {
     single(0x10, wordAt(0), formula::plain, quantities::count, "good"),
-    {0x11, 1, "bad", 1, {{nullptr, always, wordAt(0), formula::plain, &quantities::count}}}};
-constexpr ParameterRow empty[] = {{0x11, 1, "no sensor", 1, {}}};
+    {0x11, 1, 1, "bad", {{nullptr, always, wordAt(0), formula::plain, &quantities::count}}}};
+constexpr ParameterRow empty[] = {{0x11, 1, 1, "no sensor", {}}};
 constexpr ParameterRow twice[] = {tooShort[0], tooShort[0]};
 
 // What the checks of the tables find, seen by the compiler.
