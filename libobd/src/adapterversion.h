@@ -1,6 +1,5 @@
 #pragma once
 
-#include <compare>
 #include <string>
 
 namespace obd {
@@ -11,7 +10,12 @@ struct AdapterVersion
     int majorNumber = 1;
     int minorNumber = 0; // its first digit only: 4 for "1.45"
 
-    auto operator<=>(AdapterVersion const&) const = default;
+    bool operator==(AdapterVersion const&) const = default;
+    bool isAtLeast(AdapterVersion const& other) const
+    {
+        return majorNumber > other.majorNumber ||
+               (majorNumber == other.majorNumber && minorNumber >= other.minorNumber);
+    }
 };
 
 // Reads "v1.5", "1.30" or "v2.1a". What is missing or no number is 0.

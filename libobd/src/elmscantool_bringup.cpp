@@ -113,7 +113,7 @@ bool ElmScantool::configure()
     if (!setEchoOff() || !setLinefeedOff()) {
         return false;
     }
-    if (m_version.load() >= firstWithoutSpaces) {
+    if (m_version.load().isAtLeast(firstWithoutSpaces)) {
         setSpacesOff();
     }
     setMemoryOff();

@@ -34,10 +34,10 @@ TEST(AdapterVersion, NumberTooLargeToBeOneIsZero)
 TEST(AdapterVersion, IsOrdered)
 {
     constexpr obd::AdapterVersion limit{1, 3};
-    EXPECT_LT((obd::AdapterVersion{1, 2}), limit);
-    EXPECT_LT((obd::AdapterVersion{0, 9}), limit);
-    EXPECT_GE((obd::AdapterVersion{1, 3}), limit);
-    EXPECT_GE((obd::AdapterVersion{2, 0}), limit);
+    EXPECT_FALSE((obd::AdapterVersion{1, 2}).isAtLeast(limit));
+    EXPECT_FALSE((obd::AdapterVersion{0, 9}).isAtLeast(limit));
+    EXPECT_TRUE((obd::AdapterVersion{1, 3}).isAtLeast(limit));
+    EXPECT_TRUE((obd::AdapterVersion{2, 0}).isAtLeast(limit));
 }
 
 } // namespace
