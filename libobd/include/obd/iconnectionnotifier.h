@@ -1,0 +1,20 @@
+#pragma once
+
+namespace obd {
+
+class IConnectionNotifierListener;
+
+// Tells opening and closing in the order of three priorities: 0 the control modules, 1 the services, 2 the connection
+// service. Other priorities are ignored. Listeners are not owned.
+class IConnectionNotifier
+{
+public:
+    virtual ~IConnectionNotifier() = default;
+
+    virtual bool isConnected() = 0;
+    virtual void attach(unsigned int priority, IConnectionNotifierListener* listener) = 0;
+    // Removes every entry of the listener at that priority.
+    virtual void detach(unsigned int priority, IConnectionNotifierListener* listener) = 0;
+};
+
+} // namespace obd

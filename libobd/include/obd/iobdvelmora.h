@@ -1,0 +1,33 @@
+#pragma once
+
+#include <memory>
+
+namespace obd {
+
+class IConfiguration;
+class IConnectionManager;
+class IConnectionNotifier;
+class IEcuManager;
+class IVelmoraSettings;
+
+// Start here: the top-level object, which owns the connection and all that hangs on it. Pointers that it hands out are
+// borrowed and live as long as it does. It must outlive every service that was built while it was the latest one;
+// destroying it closes the connection.
+class IObdVelmora
+{
+public:
+    virtual ~IObdVelmora() = default;
+
+    // The three values that the object was built with; the application's own.
+    virtual unsigned int getHostValue1() const = 0;
+    virtual unsigned int getHostValue2() const = 0;
+    virtual unsigned int getHostValue3() const = 0;
+
+    virtual std::shared_ptr<IConnectionManager> getConnectionManager() const = 0;
+    virtual IEcuManager* getEcuManager() const = 0;
+    virtual IVelmoraSettings* getSettings() const = 0;
+    virtual IConfiguration* getConfiguration() const = 0;
+    virtual IConnectionNotifier* getConnectionNotifier() const = 0;
+};
+
+} // namespace obd

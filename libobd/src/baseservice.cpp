@@ -1,0 +1,79 @@
+#include "libobd/src/baseservice.h"
+
+#include "libobd/src/callback.h"
+
+#include <obd/iconnectionmanager.h>
+#include <obd/iconnectionnotifier.h>
+#include <obd/iobdproxy.h>
+#include <obd/iobdvelmora.h>
+#include <obd/ivelmorasettings.h>
+
+namespace obd {
+
+BaseService::BaseService(IObdVelmora const* obd, unsigned int priority)
+    : m_obd(obd), m_priority(priority), m_openedCallback(std::make_shared<Callback>()),
+      m_closedCallback(std::make_shared<Callback>()), m_spareCallback(std::make_shared<Callback>())
+{
+    m_obd->getConnectionNotifier()->attach(m_priority, this);
+    m_obd->getEcuManager()->attach(this);
+    m_obd->getSettings()->attach(this);
+    m_unitSystem = m_obd->getSettings()->unitSystem();
+    m_connected = m_obd->getConnectionManager()->getProxy()->isConnected();
+    if (m_connected) {
+        std::lock_guard const lock(m_ecuMutex);
+        m_ecu = m_obd->getEcuManager()->getCurrentEcu();
+    }
+}
+
+BaseService::~BaseService()
+{
+    m_obd->getSettings()->detach(this);
+    m_obd->getEcuManager()->detach(this);
+    m_obd->getConnectionNotifier()->detach(m_priority, this);
+}
+
+std::shared_ptr<IEcu> BaseService::ecu() const
+{
+    std::lock_guard const lock(m_ecuMutex);
+    return m_ecu;
+}
+
+void BaseService::onConnectionOpened()
+{
+    m_connected = true;
+    m_openedCallback->post([this] { onServiceConnected(); });
+}
+
+void BaseService::onConnectionClosed()
+{
+    m_connected = false;
+    m_closedCallback->post([this] { onServiceDisconnected(); });
+}
+
+void BaseService::onEvent(EcuManagerEvent const& event)
+{
+    if (event != EcuManagerEvent::CurrentEcuChanged) {
+        return;
+    }
+    std::shared_ptr<IEcu> current = m_obd->getEcuManager()->getCurrentEcu();
+    {
+        std::lock_guard const lock(m_ecuMutex);
+        m_ecu.swap(current);
+    }
+    if (m_connected) {
+        onEcuChanged();
+    }
+}
+
+void BaseService::onEvent(VelmoraSettingsEvent const& event)
+{
+    if (event != VelmoraSettingsEvent::UnitSystemChanged) {
+        return;
+    }
+    UnitSystem const system = m_obd->getSettings()->unitSystem();
+    if (m_unitSystem.exchange(system) != system) {
+        onUnitSystemChanged();
+    }
+}
+
+} // namespace obd
