@@ -1,0 +1,10 @@
+#include "velmora/command/commands.h"
+
+namespace velmora {
+
+void addCommands(CommandLine& commandLine)
+{
+    addPortsCommand(commandLine);
+}
+
+} // namespace velmora

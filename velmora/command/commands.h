@@ -1,0 +1,13 @@
+#pragma once
+
+namespace velmora {
+
+class CommandLine;
+
+// Adds every command of the program, in the order of its help.
+void addCommands(CommandLine& commandLine);
+
+// One function a command, each in the file of its name.
+void addPortsCommand(CommandLine& commandLine);
+
+} // namespace velmora

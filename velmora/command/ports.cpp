@@ -1,0 +1,40 @@
+#include "velmora/command/commands.h"
+#include "velmora/commandline.h"
+#include "velmora/port/serialportlist.h"
+
+#include <fmt/format.h>
+#include <nlohmann/json.hpp>
+
+namespace velmora {
+
+namespace {
+
+ExitCode listPorts(GlobalOptions const& options)
+{
+    std::vector<SerialPortEntry> const ports = listSerialPorts();
+    if (options.json) {
+        nlohmann::json list = nlohmann::json::array();
+        for (SerialPortEntry const& port : ports) {
+            list.push_back({{"device", port.device}, {"description", port.description}});
+        }
+        fmt::print("{}\n", list.dump(2));
+        return ExitCode::Done;
+    }
+    for (SerialPortEntry const& port : ports) {
+        fmt::print("{}{}{}\n", port.device, port.description.empty() ? "" : "  ", port.description);
+    }
+    if (ports.empty()) {
+        fmt::print(stderr,
+                   "No serial port that looks like an adapter. A network adapter needs none: --port HOST:PORT\n");
+    }
+    return ExitCode::Done;
+}
+
+} // namespace
+
+void addPortsCommand(CommandLine& commandLine)
+{
+    commandLine.addCommand("ports", "List serial ports that look like adapters", listPorts);
+}
+
+} // namespace velmora

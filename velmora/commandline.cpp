@@ -1,0 +1,141 @@
+#include "velmora/commandline.h"
+
+#include "velmora/failure.h"
+#include "velmora/version.h"
+
+#include <CLI/Config.hpp>
+#include <CLI/Formatter.hpp>
+#include <cstdio>
+#include <exception>
+#include <fmt/format.h>
+#include <map>
+#include <utility>
+
+namespace velmora {
+
+namespace {
+
+constexpr char const* exitCodes =
+    R"(Exit codes: 0 done; 1 failed otherwise; 2 wrong use; 3 port not opened; 4 adapter silent;
+5 vehicle silent; 6 not supported by the vehicle; 7 refused by the vehicle; 8 link lost;
+10 findings, with --check; 130 interrupted.)";
+
+void report(Failure const& failure)
+{
+    fmt::print(stderr, "velmora: {}\n", failure.what());
+    for (std::string const& hint : failure.hints()) {
+        fmt::print(stderr, "  - {}\n", hint);
+    }
+}
+
+template <typename Value, typename Parse>
+CLI::Option* addParsed(CLI::App& app, std::string const& names, std::optional<Value>& target, Parse parse,
+                       std::string const& expected, std::string const& help)
+{
+    return app.add_option_function<std::string>(
+        names,
+        [&target, parse, expected](std::string const& text) {
+            target = parse(text);
+            if (!target) {
+                throw CLI::ValidationError("\"" + text + "\" is not understood; expected " + expected);
+            }
+        },
+        help);
+}
+
+std::optional<obd::UnitSystem> parseUnits(std::string const& text)
+{
+    static std::map<std::string, obd::UnitSystem> const names = {
+        {"metric", obd::UnitSystem::Metric},
+        {"imperial", obd::UnitSystem::Imperial},
+    };
+    auto const found = names.find(text);
+    return found != names.end() ? std::optional(found->second) : std::nullopt;
+}
+
+} // namespace
+
+CommandLine::CommandLine() : m_app("Reads live data, trouble codes and vehicle data from a car.", "velmora")
+{
+    m_app.require_subcommand(1);
+    m_app.set_version_flag("-V,--version", std::string("velmora ") + versionText);
+    m_app.set_help_flag("-h,--help", "Print this help");
+    m_app.set_help_all_flag("--help-all", "Print the help of all commands");
+    m_app.footer(exitCodes);
+    addGlobalOptions();
+}
+
+void CommandLine::addGlobalOptions()
+{
+    m_app.fallthrough();
+    m_app
+        .add_option("-p,--port", m_options.port,
+                    "Where the adapter is: /dev/ttyUSB0, serial:///dev/ttyUSB0?baud=38400,\n"
+                    "HOST:PORT, tcp://HOST:PORT, sim:VEHICLE, replay:FILE")
+        ->type_name("PORT")
+        ->envname("VELMORA_PORT");
+    m_app.add_option("-b,--baud", m_options.baud, "Line rate of a serial port (38400)")
+        ->type_name("N")
+        ->check(CLI::Range(300, 4000000));
+    addParsed(m_app, "-P,--protocol", m_options.protocol, parseProtocol, "auto or a number from 1 to 9",
+              "Bus protocol: auto or 1 to 9")
+        ->type_name("N");
+    addParsed(m_app, "-u,--units", m_options.units, parseUnits, "metric or imperial",
+              "Unit system for this run: metric or imperial")
+        ->type_name("SYSTEM");
+    addParsed(m_app, "--ecu", m_options.ecu, parseEcuId, "a control module id in hexadecimal, such as 7E8",
+              "Control module, hexadecimal (the first)")
+        ->type_name("ID");
+    m_app.add_flag("--json", m_options.json, "One JSON document on standard output");
+    m_app.add_option("--log", m_options.logFile, "Write the library's log there")->type_name("FILE");
+    m_app.add_option("--trace", m_options.traceFile, "Write the adapter traffic there, with times")->type_name("FILE");
+    m_app
+        .add_option("--settings", m_options.settingsFile,
+                    "Settings file (velmora/settings.toml in the user's configuration folder)")
+        ->type_name("FILE")
+        ->envname("VELMORA_SETTINGS");
+    m_app.add_flag("--reset", m_options.reset, "Restore and reset the adapter before use");
+    m_app.add_flag("-y,--yes", m_options.yes, "Don't ask before clearing codes or running a routine");
+    m_app.add_flag("-q,--quiet", m_options.quiet, "No progress on standard error");
+    m_app.add_flag("-v,--verbose", m_options.verbose, "More progress on standard error");
+    m_app.add_option("--color", m_options.color, "Colours: auto, always or never (also NO_COLOR)")
+        ->type_name("WHEN")
+        ->transform(CLI::CheckedTransformer(std::map<std::string, ColorMode>{
+            {"auto", ColorMode::Auto}, {"always", ColorMode::Always}, {"never", ColorMode::Never}}));
+}
+
+CLI::App* CommandLine::addCommand(std::string const& name, std::string const& help, Action action)
+{
+    CLI::App* command = m_app.add_subcommand(name, help);
+    command->callback([this, chosen = std::move(action)] { m_action = chosen; });
+    return command;
+}
+
+ExitCode CommandLine::run(int argc, char const* const* argv)
+{
+    try {
+        m_app.parse(argc, argv);
+    } catch (CLI::Success const& wanted) {
+        m_app.exit(wanted);
+        return ExitCode::Done;
+    } catch (CLI::ParseError const& error) {
+        fmt::print(stderr, "velmora: {}\n  - velmora --help tells the options and commands\n", error.what());
+        return ExitCode::WrongUse;
+    }
+    return runAction();
+}
+
+ExitCode CommandLine::runAction()
+{
+    try {
+        return m_action(m_options);
+    } catch (Failure const& failure) {
+        report(failure);
+        return failure.code();
+    } catch (std::exception const& error) {
+        fmt::print(stderr, "velmora: {}\n", error.what());
+        return ExitCode::Failed;
+    }
+}
+
+} // namespace velmora

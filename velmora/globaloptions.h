@@ -1,0 +1,42 @@
+#pragma once
+
+#include <obd/unitsystem.h>
+#include <obd/vehicleprotocol.h>
+#include <optional>
+#include <string>
+
+namespace velmora {
+
+enum class ColorMode
+{
+    Auto,
+    Always,
+    Never,
+};
+
+// What the options before the command say, as given; the settings file fills what stays empty.
+struct GlobalOptions
+{
+    std::string port;
+    std::optional<unsigned int> baud;
+    std::optional<obd::VehicleProtocol> protocol;
+    std::optional<obd::UnitSystem> units;
+    std::optional<unsigned int> ecu; // control module id
+    bool json = false;
+    std::string logFile;
+    std::string traceFile;
+    std::string settingsFile;
+    bool reset = false;
+    bool yes = false;
+    bool quiet = false;
+    bool verbose = false;
+    ColorMode color = ColorMode::Auto;
+};
+
+// "auto", "1" to "9", or as adapters print a protocol that they found, "A6". Nothing for any other text.
+std::optional<obd::VehicleProtocol> parseProtocol(std::string const& text);
+
+// A control module id in hexadecimal, with or without 0x. Nothing for any other text.
+std::optional<unsigned int> parseEcuId(std::string const& text);
+
+} // namespace velmora

@@ -1,0 +1,39 @@
+#pragma once
+
+#include <atomic>
+#include <functional>
+#include <mutex>
+#include <thread>
+
+namespace velmora {
+
+// Ctrl-C and the wish to terminate. Made in main before any other thread: from then on the signals reach this object
+// only. The first one asks the running command to end; the second ends the program at once.
+class Interrupt
+{
+public:
+    Interrupt();
+    ~Interrupt();
+    Interrupt(Interrupt const&) = delete;
+    Interrupt& operator=(Interrupt const&) = delete;
+
+    // The one of this process.
+    static Interrupt& instance();
+
+    bool raised() const { return m_raised; }
+
+    // Called on the object's own thread when a signal comes; at once if one came already. Null removes it; once that
+    // has returned, it isn't running any more.
+    void setHandler(std::function<void()> handler);
+
+private:
+    void wait();
+
+    std::atomic<bool> m_raised{false};
+    std::atomic<bool> m_stop{false};
+    std::mutex m_mutex;
+    std::function<void()> m_handler; // protected by m_mutex
+    std::thread m_thread;
+};
+
+} // namespace velmora

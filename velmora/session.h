@@ -1,0 +1,62 @@
+#pragma once
+
+#include "velmora/dispatchloop.h"
+#include "velmora/globaloptions.h"
+#include "velmora/port/bridgepump.h"
+#include "velmora/port/portaddress.h"
+
+#include <memory>
+#include <obd/iadapter.h>
+#include <obd/iecumanager.h>
+#include <obd/iobdproxy.h>
+#include <obd/iobdvelmora.h>
+#include <optional>
+#include <string>
+
+namespace velmora {
+
+class SettingsStore;
+class TrafficTrace;
+
+// The library in use by one command: settings, log and top-level object from the start, a connection after connect. The
+// main thread's.
+class Session
+{
+public:
+    explicit Session(GlobalOptions const& options);
+    // Closes what is open. Services must be gone.
+    ~Session();
+    Session(Session const&) = delete;
+    Session& operator=(Session const&) = delete;
+
+    // Opens the port and brings up adapter and vehicle, and selects the control module that the options name. Throws
+    // Failure that tells how far it came.
+    void connect();
+
+    obd::IObdVelmora& obd() const { return *m_obd; }
+    std::shared_ptr<obd::IObdProxy> proxy() const;
+    std::shared_ptr<obd::IAdapter> adapter() const;
+    DispatchLoop& loop() { return m_loop; }
+    GlobalOptions const& options() const { return m_options; }
+
+    // Throws Failure if the link has broken or the user has interrupted meanwhile.
+    void check() const;
+
+private:
+    PortAddress portAddress() const;
+    obd::VehicleProtocol protocol() const;
+    bool openOnThread(PortAddress const& address);
+    [[noreturn]] void failOpening(PortAddress const& address);
+    void selectEcu();
+    void close();
+
+    GlobalOptions const m_options;
+    std::shared_ptr<SettingsStore> m_settings;
+    DispatchLoop m_loop;
+    std::shared_ptr<obd::IObdVelmora> m_obd;
+    std::shared_ptr<obd::DataBridge> m_bridge;
+    std::unique_ptr<BridgePump> m_pump;
+    std::unique_ptr<TrafficTrace> m_trace;
+};
+
+} // namespace velmora
