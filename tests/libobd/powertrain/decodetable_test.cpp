@@ -2,12 +2,15 @@
 #include "tests/support/hexbytes.h"
 #include "tests/support/parameterclasses.h"
 #include "tests/support/payload.h"
+#include "tests/support/payloadproperty.h"
 #include "tests/support/tablefile.h"
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <random>
 #include <set>
+#include <tuple>
 
 // Feeds replies to the classes and compares what the user reads with decode_table.txt and recorded_table.txt.
 namespace {
@@ -137,33 +140,40 @@ TEST_F(DecodeTable, ModulesKeepTheirReadingsApart)
     }
 }
 
-// Any payload is either refused, changing nothing, or read into values of the sensors that the class announces.
-TEST_F(DecodeTable, RandomPayloadsOfEveryLengthNeverLeaveTheAnnouncedSensors)
+class AnyPayload : public ::testing::TestWithParam<std::tuple<obd::ObdProtocol, bool>>
 {
-    std::mt19937 random(1);
+protected:
+    void SetUp() override { obd::FuelTrim::setByteBInUse(std::get<1>(GetParam())); }
+    void TearDown() override { obd::FuelTrim::setByteBInUse(false); }
+
+    Bytes randomPayload(std::size_t length)
+    {
+        Bytes payload(length);
+        std::generate(payload.begin(), payload.end(), [this] { return static_cast<unsigned char>(m_random()); });
+        return payload;
+    }
+
+    std::shared_ptr<support::FakeEcu> m_ecu = std::make_shared<support::FakeEcu>(0x10, std::get<0>(GetParam()));
+    std::mt19937 m_random{1};
+};
+
+TEST_P(AnyPayload, IsReadOrRefusedByEveryClassBeforeAndAfterAGoodOne)
+{
     for (auto const& [name, make] : support::parameterClasses()) {
-        SCOPED_TRACE(name);
-        for (bool const byteB : {false, true}) {
-            obd::FuelTrim::setByteBInUse(byteB);
+        for (std::size_t length = 0; length <= 40; ++length) {
             auto const parameter = support::liveParameter(name);
-            std::set<int> uids;
-            for (auto const& info : parameter->sensorInfo(*m_ecu)) {
-                uids.insert(info->uid());
-            }
-            for (std::size_t length = 0; length <= 40; ++length) {
-                Bytes payload(length);
-                std::generate(payload.begin(), payload.end(), [&] { return static_cast<unsigned char>(random()); });
-                std::string const before = support::texts(*parameter, *m_ecu, UnitSystem::Imperial);
-                if (!support::reply(*parameter, m_ecu, payload)) {
-                    EXPECT_EQ(support::texts(*parameter, *m_ecu, UnitSystem::Imperial), before);
-                }
-                for (auto const& value : parameter->values(*m_ecu, UnitSystem::Metric)) {
-                    EXPECT_EQ(uids.count(value->uid()), 1u);
-                }
-            }
+            Bytes const payload = randomPayload(length);
+            EXPECT_EQ(support::brokenBy(*parameter, m_ecu, payload), "") << name << " of " << length << " bytes";
+            ASSERT_TRUE(support::reply(*parameter, m_ecu, Bytes(40, 0x01))) << name;
+            EXPECT_EQ(support::brokenBy(*parameter, m_ecu, payload), "") << name << " of " << length << " bytes";
         }
     }
-    obd::FuelTrim::setByteBInUse(false);
 }
+
+INSTANTIATE_TEST_SUITE_P(
+    OnEveryBus, AnyPayload,
+    ::testing::Values(std::tuple(obd::ObdProtocolIso9141, false), std::tuple(obd::ObdProtocolIso14230, false),
+                      std::tuple(obd::ObdProtocolJ1850, false), std::tuple(obd::ObdProtocolCan11, false),
+                      std::tuple(obd::ObdProtocolCan11, true), std::tuple(obd::ObdProtocolCan29, false)));
 
 } // namespace
