@@ -21,11 +21,13 @@ unsigned int SaeLines::word(std::size_t line, std::size_t index) const
     return readUint16(m_data, line * m_step + index);
 }
 
-std::vector<unsigned char> SaeLines::data(std::size_t line) const
+std::vector<unsigned char> SaeLines::bytes(std::size_t line, std::size_t index, std::size_t count) const
 {
-    std::vector<unsigned char> bytes(dataLength);
-    copyData(line, bytes, 0);
-    return bytes;
+    std::vector<unsigned char> part;
+    for (std::size_t i = 0; i < count; ++i) {
+        part.push_back(byte(line, index + i));
+    }
+    return part;
 }
 
 void SaeLines::copyData(std::size_t line, std::vector<unsigned char>& item, std::size_t toPlace) const

@@ -32,8 +32,11 @@ public:
     // A big-endian field of the line.
     unsigned int word(std::size_t line, std::size_t index) const;
 
+    // Bytes of the line from `index` on.
+    std::vector<unsigned char> bytes(std::size_t line, std::size_t index, std::size_t count) const;
+
     // The 4 data bytes.
-    std::vector<unsigned char> data(std::size_t line) const;
+    std::vector<unsigned char> data(std::size_t line) const { return bytes(line, 3, dataLength); }
 
     // Writes the 4 data bytes to a place of an item, counted in lines.
     void copyData(std::size_t line, std::vector<unsigned char>& item, std::size_t toPlace) const;
