@@ -83,7 +83,7 @@ void Adapter::receiveOne(char character)
     case State::Monitoring:
         stop();
         return;
-    case State::Resetting:
+    case State::Deaf:
         return;
     case State::Asleep:
         m_state = State::Ready;
@@ -115,18 +115,21 @@ void Adapter::receiveOne(char character)
 /// Ends states that last for a time only.
 void Adapter::settle()
 {
-    const bool timed = m_state == State::Busy || m_state == State::Resetting || m_state == State::AwaitingRate;
+    const bool timed = m_state == State::Busy || m_state == State::Deaf || m_state == State::AwaitingRate;
     if (timed && m_now >= m_stateUntil) {
         m_state = State::Ready;
     }
 }
 
+/// The character that interrupts is lost, and so are those that come while the
+/// adapter still talks.
 void Adapter::stop()
 {
     m_output.clear();
-    m_state = State::Ready;
     say(commandTime, "STOPPED\r");
     finish(commandTime);
+    m_state = State::Deaf;
+    m_stateUntil = m_now + commandTime;
 }
 
 void Adapter::execute(const std::string& line)
@@ -271,7 +274,7 @@ void Adapter::answerReset(const CommandReply& reply)
         say(delay, "?\r");
         finish(delay);
     }
-    m_state = State::Resetting;
+    m_state = State::Deaf;
     m_stateUntil = m_now + delay;
 }
 

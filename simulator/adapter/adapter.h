@@ -45,8 +45,8 @@ private:
     enum class State : int
     {
         Ready,
-        Busy,      ///< with the bus; a character interrupts
-        Resetting, ///< deaf until the banner is out
+        Busy, ///< with the bus; a character interrupts
+        Deaf, ///< until a banner or a notice is out
         Monitoring,
         Asleep,
         AwaitingRate ///< for the CR that confirms a new line rate

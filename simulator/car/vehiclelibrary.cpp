@@ -2,6 +2,7 @@
 
 #include "simulator/car/embeddedvehicles.h"
 
+#include <algorithm>
 #include <fstream>
 #include <iterator>
 
@@ -31,6 +32,7 @@ std::vector<std::string> vehicleNames()
     for (std::size_t i = 0; i < embeddedVehicleCount; ++i) {
         names.emplace_back(embeddedVehicles[i].name);
     }
+    std::sort(names.begin(), names.end());
     return names;
 }
 

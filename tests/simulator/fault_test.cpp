@@ -1,0 +1,153 @@
+#include "simulator/fault.h"
+
+#include "tests/simulator/conversation.h"
+
+#include <gtest/gtest.h>
+
+namespace {
+
+using obdsim::FaultError;
+using obdsim::FaultKind;
+using obdsim::parseFaults;
+using obdsim::Time;
+
+Conversation faulty(const std::vector<std::string>& faults)
+{
+    return simulated("petrol-can11", "elm327-v1.5", faults);
+}
+
+TEST(Fault, textsAreRead)
+{
+    const auto plan =
+        parseFaults({"garbage=0.25", "nul=1", "cut@120", "stall@80:500", "slow=30", "loss@99", "error:BUS BUSY@3",
+                     "error:CAN ERROR=0.5", "prompt@2", "prompt=0.1", "echo", "quirk:prompt-late", "seed=7"});
+    ASSERT_EQ(plan.faults.size(), 10U);
+    EXPECT_EQ(plan.faults[0].kind, FaultKind::Garbage);
+    EXPECT_EQ(plan.faults[0].probability, 0.25);
+    EXPECT_EQ(plan.faults[2].kind, FaultKind::Cut);
+    EXPECT_EQ(plan.faults[2].position, 120U);
+    EXPECT_EQ(plan.faults[3].duration, Time(500));
+    EXPECT_EQ(plan.faults[4].duration, Time(30));
+    EXPECT_EQ(plan.faults[6].word, "BUS BUSY");
+    EXPECT_EQ(plan.faults[6].position, 3U);
+    EXPECT_EQ(plan.faults[7].probability, 0.5);
+    EXPECT_TRUE(plan.quirks.has(obdsim::Quirk::EchoStuck));
+    EXPECT_TRUE(plan.quirks.has(obdsim::Quirk::PromptLate));
+    EXPECT_EQ(plan.seed, 7U);
+    EXPECT_TRUE(parseFaults({"echo"}).empty());
+}
+
+TEST(Fault, wrongTextIsToldWithTheFormsThereAre)
+{
+    for (const char* text :
+         {"",           "garbage", "garbage=", "garbage=2", "garbage=-1", "garbage=x",      "garbage@5",
+          "cut=3",      "cut@0",   "cut@x",    "cut@5:3",   "stall@5",    "stall=5",        "stall@5:x",
+          "slow=x",     "slow@5",  "loss=3",   "error@3",   "error:@3",   "error:BUS BUSY", "error:X@",
+          "quirk:none", "seed=x",  "fire=1",   "prompt"}) {
+        try {
+            parseFaults({text});
+            ADD_FAILURE() << text;
+        } catch (const FaultError& error) {
+            const std::string what = error.what();
+            EXPECT_EQ(what.find("fault \"" + std::string(text) + "\": "), 0U) << what;
+        }
+    }
+}
+
+TEST(FaultyPeer, sameSeedGivesTheSameGarbage)
+{
+    const auto run = [](const char* seed) {
+        auto host = faulty({"garbage=0.05", "nul=0.02", seed});
+        return host.ask("ATZ") + host.ask("ATE0") + host.ask("0100") + host.ask("0902");
+    };
+    const std::string first = run("seed=3");
+    EXPECT_EQ(first, run("seed=3"));
+    EXPECT_NE(first, run("seed=4"));
+    EXPECT_NE(first.find('\0'), std::string::npos);
+}
+
+TEST(FaultyPeer, promptIsLostInOneReply)
+{
+    auto host = faulty({"prompt@2"});
+    EXPECT_EQ(host.ask("ATE0"), "ATE0\rOK\r\r>");
+    EXPECT_EQ(host.ask("ATI"), "ELM327 v1.5\r\r");
+    EXPECT_EQ(host.ask("ATI"), "ELM327 v1.5\r\r>");
+}
+
+TEST(FaultyPeer, replyIsCutAtAByte)
+{
+    auto host = faulty({"cut@14"});
+    EXPECT_EQ(host.ask("ATE0"), "ATE0\rOK\r\r>") << "10 bytes";
+    EXPECT_EQ(host.ask("ATI"), "ELM");
+    EXPECT_EQ(host.ask("ATI"), "ELM327 v1.5\r\r>");
+}
+
+TEST(FaultyPeer, outputStallsBeforeAByte)
+{
+    auto host = faulty({"stall@14:700"});
+    host.ask("ATE0");
+    host.peer().receive("ATI\r");
+    const Time start = host.peer().now();
+    EXPECT_EQ(host.peer().advanceTo(start + Time(600)), "ELM");
+    EXPECT_EQ(host.peer().advanceTo(start + Time(704)), "327 v1.5\r\r>");
+}
+
+TEST(FaultyPeer, slowAdapterAnswersLater)
+{
+    auto host = faulty({"slow=300"});
+    host.ask("ATE0");
+    host.ask("ATI");
+    EXPECT_EQ(host.lastWait(), Time(304));
+}
+
+TEST(FaultyPeer, errorWordTakesThePlaceOfAReply)
+{
+    auto host = faulty({"error:BUS BUSY@3"});
+    host.ask("ATE0");
+    EXPECT_EQ(host.ask("0100").substr(0, 13), "SEARCHING...\r");
+    EXPECT_EQ(host.ask("0100"), "BUS BUSY\r\r>");
+    EXPECT_EQ(host.ask("0100").substr(0, 5), "41 00");
+}
+
+TEST(FaultyPeer, errorWordFollowsTheEcho)
+{
+    auto host = faulty({"error:STOPPED@1"});
+    EXPECT_EQ(host.ask("ATI"), "ATI\rSTOPPED\r\r>");
+}
+
+TEST(FaultyPeer, linkBreaksAndANewClientHasItAgain)
+{
+    auto host = faulty({"loss@14"});
+    host.ask("ATE0");
+    EXPECT_TRUE(host.peer().linkIsUp());
+    EXPECT_EQ(host.ask("ATI"), "ELM");
+    EXPECT_FALSE(host.peer().linkIsUp());
+    EXPECT_EQ(host.ask("ATI"), "");
+    host.peer().connect();
+    EXPECT_TRUE(host.peer().linkIsUp());
+    EXPECT_EQ(host.ask("ATI"), "ELM327 v1.5\r\r") << "and loses it at the same byte";
+}
+
+TEST(FaultyPeer, echoStaysOn)
+{
+    auto host = faulty({"echo"});
+    EXPECT_EQ(host.ask({"ATE0", "ATI"}), "ATI\rELM327 v1.5\r\r>");
+}
+
+TEST(FaultyPeer, replayHasFaultsToo)
+{
+    Conversation host(obdsim::replay(VELMORA_SOURCE_DIR "/tests/dialogues/kwpfast-van-2005-stn.dialogue",
+                                     {"error:NO DATA@2", "quirk:echo-stuck"}));
+    host.ask("ATE0");
+    EXPECT_EQ(host.ask("0100"), "0100\rNO DATA\r\r>");
+}
+
+TEST(Simulation, wrongNamesAreTold)
+{
+    EXPECT_THROW(obdsim::simulate({"no-such-car", "elm327-v1.5", {}}), obdsim::SimulatorError);
+    EXPECT_THROW(obdsim::simulate({"petrol-can11", "no-such-adapter", {}}), obdsim::SimulatorError);
+    EXPECT_THROW(obdsim::simulate({"petrol-can11", "elm327-v1.5", {"fire=1"}}), obdsim::SimulatorError);
+    EXPECT_THROW(obdsim::replay("/no/such/file"), obdsim::SimulatorError);
+}
+
+} // namespace

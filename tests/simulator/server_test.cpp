@@ -1,0 +1,208 @@
+#include "simulator/server.h"
+
+#include "simulator/simulation.h"
+
+#include <gtest/gtest.h>
+
+#include <asio/connect.hpp>
+#include <asio/ip/tcp.hpp>
+#include <asio/write.hpp>
+
+#include <chrono>
+#include <fcntl.h>
+#include <poll.h>
+#include <thread>
+#include <unistd.h>
+
+namespace {
+
+using asio::ip::tcp;
+using std::chrono::milliseconds;
+using std::chrono::steady_clock;
+
+constexpr double fast = 50; // of simulated to real time
+
+/// A file descriptor that a test talks through, with a limit to every wait.
+class Line
+{
+public:
+    explicit Line(int descriptor) : m_descriptor(descriptor) {}
+    ~Line() { ::close(m_descriptor); }
+    Line(const Line&) = delete;
+    Line& operator=(const Line&) = delete;
+
+    void send(const std::string& text) const
+    {
+        ASSERT_EQ(::write(m_descriptor, text.data(), text.size()), static_cast<ssize_t>(text.size()));
+    }
+
+    /// All up to and with the prompt; what came if the line ends or stays silent.
+    std::string readReply()
+    {
+        std::string text;
+        char byte = 0;
+        while (text.empty() || text.back() != '>') {
+            pollfd wait{m_descriptor, POLLIN, 0};
+            if (::poll(&wait, 1, 2000) <= 0 || ::read(m_descriptor, &byte, 1) <= 0) {
+                m_ended = true;
+                break;
+            }
+            text += byte;
+        }
+        return text;
+    }
+
+    std::string ask(const std::string& command)
+    {
+        send(command + "\r");
+        return readReply();
+    }
+
+    bool ended() const { return m_ended; }
+
+private:
+    int m_descriptor;
+    bool m_ended = false;
+};
+
+int connectTo(const std::string& address)
+{
+    const auto colon = address.rfind(':');
+    asio::io_context context;
+    tcp::socket socket(context);
+    asio::connect(socket, tcp::resolver(context).resolve(address.substr(0, colon), address.substr(colon + 1)));
+    const int descriptor = ::dup(socket.native_handle());
+    ::fcntl(descriptor, F_SETFL, ::fcntl(descriptor, F_GETFL) & ~O_NONBLOCK);
+    return descriptor;
+}
+
+milliseconds timeOf(const std::function<void()>& action)
+{
+    const auto start = steady_clock::now();
+    action();
+    return std::chrono::duration_cast<milliseconds>(steady_clock::now() - start);
+}
+
+TEST(TcpServer, servesOneClientAfterAnother)
+{
+    const auto server = obdsim::serveTcp(obdsim::simulate({}), "127.0.0.1", 0, fast);
+    server->start();
+    EXPECT_EQ(server->address().substr(0, 10), "127.0.0.1:");
+    {
+        Line first(connectTo(server->address()));
+        EXPECT_EQ(first.ask("ATE0"), "ATE0\rOK\r\r>");
+        EXPECT_EQ(first.ask("0100").substr(0, 13), "SEARCHING...\r");
+    }
+    Line second(connectTo(server->address()));
+    EXPECT_EQ(second.ask("ATI"), "ELM327 v1.5\r\r>") << "the adapter has kept its settings";
+    EXPECT_EQ(second.ask("0100").substr(0, 5), "41 00");
+}
+
+TEST(TcpServer, secondClientWaitsForTheFirstToGo)
+{
+    const auto server = obdsim::serveTcp(obdsim::simulate({}), "127.0.0.1", 0, fast);
+    server->start();
+    auto first = std::make_unique<Line>(connectTo(server->address()));
+    EXPECT_EQ(first->ask("ATE0"), "ATE0\rOK\r\r>");
+    Line second(connectTo(server->address()));
+    second.send("ATI\r");
+    EXPECT_EQ(first->ask("ATI"), "ELM327 v1.5\r\r>");
+    first.reset();
+    EXPECT_EQ(second.readReply(), "ELM327 v1.5\r\r>");
+}
+
+TEST(TcpServer, stopsAtOnceWithAClientOnTheLine)
+{
+    const auto server = obdsim::serveTcp(obdsim::simulate({}), "127.0.0.1", 0, 1);
+    server->start();
+    Line client(connectTo(server->address()));
+    client.ask("ATE0");
+    client.send("0100\r");
+    EXPECT_LT(timeOf([&] { server->stop(); }), milliseconds(200));
+    server->stop();
+}
+
+TEST(TcpServer, runsOnTheCallersThreadToo)
+{
+    const auto server = obdsim::serveTcp(obdsim::simulate({}), "127.0.0.1", 0, fast);
+    std::thread thread([&] { server->run(); });
+    {
+        Line client(connectTo(server->address()));
+        EXPECT_EQ(client.ask("ATI"), "ATI\rELM327 v1.5\r\r>");
+    }
+    server->stop();
+    thread.join();
+}
+
+TEST(TcpServer, stoppedBeforeItRunsItReturns)
+{
+    const auto server = obdsim::serveTcp(obdsim::simulate({}), "127.0.0.1", 0);
+    server->stop();
+    server->run();
+}
+
+TEST(TcpServer, lostLinkClosesTheConnectionAndTheNextOneIsServed)
+{
+    const auto peer = obdsim::simulate({"petrol-can11", "elm327-v1.5", {"loss@14"}});
+    const auto server = obdsim::serveTcp(peer, "127.0.0.1", 0, fast);
+    server->start();
+    {
+        Line client(connectTo(server->address()));
+        EXPECT_EQ(client.ask("ATE0"), "ATE0\rOK\r\r>");
+        EXPECT_EQ(client.ask("ATI"), "ELM");
+        EXPECT_TRUE(client.ended());
+    }
+    Line next(connectTo(server->address()));
+    EXPECT_EQ(next.ask("ATE0"), "OK\r\r>");
+}
+
+TEST(TcpServer, portInUseIsTold)
+{
+    const auto server = obdsim::serveTcp(obdsim::simulate({}), "127.0.0.1", 0);
+    const std::string address = server->address();
+    const auto port = static_cast<std::uint16_t>(std::stoi(address.substr(address.rfind(':') + 1)));
+    try {
+        obdsim::serveTcp(obdsim::simulate({}), "127.0.0.1", port);
+        FAIL();
+    } catch (const obdsim::ServerError& error) {
+        EXPECT_EQ(std::string(error.what()).find("cannot listen on " + address), 0U) << error.what();
+    }
+    EXPECT_THROW(obdsim::serveTcp(obdsim::simulate({}), "256.1.1.1.1", 0), obdsim::ServerError);
+}
+
+TEST(PtyServer, servesProgramsThatOpenItsDevice)
+{
+    const auto server = obdsim::servePseudoTerminal(obdsim::simulate({}), fast);
+    server->start();
+    {
+        Line first(::open(server->address().c_str(), O_RDWR | O_NOCTTY));
+        EXPECT_EQ(first.ask("ATZ"), "ATZ\r\r\rELM327 v1.5\r\r>") << "no byte changed by the terminal";
+        EXPECT_EQ(first.ask("ATE0"), "ATE0\rOK\r\r>");
+    }
+    Line second(::open(server->address().c_str(), O_RDWR | O_NOCTTY));
+    EXPECT_EQ(second.ask("ATI"), "ELM327 v1.5\r\r>");
+}
+
+TEST(PtyServer, stopsAtOnceAndTakesItsDeviceAway)
+{
+    auto server = obdsim::servePseudoTerminal(obdsim::simulate({}));
+    server->start();
+    const std::string path = server->address();
+    EXPECT_LT(timeOf([&] { server->stop(); }), milliseconds(200));
+    server.reset();
+    EXPECT_NE(::access(path.c_str(), F_OK), 0);
+}
+
+TEST(PtyServer, lostLinkTakesTheDeviceAway)
+{
+    const auto peer = obdsim::simulate({"petrol-can11", "elm327-v1.5", {"loss@14"}});
+    const auto server = obdsim::servePseudoTerminal(peer, fast);
+    server->start();
+    Line client(::open(server->address().c_str(), O_RDWR | O_NOCTTY));
+    EXPECT_EQ(client.ask("ATE0"), "ATE0\rOK\r\r>");
+    const std::string rest = client.ask("ATI");
+    EXPECT_EQ(rest, std::string("ELM").substr(0, rest.size())) << "the hang-up may take unread bytes with it";
+    EXPECT_TRUE(client.ended());
+}
+
+} // namespace
