@@ -13,9 +13,9 @@ void expectService(unsigned char service)
     EXPECT_EQ(diagnosticsrig::requestOf(Codes()), std::vector<unsigned char>{service});
     EXPECT_EQ(Codes().timeout(), 1500U);
     auto const ecu = std::make_shared<support::FakeEcu>(0x7E8U);
-    for (unsigned char const first : {'C', 'G', 'J'}) {
+    for (unsigned char const first : diagnosticsrig::Bytes{0x43, 0x47, 0x4A}) {
         bool const ours = first == service + 0x40;
-        EXPECT_EQ(Codes().setResponseData(ecu, {first, 0x01, 0x04, 0x20}), ours) << first;
+        EXPECT_EQ(Codes().setResponseData(ecu, {first, 0x01, 0x04, 0x20}), ours) << static_cast<int>(first);
     }
 }
 
