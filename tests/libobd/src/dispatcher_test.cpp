@@ -5,6 +5,7 @@
 #include "tests/support/fakework.h"
 #include "tests/support/logcapture.h"
 
+#include <chrono>
 #include <stdexcept>
 #include <thread>
 
@@ -152,7 +153,8 @@ TEST_F(Dispatcher, CancelWhileWorkIsRunningReturnsOnlyAfterItsExecuteEnded)
     });
     // Once the new worker refuses for want of a proxy, the cancel is on its way to join the old one.
     auto const refused = std::make_shared<FakeWork>();
-    while (dispatcher.update(refused)) {
+    auto const end = std::chrono::steady_clock::now() + support::patience;
+    while (dispatcher.update(refused) && std::chrono::steady_clock::now() < end) {
         std::this_thread::yield();
     }
     EXPECT_FALSE(returned);
