@@ -43,14 +43,23 @@ CLI::Option* addParsed(CLI::App& app, std::string const& names, std::optional<Va
         help);
 }
 
+template <typename Value>
+std::optional<Value> parseWord(std::map<std::string, Value> const& words, std::string const& text)
+{
+    auto const found = words.find(text);
+    return found != words.end() ? std::optional(found->second) : std::nullopt;
+}
+
 std::optional<obd::UnitSystem> parseUnits(std::string const& text)
 {
-    static std::map<std::string, obd::UnitSystem> const names = {
-        {"metric", obd::UnitSystem::Metric},
-        {"imperial", obd::UnitSystem::Imperial},
-    };
-    auto const found = names.find(text);
-    return found != names.end() ? std::optional(found->second) : std::nullopt;
+    return parseWord<obd::UnitSystem>({{"metric", obd::UnitSystem::Metric}, {"imperial", obd::UnitSystem::Imperial}},
+                                      text);
+}
+
+std::optional<ColorMode> parseColor(std::string const& text)
+{
+    return parseWord<ColorMode>({{"auto", ColorMode::Auto}, {"always", ColorMode::Always}, {"never", ColorMode::Never}},
+                                text);
 }
 
 } // namespace
@@ -98,10 +107,9 @@ void CommandLine::addGlobalOptions()
     m_app.add_flag("-y,--yes", m_options.yes, "Don't ask before clearing codes or running a routine");
     m_app.add_flag("-q,--quiet", m_options.quiet, "No progress on standard error");
     m_app.add_flag("-v,--verbose", m_options.verbose, "More progress on standard error");
-    m_app.add_option("--color", m_options.color, "Colours: auto, always or never (also NO_COLOR)")
-        ->type_name("WHEN")
-        ->transform(CLI::CheckedTransformer(std::map<std::string, ColorMode>{
-            {"auto", ColorMode::Auto}, {"always", ColorMode::Always}, {"never", ColorMode::Never}}));
+    addParsed(m_app, "--color", m_options.color, parseColor, "auto, always or never",
+              "Colours: auto, always or never (also NO_COLOR)")
+        ->type_name("WHEN");
 }
 
 CLI::App* CommandLine::addCommand(std::string const& name, std::string const& help, Action action)
@@ -119,7 +127,9 @@ ExitCode CommandLine::run(int argc, char const* const* argv)
         m_app.exit(wanted);
         return ExitCode::Done;
     } catch (CLI::ParseError const& error) {
-        fmt::print(stderr, "velmora: {}\n  - velmora --help tells the options and commands\n", error.what());
+        std::vector<std::string> const unknown = m_app.remaining();
+        fmt::print(stderr, "velmora: {}\n  - velmora --help tells the options and commands\n",
+                   unknown.empty() ? error.what() : "\"" + unknown.front() + "\" is no command or option");
         return ExitCode::WrongUse;
     }
     return runAction();

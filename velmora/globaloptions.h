@@ -30,7 +30,7 @@ struct GlobalOptions
     bool yes = false;
     bool quiet = false;
     bool verbose = false;
-    ColorMode color = ColorMode::Auto;
+    std::optional<ColorMode> color;
 };
 
 // "auto", "1" to "9", or as adapters print a protocol that they found, "A6". Nothing for any other text.

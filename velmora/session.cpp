@@ -35,7 +35,7 @@ std::string portKey()
 } // namespace
 
 Session::Session(GlobalOptions const& options)
-    : m_options(options),
+    : m_options(options), m_deadline([this] { m_bridge->invalidate(); }),
       m_settings(std::make_shared<SettingsStore>(
           options.settingsFile.empty() ? SettingsStore::defaultFile() : std::filesystem::path(options.settingsFile)))
 {
@@ -95,16 +95,15 @@ void Session::connect()
     if (!m_options.quiet) {
         fmt::print(stderr, "Connecting to {} ...\n", toString(address));
     }
-    if (!openOnThread(address)) {
+    if (!openOnThread()) {
         failOpening(address);
     }
     selectEcu();
 }
 
 // The opening may take minutes; meanwhile this thread dispatches and listens for Ctrl-C.
-bool Session::openOnThread(PortAddress const& address)
+bool Session::openOnThread()
 {
-    static_cast<void>(address);
     std::atomic<bool> done{false};
     bool opened = false;
     std::thread opener([&] {
@@ -118,6 +117,10 @@ bool Session::openOnThread(PortAddress const& address)
     });
     m_loop.runUntil([&done] { return done.load(); });
     opener.join();
+    Interrupt::instance().setHandler([this] {
+        m_loop.wake();
+        m_deadline.start();
+    });
     return opened;
 }
 
@@ -178,8 +181,10 @@ void Session::close()
     if (m_bridge == nullptr) {
         return;
     }
+    m_deadline.start();
     m_obd->getConnectionManager()->closeConnection();
     m_bridge->invalidate();
+    m_deadline.stop();
     m_pump.reset();
     m_bridge.reset();
 }

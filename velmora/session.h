@@ -1,5 +1,6 @@
 #pragma once
 
+#include "velmora/deadline.h"
 #include "velmora/dispatchloop.h"
 #include "velmora/globaloptions.h"
 #include "velmora/port/bridgepump.h"
@@ -36,6 +37,8 @@ public:
     obd::IObdVelmora& obd() const { return *m_obd; }
     std::shared_ptr<obd::IObdProxy> proxy() const;
     std::shared_ptr<obd::IAdapter> adapter() const;
+    // The port's address, for messages and reports.
+    std::string port() const { return toString(portAddress()); }
     DispatchLoop& loop() { return m_loop; }
     GlobalOptions const& options() const { return m_options; }
 
@@ -45,12 +48,14 @@ public:
 private:
     PortAddress portAddress() const;
     obd::VehicleProtocol protocol() const;
-    bool openOnThread(PortAddress const& address);
+    bool openOnThread();
     [[noreturn]] void failOpening(PortAddress const& address);
     void selectEcu();
     void close();
 
     GlobalOptions const m_options;
+    // Ends the waiting for a silent adapter soon after a close or an interruption began.
+    Deadline m_deadline;
     std::shared_ptr<SettingsStore> m_settings;
     DispatchLoop m_loop;
     std::shared_ptr<obd::IObdVelmora> m_obd;

@@ -4,6 +4,10 @@ namespace velmora {
 
 void addCommands(CommandLine& commandLine)
 {
+    addScanCommand(commandLine);
+    addSensorsCommand(commandLine);
+    addConsoleCommand(commandLine);
+    addSimulateCommand(commandLine);
     addPortsCommand(commandLine);
 }
 

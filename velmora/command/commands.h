@@ -8,6 +8,10 @@ class CommandLine;
 void addCommands(CommandLine& commandLine);
 
 // One function a command, each in the file of its name.
+void addConsoleCommand(CommandLine& commandLine);
 void addPortsCommand(CommandLine& commandLine);
+void addScanCommand(CommandLine& commandLine);
+void addSensorsCommand(CommandLine& commandLine);
+void addSimulateCommand(CommandLine& commandLine);
 
 } // namespace velmora

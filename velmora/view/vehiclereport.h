@@ -1,0 +1,47 @@
+#pragma once
+
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace velmora {
+
+// What a scan finds, ready to be shown; no bus work here. Empty texts and missing values were not told.
+struct AdapterReport
+{
+    std::string port;
+    std::string device; // name and version
+    std::string description;
+    std::string identification;
+    std::optional<float> volts;
+};
+
+struct ProtocolReport
+{
+    std::optional<int> number; // the adapter's, 1 to 9
+    std::string name;          // the adapter's words
+};
+
+struct ModuleReport
+{
+    unsigned int id;
+    std::string name;
+    std::string description;
+    std::string standard;
+    std::vector<unsigned int> supported; // identifiers of service 01 that are sensors
+};
+
+struct VehicleReport
+{
+    AdapterReport adapter;
+    ProtocolReport protocol;
+    std::vector<ModuleReport> modules; // in rising order of id
+};
+
+// Headings and aligned columns, for people.
+std::string toText(VehicleReport const& report);
+
+// The document that docs/json.md describes.
+std::string toJson(VehicleReport const& report);
+
+} // namespace velmora

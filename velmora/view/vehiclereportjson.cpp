@@ -1,0 +1,65 @@
+#include "velmora/view/vehiclereport.h"
+
+#include <fmt/format.h>
+#include <nlohmann/json.hpp>
+
+namespace velmora {
+
+namespace {
+
+using Json = nlohmann::ordered_json;
+
+// A text that was not told is null, never an empty string.
+Json textOrNull(std::string const& text)
+{
+    return text.empty() ? Json(nullptr) : Json(text);
+}
+
+template <typename Value>
+Json valueOrNull(std::optional<Value> const& value)
+{
+    return value ? Json(*value) : Json(nullptr);
+}
+
+// The voltage in the tenths that the adapter gives.
+Json voltsOrNull(std::optional<float> const& volts)
+{
+    return volts ? Json(static_cast<double>(static_cast<int>(*volts * 10.0F + 0.5F)) / 10.0) : Json(nullptr);
+}
+
+Json moduleJson(ModuleReport const& module)
+{
+    Json supported = Json::array();
+    for (unsigned int const id : module.supported) {
+        supported.push_back(fmt::format("{:02X}", id));
+    }
+    return {{"id", fmt::format("{:X}", module.id)},
+            {"name", textOrNull(module.name)},
+            {"description", textOrNull(module.description)},
+            {"standard", textOrNull(module.standard)},
+            {"sensors", supported}};
+}
+
+} // namespace
+
+std::string toJson(VehicleReport const& report)
+{
+    Json modules = Json::array();
+    for (ModuleReport const& module : report.modules) {
+        modules.push_back(moduleJson(module));
+    }
+    Json const document = {
+        {"adapter",
+         {{"port", report.adapter.port},
+          {"device", textOrNull(report.adapter.device)},
+          {"description", textOrNull(report.adapter.description)},
+          {"identification", textOrNull(report.adapter.identification)},
+          {"volts", voltsOrNull(report.adapter.volts)}}},
+        {"protocol", {{"number", valueOrNull(report.protocol.number)}, {"name", textOrNull(report.protocol.name)}}},
+        {"modules", modules},
+    };
+    // An adapter may say anything: bytes that are no UTF-8 are replaced.
+    return document.dump(2, ' ', false, Json::error_handler_t::replace) + "\n";
+}
+
+} // namespace velmora
