@@ -115,6 +115,9 @@ std::vector<std::string> splitAlternatives(std::string_view text)
 std::vector<std::string> expandText(std::string_view pattern, std::size_t count, const Lists& lists)
 {
     const std::vector<Alternatives> parts = splitPattern(pattern, lists);
+    if (pattern.find('{') == std::string_view::npos) {
+        return std::vector<std::string>(count, std::string(pattern));
+    }
     std::vector<std::string> texts(1);
     for (const Alternatives& part : parts) {
         std::vector<std::string> longer;

@@ -15,9 +15,9 @@ using Lists = std::map<std::string, std::vector<std::string>, std::less<>>;
 std::vector<std::string> splitAlternatives(std::string_view text);
 
 // The texts that a pattern stands for. "{Low|High}" gives one text with each word, "{1-4}" and "{A-F}" one for each
-// number or letter, "{name}" one for each entry of that list. Of several groups the last one changes fastest.
-// Throws SourceError for an open brace, an empty or falling group, an unknown list, and when the pattern does not give
-// exactly `count` texts.
+// number or letter, "{name}" one for each entry of that list. Of several groups the last one changes fastest. A pattern
+// without a group stands `count` times. Throws SourceError for an open brace, an empty or falling group, an unknown
+// list, and when groups do not give exactly `count` texts.
 std::vector<std::string> expandText(std::string_view pattern, std::size_t count, const Lists& lists);
 
 } // namespace catalogue
