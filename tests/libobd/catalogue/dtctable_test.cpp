@@ -192,6 +192,59 @@ TEST(DtcTable, MakersSamplesWordForWord)
     }
 }
 
+TEST(DtcTable, MisspelledSampleIsKept)
+{
+    EXPECT_EQ(textsOf("Alfa Romeo", "P1213"),
+              (std::vector<std::string>{"Full Throttle Swithc Or Circuit", "Full Throttle Swithc Or Circuit"}));
+}
+
+TEST(DtcTable, RepeatedCodesStandTwoToFourTimes)
+{
+    std::map<std::pair<std::int32_t, std::string_view>, int> rows;
+    for (const DtcRow& row : DtcTable()) {
+        ++rows[{row.maker, row.code}];
+    }
+    std::map<std::string_view, int> repeated;
+    for (const auto& [key, count] : rows) {
+        EXPECT_LE(count, 4) << key.second;
+        if (count > 1) {
+            ++repeated["all"];
+            ++repeated[catalogue::makerName(static_cast<std::size_t>(key.first))];
+        }
+    }
+    EXPECT_EQ(repeated["all"], 141);
+    EXPECT_EQ(repeated["Fiat"], 35);
+    EXPECT_EQ(repeated["GM"], 17);
+    EXPECT_EQ(repeated["Alfa Romeo"], 14);
+    EXPECT_EQ(repeated["Generic"], 0);
+}
+
+TEST(DtcTable, MakersOfOnePlatformHaveTheSameRows)
+{
+    using Rows = std::vector<std::pair<std::string_view, std::string_view>>;
+    std::map<std::string_view, Rows> rows;
+    for (const DtcRow& row : DtcTable()) {
+        rows[catalogue::makerName(static_cast<std::size_t>(row.maker))].emplace_back(row.code, row.text);
+    }
+    EXPECT_FALSE(rows["Chrysler"].empty() || rows["Citroen"].empty() || rows["Lincoln"].empty());
+    EXPECT_EQ(rows["Chrysler"], rows["Dodge"]);
+    EXPECT_EQ(rows["Chrysler"], rows["Jeep"]);
+    EXPECT_EQ(rows["Citroen"], rows["Peugeot"]);
+    EXPECT_EQ(rows["Lincoln"], rows["Mercury"]);
+    EXPECT_EQ(rows["Lincoln"], rows["Oldsmobile"]);
+    EXPECT_EQ(rows["Skoda"], rows["Volkswagen"]);
+}
+
+TEST(DtcTable, GenericRowsStayInTheControlledRanges)
+{
+    const std::set<std::string> generic = {"P0", "P2", "P3", "U0", "U3", "B0", "B3", "C0"};
+    for (const DtcRow& row : DtcTable()) {
+        if (row.maker == 0) {
+            EXPECT_EQ(generic.count(std::string(row.code, 2)), 1U) << row.code;
+        }
+    }
+}
+
 TEST(DtcTable, AllCodesButTwoAreWellFormed)
 {
     std::set<std::string> malformed;
