@@ -24,7 +24,7 @@ CommandReply fromBus(const BusReply& reply)
 
 } // namespace
 
-CommandReply setProtocol(CommandContext& context, const std::string& argument)
+CommandReply tryProtocol(CommandContext& context, const std::string& argument)
 {
     const bool searches = argument.size() > 1 && argument[0] == 'A';
     const auto number = parseHexNumber(searches ? argument.substr(1) : argument).value_or(0);
@@ -33,6 +33,14 @@ CommandReply setProtocol(CommandContext& context, const std::string& argument)
     }
     context.bus.select(static_cast<int>(number), searches || number == 0);
     return ok();
+}
+
+/// Unlike the protocol that is only tried, this one outlasts a reset.
+CommandReply setProtocol(CommandContext& context, const std::string& argument)
+{
+    const CommandReply reply = tryProtocol(context, argument);
+    context.bus.store();
+    return reply;
 }
 
 CommandReply describeProtocol(CommandContext& context, const std::string& /*argument*/)
@@ -144,13 +152,18 @@ CommandReply keywords(CommandContext& context, const std::string& /*argument*/)
 }
 
 /// Diamex adapters repeat the chosen number: "6=ISO 15765-4 (CAN 11/500)".
+CommandReply diamexTryProtocol(CommandContext& context, const std::string& argument)
+{
+    const CommandReply reply = tryProtocol(context, argument);
+    const bool chosen = reply.lines.front() == "OK";
+    return chosen ? line(argument + "=" + context.bus.description()) : reply;
+}
+
 CommandReply diamexProtocol(CommandContext& context, const std::string& argument)
 {
-    const CommandReply reply = setProtocol(context, argument);
-    if (reply.lines.front() == "?") {
-        return reply;
-    }
-    return line(argument + "=" + context.bus.description());
+    CommandReply reply = diamexTryProtocol(context, argument);
+    context.bus.store();
+    return reply;
 }
 
 } // namespace obdsim::handler

@@ -106,6 +106,17 @@ void BusLink::select(int number, bool automatic)
     close();
 }
 
+void BusLink::store()
+{
+    m_storedNumber = m_number;
+    m_storedAutomatic = m_automatic;
+}
+
+void BusLink::restore()
+{
+    select(m_storedNumber, m_storedAutomatic);
+}
+
 void BusLink::close()
 {
     m_open = false;

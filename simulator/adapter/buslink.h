@@ -47,6 +47,12 @@ public:
     /// ATSP and ATTP: 0 for automatic. `automatic`: search if it fails.
     void select(int number, bool automatic);
 
+    /// Keeps the chosen protocol for restore().
+    void store();
+
+    /// Back to the stored protocol, as after a reset.
+    void restore();
+
     /// ATPC: the next request starts the bus anew.
     void close();
 
@@ -88,6 +94,8 @@ private:
     const Quirks& m_quirks;
     int m_number = 0;
     bool m_automatic = true;
+    int m_storedNumber = 0;
+    bool m_storedAutomatic = true;
     bool m_open = false;
     bool m_asked = false; ///< a request has been sent since the protocol was chosen
 };

@@ -34,7 +34,7 @@ CommandReply reset(CommandContext& context, const std::string& /*argument*/)
 {
     context.settings = Settings{};
     context.settings.linefeeds = context.profile.quirks.has(Quirk::LinefeedsOn);
-    context.bus.close();
+    context.bus.restore();
     return {{context.profile.banner}, After::Reset, resetTime};
 }
 
@@ -44,6 +44,7 @@ CommandReply defaults(CommandContext& context, const std::string& /*argument*/)
     context.settings = Settings{};
     context.settings.linefeeds = context.profile.quirks.has(Quirk::LinefeedsOn);
     context.settings.echo = echo || !context.profile.quirks.has(Quirk::EchoKeptOff);
+    context.bus.restore();
     return ok();
 }
 

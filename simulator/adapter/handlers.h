@@ -22,6 +22,7 @@ CommandReply baudRate(CommandContext& context, const std::string& argument);
 CommandReply baudWait(CommandContext& context, const std::string& argument);
 CommandReply sleep(CommandContext& context, const std::string& argument);
 
+CommandReply tryProtocol(CommandContext& context, const std::string& argument);
 CommandReply setProtocol(CommandContext& context, const std::string& argument);
 CommandReply describeProtocol(CommandContext& context, const std::string& argument);
 CommandReply protocolNumber(CommandContext& context, const std::string& argument);
@@ -40,6 +41,7 @@ CommandReply canStatus(CommandContext& context, const std::string& argument);
 CommandReply bufferDump(CommandContext& context, const std::string& argument);
 CommandReply keywords(CommandContext& context, const std::string& argument);
 
+CommandReply diamexTryProtocol(CommandContext& context, const std::string& argument);
 CommandReply diamexProtocol(CommandContext& context, const std::string& argument);
 CommandReply obdProsBaudRate(CommandContext& context, const std::string& argument);
 

@@ -15,7 +15,6 @@ struct Settings
     bool lengths = false;    ///< ATD1: the data length code behind CAN identifiers
     bool formatting = true;  ///< ATCAF1: the adapter handles PCI bytes
     bool flowControl = true; ///< ATCFC1: the adapter sends the flow control frames
-    bool memory = true;      ///< ATM1: protocols are remembered
     bool responses = true;   ///< ATR1: wait for answers
     int timeoutTicks = 0x32; ///< ATST, in steps of 4 ms
     int adaptiveTiming = 1;

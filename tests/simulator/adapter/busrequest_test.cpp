@@ -257,6 +257,16 @@ TEST(ProtocolSearch, withoutACarNothingIsFound)
     EXPECT_EQ(host.ask({"ATSPA8", "0100"}), "SEARCHING...\rUNABLE TO CONNECT\r\r>");
 }
 
+TEST(ProtocolSearch, resetForgetsATriedProtocolButNotAChosenOne)
+{
+    auto host = unplugged();
+    EXPECT_EQ(host.ask({"ATE0", "ATTP6", "ATZ", "ATE0", "ATDPN"}), "A0\r\r>");
+    EXPECT_EQ(host.ask({"ATSP6", "ATTP3", "ATD", "ATE0", "ATDPN"}), "6\r\r>");
+    auto diamex = unplugged("diamex");
+    EXPECT_EQ(diamex.ask({"ATE0", "ATPA6", "ATZ", "ATE0", "ATN"}), "A0\r\r>");
+    EXPECT_EQ(diamex.ask({"ATP6", "ATZ", "ATE0", "ATN"}), "6\r\r>");
+}
+
 TEST(ProtocolSearch, closedBusIsStartedAnew)
 {
     auto host = simulated("petrol-kwp-fast");
