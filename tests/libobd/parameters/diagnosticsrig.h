@@ -49,20 +49,36 @@ inline Bytes withChecksums(Bytes const& lines)
     return data;
 }
 
-// Random replies of every length up to 40 bytes that begin with the parameter's signature, and some that do not.
+// Writes the signature to the start of each line of `step` bytes, and small sequence numbers behind it.
+inline void stampLines(Bytes& data, Bytes const& signature, std::size_t step)
+{
+    for (std::size_t start = 0; start < data.size(); start += step) {
+        std::size_t const room = std::min(signature.size(), data.size() - start);
+        std::copy_n(signature.begin(), room, data.begin() + static_cast<std::ptrdiff_t>(start));
+        if (signature.size() == 2 && start + 2 < data.size()) {
+            data[start + 2] = static_cast<unsigned char>(data[start + 2] % 6);
+        }
+    }
+}
+
+// Random replies of every length up to 40 bytes: noise, noise behind the parameter's signature, and lines of the older
+// buses without and with checksums.
 template <typename Check>
 void forRandomReplies(Bytes const& signature, Check check)
 {
     std::mt19937 random(3779);
-    for (int round = 0; round < 20; ++round) {
+    for (int round = 0; round < 6; ++round) {
         for (std::size_t length = 0; length <= 40; ++length) {
             Bytes data(length);
             for (unsigned char& byte : data) {
                 byte = static_cast<unsigned char>(random());
             }
             check(data);
-            std::copy_n(signature.begin(), std::min(signature.size(), length), data.begin());
-            check(data);
+            for (std::size_t const step : {64U, 8U, 7U}) {
+                Bytes lines = data;
+                stampLines(lines, signature, step);
+                check(lines);
+            }
         }
     }
 }

@@ -153,13 +153,18 @@ TEST(EcuName, RandomRepliesAreReadOrRefusedWithoutChange)
 {
     for (ObdProtocol const protocol : allProtocols) {
         auto const ecu = makeEcu(protocol, 0x10);
-        forRandomReplies({0x49, 0x0A}, [&ecu](Bytes const& data) {
+        bool const can = protocol == ObdProtocolCan11 || protocol == ObdProtocolCan29;
+        forRandomReplies({0x49, 0x0A}, [&ecu, can](Bytes const& data) {
             EcuName parameter;
-            bool const taken = parameter.setResponseData(ecu, data);
-            support::LogCapture log;
-            EXPECT_LE(parameter.ecuAcronym(*ecu).size(), 4U);
-            EXPECT_LE(parameter.description(*ecu).size(), 15U);
-            EXPECT_EQ(log.lines().empty(), taken);
+            ASSERT_TRUE(offer(parameter, ecu, can ? engineControl : engineLines));
+            std::string const before = parameter.ecuAcronym(*ecu);
+            if (parameter.setResponseData(ecu, data)) {
+                EXPECT_LE(parameter.ecuAcronym(*ecu).size(), 4U);
+                EXPECT_LE(parameter.description(*ecu).size(), 15U);
+            } else {
+                EXPECT_EQ(parameter.ecuAcronym(*ecu), before);
+                EXPECT_EQ(parameter.description(*ecu), "EngineControl");
+            }
         });
     }
 }

@@ -114,8 +114,10 @@ TEST(OxygenSensorTestResult, RandomRepliesAreReadOrRefusedWithoutChange)
         auto const ecu = makeEcu(protocol, 0x10);
         forRandomReplies({0x45, 0x05, 0x01}, [&ecu](Bytes const& data) {
             OxygenSensorTestResult parameter(0x05, front);
+            ASSERT_TRUE(offer(parameter, ecu, "45 05 01 0F 10 80"));
+            auto const before = parameter.getResult(ecu);
             bool const taken = parameter.setResponseData(ecu, data);
-            EXPECT_EQ(parameter.getResult(ecu) != nullptr, taken);
+            EXPECT_EQ(parameter.getResult(ecu) != before, taken);
         });
     }
 }
