@@ -1,0 +1,149 @@
+// The program as a user runs it: against simulated and recorded cars, in real time.
+
+#include "tests/e2e/childprocess.h"
+
+#include <chrono>
+#include <gtest/gtest.h>
+#include <nlohmann/json.hpp>
+#include <thread>
+
+namespace {
+
+using e2e::ChildProcess;
+using e2e::Outcome;
+using e2e::runVelmora;
+
+std::string recorded(std::string const& name)
+{
+    return std::string("replay:") + VELMORA_SOURCE_DIR + "/tests/dialogues/" + name + ".dialogue";
+}
+
+bool holds(std::string const& text, std::string const& part)
+{
+    return text.find(part) != std::string::npos;
+}
+
+TEST(Program, TellsItsVersionAndHelp)
+{
+    EXPECT_TRUE(runVelmora({"--version"}).out.starts_with("velmora "));
+    Outcome const help = runVelmora({"--help"});
+    EXPECT_EQ(help.exitCode, 0);
+    for (char const* word : {"scan", "console", "simulate", "ports", "--port", "Exit codes"}) {
+        EXPECT_TRUE(holds(help.out, word)) << word;
+    }
+}
+
+TEST(Program, WrongUseIsExitCodeTwoAndSaysWhatToDo)
+{
+    for (std::vector<std::string> const& wrong : {std::vector<std::string>{},
+                                                  {"nonsense"},
+                                                  {"-P", "10", "scan"},
+                                                  {"--ecu", "XYZ", "scan"},
+                                                  {"-u", "old", "scan"},
+                                                  {"-p", "ftp://x", "scan"},
+                                                  {"--baud", "0", "scan"}}) {
+        Outcome const outcome = runVelmora(wrong);
+        EXPECT_EQ(outcome.exitCode, 2) << outcome.err;
+        EXPECT_TRUE(outcome.err.starts_with("velmora: ")) << outcome.err;
+        EXPECT_TRUE(holds(outcome.err, "\n  - ")) << outcome.err;
+        EXPECT_TRUE(outcome.out.empty());
+    }
+}
+
+TEST(Program, PortThatDoesNotExistIsExitCodeThree)
+{
+    for (char const* port : {"/dev/no-such-port", "127.0.0.1:1", "sim:no-such-car", "replay:/no/such/file"}) {
+        Outcome const outcome = runVelmora({"-p", port, "scan"});
+        EXPECT_EQ(outcome.exitCode, 3) << port << outcome.err;
+        EXPECT_FALSE(outcome.err.empty());
+    }
+}
+
+TEST(Program, SettingsFileThatIsBrokenIsToldWithItsLine)
+{
+    std::string const file = testing::TempDir() + "velmora-broken.toml";
+    FILE* const out = std::fopen(file.c_str(), "w");
+    ASSERT_NE(out, nullptr);
+    std::fputs("[common]\nunitsystem = \n", out);
+    std::fclose(out);
+    Outcome const outcome = runVelmora({"-p", "sim:", "--settings", file, "scan"});
+    EXPECT_EQ(outcome.exitCode, 1);
+    EXPECT_TRUE(holds(outcome.err, "line 2")) << outcome.err;
+    std::remove(file.c_str());
+}
+
+TEST(Program, SilentAdapterIsExitCodeFour)
+{
+    ChildProcess simulator({"simulate", "--listen", "tcp://127.0.0.1:0", "--adapter", "silent"});
+    Outcome const outcome = runVelmora({"-q", "-p", simulator.readLine(), "scan"});
+    EXPECT_EQ(outcome.exitCode, 4) << outcome.err;
+}
+
+TEST(Program, RecordedCarWithoutAnAnswerIsExitCodeFive)
+{
+    Outcome const outcome = runVelmora({"-q", "-P", "6", "-p", recorded("can11-leaf-2011-no-data"), "scan"});
+    EXPECT_EQ(outcome.exitCode, 5) << outcome.err;
+    EXPECT_TRUE(holds(outcome.err, "ignition")) << outcome.err;
+}
+
+TEST(Program, ScansARecordedRealCarOverTcp)
+{
+    ChildProcess simulator({"simulate", "--listen", "tcp://127.0.0.1:0", "--replay",
+                            recorded("can11-a180d-three-modules").substr(std::string("replay:").size())});
+    Outcome const outcome = runVelmora({"-q", "-p", simulator.readLine(), "scan", "--json"});
+    ASSERT_EQ(outcome.exitCode, 0) << outcome.err;
+    auto const report = nlohmann::json::parse(outcome.out);
+    EXPECT_EQ(report["adapter"]["device"], "ELM327 v1.5");
+    EXPECT_EQ(report["adapter"]["description"], "ICSolution");
+    EXPECT_EQ(report["protocol"]["number"], 6);
+    ASSERT_EQ(report["modules"].size(), 3U);
+    EXPECT_EQ(report["modules"][0]["id"], "7E8");
+    EXPECT_EQ(report["modules"][2]["id"], "7EB");
+}
+
+TEST(Program, ScansASimulatedCarOverAPseudoTerminal)
+{
+    ChildProcess simulator({"simulate", "--listen", "pty", "--vehicle", "petrol-kwp-fast"});
+    Outcome const outcome = runVelmora({"-q", "-p", simulator.readLine(), "scan"});
+    ASSERT_EQ(outcome.exitCode, 0) << outcome.err;
+    EXPECT_TRUE(holds(outcome.out, "ISO 14230-4")) << outcome.out;
+    EXPECT_TRUE(outcome.err.empty()) << outcome.err;
+}
+
+TEST(Program, ConsoleReadsCommandsFromAPipe)
+{
+    Outcome const outcome = runVelmora({"-q", "-p", "sim:petrol-can11", "console"}, "ATI\nATRV\nNONSENSE\nexit\nATI\n");
+    ASSERT_EQ(outcome.exitCode, 0) << outcome.err;
+    EXPECT_TRUE(outcome.out.starts_with("ELM327 v1.5\n")) << outcome.out;
+    EXPECT_TRUE(outcome.out.ends_with("V\n(no data)\n")) << outcome.out;
+}
+
+TEST(Program, InterruptEndsWithinASecond)
+{
+    ChildProcess simulator({"simulate", "--listen", "tcp://127.0.0.1:0", "--adapter", "silent"});
+    ChildProcess scan({"-q", "-p", simulator.readLine(), "scan"});
+    std::this_thread::sleep_for(std::chrono::milliseconds(300));
+    auto const start = std::chrono::steady_clock::now();
+    scan.interrupt();
+    EXPECT_EQ(scan.wait(), 130);
+    EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(1));
+}
+
+TEST(Program, LinkThatBreaksWhileConnectingIsExitCodeEight)
+{
+    ChildProcess simulator({"simulate", "--listen", "tcp://127.0.0.1:0", "--fault", "loss@60"});
+    Outcome const outcome = runVelmora({"-q", "-p", simulator.readLine(), "scan"});
+    EXPECT_EQ(outcome.exitCode, 8) << outcome.err;
+}
+
+TEST(Program, WrongSimulatorOptionsAreExitCodeTwo)
+{
+    for (std::vector<std::string> const& wrong : {std::vector<std::string>{"simulate", "--fault", "nonsense"},
+                                                  {"simulate", "--adapter", "none"},
+                                                  {"simulate", "--vehicle", "none"},
+                                                  {"simulate", "--listen", "sim:x"}}) {
+        EXPECT_EQ(runVelmora(wrong).exitCode, 2);
+    }
+}
+
+} // namespace
