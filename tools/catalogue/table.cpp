@@ -70,8 +70,7 @@ void TableBuilder::checkExceptions(const Twin& twin)
     for (const std::string& code : twin.exceptions) {
         const auto matches = [&](const Row& row) { return row.maker == twin.original && row.code == code; };
         if (std::none_of(m_source.rows.begin(), m_source.rows.end(), matches)) {
-            report(twin.place,
-                   std::string("'").append(makerName(twin.original)) + "' has no code " + code + " to leave out");
+            report(twin.place, "'" + std::string(makerName(twin.original)) + "' has no code " + code + " to leave out");
         }
     }
 }
