@@ -1,0 +1,35 @@
+#include "libobd/src/sensormodels.h"
+
+#include <obd/parameteridentifier.h>
+
+#include <algorithm>
+#include <iterator>
+
+namespace obd {
+
+bool isSelectable(int uid)
+{
+    static constexpr int alwaysShown[] = {Pid2Uid(0x05), Pid2Uid(0x0C), Pid2Uid(0x0D), Pid2Uid(0x0F)};
+    return std::find(std::begin(alwaysShown), std::end(alwaysShown), uid) == std::end(alwaysShown);
+}
+
+std::shared_ptr<SensorValueDataModel> makeValueModel(std::shared_ptr<SensorValue> const& value)
+{
+    return value != nullptr ? std::make_shared<SensorValueDataModel>(value->uid(), value->textualValue()) : nullptr;
+}
+
+std::shared_ptr<SensorDataModel> makeSensorModel(SensorDescriptor const& sensor, std::string const& name,
+                                                 std::shared_ptr<SensorValue> const& value)
+{
+    return std::make_shared<SensorDataModel>(isSelectable(sensor.uid()), sensor.uid(), name, sensor.unit(),
+                                             makeValueModel(value), nullptr);
+}
+
+std::shared_ptr<SensorValue> findValue(std::vector<std::shared_ptr<SensorValue>> const& values, int uid)
+{
+    auto const found = std::find_if(values.begin(), values.end(),
+                                    [uid](auto const& value) { return value != nullptr && value->uid() == uid; });
+    return found != values.end() ? *found : nullptr;
+}
+
+} // namespace obd

@@ -1,0 +1,27 @@
+#pragma once
+
+#include <obd/sensordatamodel.h>
+#include <obd/sensordescriptor.h>
+#include <obd/sensorvalue.h>
+
+#include <memory>
+#include <string>
+#include <vector>
+
+namespace obd {
+
+// The leading flag of a sensor's data model: false for coolant temperature, engine speed, vehicle speed and intake air
+// temperature, which applications always show.
+bool isSelectable(int uid);
+
+// The reading of a sensor without statistics; null for null.
+std::shared_ptr<SensorValueDataModel> makeValueModel(std::shared_ptr<SensorValue> const& value);
+
+// A sensor under a name, with its reading, which may be null, and without a range.
+std::shared_ptr<SensorDataModel> makeSensorModel(SensorDescriptor const& sensor, std::string const& name,
+                                                 std::shared_ptr<SensorValue> const& value);
+
+// The value of a sensor among those of its parameter, which leave out the sensors without a reading. Null for those.
+std::shared_ptr<SensorValue> findValue(std::vector<std::shared_ptr<SensorValue>> const& values, int uid);
+
+} // namespace obd
