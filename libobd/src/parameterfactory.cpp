@@ -1,8 +1,10 @@
 #include "libobd/src/parameterfactory.h"
 
+#include "libobd/powertrain/codedparameters.h"
 #include "libobd/powertrain/fueltrim.h"
 #include "libobd/powertrain/monitorstatus.h"
 #include "libobd/powertrain/numericparameters.h"
+#include "libobd/powertrain/oxygensensorspresent.h"
 
 #include <algorithm>
 #include <iterator>
@@ -34,6 +36,7 @@ constexpr FactoryRow row(int pid)
 // (0x01, 0x41), the trouble code of the freeze frame (0x02) and the test equipment configurations (0x4F, 0x50), which
 // have their own ways.
 constexpr FactoryRow sensors[] = {
+    row<FuelSystem>(0x03),
     row<CalculatedEngineLoad>(0x04),
     row<EngineCoolantTemperature>(0x05),
     row<ShortTermFuelTrimBank1>(0x06),
@@ -48,6 +51,11 @@ constexpr FactoryRow sensors[] = {
     row<IntakeAirTemperature>(0x0F),
     row<AirFlowRate>(0x10),
     row<ThrottlePosition>(0x11),
+    row<SecondaryAirStatus>(0x12),
+    row<OxygenSensorsPresent13>(0x13),
+    row<SaeStandard>(0x1C),
+    row<OxygenSensorsPresent1d>(0x1D),
+    row<AuxiliaryInputStatus>(0x1E),
     row<EngineRuntime>(0x1F),
     row<MilDistance>(0x21),
     row<RelativeFuelRailPressure>(0x22),
@@ -77,6 +85,7 @@ constexpr FactoryRow sensors[] = {
     row<CommandedThrottleActuatorControl>(0x4C),
     row<EngineRuntimeMil>(0x4D),
     row<EngineRuntimeDtc>(0x4E),
+    row<FuelTypeParameter>(0x51),
     row<AlcoholFuelPercentage>(0x52),
     row<AbsoluteEvapSystemVaporPressure>(0x53),
     row<EvapSystemVaporPressure>(0x54),
@@ -90,12 +99,16 @@ constexpr FactoryRow sensors[] = {
     row<EngineOilTemperature>(0x5C),
     row<FuelInjectionTiming>(0x5D),
     row<EngineFuelRate>(0x5E),
+    row<EmissionStandard>(0x5F),
     row<RequestedTorque>(0x61),
     row<ActualTorque>(0x62),
     row<ReferenceTorque>(0x63),
+    row<AuxiliaryIo>(0x65),
+    row<NOxControlAreaStatus>(0x7D),
+    row<PmControlAreaStatus>(0x7E),
 };
 static_assert(pidsRise(sensors), "PIDs must rise, none twice");
-static_assert(std::size(sensors) == 59);
+static_assert(std::size(sensors) == 70);
 
 std::shared_ptr<PowertrainParameter> makeSensor(ParameterIdentifier::Id id, ObdMode mode, unsigned char frame)
 {

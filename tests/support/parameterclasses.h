@@ -1,7 +1,9 @@
 #pragma once
 
+#include "libobd/powertrain/codedparameters.h"
 #include "libobd/powertrain/fueltrim.h"
 #include "libobd/powertrain/numericparameters.h"
+#include "libobd/powertrain/oxygensensorspresent.h"
 
 #include <map>
 #include <memory>
@@ -26,6 +28,7 @@ std::shared_ptr<obd::PowertrainParameter> makeParameter(obd::ObdMode mode, unsig
 inline std::map<std::string, MakeParameter> const& parameterClasses()
 {
     static std::map<std::string, MakeParameter> const classes{
+        SUPPORT_PARAMETER(FuelSystem),
         SUPPORT_PARAMETER(CalculatedEngineLoad),
         SUPPORT_PARAMETER(EngineCoolantTemperature),
         SUPPORT_PARAMETER(ShortTermFuelTrimBank1),
@@ -40,6 +43,11 @@ inline std::map<std::string, MakeParameter> const& parameterClasses()
         SUPPORT_PARAMETER(IntakeAirTemperature),
         SUPPORT_PARAMETER(AirFlowRate),
         SUPPORT_PARAMETER(ThrottlePosition),
+        SUPPORT_PARAMETER(SecondaryAirStatus),
+        SUPPORT_PARAMETER(OxygenSensorsPresent13),
+        SUPPORT_PARAMETER(SaeStandard),
+        SUPPORT_PARAMETER(OxygenSensorsPresent1d),
+        SUPPORT_PARAMETER(AuxiliaryInputStatus),
         SUPPORT_PARAMETER(EngineRuntime),
         SUPPORT_PARAMETER(MilDistance),
         SUPPORT_PARAMETER(RelativeFuelRailPressure),
@@ -69,6 +77,7 @@ inline std::map<std::string, MakeParameter> const& parameterClasses()
         SUPPORT_PARAMETER(CommandedThrottleActuatorControl),
         SUPPORT_PARAMETER(EngineRuntimeMil),
         SUPPORT_PARAMETER(EngineRuntimeDtc),
+        SUPPORT_PARAMETER(FuelTypeParameter),
         SUPPORT_PARAMETER(AlcoholFuelPercentage),
         SUPPORT_PARAMETER(AbsoluteEvapSystemVaporPressure),
         SUPPORT_PARAMETER(EvapSystemVaporPressure),
@@ -82,9 +91,13 @@ inline std::map<std::string, MakeParameter> const& parameterClasses()
         SUPPORT_PARAMETER(EngineOilTemperature),
         SUPPORT_PARAMETER(FuelInjectionTiming),
         SUPPORT_PARAMETER(EngineFuelRate),
+        SUPPORT_PARAMETER(EmissionStandard),
         SUPPORT_PARAMETER(RequestedTorque),
         SUPPORT_PARAMETER(ActualTorque),
         SUPPORT_PARAMETER(ReferenceTorque),
+        SUPPORT_PARAMETER(AuxiliaryIo),
+        SUPPORT_PARAMETER(NOxControlAreaStatus),
+        SUPPORT_PARAMETER(PmControlAreaStatus),
     };
     return classes;
 }
