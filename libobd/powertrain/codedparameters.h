@@ -50,6 +50,7 @@ inline constexpr Quantity powerTakeOff = coded::states(coded::textOf<texts::powe
 inline constexpr Quantity autoTransmission = coded::states(coded::textOf<texts::autoTransmission>);
 inline constexpr Quantity manualTransmission = coded::states(coded::textOf<texts::manualTransmission>);
 inline constexpr Quantity glowPlugLamp = coded::states(coded::textOf<texts::glowPlugLamp>);
+inline constexpr Quantity controlStatus = coded::states(coded::textOf<texts::controlStatus>);
 inline constexpr Quantity controlArea = coded::states(coded::textOf<texts::controlArea>);
 
 } // namespace states

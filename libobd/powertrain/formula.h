@@ -38,6 +38,22 @@ constexpr Decoded celsius(Raw raw, IEcu const& /*ecu*/)
     return raw - 40.0;
 }
 
+constexpr Decoded wideCelsius(Raw raw, IEcu const& /*ecu*/)
+{
+    return raw * 4.0 - 40.0;
+}
+
+constexpr Decoded tenthCelsius(Raw raw, IEcu const& /*ecu*/)
+{
+    return raw * 0.1 - 40.0;
+}
+
+// Whole degrees at a turbine: the tenths are cut off before the offset is taken away.
+constexpr Decoded turbineCelsius(Raw raw, IEcu const& /*ecu*/)
+{
+    return -40.0 - static_cast<int>(raw * -0.1);
+}
+
 // Tenths of a degree, cut toward zero.
 constexpr Decoded wholeCelsius(Raw raw, IEcu const& /*ecu*/)
 {
@@ -47,6 +63,11 @@ constexpr Decoded wholeCelsius(Raw raw, IEcu const& /*ecu*/)
 constexpr Decoded timesThree(Raw raw, IEcu const& /*ecu*/)
 {
     return raw * 3.0;
+}
+
+constexpr Decoded timesEight(Raw raw, IEcu const& /*ecu*/)
+{
+    return raw * 8.0;
 }
 
 // The reply counts quarters of a revolution; they are dropped.
@@ -97,6 +118,28 @@ constexpr Decoded twentieths(Raw raw, IEcu const& /*ecu*/)
     return raw / 20.0;
 }
 
+constexpr Decoded hundredths(Raw raw, IEcu const& /*ecu*/)
+{
+    return raw * 0.01;
+}
+
+// Steps of 1/32.
+constexpr Decoded thirtySeconds(Raw raw, IEcu const& /*ecu*/)
+{
+    return raw * 0.03125;
+}
+
+constexpr Decoded fiveThousandths(Raw raw, IEcu const& /*ecu*/)
+{
+    return raw * 0.005;
+}
+
+// The trim that follows the voltage of an oxygen sensor; 0xFF says that the sensor has no part in it.
+constexpr Decoded sensorTrim(Raw raw, IEcu const& ecu)
+{
+    return raw == 0xFF ? std::nullopt : trim(raw, ecu);
+}
+
 constexpr Decoded thousandths(Raw raw, IEcu const& /*ecu*/)
 {
     return raw * 0.001;
@@ -116,6 +159,17 @@ inline Decoded airFlow(Raw raw, IEcu const& ecu)
 inline Decoded equivalenceRatio(Raw raw, IEcu const& ecu)
 {
     return raw * static_cast<double>(ecu.equivalenceRatioMax()) / 65535.0;
+}
+
+inline Decoded oxygenSensorVoltage(Raw raw, IEcu const& ecu)
+{
+    return raw * static_cast<double>(ecu.oxygenSensorVoltageMax()) / 65535.0;
+}
+
+// Steps of 1/32768 of the maximum; a current of none is 0.
+inline Decoded oxygenSensorCurrent(Raw raw, IEcu const& ecu)
+{
+    return raw * 0.000030517578125 * ecu.oxygenSensorCurrentMax();
 }
 
 } // namespace obd::formula

@@ -3,7 +3,9 @@
 #include "libobd/powertrain/codedparameters.h"
 #include "libobd/powertrain/fueltrim.h"
 #include "libobd/powertrain/monitorstatus.h"
+#include "libobd/powertrain/multisensorparameters.h"
 #include "libobd/powertrain/numericparameters.h"
+#include "libobd/powertrain/oxygensensors.h"
 #include "libobd/powertrain/oxygensensorspresent.h"
 
 #include <algorithm>
@@ -53,6 +55,14 @@ constexpr FactoryRow sensors[] = {
     row<ThrottlePosition>(0x11),
     row<SecondaryAirStatus>(0x12),
     row<OxygenSensorsPresent13>(0x13),
+    row<OxygenSensor1Bank1>(0x14),
+    row<OxygenSensor2Bank1>(0x15),
+    row<OxygenSensor3Bank1>(0x16),
+    row<OxygenSensor4Bank1>(0x17),
+    row<OxygenSensor1Bank2>(0x18),
+    row<OxygenSensor2Bank2>(0x19),
+    row<OxygenSensor3Bank2>(0x1A),
+    row<OxygenSensor4Bank2>(0x1B),
     row<SaeStandard>(0x1C),
     row<OxygenSensorsPresent1d>(0x1D),
     row<AuxiliaryInputStatus>(0x1E),
@@ -60,6 +70,14 @@ constexpr FactoryRow sensors[] = {
     row<MilDistance>(0x21),
     row<RelativeFuelRailPressure>(0x22),
     row<FuelRailPressure>(0x23),
+    row<OxygenSensorErvSensor1>(0x24),
+    row<OxygenSensorErvSensor2>(0x25),
+    row<OxygenSensorErvSensor3>(0x26),
+    row<OxygenSensorErvSensor4>(0x27),
+    row<OxygenSensorErvSensor5>(0x28),
+    row<OxygenSensorErvSensor6>(0x29),
+    row<OxygenSensorErvSensor7>(0x2A),
+    row<OxygenSensorErvSensor8>(0x2B),
     row<CommandedEgr>(0x2C),
     row<EgrError>(0x2D),
     row<EvaporativePurge>(0x2E),
@@ -68,6 +86,14 @@ constexpr FactoryRow sensors[] = {
     row<DistanceTraveled>(0x31),
     row<VaporPressure>(0x32),
     row<BarometricPressure>(0x33),
+    row<OxygenSensor1Erc>(0x34),
+    row<OxygenSensor2Erc>(0x35),
+    row<OxygenSensor3Erc>(0x36),
+    row<OxygenSensor4Erc>(0x37),
+    row<OxygenSensor5Erc>(0x38),
+    row<OxygenSensor6Erc>(0x39),
+    row<OxygenSensor7Erc>(0x3A),
+    row<OxygenSensor8Erc>(0x3B),
     row<CatalystTemperatureBank1Sensor1>(0x3C),
     row<CatalystTemperatureBank2Sensor1>(0x3D),
     row<CatalystTemperatureBank1Sensor2>(0x3E),
@@ -103,12 +129,37 @@ constexpr FactoryRow sensors[] = {
     row<RequestedTorque>(0x61),
     row<ActualTorque>(0x62),
     row<ReferenceTorque>(0x63),
+    row<EngineTorqueData>(0x64),
     row<AuxiliaryIo>(0x65),
+    row<MassAirFlow>(0x66),
+    row<EngineCoolantTemperature2>(0x67),
+    row<IntakeAirTemperature2>(0x68),
+    row<Egr>(0x69),
+    row<DieselIntakeAirFlow>(0x6A),
+    row<ExhaustGasRecirculationTemperature>(0x6B),
+    row<ThrottleControlPosition>(0x6C),
+    row<FuelPressureControlSystem>(0x6D),
+    row<InjectionPressureControlSystem>(0x6E),
+    row<TurbochargerCompressorInletPressure>(0x6F),
+    row<BoostPressureControl>(0x70),
+    row<VariableGeometryTurboControl>(0x71),
+    row<WastegateControl>(0x72),
+    row<ExhaustPressure>(0x73),
+    row<TurbochargerRpm>(0x74),
+    row<TurbochargerATemperature>(0x75),
+    row<TurbochargerBTemperature>(0x76),
+    row<ChargeAirCoolerTemperature>(0x77),
+    row<ExhaustGasTemperatureBank1>(0x78),
+    row<ExhaustGasTemperatureBank2>(0x79),
+    row<DieselParticulateFilterBank1>(0x7A),
+    row<DieselParticulateFilterBank2>(0x7B),
+    row<DieselParticulateFilterTemperature>(0x7C),
     row<NOxControlAreaStatus>(0x7D),
     row<PmControlAreaStatus>(0x7E),
+    row<EngineRuntime2>(0x7F),
 };
 static_assert(pidsRise(sensors), "PIDs must rise, none twice");
-static_assert(std::size(sensors) == 70);
+static_assert(std::size(sensors) == 119);
 
 std::shared_ptr<PowertrainParameter> makeSensor(ParameterIdentifier::Id id, ObdMode mode, unsigned char frame)
 {

@@ -53,7 +53,7 @@ std::vector<DecodeRow> rowsOf(std::string const& file)
 std::vector<DecodeRow> allRows()
 {
     std::vector<DecodeRow> all;
-    for (char const* file : {"decode_table.txt", "state_table.txt"}) {
+    for (char const* file : {"decode_table.txt", "state_table.txt", "oxygen_table.txt", "multisensor_table.txt"}) {
         for (DecodeRow& row : rowsOf(file)) {
             all.push_back(std::move(row));
         }
