@@ -2,16 +2,12 @@
 #include "tests/support/hexbytes.h"
 #include "tests/support/parameterclasses.h"
 #include "tests/support/payload.h"
-#include "tests/support/payloadproperty.h"
 #include "tests/support/tablefile.h"
 
 #include <gtest/gtest.h>
 
-#include <algorithm>
 #include <map>
-#include <random>
 #include <set>
-#include <tuple>
 
 // Feeds replies to the classes and compares what the user reads with the decode tables and recorded_table.txt.
 namespace {
@@ -162,41 +158,5 @@ TEST_F(DecodeTable, ModulesKeepTheirReadingsApart)
         EXPECT_EQ(support::texts(*parameter, *other, UnitSystem::Metric), unanswered);
     }
 }
-
-class AnyPayload : public ::testing::TestWithParam<std::tuple<obd::ObdProtocol, bool>>
-{
-protected:
-    void SetUp() override { obd::FuelTrim::setByteBInUse(std::get<1>(GetParam())); }
-    void TearDown() override { obd::FuelTrim::setByteBInUse(false); }
-
-    Bytes randomPayload(std::size_t length)
-    {
-        Bytes payload(length);
-        std::generate(payload.begin(), payload.end(), [this] { return static_cast<unsigned char>(m_random()); });
-        return payload;
-    }
-
-    std::shared_ptr<support::FakeEcu> m_ecu = std::make_shared<support::FakeEcu>(0x10, std::get<0>(GetParam()));
-    std::mt19937 m_random{1};
-};
-
-TEST_P(AnyPayload, IsReadOrRefusedByEveryClassBeforeAndAfterAGoodOne)
-{
-    for (auto const& [name, make] : support::parameterClasses()) {
-        for (std::size_t length = 0; length <= 40; ++length) {
-            auto const parameter = support::liveParameter(name);
-            Bytes const payload = randomPayload(length);
-            EXPECT_EQ(support::brokenBy(*parameter, m_ecu, payload), "") << name << " of " << length << " bytes";
-            ASSERT_TRUE(support::reply(*parameter, m_ecu, Bytes(40, 0x01))) << name;
-            EXPECT_EQ(support::brokenBy(*parameter, m_ecu, payload), "") << name << " of " << length << " bytes";
-        }
-    }
-}
-
-INSTANTIATE_TEST_SUITE_P(
-    OnEveryBus, AnyPayload,
-    ::testing::Values(std::tuple(obd::ObdProtocolIso9141, false), std::tuple(obd::ObdProtocolIso14230, false),
-                      std::tuple(obd::ObdProtocolJ1850, false), std::tuple(obd::ObdProtocolCan11, false),
-                      std::tuple(obd::ObdProtocolCan11, true), std::tuple(obd::ObdProtocolCan29, false)));
 
 } // namespace
