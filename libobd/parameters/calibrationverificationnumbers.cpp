@@ -42,16 +42,12 @@ bool CalibrationVerificationNumbers::fromCanSystem(unsigned int ecuId, std::vect
 
 bool CalibrationVerificationNumbers::fromSaeSystem(unsigned int ecuId, std::vector<unsigned char> const& data)
 {
-    if (data.size() < SaeLines::lineLength) {
-        return refuseLength(data);
+    std::optional<SaeLines> const lines = saeLines(data);
+    if (!lines) {
+        return false;
     }
-    int const checksumLength = findSaeChecksumLength(data);
-    if (checksumLength < 0) {
-        return refuse("Invalid data received");
-    }
-    SaeLines const lines(data, static_cast<std::size_t>(checksumLength));
-    for (std::size_t line = 0; line < lines.count(); ++line) {
-        m_numbers[ecuId].push_back(hexText(lines.data(line)));
+    for (std::size_t line = 0; line < lines->count(); ++line) {
+        m_numbers[ecuId].push_back(hexText(lines->data(line)));
     }
     return true;
 }

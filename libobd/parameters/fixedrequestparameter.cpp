@@ -1,5 +1,6 @@
 #include "libobd/parameters/fixedrequestparameter.h"
 
+#include "libobd/parameters/replychecks.h"
 #include "libobd/src/protocolfamily.h"
 
 #include <utility>
@@ -25,6 +26,20 @@ void FixedRequestParameter::getSignature(std::vector<unsigned char>& signature) 
 {
     signature = m_lead;
     signature.front() = static_cast<unsigned char>(signature.front() + positiveReply);
+}
+
+std::optional<SaeLines> FixedRequestParameter::saeLines(std::vector<unsigned char> const& data) const
+{
+    if (data.size() < SaeLines::lineLength) {
+        refuseLength(data);
+        return std::nullopt;
+    }
+    int const checksumLength = findSaeChecksumLength(data);
+    if (checksumLength < 0) {
+        refuse("Invalid data received");
+        return std::nullopt;
+    }
+    return SaeLines(data, static_cast<std::size_t>(checksumLength));
 }
 
 std::vector<unsigned char> requestFillers(ObdProtocol protocol)

@@ -1,7 +1,10 @@
 #pragma once
 
+#include "libobd/parameters/saelines.h"
+
 #include <obd/obdparameter.h>
 
+#include <optional>
 #include <vector>
 
 namespace obd {
@@ -15,6 +18,10 @@ protected:
 
     void getRequestData(std::vector<unsigned char>& data) const override;
     void getSignature(std::vector<unsigned char>& signature) const override;
+
+    // The lines of a reply from a bus before CAN; it must outlive them. Nothing, with a log line, for what is no such
+    // reply to this request.
+    std::optional<SaeLines> saeLines(std::vector<unsigned char> const& data) const;
 
 private:
     std::vector<unsigned char> m_lead;

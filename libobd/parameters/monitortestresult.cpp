@@ -74,20 +74,16 @@ bool MonitorTestResult::parseFromCanBus(unsigned int ecuId, std::vector<unsigned
 
 bool MonitorTestResult::parseFromNonCanBus(unsigned int ecuId, std::vector<unsigned char> const& data)
 {
-    if (data.size() < SaeLines::lineLength) {
-        return refuseLength(data);
+    std::optional<SaeLines> const lines = saeLines(data);
+    if (!lines) {
+        return false;
     }
-    int const checksumLength = findSaeChecksumLength(data);
-    if (checksumLength < 0) {
-        return refuse("Invalid data received");
-    }
-    SaeLines const lines(data, static_cast<std::size_t>(checksumLength));
-    for (std::size_t line = 0; line < lines.count(); ++line) {
+    for (std::size_t line = 0; line < lines->count(); ++line) {
         auto const monitor = std::make_shared<ObdMonitorTestItem>();
-        auto const component = static_cast<unsigned char>(lines.byte(line, 2) & componentMask);
+        auto const component = static_cast<unsigned char>(lines->byte(line, 2) & componentMask);
         monitor->id = component;
         monitor->description = descriptionSae(component);
-        if (addItem(*monitor, MonitorTestItemParserNonCan(lines.bytes(line, 1, saeRecordLength)))) {
+        if (addItem(*monitor, MonitorTestItemParserNonCan(lines->bytes(line, 1, saeRecordLength)))) {
             m_monitors[ecuId].push_back(monitor);
         }
     }

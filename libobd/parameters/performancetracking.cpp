@@ -74,18 +74,14 @@ bool PerformanceTracking::fromCanSystem(unsigned int ecuId, std::vector<unsigned
 
 bool PerformanceTracking::fromSaeSystem(unsigned int ecuId, std::vector<unsigned char> const& data)
 {
-    if (data.size() < SaeLines::lineLength) {
-        return refuseLength(data);
+    std::optional<SaeLines> const lines = saeLines(data);
+    if (!lines) {
+        return false;
     }
-    int const checksumLength = findSaeChecksumLength(data);
-    if (checksumLength < 0) {
-        return refuse("Invalid data received");
-    }
-    SaeLines const lines(data, static_cast<std::size_t>(checksumLength));
     Counters counters;
-    for (std::size_t line = 0; line < lines.count(); ++line) {
-        store(counters, 2 * line, lines.word(line, 3));
-        store(counters, 2 * line + 1, lines.word(line, 5));
+    for (std::size_t line = 0; line < lines->count(); ++line) {
+        store(counters, 2 * line, lines->word(line, 3));
+        store(counters, 2 * line + 1, lines->word(line, 5));
     }
     m_counters[ecuId] = std::move(counters);
     return true;
