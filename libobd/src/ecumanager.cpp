@@ -1,5 +1,6 @@
 #include "libobd/src/ecumanager.h"
 
+#include "libobd/powertrain/consumptionchoice.h"
 #include "libobd/src/hexformat.h"
 #include "libobd/src/parameterfactory.h"
 
@@ -39,11 +40,16 @@ std::vector<unsigned char> displayedIds(IEcu const& ecu)
     return ids;
 }
 
-std::shared_ptr<PowertrainParameter> createParameter(ParameterFactory& factory, unsigned char id)
+std::shared_ptr<PowertrainParameter> createParameter(ParameterFactory& factory, IEcu const& ecu, unsigned char id)
 {
     ParameterIdentifier::Id const identifier = ParameterIdentifier(id).id();
-    return id == freezeFrameCodePid ? factory.createFreezeFrameParameter(identifier, 0)
-                                    : factory.createParameter(identifier);
+    if (id == freezeFrameCodePid) {
+        return factory.createFreezeFrameParameter(identifier, 0);
+    }
+    if (identifier == ParameterIdentifier::FuelConsumption) {
+        return createConsumption(ecu, ecu.ignitionType(), {0.0, 0.0, 0.0}); // for its description alone
+    }
+    return factory.createParameter(identifier);
 }
 
 } // namespace
@@ -115,7 +121,7 @@ std::vector<std::shared_ptr<ParameterDescriptor>> EcuManager::getParameters(unsi
         if ((oid & 0x1F) == 0) {
             continue; // the support masks are no parameters
         }
-        if (std::shared_ptr<PowertrainParameter> const parameter = createParameter(factory, oid)) {
+        if (std::shared_ptr<PowertrainParameter> const parameter = createParameter(factory, *ecu, oid)) {
             parameters.push_back(std::make_shared<ParameterDescriptor>(parameter, ecu, system));
         } else {
             TERVEX_LOG(Error) << "Failed to create sensor 0x" << lowerHex(oid);

@@ -1,5 +1,7 @@
 #include "libobd/src/parameterfactory.h"
 
+#include "libobd/powertrain/batteryvoltage.h"
+#include "libobd/powertrain/boostpressure.h"
 #include "libobd/powertrain/codedparameters.h"
 #include "libobd/powertrain/fueltrim.h"
 #include "libobd/powertrain/monitorstatus.h"
@@ -7,6 +9,9 @@
 #include "libobd/powertrain/numericparameters.h"
 #include "libobd/powertrain/oxygensensors.h"
 #include "libobd/powertrain/oxygensensorspresent.h"
+#include "libobd/powertrain/torque.h"
+
+#include <common/logrecord.h>
 
 #include <algorithm>
 #include <iterator>
@@ -168,12 +173,35 @@ std::shared_ptr<PowertrainParameter> makeSensor(ParameterIdentifier::Id id, ObdM
     return found != std::end(sensors) && found->pid == id ? found->make(mode, frame) : nullptr;
 }
 
+// Of a usual car, for who does not know the vehicle's.
+constexpr unsigned int usualWeight = 1500; // kg
+
+template <typename Parameter>
+std::shared_ptr<PowertrainParameter> makeWithUsualWeight(char const* name)
+{
+    TERVEX_LOG(Error) << name << " created without setting the vehicle weight";
+    return std::make_shared<Parameter>(usualWeight);
+}
+
 } // namespace
 
+// No freeze frame holds the readiness or a derived value, so they have no row.
 std::shared_ptr<PowertrainParameter> ParameterFactory::createParameter(ParameterIdentifier::Id id)
 {
-    // No freeze frame holds the readiness, so it has no row.
-    return id == 0x01 ? std::make_shared<MonitorStatus>() : makeSensor(id, ObdMode::CurrentData, 0);
+    switch (static_cast<int>(id)) {
+    case 0x01:
+        return std::make_shared<MonitorStatus>();
+    case ParameterIdentifier::BatteryVoltage:
+        return std::make_shared<BatteryVoltage>();
+    case ParameterIdentifier::EnginePower:
+        return makeWithUsualWeight<EnginePower>("EnginePower");
+    case ParameterIdentifier::Torque:
+        return makeWithUsualWeight<Torque>("Torque");
+    case ParameterIdentifier::BoostPressure:
+        return std::make_shared<BoostPressure>();
+    default:
+        return makeSensor(id, ObdMode::CurrentData, 0);
+    }
 }
 
 std::shared_ptr<PowertrainParameter> ParameterFactory::createFreezeFrameParameter(ParameterIdentifier::Id id,

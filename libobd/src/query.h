@@ -29,16 +29,19 @@ public:
     Query(Query const&) = delete;
     Query& operator=(Query const&) = delete;
 
-    // Empties the parameter and queues a run; callback hears its end, inside Dispatcher::dispatch, and may start the
-    // next. False while a run is on, which is left as it is, and without a connection; the callback is dropped then.
-    // A callback that holds this query keeps it alive until the run has ended or is cancelled.
+    // Empties the parameter, unless it keeps a history, and queues a run; callback hears its end, inside
+    // Dispatcher::dispatch, and may start the next. False while a run is on, which is left as it is, and without a
+    // connection; the callback is dropped then. A callback that holds this query keeps it alive until the run has ended
+    // or is cancelled.
     bool start(Function callback)
     {
         if (m_running.exchange(true)) {
             return false;
         }
         m_callback.swap(callback);
-        m_parameter->clear();
+        if (!m_parameter->keepsHistory()) {
+            m_parameter->clear();
+        }
         m_dispatchable = std::make_shared<DispatchableQuery>(*this, m_parameter);
         if (!Dispatcher::getInstance().update(m_dispatchable)) {
             cancel();

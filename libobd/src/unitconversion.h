@@ -40,4 +40,9 @@ constexpr double kilometreToMile(double kilometre)
     return kilometre * 0.62137;
 }
 
+constexpr double kilowattToHorsepower(double kilowatt)
+{
+    return kilowatt * 1.3410220888;
+}
+
 } // namespace obd::unitconversion

@@ -16,6 +16,7 @@ public:
 
     std::function<Status()> onUpdate = [] { return Status::UpdateOk; };
     std::atomic<unsigned int> limit{1000};
+    std::atomic<bool> history{false};
     std::atomic<int> updates{0};
     std::atomic<int> clears{0};
 
@@ -26,6 +27,7 @@ public:
     }
     unsigned int timeout() const override { return limit; }
     void clear() override { ++clears; }
+    bool keepsHistory() const override { return history; }
 };
 
 } // namespace support

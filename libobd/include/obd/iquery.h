@@ -28,6 +28,10 @@ public:
 
     // Forgets what was stored.
     virtual void clear() = 0;
+
+    // Whether a reading builds on those before it. Whoever repeats such a query leaves out the clear() between its
+    // runs.
+    virtual bool keepsHistory() const { return false; }
 };
 
 } // namespace obd

@@ -1,7 +1,11 @@
 #include "libobd/src/parameterfactory.h"
 
+#include "libobd/powertrain/batteryvoltage.h"
+#include "libobd/powertrain/boostpressure.h"
 #include "libobd/powertrain/monitorstatus.h"
+#include "libobd/powertrain/torque.h"
 #include "tests/support/hexbytes.h"
+#include "tests/support/logcapture.h"
 #include "tests/support/parameterclasses.h"
 #include "tests/support/payload.h"
 
@@ -56,6 +60,28 @@ TEST(ParameterFactory, MakesTheReadinessForALiveReadingOnly)
     auto const parameter = ParameterFactory().createParameter(id(0x01));
     EXPECT_NE(std::dynamic_pointer_cast<obd::MonitorStatus>(parameter), nullptr);
     EXPECT_EQ(ParameterFactory().createFreezeFrameParameter(id(0x01), 0), nullptr);
+}
+
+TEST(ParameterFactory, MakesTheDerivedParametersForALiveReadingOnly)
+{
+    support::LogCapture const log;
+    ParameterFactory factory;
+    EXPECT_NE(std::dynamic_pointer_cast<obd::BatteryVoltage>(factory.createParameter(id(0xF4))), nullptr);
+    EXPECT_NE(std::dynamic_pointer_cast<obd::BoostPressure>(factory.createParameter(id(0xF7))), nullptr);
+    EXPECT_TRUE(log.lines().empty());
+    for (int const pid : {0xF4, 0xF5, 0xF6, 0xF7}) {
+        EXPECT_EQ(factory.createFreezeFrameParameter(id(pid), 0), nullptr) << pid;
+    }
+}
+
+TEST(ParameterFactory, PowerAndTorqueAreMadeForAUsualWeightAndTellSo)
+{
+    support::LogCapture const log;
+    ParameterFactory factory;
+    EXPECT_NE(std::dynamic_pointer_cast<obd::EnginePower>(factory.createParameter(id(0xF5))), nullptr);
+    EXPECT_NE(std::dynamic_pointer_cast<obd::Torque>(factory.createParameter(id(0xF6))), nullptr);
+    EXPECT_EQ(log.lines(), (std::vector<std::string>{"ERROR EnginePower created without setting the vehicle weight",
+                                                     "ERROR Torque created without setting the vehicle weight"}));
 }
 
 TEST(ParameterFactory, MakesEveryClassByItsOwnPid)

@@ -80,6 +80,17 @@ TEST_F(Query, StartClearsTheParameterBeforeItRuns)
     EXPECT_EQ(parameter->clears, 1);
 }
 
+TEST_F(Query, StartLeavesTheHistoryOfAParameterThatKeepsOne)
+{
+    parameter->history = true;
+    for (std::size_t runs = 1; runs <= 3; ++runs) {
+        ASSERT_TRUE(query->start(record()));
+        ASSERT_TRUE(rig.loop.runUntil([&] { return outcomes.size() == runs; }));
+    }
+    EXPECT_EQ(parameter->updates, 3);
+    EXPECT_EQ(parameter->clears, 0);
+}
+
 TEST_F(Query, StartOnARunningQueryIsFalseAndLeavesTheFirstCallbackInPlace)
 {
     ASSERT_TRUE(query->start(record()));

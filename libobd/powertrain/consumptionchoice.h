@@ -1,0 +1,36 @@
+#pragma once
+
+#include <obd/export.h>
+#include <obd/iecu.h>
+
+#include <memory>
+
+namespace obd {
+
+class PowertrainParameter;
+
+// The models of the fuel consumption.
+enum class ConsumptionKind : int
+{
+    None = 0,
+    GasMaf = 1,
+    GasMap = 2,
+    Diesel = 3,
+};
+
+// What the user says about the vehicle, for its fuel consumption.
+struct ConsumptionSettings
+{
+    double correctionFactor{1.0};
+    double volumetricEfficiency{85.0}; // percent
+    double engineDisplacement{2.0};    // litres
+};
+
+// The model that suits an ignition type, which may be the user's choice, and what the module reports.
+OBD_EXPORT ConsumptionKind chooseConsumption(IEcu const& ecu, IgnitionType ignitionType);
+
+// The parameter of that model. Null if none suits.
+OBD_EXPORT std::shared_ptr<PowertrainParameter> createConsumption(IEcu const& ecu, IgnitionType ignitionType,
+                                                                  ConsumptionSettings const& settings);
+
+} // namespace obd
