@@ -1,5 +1,6 @@
 #include "libobd/src/ecu.h"
 
+#include "libobd/powertrain/testequipmentconfiguration.h"
 #include "libobd/src/hexformat.h"
 
 #include <common/logrecord.h>
@@ -11,6 +12,8 @@
 
 namespace obd {
 namespace {
+
+constexpr unsigned char firstFrame = 0;
 
 std::shared_ptr<std::vector<unsigned char>> seededSet()
 {
@@ -26,8 +29,12 @@ bool holds(std::vector<unsigned char> const& set, unsigned char id)
 
 Ecu::Ecu(unsigned int id, ObdProtocol protocol, std::string protocolDescription, std::shared_ptr<IObdProxy> proxy)
     : m_id(id), m_protocol(protocol), m_protocolDescription(std::move(protocolDescription)), m_proxy(std::move(proxy)),
+      m_testerConfiguration1(std::make_unique<TestEquipmentConfiguration1>(ObdMode::CurrentData, firstFrame)),
+      m_testerConfiguration2(std::make_unique<TestEquipmentConfiguration2>(ObdMode::CurrentData, firstFrame)),
       m_mode01Oids(seededSet()), m_mode06Oids(seededSet()), m_mode08Oids(seededSet()), m_mode09Oids(seededSet())
 {}
+
+Ecu::~Ecu() = default;
 
 std::shared_ptr<Ecu::OidSet> Ecu::getOids(ObdMode mode, unsigned char frame) const
 {
@@ -172,26 +179,29 @@ std::vector<OxygenSensorLocation> Ecu::oxygenSensorLocations() const
     return m_oxygenSensorLocations;
 }
 
-// The standard's ranges for a module that tells no others.
 unsigned int Ecu::equivalenceRatioMax() const
 {
-    return 2;
+    return m_testerConfiguration1->equivalenceRatioMax(*this);
 }
+
 unsigned int Ecu::oxygenSensorVoltageMax() const
 {
-    return 8;
+    return m_testerConfiguration1->oxygenSensorVoltageMax(*this);
 }
+
 unsigned int Ecu::oxygenSensorCurrentMax() const
 {
-    return 128;
+    return m_testerConfiguration1->oxygenSensorCurrentMax(*this);
 }
+
 unsigned int Ecu::intakeManifoldAbsolutePressureMax() const
 {
-    return 255;
+    return m_testerConfiguration1->intakeManifoldAbsolutePressureMax(*this);
 }
+
 double Ecu::airFlowRateMax() const
 {
-    return 655.35;
+    return m_testerConfiguration2->airFlowRateMax(*this);
 }
 
 IgnitionType Ecu::ignitionType() const

@@ -11,13 +11,21 @@
 namespace obd {
 
 class IObdProxy;
+class OxygenSensorsPresent;
+class PowertrainParameter;
 class SupportedOids;
+class TestEquipmentConfiguration;
+class TestEquipmentConfiguration1;
+class TestEquipmentConfiguration2;
 
 // One control module. Made by the proxy and filled by init on the connection's thread; read from any thread.
 class Ecu : public IEcu
 {
 public:
     Ecu(unsigned int id, ObdProtocol protocol, std::string protocolDescription, std::shared_ptr<IObdProxy> proxy);
+    ~Ecu() override;
+    Ecu(Ecu const&) = delete;
+    Ecu& operator=(Ecu const&) = delete;
 
     // Asks the module what it can do. index is its place in the proxy's list, from 0. Only a module that tells nothing
     // of service 01 fails; a link lost on the way ends the run early.
@@ -49,6 +57,10 @@ private:
     // A set begins with the identifier 0, which starts the chain of range requests. In the order of arrival.
     using OidSet = std::vector<unsigned char>;
 
+    // A range request asks for so many identifiers; the last range begins there.
+    static constexpr unsigned int rangeSize = 0x20;
+    static constexpr unsigned int lastRange = 0xE0;
+
     // Null for a service without a set, or a freeze frame that was not detected. Called with m_mutex held.
     std::shared_ptr<OidSet> getOids(ObdMode mode, unsigned char frame) const;
     // The request for one range of a service; null for a service without ranges here.
@@ -62,13 +74,36 @@ private:
     void logSupportedPids(ObdMode mode, unsigned char frame) const;
 
     bool detectConfiguration(ObdMode mode, unsigned char frame);
+
+    // The facts, in the order of init. False where the module was asked and gave no answer, or, of the standard, can't
+    // be asked; what stood before then stands on.
+    bool detectTesterConfiguration1();
+    bool detectTesterConfiguration2();
+    bool detectIgnitionType();
+    void addFuelConsumptionParameter();
+    void addCustomParameters();
+    bool detectStandard();
+    bool detectOxygenSensors();
+    bool updateEcuOxygenSensorLocations(OxygenSensorsPresent& query);
+    void setFuelTrimByteUsage();
+    bool areAllPresentFor1D() const;
+    bool detectMode05Configuration();
+    bool detectTestIdentifiers(OxygenSensorLocation location);
     void detectEcuName(unsigned int index);
+
+    void detectModuleFacts(); // the first five
+    bool isReported(PowertrainParameter const& parameter) const;
+    bool detectTesterConfiguration(TestEquipmentConfiguration& configuration, int number);
+    // found gets what the module reports, so that the chain of ranges can go on.
+    bool detectFirstTestIdentifiers(OxygenSensorLocation location, std::vector<unsigned char>& found);
 
     // Constant after construction.
     unsigned int const m_id;
     ObdProtocol const m_protocol;
     std::string const m_protocolDescription;
     std::shared_ptr<IObdProxy> const m_proxy;
+    std::unique_ptr<TestEquipmentConfiguration1> const m_testerConfiguration1; // guards its values itself
+    std::unique_ptr<TestEquipmentConfiguration2> const m_testerConfiguration2; // guards its values itself
 
     // Protected by m_mutex, which is never held over a request.
     mutable std::mutex m_mutex;

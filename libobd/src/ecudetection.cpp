@@ -8,26 +8,33 @@
 #include <common/tracestream.h>
 #include <obd/iobdproxy.h>
 
+#include <functional>
+
 namespace obd {
-namespace {
-
-constexpr unsigned int rangeSize = 0x20;
-constexpr unsigned int lastRange = 0xE0;
-
-} // namespace
 
 bool Ecu::init(unsigned int index)
 {
     if (!detectConfiguration(ObdMode::CurrentData, 0)) {
         return false;
     }
-    for (ObdMode const mode : {ObdMode::MonitorTests, ObdMode::SystemControl, ObdMode::VehicleInformation}) {
+    // The sequence is long on a slow bus: a lost link has to end it early.
+    std::function<void()> const steps[] = {
+        [this] { detectModuleFacts(); },
+        [this] { detectConfiguration(ObdMode::MonitorTests, 0); },
+        [this] { detectConfiguration(ObdMode::SystemControl, 0); },
+        [this] { detectConfiguration(ObdMode::VehicleInformation, 0); },
+        [this] { detectStandard(); },
+        [this] {
+            detectOxygenSensors();
+            setFuelTrimByteUsage();
+        },
+        [this] { detectMode05Configuration(); },
+        [this, index] { detectEcuName(index); },
+    };
+    for (std::function<void()> const& step : steps) {
         if (m_proxy->isConnected()) {
-            detectConfiguration(mode, 0);
+            step();
         }
-    }
-    if (m_proxy->isConnected()) {
-        detectEcuName(index);
     }
     return true;
 }
@@ -95,13 +102,6 @@ bool Ecu::detectFreezeFrameConfiguration(unsigned char frame)
         m_mode02Oids.erase(frame);
     }
     return detected;
-}
-
-void Ecu::detectEcuName(unsigned int index)
-{
-    std::lock_guard const lock(m_mutex);
-    m_name = "ECU#" + std::to_string(index + 1);
-    m_description = "Control Module 0x" + upperHex(m_id);
 }
 
 } // namespace obd

@@ -118,7 +118,7 @@ TEST_F(EcuDetection, NextRangeIsReadOnlyIfTheModuleReportsIt)
     m_device->answer({0x01, 0x00}, engine, {0x41, 0x00, 0x00, 0x00, 0x00, 0x01});
     m_device->answer({0x01, 0x20}, engine, {0x41, 0x20, 0x80, 0x00, 0x00, 0x00});
     ASSERT_TRUE(m_proxy->initialize());
-    EXPECT_EQ(m_proxy->firstEcu()->supportedIds(ObdMode::CurrentData, 0), (Bytes{0, 0x20, 0x21}));
+    EXPECT_EQ(m_proxy->firstEcu()->supportedIds(ObdMode::CurrentData, 0), (Bytes{0, 0x20, 0x21, 0xF4, 0xF5, 0xF6}));
     EXPECT_EQ(countOf({0x01, 0x20}), 1);
 }
 
@@ -130,7 +130,7 @@ TEST_F(EcuDetection, ChainStopsAtE0WhateverIsReported)
     }
     ASSERT_TRUE(m_proxy->initialize());
     EXPECT_EQ(m_proxy->firstEcu()->supportedIds(ObdMode::CurrentData, 0),
-              (Bytes{0, 0x20, 0x40, 0x60, 0x80, 0xA0, 0xC0, 0xE0, 0x00}));
+              (Bytes{0, 0x20, 0x40, 0x60, 0x80, 0xA0, 0xC0, 0xE0, 0x00, 0xF4, 0xF5, 0xF6}));
     EXPECT_EQ(countOf({0x01, 0xE0}), 1);
     EXPECT_EQ(countOf({0x01, 0x00}), 2) << "once to find the modules, once for the first range";
 }
@@ -139,7 +139,7 @@ TEST_F(EcuDetection, FailingLaterRangeKeepsTheEarlierOnes)
 {
     m_device->answer({0x01, 0x00}, engine, {0x41, 0x00, 0x80, 0x00, 0x00, 0x01});
     ASSERT_TRUE(m_proxy->initialize());
-    EXPECT_EQ(m_proxy->firstEcu()->supportedIds(ObdMode::CurrentData, 0), (Bytes{0, 0x01, 0x20}));
+    EXPECT_EQ(m_proxy->firstEcu()->supportedIds(ObdMode::CurrentData, 0), (Bytes{0, 0x01, 0x20, 0xF4, 0xF5, 0xF6}));
     EXPECT_TRUE(m_log.contains("FATAL Failed to get supported 01 IDs 0x21 - 0x40 for ECU 0x7e8 frame 0x0"));
 }
 
@@ -148,7 +148,7 @@ TEST_F(EcuDetection, ModuleThatDidNotAnswerARangeThatAnotherAnsweredAddsNothing)
     m_device->answer({0x01, 0x00}, 0x7E9, {0x41, 0x00, 0x80, 0x00, 0x00, 0x01});
     m_device->answer({0x01, 0x20}, engine, {0x41, 0x20, 0x80, 0x00, 0x00, 0x00});
     ASSERT_TRUE(m_proxy->initialize());
-    EXPECT_EQ(m_proxy->ecu(0x7E9)->supportedIds(ObdMode::CurrentData, 0), (Bytes{0, 0x01, 0x20}));
+    EXPECT_EQ(m_proxy->ecu(0x7E9)->supportedIds(ObdMode::CurrentData, 0), (Bytes{0, 0x01, 0x20, 0xF4, 0xF5, 0xF6}));
     EXPECT_FALSE(m_log.contains("FATAL Failed to get supported 01 IDs 0x21 - 0x40 for ECU 0x7e9 frame 0x0"));
 }
 
