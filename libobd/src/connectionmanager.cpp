@@ -116,6 +116,7 @@ void ConnectionManager::closeConnection()
     m_proxy->setDevice(nullptr);
     storeDevice(nullptr);
     storeConnection(nullptr);
+    forgetCurrent();
     Dispatcher::getInstance().cancel();
     TERVEX_LOG(Info) << "closeConnection exit";
 }
@@ -141,26 +142,53 @@ void ConnectionManager::storeConnection(std::shared_ptr<IDataConnection> connect
 void ConnectionManager::attachLoggers(std::shared_ptr<IDataConnection> const& connection)
 {
     std::lock_guard const lock(m_loggerMutex);
-    m_tapped = connection;
+    m_current = connection;
+    if (!rememberTapped(connection)) {
+        // It bears the loggers of an earlier attempt: each of them is to hear its traffic once.
+        for (IConnectionLogger* logger : m_loggers) {
+            connection->removeLogger(logger);
+        }
+    }
     for (IConnectionLogger* logger : m_loggers) {
         connection->addLogger(logger);
     }
 }
 
+// False for a channel that is known already.
+bool ConnectionManager::rememberTapped(std::shared_ptr<IDataConnection> const& connection)
+{
+    std::erase_if(m_tapped, [](auto const& tapped) { return tapped.expired(); });
+    auto const isSame = [&connection](auto const& tapped) { return tapped.lock() == connection; };
+    if (std::any_of(m_tapped.begin(), m_tapped.end(), isSame)) {
+        return false;
+    }
+    m_tapped.push_back(connection);
+    return true;
+}
+
+void ConnectionManager::forgetCurrent()
+{
+    std::lock_guard const lock(m_loggerMutex);
+    m_current.reset();
+}
+
 void ConnectionManager::addLogger(IConnectionLogger* logger)
 {
     std::lock_guard const lock(m_loggerMutex);
-    if (std::shared_ptr<IDataConnection> const connection = m_tapped.lock()) {
+    if (std::shared_ptr<IDataConnection> const connection = m_current.lock()) {
         connection->addLogger(logger);
     }
     m_loggers.push_back(logger);
 }
 
+// From every channel that the application still holds: one that was closed or replaced bears its loggers on.
 void ConnectionManager::removeLogger(IConnectionLogger* logger)
 {
     std::lock_guard const lock(m_loggerMutex);
-    if (std::shared_ptr<IDataConnection> const connection = m_tapped.lock()) {
-        connection->removeLogger(logger);
+    for (std::weak_ptr<IDataConnection> const& tapped : m_tapped) {
+        if (std::shared_ptr<IDataConnection> const connection = tapped.lock()) {
+            connection->removeLogger(logger);
+        }
     }
     removeFirst(m_loggers, logger);
 }

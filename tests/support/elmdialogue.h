@@ -33,6 +33,23 @@ inline void expectDetectVehicle(ScriptedChannel& channel, int protocol = 0,
     channel.expect("ATH1").reply("OK\r\r>");
 }
 
+// What IObdProxy::initialize says to one CAN module, 0x7E8, that supports nothing beyond the first mask.
+inline void expectModuleDetection(ScriptedChannel& channel)
+{
+    channel.whenever("0100").reply("7E8064100BE3EA812\r\r>");
+    channel.whenever("0600").reply("NO DATA\r\r>");
+    channel.whenever("0800").reply("NO DATA\r\r>");
+    channel.whenever("0900").reply("NO DATA\r\r>");
+}
+
+// A whole opening that succeeds.
+inline void expectOpening(ScriptedChannel& channel)
+{
+    expectInitialize(channel);
+    expectDetectVehicle(channel);
+    expectModuleDetection(channel);
+}
+
 // What ElmScantool::close says.
 inline void expectClose(ScriptedChannel& channel)
 {
