@@ -14,22 +14,42 @@ BaseService::BaseService(IObdVelmora const* obd, unsigned int priority)
     : m_obd(obd), m_priority(priority), m_openedCallback(std::make_shared<Callback>()),
       m_closedCallback(std::make_shared<Callback>()), m_spareCallback(std::make_shared<Callback>())
 {
+    try {
+        attachToAll();
+        readState();
+    } catch (...) { // such as the application's settings store throws
+        detachFromAll();
+        throw;
+    }
+}
+
+BaseService::~BaseService()
+{
+    detachFromAll();
+}
+
+void BaseService::attachToAll()
+{
     m_obd->getConnectionNotifier()->attach(m_priority, this);
     m_obd->getEcuManager()->attach(this);
     m_obd->getSettings()->attach(this);
+}
+
+void BaseService::detachFromAll()
+{
+    m_obd->getSettings()->detach(this);
+    m_obd->getEcuManager()->detach(this);
+    m_obd->getConnectionNotifier()->detach(m_priority, this);
+}
+
+void BaseService::readState()
+{
     m_unitSystem = m_obd->getSettings()->unitSystem();
     m_connected = m_obd->getConnectionManager()->getProxy()->isConnected();
     if (m_connected) {
         std::lock_guard const lock(m_ecuMutex);
         m_ecu = m_obd->getEcuManager()->getCurrentEcu();
     }
-}
-
-BaseService::~BaseService()
-{
-    m_obd->getSettings()->detach(this);
-    m_obd->getEcuManager()->detach(this);
-    m_obd->getConnectionNotifier()->detach(m_priority, this);
 }
 
 std::shared_ptr<IEcu> BaseService::ecu() const

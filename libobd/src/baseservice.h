@@ -50,6 +50,10 @@ protected:
     UnitSystem unitSystem() const { return m_unitSystem; }
 
 private:
+    void attachToAll();
+    void detachFromAll();
+    void readState();
+
     IObdVelmora const* const m_obd;
     unsigned int const m_priority;
     mutable std::mutex m_ecuMutex; // a leaf
