@@ -45,7 +45,8 @@ void BaseService::detachFromAll()
 void BaseService::readState()
 {
     m_unitSystem = m_obd->getSettings()->unitSystem();
-    m_connected = m_obd->getConnectionManager()->getProxy()->isConnected();
+    std::shared_ptr<IConnectionManager> const manager = m_obd->getConnectionManager();
+    m_connected = manager != nullptr && manager->getProxy()->isConnected();
     if (m_connected) {
         std::lock_guard const lock(m_ecuMutex);
         m_ecu = m_obd->getEcuManager()->getCurrentEcu();

@@ -47,6 +47,9 @@ protected:
 
     IObdVelmora const* obd() const { return m_obd; }
     std::shared_ptr<IEcu> ecu() const;
+    // The current control module while there is a connection, else null. An operation takes it once, at its start, for
+    // it may change meanwhile.
+    std::shared_ptr<IEcu> connectedEcu() const { return isConnected() ? ecu() : nullptr; }
     UnitSystem unitSystem() const { return m_unitSystem; }
 
 private:

@@ -57,11 +57,6 @@ std::shared_ptr<PowertrainParameter> makeCurrent()
 
 TroubleCodeService::TroubleCodeService(IObdVelmora const* obd) : BaseService(obd) {}
 
-std::shared_ptr<IEcu> TroubleCodeService::connectedEcu() const
-{
-    return isConnected() ? ecu() : nullptr;
-}
-
 template <typename Codes>
 std::vector<std::shared_ptr<DtcDataModel>> TroubleCodeService::fetchCodes() const
 {

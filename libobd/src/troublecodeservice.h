@@ -31,9 +31,6 @@ public:
     bool resetCodes() const override;
 
 private:
-    // The current control module while there is a connection, else null. Each operation takes it once, at its start.
-    std::shared_ptr<IEcu> connectedEcu() const;
-
     template <typename Codes>
     std::vector<std::shared_ptr<DtcDataModel>> fetchCodes() const;
     std::shared_ptr<SensorDataModel> fetchRequest(std::shared_ptr<PowertrainParameter> const& parameter) const;
