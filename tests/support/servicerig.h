@@ -12,10 +12,11 @@
 #include "tests/support/memorysettings.h"
 
 #include <memory>
+#include <vector>
 
 namespace support {
 
-// Hands out the proxy of a test; opens and closes nothing.
+// Hands out the proxy of a test, and keeps the loggers that are to hear of the traffic; opens and closes nothing.
 class FakeConnectionManager : public obd::IConnectionManager
 {
 public:
@@ -32,8 +33,10 @@ public:
     void closeConnection() override {}
     std::shared_ptr<obd::IDevice> getAdapter() override { return nullptr; }
     std::shared_ptr<obd::IObdProxy> getProxy() override { return m_proxy; }
-    void addLogger(obd::IConnectionLogger* /*logger*/) override {}
-    void removeLogger(obd::IConnectionLogger* /*logger*/) override {}
+    void addLogger(obd::IConnectionLogger* logger) override { loggers.push_back(logger); }
+    void removeLogger(obd::IConnectionLogger* logger) override { std::erase(loggers, logger); }
+
+    std::vector<obd::IConnectionLogger*> loggers;
 
 private:
     std::shared_ptr<obd::IObdProxy> m_proxy;
@@ -69,7 +72,7 @@ public:
     unsigned int getHostValue1() const override { return 0; }
     unsigned int getHostValue2() const override { return 0; }
     unsigned int getHostValue3() const override { return 0; }
-    std::shared_ptr<obd::IConnectionManager> getConnectionManager() const override { return m_manager; }
+    std::shared_ptr<obd::IConnectionManager> getConnectionManager() const override { return manager; }
     obd::IEcuManager* getEcuManager() const override { return &m_ecus; }
     obd::IVelmoraSettings* getSettings() const override { return &m_settings; }
     obd::IConfiguration* getConfiguration() const override { return &m_configuration; }
@@ -77,12 +80,12 @@ public:
 
     DispatcherRig rig;
     mutable obd::ConnectionNotifier notifier;
+    std::shared_ptr<FakeConnectionManager> manager = std::make_shared<FakeConnectionManager>(rig.proxy); // may be null
 
 private:
     mutable obd::VelmoraSettings m_settings{std::make_shared<MemorySettings>()};
     mutable obd::Configuration m_configuration;
     mutable obd::EcuManager m_ecus{notifier, rig.proxy.get(), &m_settings};
-    std::shared_ptr<FakeConnectionManager> m_manager = std::make_shared<FakeConnectionManager>(rig.proxy);
 };
 
 } // namespace support

@@ -1,0 +1,35 @@
+#pragma once
+
+#include <common/inotifier.h>
+#include <obd/export.h>
+#include <obd/itroubleshootingserviceobserver.h>
+
+#include <memory>
+#include <string>
+
+namespace obd {
+
+// The raw view on the adapter: a console and a log of the traffic. Attach and detach observers while logging is off.
+class ITroubleshootingService : public virtual tervex::INotifier<ITroubleshootingServiceObserver>
+{
+public:
+    // Sends a command word for word and gives what the adapter says, line ends removed. Waits up to timeout
+    // milliseconds and 50 more, the time in the dispatcher's queue included; a negative one counts as none. Empty, with
+    // a log line, without a connection or an answer. Blocks; call from any thread but the dispatcher's worker. A
+    // command that changes the adapter's settings may break the connection.
+    virtual std::string query(std::string const& request, int timeout) = 0;
+
+    // Logging is off at the start, and stays as it is across connections. Any thread.
+    virtual void startLogging() = 0;
+    virtual bool isLogging() = 0;
+    virtual void stopLogging() = 0;
+};
+
+namespace TroubleshootingServiceBuilder {
+
+// A new service on the top-level object that was built last; it must die before that object.
+OBD_EXPORT std::shared_ptr<ITroubleshootingService> createTroubleshootingService();
+
+} // namespace TroubleshootingServiceBuilder
+
+} // namespace obd
