@@ -1,0 +1,13 @@
+# <obd/obd.h> gives every public header.
+file(GLOB headers RELATIVE ${STAGE}/include/velmora ${STAGE}/include/velmora/obd/*.h)
+file(STRINGS ${STAGE}/include/velmora/obd/obd.h lines REGEX "^#include <")
+list(TRANSFORM lines REPLACE "^#include <(.*)>$" "\\1")
+list(REMOVE_ITEM headers obd/obd.h)
+list(SORT headers)
+set(sorted ${lines})
+list(SORT sorted)
+if(NOT headers STREQUAL sorted)
+    set(missing ${headers})
+    list(REMOVE_ITEM missing ${lines})
+    message(FATAL_ERROR "obd.h lacks ${missing}, or has one twice")
+endif()
