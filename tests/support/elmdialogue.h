@@ -33,10 +33,10 @@ inline void expectDetectVehicle(ScriptedChannel& channel, int protocol = 0,
     channel.expect("ATH1").reply("OK\r\r>");
 }
 
-// What IObdProxy::initialize says to one CAN module, 0x7E8, that supports nothing beyond the first mask.
+// What IObdProxy::initialize says to one CAN module, 0x7E8, that supports the engine speed alone.
 inline void expectModuleDetection(ScriptedChannel& channel)
 {
-    channel.whenever("0100").reply("7E8064100BE3EA812\r\r>");
+    channel.whenever("0100").reply("7E806410000100000\r\r>");
     channel.whenever("0600").reply("NO DATA\r\r>");
     channel.whenever("0800").reply("NO DATA\r\r>");
     channel.whenever("0900").reply("NO DATA\r\r>");
