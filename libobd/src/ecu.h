@@ -75,8 +75,8 @@ private:
 
     bool detectConfiguration(ObdMode mode, unsigned char frame);
 
-    // The facts, in the order of init. False where the module was asked and gave no answer, or, of the standard, can't
-    // be asked; what stood before then stands on.
+    // The facts, in the order of init. False if the module was asked in vain, and of the standard also if it reports
+    // none; the defaults stand then.
     bool detectTesterConfiguration1();
     bool detectTesterConfiguration2();
     bool detectIgnitionType();
