@@ -94,6 +94,17 @@ std::vector<std::shared_ptr<DtcDataModel>> DtcReader::getTroubleCodes() const
     return models;
 }
 
+std::vector<std::shared_ptr<DtcDataModel>> DtcReader::getRows() const
+{
+    std::shared_lock const lock(m_mutex);
+    std::vector<std::shared_ptr<DtcDataModel>> rows;
+    rows.reserve(m_data.size());
+    for (auto const& entry : m_data) {
+        rows.push_back(entry.second);
+    }
+    return rows;
+}
+
 std::string DtcReader::getSystem(std::string const& code) const
 {
     return system(code);

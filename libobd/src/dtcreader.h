@@ -42,6 +42,9 @@ public:
     // Every code once, sorted as text, with its first meaning.
     std::vector<std::shared_ptr<DtcDataModel>> getTroubleCodes() const;
 
+    // Every row in the order of the table, which has the makers in the order of their numbers.
+    std::vector<std::shared_ptr<DtcDataModel>> getRows() const;
+
     // By the first letter: "Powertrain", "Body", "Chassis", "Network", else "Undefined".
     std::string getSystem(std::string const& code) const;
 
