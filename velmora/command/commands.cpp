@@ -6,6 +6,10 @@ void addCommands(CommandLine& commandLine)
 {
     addScanCommand(commandLine);
     addSensorsCommand(commandLine);
+    addCodesCommand(commandLine);
+    addClearCommand(commandLine);
+    addFreezeCommand(commandLine);
+    addDtcCommand(commandLine);
     addConsoleCommand(commandLine);
     addSimulateCommand(commandLine);
     addPortsCommand(commandLine);

@@ -8,7 +8,11 @@ class CommandLine;
 void addCommands(CommandLine& commandLine);
 
 // One function a command, each in the file of its name.
+void addClearCommand(CommandLine& commandLine);
+void addCodesCommand(CommandLine& commandLine);
 void addConsoleCommand(CommandLine& commandLine);
+void addDtcCommand(CommandLine& commandLine);
+void addFreezeCommand(CommandLine& commandLine);
 void addPortsCommand(CommandLine& commandLine);
 void addScanCommand(CommandLine& commandLine);
 void addSensorsCommand(CommandLine& commandLine);

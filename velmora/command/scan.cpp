@@ -1,8 +1,12 @@
+#include "velmora/codereader.h"
 #include "velmora/command/commands.h"
 #include "velmora/commandline.h"
+#include "velmora/failure.h"
 #include "velmora/session.h"
 #include "velmora/view/vehiclereport.h"
 
+#include <algorithm>
+#include <cstdio>
 #include <fmt/format.h>
 #include <obd/iecu.h>
 
@@ -39,37 +43,62 @@ bool isSensor(unsigned char id)
     return (id & 0x1F) != 0 && id > 0x02;
 }
 
-ModuleReport readModule(obd::IEcu const& ecu)
+ModuleReport readModule(obd::IEcu const& ecu, CodeReader& reader)
 {
-    ModuleReport report{ecu.id(), ecu.name(), ecu.description(), ecu.standardDescription(), {}};
+    ModuleReport report{ecu.id(), ecu.name(), ecu.description(), ecu.standardDescription(), {}, {}};
     for (unsigned char const id : ecu.supportedIds(obd::ObdMode::CurrentData, 0)) {
         if (isSensor(id)) {
             report.supported.push_back(id);
         }
     }
+    report.codes = reader.read(ecu, {CodeKind::Confirmed, CodeKind::Pending, CodeKind::Permanent});
     return report;
 }
 
-ExitCode scan(GlobalOptions const& options)
+// A car that tells none of its codes is not known to be free of them.
+ExitCode check(VehicleReport const& report)
+{
+    auto const anyModule = [&report](bool (*holds)(CodeReport const&)) {
+        return std::any_of(report.modules.begin(), report.modules.end(),
+                           [holds](ModuleReport const& module) { return holds(module.codes); });
+    };
+    if (anyModule(hasFindings)) {
+        return ExitCode::Findings;
+    }
+    if (!anyModule(canBeChecked)) {
+        std::fflush(stdout);
+        throw Failure(ExitCode::NotSupported, "No control module told its trouble codes, so there is nothing to check",
+                      {"is the ignition on?"});
+    }
+    return ExitCode::Done;
+}
+
+ExitCode scan(bool checking, GlobalOptions const& options)
 {
     Session session(options);
     session.connect();
     VehicleReport report;
     report.adapter = readAdapter(session);
     report.protocol = readProtocol(session);
+    CodeReader reader(session);
     for (std::shared_ptr<obd::IEcu> const& ecu : session.obd().getEcuManager()->getEcus()) {
-        report.modules.push_back(readModule(*ecu));
+        report.modules.push_back(readModule(*ecu, reader));
     }
     session.check();
     fmt::print("{}", options.json ? toJson(report) : toText(report));
-    return ExitCode::Done;
+    return checking ? check(report) : ExitCode::Done;
 }
 
 } // namespace
 
 void addScanCommand(CommandLine& commandLine)
 {
-    commandLine.addCommand("scan", "Report on the adapter and all control modules", scan);
+    auto const checking = std::make_shared<bool>(false);
+    CLI::App* const command =
+        commandLine.addCommand("scan", "Report on the adapter and all control modules",
+                               [checking](GlobalOptions const& options) { return scan(*checking, options); });
+    command->add_flag("--check", *checking,
+                      "Exit with code 10 if the lamp is on or a code is confirmed or permanent; a pending one is none");
 }
 
 } // namespace velmora

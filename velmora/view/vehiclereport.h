@@ -1,5 +1,7 @@
 #pragma once
 
+#include "velmora/view/codereport.h"
+
 #include <optional>
 #include <string>
 #include <vector>
@@ -29,6 +31,7 @@ struct ModuleReport
     std::string description;
     std::string standard;
     std::vector<unsigned int> supported; // identifiers of service 01 that are sensors
+    CodeReport codes;
 };
 
 struct VehicleReport

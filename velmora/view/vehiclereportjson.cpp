@@ -37,7 +37,8 @@ Json moduleJson(ModuleReport const& module)
             {"name", textOrNull(module.name)},
             {"description", textOrNull(module.description)},
             {"standard", textOrNull(module.standard)},
-            {"sensors", supported}};
+            {"sensors", supported},
+            {"codes", toJsonValue(module.codes)}};
 }
 
 } // namespace

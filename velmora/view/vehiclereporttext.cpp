@@ -36,6 +36,7 @@ void addModule(std::string& text, ModuleReport const& module)
     addLine(text, "Description", module.description);
     addLine(text, "Standard", module.standard);
     addLine(text, "Sensors", std::to_string(module.supported.size()));
+    text += toText(module.codes);
 }
 
 } // namespace

@@ -1,0 +1,149 @@
+#include "velmora/command/commands.h"
+#include "velmora/commandline.h"
+#include "velmora/failure.h"
+#include "velmora/linereader.h"
+#include "velmora/servicereplies.h"
+#include "velmora/session.h"
+
+#include <fmt/format.h>
+#include <nlohmann/json.hpp>
+#include <set>
+#include <unistd.h>
+
+namespace velmora {
+
+namespace {
+
+constexpr unsigned char clearService = 0x04;
+// Some modules write their memory before they answer.
+constexpr unsigned int replyLimitMs = 5000;
+
+constexpr char const* warning =
+    R"(This clears the confirmed and pending trouble codes of all control modules and turns the lamp off.
+It also erases: freeze frames, readiness (the vehicle must be driven before it can pass an emissions
+test), monitor test results, and the distance and time since codes were cleared.
+Permanent codes stay. Note codes and freeze frame down first if they may be needed.
+)";
+
+struct ModuleOutcome
+{
+    unsigned int id;
+    std::string name;
+    ServiceReply reply;
+};
+
+char const* resultWord(ServiceReply::Kind kind)
+{
+    static constexpr char const* words[] = {"cleared", "refused", "no answer", "the reply can't be read"};
+    return words[static_cast<int>(kind)];
+}
+
+// Clearing is functional: the request reaches every module, whichever one is selected.
+void checkOptions(GlobalOptions const& options)
+{
+    if (options.ecu) {
+        throw Failure(ExitCode::WrongUse, "Clearing reaches all control modules; it can't be held to one",
+                      {"leave --ecu out to clear the codes of all"});
+    }
+    if (!options.yes && ::isatty(STDIN_FILENO) == 0) {
+        throw Failure(ExitCode::WrongUse, "Clearing must be confirmed, and there is no terminal to ask",
+                      {"--yes clears without asking"});
+    }
+}
+
+bool confirmed(Session const& session)
+{
+    fmt::print(stderr, "{}Clear now? [y/N] ", warning);
+    std::string answer;
+    return LineReader(session).read(answer) && (answer == "y" || answer == "Y" || answer == "yes");
+}
+
+std::vector<ModuleOutcome> clearCodes(Session& session)
+{
+    ServiceReplies const replies(*session.proxy(), clearService, replyLimitMs);
+    session.check();
+    obd::IEcuManager& modules = *session.obd().getEcuManager();
+    std::vector<unsigned int> known;
+    modules.getEcuIds(known);
+    std::set<unsigned int> ids(known.begin(), known.end());
+    for (unsigned int const id : replies.answering()) {
+        ids.insert(id);
+    }
+    std::vector<ModuleOutcome> outcomes;
+    for (unsigned int const id : ids) {
+        outcomes.push_back({id, modules.getEcuName(id), replies.of(id)});
+    }
+    return outcomes;
+}
+
+void printText(std::vector<ModuleOutcome> const& outcomes)
+{
+    for (ModuleOutcome const& outcome : outcomes) {
+        fmt::print("Control module {:X}{}{}: {}{}{}\n", outcome.id, outcome.name.empty() ? "" : " ", outcome.name,
+                   resultWord(outcome.reply.kind), outcome.reply.reason.empty() ? "" : ": ", outcome.reply.reason);
+    }
+}
+
+void printJson(std::vector<ModuleOutcome> const& outcomes)
+{
+    nlohmann::ordered_json list = nlohmann::ordered_json::array();
+    for (ModuleOutcome const& outcome : outcomes) {
+        list.push_back({{"id", fmt::format("{:X}", outcome.id)},
+                        {"name", outcome.name},
+                        {"cleared", outcome.reply.kind == ServiceReply::Kind::Positive},
+                        {"result", resultWord(outcome.reply.kind)},
+                        {"reason", outcome.reply.reason.empty() ? nlohmann::ordered_json(nullptr)
+                                                                : nlohmann::ordered_json(outcome.reply.reason)}});
+    }
+    fmt::print("{}\n", list.dump(2, ' ', false, nlohmann::ordered_json::error_handler_t::replace));
+}
+
+ExitCode judge(std::vector<ModuleOutcome> const& outcomes)
+{
+    bool cleared = false;
+    for (ModuleOutcome const& outcome : outcomes) {
+        if (outcome.reply.kind == ServiceReply::Kind::Refused) {
+            throw Failure(
+                ExitCode::Refused,
+                fmt::format("Control module {:X} refused to clear its codes: {}", outcome.id, outcome.reply.reason),
+                {"most modules clear only with the ignition on and the engine off"});
+        }
+        cleared = cleared || outcome.reply.kind == ServiceReply::Kind::Positive;
+    }
+    if (!cleared) {
+        throw Failure(ExitCode::VehicleSilent, "No control module confirmed that it cleared its codes",
+                      {"is the ignition still on?", "`velmora codes` tells what is stored now"});
+    }
+    return ExitCode::Done;
+}
+
+ExitCode clear(GlobalOptions const& options)
+{
+    checkOptions(options);
+    Session session(options);
+    session.connect();
+    if (!options.yes && !confirmed(session)) {
+        fmt::print(stderr, "Nothing was cleared.\n");
+        return ExitCode::Failed;
+    }
+    std::vector<ModuleOutcome> const outcomes = clearCodes(session);
+    if (options.json) {
+        printJson(outcomes);
+    } else {
+        printText(outcomes);
+    }
+    std::fflush(stdout);
+    return judge(outcomes);
+}
+
+} // namespace
+
+void addClearCommand(CommandLine& commandLine)
+{
+    commandLine.addCommand("clear",
+                           "Clear trouble codes, and with them freeze frames and readiness, in all control modules; "
+                           "asks first",
+                           clear);
+}
+
+} // namespace velmora

@@ -1,0 +1,36 @@
+#pragma once
+
+#include <memory>
+#include <nlohmann/json_fwd.hpp>
+#include <obd/dtcdatamodel.h>
+#include <string>
+#include <vector>
+
+namespace velmora {
+
+// One trouble code as people read it: all its meanings together.
+struct TroubleCode
+{
+    struct Meaning
+    {
+        std::string maker;
+        std::string text;
+
+        bool operator==(Meaning const&) const = default;
+    };
+
+    std::string code;
+    std::string system;
+    std::vector<Meaning> meanings;
+};
+
+// Brings the meanings of each code together, each once, with the codes in the order of their first appearance.
+std::vector<TroubleCode> groupByCode(std::vector<std::shared_ptr<obd::DtcDataModel>> const& models);
+
+// One line a meaning: code, maker and text in columns, behind the indent.
+std::string toText(TroubleCode const& code, std::string const& indent = {});
+
+nlohmann::ordered_json toJsonValue(TroubleCode const& code);
+nlohmann::ordered_json toJsonValue(std::vector<TroubleCode> const& codes);
+
+} // namespace velmora
