@@ -113,7 +113,9 @@ TEST(TroubleCodes, ClearingAsksAndPutsTheLampOut)
     EXPECT_EQ(after["lamp"], false);
     EXPECT_TRUE(after["confirmed"]["codes"].empty());
     EXPECT_EQ(after["permanent"]["codes"][0]["code"], "P0133");
-    EXPECT_TRUE(holds(runVelmora({"-q", "-p", port, "freeze"}).out, "none stored"));
+    Outcome const frame = runVelmora({"-q", "-p", port, "freeze"});
+    EXPECT_EQ(frame.exitCode, 6) << frame.err; // without a frame this car does not tell what one would hold
+    EXPECT_FALSE(holds(frame.out, "P0133")) << frame.out;
 }
 
 TEST(TroubleCodes, RefusedClearingIsExitCodeSevenWithItsReason)
