@@ -91,7 +91,7 @@ TEST(TroubleCodes, FreezeFrameShowsCodeNamesAndUnits)
     ASSERT_EQ(outcome.exitCode, 0) << outcome.err;
     EXPECT_TRUE(holds(outcome.out, "  P0133  Generic        O2 Sensor Circuit Slow Response")) << outcome.out;
     EXPECT_TRUE(holds(outcome.out, " rpm\n")) << outcome.out;
-    EXPECT_TRUE(holds(outcome.out, "Control module 7E9: ECU#2, freeze frame 0\n  none stored\n")) << outcome.out;
+    EXPECT_TRUE(holds(outcome.out, "Control module 7E9: TCM, freeze frame 0\n  none stored\n")) << outcome.out;
     EXPECT_EQ(runVelmora({"-p", "sim:petrol-can11", "freeze", "256"}).exitCode, 2);
 }
 
@@ -108,7 +108,7 @@ TEST(TroubleCodes, ClearingAsksAndPutsTheLampOut)
     EXPECT_TRUE(holds(before.out, "Lamp           on")) << before.out;
     Outcome const cleared = runVelmora({"-q", "-p", port, "clear", "--yes"});
     EXPECT_EQ(cleared.exitCode, 0) << cleared.err;
-    EXPECT_TRUE(holds(cleared.out, "Control module 7E8 ECU#1: cleared")) << cleared.out;
+    EXPECT_TRUE(holds(cleared.out, "Control module 7E8 ECM: cleared")) << cleared.out;
     auto const after = nlohmann::json::parse(runVelmora({"-q", "-p", port, "--json", "codes"}).out)[0];
     EXPECT_EQ(after["lamp"], false);
     EXPECT_TRUE(after["confirmed"]["codes"].empty());
@@ -123,7 +123,7 @@ TEST(TroubleCodes, RefusedClearingIsExitCodeSevenWithItsReason)
     Outcome const outcome = runVelmora({"-q", "-p", "sim:diesel-can29", "clear", "--yes"});
     EXPECT_EQ(outcome.exitCode, 7);
     EXPECT_TRUE(holds(outcome.err, "18DAF110 refused to clear its codes: conditions not correct (22)")) << outcome.err;
-    EXPECT_TRUE(holds(outcome.out, "18DAF118 ECU#2: cleared")) << outcome.out;
+    EXPECT_TRUE(holds(outcome.out, "18DAF118 TCM: cleared")) << outcome.out;
 }
 
 TEST(TroubleCodes, CheckOfACarWithoutCodesIsDone)
