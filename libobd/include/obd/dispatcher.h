@@ -19,10 +19,10 @@ class IObdProxy;
 //
 // An application needs getInstance(), attach() and detach() of its IDispatchRunner, and dispatch(). The runners' list
 // has no lock: attach before the first connection, detach after the last, on the main thread.
-class Dispatcher : public virtual tervex::Notifier<IDispatchRunner>
+class OBD_EXPORT Dispatcher : public virtual tervex::Notifier<IDispatchRunner>
 {
 public:
-    OBD_EXPORT static Dispatcher& getInstance();
+    static Dispatcher& getInstance();
 
     Dispatcher(Dispatcher const&) = delete;
     Dispatcher& operator=(Dispatcher const&) = delete;
@@ -30,7 +30,7 @@ public:
     // Does what is due on the main thread: the calls of observers, and with them the next round of live values. Call it
     // once for each onDispatchRequested, never from inside it. Not for two threads at once, nor from inside itself. An
     // observer's exception passes through; what was due behind it waits for the next call.
-    OBD_EXPORT void dispatch();
+    void dispatch();
 
     // The rest is the library's own.
 
