@@ -8,12 +8,13 @@
 #include <atomic>
 #include <functional>
 #include <memory>
+#include <mutex>
 #include <utility>
 
 namespace obd {
 
 // Runs a parameter on the worker without a waiting caller; the outcome comes back as a call on the application's
-// thread. One run at a time, to be started again for the next. All on the application's thread.
+// thread. One run at a time, to be started again for the next. Any thread may cancel, also while the run finishes.
 //
 // The parameter is one object for all runs, and a run that was cancelled may still be on the worker: start a cancelled
 // query again only when the worker is known to be out of it, or build a new one.
@@ -35,88 +36,88 @@ public:
     // or is cancelled.
     bool start(Function callback)
     {
-        if (m_running.exchange(true)) {
-            return false;
+        auto const run = std::make_shared<DispatchableQuery>(m_parameter, std::move(callback));
+        {
+            std::lock_guard const lock(m_mutex);
+            if (m_dispatchable != nullptr && m_dispatchable->isRunning()) {
+                return false;
+            }
+            m_dispatchable = run;
         }
-        m_callback.swap(callback);
         if (!m_parameter->keepsHistory()) {
             m_parameter->clear();
         }
-        m_dispatchable = std::make_shared<DispatchableQuery>(*this, m_parameter);
-        if (!Dispatcher::getInstance().update(m_dispatchable)) {
+        if (!Dispatcher::getInstance().update(run)) {
             cancel();
             return false;
         }
         return true;
     }
 
-    // Ends the run: its callback will not be called. A request that is on its way is not held up.
+    // Ends the run: its callback will not be called, unless it is being called already. A request that is on its way is
+    // not held up.
     void cancel()
     {
-        // Goes last: it may hold the last reference to this query.
-        Function const dropped = std::exchange(m_callback, nullptr);
-        if (m_dispatchable != nullptr) {
-            m_dispatchable->cancel();
-            m_dispatchable = nullptr;
+        std::shared_ptr<DispatchableQuery> run;
+        {
+            std::lock_guard const lock(m_mutex);
+            run.swap(m_dispatchable);
         }
-        m_running = false;
+        if (run != nullptr) {
+            run->cancel();
+        }
     }
 
 private:
     class DispatchableQuery;
 
-    // Gives the callback away: the call may start the next run, or end this object.
-    void finish(bool success)
-    {
-        Function const callback = std::exchange(m_callback, nullptr);
-        std::shared_ptr<T> const parameter = m_parameter;
-        m_running = false;
-        if (callback) {
-            callback(success, parameter);
-        }
-    }
-
-    std::shared_ptr<DispatchableQuery> m_dispatchable; // of the run that is on
-    std::atomic<bool> m_running{false};
-    Function m_callback;
-    std::shared_ptr<T> m_parameter;
+    std::shared_ptr<T> const m_parameter;
+    std::mutex m_mutex;                                // a leaf
+    std::shared_ptr<DispatchableQuery> m_dispatchable; // of the latest run; protected by m_mutex
 };
 
-// One run.
+// One run. Whoever ends it, finish or cancel, has the callback for itself.
 template <class T>
 class Query<T>::DispatchableQuery : public IDispatchable
 {
 public:
-    DispatchableQuery(Query<T>& owner, std::shared_ptr<T> parameter)
-        : m_owner(&owner), m_parameter(std::move(parameter))
+    DispatchableQuery(std::shared_ptr<T> parameter, Function callback)
+        : m_parameter(std::move(parameter)), m_callback(std::move(callback))
     {}
 
-    // The owner may go after this.
+    bool isRunning() const { return m_running; }
+
     void cancel()
     {
-        m_cancelled = true;
-        m_owner = nullptr;
+        if (m_running.exchange(false)) {
+            m_callback = nullptr; // it may hold the last reference to its query
+        }
     }
 
     void execute(std::shared_ptr<IObdProxy> const& proxy) override
     {
-        if (proxy != nullptr && !m_cancelled) {
+        if (proxy != nullptr && m_running) {
             m_success = pacedUpdate(*m_parameter, proxy);
         }
     }
 
+    // Gives the callback away: the call may start the next run, or end the query.
     void finish() override
     {
-        if (m_owner != nullptr && !m_cancelled) {
-            m_owner->finish(m_success);
+        if (!m_running.exchange(false)) {
+            return;
+        }
+        Function const callback = std::exchange(m_callback, nullptr);
+        if (callback) {
+            callback(m_success, m_parameter);
         }
     }
 
 private:
-    Query<T>* m_owner; // null once cancelled; the application's thread alone
-    std::shared_ptr<T> m_parameter;
+    std::shared_ptr<T> const m_parameter;
+    std::atomic<bool> m_running{true};
+    Function m_callback; // of the one that took m_running down
     std::atomic<bool> m_success{false};
-    std::atomic<bool> m_cancelled{false};
 };
 
 } // namespace obd
