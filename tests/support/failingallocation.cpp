@@ -1,5 +1,6 @@
 #include "tests/support/failingallocation.h"
 
+#include <atomic>
 #include <cstdlib>
 #include <new>
 #include <utility>
@@ -7,6 +8,15 @@
 namespace {
 
 thread_local bool failNext = false;
+std::atomic<long> live{0};
+
+void release(void* memory)
+{
+    if (memory != nullptr) {
+        live.fetch_sub(1, std::memory_order_relaxed);
+        std::free(memory);
+    }
+}
 
 } // namespace
 
@@ -14,6 +24,7 @@ void* operator new(std::size_t size)
 {
     if (!std::exchange(failNext, false)) {
         if (void* const memory = std::malloc(size == 0 ? 1 : size)) {
+            live.fetch_add(1, std::memory_order_relaxed);
             return memory;
         }
     }
@@ -22,12 +33,12 @@ void* operator new(std::size_t size)
 
 void operator delete(void* memory) noexcept
 {
-    std::free(memory);
+    release(memory);
 }
 
 void operator delete(void* memory, std::size_t /*size*/) noexcept
 {
-    std::free(memory);
+    release(memory);
 }
 
 namespace support {
@@ -40,6 +51,11 @@ FailingAllocation::FailingAllocation()
 FailingAllocation::~FailingAllocation()
 {
     failNext = false;
+}
+
+long liveAllocations()
+{
+    return live;
 }
 
 } // namespace support

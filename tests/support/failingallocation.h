@@ -13,4 +13,7 @@ public:
     FailingAllocation& operator=(FailingAllocation const&) = delete;
 };
 
+// How many allocations of all threads are not freed yet. For a test executable as above.
+long liveAllocations();
+
 } // namespace support

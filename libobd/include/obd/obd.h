@@ -29,6 +29,8 @@
 #include <obd/iobdproxy.h>
 #include <obd/iobdvelmora.h>
 #include <obd/iquery.h>
+#include <obd/isensorservice.h>
+#include <obd/isensorserviceobserver.h>
 #include <obd/isettings.h>
 #include <obd/itroublecodeservice.h>
 #include <obd/ivalueformater.h>

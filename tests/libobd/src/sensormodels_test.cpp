@@ -51,4 +51,36 @@ TEST(SensorModels, AValueIsFoundByItsSensorThoughOthersAreLeftOut)
     EXPECT_EQ(obd::findValue(values, 783)->textualValue(), "fourth");
 }
 
+TEST(SensorModels, WidenTheRangeToWholeNumbers)
+{
+    struct Case
+    {
+        double minimum;
+        double maximum;
+        int low;
+        int high;
+    };
+    Case const cases[] = {
+        {-40.0, 215.0, -40, 215},
+        {-100.0, 99.6, -100, 100},
+        {-100.0, 99.22, -100, 100},
+        {-99.2, 100.0, -100, 100},
+        {0.0, 16383.75, 0, 16384},
+        {0.0, 1.275, 0, 2},
+        {0.0, 0.5, -1, 1},
+        {0.0, 0.0, 0, 0},
+        {-64.0, 63.5, -64, 64},
+        {-3.0, 4.0, -3, 4},
+        {0.5, 0.5, 0, 1},
+        {-210.0, 301.99, -210, 302},
+        {0.0, 4294967295.0, 0, 2147483647},
+    };
+    for (Case const& each : cases) {
+        SCOPED_TRACE(testing::Message() << each.minimum << " to " << each.maximum);
+        obd::SensorDataModel::Numeric const range = obd::displayRange(each.minimum, each.maximum);
+        EXPECT_EQ(range.minimum, each.low);
+        EXPECT_EQ(range.maximum, each.high);
+    }
+}
+
 } // namespace
