@@ -1,0 +1,25 @@
+#pragma once
+
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace velmora {
+
+// A short name of a PID, as people type it. The first name of a PID in the table is the one that messages use.
+struct SensorName
+{
+    int pid;
+    char const* name; // capitals, digits and underscores
+};
+
+// All names, by PID.
+std::vector<SensorName> const& sensorNames();
+
+// The PID of a name in any letter case, with '-' or a blank for '_'.
+std::optional<int> findSensorName(std::string const& text);
+
+// The first name of a PID, empty for one without.
+std::string sensorNameOf(int pid);
+
+} // namespace velmora

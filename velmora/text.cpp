@@ -1,0 +1,81 @@
+#include "velmora/text.h"
+
+#include <algorithm>
+#include <numeric>
+
+namespace velmora {
+
+namespace {
+
+bool isContinuation(char byte)
+{
+    return (static_cast<unsigned char>(byte) & 0xC0) == 0x80;
+}
+
+// The first characters of a UTF-8 text.
+std::string firstCharacters(std::string const& text, std::size_t count)
+{
+    std::size_t end = 0;
+    while (end < text.size() && (count > 0 || isContinuation(text[end]))) {
+        if (!isContinuation(text[end])) {
+            --count;
+        }
+        ++end;
+    }
+    return text.substr(0, end);
+}
+
+} // namespace
+
+std::string toUpper(std::string text)
+{
+    std::transform(text.begin(), text.end(), text.begin(),
+                   [](char each) { return each >= 'a' && each <= 'z' ? static_cast<char>(each - 'a' + 'A') : each; });
+    return text;
+}
+
+std::vector<std::string> splitWords(std::string const& text)
+{
+    constexpr char const* separators = " _-";
+    std::vector<std::string> words;
+    std::size_t begin = text.find_first_not_of(separators);
+    while (begin != std::string::npos) {
+        std::size_t const end = text.find_first_of(separators, begin);
+        words.push_back(text.substr(begin, end - begin));
+        begin = text.find_first_not_of(separators, end);
+    }
+    return words;
+}
+
+std::size_t displayWidth(std::string const& text)
+{
+    return static_cast<std::size_t>(
+        std::count_if(text.begin(), text.end(), [](char byte) { return !isContinuation(byte); }));
+}
+
+std::string fitted(std::string const& text, std::size_t width, bool rightAligned)
+{
+    std::size_t const shown = displayWidth(text);
+    if (shown > width) {
+        return width == 0 ? std::string() : firstCharacters(text, width - 1) + "…";
+    }
+    std::string const blanks(width - shown, ' ');
+    return rightAligned ? blanks + text : text + blanks;
+}
+
+std::size_t editDistance(std::string const& left, std::string const& right)
+{
+    std::vector<std::size_t> row(right.size() + 1);
+    std::iota(row.begin(), row.end(), std::size_t{0});
+    for (std::size_t i = 0; i < left.size(); ++i) {
+        std::size_t diagonal = row[0]++;
+        for (std::size_t j = 0; j < right.size(); ++j) {
+            std::size_t const changed = diagonal + (left[i] == right[j] ? 0 : 1);
+            diagonal = row[j + 1];
+            row[j + 1] = std::min({changed, row[j] + 1, row[j + 1] + 1});
+        }
+    }
+    return row.back();
+}
+
+} // namespace velmora

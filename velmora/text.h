@@ -1,0 +1,24 @@
+#pragma once
+
+#include <cstddef>
+#include <string>
+#include <vector>
+
+namespace velmora {
+
+// ASCII letters only.
+std::string toUpper(std::string text);
+
+// The parts between blanks, '_' and '-'.
+std::vector<std::string> splitWords(std::string const& text);
+
+// How many characters a UTF-8 text shows.
+std::size_t displayWidth(std::string const& text);
+
+// The text in exactly that many columns: filled with blanks, at the left for rightAligned, or cut with an ellipsis.
+std::string fitted(std::string const& text, std::size_t width, bool rightAligned = false);
+
+// How many letters have to be typed, left out or changed to make one text of the other.
+std::size_t editDistance(std::string const& left, std::string const& right);
+
+} // namespace velmora
