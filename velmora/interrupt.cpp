@@ -54,13 +54,28 @@ void Interrupt::wait()
     int signal = 0;
     while (sigwait(&signals, &signal) == 0 && !m_stop) {
         if (m_raised.exchange(true)) {
-            ::_exit(static_cast<int>(ExitCode::Interrupted));
+            endAtOnce();
         }
         std::lock_guard const lock(m_mutex);
         if (m_handler) {
             m_handler();
         }
     }
+}
+
+void Interrupt::endAtOnce()
+{
+    std::lock_guard const lock(m_lastActMutex);
+    if (m_lastAct) {
+        m_lastAct();
+    }
+    ::_exit(static_cast<int>(ExitCode::Interrupted));
+}
+
+void Interrupt::setLastAct(std::function<void()> act)
+{
+    std::lock_guard const lock(m_lastActMutex);
+    m_lastAct = std::move(act);
 }
 
 void Interrupt::setHandler(std::function<void()> handler)

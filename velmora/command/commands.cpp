@@ -5,6 +5,7 @@ namespace velmora {
 void addCommands(CommandLine& commandLine)
 {
     addScanCommand(commandLine);
+    addLiveCommand(commandLine);
     addSensorsCommand(commandLine);
     addCodesCommand(commandLine);
     addClearCommand(commandLine);

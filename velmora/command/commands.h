@@ -13,6 +13,7 @@ void addCodesCommand(CommandLine& commandLine);
 void addConsoleCommand(CommandLine& commandLine);
 void addDtcCommand(CommandLine& commandLine);
 void addFreezeCommand(CommandLine& commandLine);
+void addLiveCommand(CommandLine& commandLine);
 void addPortsCommand(CommandLine& commandLine);
 void addScanCommand(CommandLine& commandLine);
 void addSensorsCommand(CommandLine& commandLine);

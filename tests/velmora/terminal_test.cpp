@@ -1,0 +1,47 @@
+#include "velmora/terminal.h"
+
+#include <gtest/gtest.h>
+
+namespace {
+
+using velmora::Key;
+using velmora::takeKey;
+
+std::vector<int> keys(std::string bytes)
+{
+    std::vector<int> list;
+    while (auto const key = takeKey(bytes)) {
+        list.push_back(static_cast<int>(*key));
+    }
+    EXPECT_TRUE(bytes.empty());
+    return list;
+}
+
+TEST(Keys, LettersAreTheirOwnCodes)
+{
+    EXPECT_EQ(keys("qU \n"), (std::vector<int>{'q', 'U', ' ', '\n'}));
+    EXPECT_EQ(keys("\r"), std::vector<int>{static_cast<int>(Key::Enter)});
+}
+
+TEST(Keys, ArrowsComeInBothOfTheirForms)
+{
+    EXPECT_EQ(keys("\033[A\033[B"), (std::vector<int>{static_cast<int>(Key::Up), static_cast<int>(Key::Down)}));
+    EXPECT_EQ(keys("\033OA\033OB"), (std::vector<int>{static_cast<int>(Key::Up), static_cast<int>(Key::Down)}));
+    EXPECT_EQ(keys("\033[5~\033[6~"),
+              (std::vector<int>{static_cast<int>(Key::PageUp), static_cast<int>(Key::PageDown)}));
+}
+
+TEST(Keys, EscapeAloneIsAKey)
+{
+    EXPECT_EQ(keys("\033"), std::vector<int>{static_cast<int>(Key::Escape)});
+    EXPECT_EQ(keys("\033q"), (std::vector<int>{static_cast<int>(Key::Escape), 'q'}));
+}
+
+TEST(Keys, UnknownSequencesAreSkippedWhole)
+{
+    EXPECT_EQ(keys("\033[1;5Cq"), std::vector<int>{'q'});
+    EXPECT_EQ(keys("\033["), std::vector<int>{});
+    EXPECT_EQ(keys(""), std::vector<int>{});
+}
+
+} // namespace

@@ -1,0 +1,88 @@
+#pragma once
+
+#include "velmora/exitcode.h"
+#include "velmora/sensorchoice.h"
+#include "velmora/session.h"
+#include "velmora/terminal.h"
+#include "velmora/view/livecsv.h"
+#include "velmora/view/livescreen.h"
+#include "velmora/view/livetable.h"
+
+#include <common/observer.h>
+#include <memory>
+#include <obd/isensorservice.h>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace velmora {
+
+struct LiveOptions
+{
+    std::vector<std::string> sensors;
+    std::string csv;
+    unsigned long count = 0; // readings of every sensor; 0: no end
+    double duration = 0.0;   // seconds; 0: no end
+};
+
+// Live values of one connection: takes the readings of the sensor service and hands them to the lines, the recording
+// and the screen. The main thread's.
+class LiveRun : public tervex::Observer<obd::ISensorServiceObserver>
+{
+public:
+    // csv may be null. session must be connected and outlive the run.
+    LiveRun(Session& session, LiveOptions const& options, LiveCsv* csv);
+    ~LiveRun() override;
+    LiveRun(LiveRun const&) = delete;
+    LiveRun& operator=(LiveRun const&) = delete;
+
+    // Until the count, the duration or the user ends it. Throws Failure on a lost link and on Ctrl-C.
+    void run();
+
+private:
+    void onInvalidated() override { m_invalidated = true; }
+    void onSensorUpdated(bool success, std::shared_ptr<obd::ParameterDescriptor> const& descriptor,
+                         std::vector<std::shared_ptr<obd::SensorValueDataModel>> const& values) override;
+
+    void select(SensorIds const& ids);
+    void restart(SensorIds const& ids);
+    std::vector<OfferedSensor> offered() const;
+
+    bool isDone() const;
+    void runOnce();
+    void watchSilence(LiveTime now);
+    void failSilent() const;
+    void print(int pid);
+
+    void handleKeys();
+    void handleKey(Key key);
+    void handlePickerKey(Key key);
+    void switchUnits();
+    void scroll(int lines);
+    void draw(LiveTime now);
+    std::string frame(FrameStyle const& style) const;
+    std::string title() const;
+    std::string status() const;
+    FrameStyle style() const;
+
+    Session& m_session;
+    LiveOptions const m_options;
+    LiveCsv* const m_csv;
+    std::shared_ptr<obd::ISensorService> m_service;
+    LiveTable m_table;
+    SensorIds m_ids;
+    LiveTime m_start;
+    LiveTime m_lastReading;
+    LiveTime m_lastLinkCheck;
+    LiveTime m_lastDraw;
+    bool m_invalidated = false;
+    bool m_silenceTold = false;
+    bool m_quit = false;
+    bool m_readerGone = false;
+    std::unique_ptr<Terminal> m_terminal; // null where lines are printed
+    std::unique_ptr<SensorPicker> m_picker;
+    std::size_t m_firstRow = 0;
+    std::string m_note; // in the status line, until the next key
+};
+
+} // namespace velmora

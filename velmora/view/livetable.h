@@ -1,0 +1,84 @@
+#pragma once
+
+#include <chrono>
+#include <deque>
+#include <memory>
+#include <obd/parameterdescriptor.h>
+#include <obd/sensorvaluedatamodel.h>
+#include <set>
+#include <string>
+#include <vector>
+
+namespace velmora {
+
+using LiveTime = std::chrono::steady_clock::time_point;
+
+// One sensor with what is known of it. Texts are empty where nothing is known, for a sensor that the vehicle no longer
+// answers for too.
+struct LiveRow
+{
+    int uid;
+    std::string name;
+    std::string unit;
+    bool numeric;
+    std::string value;
+    std::string minimum;
+    std::string mean;
+    std::string maximum;
+    std::deque<double> trend; // oldest first
+    LiveTime updated;
+    LiveTime trendTime;
+};
+
+// The live values of the selected parameters, in the order of their selection.
+class LiveTable
+{
+public:
+    static constexpr std::size_t trendLength = 16;
+
+    using Descriptors = std::vector<std::shared_ptr<obd::ParameterDescriptor>>;
+    using Values = std::vector<std::shared_ptr<obd::SensorValueDataModel>>;
+
+    // Starts anew, with other parameters or other units.
+    void select(Descriptors const& parameters);
+
+    // Takes a reading of a parameter; a sensor that is not among the values has none any more. Of a parameter that was
+    // not selected nothing is taken.
+    void update(int pid, Values const& values, LiveTime now);
+
+    // Forgets the values that are too old to be shown as current: by some rounds of all sensors, and some seconds.
+    void expire(LiveTime now);
+
+    std::vector<LiveRow> const& rows() const { return m_rows; }
+    // The rows of one parameter.
+    std::vector<LiveRow const*> rowsOf(int pid) const;
+
+    // How often all parameters have had their turn. One that the vehicle doesn't answer for has had it when another one
+    // comes again.
+    unsigned long rounds() const { return m_rounds; }
+    // Whether a reading of this parameter would begin the next round.
+    bool beginsRound(int pid) const { return m_seen.count(pid) != 0; }
+    // All readings so far.
+    unsigned long readings() const { return m_readings; }
+
+private:
+    void countRound(int pid, LiveTime now);
+    void endRound(LiveTime now);
+
+    std::vector<LiveRow> m_rows;
+    std::set<int> m_selected;
+    std::set<int> m_seen; // in this round
+    unsigned long m_rounds = 0;
+    unsigned long m_readings = 0;
+    LiveTime m_roundStart;
+    LiveTime m_lastReading;
+    LiveTime::duration m_roundLength{0};
+};
+
+// "Engine RPM (rpm)", or the name alone.
+std::string nameWithUnit(LiveRow const& row);
+
+// The text, or "-" where there is none.
+std::string orDash(std::string const& text);
+
+} // namespace velmora
