@@ -101,6 +101,22 @@ TEST(Program, ScansARecordedRealCarOverTcp)
     EXPECT_EQ(report["modules"][2]["id"], "7EB");
 }
 
+TEST(Program, ReadsARecordedRealCarLive)
+{
+    std::string const car = recorded("can11-jaguar-2014-two-modules-come-and-go");
+    Outcome const inProcess = runVelmora({"-q", "-p", car, "live", "RPM", "SPEED", "COOLANT_TEMP", "-n", "2"});
+    EXPECT_EQ(inProcess.exitCode, 0) << inProcess.err;
+    ChildProcess simulator({"simulate", "--listen", "tcp://127.0.0.1:0", "--replay", car.substr(7)});
+    Outcome const overTcp =
+        runVelmora({"-q", "-p", simulator.readLine(), "live", "RPM", "SPEED", "COOLANT_TEMP", "-n", "2"});
+    EXPECT_EQ(overTcp.exitCode, 0) << overTcp.err;
+    for (Outcome const& outcome : {inProcess, overTcp}) {
+        EXPECT_TRUE(holds(outcome.out, "Engine RPM: 0 rpm\n")) << outcome.out;
+        EXPECT_TRUE(holds(outcome.out, "Vehicle Speed Sensor: 0 km/h\n")) << outcome.out;
+        EXPECT_TRUE(holds(outcome.out, "Engine Coolant Temperature: 76 °C\n")) << outcome.out;
+    }
+}
+
 TEST(Program, ScansASimulatedCarOverAPseudoTerminal)
 {
     ChildProcess simulator({"simulate", "--listen", "pty", "--vehicle", "petrol-kwp-fast"});
