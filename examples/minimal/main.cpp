@@ -37,13 +37,13 @@ static void writeLoop(int link, obd::IDataBridge& bridge, std::atomic<bool> cons
     }
 }
 
-static void readCar(obd::IObdVelmora& car)
+static void readCar()
 {
-    unsigned int const module = car.getEcuManager()->getCurrentEcu()->id();
-    obd::ResponseMap replies; // in quarters of a turn a minute, behind the echo of service and PID
-    car.getConnectionManager()->getProxy()->execute({0x01, 0x0C}, replies, 1000);
-    if (replies[module].size() >= 4) {
-        std::printf("Engine speed: %d rpm\n", (replies[module][2] * 256 + replies[module][3]) / 4);
+    auto const sensors = obd::SensorServiceBuilder::createSensorService();
+    for (int reading = 0; reading < 5; ++reading) {
+        for (auto const& sensor : sensors->fetchSensors(obd::ParameterIdentifier(0x0C).id())) {
+            std::printf("%s: %s rpm\n", sensor->name.c_str(), sensor->value ? sensor->value->value.c_str() : "-");
+        }
     }
     for (auto const& code : obd::TroubleCodeServiceBuilder::createTroubleCodeService()->fetchConfirmedCodes()) {
         std::printf("Trouble code: %s %s\n", code->code.c_str(), code->description.c_str());
@@ -68,7 +68,7 @@ int main(int count, char** arguments)
     std::thread reader([&] { readLoop(link, *bridge); });
     std::thread writer([&] { writeLoop(link, *bridge, done); });
     bool const opened = car->getConnectionManager()->openConnection(bridge, obd::VehicleProtocol::Automatic, false);
-    opened ? readCar(*car) : void(std::fprintf(stderr, "No car answers.\n"));
+    opened ? readCar() : void(std::fprintf(stderr, "No car answers.\n"));
     car.reset(); // closes the connection
     done = true;
     writer.join();

@@ -16,7 +16,7 @@ port=${address##*:}
 
 said=$("$2" 127.0.0.1 "$port") || fail "the example failed: $said"
 echo "$said"
-[[ $said =~ Engine\ speed:\ [1-9][0-9]*\ rpm ]] || fail "no engine speed"
+[[ $said =~ Engine\ RPM:\ [1-9][0-9]*\ rpm ]] || fail "no engine speed"
 [[ $said =~ Trouble\ code:\ P[0-9A-F]{4}\ .+ ]] || fail "no trouble code"
 
 kill "$server"

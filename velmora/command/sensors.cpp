@@ -1,15 +1,18 @@
 #include "velmora/command/commands.h"
 #include "velmora/commandline.h"
 #include "velmora/session.h"
+#include "velmora/view/unitlabel.h"
 
 #include <fmt/format.h>
 #include <nlohmann/json.hpp>
 #include <obd/iecu.h>
-#include <obd/parameterdescriptor.h>
+#include <obd/iecuservice.h>
 
 namespace velmora {
 
 namespace {
+
+using Json = nlohmann::ordered_json;
 
 struct Service
 {
@@ -36,7 +39,53 @@ std::vector<std::string> identifiers(obd::IEcu const& ecu, obd::ObdMode mode)
     return texts;
 }
 
-void printText(Session& session, obd::IEcu const& ecu)
+struct SensorsOptions
+{
+    bool all = false;
+};
+
+struct Offer
+{
+    std::shared_ptr<obd::ParameterDataModel> parameter;
+    bool offered;
+};
+
+// What the library can show of the selected module; all of it, or what the module offers.
+std::vector<Offer> offers(bool all)
+{
+    std::vector<Offer> list;
+    auto const service = obd::EcuServiceBuilder::createEcuService();
+    for (auto const& parameter : service->supportedParameters()) {
+        bool const offered = service->isParameterSupported(parameter);
+        if (offered || all) {
+            list.push_back({parameter, offered});
+        }
+    }
+    return list;
+}
+
+std::string range(obd::SensorDataModel const& sensor)
+{
+    return sensor.numeric != nullptr ? fmt::format("{} to {}", sensor.numeric->minimum, sensor.numeric->maximum)
+                                     : "text";
+}
+
+void printOffer(Offer const& offer, bool all)
+{
+    std::string lead = fmt::format("{:02X}", static_cast<int>(offer.parameter->id));
+    for (auto const& sensor : offer.parameter->sensors) {
+        std::string const line =
+            fmt::format("  {:<2}  {:<58}  {:<8}  {}", lead, sensor->name, unitLabel(sensor->unit), range(*sensor));
+        if (all) {
+            fmt::print("{:<92}{}\n", line, offer.offered ? "offered" : "-");
+        } else {
+            fmt::print("{}\n", line);
+        }
+        lead.clear();
+    }
+}
+
+void printText(obd::IEcu const& ecu, bool all)
 {
     fmt::print("Control module {:X}: {} ({})\n", ecu.id(), ecu.name(), ecu.description());
     for (Service const& service : services) {
@@ -44,22 +93,37 @@ void printText(Session& session, obd::IEcu const& ecu)
         fmt::print("  {:<24} {}\n", service.title, ids.empty() ? "-" : fmt::format("{}", fmt::join(ids, " ")));
     }
     fmt::print("\n");
-    for (auto const& parameter : session.obd().getEcuManager()->getParameters(ecu.id())) {
-        fmt::print("  {:02X}  {}\n", static_cast<int>(parameter->pid()), parameter->description());
+    for (Offer const& offer : offers(all)) {
+        printOffer(offer, all);
     }
     fmt::print("\n");
 }
 
-nlohmann::ordered_json toJson(Session& session, obd::IEcu const& ecu)
+Json sensorJson(obd::SensorDataModel const& sensor)
 {
-    nlohmann::ordered_json supported;
+    std::string const unit = unitLabel(sensor.unit);
+    Json json = {{"uid", sensor.uid}, {"name", sensor.name}, {"unit", unit.empty() ? Json(nullptr) : Json(unit)}};
+    json["minimum"] = sensor.numeric != nullptr ? Json(sensor.numeric->minimum) : Json(nullptr);
+    json["maximum"] = sensor.numeric != nullptr ? Json(sensor.numeric->maximum) : Json(nullptr);
+    return json;
+}
+
+Json toJson(obd::IEcu const& ecu, bool all)
+{
+    Json supported;
     for (Service const& service : services) {
         supported[std::string(service.title, 2)] = identifiers(ecu, service.mode);
     }
-    nlohmann::ordered_json parameters = nlohmann::ordered_json::array();
-    for (auto const& parameter : session.obd().getEcuManager()->getParameters(ecu.id())) {
-        parameters.push_back(
-            {{"id", fmt::format("{:02X}", static_cast<int>(parameter->pid()))}, {"name", parameter->description()}});
+    Json parameters = Json::array();
+    for (Offer const& offer : offers(all)) {
+        Json sensorList = Json::array();
+        for (auto const& sensor : offer.parameter->sensors) {
+            sensorList.push_back(sensorJson(*sensor));
+        }
+        parameters.push_back({{"id", fmt::format("{:02X}", static_cast<int>(offer.parameter->id))},
+                              {"name", offer.parameter->name},
+                              {"offered", offer.offered},
+                              {"sensors", sensorList}});
     }
     return {{"id", fmt::format("{:X}", ecu.id())},
             {"name", ecu.name()},
@@ -68,23 +132,25 @@ nlohmann::ordered_json toJson(Session& session, obd::IEcu const& ecu)
             {"parameters", parameters}};
 }
 
-ExitCode sensors(GlobalOptions const& options)
+ExitCode sensors(GlobalOptions const& options, bool all)
 {
     Session session(options);
     session.connect();
-    nlohmann::ordered_json modules = nlohmann::ordered_json::array();
-    for (std::shared_ptr<obd::IEcu> const& ecu : session.obd().getEcuManager()->getEcus()) {
+    Json modules = Json::array();
+    obd::IEcuManager& manager = *session.obd().getEcuManager();
+    for (std::shared_ptr<obd::IEcu> const& ecu : manager.getEcus()) {
         if (options.ecu && ecu->id() != *options.ecu) {
             continue;
         }
+        manager.setCurrentEcu(ecu->id());
         if (options.json) {
-            modules.push_back(toJson(session, *ecu));
+            modules.push_back(toJson(*ecu, all));
         } else {
-            printText(session, *ecu);
+            printText(*ecu, all);
         }
     }
     if (options.json) {
-        fmt::print("{}\n", modules.dump(2));
+        fmt::print("{}\n", modules.dump(2, ' ', false, Json::error_handler_t::replace));
     }
     return ExitCode::Done;
 }
@@ -93,7 +159,11 @@ ExitCode sensors(GlobalOptions const& options)
 
 void addSensorsCommand(CommandLine& commandLine)
 {
-    commandLine.addCommand("sensors", "List what the vehicle offers, by control module", sensors);
+    auto const chosen = std::make_shared<SensorsOptions>();
+    CLI::App* const command =
+        commandLine.addCommand("sensors", "List what the vehicle offers, by control module",
+                               [chosen](GlobalOptions const& options) { return sensors(options, chosen->all); });
+    command->add_flag("--all", chosen->all, "Also what the vehicle does not offer");
 }
 
 } // namespace velmora
