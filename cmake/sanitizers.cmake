@@ -1,6 +1,5 @@
-# The build type of the sanitizer presets: light optimisation keeps the instrumented tests fast.
-set(CMAKE_CXX_FLAGS_SANITIZE "-O1 -g1 -fno-omit-frame-pointer" CACHE STRING "Flags of the Sanitize build type")
-
+# The sanitizer presets' build type has no flags of its own: unoptimised objects without debug information build
+# fastest, and the tests wait for nothing.
 if(VELMORA_SANITIZE)
     add_compile_options(-fsanitize=${VELMORA_SANITIZE} -fno-sanitize-recover=all)
     add_link_options(-fsanitize=${VELMORA_SANITIZE})
