@@ -31,6 +31,16 @@ void* operator new(std::size_t size)
     throw std::bad_alloc();
 }
 
+// The standard library's sorting asks this way.
+void* operator new(std::size_t size, std::nothrow_t const& /*tag*/) noexcept
+{
+    try {
+        return operator new(size);
+    } catch (std::bad_alloc const&) {
+        return nullptr;
+    }
+}
+
 void operator delete(void* memory) noexcept
 {
     release(memory);
