@@ -27,6 +27,14 @@ std::shared_ptr<support::FakeEcu> moduleOf(unsigned char choice)
     return ecu;
 }
 
+// Derived parameters send nothing of their own, so no reply is theirs.
+bool hasReply(obd::PowertrainParameter const& parameter)
+{
+    std::vector<unsigned char> request;
+    parameter.requestData(request);
+    return !request.empty();
+}
+
 void require(std::string const& broken, int pid)
 {
     if (!broken.empty()) {
@@ -43,7 +51,7 @@ extern "C" int LLVMFuzzerTestOneInput(std::uint8_t const* data, std::size_t size
         return 0;
     }
     auto const parameter = obd::ParameterFactory().createParameter(obd::ParameterIdentifier::Id(data[0]));
-    if (parameter == nullptr) {
+    if (parameter == nullptr || !hasReply(*parameter)) {
         return 0;
     }
     auto const ecu = moduleOf(data[1]);
