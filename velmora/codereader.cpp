@@ -58,7 +58,7 @@ CodeReader::CodeReader(Session& session)
 
 CodeReport CodeReader::read(obd::IEcu const& ecu, std::vector<CodeKind> const& kinds)
 {
-    m_session.obd().getEcuManager()->setCurrentEcu(ecu.id());
+    m_session.select(ecu);
     CodeReport report;
     auto const lamp = m_service->fetchMilStatus();
     m_session.check();
@@ -89,14 +89,6 @@ ServiceReply CodeReader::reply(obd::IEcu const& ecu, CodeKind kind)
         found = m_replies.emplace(kind, ServiceReplies(*m_session.proxy(), row(kind).service, replyLimitMs)).first;
     }
     return found->second.of(ecu.id());
-}
-
-std::vector<std::shared_ptr<obd::IEcu>> selectedModules(Session& session)
-{
-    if (session.options().ecu) {
-        return {session.obd().getEcuManager()->getCurrentEcu()};
-    }
-    return session.obd().getEcuManager()->getEcus();
 }
 
 } // namespace velmora

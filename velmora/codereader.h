@@ -34,7 +34,4 @@ private:
 // with a checksum.
 bool isCodeListReply(std::vector<unsigned char> const& bytes, obd::ObdProtocol protocol);
 
-// The control modules that the options select: one, or all.
-std::vector<std::shared_ptr<obd::IEcu>> selectedModules(Session& session);
-
 } // namespace velmora

@@ -70,6 +70,19 @@ std::shared_ptr<obd::IAdapter> Session::adapter() const
     return m_obd->getConnectionManager()->getAdapter();
 }
 
+std::vector<std::shared_ptr<obd::IEcu>> Session::selectedModules() const
+{
+    if (m_options.ecu) {
+        return {m_obd->getEcuManager()->getCurrentEcu()};
+    }
+    return m_obd->getEcuManager()->getEcus();
+}
+
+void Session::select(obd::IEcu const& ecu) const
+{
+    m_obd->getEcuManager()->setCurrentEcu(ecu.id());
+}
+
 PortAddress Session::portAddress() const
 {
     std::string text = m_options.port;

@@ -13,6 +13,7 @@
 #include <obd/iobdvelmora.h>
 #include <optional>
 #include <string>
+#include <vector>
 
 namespace velmora {
 
@@ -35,6 +36,10 @@ public:
     void connect();
 
     obd::IObdVelmora& obd() const { return *m_obd; }
+    // The control modules that the options select: one, or all.
+    std::vector<std::shared_ptr<obd::IEcu>> selectedModules() const;
+    // Makes a module the one that the library's services work with.
+    void select(obd::IEcu const& ecu) const;
     std::shared_ptr<obd::IObdProxy> proxy() const;
     std::shared_ptr<obd::IAdapter> adapter() const;
     // The port's address, for messages and reports.

@@ -89,9 +89,9 @@ TEST(TroubleCodes, FreezeFrameShowsCodeNamesAndUnits)
 {
     Outcome const outcome = runVelmora({"-q", "-p", "sim:petrol-can11", "freeze"});
     ASSERT_EQ(outcome.exitCode, 0) << outcome.err;
-    EXPECT_TRUE(holds(outcome.out, "  P0133  Generic        O2 Sensor Circuit Slow Response")) << outcome.out;
+    EXPECT_TRUE(holds(outcome.out, "    P0133  Generic        O2 Sensor Circuit Slow Response")) << outcome.out;
     EXPECT_TRUE(holds(outcome.out, " rpm\n")) << outcome.out;
-    EXPECT_TRUE(holds(outcome.out, "Control module 7E9: TCM, freeze frame 0\n  none stored\n")) << outcome.out;
+    EXPECT_TRUE(holds(outcome.out, "Control module 7E9: TCM\n  Freeze frame   0: none stored\n")) << outcome.out;
     EXPECT_EQ(runVelmora({"-p", "sim:petrol-can11", "freeze", "256"}).exitCode, 2);
 }
 

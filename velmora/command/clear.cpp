@@ -4,9 +4,9 @@
 #include "velmora/linereader.h"
 #include "velmora/servicereplies.h"
 #include "velmora/session.h"
+#include "velmora/view/json.h"
 
 #include <fmt/format.h>
-#include <nlohmann/json.hpp>
 #include <set>
 #include <unistd.h>
 
@@ -86,16 +86,15 @@ void printText(std::vector<ModuleOutcome> const& outcomes)
 
 void printJson(std::vector<ModuleOutcome> const& outcomes)
 {
-    nlohmann::ordered_json list = nlohmann::ordered_json::array();
+    Json list = Json::array();
     for (ModuleOutcome const& outcome : outcomes) {
         list.push_back({{"id", fmt::format("{:X}", outcome.id)},
-                        {"name", outcome.name},
+                        {"name", textOrNull(outcome.name)},
                         {"cleared", outcome.reply.kind == ServiceReply::Kind::Positive},
                         {"result", resultWord(outcome.reply.kind)},
-                        {"reason", outcome.reply.reason.empty() ? nlohmann::ordered_json(nullptr)
-                                                                : nlohmann::ordered_json(outcome.reply.reason)}});
+                        {"reason", textOrNull(outcome.reply.reason)}});
     }
-    fmt::print("{}\n", list.dump(2, ' ', false, nlohmann::ordered_json::error_handler_t::replace));
+    fmt::print("{}", printed(list));
 }
 
 ExitCode judge(std::vector<ModuleOutcome> const& outcomes)

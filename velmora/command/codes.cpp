@@ -1,11 +1,9 @@
 #include "velmora/codereader.h"
 #include "velmora/command/commands.h"
+#include "velmora/command/modulecommand.h"
 #include "velmora/commandline.h"
-#include "velmora/failure.h"
 
 #include <algorithm>
-#include <cstdio>
-#include <fmt/format.h>
 
 namespace velmora {
 
@@ -40,19 +38,16 @@ bool anyRefused(std::vector<ModuleCodes> const& modules)
     });
 }
 
-void failWithoutAnswer(std::vector<ModuleCodes> const& modules)
+Failure withoutAnswer(std::vector<ModuleCodes> const& modules)
 {
-    if (std::any_of(modules.begin(), modules.end(),
-                    [](ModuleCodes const& module) { return hasAnswer(module.report); })) {
-        return;
-    }
-    std::fflush(stdout);
     if (anyRefused(modules)) {
-        throw Failure(ExitCode::Refused, "The vehicle refused to tell these codes",
-                      {"try again with the ignition on and the engine off"});
+        return {ExitCode::Refused,
+                "The vehicle refused to tell these codes",
+                {"try again with the ignition on and the engine off"}};
     }
-    throw Failure(ExitCode::NotSupported, "No control module told these codes",
-                  {"is the ignition on?", "pending codes are not told by all vehicles, permanent ones only by newer"});
+    return {ExitCode::NotSupported,
+            "No control module told these codes",
+            {"is the ignition on?", "pending codes are not told by all vehicles, permanent ones only by newer"}};
 }
 
 ExitCode codes(CodesOptions const& chosen, GlobalOptions const& options)
@@ -60,12 +55,10 @@ ExitCode codes(CodesOptions const& chosen, GlobalOptions const& options)
     Session session(options);
     session.connect();
     CodeReader reader(session);
-    std::vector<ModuleCodes> modules;
-    for (std::shared_ptr<obd::IEcu> const& ecu : selectedModules(session)) {
-        modules.push_back({ecu->id(), ecu->name(), reader.read(*ecu, chosenKinds(chosen))});
-    }
-    fmt::print("{}", options.json ? toJson(modules) : toText(modules));
-    failWithoutAnswer(modules);
+    auto const modules = readModules(
+        session, [&](Session& /*session*/, obd::IEcu const& ecu) { return reader.read(ecu, chosenKinds(chosen)); });
+    print(modules, options);
+    requireAnswer(modules, withoutAnswer(modules));
     return ExitCode::Done;
 }
 

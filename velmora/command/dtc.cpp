@@ -2,12 +2,12 @@
 #include "velmora/command/commands.h"
 #include "velmora/commandline.h"
 #include "velmora/failure.h"
+#include "velmora/view/json.h"
 #include "velmora/view/troublecode.h"
 
 #include <algorithm>
 #include <fmt/format.h>
 #include <memory>
-#include <nlohmann/json.hpp>
 #include <obd/library.h>
 #include <obd/troublecodecatalogue.h>
 
@@ -40,12 +40,6 @@ std::string upperCase(std::string text)
     return text;
 }
 
-void print(nlohmann::ordered_json const& document)
-{
-    // What the user typed may be no UTF-8.
-    fmt::print("{}\n", document.dump(2, ' ', false, nlohmann::ordered_json::error_handler_t::replace));
-}
-
 // A generic meaning holds for every maker's vehicles.
 void keepMaker(std::vector<TroubleCode::Meaning>& meanings, std::string const& maker)
 {
@@ -75,7 +69,7 @@ ExitCode explain(DtcOptions const& options, std::string const& maker, bool json)
         }
     }
     if (json) {
-        print(toJsonValue(found));
+        fmt::print("{}", printed(toJsonValue(found)));
     } else {
         for (TroubleCode const& code : found) {
             fmt::print("{}", toText(code));
@@ -93,11 +87,11 @@ ExitCode explain(DtcOptions const& options, std::string const& maker, bool json)
 
 void printJson(CatalogueRows const& rows)
 {
-    nlohmann::ordered_json list = nlohmann::ordered_json::array();
+    Json list = Json::array();
     for (auto const& row : rows) {
         list.push_back({{"maker", row->manufacturer}, {"code", row->code}, {"text", row->description}});
     }
-    print(list);
+    fmt::print("{}", printed(list));
 }
 
 ExitCode listRows(DtcOptions const& options, std::string const& maker, bool json)

@@ -1,7 +1,7 @@
 #include "velmora/command/liverun.h"
+#include "velmora/view/style.h"
 
 #include <algorithm>
-#include <cstdlib>
 #include <fmt/format.h>
 #include <obd/iecu.h>
 #include <obd/ivelmorasettings.h>
@@ -116,8 +116,7 @@ void LiveRun::scroll(int lines)
 FrameStyle LiveRun::style() const
 {
     Terminal::Size const size = m_terminal->size();
-    return {size.columns, size.rows,
-            m_session.options().color != ColorMode::Never && std::getenv("NO_COLOR") == nullptr};
+    return {size.columns, size.rows, outputStyle(m_session.options()).isColoured()};
 }
 
 void LiveRun::draw(LiveTime now)

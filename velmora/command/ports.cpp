@@ -1,9 +1,9 @@
 #include "velmora/command/commands.h"
 #include "velmora/commandline.h"
 #include "velmora/port/serialportlist.h"
+#include "velmora/view/json.h"
 
 #include <fmt/format.h>
-#include <nlohmann/json.hpp>
 
 namespace velmora {
 
@@ -13,11 +13,11 @@ ExitCode listPorts(GlobalOptions const& options)
 {
     std::vector<SerialPortEntry> const ports = listSerialPorts();
     if (options.json) {
-        nlohmann::json list = nlohmann::json::array();
+        Json list = Json::array();
         for (SerialPortEntry const& port : ports) {
-            list.push_back({{"device", port.device}, {"description", port.description}});
+            list.push_back({{"device", port.device}, {"description", textOrNull(port.description)}});
         }
-        fmt::print("{}\n", list.dump(2));
+        fmt::print("{}", printed(list));
         return ExitCode::Done;
     }
     for (SerialPortEntry const& port : ports) {

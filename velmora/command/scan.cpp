@@ -85,7 +85,7 @@ ExitCode scan(bool checking, GlobalOptions const& options)
         report.modules.push_back(readModule(*ecu, reader));
     }
     session.check();
-    fmt::print("{}", options.json ? toJson(report) : toText(report));
+    fmt::print("{}", options.json ? toJson(report) : toText(report, outputStyle(options)));
     return checking ? check(report) : ExitCode::Done;
 }
 

@@ -1,18 +1,16 @@
 #include "velmora/command/commands.h"
 #include "velmora/commandline.h"
 #include "velmora/session.h"
+#include "velmora/view/json.h"
 #include "velmora/view/unitlabel.h"
 
 #include <fmt/format.h>
-#include <nlohmann/json.hpp>
 #include <obd/iecu.h>
 #include <obd/iecuservice.h>
 
 namespace velmora {
 
 namespace {
-
-using Json = nlohmann::ordered_json;
 
 struct Service
 {
@@ -101,8 +99,7 @@ void printText(obd::IEcu const& ecu, bool all)
 
 Json sensorJson(obd::SensorDataModel const& sensor)
 {
-    std::string const unit = unitLabel(sensor.unit);
-    Json json = {{"uid", sensor.uid}, {"name", sensor.name}, {"unit", unit.empty() ? Json(nullptr) : Json(unit)}};
+    Json json = {{"uid", sensor.uid}, {"name", sensor.name}, {"unit", textOrNull(unitLabel(sensor.unit))}};
     json["minimum"] = sensor.numeric != nullptr ? Json(sensor.numeric->minimum) : Json(nullptr);
     json["maximum"] = sensor.numeric != nullptr ? Json(sensor.numeric->maximum) : Json(nullptr);
     return json;
@@ -126,8 +123,8 @@ Json toJson(obd::IEcu const& ecu, bool all)
                               {"sensors", sensorList}});
     }
     return {{"id", fmt::format("{:X}", ecu.id())},
-            {"name", ecu.name()},
-            {"description", ecu.description()},
+            {"name", textOrNull(ecu.name())},
+            {"description", textOrNull(ecu.description())},
             {"supported", supported},
             {"parameters", parameters}};
 }
@@ -137,12 +134,8 @@ ExitCode sensors(GlobalOptions const& options, bool all)
     Session session(options);
     session.connect();
     Json modules = Json::array();
-    obd::IEcuManager& manager = *session.obd().getEcuManager();
-    for (std::shared_ptr<obd::IEcu> const& ecu : manager.getEcus()) {
-        if (options.ecu && ecu->id() != *options.ecu) {
-            continue;
-        }
-        manager.setCurrentEcu(ecu->id());
+    for (std::shared_ptr<obd::IEcu> const& ecu : session.selectedModules()) {
+        session.select(*ecu);
         if (options.json) {
             modules.push_back(toJson(*ecu, all));
         } else {
@@ -150,7 +143,7 @@ ExitCode sensors(GlobalOptions const& options, bool all)
         }
     }
     if (options.json) {
-        fmt::print("{}\n", modules.dump(2, ' ', false, Json::error_handler_t::replace));
+        fmt::print("{}", printed(modules));
     }
     return ExitCode::Done;
 }

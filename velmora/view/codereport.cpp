@@ -1,12 +1,10 @@
 #include "velmora/view/codereport.h"
 
+#include "velmora/view/layout.h"
+
 #include <algorithm>
-#include <fmt/format.h>
-#include <nlohmann/json.hpp>
 
 namespace velmora {
-
-using Json = nlohmann::ordered_json;
 
 namespace {
 
@@ -43,20 +41,26 @@ std::string summary(CodeList const& list)
     if (list.codes.empty()) {
         return "none stored";
     }
-    return list.codes.size() == 1 ? "1 code" : fmt::format("{} codes", list.codes.size());
+    return counted(list.codes.size(), "code");
 }
 
-std::string line(char const* label, std::string const& value)
+Mark mark(CodeList const& list)
 {
-    return fmt::format("  {:<14} {}\n", label, value);
-}
-
-char const* lampText(std::optional<bool> const& lamp)
-{
-    return !lamp ? "-" : *lamp ? "on" : "off";
+    if (list.answer != CodeList::Answer::Read) {
+        return Mark::Faint;
+    }
+    if (list.codes.empty()) {
+        return Mark::Good;
+    }
+    return list.kind == CodeKind::Pending ? Mark::Warning : Mark::Bad;
 }
 
 } // namespace
+
+std::string lampText(std::optional<bool> const& lamp, Style const& style)
+{
+    return !lamp ? "-" : *lamp ? style.paint(Mark::Bad, "on") : style.paint(Mark::Good, "off");
+}
 
 bool hasFindings(CodeReport const& report)
 {
@@ -78,11 +82,11 @@ bool canBeChecked(CodeReport const& report)
            });
 }
 
-std::string toText(CodeReport const& report)
+std::string toText(CodeReport const& report, Style const& style)
 {
-    std::string text = line("Lamp", lampText(report.lamp));
+    std::string text = labelledLine("Lamp", lampText(report.lamp, style));
     for (CodeList const& list : report.lists) {
-        text += line(names(list.kind).title, summary(list));
+        text += labelledLine(names(list.kind).title, style.paint(mark(list), summary(list)));
         for (TroubleCode const& code : list.codes) {
             text += toText(code, "    ");
         }
@@ -90,37 +94,16 @@ std::string toText(CodeReport const& report)
     return text;
 }
 
-std::string toText(std::vector<ModuleCodes> const& modules)
-{
-    std::string text;
-    for (ModuleCodes const& module : modules) {
-        text += fmt::format("{}Control module {:X}: {}\n", text.empty() ? "" : "\n", module.id, module.name);
-        text += toText(module.report);
-    }
-    return text;
-}
-
 Json toJsonValue(CodeReport const& report)
 {
-    Json document = {{"lamp", report.lamp ? Json(*report.lamp) : Json(nullptr)}};
+    Json document = {{"lamp", valueOrNull(report.lamp)}};
     for (CodeList const& list : report.lists) {
         bool const read = list.answer == CodeList::Answer::Read;
         document[names(list.kind).key] = {{"answer", answerKey(list.answer)},
-                                          {"reason", list.reason.empty() ? Json(nullptr) : Json(list.reason)},
+                                          {"reason", textOrNull(list.reason)},
                                           {"codes", read ? toJsonValue(list.codes) : Json(nullptr)}};
     }
     return document;
-}
-
-std::string toJson(std::vector<ModuleCodes> const& modules)
-{
-    Json list = Json::array();
-    for (ModuleCodes const& module : modules) {
-        Json entry = {{"id", fmt::format("{:X}", module.id)}, {"name", module.name}};
-        entry.update(toJsonValue(module.report));
-        list.push_back(entry);
-    }
-    return list.dump(2, ' ', false, Json::error_handler_t::replace) + "\n";
 }
 
 } // namespace velmora

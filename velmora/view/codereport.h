@@ -1,8 +1,8 @@
 #pragma once
 
+#include "velmora/view/moduletopic.h"
 #include "velmora/view/troublecode.h"
 
-#include <nlohmann/json_fwd.hpp>
 #include <optional>
 #include <string>
 #include <vector>
@@ -39,12 +39,10 @@ struct CodeReport
     std::vector<CodeList> lists;
 };
 
-struct ModuleCodes
-{
-    unsigned int id;
-    std::string name;
-    CodeReport report;
-};
+using ModuleCodes = ModuleTopic<CodeReport>;
+
+// "on", "off" or "-".
+std::string lampText(std::optional<bool> const& lamp, Style const& style);
 
 // Whether the lamp is on, or a code is confirmed or permanent. A pending code is no finding yet.
 bool hasFindings(CodeReport const& report);
@@ -56,11 +54,9 @@ bool hasAnswer(CodeReport const& report);
 bool canBeChecked(CodeReport const& report);
 
 // Indented lines under the heading of a control module.
-std::string toText(CodeReport const& report);
-std::string toText(std::vector<ModuleCodes> const& modules);
+std::string toText(CodeReport const& report, Style const& style);
 
 // "lamp", and for each list its codes, or null and a word for why there are none.
-nlohmann::ordered_json toJsonValue(CodeReport const& report);
-std::string toJson(std::vector<ModuleCodes> const& modules);
+Json toJsonValue(CodeReport const& report);
 
 } // namespace velmora

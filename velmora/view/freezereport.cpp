@@ -1,69 +1,47 @@
 #include "velmora/view/freezereport.h"
 
-#include <algorithm>
-#include <fmt/format.h>
-#include <nlohmann/json.hpp>
+#include "velmora/view/layout.h"
 
 namespace velmora {
 
-using Json = nlohmann::ordered_json;
-
 namespace {
 
-std::string toText(FreezeFrame const& frame)
+std::string toText(FreezeFrame const& frame, Style const& style)
 {
-    std::size_t width = 0;
+    std::vector<std::vector<Cell>> rows;
     for (FreezeFrame::Reading const& reading : frame.readings) {
-        width = std::max(width, reading.name.size());
+        std::string const unit = reading.value && !reading.unit.empty() ? " " + reading.unit : "";
+        rows.push_back({{reading.name}, {reading.value.value_or("-") + unit}});
     }
-    std::string text = toText(frame.code, "  ");
-    for (FreezeFrame::Reading const& reading : frame.readings) {
-        bool const hasUnit = reading.value && !reading.unit.empty();
-        text += fmt::format("  {:<{}}  {}{}{}\n", reading.name, width, reading.value.value_or("-"), hasUnit ? " " : "",
-                            hasUnit ? reading.unit : "");
-    }
-    return text;
+    return toText(frame.code, "    ") + drawColumns(rows, "    ", style);
 }
 
 Json toJsonValue(FreezeFrame const& frame)
 {
     Json readings = Json::array();
     for (FreezeFrame::Reading const& reading : frame.readings) {
-        readings.push_back({{"name", reading.name},
-                            {"value", reading.value ? Json(*reading.value) : Json(nullptr)},
-                            {"unit", reading.unit.empty() ? Json(nullptr) : Json(reading.unit)}});
+        readings.push_back(
+            {{"name", reading.name}, {"value", valueOrNull(reading.value)}, {"unit", textOrNull(reading.unit)}});
     }
     return {{"code", velmora::toJsonValue(frame.code)}, {"readings", readings}};
 }
 
 } // namespace
 
-std::string toText(std::vector<ModuleFreeze> const& modules, unsigned int frame)
+std::string toText(FreezeReport const& report, Style const& style)
 {
-    std::string text;
-    for (ModuleFreeze const& module : modules) {
-        text += fmt::format("{}Control module {:X}: {}, freeze frame {}\n", text.empty() ? "" : "\n", module.id,
-                            module.name, frame);
-        if (module.frame) {
-            text += toText(*module.frame);
-        } else {
-            text += module.offered ? "  none stored\n" : "  no answer\n";
-        }
+    std::string const number = std::to_string(report.number);
+    if (report.frame) {
+        return labelledLine("Freeze frame", number) + toText(*report.frame, style);
     }
-    return text;
+    return labelledLine("Freeze frame", number + (report.answered ? ": none stored" : ": no answer"));
 }
 
-std::string toJson(std::vector<ModuleFreeze> const& modules, unsigned int frame)
+Json toJsonValue(FreezeReport const& report)
 {
-    Json list = Json::array();
-    for (ModuleFreeze const& module : modules) {
-        list.push_back({{"id", fmt::format("{:X}", module.id)},
-                        {"name", module.name},
-                        {"frame", frame},
-                        {"answered", module.offered},
-                        {"freeze", module.frame ? toJsonValue(*module.frame) : Json(nullptr)}});
-    }
-    return list.dump(2, ' ', false, Json::error_handler_t::replace) + "\n";
+    return {{"frame", report.number},
+            {"answered", report.answered},
+            {"freeze", report.frame ? toJsonValue(*report.frame) : Json(nullptr)}};
 }
 
 } // namespace velmora

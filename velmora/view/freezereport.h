@@ -1,5 +1,6 @@
 #pragma once
 
+#include "velmora/view/moduletopic.h"
 #include "velmora/view/troublecode.h"
 
 #include <optional>
@@ -22,15 +23,23 @@ struct FreezeFrame
     std::vector<Reading> readings;
 };
 
-struct ModuleFreeze
+// One frame of a control module, by number.
+struct FreezeReport
 {
-    unsigned int id;
-    std::string name;
-    bool offered; // whether the module told what its frame holds
+    unsigned int number;
+    bool answered; // whether the module told what its frame holds
     std::optional<FreezeFrame> frame;
 };
 
-std::string toText(std::vector<ModuleFreeze> const& modules, unsigned int frame);
-std::string toJson(std::vector<ModuleFreeze> const& modules, unsigned int frame);
+inline bool hasAnswer(FreezeReport const& report)
+{
+    return report.answered;
+}
+
+// Indented lines under the heading of a control module.
+std::string toText(FreezeReport const& report, Style const& style);
+
+// "frame", "answered" and "freeze", which is null for a frame that holds nothing.
+Json toJsonValue(FreezeReport const& report);
 
 } // namespace velmora

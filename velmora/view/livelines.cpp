@@ -1,8 +1,9 @@
 #include "velmora/view/livelines.h"
 
+#include "velmora/view/json.h"
+
 #include <ctime>
 #include <fmt/format.h>
-#include <nlohmann/json.hpp>
 #include <obd/parameteridentifier.h>
 
 namespace velmora {
@@ -10,7 +11,7 @@ namespace velmora {
 namespace {
 
 // A number with the decimals that the sensor has, a text, or null.
-nlohmann::ordered_json toJson(std::string const& text, bool numeric)
+Json toJson(std::string const& text, bool numeric)
 {
     if (text.empty()) {
         return nullptr;
@@ -18,8 +19,7 @@ nlohmann::ordered_json toJson(std::string const& text, bool numeric)
     if (!numeric) {
         return text;
     }
-    return nlohmann::ordered_json::parse(text, nullptr, false).is_number() ? nlohmann::ordered_json::parse(text)
-                                                                           : nlohmann::ordered_json(nullptr);
+    return Json::parse(text, nullptr, false).is_number() ? Json::parse(text) : Json(nullptr);
 }
 
 } // namespace
@@ -44,18 +44,18 @@ std::string toLine(LiveRow const& row)
 
 std::string toJsonLine(LiveRow const& row, std::string const& time)
 {
-    nlohmann::ordered_json const line = {
+    Json const line = {
         {"time", time},
         {"pid", fmt::format("{:02X}", static_cast<int>(obd::Uid2Pid(row.uid)))},
         {"uid", row.uid},
         {"name", row.name},
         {"value", toJson(row.value, row.numeric)},
-        {"unit", row.unit.empty() ? nlohmann::ordered_json(nullptr) : nlohmann::ordered_json(row.unit)},
+        {"unit", textOrNull(row.unit)},
         {"minimum", toJson(row.minimum, row.numeric)},
         {"mean", toJson(row.mean, row.numeric)},
         {"maximum", toJson(row.maximum, row.numeric)},
     };
-    return line.dump(-1, ' ', false, nlohmann::ordered_json::error_handler_t::replace) + "\n";
+    return line.dump(-1, ' ', false, Json::error_handler_t::replace) + "\n";
 }
 
 } // namespace velmora

@@ -1,12 +1,11 @@
 #include "velmora/view/troublecode.h"
 
+#include "velmora/view/json.h"
+
 #include <algorithm>
 #include <fmt/format.h>
-#include <nlohmann/json.hpp>
 
 namespace velmora {
-
-using Json = nlohmann::ordered_json;
 
 std::vector<TroubleCode> groupByCode(std::vector<std::shared_ptr<obd::DtcDataModel>> const& models)
 {

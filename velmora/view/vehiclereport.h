@@ -42,7 +42,7 @@ struct VehicleReport
 };
 
 // Headings and aligned columns, for people.
-std::string toText(VehicleReport const& report);
+std::string toText(VehicleReport const& report, Style const& style);
 
 // The document that docs/json.md describes.
 std::string toJson(VehicleReport const& report);

@@ -1,25 +1,10 @@
 #include "velmora/view/vehiclereport.h"
 
 #include <fmt/format.h>
-#include <nlohmann/json.hpp>
 
 namespace velmora {
 
 namespace {
-
-using Json = nlohmann::ordered_json;
-
-// A text that was not told is null, never an empty string.
-Json textOrNull(std::string const& text)
-{
-    return text.empty() ? Json(nullptr) : Json(text);
-}
-
-template <typename Value>
-Json valueOrNull(std::optional<Value> const& value)
-{
-    return value ? Json(*value) : Json(nullptr);
-}
 
 // The voltage in the tenths that the adapter gives.
 Json voltsOrNull(std::optional<float> const& volts)
@@ -59,8 +44,7 @@ std::string toJson(VehicleReport const& report)
         {"protocol", {{"number", valueOrNull(report.protocol.number)}, {"name", textOrNull(report.protocol.name)}}},
         {"modules", modules},
     };
-    // An adapter may say anything: bytes that are no UTF-8 are replaced.
-    return document.dump(2, ' ', false, Json::error_handler_t::replace) + "\n";
+    return printed(document);
 }
 
 } // namespace velmora

@@ -1,3 +1,4 @@
+#include "velmora/view/layout.h"
 #include "velmora/view/vehiclereport.h"
 
 #include <fmt/format.h>
@@ -9,7 +10,7 @@ namespace {
 void addLine(std::string& text, char const* label, std::string const& value)
 {
     if (!value.empty()) {
-        text += fmt::format("  {:<14} {}\n", label, value);
+        text += labelledLine(label, value);
     }
 }
 
@@ -30,24 +31,24 @@ void addProtocol(std::string& text, ProtocolReport const& protocol)
     addLine(text, "Name", protocol.name);
 }
 
-void addModule(std::string& text, ModuleReport const& module)
+void addModule(std::string& text, ModuleReport const& module, Style const& style)
 {
-    text += fmt::format("\nControl module {:X}: {}\n", module.id, module.name);
+    text += "\n" + moduleHeading(module.id, module.name) + "\n";
     addLine(text, "Description", module.description);
     addLine(text, "Standard", module.standard);
     addLine(text, "Sensors", std::to_string(module.supported.size()));
-    text += toText(module.codes);
+    text += toText(module.codes, style);
 }
 
 } // namespace
 
-std::string toText(VehicleReport const& report)
+std::string toText(VehicleReport const& report, Style const& style)
 {
     std::string text;
     addAdapter(text, report.adapter);
     addProtocol(text, report.protocol);
     for (ModuleReport const& module : report.modules) {
-        addModule(text, module);
+        addModule(text, module, style);
     }
     return text;
 }

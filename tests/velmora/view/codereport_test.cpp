@@ -23,24 +23,36 @@ TEST(CodeReportView, TellsPlainlyWhyThereAreNoCodes)
     CodeReport const report{true,
                             {listWithCode(CodeKind::Confirmed), listWithout(CodeKind::Pending, Answer::Read),
                              listWithout(CodeKind::Permanent, Answer::Silent)}};
-    EXPECT_EQ(toText(report), "  Lamp           on\n"
-                              "  Confirmed      1 code\n"
-                              "    P0133  Generic        Slow\n"
-                              "  Pending        none stored\n"
-                              "  Permanent      no answer\n");
+    EXPECT_EQ(toText(report, Style()), "  Lamp           on\n"
+                                       "  Confirmed      1 code\n"
+                                       "    P0133  Generic        Slow\n"
+                                       "  Pending        none stored\n"
+                                       "  Permanent      no answer\n");
     CodeReport const other{std::nullopt,
                            {listWithout(CodeKind::Confirmed, Answer::Unreadable),
                             listWithout(CodeKind::Permanent, Answer::Refused, "service not supported (11)")}};
-    EXPECT_EQ(toText(other), "  Lamp           -\n"
-                             "  Confirmed      the reply can't be read\n"
-                             "  Permanent      refused: service not supported (11)\n");
+    EXPECT_EQ(toText(other, Style()), "  Lamp           -\n"
+                                      "  Confirmed      the reply can't be read\n"
+                                      "  Permanent      refused: service not supported (11)\n");
 }
 
 TEST(CodeReportView, HeadsEachModule)
 {
-    EXPECT_EQ(toText(std::vector<ModuleCodes>{{0x7E8, "ECM", {false, {}}}, {0x18DAF110, "TCM", {true, {}}}}),
+    EXPECT_EQ(toText(std::vector<ModuleCodes>{{0x7E8, "ECM", {false, {}}}, {0x18DAF110, "TCM", {true, {}}}}, Style()),
               "Control module 7E8: ECM\n  Lamp           off\n"
               "\nControl module 18DAF110: TCM\n  Lamp           on\n");
+}
+
+TEST(CodeReportView, ColoursTheLampAndWhatIsStored)
+{
+    CodeReport const report{
+        true, {listWithout(CodeKind::Confirmed, Answer::Read), listWithout(CodeKind::Permanent, Answer::Silent)}};
+    EXPECT_EQ(toText(report, Style(true)), "  Lamp           \033[31mon\033[0m\n"
+                                           "  Confirmed      \033[32mnone stored\033[0m\n"
+                                           "  Permanent      \033[2mno answer\033[0m\n");
+    EXPECT_TRUE(toText(CodeReport{false, {listWithCode(CodeKind::Pending)}}, Style(true))
+                    .starts_with("  Lamp           \033[32moff\033[0m\n"
+                                 "  Pending        \033[33m1 code\033[0m\n"));
 }
 
 TEST(CodeReportView, FindingsAreTheLampAndConfirmedAndPermanentCodes)
