@@ -10,6 +10,7 @@ void addCommands(CommandLine& commandLine)
     addCodesCommand(commandLine);
     addClearCommand(commandLine);
     addFreezeCommand(commandLine);
+    addReadinessCommand(commandLine);
     addDtcCommand(commandLine);
     addConsoleCommand(commandLine);
     addSimulateCommand(commandLine);

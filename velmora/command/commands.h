@@ -15,6 +15,7 @@ void addDtcCommand(CommandLine& commandLine);
 void addFreezeCommand(CommandLine& commandLine);
 void addLiveCommand(CommandLine& commandLine);
 void addPortsCommand(CommandLine& commandLine);
+void addReadinessCommand(CommandLine& commandLine);
 void addScanCommand(CommandLine& commandLine);
 void addSensorsCommand(CommandLine& commandLine);
 void addSimulateCommand(CommandLine& commandLine);
