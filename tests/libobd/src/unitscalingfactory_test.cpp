@@ -158,25 +158,65 @@ TEST(UnitScalingFactory, UnknownIdsGiveNoScalingAndALogLine)
     EXPECT_EQ(log.lines(), std::vector<std::string>{"ERROR Invalid scaling ID: 1"});
 }
 
+// The raw words whose texts stand in the files of texts: both ends, the ends of the signed range, and one between.
+constexpr unsigned int writtenWords[] = {0x0000, 0x0001, 0x3039, 0x7FFF, 0x8000, 0xCFC7, 0xFFFF};
+
+void expectTexts(Row const& row, IUnitScaling const* scaling)
+{
+    ASSERT_NE(scaling, nullptr) << row.at(0);
+    ASSERT_EQ(row.size(), std::size(writtenWords) + 1) << row.at(0);
+    for (std::size_t i = 0; i < std::size(writtenWords); ++i) {
+        EXPECT_EQ(shown(*scaling, writtenWords[i]), row[i + 1]) << row.at(0) << " of " << writtenWords[i];
+    }
+}
+
+TEST(UnitScalingFactory, EveryMetricScalingShowsTheWrittenTexts)
+{
+    auto const rows = support::readTable("tests/libobd/src/scaledtexts_metric.txt");
+    ASSERT_EQ(rows.size(), 109U);
+    for (Row const& row : rows) {
+        expectTexts(row, createForCan(static_cast<unsigned char>(hex(row.at(0))), UnitSystem::Metric).get());
+    }
+}
+
+TEST(UnitScalingFactory, EveryImperialScalingShowsTheWrittenTexts)
+{
+    auto const rows = support::readTable("tests/libobd/src/scaledtexts_imperial.txt");
+    ASSERT_EQ(rows.size(), 30U);
+    for (Row const& row : rows) {
+        expectTexts(row, createForCan(static_cast<unsigned char>(hex(row.at(0))), UnitSystem::Imperial).get());
+    }
+}
+
 struct TestScaling
 {
     float factor;
     Row row;
 };
 
+// The identifiers of a cell such as "01-04, 07".
+std::vector<unsigned char> identifiersIn(std::string const& cell)
+{
+    std::vector<unsigned char> ids;
+    std::istringstream ranges(cell);
+    for (std::string range; std::getline(ranges, range, ',');) {
+        std::size_t const dash = range.find('-');
+        unsigned int const first = hex(range.substr(0, dash));
+        unsigned int const last = dash == std::string::npos ? first : hex(range.substr(dash + 1));
+        for (unsigned int id = first; id <= last; ++id) {
+            ids.push_back(static_cast<unsigned char>(id));
+        }
+    }
+    return ids;
+}
+
 // The written table by test identifier.
 std::map<unsigned int, TestScaling> writtenTestScalings()
 {
     std::map<unsigned int, TestScaling> scalings;
     for (Row const& row : support::readTable("tests/libobd/src/scalings_tests.txt")) {
-        std::istringstream ranges(row.at(0));
-        for (std::string range; std::getline(ranges, range, ',');) {
-            std::size_t const dash = range.find('-');
-            unsigned int const first = hex(range.substr(0, dash));
-            unsigned int const last = dash == std::string::npos ? first : hex(range.substr(dash + 1));
-            for (unsigned int id = first; id <= last; ++id) {
-                scalings[id] = {std::stof(row.at(1)), row};
-            }
+        for (unsigned char const id : identifiersIn(row.at(0))) {
+            scalings[id] = {std::stof(row.at(1)), row};
         }
     }
     return scalings;
@@ -202,6 +242,18 @@ TEST(UnitScalingFactory, TestScalingsAgreeForEveryTest)
         EXPECT_EQ(scaling->toString(0.0),
                   decimals == 0 ? "0" : "0." + std::string(static_cast<std::size_t>(decimals), '0'));
     }
+}
+
+TEST(UnitScalingFactory, EveryTestScalingShowsTheWrittenTexts)
+{
+    std::size_t tests = 0;
+    for (Row const& row : support::readTable("tests/libobd/src/scaledtexts_tests.txt")) {
+        for (unsigned char const id : identifiersIn(row.at(0))) {
+            expectTexts(row, createForTest(id).get());
+            ++tests;
+        }
+    }
+    EXPECT_EQ(tests, 103U);
 }
 
 TEST(UnitScalingFactory, Test30ReadsSecondsAndTest20AsItCame)
