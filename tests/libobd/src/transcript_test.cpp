@@ -1,25 +1,17 @@
 // Feeds every reply of the recorded dialogues that was printed with headers through the way that replies take in the
 // driver, and compares what comes out with payloads that were worked out by hand.
 
-#include "libobd/src/bytefilter.h"
-#include "libobd/src/elmtransport.h"
-#include "libobd/src/messageparser.h"
-#include "libobd/src/proxyerror.h"
-
 #include "tests/support/payloadfile.h"
-#include "tests/support/recordeddialogue.h"
+#include "tests/support/recordedreply.h"
 
 #include <gtest/gtest.h>
-#include <obd/connectionprotocol.h>
 
 #include <algorithm>
-#include <cctype>
 #include <filesystem>
 #include <iomanip>
 #include <map>
 #include <set>
 #include <sstream>
-#include <string_view>
 
 namespace {
 
@@ -40,69 +32,17 @@ std::vector<std::string> recordings()
     return names;
 }
 
-std::string inCapitalsWithoutBlanks(std::string const& text)
-{
-    std::string result;
-    for (char const c : text) {
-        if (c != ' ') {
-            result += static_cast<char>(std::toupper(static_cast<unsigned char>(c)));
-        }
-    }
-    return result;
-}
-
 // Requests to the vehicle are hexadecimal; all else is a command to the adapter.
 bool isVehicleRequest(std::string const& request)
 {
     return !request.empty() && request.find_first_not_of(" 0123456789ABCDEFabcdef") == std::string::npos;
 }
 
-// One line that was sent while headers were on.
-struct Question
+std::vector<support::Question> questionsWithHeaders(support::RecordedDialogue const& dialogue)
 {
-    std::string request;
-    int occurrence;
-    std::string reply;
-};
-
-std::vector<Question> questionsWithHeaders(support::RecordedDialogue const& dialogue)
-{
-    bool headersOn = dialogue.header.at("headers") == "on";
-    std::map<std::string, int> occurrences;
-    std::vector<Question> questions;
-    for (support::Exchange const& exchange : dialogue.exchanges) {
-        int const occurrence = ++occurrences[exchange.request];
-        headersOn = headersOn || inCapitalsWithoutBlanks(exchange.request) == "ATH1";
-        if (headersOn) {
-            questions.push_back({exchange.request, occurrence, exchange.reply});
-        }
-    }
+    std::vector<support::Question> questions = support::questionsOf(dialogue);
+    std::erase_if(questions, [](support::Question const& question) { return !question.headers; });
     return questions;
-}
-
-obd::ObdProtocol familyOf(support::RecordedDialogue const& dialogue)
-{
-    return obd::toObdProtocol(static_cast<obd::VehicleProtocol>(std::stoi(dialogue.header.at("protocol"))));
-}
-
-// What a request's caller gets out of the reply. The read ends at the first prompt, without one there is no reply.
-ResponseMap payloadsOf(obd::ObdProtocol family, std::string const& reply)
-{
-    ResponseMap responses;
-    std::size_t const prompt = reply.find('>');
-    if (prompt == std::string::npos) {
-        return responses;
-    }
-    std::vector<unsigned char> text(reply.begin(), reply.begin() + static_cast<std::ptrdiff_t>(prompt));
-    obd::cleanReply(text);
-    if (obd::checkForErrors(text) != obd::ProxyError::None) {
-        return responses;
-    }
-    obd::removeBytes(text, " ");
-    if (!text.empty()) {
-        obd::MessageParser::parseResponseMessage(family, text, responses);
-    }
-    return responses;
 }
 
 support::ModuleMessages messagesOf(ResponseMap const& responses)
@@ -146,14 +86,14 @@ INSTANTIATE_TEST_SUITE_P(Recorded, Transcript, testing::ValuesIn(recordings()),
 
 TEST_P(Transcript, GivesThePayloadsWorkedOutByHand)
 {
-    obd::ObdProtocol const family = familyOf(dialogue);
-    for (Question const& question : questionsWithHeaders(dialogue)) {
+    obd::ObdProtocol const family = support::familyOf(dialogue);
+    for (support::Question const& question : questionsWithHeaders(dialogue)) {
         auto const expected = payloads.find({question.request, question.occurrence});
         if (expected == payloads.end()) {
             EXPECT_FALSE(isVehicleRequest(question.request)) << question.request << " has no payloads";
             continue;
         }
-        EXPECT_EQ(printed(messagesOf(payloadsOf(family, question.reply))), printed(expected->second.rule))
+        EXPECT_EQ(printed(messagesOf(support::payloadsOf(family, question.reply))), printed(expected->second.rule))
             << question.request << ", occurrence " << question.occurrence;
     }
 }
@@ -161,7 +101,7 @@ TEST_P(Transcript, GivesThePayloadsWorkedOutByHand)
 TEST_P(Transcript, EveryPayloadBelongsToARequest)
 {
     std::set<std::pair<std::string, int>> asked;
-    for (Question const& question : questionsWithHeaders(dialogue)) {
+    for (support::Question const& question : questionsWithHeaders(dialogue)) {
         asked.emplace(question.request, question.occurrence);
     }
     for (auto const& [key, expected] : payloads) {
@@ -185,8 +125,8 @@ TEST(Transcripts, CoverEveryBusFamily)
     std::map<obd::ObdProtocol, int> replies;
     for (std::string const& name : recordings()) {
         support::RecordedDialogue const dialogue = support::readDialogue(folder / (name + ".dialogue"));
-        for (Question const& question : questionsWithHeaders(dialogue)) {
-            replies[familyOf(dialogue)] += isVehicleRequest(question.request) ? 1 : 0;
+        for (support::Question const& question : questionsWithHeaders(dialogue)) {
+            replies[support::familyOf(dialogue)] += isVehicleRequest(question.request) ? 1 : 0;
         }
     }
     EXPECT_GE(recordings().size(), 40U);
