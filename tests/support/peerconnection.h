@@ -72,6 +72,17 @@ public:
         }
     }
 
+    /// Time that passes without a word from the host.
+    void pass(obdsim::Time time)
+    {
+        const std::lock_guard lock(m_mutex);
+        pull(m_peer->now() + time);
+    }
+    obdsim::Time now() const
+    {
+        const std::lock_guard lock(m_mutex);
+        return m_peer->now();
+    }
     /// The link is gone from here on.
     void breakLink() { m_broken = true; }
     /// All bytes that the adapter has said so far.

@@ -86,7 +86,7 @@ void LiveRun::run()
     m_start = Clock::now();
     m_lastReading = m_start;
     if (m_csv != nullptr) {
-        m_csv->begin(m_table, m_start);
+        m_csv->begin(m_table, m_start, std::chrono::system_clock::now());
     }
     m_service->startUpdates(m_ids);
     while (!isDone()) {

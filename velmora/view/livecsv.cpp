@@ -67,8 +67,10 @@ void LiveCsv::Close::operator()(std::FILE* file) const
 
 LiveCsv::LiveCsv(std::string const& file) : m_file(file), m_stream(openFile(file)) {}
 
-void LiveCsv::begin(LiveTable const& table, LiveTime now)
+void LiveCsv::begin(LiveTable const& table, LiveTime now, WallTime start)
 {
+    m_begin = now;
+    m_start = start;
     m_rowTime = now;
     if (::ftruncate(::fileno(m_stream.get()), 0) != 0) {
         errno = 0; // a pipe or a device has nothing to cut off
@@ -94,7 +96,8 @@ bool LiveCsv::writeRow(LiveTable const& table, LiveTime now)
     m_rounds = table.rounds();
     m_readings = table.readings();
     m_rowTime = now;
-    return write(toCsvRow(table.rows(), isoTime(std::chrono::system_clock::now())));
+    auto const time = m_start + std::chrono::duration_cast<WallTime::duration>(now - m_begin);
+    return write(toCsvRow(table.rows(), isoTime(time)));
 }
 
 bool LiveCsv::write(std::string const& text)

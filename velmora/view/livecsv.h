@@ -18,14 +18,17 @@ std::string toCsvRow(std::vector<LiveRow> const& rows, std::string const& time);
 class LiveCsv
 {
 public:
+    using WallTime = std::chrono::system_clock::time_point;
+
     // "-" is standard output. An old file is kept until begin. Throws Failure if the file can't be opened.
     explicit LiveCsv(std::string const& file);
 
     bool toStandardOutput() const { return m_file == "-"; }
     std::string const& file() const { return m_file; }
 
-    // Replaces what the file held by the header.
-    void begin(LiveTable const& table, LiveTime now);
+    // Replaces what the file held by the header. start is the time of day at now: the rows count on from it, for a
+    // clock that is set in the middle of a drive would tear the recording.
+    void begin(LiveTable const& table, LiveTime now, WallTime start);
     // Writes a row when a round of all sensors has ended, or a second after the last row if there is anything new.
     // Throws Failure when the file can't be written. False if the reader of standard output has gone.
     bool update(LiveTable const& table, LiveTime now);
@@ -46,6 +49,8 @@ private:
     std::unique_ptr<std::FILE, Close> m_stream;
     unsigned long m_rounds = 0;   // at the last row
     unsigned long m_readings = 0; // at the last row
+    LiveTime m_begin;
+    WallTime m_start; // at m_begin
     LiveTime m_rowTime;
     LiveTime m_syncTime;
 };

@@ -109,13 +109,29 @@ protected:
     std::filesystem::path file =
         std::filesystem::temp_directory_path() / ("velmora-live-" + std::to_string(::getpid()) + ".csv");
     LiveTime now = LiveTime() + seconds(1000);
+    LiveCsv::WallTime const start{seconds(1709802302)}; // 2024-03-07T09:05:02Z
     LiveTable table;
 };
+
+TEST_F(LiveCsvFile, TimesCountOnFromItsStart)
+{
+    LiveCsv csv(file.string());
+    csv.begin(table, now, start);
+    now += milliseconds(61250);
+    reading(0x0C, "1");
+    csv.update(table, now);
+    std::ifstream in(file);
+    std::string header;
+    std::string row;
+    std::getline(in, header);
+    std::getline(in, row);
+    EXPECT_EQ(row, "2024-03-07T09:06:03.250Z,1,-");
+}
 
 TEST_F(LiveCsvFile, HasARowForEachRoundAtOnce)
 {
     LiveCsv csv(file.string());
-    csv.begin(table, now);
+    csv.begin(table, now, start);
     EXPECT_THAT(content(), ElementsAre("A (%),B (%)"));
     reading(0x0C, "1");
     EXPECT_TRUE(csv.update(table, now));
@@ -128,7 +144,7 @@ TEST_F(LiveCsvFile, HasARowForEachRoundAtOnce)
 TEST_F(LiveCsvFile, HasARowASecondOnASlowBus)
 {
     LiveCsv csv(file.string());
-    csv.begin(table, now);
+    csv.begin(table, now, start);
     reading(0x0C, "1");
     now += milliseconds(999);
     csv.update(table, now);
@@ -144,7 +160,7 @@ TEST_F(LiveCsvFile, HasARowASecondOnASlowBus)
 TEST_F(LiveCsvFile, FinishWritesWhatIsLeft)
 {
     LiveCsv csv(file.string());
-    csv.begin(table, now);
+    csv.begin(table, now, start);
     reading(0x0C, "7");
     csv.finish(table, now);
     csv.finish(table, now);
@@ -156,7 +172,7 @@ TEST_F(LiveCsvFile, KeepsAnOldFileUntilItBegins)
     std::ofstream(file) << "x,old\n";
     LiveCsv csv(file.string());
     EXPECT_THAT(content(), ElementsAre("old"));
-    csv.begin(table, now);
+    csv.begin(table, now, start);
     EXPECT_THAT(content(), ElementsAre("A (%),B (%)"));
 }
 
@@ -165,7 +181,7 @@ TEST_F(LiveCsvFile, TellsOfAFileThatCannotBeOpenedOrWritten)
     EXPECT_THROW(LiveCsv("/nowhere/at/all.csv"), Failure);
     if (std::filesystem::exists("/dev/full")) {
         LiveCsv full("/dev/full");
-        EXPECT_THROW(full.begin(table, now), Failure);
+        EXPECT_THROW(full.begin(table, now, start), Failure);
     }
 }
 

@@ -1,0 +1,43 @@
+#pragma once
+
+#include <common/clock.h>
+
+#include "tests/support/peerconnection.h"
+
+#include <chrono>
+#include <memory>
+#include <thread>
+
+// The library's time is the simulated adapter's: pauses between requests are driven through. The worker's polls of an
+// empty queue cost none, so that a drive is the same on every machine. Each clock begins an hour after the one before,
+// for the derived sensors keep their samples from connection to connection. In force for its lifetime.
+class DriveClock : public tervex::IClock
+{
+public:
+    explicit DriveClock(std::shared_ptr<PeerConnection> car) : m_car(std::move(car)), m_begin(s_nextBegin)
+    {
+        s_nextBegin += 3600000;
+        tervex::setClock(this);
+    }
+    ~DriveClock() override { tervex::setClock(nullptr); }
+    DriveClock(DriveClock const&) = delete;
+    DriveClock& operator=(DriveClock const&) = delete;
+
+    unsigned int millis() override { return m_begin + static_cast<unsigned int>(m_car->now().count()); }
+    void sleep(unsigned int ms) override
+    {
+        static constexpr unsigned int pollMs = 10;
+        if (ms == pollMs) {
+            std::this_thread::sleep_for(std::chrono::microseconds(10));
+        } else {
+            m_car->pass(obdsim::Time(ms));
+        }
+    }
+    std::time_t wallSeconds() override { return 1709802302; }
+
+private:
+    static inline unsigned int s_nextBegin = 0;
+
+    std::shared_ptr<PeerConnection> m_car;
+    unsigned int const m_begin;
+};
