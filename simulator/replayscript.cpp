@@ -178,7 +178,7 @@ std::optional<std::vector<TimedText>> ReplayScript::serve(const std::string& key
     if (rows.empty()) {
         return std::nullopt;
     }
-    const bool separate = m_dialogue.headers == DialogueHeaders::Late && settings.headers;
+    const bool separate = m_dialogue.headers == DialogueHeaders::Late && settings.headers && isHexText(key);
     std::size_t& next = m_served[{key, separate}];
     const bool repeated = next >= rows.size();
     const Row& row = *rows[std::min(next, rows.size() - 1)];

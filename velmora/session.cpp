@@ -3,6 +3,7 @@
 #include "velmora/failure.h"
 #include "velmora/interrupt.h"
 #include "velmora/port/openport.h"
+#include "velmora/port/recordedport.h"
 #include "velmora/settingsstore.h"
 #include "velmora/traffictrace.h"
 
@@ -104,7 +105,11 @@ void Session::connect()
 {
     PortAddress const address = portAddress();
     m_bridge = std::make_shared<obd::DataBridge>();
-    m_pump = std::make_unique<BridgePump>(openPort(address), m_bridge);
+    std::unique_ptr<IPort> port = openPort(address);
+    if (m_recorder != nullptr) {
+        port = std::make_unique<RecordedPort>(std::move(port), *m_recorder);
+    }
+    m_pump = std::make_unique<BridgePump>(std::move(port), m_bridge);
     if (!m_options.quiet) {
         fmt::print(stderr, "Connecting to {} ...\n", toString(address));
     }

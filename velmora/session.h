@@ -17,6 +17,7 @@
 
 namespace velmora {
 
+class DialogueRecorder;
 class SettingsStore;
 class TrafficTrace;
 
@@ -30,6 +31,9 @@ public:
     ~Session();
     Session(Session const&) = delete;
     Session& operator=(Session const&) = delete;
+
+    // Takes down all that passes the port from connect on. The recorder must outlive the session.
+    void record(DialogueRecorder& recorder) { m_recorder = &recorder; }
 
     // Opens the port and brings up adapter and vehicle, and selects the control module that the options name. Throws
     // Failure that tells how far it came.
@@ -66,6 +70,7 @@ private:
     std::shared_ptr<obd::IObdVelmora> m_obd;
     std::shared_ptr<obd::DataBridge> m_bridge;
     std::unique_ptr<BridgePump> m_pump;
+    DialogueRecorder* m_recorder = nullptr;
     std::unique_ptr<TrafficTrace> m_trace;
 };
 

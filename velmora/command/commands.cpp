@@ -13,6 +13,8 @@ void addCommands(CommandLine& commandLine)
     addReadinessCommand(commandLine);
     addDtcCommand(commandLine);
     addConsoleCommand(commandLine);
+    addLogCommand(commandLine);
+    addRecordCommand(commandLine);
     addSimulateCommand(commandLine);
     addPortsCommand(commandLine);
 }

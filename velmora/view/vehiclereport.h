@@ -11,7 +11,6 @@ namespace velmora {
 // What a scan finds, ready to be shown; no bus work here. Empty texts and missing values were not told.
 struct AdapterReport
 {
-    std::string port;
     std::string device; // name and version
     std::string description;
     std::string identification;

@@ -36,8 +36,7 @@ std::string toJson(VehicleReport const& report)
     }
     Json const document = {
         {"adapter",
-         {{"port", report.adapter.port},
-          {"device", textOrNull(report.adapter.device)},
+         {{"device", textOrNull(report.adapter.device)},
           {"description", textOrNull(report.adapter.description)},
           {"identification", textOrNull(report.adapter.identification)},
           {"volts", voltsOrNull(report.adapter.volts)}}},

@@ -17,7 +17,6 @@ void addLine(std::string& text, char const* label, std::string const& value)
 void addAdapter(std::string& text, AdapterReport const& adapter)
 {
     text += "Adapter\n";
-    addLine(text, "Port", adapter.port);
     addLine(text, "Device", adapter.device);
     addLine(text, "Description", adapter.description);
     addLine(text, "Identifier", adapter.identification);

@@ -1,0 +1,32 @@
+#pragma once
+
+#include "simulator/dialogue.h"
+
+#include <chrono>
+#include <mutex>
+#include <string_view>
+
+namespace velmora {
+
+// Takes down what passes a port as a recorded dialogue, byte for byte and with its pauses. Any thread.
+class DialogueRecorder
+{
+public:
+    void onSent(std::string_view bytes);
+    void onReceived(std::string_view bytes);
+
+    // What was said so far. What vehicle and adapter were is the caller's to tell.
+    obdsim::Dialogue dialogue() const;
+
+private:
+    using Clock = std::chrono::steady_clock;
+
+    obdsim::Time pauseUntil(Clock::time_point now);
+
+    mutable std::mutex m_mutex;
+    obdsim::Dialogue m_dialogue; // protected by m_mutex, as what follows
+    std::string m_line;          // sent so far, its end is still to come
+    Clock::time_point m_told;    // how far the pauses that were written reach
+};
+
+} // namespace velmora

@@ -1,0 +1,67 @@
+#include "velmora/vehiclereader.h"
+
+#include "velmora/codereader.h"
+
+#include <obd/iecu.h>
+
+namespace velmora {
+
+namespace {
+
+constexpr unsigned int replyLimitMs = 500;
+
+// The driver keeps the bus family only; the adapter tells the number, behind an A if it searched for it.
+ProtocolReport readProtocol(Session& session)
+{
+    ProtocolReport report{std::nullopt, session.adapter()->getProtocolDescription()};
+    std::string reply;
+    if (session.proxy()->execute("ATDPN", reply, replyLimitMs) == obd::IDevice::Status::Ok) {
+        std::size_t const digit = reply.find_first_of("123456789");
+        if (digit != std::string::npos) {
+            report.number = reply[digit] - '0';
+        }
+    }
+    return report;
+}
+
+AdapterReport readAdapter(Session& session)
+{
+    std::shared_ptr<obd::IAdapter> const adapter = session.adapter();
+    float const volts = session.proxy()->batteryVoltage();
+    return {adapter->device(), adapter->description(), adapter->identification(),
+            volts > 0.0F ? std::optional(volts) : std::nullopt};
+}
+
+bool isSensor(unsigned char id)
+{
+    return (id & 0x1F) != 0 && id > 0x02;
+}
+
+ModuleReport readModule(obd::IEcu const& ecu, CodeReader& reader)
+{
+    ModuleReport report{ecu.id(), ecu.name(), ecu.description(), ecu.standardDescription(), {}, {}};
+    for (unsigned char const id : ecu.supportedIds(obd::ObdMode::CurrentData, 0)) {
+        if (isSensor(id)) {
+            report.supported.push_back(id);
+        }
+    }
+    report.codes = reader.read(ecu, {CodeKind::Confirmed, CodeKind::Pending, CodeKind::Permanent});
+    return report;
+}
+
+} // namespace
+
+VehicleReport readVehicle(Session& session)
+{
+    VehicleReport report;
+    report.adapter = readAdapter(session);
+    report.protocol = readProtocol(session);
+    CodeReader reader(session);
+    for (auto const& ecu : session.obd().getEcuManager()->getEcus()) {
+        report.modules.push_back(readModule(*ecu, reader));
+    }
+    session.check();
+    return report;
+}
+
+} // namespace velmora
