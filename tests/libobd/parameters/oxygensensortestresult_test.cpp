@@ -1,6 +1,7 @@
 #include "libobd/parameters/oxygensensortestresult.h"
 #include "tests/libobd/parameters/diagnosticsrig.h"
 #include "tests/support/logcapture.h"
+#include "tests/support/tablefile.h"
 
 #include <gtest/gtest.h>
 
@@ -79,6 +80,43 @@ TEST(OxygenSensorTestResult, TestsWithoutAScalingAreShownAsTheyCame)
     ASSERT_TRUE(offer(parameter, isoEcu, "45 20 01 C8 00 FF"));
     EXPECT_EQ(text(*parameter.getResult(isoEcu)), "200 (0 to 255) 0 status 0");
     EXPECT_EQ(parameter.getResult(isoEcu)->description, "NA");
+}
+
+// Of one test: 01 between 00 and 80, then FF above 01 to 80.
+void expectWritten(std::vector<std::string> const& row, unsigned char tid)
+{
+    std::vector<std::string> const texts(row.begin() + 3, row.end());
+    OxygenSensorTestResult parameter(tid, front);
+    ASSERT_TRUE(parameter.setResponseData(isoEcu, Bytes{0x45, tid, 0x01, 0x01, 0x00, 0x80}));
+    auto const within = parameter.getResult(isoEcu);
+    ASSERT_TRUE(parameter.setResponseData(isoEcu, Bytes{0x45, tid, 0x01, 0xFF, 0x01, 0x80}));
+    auto const above = parameter.getResult(isoEcu);
+    EXPECT_EQ(within->tid, tid);
+    EXPECT_EQ(within->description, row.at(1));
+    EXPECT_EQ(std::to_string(within->unit), row.at(2));
+    bool const constant = tid >= 1 && tid <= 4; // has the whole range, whatever stands behind the value
+    EXPECT_EQ((Texts{within->value, within->minimum, within->maximum}),
+              (Texts{texts.at(1), texts.at(0), texts.at(constant ? 3 : 2)}));
+    EXPECT_EQ((Texts{above->value, above->minimum, above->maximum}),
+              (Texts{texts.at(3), texts.at(constant ? 0 : 1), texts.at(constant ? 3 : 2)}));
+    EXPECT_EQ(within->status, 0);
+    EXPECT_EQ(above->status, constant ? 0 : 1);
+}
+
+TEST(OxygenSensorTestResult, EveryTestReadsAsTheTableSays)
+{
+    unsigned int expected = 0;
+    for (auto const& row : support::readTable("tests/libobd/parameters/oxygentests.txt")) {
+        auto const first = static_cast<unsigned int>(std::stoul(row.at(0).substr(0, 2), nullptr, 16));
+        auto const last = static_cast<unsigned int>(std::stoul(row.at(0).substr(row.at(0).size() - 2), nullptr, 16));
+        EXPECT_EQ(first, expected) << "a test is missing or told twice";
+        for (unsigned int tid = first; tid <= last; ++tid) {
+            SCOPED_TRACE(tid);
+            expectWritten(row, static_cast<unsigned char>(tid));
+        }
+        expected = last + 1;
+    }
+    EXPECT_EQ(expected, 256U);
 }
 
 TEST(OxygenSensorTestResult, AnEcuThatDidNotAnswerHasNoResultAndALogLine)

@@ -66,6 +66,42 @@ TEST(PerformanceTracking, ReadsTheCountersOfCanInOrder)
     EXPECT_EQ(parameter.counterValue(*canEcu, Spark::ParticulateFilterEncounteredBank2), 1027U);
 }
 
+// The same counters as the lines of an older bus.
+Bytes legacyReply(unsigned char infoType, int count, int first)
+{
+    Bytes const words = canReply(infoType, count, first);
+    Bytes data;
+    for (std::size_t at = 3; at < words.size(); at += 4) {
+        data.insert(data.end(), {0x49, infoType, static_cast<unsigned char>(at / 4 + 1)});
+        data.insert(data.end(), words.begin() + static_cast<std::ptrdiff_t>(at),
+                    words.begin() + static_cast<std::ptrdiff_t>(at + 4));
+    }
+    return data;
+}
+
+// Counter i of the table has to be word i of the reply, on every bus.
+template <typename Tracking>
+void expectEveryCounterAtItsPlace(unsigned char infoType, int count)
+{
+    Bytes const lines = legacyReply(infoType, count, 0x1234);
+    for (auto const& [ecu, data] :
+         {std::pair(canEcu, canReply(infoType, count, 0x1234)), {isoEcu, lines}, {isoEcu, withChecksums(lines)}}) {
+        Tracking parameter;
+        ASSERT_TRUE(parameter.setResponseData(ecu, data));
+        ASSERT_EQ(parameter.counters(*ecu).size(), static_cast<std::size_t>(count));
+        for (int i = 0; i < count; ++i) {
+            EXPECT_EQ(parameter.counters(*ecu)[static_cast<std::size_t>(i)], i);
+            EXPECT_EQ(parameter.counterValue(*ecu, i), static_cast<unsigned int>(0x1234 + i));
+        }
+    }
+}
+
+TEST(PerformanceTracking, EveryCounterStandsAtItsPlaceOnEveryBus)
+{
+    expectEveryCounterAtItsPlace<Spark>(0x08, 28);
+    expectEveryCounterAtItsPlace<Compression>(0x0B, 18);
+}
+
 TEST(PerformanceTracking, CountersOf0StandInNoListAndLogWhenRead)
 {
     Compression parameter;

@@ -25,6 +25,54 @@ TEST(ReadinessMonitors, TableAgreesRowByRow)
     }
 }
 
+// A word in which the two bits are set as told and all others the other way round, so that none of them can stand in.
+Bytes wordOf(unsigned char pid, unsigned int availableBit, bool available, unsigned int completeBit, bool incomplete,
+             bool others)
+{
+    unsigned int word = others ? 0xFFFFFFFFU : 0U;
+    word = available ? word | 1U << availableBit : word & ~(1U << availableBit);
+    word = incomplete ? word | 1U << completeBit : word & ~(1U << completeBit);
+    return {0x41,
+            pid,
+            static_cast<unsigned char>(word >> 24U),
+            static_cast<unsigned char>(word >> 16U),
+            static_cast<unsigned char>(word >> 8U),
+            static_cast<unsigned char>(word)};
+}
+
+void expectStates(ReadinessMonitorTest test, unsigned int availableBit, unsigned int completeBit, unsigned int bits)
+{
+    bool const available = (bits & 1U) != 0;
+    bool const incomplete = (bits & 2U) != 0;
+    bool const enabled = (bits & 4U) != 0;
+    bool const cycleIncomplete = (bits & 8U) != 0;
+    bool const others = (bits & 16U) != 0;
+    MonitorStatus status;
+    MonitorStatusThisCycle cycle;
+    ASSERT_TRUE(status.setResponseData(engine, wordOf(0x01, availableBit, available, completeBit, incomplete, others)));
+    ASSERT_TRUE(
+        cycle.setResponseData(engine, wordOf(0x41, availableBit, enabled, completeBit, cycleIncomplete, others)));
+    EXPECT_EQ(readinessSinceCleared(*engine, status, test), !available   ? Model::NotAvailable
+                                                            : incomplete ? Model::NotComplete
+                                                                         : Model::Complete);
+    EXPECT_EQ(readinessThisCycle(*engine, status, cycle, test), !available        ? Model::NotAvailable
+                                                                : !enabled        ? Model::DisabledThisCycle
+                                                                : cycleIncomplete ? Model::NotComplete
+                                                                                  : Model::Complete);
+}
+
+TEST(ReadinessMonitors, EveryMonitorFollowsTheBitsOfTheTable)
+{
+    for (auto const& row : support::readTable("tests/libobd/powertrain/readinessmonitors.txt")) {
+        auto const availableBit = static_cast<unsigned int>(std::stoul(row.at(1)));
+        auto const completeBit = static_cast<unsigned int>(std::stoul(row.at(2)));
+        for (unsigned int bits = 0; bits < 32; ++bits) {
+            SCOPED_TRACE(row.at(0) + " with " + std::to_string(bits));
+            expectStates(static_cast<ReadinessMonitorTest>(std::stoi(row.at(0))), availableBit, completeBit, bits);
+        }
+    }
+}
+
 TEST(ReadinessMonitors, NumbersOutsideTheTableReadNa)
 {
     EXPECT_EQ(readinessMonitorText(static_cast<ReadinessMonitorTest>(18)), "NA");
