@@ -11,10 +11,10 @@
 
 namespace obd {
 
-// Trouble codes, malfunction indicator and freeze frames of the current control module. Every operation but the last
-// asks the vehicle once, or a few times, and blocks its caller meanwhile; call from any thread but the dispatcher's
-// worker. Without a connection or a control module, and where the vehicle does not answer or refuses, lists are empty,
-// pointers null and booleans false; the log tells why.
+// Trouble codes, malfunction indicator and freeze frames of the current control module. Every operation asks the
+// vehicle once, or a few times, and blocks its caller meanwhile; call from any thread but the dispatcher's worker.
+// Without a connection or a control module, and where the vehicle does not answer or refuses, lists are empty, pointers
+// null and booleans false; the log tells why.
 class ITroubleCodeService
 {
 public:
@@ -43,7 +43,7 @@ public:
     virtual std::shared_ptr<DtcDataModel> fetchFreezeFrameTroubleCode(unsigned char frame) = 0;
     // What the frame holds beside its code. Asks the vehicle only the first time for each frame.
     virtual std::vector<ParameterIdentifier::Id> fetchFreezeFramePids(unsigned char frame) = 0;
-    // The sensors of one parameter of the frame, with full names, such as "Fuel System Status: Bank 1".
+    // The sensors of one parameter of the frame, with full names, such as "Fuel system status: Fuel system A".
     virtual std::vector<std::shared_ptr<SensorDataModel>> fetchFreezeFrameSensors(unsigned char frame,
                                                                                   ParameterIdentifier::Id id) = 0;
     // The same as one parameter, whose sensors bear their own names only. A sensor without a reading has no value.
