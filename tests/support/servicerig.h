@@ -88,4 +88,11 @@ private:
     mutable obd::EcuManager m_ecus{notifier, rig.proxy.get(), &m_settings};
 };
 
+// Tells a service alone of a closing, so that it still has its control module, and requests still get through.
+template <typename Service>
+void tellClosed(Service& service)
+{
+    dynamic_cast<obd::IConnectionNotifierListener&>(service).onConnectionClosed();
+}
+
 } // namespace support

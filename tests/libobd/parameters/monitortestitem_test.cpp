@@ -27,8 +27,9 @@ TEST(CanMonitorTestItem, StatusComparesWithBothLimits)
         double maximum;
         int status;
     };
-    for (Case const& c : {Case{5, 1, 9, 0}, Case{1, 1, 9, 0}, Case{9, 1, 9, 0}, Case{0.9, 1, 9, 1}, Case{9.1, 1, 9, 1},
-                          Case{0, 0, 1, 0}, Case{0, -1, 0, 0}, Case{5, 9, 1, 1}}) {
+    for (Case const& c :
+         {Case{5, 1, 9, 0}, Case{1, 1, 9, 0}, Case{9, 1, 9, 0}, Case{0.9, 1, 9, 1}, Case{9.1, 1, 9, 1},
+          Case{0, 0, 1, 0}, Case{0, -1, 0, 0}, Case{5, 9, 1, 1}, Case{0.1, 0, 0, 1}, Case{-0.1, 0, 0, 1}}) {
         EXPECT_EQ(CanMonitorTestItem(counts, 1, c.value, c.minimum, c.maximum).status(), c.status)
             << c.value << " in " << c.minimum << " to " << c.maximum;
     }

@@ -41,8 +41,11 @@ TEST(TestRoutine, OlderBusReplyTellsByItsThirdByte)
     TestRoutine routine(1, ObdProtocolIso9141);
     ASSERT_TRUE(offer(routine, isoEcu, "48 01 00 00 00 00 00"));
     EXPECT_EQ(routine.result(*isoEcu), TestRoutine::Accepted);
-    ASSERT_TRUE(offer(routine, isoEcu, "48 01 01 00 00 00 00"));
-    EXPECT_EQ(routine.result(*isoEcu), TestRoutine::Refused);
+    for (char const* const refusal : {"48 01 01 00 00 00 00", "48 01 80 00 00 00 00", "48 01 FF 00 00 00 00 C8"}) {
+        routine.clear();
+        ASSERT_TRUE(offer(routine, isoEcu, refusal));
+        EXPECT_EQ(routine.result(*isoEcu), TestRoutine::Refused);
+    }
 }
 
 TEST(TestRoutine, OlderBusReplyOf6BytesStoresNothing)

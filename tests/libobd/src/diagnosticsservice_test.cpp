@@ -84,6 +84,14 @@ TEST_F(DiagnosticsService, WithNoConnectionEveryOperationReturnsAtOnce)
     expectNothing();
 }
 
+TEST_F(DiagnosticsService, FromTheClosingOnNothingIsAskedThoughThereStillIsAModule)
+{
+    supportEverything();
+    open();
+    support::tellClosed(*m_service);
+    expectNothing();
+}
+
 TEST_F(DiagnosticsService, WithoutASelectedModuleThereIsNothing)
 {
     supportEverything();

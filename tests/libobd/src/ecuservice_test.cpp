@@ -100,6 +100,16 @@ TEST_F(EcuService, WithoutAConnectionThereIsNothing)
     expectNothing();
 }
 
+TEST_F(EcuService, FromTheClosingOnNothingIsAskedThoughThereStillIsAModule)
+{
+    supportEverything();
+    open();
+    support::tellClosed(*m_service);
+    expectNothingFetched();
+    EXPECT_THAT(m_log.lines(), IsEmpty());
+    EXPECT_EQ(proxy().count(), 0);
+}
+
 TEST_F(EcuService, WithoutASelectedModuleThereIsNothing)
 {
     supportEverything();

@@ -40,6 +40,16 @@ TEST_F(RoutineService, WithoutAConnectionThereIsNothingAndNoRequest)
     EXPECT_THAT(m_log.lines(), IsEmpty());
 }
 
+TEST_F(RoutineService, FromTheClosingOnNothingIsAskedThoughThereStillIsAModule)
+{
+    m_engine->setSupported(ObdMode::SystemControl, {0x01});
+    open();
+    support::tellClosed(*m_service);
+    EXPECT_THAT(m_service->getRoutines(), IsEmpty());
+    EXPECT_EQ(m_service->runRoutine(1), nullptr);
+    EXPECT_EQ(proxy().count(), 0);
+}
+
 TEST_F(RoutineService, WithoutASelectedModuleThereIsNothing)
 {
     m_engine->setSupported(ObdMode::SystemControl, {0x01});
@@ -125,6 +135,17 @@ TEST_F(RoutineService, ANegativeResponseOfCode21GivesStatus1WithTheMessageBusy)
     open();
     proxy().answer("08 02", "7F 08 21");
     expectModel(m_service->runRoutine(2), 2, 1, "Busy", "Particulate Filter Regeneration");
+}
+
+TEST_F(RoutineService, EveryOtherResponseCodeIsARefusalWithItsTextToo)
+{
+    open();
+    proxy().answer("08 02", "7F 08 22");
+    expectModel(m_service->runRoutine(2), 2, 1, "Conditions not correct", "Particulate Filter Regeneration");
+    proxy().answer("08 02", "7F 08 31");
+    expectModel(m_service->runRoutine(2), 2, 1, "Unknown", "Particulate Filter Regeneration");
+    proxy().answer("08 02", "7F 08"); // without its code
+    expectModel(m_service->runRoutine(2), 2, 1, "Unknown", "Particulate Filter Regeneration");
 }
 
 TEST_F(RoutineService, ASilentVehicleGivesStatus2)

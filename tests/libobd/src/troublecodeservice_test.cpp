@@ -103,6 +103,16 @@ TEST_F(TroubleCodeService, AfterAConnectionThereIsNothingAndNothingIsLogged)
     EXPECT_EQ(proxy().count(), 0);
 }
 
+TEST_F(TroubleCodeService, FromTheClosingOnNothingIsAskedThoughThereStillIsAModule)
+{
+    m_engine->setSupported(ObdMode::CurrentData, {0x21, 0x31, 0x4D, 0x4E});
+    open();
+    support::tellClosed(*m_service);
+    expectNothing();
+    EXPECT_THAT(m_log.lines(), IsEmpty());
+    EXPECT_EQ(proxy().count(), 0);
+}
+
 TEST_F(TroubleCodeService, WithoutASelectedModuleThereIsNothingAndNothingIsLogged)
 {
     open();
@@ -265,6 +275,14 @@ TEST_F(TroubleCodeService, AFrameWithoutAStoredCodeHasNoPids)
     open();
     m_engine->setFrame(1, {0x00, 0x0C, 0x0D});
     EXPECT_THAT(m_service->fetchFreezeFramePids(1), IsEmpty());
+}
+
+TEST_F(TroubleCodeService, EachFrameStandsForItself)
+{
+    open();
+    m_engine->setFrame(0, {0x00, 0x0C}).setFrame(2, {0x00, 0x02, 0x0D});
+    EXPECT_THAT(m_service->fetchFreezeFramePids(0), IsEmpty());
+    EXPECT_THAT(m_service->fetchFreezeFramePids(2), ElementsAre(pid(0x0D)));
 }
 
 TEST_F(TroubleCodeService, AFrameThatIsNotDetectedHasNoPids)
