@@ -1,13 +1,17 @@
-// Parsing a reply beside bare hexadecimal decoding of the same text. Items are characters of the reply, so the rates of
-// replies of different length compare: linear cost shows as the same rate.
+// Parsing a reply beside bare hexadecimal decoding of the same text, by the same function, into memory that the caller
+// keeps: decodeText into one piece, decodeFrames into one piece for each frame, as the parser must hand it out. Items
+// are characters of the reply, so the rates of replies of different length compare: linear cost shows as the same rate.
 
 #include "libobd/src/hextext.h"
 #include "libobd/src/messageparser.h"
 
 #include <benchmark/benchmark.h>
 
+#include <algorithm>
+#include <span>
 #include <string>
 #include <string_view>
+#include <vector>
 
 namespace {
 
@@ -105,13 +109,30 @@ Text saeTenTimesAsMany()
     return characters(repeated("486B1049020100000031A5", 500));
 }
 
-void decode(benchmark::State& state, Text (*reply)())
+void decodeText(benchmark::State& state, Text (*reply)())
 {
     Text const text = reply();
     for ([[maybe_unused]] auto _ : state) {
         Text bytes;
         obd::hexTextToBytes(text, bytes);
         benchmark::DoNotOptimize(bytes.data());
+    }
+    state.SetItemsProcessed(state.iterations() * static_cast<std::int64_t>(text.size()));
+}
+
+// frameCharacters is the length of every frame's text, its header left out; the same number of header characters stands
+// before each.
+void decodeFrames(benchmark::State& state, Text (*reply)(), std::size_t headerCharacters, std::size_t frameCharacters)
+{
+    Text const text = reply();
+    for ([[maybe_unused]] auto _ : state) {
+        std::vector<Text> frames;
+        for (std::span<unsigned char const> rest = text; rest.size() > headerCharacters;
+             rest = rest.subspan(std::min(headerCharacters + frameCharacters, rest.size()))) {
+            Text& bytes = frames.emplace_back(frameCharacters / 2);
+            obd::hexTextToBytes(rest.subspan(headerCharacters), bytes);
+        }
+        benchmark::DoNotOptimize(frames.data());
     }
     state.SetItemsProcessed(state.iterations() * static_cast<std::int64_t>(text.size()));
 }
@@ -147,9 +168,13 @@ void store(benchmark::State& state, obd::ObdProtocol protocol, Text (*reply)())
 }
 
 #define VELMORA_BENCH_REPLY(protocol, reply)                                                                           \
-    BENCHMARK_CAPTURE(decode, reply, reply);                                                                           \
+    BENCHMARK_CAPTURE(decodeText, reply, reply);                                                                       \
     BENCHMARK_CAPTURE(store, reply, protocol, reply);                                                                  \
     BENCHMARK_CAPTURE(parse, reply, protocol, reply)
+
+BENCHMARK_CAPTURE(decodeFrames, singleFrame, singleFrame, 3, 16);
+BENCHMARK_CAPTURE(decodeFrames, eightModules, eightModules, 3, 16);
+BENCHMARK_CAPTURE(decodeFrames, longMessage11, longMessage11, 3, 16);
 
 VELMORA_BENCH_REPLY(obd::ObdProtocolCan11, singleFrame);
 VELMORA_BENCH_REPLY(obd::ObdProtocolCan11, eightModules);

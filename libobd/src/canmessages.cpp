@@ -1,6 +1,6 @@
 #include "libobd/src/canmessages.h"
 
-#include "libobd/src/canresponse.h"
+#include "libobd/src/canmodules.h"
 #include "libobd/src/hextext.h"
 
 #include <common/logrecord.h>
@@ -9,14 +9,11 @@
 #include <array>
 #include <cstddef>
 #include <ios>
-#include <map>
 #include <utility>
 
 namespace obd {
 
 namespace {
-
-using CanResponses = std::map<unsigned int, CanResponse>;
 
 constexpr std::size_t header11Characters = 3;
 constexpr std::size_t header29Characters = 8;
@@ -26,10 +23,7 @@ bool extract11BitId(ByteView& text, unsigned int& id)
     if (text.size() < header11Characters) {
         return false;
     }
-    std::array<unsigned char, 4> const padded = {'0', text[0], text[1], text[2]};
-    std::array<unsigned char, 2> bytes{};
-    hexTextToBytes(padded, bytes);
-    id = static_cast<unsigned int>(bytes[0] << 8 | bytes[1]);
+    id = static_cast<unsigned int>(hexPairValue('0', text[0]) << 8 | hexPairValue(text[1], text[2]));
     text = text.subspan(header11Characters);
     return true;
 }
@@ -39,9 +33,8 @@ bool extract29BitId(ByteView& text, unsigned int& id)
     if (text.size() < header29Characters) {
         return false;
     }
-    std::array<unsigned char, 4> bytes{};
-    hexTextToBytes(text, bytes);
-    id = static_cast<unsigned int>((bytes[0] & 0x1F) << 24 | bytes[1] << 16 | bytes[2] << 8 | bytes[3]);
+    auto const byte = [text](std::size_t index) { return hexPairValue(text[2 * index], text[2 * index + 1]); };
+    id = static_cast<unsigned int>((byte(0) & 0x1F) << 24 | byte(1) << 16 | byte(2) << 8 | byte(3));
     text = text.subspan(header29Characters);
     return true;
 }
@@ -55,9 +48,11 @@ bool extractEcuId(ObdProtocol protocol, ByteView& text, unsigned int& id)
 // further, so that a long reply is not decoded anew for every frame.
 ByteView decodeFrame(ByteView text, std::array<unsigned char, CanResponse::MaxFrameBytes>& bytes)
 {
-    std::size_t const pciBytes = hexTextToBytes(text, std::span(bytes).first(1));
-    std::size_t const reach = pciBytes == 0 ? 0 : CanResponse::reach(bytes[0]);
-    return ByteView(bytes).first(hexTextToBytes(text, std::span(bytes).first(reach)));
+    std::size_t decoded = hexTextToBytes(text, std::span(bytes).first(CanResponse::FrameBytes));
+    if (decoded == CanResponse::FrameBytes && CanResponse::reach(bytes[0]) > decoded) {
+        decoded = hexTextToBytes(text, std::span(bytes).first(CanResponse::reach(bytes[0])));
+    }
+    return ByteView(bytes).first(decoded);
 }
 
 bool extractPayload(ByteView& text, CanResponse& response)
@@ -72,25 +67,25 @@ bool extractPayload(ByteView& text, CanResponse& response)
     return true;
 }
 
-bool parseCanFrame(ObdProtocol protocol, ByteView& text, CanResponses& messages)
+bool parseCanFrame(ObdProtocol protocol, ByteView& text, CanModules& modules)
 {
     unsigned int id = 0;
     if (!extractEcuId(protocol, text, id)) {
         TERVEX_LOG(Fatal) << "Failed to extract ECU id";
         return false;
     }
-    if (!extractPayload(text, messages[id])) {
+    if (!extractPayload(text, modules[id])) {
         TERVEX_LOG(Fatal) << "Failed to extract message payload";
         return false;
     }
     return true;
 }
 
-bool parseCanFrames(ObdProtocol protocol, ByteView text, CanResponses& messages)
+bool parseCanFrames(ObdProtocol protocol, ByteView text, CanModules& modules)
 {
     do {
-        if (!parseCanFrame(protocol, text, messages)) {
-            return !messages.empty();
+        if (!parseCanFrame(protocol, text, modules)) {
+            return !modules.empty();
         }
     } while (!text.empty());
     return true;
@@ -100,18 +95,19 @@ bool parseCanFrames(ObdProtocol protocol, ByteView text, CanResponses& messages)
 
 bool parseCanMessages(ObdProtocol protocol, ByteView text, ResponseMap& responses)
 {
-    CanResponses messages;
-    if (!parseCanFrames(protocol, text, messages)) {
+    CanModules modules;
+    if (!parseCanFrames(protocol, text, modules)) {
         return false;
     }
-    for (auto& [id, message] : messages) {
+    modules.drain([&responses](unsigned int id, CanResponse& message) {
         std::vector<unsigned char> payload;
         if (std::move(message).payload(payload)) {
-            responses[id] = std::move(payload);
+            // Modules mostly answer in the order of their identifiers.
+            responses.insert_or_assign(responses.end(), id, std::move(payload));
         } else {
             tervex::TraceStream << "Invalid data received for 0x" << std::hex << id;
         }
-    }
+    });
     return !responses.empty();
 }
 

@@ -11,7 +11,6 @@ namespace obd {
 
 namespace {
 
-constexpr std::size_t canFrameBytes = 8;
 constexpr std::uint32_t firstFrameData = 6;
 constexpr std::uint32_t consecutiveFrameData = 7;
 constexpr std::uint32_t sequenceNumbers = 16;
@@ -53,7 +52,7 @@ int notEnoughData()
 std::size_t CanResponse::reach(unsigned char pci)
 {
     bool const isSingle = pci >> 4 == static_cast<int>(CanFrameType::Single);
-    return std::max<std::size_t>(canFrameBytes, isSingle ? pci + 1U : 0U);
+    return std::max<std::size_t>(FrameBytes, isSingle ? pci + 1U : 0U);
 }
 
 int CanResponse::parse(std::vector<unsigned char> const& frame)
@@ -106,7 +105,7 @@ int CanResponse::parseSingle(ByteView frame)
     m_received = m_length;
 
     std::size_t consumed = m_length + 1;
-    while (consumed < canFrameBytes && consumed < frame.size() && isPadding(byteAt(frame, consumed))) {
+    while (consumed < FrameBytes && consumed < frame.size() && isPadding(byteAt(frame, consumed))) {
         ++consumed;
     }
     return static_cast<int>(consumed);
@@ -114,7 +113,7 @@ int CanResponse::parseSingle(ByteView frame)
 
 int CanResponse::parseFirst(ByteView frame)
 {
-    if (frame.size() < canFrameBytes) {
+    if (frame.size() < FrameBytes) {
         return notEnoughData();
     }
     m_length = static_cast<std::uint32_t>(lowNibble(byteAt(frame, 0)) << 8 | byteAt(frame, 1));
@@ -131,7 +130,7 @@ int CanResponse::parseFirst(ByteView frame)
     m_payload.resize(m_length);
     copyInto(m_payload, 0, slice(frame, 2, firstFrameData));
     m_received = firstFrameData;
-    return canFrameBytes;
+    return FrameBytes;
 }
 
 int CanResponse::parseConsecutive(ByteView frame)
@@ -151,12 +150,12 @@ int CanResponse::parseConsecutive(ByteView frame)
         count = size - offset;
         tervex::TraceStream << "Last CF? Expecting " << count << " payload bytes";
     }
-    if (frame.size() < canFrameBytes) {
+    if (frame.size() < FrameBytes) {
         return notEnoughData();
     }
     copyInto(m_payload, offset, slice(frame, 1, count));
     m_received += count;
-    return canFrameBytes;
+    return FrameBytes;
 }
 
 // Where the data of a consecutive frame belong: the first free slot whose number modulo 16 is right, which is marked as

@@ -23,6 +23,9 @@ enum class CanFrameType : unsigned char
 class CanResponse
 {
 public:
+    // The data bytes of a CAN frame.
+    static constexpr std::size_t FrameBytes = 8;
+
     // No frame looks at more bytes than this: a PCI byte and the up to 15 that its nibble can tell.
     static constexpr std::size_t MaxFrameBytes = 16;
 

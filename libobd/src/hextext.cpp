@@ -7,33 +7,8 @@ namespace obd {
 
 namespace {
 
-constexpr unsigned char noDigit = 0xFF;
-
-constexpr std::array<unsigned char, 256> digitValues = [] {
-    std::array<unsigned char, 256> values{};
-    values.fill(noDigit);
-    for (unsigned char i = 0; i < 10; ++i) {
-        values[static_cast<std::size_t>('0' + i)] = i;
-    }
-    for (unsigned char i = 0; i < 6; ++i) {
-        values[static_cast<std::size_t>('A' + i)] = static_cast<unsigned char>(10 + i);
-        values[static_cast<std::size_t>('a' + i)] = static_cast<unsigned char>(10 + i);
-    }
-    return values;
-}();
-
 constexpr std::array<unsigned char, 16> upperDigits = {'0', '1', '2', '3', '4', '5', '6', '7',
                                                        '8', '9', 'A', 'B', 'C', 'D', 'E', 'F'};
-
-unsigned char pairValue(unsigned char first, unsigned char second)
-{
-    unsigned char const high = digitValues[first];
-    unsigned char const low = digitValues[second];
-    if (high == noDigit) {
-        return 0;
-    }
-    return low == noDigit ? high : static_cast<unsigned char>(high << 4 | low);
-}
 
 } // namespace
 
@@ -48,7 +23,7 @@ std::size_t hexTextToBytes(std::span<unsigned char const> text, std::span<unsign
 {
     std::size_t const count = std::min(text.size() / 2, bytes.size());
     for (std::size_t i = 0; i < count; ++i) {
-        bytes[i] = pairValue(text[2 * i], text[2 * i + 1]);
+        bytes[i] = hexPairValue(text[2 * i], text[2 * i + 1]);
     }
     return count;
 }

@@ -98,6 +98,23 @@ TEST_F(CanMessages, TwoModulesAreIteratedInRisingOrderOfId)
     EXPECT_EQ(responses, (ResponseMap{{0x7E8, hexBytes("41 0D 37")}, {0x7E9, hexBytes("41 0D 38")}}));
 }
 
+// Eight modules answer at most, but nothing in a damaged reply keeps to that.
+TEST_F(CanMessages, MoreThanEightModulesAreKeptApart)
+{
+    std::string first;
+    std::string second;
+    ResponseMap expected;
+    for (unsigned char digit = 0; digit < 10; ++digit) {
+        std::string const id = "79" + std::to_string(digit);
+        first.insert(0, id + "10 07 49 02 01 00 00 0" + std::to_string(digit));
+        second += id + "21 AB 00 00 00 00 00 00";
+        expected[0x790U + digit] = {0x49, 0x02, 0x01, 0x00, 0x00, digit, 0xAB};
+    }
+    EXPECT_TRUE(parse11(first + second));
+    EXPECT_EQ(responses, expected);
+    EXPECT_EQ(log.lines(), Lines());
+}
+
 TEST_F(CanMessages, PaddingOfTheFirstModuleIsNotMistakenForTheSecond)
 {
     EXPECT_TRUE(parse11("7E8 03 41 0D 37 7E9 03 41 0D 38"));
