@@ -34,7 +34,8 @@ bool writeOut(std::string const& text)
 } // namespace
 
 LiveRun::LiveRun(Session& session, LiveOptions const& options, LiveCsv* csv)
-    : m_session(session), m_options(options), m_csv(csv), m_service(obd::SensorServiceBuilder::createSensorService())
+    : m_session(session), m_options(options), m_csv(csv), m_service(obd::SensorServiceBuilder::createSensorService()),
+      m_tap(*m_session.obd().getConnectionManager())
 {
     select(chooseSensors(m_options.sensors, offered()));
     m_service->attach(this);
@@ -102,6 +103,22 @@ void LiveRun::run()
         whole.rows = m_table.rows().size() + whole.rows;
         writeOut(drawTable(m_table.rows(), 0, title(), {}, whole));
     }
+    if (m_session.options().verbose) {
+        tellRate();
+    }
+}
+
+double LiveRun::rate() const
+{
+    double const elapsed = std::chrono::duration<double>(Clock::now() - m_start).count();
+    return elapsed > 0.0 ? static_cast<double>(m_table.readings()) / elapsed : 0.0;
+}
+
+void LiveRun::tellRate() const
+{
+    fmt::print(stderr,
+               "{} readings, {:.1f} a second; {:.1f} % of the time passed between a reading and the next request\n",
+               m_table.readings(), rate(), 100.0 * m_tap.meter().lostShare());
 }
 
 bool LiveRun::isDone() const

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "velmora/cyclemeter.h"
 #include "velmora/exitcode.h"
 #include "velmora/sensorchoice.h"
 #include "velmora/session.h"
@@ -53,6 +54,8 @@ private:
     void watchSilence(LiveTime now);
     void failSilent() const;
     void print(int pid);
+    void tellRate() const;
+    double rate() const;
 
     void handleKeys();
     void handleKey(Key key);
@@ -69,6 +72,7 @@ private:
     LiveOptions const m_options;
     LiveCsv* const m_csv;
     std::shared_ptr<obd::ISensorService> m_service;
+    CycleTap m_tap;
     LiveTable m_table;
     SensorIds m_ids;
     LiveTime m_start;

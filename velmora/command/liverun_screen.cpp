@@ -138,9 +138,9 @@ std::string LiveRun::title() const
 {
     std::shared_ptr<obd::IEcu> const ecu = m_session.obd().getEcuManager()->getCurrentEcu();
     double const elapsed = std::chrono::duration<double>(std::chrono::steady_clock::now() - m_start).count();
-    return fmt::format("{}, module {}, {:.0f} s, {:.1f} readings/s", m_session.port(),
-                       ecu != nullptr ? fmt::format("{:X} {}", ecu->id(), ecu->name()) : "-", elapsed,
-                       elapsed > 0.0 ? static_cast<double>(m_table.readings()) / elapsed : 0.0);
+    return fmt::format("{}, module {}, {:.0f} s, {:.1f} readings/s, {:.1f} % of the time lost", m_session.port(),
+                       ecu != nullptr ? fmt::format("{:X} {}", ecu->id(), ecu->name()) : "-", elapsed, rate(),
+                       100.0 * m_tap.meter().lostShare());
 }
 
 std::string LiveRun::status() const
