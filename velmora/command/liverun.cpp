@@ -90,9 +90,20 @@ void LiveRun::run()
         m_csv->begin(m_table, m_start, std::chrono::system_clock::now());
     }
     m_service->startUpdates(m_ids);
-    while (!isDone()) {
-        runOnce();
+    try {
+        while (!isDone()) {
+            runOnce();
+        }
+    } catch (Failure const&) {
+        finish();
+        throw;
     }
+    finish();
+}
+
+// However it ends, what was read is kept: the last row of the recording, and the table below the user's prompt.
+void LiveRun::finish()
+{
     if (m_csv != nullptr) {
         m_csv->finish(m_table, Clock::now());
     }

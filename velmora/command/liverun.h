@@ -51,8 +51,8 @@ private:
 
     bool isDone() const;
     void runOnce();
+    void finish();
     void watchSilence(LiveTime now);
-    void failSilent() const;
     void print(int pid);
     void tellRate() const;
     double rate() const;
@@ -62,6 +62,7 @@ private:
     void handlePickerKey(Key key);
     void switchUnits();
     void scroll(int lines);
+    int page() const;
     void draw(LiveTime now);
     std::string frame(FrameStyle const& style) const;
     std::string title() const;

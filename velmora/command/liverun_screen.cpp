@@ -54,6 +54,12 @@ void LiveRun::handleKey(Key key)
     case static_cast<int>(Key::Down):
         scroll(1);
         break;
+    case static_cast<int>(Key::PageUp):
+        scroll(-page());
+        break;
+    case static_cast<int>(Key::PageDown):
+        scroll(page());
+        break;
     default:
         break;
     }
@@ -103,6 +109,11 @@ void LiveRun::switchUnits()
     obd::IVelmoraSettings* const settings = m_session.obd().getSettings();
     bool const metric = settings->unitSystem() == obd::UnitSystem::Metric;
     settings->setUnitSystem(metric ? obd::UnitSystem::Imperial : obd::UnitSystem::Metric);
+}
+
+int LiveRun::page() const
+{
+    return static_cast<int>(roomForRows(style()));
 }
 
 void LiveRun::scroll(int lines)

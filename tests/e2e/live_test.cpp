@@ -1,0 +1,54 @@
+// Live values as a user meets them: in files, in pipes, and when the link goes.
+
+#include "tests/e2e/childprocess.h"
+
+#include <algorithm>
+#include <cstdio>
+#include <fstream>
+#include <gtest/gtest.h>
+
+namespace {
+
+using e2e::ChildProcess;
+using e2e::Outcome;
+using e2e::runVelmora;
+
+std::string contentOf(std::string const& file)
+{
+    std::ifstream in(file);
+    return {std::istreambuf_iterator<char>(in), {}};
+}
+
+TEST(Live, LinkThatBreaksIsExitCodeEightAndKeepsTheRecording)
+{
+    ChildProcess simulator(
+        {"simulate", "--listen", "tcp://127.0.0.1:0", "--vehicle", "petrol-can11", "--fault", "loss@2500"});
+    std::string const file = testing::TempDir() + "velmora-live-e2e.csv";
+    Outcome const outcome = runVelmora({"-v", "-p", simulator.readLine(), "live", "RPM", "SPEED", "13", "--csv", file});
+    EXPECT_EQ(outcome.exitCode, 8) << outcome.err;
+    EXPECT_NE(outcome.err.find("The link to the adapter broke"), std::string::npos) << outcome.err;
+    EXPECT_NE(outcome.err.find(" % of the time passed between a reading and the next request"), std::string::npos);
+    std::string const recording = contentOf(file);
+    EXPECT_TRUE(recording.starts_with("time,Engine RPM (rpm),Vehicle Speed Sensor (km/h),Location of Oxygen Sensors\n"))
+        << recording;
+    EXPECT_GE(std::count(recording.begin(), recording.end(), '\n'), 3) << recording;
+    EXPECT_TRUE(recording.ends_with(",\"B1S1, B1S2\"\n")) << "the last row is whole: " << recording;
+    std::remove(file.c_str());
+}
+
+// What `velmora ... | head -1` needs: a reader that has gone ends it without a complaint.
+TEST(Live, EndsQuietlyWhenItsReaderHasGone)
+{
+    std::string const command = std::string("exec 3>&1; { '") + VELMORA_PROGRAM +
+                                "' -q -p sim:petrol-can11 live RPM 2>&3; echo exit code $? >&3; } | head -n 1 >&2";
+    FILE* const shell = ::popen(command.c_str(), "r");
+    ASSERT_NE(shell, nullptr);
+    std::string told;
+    for (int byte = std::fgetc(shell); byte != EOF; byte = std::fgetc(shell)) {
+        told += static_cast<char>(byte);
+    }
+    ::pclose(shell);
+    EXPECT_EQ(told, "exit code 0\n");
+}
+
+} // namespace
