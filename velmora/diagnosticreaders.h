@@ -1,6 +1,10 @@
 #pragma once
 
 #include "velmora/session.h"
+#include "velmora/view/countersreport.h"
+#include "velmora/view/inforeport.h"
+#include "velmora/view/monitorsreport.h"
+#include "velmora/view/oxygenreport.h"
 #include "velmora/view/readinessreport.h"
 
 #include <obd/iecu.h>
@@ -11,5 +15,10 @@
 namespace velmora {
 
 ReadinessReport readReadiness(Session& session, obd::IEcu const& ecu);
+// Asks once for each monitor, which takes seconds.
+MonitorsReport readMonitors(Session& session, obd::IEcu const& ecu);
+OxygenReport readOxygen(Session& session, obd::IEcu const& ecu);
+CountersReport readCounters(Session& session, obd::IEcu const& ecu);
+InfoReport readInfo(Session& session, obd::IEcu const& ecu);
 
 } // namespace velmora

@@ -1,6 +1,7 @@
 #include "velmora/globaloptions.h"
 
-#include <charconv>
+#include "velmora/text.h"
+
 #include <string_view>
 
 namespace velmora {
@@ -22,16 +23,7 @@ std::optional<obd::VehicleProtocol> parseProtocol(std::string const& text)
 
 std::optional<unsigned int> parseEcuId(std::string const& text)
 {
-    std::string_view digits = text;
-    if (digits.starts_with("0x") || digits.starts_with("0X")) {
-        digits.remove_prefix(2);
-    }
-    unsigned int id = 0;
-    auto const [end, error] = std::from_chars(digits.data(), digits.data() + digits.size(), id, 16);
-    if (digits.empty() || error != std::errc() || end != digits.data() + digits.size() || id > 0x1FFFFFFF) {
-        return std::nullopt;
-    }
-    return id;
+    return parseHex(text, 0x1FFFFFFF);
 }
 
 } // namespace velmora

@@ -1,7 +1,9 @@
 #include "velmora/text.h"
 
 #include <algorithm>
+#include <charconv>
 #include <numeric>
+#include <string_view>
 
 namespace velmora {
 
@@ -32,6 +34,20 @@ std::string toUpper(std::string text)
     std::transform(text.begin(), text.end(), text.begin(),
                    [](char each) { return each >= 'a' && each <= 'z' ? static_cast<char>(each - 'a' + 'A') : each; });
     return text;
+}
+
+std::optional<unsigned int> parseHex(std::string const& text, unsigned int highest)
+{
+    std::string_view digits = text;
+    if (digits.starts_with("0x") || digits.starts_with("0X")) {
+        digits.remove_prefix(2);
+    }
+    unsigned int number = 0;
+    auto const [end, error] = std::from_chars(digits.data(), digits.data() + digits.size(), number, 16);
+    if (digits.empty() || error != std::errc() || end != digits.data() + digits.size() || number > highest) {
+        return std::nullopt;
+    }
+    return number;
 }
 
 std::vector<std::string> splitWords(std::string const& text)

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstddef>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -8,6 +9,9 @@ namespace velmora {
 
 // ASCII letters only.
 std::string toUpper(std::string text);
+
+// A hexadecimal number, with or without 0x. Nothing for any other text or a number above the highest.
+std::optional<unsigned int> parseHex(std::string const& text, unsigned int highest);
 
 // The parts between blanks, '_' and '-'.
 std::vector<std::string> splitWords(std::string const& text);

@@ -1,14 +1,13 @@
 #include "velmora/command/commands.h"
+#include "velmora/command/confirm.h"
 #include "velmora/commandline.h"
 #include "velmora/failure.h"
-#include "velmora/linereader.h"
 #include "velmora/servicereplies.h"
 #include "velmora/session.h"
 #include "velmora/view/json.h"
 
 #include <fmt/format.h>
 #include <set>
-#include <unistd.h>
 
 namespace velmora {
 
@@ -45,17 +44,7 @@ void checkOptions(GlobalOptions const& options)
         throw Failure(ExitCode::WrongUse, "Clearing reaches all control modules; it can't be held to one",
                       {"leave --ecu out to clear the codes of all"});
     }
-    if (!options.yes && ::isatty(STDIN_FILENO) == 0) {
-        throw Failure(ExitCode::WrongUse, "Clearing must be confirmed, and there is no terminal to ask",
-                      {"--yes clears without asking"});
-    }
-}
-
-bool confirmed(Session const& session)
-{
-    fmt::print(stderr, "{}Clear now? [y/N] ", warning);
-    std::string answer;
-    return LineReader(session).read(answer) && (answer == "y" || answer == "Y" || answer == "yes");
+    requireConsent(options, "Clearing", "clears without asking");
 }
 
 std::vector<ModuleOutcome> clearCodes(Session& session)
@@ -121,7 +110,7 @@ ExitCode clear(GlobalOptions const& options)
     checkOptions(options);
     Session session(options);
     session.connect();
-    if (!options.yes && !confirmed(session)) {
+    if (!confirmed(session, warning, "Clear now?")) {
         fmt::print(stderr, "Nothing was cleared.\n");
         return ExitCode::Failed;
     }

@@ -11,6 +11,11 @@ void addCommands(CommandLine& commandLine)
     addClearCommand(commandLine);
     addFreezeCommand(commandLine);
     addReadinessCommand(commandLine);
+    addMonitorsCommand(commandLine);
+    addOxygenCommand(commandLine);
+    addCountersCommand(commandLine);
+    addInfoCommand(commandLine);
+    addRoutinesCommand(commandLine);
     addDtcCommand(commandLine);
     addConsoleCommand(commandLine);
     addLogCommand(commandLine);

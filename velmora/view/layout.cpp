@@ -14,6 +14,9 @@ std::vector<std::size_t> columnWidths(std::vector<std::vector<Cell>> const& rows
 {
     std::vector<std::size_t> widths;
     for (std::vector<Cell> const& row : rows) {
+        if (row.size() == 1) {
+            continue;
+        }
         widths.resize(std::max(widths.size(), row.size()));
         for (std::size_t i = 0; i < row.size(); ++i) {
             widths[i] = std::max(widths[i], displayWidth(row[i].text));
@@ -46,6 +49,10 @@ std::string drawColumns(std::vector<std::vector<Cell>> const& rows, std::string 
     for (std::vector<Cell> const& row : rows) {
         std::size_t const length = lengthOf(row);
         text += indent;
+        if (row.size() == 1) {
+            text += style.paint(row[0].mark, row[0].text) + "\n";
+            continue;
+        }
         for (std::size_t i = 0; i < length; ++i) {
             std::string const blanks(widths[i] - displayWidth(row[i].text), ' ');
             std::string const painted = style.paint(row[i].mark, row[i].text);

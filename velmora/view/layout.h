@@ -17,7 +17,7 @@ struct Cell
     bool rightAligned = false;
 };
 
-// A line a row behind the indent, each column as wide as its widest cell.
+// A line a row behind the indent, each column as wide as its widest cell. A row of one cell stands across all columns.
 std::string drawColumns(std::vector<std::vector<Cell>> const& rows, std::string const& indent, Style const& style);
 
 // The text in lines of at most that many characters, where words allow it, each behind the indent.

@@ -23,6 +23,11 @@ TEST(Layout, ColumnsAreAsWideAsTheirWidestCell)
               "  x           123456\n");
 }
 
+TEST(Layout, ARowOfOneCellStandsAcrossTheColumns)
+{
+    EXPECT_EQ(drawColumns({{{"a"}, {"b"}}, {{"a long heading", Mark::Bad}}}, " ", Style()), " a  b\n a long heading\n");
+}
+
 TEST(Layout, ColoursDoNotMoveColumns)
 {
     EXPECT_EQ(drawColumns({{{"failed", Mark::Bad}, {"1", Mark::Bad, true}}, {{"ok"}, {"22", Mark::None, true}}}, "",

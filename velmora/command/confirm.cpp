@@ -1,0 +1,29 @@
+#include "velmora/command/confirm.h"
+
+#include "velmora/failure.h"
+#include "velmora/linereader.h"
+
+#include <fmt/format.h>
+#include <unistd.h>
+
+namespace velmora {
+
+void requireConsent(GlobalOptions const& options, std::string const& action, std::string const& yes)
+{
+    if (!options.yes && ::isatty(STDIN_FILENO) == 0) {
+        throw Failure(ExitCode::WrongUse, action + " must be confirmed, and there is no terminal to ask",
+                      {"--yes " + yes});
+    }
+}
+
+bool confirmed(Session const& session, std::string const& warning, std::string const& question)
+{
+    if (session.options().yes) {
+        return true;
+    }
+    fmt::print(stderr, "{}{} [y/N] ", warning, question);
+    std::string answer;
+    return LineReader(session).read(answer) && (answer == "y" || answer == "Y" || answer == "yes");
+}
+
+} // namespace velmora
