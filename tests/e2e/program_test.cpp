@@ -1,6 +1,7 @@
 // The program as a user runs it: against simulated and recorded cars, in real time.
 
 #include "tests/e2e/childprocess.h"
+#include "tests/support/jsonschema.h"
 
 #include <chrono>
 #include <gtest/gtest.h>
@@ -92,6 +93,7 @@ TEST(Program, ScansARecordedRealCarOverTcp)
                             recorded("can11-a180d-three-modules").substr(std::string("replay:").size())});
     Outcome const outcome = runVelmora({"-q", "-p", simulator.readLine(), "scan", "--json"});
     ASSERT_EQ(outcome.exitCode, 0) << outcome.err;
+    support::expectValid(outcome.out, "scan");
     auto const report = nlohmann::json::parse(outcome.out);
     EXPECT_EQ(report["adapter"]["device"], "ELM327 v1.5");
     EXPECT_EQ(report["adapter"]["description"], "ICSolution");

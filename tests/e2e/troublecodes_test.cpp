@@ -1,6 +1,7 @@
 // Trouble codes as a user reads and clears them: offline, and against simulated cars of every bus family.
 
 #include "tests/e2e/childprocess.h"
+#include "tests/support/jsonschema.h"
 
 #include <algorithm>
 #include <gtest/gtest.h>
@@ -62,6 +63,7 @@ TEST_P(CodesOfCar, AreReadWithLampAndTexts)
     Outcome const outcome =
         runVelmora({"-q", "-p", std::string("sim:") + GetParam().vehicle, "--json", "codes", "--confirmed"});
     ASSERT_EQ(outcome.exitCode, 0) << outcome.err;
+    support::expectValid(outcome.out, "codes");
     auto const module = nlohmann::json::parse(outcome.out)[0];
     EXPECT_EQ(module["lamp"], true);
     EXPECT_EQ(module["confirmed"]["codes"][0]["code"], GetParam().confirmed);
