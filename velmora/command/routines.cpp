@@ -66,7 +66,7 @@ ExitCode judge(RoutineRun const& run)
         throw Failure(ExitCode::Refused,
                       fmt::format("The vehicle refused to run routine {}{}{}", routineId(run.routine.id),
                                   run.reason.empty() ? "" : ": ", run.reason),
-                      {"many routines run only with the engine off, or only with it warm and idling"});
+                      {"the vehicle decides when a routine may run; its maker's documents tell the conditions"});
     case RoutineRun::Result::NoAnswer:
         throw Failure(ExitCode::VehicleSilent,
                       fmt::format("The vehicle did not say whether it runs routine {}", routineId(run.routine.id)),
