@@ -92,7 +92,7 @@ TEST(JsonSchema, HoldsForInformationAndRoutines)
 TEST(JsonSchema, HoldsForAScan)
 {
     VehicleReport report;
-    report.adapter = {"sim:x", "ELM327 v1.5", "", "", 12.3F};
+    report.adapter = {"ELM327 v1.5", "", "", 12.3F};
     report.protocol = {6, "ISO 15765-4"};
     report.modules = {{0x7E8, "ECM", "", "EOBD", {0x0C, 0x0D}, codeReport()}};
     expectValid(toJson(report), "scan");
