@@ -6,6 +6,7 @@
 #include "libobd/src/hexformat.h"
 #include "libobd/src/protocolfamily.h"
 
+#include "tests/support/dtcrows.h"
 #include "tests/support/fakeecu.h"
 #include "tests/support/hexbytes.h"
 #include "tests/support/payloadfile.h"
@@ -19,6 +20,7 @@
 #include <fstream>
 #include <functional>
 #include <regex>
+#include <set>
 
 namespace {
 
@@ -120,32 +122,87 @@ void tell(std::vector<std::string>& lines, std::string const& dialogue, std::str
     }
 }
 
-TEST(RecordedCodes, AreReadAsTheyWereMeant)
+// Hands over each reply of the recordings to a request without its blanks.
+void forEachReply(std::function<void(std::string const& dialogue, std::string const& request, int occurrence,
+                                     support::ExpectedPayloads const& payloads)> const& take)
 {
-    std::vector<std::string> told;
     for (fs::directory_entry const& entry : fs::directory_iterator(folder)) {
         if (entry.path().extension() != ".payloads") {
             continue;
         }
         for (auto const& [key, payloads] : support::readPayloads(entry.path())) {
-            std::string const request = withoutBlanks(key.first);
-            if (readers.count(request) != 0) {
-                std::string const name = entry.path().stem().string();
-                std::string const place = request + " | " + std::to_string(key.second);
-                tell(told, name, place, "library", payloads.rule);
-                tell(told, name, place, "standard", payloads.standard);
-            }
+            take(entry.path().stem().string(), withoutBlanks(key.first), key.second, payloads);
         }
     }
-    std::vector<std::string> expected;
-    for (auto const& row : support::readTable("tests/libobd/parameters/recordedcodes.txt")) {
+}
+
+// The rows of a table, each as one line.
+std::vector<std::string> linesOf(std::string const& table)
+{
+    std::vector<std::string> lines;
+    for (auto const& row : support::readTable("tests/libobd/parameters/" + table)) {
         std::string line;
         for (std::string const& cell : row) {
             line += (line.empty() ? "" : " | ") + cell;
         }
-        expected.push_back(line);
+        lines.push_back(line);
     }
-    EXPECT_THAT(told, testing::UnorderedElementsAreArray(expected));
+    return lines;
+}
+
+TEST(RecordedCodes, AreReadAsTheyWereMeant)
+{
+    std::vector<std::string> told;
+    forEachReply([&told](auto const& dialogue, auto const& request, int occurrence, auto const& payloads) {
+        if (readers.count(request) != 0) {
+            std::string const place = request + " | " + std::to_string(occurrence);
+            tell(told, dialogue, place, "library", payloads.rule);
+            tell(told, dialogue, place, "standard", payloads.standard);
+        }
+    });
+    EXPECT_THAT(told, testing::UnorderedElementsAreArray(linesOf("recordedcodes.txt")));
+}
+
+template <typename Codes>
+std::vector<std::shared_ptr<obd::DtcDataModel>> readModels(std::shared_ptr<obd::IEcu> const& ecu,
+                                                           Messages const& messages)
+{
+    Codes codes;
+    return offer(codes, ecu, messages) ? codes.getTroubleCodes(*ecu)
+                                       : std::vector<std::shared_ptr<obd::DtcDataModel>>();
+}
+
+// In the form of recordedtexts.txt.
+void explain(std::set<std::string>& lines, std::string const& dialogue, std::string const& request,
+             support::ModuleMessages const& modules)
+{
+    static std::map<std::string, decltype(&readModels<obd::ConfirmedTroubleCodes>)> const kinds = {
+        {"03", readModels<obd::ConfirmedTroubleCodes>},
+        {"07", readModels<obd::PendingTroubleCodes>},
+        {"0A", readModels<obd::PermanentTroubleCodes>},
+    };
+    auto const kind = kinds.find(request);
+    if (kind == kinds.end()) {
+        return;
+    }
+    for (auto const& [id, messages] : modules) {
+        auto const ecu = std::make_shared<support::FakeEcu>(id, protocolOf(dialogue));
+        for (auto const& model : kind->second(ecu, messages)) {
+            lines.insert(dialogue + " | " + model->code + " | " + model->system + " | " + model->manufacturer + " | " +
+                         model->description);
+        }
+    }
+}
+
+TEST(RecordedCodes, ComeWithTheirTextsFromTheCatalogue)
+{
+    support::LoadedCodes const catalogue;
+    std::set<std::string> told;
+    forEachReply([&told](auto const& dialogue, auto const& request, int /*occurrence*/, auto const& payloads) {
+        explain(told, dialogue, request, payloads.rule);
+        explain(told, dialogue, request, payloads.standard);
+    });
+    EXPECT_THAT(told, testing::UnorderedElementsAreArray(linesOf("recordedtexts.txt")));
 }
 
 std::vector<std::string> split(std::string const& text, std::string const& separator)
