@@ -47,6 +47,8 @@ void checkOptions(GlobalOptions const& options)
     requireConsent(options, "Clearing", "clears without asking");
 }
 
+// The library's own clearing tells of the current module alone, and not why it failed; asking again to learn of the
+// others would clear twice.
 std::vector<ModuleOutcome> clearCodes(Session& session)
 {
     ServiceReplies const replies(*session.proxy(), clearService, replyLimitMs);
@@ -61,6 +63,11 @@ std::vector<ModuleOutcome> clearCodes(Session& session)
     std::vector<ModuleOutcome> outcomes;
     for (unsigned int const id : ids) {
         outcomes.push_back({id, modules.getEcuName(id), replies.of(id)});
+    }
+    for (std::shared_ptr<obd::IEcu> const& ecu : modules.getEcus()) {
+        if (replies.of(ecu->id()).kind == ServiceReply::Kind::Positive) {
+            ecu->resetFreezeFrameConfiguration(); // the module has erased what the library knows of them
+        }
     }
     return outcomes;
 }
