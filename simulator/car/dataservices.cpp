@@ -46,6 +46,9 @@ std::optional<Bytes> frameItem(const Module& module, const FreezeFrame& frame, s
     if (pid == freezeFrameCode) {
         return Bytes{static_cast<std::uint8_t>(frame.code >> 8), static_cast<std::uint8_t>(frame.code & 0xFF)};
     }
+    if (frame.code == 0) {
+        return std::nullopt;
+    }
     if (const auto value = frame.values.find(pid); value != frame.values.end()) {
         return value->second;
     }
@@ -53,10 +56,14 @@ std::optional<Bytes> frameItem(const Module& module, const FreezeFrame& frame, s
     return kept ? module.currentData(pid, frame.takenAt) : std::nullopt;
 }
 
-/// A module without a frame still tells that there is no code behind it.
-std::optional<Bytes> missingFrameItem(std::uint8_t pid)
+/// A module without a frame still tells that there is no code behind it (0000 in SAE J1979), and, of the one frame that
+/// every module may have, that there is nothing but this to ask for.
+std::optional<Bytes> missingFrameItem(std::uint8_t number, std::uint8_t pid)
 {
-    return pid == freezeFrameCode ? std::optional<Bytes>(Bytes{0, 0}) : std::nullopt;
+    if (pid == freezeFrameCode) {
+        return Bytes{0, 0};
+    }
+    return number == 0 && isRangeRequest(pid) ? supportedMask({freezeFrameCode}, pid) : std::nullopt;
 }
 
 } // namespace
@@ -83,7 +90,7 @@ Answer freezeFrame(const ServiceCall& call)
         return {};
     }
     const FreezeFrame* frame = findFrame(call.module.data(), *number);
-    const auto data = frame == nullptr ? missingFrameItem(*pid) : frameItem(call.module, *frame, *pid);
+    const auto data = frame == nullptr ? missingFrameItem(*number, *pid) : frameItem(call.module, *frame, *pid);
     if (!data) {
         return {};
     }

@@ -99,7 +99,9 @@ void Module::clear(Time now)
 {
     m_data.stored.clear();
     m_data.pending.clear();
-    m_data.frames.clear();
+    for (auto& frame : m_data.frames) {
+        frame.code = 0;
+    }
     m_data.lamp = false;
     for (auto& test : m_data.monitorTests) {
         test.words.assign(test.words.size(), 0);

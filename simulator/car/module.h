@@ -45,7 +45,8 @@ public:
     bool engineRuns(Time now) const;
 
     /// Service 04: forgets codes, freeze frames and results, and starts the
-    /// counters and the monitors anew. Permanent codes stay.
+    /// counters and the monitors anew. Permanent codes stay, and the module goes
+    /// on telling which PIDs a frame would hold.
     void clear(Time now);
 
 private:

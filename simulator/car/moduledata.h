@@ -32,7 +32,7 @@ struct Monitors
 struct FreezeFrame
 {
     std::uint8_t number = 0;
-    std::uint16_t code = 0;
+    std::uint16_t code = 0;               ///< 0: empty, for the codes were cleared
     Time takenAt{};                       ///< moment of the drive, for the live PIDs
     std::vector<std::uint8_t> pids;       ///< taken from the drive model or the fixed values
     std::map<std::uint8_t, Bytes> values; ///< given byte for byte

@@ -178,6 +178,15 @@ TEST(Service02, frameHasItsCodeAndItsValues)
     EXPECT_EQ(ask(car, "02 0C"), Lines{});
 }
 
+TEST(Service02, moduleThatNeverKeptAFrameTellsThatThereIsNoCode)
+{
+    Vehicle car(obdsim::parseVehicle("name = \"Car\"\nprotocol = 6\n[[module]]\nid = \"7E8\"\nstored = []\n", "test"));
+    EXPECT_EQ(ask(car, "02 00 00"), Lines{"42 00 00 40 00 00 00"});
+    EXPECT_EQ(ask(car, "02 02 00"), Lines{"42 02 00 00 00"});
+    EXPECT_EQ(ask(car, "02 0C 00"), Lines{});
+    EXPECT_EQ(ask(car, "02 00 01"), Lines{});
+}
+
 TEST(Services03To0A, codesAreCountedOnCan)
 {
     auto car = canCar();
@@ -202,7 +211,9 @@ TEST(Service04, forgetsAllButThePermanentCodes)
     EXPECT_EQ(ask(car, "07"), Lines{"47 00"});
     EXPECT_EQ(ask(car, "0A"), Lines{"4A 01 01 00"});
     EXPECT_EQ(ask(car, "01 01"), Lines{"41 01 00 77 05 05"}) << "lamp off, nothing complete";
+    EXPECT_EQ(ask(car, "02 00 00"), Lines{"42 00 00 48 18 00 00"}) << "what a frame would hold";
     EXPECT_EQ(ask(car, "02 02 00"), Lines{"42 02 00 00 00"});
+    EXPECT_EQ(ask(car, "02 0C 00"), Lines{});
     EXPECT_EQ(ask(car, "06 31"), Lines{"46 31 C0 82 00 00 00 00 00 00"});
 }
 
