@@ -274,6 +274,7 @@ BusReply BusLink::exchange(const BusRequest& request, const Settings& settings, 
     const FrameWriter writer(bus, settings, m_quirks);
     const Time sent = reply.end;
     Time deadline = sent + settings.timeout();
+    Time promised{}; // a module asked for patience until then, whatever the others say meanwhile
     int count = 0;
     for (const auto& [time, frame] : send(request, settings, now + sent)) {
         const bool enough = request.expected && count == *request.expected;
@@ -282,7 +283,8 @@ BusReply BusLink::exchange(const BusRequest& request, const Settings& settings, 
         }
         if (passes(bus, settings, frame)) {
             reply.texts.push_back({sent + time, writer.lines(frame)});
-            deadline = sent + time + (isPending(bus, frame) ? settings.timeout() : patience(settings));
+            promised = isPending(bus, frame) ? sent + time + settings.timeout() : promised;
+            deadline = std::max(promised, sent + time + patience(settings));
             ++count;
         }
     }

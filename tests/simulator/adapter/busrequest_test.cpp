@@ -125,6 +125,27 @@ raw = { "0904" = "49 04 00" }
     EXPECT_GE(host.lastWait(), Time(370));
 }
 
+TEST(BusRequest, pendingAnswerIsAwaitedBehindThatOfAnotherModule)
+{
+    constexpr const char* busy = R"(
+name = "Busy"
+protocol = 6
+padding = "00"
+[[module]]
+id = "7E8"
+latency = 10
+raw = { "0904" = "49 04 00" }
+[module.delays]
+"0904" = { times = 1, milliseconds = 180 }
+[[module]]
+id = "7E9"
+latency = 40
+raw = { "0904" = "49 04 01" }
+)";
+    auto host = ready(busy, {"ATS0", "ATH1", "ATSP6"});
+    EXPECT_EQ(host.ask("0904"), "7E8037F0978\r7E903490401\r7E803490400\r\r>");
+}
+
 TEST(BusRequest, filtersLetOneModuleThrough)
 {
     auto host = ready(twoModules, {"ATS0", "ATSP6", "ATCF7E9", "ATCM7FF"});
