@@ -21,7 +21,7 @@ need() {
 }
 
 build_packages=(g++ cmake ninja-build libasio-dev libcli11-dev nlohmann-json3-dev libfmt-dev libtomlplusplus-dev)
-test_packages=(libgtest-dev libgmock-dev libbenchmark-dev libvalijson-dev clang libclang-rt-14-dev clang-format
+test_packages=(libgtest-dev libgmock-dev libbenchmark-dev python3-jsonschema clang libclang-rt-14-dev clang-format
     clang-tidy)
 
 # build PRESET [TARGET...]: configures and builds.

@@ -1,7 +1,11 @@
 #include "velmora/vehiclereader.h"
 
 #include "velmora/codereader.h"
+#include "velmora/diagnosticreaders.h"
+#include "velmora/freezereader.h"
 
+#include <cstdio>
+#include <fmt/format.h>
 #include <obd/iecu.h>
 
 namespace velmora {
@@ -37,16 +41,30 @@ bool isSensor(unsigned char id)
     return (id & 0x1F) != 0 && id > 0x02;
 }
 
-ModuleReport readModule(obd::IEcu const& ecu, CodeReader& reader)
+std::vector<unsigned int> sensorsOf(obd::IEcu const& ecu)
 {
-    ModuleReport report{ecu.id(), ecu.name(), ecu.description(), ecu.standardDescription(), {}, {}};
+    std::vector<unsigned int> sensors;
     for (unsigned char const id : ecu.supportedIds(obd::ObdMode::CurrentData, 0)) {
         if (isSensor(id)) {
-            report.supported.push_back(id);
+            sensors.push_back(id);
         }
     }
-    report.codes = reader.read(ecu, {CodeKind::Confirmed, CodeKind::Pending, CodeKind::Permanent});
-    return report;
+    return sensors;
+}
+
+ModuleReport readModule(Session& session, obd::IEcu const& ecu, CodeReader& reader)
+{
+    constexpr unsigned char newestFrame = 0;
+    return {ecu.id(),
+            ecu.name(),
+            sensorsOf(ecu),
+            readInfo(session, ecu),
+            reader.read(ecu, {CodeKind::Confirmed, CodeKind::Pending, CodeKind::Permanent}),
+            readFreeze(session, ecu, newestFrame),
+            readReadiness(session, ecu),
+            readMonitors(session, ecu),
+            readOxygen(session, ecu),
+            readCounters(session, ecu)};
 }
 
 } // namespace
@@ -58,7 +76,10 @@ VehicleReport readVehicle(Session& session)
     report.protocol = readProtocol(session);
     CodeReader reader(session);
     for (auto const& ecu : session.obd().getEcuManager()->getEcus()) {
-        report.modules.push_back(readModule(*ecu, reader));
+        if (!session.options().quiet) {
+            fmt::print(stderr, "Reading {:X} {} ...\n", ecu->id(), ecu->name());
+        }
+        report.modules.push_back(readModule(session, *ecu, reader));
     }
     session.check();
     return report;

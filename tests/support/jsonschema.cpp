@@ -1,58 +1,49 @@
 #include "tests/support/jsonschema.h"
 
+#include <array>
+#include <cstdio>
+#include <filesystem>
 #include <fstream>
 #include <gtest/gtest.h>
-#include <nlohmann/json.hpp>
-#include <valijson/adapters/nlohmann_json_adapter.hpp>
-#include <valijson/schema.hpp>
-#include <valijson/schema_parser.hpp>
-#include <valijson/validation_results.hpp>
-#include <valijson/validator.hpp>
+#include <unistd.h>
 
 namespace support {
 
 namespace {
 
-using Adapter = valijson::adapters::NlohmannJsonAdapter;
-
-// The schema of the whole file with one definition as its root, so that references find the others.
-nlohmann::json schemaOf(std::string const& definition)
+// What a command prints, and that it failed, if it did.
+std::string outputOf(std::string const& command)
 {
-    std::ifstream file(std::string(VELMORA_SOURCE_DIR) + "/docs/json.schema.json");
-    nlohmann::json whole = nlohmann::json::parse(file);
-    nlohmann::json root = whole.at("definitions").at(definition);
-    root["definitions"] = whole["definitions"];
-    return root;
+    std::FILE* const pipe = ::popen((command + " 2>&1").c_str(), "r");
+    if (pipe == nullptr) {
+        return "could not run " + command + "\n";
+    }
+    std::string output;
+    std::array<char, 4096> part{};
+    while (std::size_t const count = std::fread(part.data(), 1, part.size(), pipe)) {
+        output.append(part.data(), count);
+    }
+    return ::pclose(pipe) == 0 ? output : output + "failed: " + command + "\n";
 }
 
-std::string toText(valijson::ValidationResults& results)
+std::string quoted(std::filesystem::path const& path)
 {
-    std::string text;
-    valijson::ValidationResults::Error error;
-    while (results.popError(error)) {
-        for (std::string const& part : error.context) {
-            text += part;
-        }
-        text += ": " + error.description + "\n";
-    }
-    return text;
+    return "'" + path.string() + "'";
 }
 
 } // namespace
 
 std::string schemaErrors(std::string const& document, std::string const& definition)
 {
-    nlohmann::json const parsed = nlohmann::json::parse(document, nullptr, false);
-    if (parsed.is_discarded()) {
-        return "this is no JSON document\n";
-    }
-    nlohmann::json const root = schemaOf(definition);
-    valijson::Schema schema;
-    valijson::SchemaParser(valijson::SchemaParser::kDraft7).populateSchema(Adapter(root), schema);
-    valijson::Validator validator;
-    valijson::ValidationResults results;
-    bool const valid = validator.validate(schema, Adapter(parsed), &results);
-    return valid ? std::string() : "the document does not match\n" + toText(results);
+    std::filesystem::path const source = VELMORA_SOURCE_DIR;
+    std::filesystem::path const file =
+        std::filesystem::path(testing::TempDir()) / ("document-" + std::to_string(::getpid()) + ".json");
+    std::ofstream(file) << document;
+    std::string const errors =
+        outputOf("python3 " + quoted(source / "tests/support/validatejson.py") + " " +
+                 quoted(source / "docs/json.schema.json") + " " + definition + " " + quoted(file));
+    std::filesystem::remove(file);
+    return errors;
 }
 
 void expectValid(std::string const& document, std::string const& definition)

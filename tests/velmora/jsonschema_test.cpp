@@ -10,6 +10,7 @@
 #include "velmora/view/oxygenreport.h"
 #include "velmora/view/readinessreport.h"
 #include "velmora/view/routinesreport.h"
+#include "velmora/view/trafficlog.h"
 #include "velmora/view/vehiclereport.h"
 
 #include <gtest/gtest.h>
@@ -94,8 +95,34 @@ TEST(JsonSchema, HoldsForAScan)
     VehicleReport report;
     report.adapter = {"ELM327 v1.5", "", "", 12.3F};
     report.protocol = {6, "ISO 15765-4"};
-    report.modules = {{0x7E8, "ECM", "", "EOBD", {0x0C, 0x0D}, codeReport()}};
+    ModuleReport full{0x7E8, "ECM", {0x0C, 0x0D}, infoReport(), codeReport(), {0, true, {}}, {}, {}, {}, {}};
+    full.monitors = {TopicAnswer::Read, {{0x01, "A", limitTests()}}};
+    full.counters = {TopicAnswer::Read, {{"A", 7}}};
+    ModuleReport empty{0x7E9, "", {}, {}, codeReport(), {}, {}, {}, {}, {}};
+    empty.codes.lamp.reset();
+    report.modules = {full, empty};
     expectValid(toJson(report), "scan");
+}
+
+TEST(JsonSchema, RefusesAScanThatMissesATopic)
+{
+    VehicleReport report;
+    report.modules = {{0x7E8, "", {}, {}, codeReport(), {}, {}, {}, {}, {}}};
+    Json document = Json::parse(toJson(report));
+    ASSERT_EQ(schemaErrors(document.dump(), "scan"), "");
+    for (char const* topic : {"info", "codes", "freeze", "readiness", "monitors", "oxygen", "counters", "sensors"}) {
+        Json wrong = document;
+        wrong["modules"][0].erase(topic);
+        EXPECT_NE(schemaErrors(wrong.dump(), "scan"), "") << topic;
+    }
+    document["modules"][0]["readiness"]["x"] = 1;
+    EXPECT_NE(schemaErrors(document.dump(), "scan"), "");
+}
+
+TEST(JsonSchema, HoldsForALineOfTheLog)
+{
+    expectValid(toJsonLine(obd::MessageDataModel{"09:05:02", obd::MessageDataModel::Sent, "010C"}), "log");
+    expectValid(toJsonLine(obd::MessageDataModel{"23:59:60", obd::MessageDataModel::Received, ""}), "log");
 }
 
 TEST(JsonSchema, HoldsForALineOfLive)
@@ -128,7 +155,7 @@ TEST(JsonSchema, TellsThePlaceOfAnError)
 {
     std::string const errors = schemaErrors(
         R"([{"id": "7E8", "name": "ECM", "answer": "read", "counters": [{"name": "A", "value": -1}]}])", "counters");
-    EXPECT_TRUE(errors.find("[counters][0][value]") != std::string::npos) << errors;
+    EXPECT_TRUE(errors.find("0/counters/0/value: -1") != std::string::npos) << errors;
 }
 
 } // namespace

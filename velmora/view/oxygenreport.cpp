@@ -19,11 +19,6 @@ Place const& place(obd::OxygenSensorLocation location)
     return places[static_cast<int>(location)];
 }
 
-std::string placeText(obd::OxygenSensorLocation location)
-{
-    return fmt::format("Bank {} sensor {}", place(location).bank, place(location).sensor);
-}
-
 std::string monitorText(OxygenReport const& report, Style const& style)
 {
     if (report.answer != TopicAnswer::Read) {
@@ -40,7 +35,7 @@ std::string sensorList(OxygenReport const& report)
 {
     std::string list;
     for (OxygenSensor const& sensor : report.sensors) {
-        list += (list.empty() ? "" : ", ") + placeText(sensor.location);
+        list += (list.empty() ? "" : ", ") + locationName(sensor.location);
     }
     return list;
 }
@@ -49,7 +44,7 @@ std::string drawTests(std::vector<OxygenSensor> const& sensors, Style const& sty
 {
     std::vector<std::vector<Cell>> rows = {limitTestHeads()};
     for (OxygenSensor const& sensor : sensors) {
-        rows.push_back({{placeText(sensor.location) + (sensor.tests.empty() ? ": no tests" : "")}});
+        rows.push_back({{locationName(sensor.location) + (sensor.tests.empty() ? ": no tests" : "")}});
         for (LimitTest const& test : failedFirst(sensor.tests)) {
             rows.push_back(limitTestRow(test));
         }
@@ -59,14 +54,19 @@ std::string drawTests(std::vector<OxygenSensor> const& sensors, Style const& sty
 
 } // namespace
 
+std::string locationName(obd::OxygenSensorLocation location)
+{
+    return fmt::format("Bank {} sensor {}", place(location).bank, place(location).sensor);
+}
+
 std::string toText(OxygenReport const& report, Style const& style)
 {
     std::string text = labelledLine("Oxygen monitor", monitorText(report, style));
     if (report.answer != TopicAnswer::Read) {
         return text;
     }
-    text += labelledLine("Sensors", sensorList(report));
-    return text + (report.onCan ? labelledLine("Tests", "among those of the monitors (velmora monitors)")
+    text += labelledLine("O2 sensors", sensorList(report));
+    return text + (report.onCan ? labelledLine("O2 tests", "among those of the monitors (velmora monitors)")
                                 : drawTests(report.sensors, style));
 }
 

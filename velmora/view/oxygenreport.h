@@ -24,6 +24,9 @@ struct OxygenReport
     std::vector<OxygenSensor> sensors;
 };
 
+// "Bank 1 sensor 2"
+std::string locationName(obd::OxygenSensorLocation location);
+
 // The sensors with their places, and below each its tests, the failed first.
 std::string toText(OxygenReport const& report, Style const& style);
 // "tests" is null on CAN.

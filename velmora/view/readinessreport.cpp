@@ -92,7 +92,7 @@ std::optional<bool> isReady(ReadinessReport const& report)
 
 std::string toText(ReadinessReport const& report, Style const& style)
 {
-    std::string text = labelledLine("Lamp", lampText(report.lamp, style));
+    std::string text = report.lamp ? labelledLine("Lamp", lampText(report.lamp, style)) : std::string();
     text += labelledLine("Readiness", verdict(report, style));
     if (!isReady(report)) {
         return text;

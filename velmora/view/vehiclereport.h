@@ -1,6 +1,12 @@
 #pragma once
 
 #include "velmora/view/codereport.h"
+#include "velmora/view/countersreport.h"
+#include "velmora/view/freezereport.h"
+#include "velmora/view/inforeport.h"
+#include "velmora/view/monitorsreport.h"
+#include "velmora/view/oxygenreport.h"
+#include "velmora/view/readinessreport.h"
 
 #include <optional>
 #include <string>
@@ -27,10 +33,14 @@ struct ModuleReport
 {
     unsigned int id;
     std::string name;
-    std::string description;
-    std::string standard;
     std::vector<unsigned int> supported; // identifiers of service 01 that are sensors
+    InfoReport info;
     CodeReport codes;
+    FreezeReport freeze;
+    ReadinessReport readiness;
+    MonitorsReport monitors;
+    OxygenReport oxygen;
+    CountersReport counters;
 };
 
 struct VehicleReport
@@ -40,7 +50,8 @@ struct VehicleReport
     std::vector<ModuleReport> modules; // in rising order of id
 };
 
-// Headings and aligned columns, for people.
+// Headings and aligned columns, for people: adapter and protocol, what is wrong with the whole vehicle, then all that
+// each module told.
 std::string toText(VehicleReport const& report, Style const& style);
 
 // The document that docs/json.md describes.

@@ -18,12 +18,11 @@ Json moduleJson(ModuleReport const& module)
     for (unsigned int const id : module.supported) {
         supported.push_back(fmt::format("{:02X}", id));
     }
-    return {{"id", fmt::format("{:X}", module.id)},
-            {"name", textOrNull(module.name)},
-            {"description", textOrNull(module.description)},
-            {"standard", textOrNull(module.standard)},
-            {"sensors", supported},
-            {"codes", toJsonValue(module.codes)}};
+    return {{"id", fmt::format("{:X}", module.id)},       {"name", textOrNull(module.name)},
+            {"info", toJsonValue(module.info)},           {"sensors", supported},
+            {"codes", toJsonValue(module.codes)},         {"freeze", toJsonValue(module.freeze)},
+            {"readiness", toJsonValue(module.readiness)}, {"monitors", toJsonValue(module.monitors)},
+            {"oxygen", toJsonValue(module.oxygen)},       {"counters", toJsonValue(module.counters)}};
 }
 
 } // namespace

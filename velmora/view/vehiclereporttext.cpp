@@ -1,3 +1,4 @@
+#include "velmora/view/findings.h"
 #include "velmora/view/layout.h"
 #include "velmora/view/vehiclereport.h"
 
@@ -14,40 +15,58 @@ void addLine(std::string& text, char const* label, std::string const& value)
     }
 }
 
-void addAdapter(std::string& text, AdapterReport const& adapter)
+std::string adapterText(AdapterReport const& adapter)
 {
-    text += "Adapter\n";
+    std::string text = "Adapter\n";
     addLine(text, "Device", adapter.device);
     addLine(text, "Description", adapter.description);
     addLine(text, "Identifier", adapter.identification);
-    addLine(text, "Voltage", adapter.volts ? fmt::format("{:.1f} V", *adapter.volts) : "-");
+    return text + labelledLine("Voltage", adapter.volts ? fmt::format("{:.1f} V", *adapter.volts) : "");
 }
 
-void addProtocol(std::string& text, ProtocolReport const& protocol)
+std::string protocolText(ProtocolReport const& protocol)
 {
-    text += "\nProtocol\n";
-    addLine(text, "Number", protocol.number ? std::to_string(*protocol.number) : "-");
+    std::string text = "Protocol\n";
+    text += labelledLine("Number", protocol.number ? std::to_string(*protocol.number) : "");
     addLine(text, "Name", protocol.name);
+    return text;
 }
 
-void addModule(std::string& text, ModuleReport const& module, Style const& style)
+// What a module does not offer is left out.
+template <typename Report>
+std::string topicText(Report const& report, Style const& style)
 {
-    text += "\n" + moduleHeading(module.id, module.name) + "\n";
-    addLine(text, "Description", module.description);
-    addLine(text, "Standard", module.standard);
-    addLine(text, "Sensors", std::to_string(module.supported.size()));
-    text += toText(module.codes, style);
+    return report.answer == TopicAnswer::NotOffered ? std::string() : toText(report, style);
+}
+
+// The lamp stands with the codes.
+std::string readinessText(ReadinessReport report, Style const& style)
+{
+    report.lamp.reset();
+    return topicText(report, style);
+}
+
+std::string moduleText(ModuleReport const& module, Style const& style)
+{
+    std::string text = moduleHeading(module.id, module.name) + "\n" + toText(module.info, style) +
+                       labelledLine("Live sensors", std::to_string(module.supported.size()));
+    for (std::string const& topic :
+         {toText(module.codes, style), hasAnswer(module.freeze) ? toText(module.freeze, style) : std::string(),
+          readinessText(module.readiness, style), topicText(module.monitors, style), topicText(module.oxygen, style),
+          topicText(module.counters, style)}) {
+        text += topic.empty() ? "" : "\n" + topic;
+    }
+    return text;
 }
 
 } // namespace
 
 std::string toText(VehicleReport const& report, Style const& style)
 {
-    std::string text;
-    addAdapter(text, report.adapter);
-    addProtocol(text, report.protocol);
+    std::string text =
+        adapterText(report.adapter) + "\n" + protocolText(report.protocol) + "\n" + toText(findings(report), style);
     for (ModuleReport const& module : report.modules) {
-        addModule(text, module, style);
+        text += "\n" + moduleText(module, style);
     }
     return text;
 }

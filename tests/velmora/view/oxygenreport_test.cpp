@@ -19,7 +19,7 @@ OxygenReport const report{TopicAnswer::Read,
 TEST(OxygenReportView, ShowsSensorsAndTheirTests)
 {
     EXPECT_EQ(toText(report, Style()), "  Oxygen monitor complete\n"
-                                       "  Sensors        Bank 1 sensor 1, Bank 4 sensor 2\n"
+                                       "  O2 sensors     Bank 1 sensor 1, Bank 4 sensor 2\n"
                                        "      Result  Test  Value  Minimum  Maximum  Unit  Description\n"
                                        "    Bank 1 sensor 1\n"
                                        "      failed  05    0.200    0.000    0.160  s     Switch time\n"
@@ -31,8 +31,8 @@ TEST(OxygenReportView, PointsToTheMonitorsOnCan)
 {
     OxygenReport const onCan{TopicAnswer::Read, false, true, {{OxygenSensorLocation::Bank2Sensor3, {}}}};
     EXPECT_EQ(toText(onCan, Style()), "  Oxygen monitor not complete, so results don't count yet\n"
-                                      "  Sensors        Bank 2 sensor 3\n"
-                                      "  Tests          among those of the monitors (velmora monitors)\n");
+                                      "  O2 sensors     Bank 2 sensor 3\n"
+                                      "  O2 tests       among those of the monitors (velmora monitors)\n");
     EXPECT_EQ(toJsonValue(onCan), Json::parse(R"({"answer": "read", "complete": false,
         "sensors": [{"bank": 2, "sensor": 3, "tests": null}]})"));
 }

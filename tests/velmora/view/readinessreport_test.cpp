@@ -39,10 +39,8 @@ TEST(ReadinessReportView, IsReadyWhenAllThatTheVehicleHasIsComplete)
 
 TEST(ReadinessReportView, TellsWhyThereIsNone)
 {
-    EXPECT_EQ(toText(ReadinessReport(), Style()), "  Lamp           -\n"
-                                                  "  Readiness      not supported\n");
-    EXPECT_EQ(toText(ReadinessReport{TopicAnswer::Silent, {}, {}}, Style()), "  Lamp           -\n"
-                                                                             "  Readiness      no answer\n");
+    EXPECT_EQ(toText(ReadinessReport(), Style()), "  Readiness      not supported\n");
+    EXPECT_EQ(toText(ReadinessReport{TopicAnswer::Silent, {}, {}}, Style()), "  Readiness      no answer\n");
     EXPECT_FALSE(hasAnswer(ReadinessReport{TopicAnswer::Silent, {}, {}}));
 }
 
