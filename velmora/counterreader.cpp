@@ -17,18 +17,14 @@ bool isOffered(obd::IEcu const& ecu, unsigned char infoType)
     return ecu.isSupported(obd::ObdMode::VehicleInformation, infoType, 0);
 }
 
-// Counters that are 0 stand in no list, so an empty one may be an answer or none.
-bool answers(Session& session, obd::IEcu const& ecu)
+// Counters that are 0 stand in no list, so an empty list may be an answer, one that can't be decoded, or none.
+TopicAnswer answerWithoutCounters(Session& session, obd::IEcu const& ecu)
 {
-    return std::any_of(std::begin(infoTypes), std::end(infoTypes), [&](unsigned char infoType) {
-        obd::ResponseMap responses;
-        if (!isOffered(ecu, infoType)) {
-            return false;
-        }
-        session.proxy()->execute({0x09, infoType}, responses, replyLimitMs);
-        auto const found = responses.find(ecu.id());
-        return found != responses.end() && !found->second.empty() && found->second.front() == 0x49;
-    });
+    auto const offered = std::find_if(std::begin(infoTypes), std::end(infoTypes),
+                                      [&ecu](unsigned char infoType) { return isOffered(ecu, infoType); });
+    obd::ResponseMap responses;
+    session.proxy()->execute({0x09, *offered}, responses, replyLimitMs);
+    return judgeWithoutCounters(responses[ecu.id()], ecu.protocol());
 }
 
 unsigned int toNumber(std::string const& digits)
@@ -39,6 +35,18 @@ unsigned int toNumber(std::string const& digits)
 }
 
 } // namespace
+
+TopicAnswer judgeWithoutCounters(std::vector<unsigned char> const& reply, obd::ObdProtocol protocol)
+{
+    if (reply.empty() || reply.front() != 0x49) {
+        return TopicAnswer::Silent;
+    }
+    bool const can = protocol == obd::ObdProtocolCan11 || protocol == obd::ObdProtocolCan29;
+    std::size_t const heading = 3; // service, info type, count of items
+    bool const zeros = reply.size() <= heading ||
+                       std::all_of(reply.begin() + heading, reply.end(), [](unsigned char byte) { return byte == 0; });
+    return can && !zeros ? TopicAnswer::Unreadable : TopicAnswer::Read;
+}
 
 CountersReport readCounters(Session& session, obd::IEcu const& ecu)
 {
@@ -52,8 +60,7 @@ CountersReport readCounters(Session& session, obd::IEcu const& ecu)
         report.counters.push_back({counter->description, toNumber(counter->value)});
     }
     session.check();
-    bool const told = !report.counters.empty() || answers(session, ecu);
-    report.answer = told ? TopicAnswer::Read : TopicAnswer::Silent;
+    report.answer = report.counters.empty() ? answerWithoutCounters(session, ecu) : TopicAnswer::Read;
     session.check();
     return report;
 }

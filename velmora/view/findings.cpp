@@ -78,12 +78,20 @@ void addReadiness(std::vector<Finding>& list, ModuleReport const& module)
     }
 }
 
+// Silence is no sign of health.
+void addUntold(std::vector<Finding>& list, ModuleReport const& module)
+{
+    if (!canBeChecked(module.codes)) {
+        list.push_back({Mark::Warning, nameOf(module), "not told", "lamp and confirmed codes"});
+    }
+}
+
 } // namespace
 
 std::vector<Finding> findings(VehicleReport const& report)
 {
     std::vector<Finding> list;
-    for (auto const add : {addLamp, addCodes, addTests, addReadiness}) {
+    for (auto const add : {addLamp, addCodes, addTests, addReadiness, addUntold}) {
         for (ModuleReport const& module : report.modules) {
             add(list, module);
         }

@@ -17,9 +17,10 @@ enum class TopicAnswer
     Read,
     NotOffered, // by what the module says it supports, so that it was not asked
     Silent,
+    Unreadable, // it answered in a form that can't be decoded
 };
 
-// "read", "not supported" or "no answer".
+// "read", "not supported", "no answer" or "unreadable".
 char const* answerWord(TopicAnswer answer);
 
 // What one control module told of one topic. For each Report there are toText(Report, Style), indented lines without a

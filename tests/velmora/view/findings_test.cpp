@@ -11,7 +11,9 @@ TroubleCode const lean{"P0171", "Powertrain", {{"Generic", "Lean"}}};
 
 ModuleReport module(unsigned int id, std::string const& name)
 {
-    return {id, name, {}, {}, {}, {}, {}, {}, {}, {}};
+    ModuleReport report{id, name, {}, {}, {}, {}, {}, {}, {}, {}};
+    report.codes.lamp = false;
+    return report;
 }
 
 CodeList list(CodeKind kind, std::vector<TroubleCode> const& codes)
@@ -72,6 +74,14 @@ TEST(Findings, TellFailedTestsAndWhatIsNotComplete)
                                                  "  10 ECM  failed test   Monitor: Count\n"
                                                  "  10 ECM  failed test   Bank 1 sensor 2: Voltage\n"
                                                  "  10 ECM  not complete  Catalyst\n");
+}
+
+TEST(Findings, TellAModuleThatHidesItsCodes)
+{
+    VehicleReport report;
+    report.modules = {module(0x7E8, "ECM")};
+    report.modules[0].codes = {{}, {{CodeKind::Confirmed, CodeList::Answer::Silent, {}, {}}}};
+    EXPECT_EQ(toText(findings(report), Style()), "Findings\n  7E8 ECM  not told  lamp and confirmed codes\n");
 }
 
 TEST(Findings, AreMarkedByWeight)
