@@ -19,7 +19,7 @@ bool holds(std::string const& text, std::string const& part)
 
 nlohmann::json runJson(std::string const& car, std::string const& command)
 {
-    Outcome const outcome = runVelmora({"-q", "-p", "sim:" + car, "--json", command});
+    Outcome const outcome = runVelmora({"-q", "-p", "sim:" + car + "?instant", "--json", command});
     EXPECT_EQ(outcome.exitCode, 0) << outcome.err;
     expectValid(outcome.out, command);
     return nlohmann::json::parse(outcome.out, nullptr, false);
@@ -72,7 +72,7 @@ TEST(Diagnostics, CountersAndInformationAreThoseOfTheCar)
 
 TEST(Diagnostics, WhatNoModuleOffersIsExitCodeSix)
 {
-    Outcome const outcome = runVelmora({"-q", "-p", "sim:petrol-iso9141", "counters"});
+    Outcome const outcome = runVelmora({"-q", "-p", "sim:petrol-iso9141?instant", "counters"});
     EXPECT_EQ(outcome.exitCode, 6);
     EXPECT_TRUE(holds(outcome.out, "Counters       not supported\n")) << outcome.out;
     EXPECT_TRUE(holds(outcome.err, "in-use counters")) << outcome.err;
@@ -80,11 +80,11 @@ TEST(Diagnostics, WhatNoModuleOffersIsExitCodeSix)
 
 TEST(Diagnostics, RoutineRunsOnlyWhenConfirmedAndOffered)
 {
-    Outcome const unasked = runVelmora({"-q", "-p", "sim:petrol-can11", "routines", "--run", "01"});
+    Outcome const unasked = runVelmora({"-q", "-p", "sim:petrol-can11?instant", "routines", "--run", "01"});
     EXPECT_EQ(unasked.exitCode, 2);
     EXPECT_TRUE(holds(unasked.err, "--yes")) << unasked.err;
-    EXPECT_EQ(runVelmora({"-q", "-y", "-p", "sim:petrol-can11", "routines", "--run", "100"}).exitCode, 2);
-    Outcome const unknown = runVelmora({"-q", "-y", "-p", "sim:petrol-can11", "routines", "--run", "03"});
+    EXPECT_EQ(runVelmora({"-q", "-y", "-p", "sim:petrol-can11?instant", "routines", "--run", "100"}).exitCode, 2);
+    Outcome const unknown = runVelmora({"-q", "-y", "-p", "sim:petrol-can11?instant", "routines", "--run", "03"});
     EXPECT_EQ(unknown.exitCode, 6) << unknown.err;
     EXPECT_TRUE(unknown.out.empty()) << unknown.out;
 }
@@ -93,7 +93,8 @@ TEST(Diagnostics, RoutineThatRunsIsAccepted)
 {
     auto const routines = runJson("petrol-can11", "routines");
     EXPECT_EQ(routines[0]["routines"][0]["name"], "Evaporative system leak test");
-    Outcome const run = runVelmora({"-q", "-y", "--json", "-p", "sim:petrol-can11", "routines", "--run", "0x01"});
+    Outcome const run =
+        runVelmora({"-q", "-y", "--json", "-p", "sim:petrol-can11?instant", "routines", "--run", "0x01"});
     EXPECT_EQ(run.exitCode, 0) << run.err;
     expectValid(run.out, "routinesRun");
     EXPECT_TRUE(holds(run.out, "\"accepted\"")) << run.out;
@@ -101,7 +102,7 @@ TEST(Diagnostics, RoutineThatRunsIsAccepted)
 
 TEST(Diagnostics, RoutineThatIsRefusedIsExitCodeSevenWithItsReason)
 {
-    Outcome const run = runVelmora({"-q", "-y", "-p", "sim:petrol-can11", "routines", "--run", "02"});
+    Outcome const run = runVelmora({"-q", "-y", "-p", "sim:petrol-can11?instant", "routines", "--run", "02"});
     EXPECT_EQ(run.exitCode, 7) << run.err;
     EXPECT_TRUE(holds(run.out, "Result         refused: conditions not correct\n")) << run.out;
     EXPECT_TRUE(holds(run.err, "refused to run routine 02: conditions not correct")) << run.err;

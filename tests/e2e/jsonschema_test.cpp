@@ -14,7 +14,7 @@ using support::expectValid;
 
 std::string run(std::string const& car, std::vector<std::string> const& command)
 {
-    std::vector<std::string> arguments = {"-q", "--json", "-p", "sim:" + car};
+    std::vector<std::string> arguments = {"-q", "--json", "-p", "sim:" + car + "?instant"};
     arguments.insert(arguments.end(), command.begin(), command.end());
     return runVelmora(arguments).out;
 }

@@ -52,7 +52,7 @@ TEST_F(RecordTest, ReplayGivesTheReportOfTheRecordedRun)
 
 TEST_F(RecordTest, BlanksTheEndOfTheVinAndNothingElse)
 {
-    Outcome const recorded = runVelmora({"-q", "--json", "-p", "sim:petrol-vpw", "record", m_file});
+    Outcome const recorded = runVelmora({"-q", "--json", "-p", "sim:petrol-vpw?instant", "record", m_file});
     ASSERT_EQ(recorded.exitCode, 0) << recorded.err;
     support::expectValid(recorded.out, "scan");
     Outcome const replayed = runVelmora({"-q", "--json", "-p", "replay:" + m_file, "scan"});

@@ -78,7 +78,8 @@ class CodesOfCar : public testing::TestWithParam<Car>
 
 TEST_P(CodesOfCar, AreReadWithLampAndTexts)
 {
-    Outcome const outcome = runVelmora({"-q", "-p", std::string("sim:") + GetParam().vehicle, "--json", "codes"});
+    Outcome const outcome =
+        runVelmora({"-q", "-p", std::string("sim:") + GetParam().vehicle + "?instant", "--json", "codes"});
     ASSERT_EQ(outcome.exitCode, 0) << outcome.err;
     support::expectValid(outcome.out, "codes");
     auto const module = nlohmann::json::parse(outcome.out)[0];
@@ -98,7 +99,7 @@ INSTANTIATE_TEST_SUITE_P(EveryBus, CodesOfCar,
 
 TEST(TroubleCodes, OneKindMayBeAskedAlone)
 {
-    Outcome const outcome = runVelmora({"-q", "-p", "sim:petrol-can11", "--json", "codes", "--confirmed"});
+    Outcome const outcome = runVelmora({"-q", "-p", "sim:petrol-can11?instant", "--json", "codes", "--confirmed"});
     ASSERT_EQ(outcome.exitCode, 0) << outcome.err;
     auto const module = nlohmann::json::parse(outcome.out)[0];
     EXPECT_TRUE(module.contains("confirmed"));
@@ -108,23 +109,23 @@ TEST(TroubleCodes, OneKindMayBeAskedAlone)
 
 TEST(TroubleCodes, RefusalAndSilenceAreToldPerModule)
 {
-    Outcome const kwp = runVelmora({"-q", "-p", "sim:petrol-kwp-fast", "codes"});
+    Outcome const kwp = runVelmora({"-q", "-p", "sim:petrol-kwp-fast?instant", "codes"});
     EXPECT_EQ(kwp.exitCode, 0);
     EXPECT_TRUE(holds(kwp.out, "Permanent      refused: service not supported (11)")) << kwp.out;
     EXPECT_TRUE(holds(kwp.out, "Pending        none stored")) << kwp.out;
-    Outcome const permanent = runVelmora({"-q", "-p", "sim:petrol-iso9141", "codes", "--permanent"});
+    Outcome const permanent = runVelmora({"-q", "-p", "sim:petrol-iso9141?instant", "codes", "--permanent"});
     EXPECT_EQ(permanent.exitCode, 6);
     EXPECT_TRUE(holds(permanent.out, "Permanent      no answer")) << permanent.out;
 }
 
 TEST(TroubleCodes, FreezeFrameShowsCodeNamesAndUnits)
 {
-    Outcome const outcome = runVelmora({"-q", "-p", "sim:petrol-can11", "freeze"});
+    Outcome const outcome = runVelmora({"-q", "-p", "sim:petrol-can11?instant", "freeze"});
     ASSERT_EQ(outcome.exitCode, 0) << outcome.err;
     EXPECT_TRUE(holds(outcome.out, "    P0133  Generic        O2 Sensor Circuit Slow Response")) << outcome.out;
     EXPECT_TRUE(holds(outcome.out, " rpm\n")) << outcome.out;
     EXPECT_TRUE(holds(outcome.out, "Control module 7E9: TCM\n  Freeze frame   0: none stored\n")) << outcome.out;
-    EXPECT_EQ(runVelmora({"-p", "sim:petrol-can11", "freeze", "256"}).exitCode, 2);
+    EXPECT_EQ(runVelmora({"-p", "sim:petrol-can11?instant", "freeze", "256"}).exitCode, 2);
 }
 
 TEST(TroubleCodes, ClearingAsksAndPutsTheLampOut)
@@ -153,7 +154,7 @@ TEST(TroubleCodes, ClearingAsksAndPutsTheLampOut)
 
 TEST(TroubleCodes, RefusedClearingIsExitCodeSevenWithItsReason)
 {
-    Outcome const outcome = runVelmora({"-q", "-p", "sim:diesel-can29", "clear", "--yes"});
+    Outcome const outcome = runVelmora({"-q", "-p", "sim:diesel-can29?instant", "clear", "--yes"});
     EXPECT_EQ(outcome.exitCode, 7);
     EXPECT_TRUE(holds(outcome.err, "18DAF110 refused to clear its codes: conditions not correct (22)")) << outcome.err;
     EXPECT_TRUE(holds(outcome.out, "18DAF118 TCM: cleared")) << outcome.out;
@@ -161,7 +162,7 @@ TEST(TroubleCodes, RefusedClearingIsExitCodeSevenWithItsReason)
 
 TEST(TroubleCodes, CheckOfACarWithoutCodesIsDone)
 {
-    Outcome const outcome = runVelmora({"-q", "-p", "sim:real-hyundai-i40", "scan", "--check"});
+    Outcome const outcome = runVelmora({"-q", "-p", "sim:real-hyundai-i40?instant", "scan", "--check"});
     EXPECT_EQ(outcome.exitCode, 0) << outcome.err;
 }
 

@@ -4,12 +4,13 @@
 #include "simulator/simulation.h"
 #include "velmora/failure.h"
 
+#include <algorithm>
 #include <optional>
 #include <utility>
 
 namespace velmora {
 
-PeerPort::PeerPort(std::shared_ptr<obdsim::IPeer> peer) : m_peer(std::move(peer)) {}
+PeerPort::PeerPort(std::shared_ptr<obdsim::IPeer> peer, bool instant) : m_peer(std::move(peer)), m_instant(instant) {}
 
 PeerPort::~PeerPort()
 {
@@ -52,7 +53,10 @@ obdsim::Time PeerPort::elapsed() const
 void PeerPort::waitForWork(std::unique_lock<std::mutex>& lock)
 {
     auto const hasWork = [this] { return m_stop || !m_toPeer.empty(); };
-    if (std::optional<obdsim::Time> const due = m_peer->nextOutput()) {
+    std::optional<obdsim::Time> const due = m_peer->nextOutput();
+    if (due && m_instant) {
+        m_start -= std::max(*due - elapsed(), obdsim::Time(0));
+    } else if (due) {
         m_wake.wait_until(lock, m_start + *due, hasWork);
     } else {
         m_wake.wait(lock, hasWork);
@@ -89,7 +93,7 @@ std::unique_ptr<IPort> openSimulatorPort(SimulatorAddress const& address)
         options.vehicle = address.vehicle;
     }
     try {
-        return std::make_unique<PeerPort>(obdsim::simulate(options));
+        return std::make_unique<PeerPort>(obdsim::simulate(options), address.instant);
     } catch (obdsim::SimulatorError const& error) {
         std::string names;
         for (std::string const& name : obdsim::simulatedVehicles()) {

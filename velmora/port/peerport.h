@@ -13,11 +13,11 @@
 
 namespace velmora {
 
-// A simulated adapter in this process, played in real time.
+// A simulated adapter in this process. Its clock follows the real one, but an instant one is moved on to each output.
 class PeerPort : public IPort
 {
 public:
-    explicit PeerPort(std::shared_ptr<obdsim::IPeer> peer);
+    explicit PeerPort(std::shared_ptr<obdsim::IPeer> peer, bool instant = false);
     ~PeerPort() override;
     PeerPort(PeerPort const&) = delete;
     PeerPort& operator=(PeerPort const&) = delete;
@@ -32,9 +32,10 @@ private:
     void waitForWork(std::unique_lock<std::mutex>& lock);
 
     std::shared_ptr<obdsim::IPeer> m_peer; // the port's thread alone
+    bool const m_instant;
     Receiver m_onBytes;
     LossHandler m_onLost;
-    std::chrono::steady_clock::time_point m_start;
+    std::chrono::steady_clock::time_point m_start; // moved back to move the peer's clock on
 
     std::mutex m_mutex;
     std::condition_variable m_wake;

@@ -54,6 +54,15 @@ SerialAddress parseSerial(std::string const& whole, std::string_view rest, unsig
     return address;
 }
 
+SimulatorAddress parseSimulator(std::string const& whole, std::string_view rest)
+{
+    std::size_t const query = rest.find('?');
+    if (query != std::string_view::npos && rest.substr(query) != "?instant") {
+        reject(whole, "after ? only instant is understood");
+    }
+    return {std::string(rest.substr(0, query)), query != std::string_view::npos};
+}
+
 // A host in square brackets holds colons of its own (IPv6).
 TcpAddress parseTcp(std::string const& whole, std::string_view rest)
 {
@@ -101,7 +110,10 @@ struct Printer
         bool const bracketed = address.host.find(':') != std::string::npos;
         return (bracketed ? "[" + address.host + "]" : address.host) + ":" + std::to_string(address.port);
     }
-    std::string operator()(SimulatorAddress const& address) const { return "sim:" + address.vehicle; }
+    std::string operator()(SimulatorAddress const& address) const
+    {
+        return "sim:" + address.vehicle + (address.instant ? "?instant" : "");
+    }
     std::string operator()(ReplayAddress const& address) const { return "replay:" + address.file; }
 };
 
@@ -111,7 +123,7 @@ PortAddress parsePortAddress(std::string const& text, unsigned int baud)
 {
     std::string_view rest = text;
     if (takePrefix(rest, "sim:")) {
-        return SimulatorAddress{std::string(rest)};
+        return parseSimulator(text, rest);
     }
     if (takePrefix(rest, "replay:")) {
         if (rest.empty()) {

@@ -25,6 +25,7 @@ struct TcpAddress
 struct SimulatorAddress
 {
     std::string vehicle;
+    bool instant = false; // the adapter answers at once, in place of the time that adapters and cars take
 
     bool operator==(SimulatorAddress const&) const = default;
 };

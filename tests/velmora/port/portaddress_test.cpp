@@ -29,6 +29,7 @@ TEST(PortAddress, UnderstandsEveryForm)
         {"tcp://[::1]", TcpAddress{"::1", 35000}},
         {"sim:petrol-can11", SimulatorAddress{"petrol-can11"}},
         {"sim:", SimulatorAddress{""}},
+        {"sim:petrol-can11?instant", SimulatorAddress{"petrol-can11", true}},
         {"replay:car.dialogue", ReplayAddress{"car.dialogue"}},
     };
     for (AddressCase const& row : cases) {
@@ -45,8 +46,9 @@ TEST(PortAddress, BaudOptionHoldsWhereTheAddressNamesNone)
 
 TEST(PortAddress, RefusesWhatIsNoAddressAndTellsTheForms)
 {
-    for (char const* text : {"", ":35000", "host:", "host:0", "host:65536", "host:12a", "[::1", "[::1]x", "ftp://host",
-                             "replay:", "serial://", "/dev/ttyUSB0?rate=1", "/dev/ttyUSB0?baud=x", "two words"}) {
+    for (char const* text :
+         {"", ":35000", "host:", "host:0", "host:65536", "host:12a", "[::1", "[::1]x", "ftp://host",
+          "replay:", "serial://", "/dev/ttyUSB0?rate=1", "/dev/ttyUSB0?baud=x", "sim:x?", "sim:x?fast", "two words"}) {
         try {
             parsePortAddress(text);
             ADD_FAILURE() << text << " was taken";
@@ -63,6 +65,7 @@ TEST(PortAddress, PrintsItselfForMessages)
     EXPECT_EQ(toString(parsePortAddress("/dev/ttyUSB0")), "/dev/ttyUSB0 (38400 baud)");
     EXPECT_EQ(toString(parsePortAddress("[::1]:1")), "[::1]:1");
     EXPECT_EQ(toString(parsePortAddress("sim:x")), "sim:x");
+    EXPECT_EQ(toString(parsePortAddress("sim:x?instant")), "sim:x?instant");
 }
 
 } // namespace
