@@ -34,6 +34,7 @@ void ConnectionNotifier::tellAll(void (IConnectionNotifierListener::*what)())
 {
     for (List& list : m_lists) {
         std::lock_guard const lock(list.mutex);
+        // NOLINTNEXTLINE(modernize-loop-convert): reads the size afresh at each step
         for (std::size_t i = 0; i < list.listeners.size(); ++i) {
             (list.listeners[i]->*what)();
         }

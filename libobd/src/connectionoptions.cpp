@@ -14,8 +14,7 @@ constexpr int wifiAdapterPort = 35000;
 } // namespace
 
 ConnectionOptions::ConnectionOptions(std::shared_ptr<ISettings> const& settings)
-    : m_settings(settings), m_remembered(settings), m_bus(0), m_protocol(VehicleProtocol::Automatic),
-      m_bluetooth("", "", 1), m_serial("", ""), m_tcp("", 0)
+    : m_settings(settings), m_remembered(settings), m_bluetooth("", "", 1), m_serial("", ""), m_tcp("", 0)
 {
     ConnectionOptions::load();
     m_remembered.load();

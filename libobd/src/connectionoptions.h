@@ -41,8 +41,8 @@ private:
 
     std::shared_ptr<ISettings> m_settings;
     RememberedBluetoothDevices m_remembered;
-    int m_bus;
-    VehicleProtocol m_protocol;
+    int m_bus = 0;
+    VehicleProtocol m_protocol = VehicleProtocol::Automatic;
     BluetoothDescriptor m_bluetooth;
     SerialDescriptor m_serial;
     TcpDescriptor m_tcp;

@@ -11,7 +11,7 @@ namespace obd {
 // Never destroyed: at the process's end a worker may still run, and log.
 Dispatcher& Dispatcher::getInstance()
 {
-    static Dispatcher* const instance = new Dispatcher;
+    static auto* const instance = new Dispatcher;
     return *instance;
 }
 

@@ -45,7 +45,7 @@ RoutineText const* findText(unsigned char id)
 std::shared_ptr<TestRoutineDataModel> makeModel(unsigned char id)
 {
     RoutineText const* const text = findText(id);
-    auto const model = std::make_shared<TestRoutineDataModel>();
+    auto model = std::make_shared<TestRoutineDataModel>();
     model->id = id;
     model->name = text != nullptr ? text->name : "NA";
     model->description = text != nullptr ? text->description : "";
@@ -87,7 +87,7 @@ std::shared_ptr<TestRoutineDataModel> RoutineService::runRoutine(unsigned char i
         return nullptr;
     }
     auto const routine = std::make_shared<TestRoutine>(id, module->protocol());
-    auto const model = makeModel(id);
+    auto model = makeModel(id);
     switch (run(routine, *module)) {
     case TestRoutine::Accepted:
         model->status = TestRoutineDataModel::Accepted;

@@ -117,7 +117,7 @@ SensorSet::Models SensorSet::record(std::vector<std::shared_ptr<SensorValue>> co
 {
     Models models;
     for (std::shared_ptr<SensorValue> const& value : values) {
-        if (m_sensorData.count(value->uid()) != 0) {
+        if (m_sensorData.contains(value->uid())) {
             models.push_back(record(value));
         }
     }

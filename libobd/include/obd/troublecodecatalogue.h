@@ -7,11 +7,9 @@
 #include <string>
 #include <vector>
 
-namespace obd {
-
 // The texts of trouble codes without a vehicle. Filled from LIBOBDOpen to LIBOBDClose; outside of that every code gets
 // its default text. Any thread. The models are shared: read only.
-namespace TroubleCodeCatalogue {
+namespace obd::TroubleCodeCatalogue {
 
 // Whether a text is a trouble code that a vehicle can report (SAE J2012): P, B, C or U, a digit from 0 to 3, and three
 // hexadecimal digits, all in upper case. It need not stand in the catalogue.
@@ -24,6 +22,4 @@ OBD_EXPORT std::vector<std::shared_ptr<DtcDataModel>> getTroubleCodes(std::strin
 // Every row, the generic ones first, then maker by maker, for searching and listing.
 OBD_EXPORT std::vector<std::shared_ptr<DtcDataModel>> getRows();
 
-} // namespace TroubleCodeCatalogue
-
-} // namespace obd
+} // namespace obd::TroubleCodeCatalogue
