@@ -38,6 +38,7 @@ Interrupt::Interrupt()
 Interrupt::~Interrupt()
 {
     m_stop = true;
+    // NOLINTNEXTLINE(bugprone-bad-signal-to-kill-thread): every thread blocks it; it ends the wait of this one
     pthread_kill(m_thread.native_handle(), SIGTERM);
     m_thread.join();
     current = nullptr;

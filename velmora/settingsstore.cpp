@@ -140,7 +140,8 @@ std::string SettingsStore::toToml() const
             table = table->insert(key.substr(begin, slash - begin), toml::table{}).first->second.as_table();
             begin = slash + 1;
         }
-        std::visit([&](auto const& plain) { table->insert_or_assign(key.substr(begin), plain); }, value);
+        std::string const name = key.substr(begin);
+        std::visit([&](auto const& plain) { table->insert_or_assign(name, plain); }, value);
     }
     std::ostringstream text;
     text << root << "\n";
