@@ -7,6 +7,7 @@
 #include <algorithm>
 #include <charconv>
 #include <fmt/format.h>
+#include <obd/parameterdescriptor.h>
 #include <optional>
 #include <string_view>
 
@@ -149,6 +150,15 @@ SensorIds usualSensors(Offered const& offered)
 }
 
 } // namespace
+
+std::vector<OfferedSensor> offeredSensors(obd::ISensorService& service)
+{
+    Offered offered;
+    for (auto const& descriptor : service.getDescriptors()) {
+        offered.push_back({descriptor->pid(), descriptor->description()});
+    }
+    return offered;
+}
 
 SensorIds chooseSensors(std::vector<std::string> const& words, Offered const& offered)
 {

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <obd/isensorservice.h>
 #include <obd/parameteridentifier.h>
 #include <string>
 #include <vector>
@@ -12,6 +13,9 @@ struct OfferedSensor
     obd::ParameterIdentifier::Id id;
     std::string title;
 };
+
+// What the current control module offers.
+std::vector<OfferedSensor> offeredSensors(obd::ISensorService& service);
 
 using SensorIds = std::vector<obd::ParameterIdentifier::Id>;
 

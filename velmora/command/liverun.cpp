@@ -37,22 +37,13 @@ LiveRun::LiveRun(Session& session, LiveOptions const& options, LiveCsv* csv)
     : m_session(session), m_options(options), m_csv(csv), m_service(obd::SensorServiceBuilder::createSensorService()),
       m_tap(*m_session.obd().getConnectionManager())
 {
-    select(chooseSensors(m_options.sensors, offered()));
+    select(chooseSensors(m_options.sensors, offeredSensors(*m_service)));
     m_service->attach(this);
 }
 
 LiveRun::~LiveRun()
 {
     m_service->detach(this);
-}
-
-std::vector<OfferedSensor> LiveRun::offered() const
-{
-    std::vector<OfferedSensor> list;
-    for (auto const& descriptor : m_service->getDescriptors()) {
-        list.push_back({descriptor->pid(), descriptor->description()});
-    }
-    return list;
 }
 
 void LiveRun::select(SensorIds const& ids)

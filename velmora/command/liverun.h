@@ -47,7 +47,6 @@ private:
 
     void select(SensorIds const& ids);
     void restart(SensorIds const& ids);
-    std::vector<OfferedSensor> offered() const;
 
     bool isDone() const;
     void runOnce();

@@ -45,7 +45,7 @@ void LiveRun::handleKey(Key key)
         if (m_csv != nullptr) {
             m_note = "The recording's columns are fixed";
         } else {
-            m_picker = std::make_unique<SensorPicker>(offered(), m_ids);
+            m_picker = std::make_unique<SensorPicker>(offeredSensors(*m_service), m_ids);
         }
         break;
     case static_cast<int>(Key::Up):

@@ -10,7 +10,6 @@
 #include <common/observer.h>
 #include <obd/isensorservice.h>
 #include <obd/itroubleshootingservice.h>
-#include <obd/parameterdescriptor.h>
 
 namespace velmora {
 
@@ -61,14 +60,7 @@ private:
 
 SensorIds chosenSensors(std::vector<std::string> const& names, obd::ISensorService& service)
 {
-    if (names.empty()) {
-        return {};
-    }
-    std::vector<OfferedSensor> offered;
-    for (auto const& descriptor : service.getDescriptors()) {
-        offered.push_back({descriptor->pid(), descriptor->description()});
-    }
-    return chooseSensors(names, offered);
+    return names.empty() ? SensorIds() : chooseSensors(names, offeredSensors(service));
 }
 
 ExitCode log(LogOptions const& chosen, GlobalOptions const& options)
