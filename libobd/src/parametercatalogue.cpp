@@ -60,7 +60,6 @@ std::shared_ptr<ParameterDataModel> describeParameter(std::shared_ptr<Powertrain
     std::string const name = descriptor.description();
     auto const sensors = descriptor.sensors();
     std::vector<std::shared_ptr<SensorDataModel>> models;
-    models.reserve(sensors.size());
     for (std::shared_ptr<SensorDescriptor> const& sensor : sensors) {
         models.push_back(makeLiveModel(*sensor, displayName(name, *sensor, sensors.size() == 1), nullptr));
     }
