@@ -83,10 +83,10 @@ std::size_t editDistance(std::string const& left, std::string const& right)
 {
     std::vector<std::size_t> row(right.size() + 1);
     std::iota(row.begin(), row.end(), std::size_t{0});
-    for (std::size_t i = 0; i < left.size(); ++i) {
+    for (char const letter : left) {
         std::size_t diagonal = row[0]++;
         for (std::size_t j = 0; j < right.size(); ++j) {
-            std::size_t const changed = diagonal + (left[i] == right[j] ? 0 : 1);
+            std::size_t const changed = diagonal + (letter == right[j] ? 0 : 1);
             diagonal = row[j + 1];
             row[j + 1] = std::min({changed, row[j] + 1, row[j + 1] + 1});
         }

@@ -196,7 +196,7 @@ void TableReader::tableEntries(const std::function<void(const Bytes&, TableReade
 void TableReader::finish()
 {
     for (const auto& [key, node] : m_table) {
-        if (m_known.count(key.str()) == 0) {
+        if (!m_known.contains(key.str())) {
             throw VehicleFileError(place(m_origin, key.source()) + "unknown key " + quoted(key.str()) + " in " +
                                    m_title);
         }

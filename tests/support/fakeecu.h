@@ -61,13 +61,13 @@ public:
 
     bool detectFreezeFrameConfiguration(unsigned char frame) override
     {
-        if (m_detected.count(frame) == 0) {
+        if (!m_detected.contains(frame)) {
             ++m_frameDetections;
-            if (m_frames.count(frame) != 0) {
+            if (m_frames.contains(frame)) {
                 m_detected[frame] = m_frames[frame];
             }
         }
-        return m_detected.count(frame) != 0;
+        return m_detected.contains(frame);
     }
     void resetFreezeFrameConfiguration() override { m_detected.clear(); }
 

@@ -19,7 +19,7 @@ inline std::string brokenValues(obd::PowertrainParameter& parameter, obd::IEcu c
     }
     int last = -1;
     for (auto const& value : parameter.values(ecu, system)) {
-        if (numeric.count(value->uid()) == 0) {
+        if (!numeric.contains(value->uid())) {
             return "a value of a sensor that was not announced";
         }
         if (value->uid() <= last) {

@@ -25,7 +25,7 @@ std::string usbProduct(std::filesystem::path const& ttyFolder)
     std::error_code error;
     std::filesystem::path folder = std::filesystem::canonical(ttyFolder / "device", error);
     for (int level = 0; level < 4 && !error && folder.has_relative_path(); ++level) {
-        std::string const product = firstLine(folder / "product");
+        std::string product = firstLine(folder / "product");
         if (!product.empty()) {
             return product;
         }

@@ -154,7 +154,7 @@ void SensorPicker::toggle()
 SensorIds SensorPicker::chosen() const
 {
     SensorIds ids;
-    auto const isMarked = [this](obd::ParameterIdentifier::Id id) { return m_marked.count(id) != 0; };
+    auto const isMarked = [this](obd::ParameterIdentifier::Id id) { return m_marked.contains(id); };
     std::copy_if(m_before.begin(), m_before.end(), std::back_inserter(ids), isMarked);
     for (OfferedSensor const& each : m_offered) {
         if (isMarked(each.id) && std::find(ids.begin(), ids.end(), each.id) == ids.end()) {
@@ -171,8 +171,8 @@ std::string SensorPicker::draw(FrameStyle const& style) const
     std::string text = emphasised(cut("Which sensors?", style.columns), style) + "\n";
     for (std::size_t i = first; i < std::min(m_offered.size(), first + room); ++i) {
         OfferedSensor const& each = m_offered[i];
-        text += cut(fmt::format("{} [{}] {:02X} {}", i == m_cursor ? ">" : " ",
-                                m_marked.count(each.id) != 0 ? "x" : " ", static_cast<int>(each.id), each.title),
+        text += cut(fmt::format("{} [{}] {:02X} {}", i == m_cursor ? ">" : " ", m_marked.contains(each.id) ? "x" : " ",
+                                static_cast<int>(each.id), each.title),
                     style.columns) +
                 "\n";
     }

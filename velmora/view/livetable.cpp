@@ -74,7 +74,7 @@ void LiveTable::select(Descriptors const& parameters)
 
 void LiveTable::update(int pid, Values const& values, LiveTime now)
 {
-    if (m_selected.count(pid) == 0) {
+    if (!m_selected.contains(pid)) {
         return;
     }
     for (LiveRow& row : m_rows) {

@@ -57,7 +57,7 @@ public:
     // comes again.
     unsigned long rounds() const { return m_rounds; }
     // Whether a reading of this parameter would begin the next round.
-    bool beginsRound(int pid) const { return m_seen.count(pid) != 0; }
+    bool beginsRound(int pid) const { return m_seen.contains(pid); }
     // All readings so far.
     unsigned long readings() const { return m_readings; }
 

@@ -154,7 +154,7 @@ TEST(RecordedCodes, AreReadAsTheyWereMeant)
 {
     std::vector<std::string> told;
     forEachReply([&told](auto const& dialogue, auto const& request, int occurrence, auto const& payloads) {
-        if (readers.count(request) != 0) {
+        if (readers.contains(request)) {
             std::string const place = request + " | " + std::to_string(occurrence);
             tell(told, dialogue, place, "library", payloads.rule);
             tell(told, dialogue, place, "standard", payloads.standard);
@@ -229,7 +229,7 @@ TEST(RecordedCodes, WorkedDecodesComeOutTheSame)
     std::ifstream in(folder / "decoded.txt");
     for (std::string line; std::getline(in, line);) {
         std::vector<std::string> const fields = split(line, "  +");
-        if (fields.size() < 5 || readers.count(withoutBlanks(fields[0])) == 0) {
+        if (fields.size() < 5 || !readers.contains(withoutBlanks(fields[0]))) {
             continue;
         }
         ++rows;

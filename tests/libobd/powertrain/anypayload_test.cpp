@@ -71,8 +71,8 @@ bool isNumber(std::string const& text)
 bool isKnown(std::set<std::string> const& known, std::string const& text)
 {
     std::vector<std::string> const parts = split(text, ", ");
-    return known.count(text) != 0 ||
-           std::all_of(parts.begin(), parts.end(), [&known](auto const& part) { return known.count(part) != 0; });
+    return known.contains(text) ||
+           std::all_of(parts.begin(), parts.end(), [&known](auto const& part) { return known.contains(part); });
 }
 
 class Payloads : public ::testing::Test
