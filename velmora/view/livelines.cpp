@@ -27,7 +27,7 @@ Json toJson(std::string const& text, bool numeric)
 std::string isoTime(std::chrono::system_clock::time_point time)
 {
     auto const ms = std::chrono::duration_cast<std::chrono::milliseconds>(time.time_since_epoch()).count();
-    std::time_t const seconds = static_cast<std::time_t>(ms / 1000);
+    auto const seconds = static_cast<std::time_t>(ms / 1000);
     std::tm fields{};
     ::gmtime_r(&seconds, &fields);
     return fmt::format("{:04}-{:02}-{:02}T{:02}:{:02}:{:02}.{:03}Z", fields.tm_year + 1900, fields.tm_mon + 1,

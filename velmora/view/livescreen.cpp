@@ -3,6 +3,7 @@
 #include "velmora/text.h"
 
 #include <algorithm>
+#include <cmath>
 #include <fmt/format.h>
 
 namespace velmora {
@@ -105,7 +106,7 @@ std::string trendLine(std::deque<double> const& numbers, std::size_t width)
     double const range = *std::max_element(first, numbers.end()) - low;
     for (auto number = first; number != numbers.end(); ++number) {
         double const part = range > 0.0 ? (*number - low) / range : 0.0;
-        text += blocks[static_cast<std::size_t>(part * 7.0 + 0.5)];
+        text += blocks[static_cast<std::size_t>(std::lround(part * 7.0))];
     }
     return text;
 }

@@ -50,7 +50,7 @@ std::string summary(MonitorsReport const& report, Style const& style)
 
 std::string toText(MonitorsReport const& report, Style const& style)
 {
-    std::string const text = labelledLine("Monitor tests", summary(report, style));
+    std::string text = labelledLine("Monitor tests", summary(report, style));
     if (report.monitors.empty()) {
         return text;
     }

@@ -1,5 +1,6 @@
 #include "velmora/view/vehiclereport.h"
 
+#include <cmath>
 #include <fmt/format.h>
 
 namespace velmora {
@@ -9,7 +10,7 @@ namespace {
 // The voltage in the tenths that the adapter gives.
 Json voltsOrNull(std::optional<float> const& volts)
 {
-    return volts ? Json(static_cast<double>(static_cast<int>(*volts * 10.0F + 0.5F)) / 10.0) : Json(nullptr);
+    return volts ? Json(static_cast<double>(std::lround(*volts * 10.0F)) / 10.0) : Json(nullptr);
 }
 
 Json moduleJson(ModuleReport const& module)
