@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <charconv>
+#include <cmath>
 #include <fmt/format.h>
 
 namespace velmora {
@@ -28,6 +29,9 @@ void addTrend(LiveRow& row, LiveTime now)
 {
     double number = 0.0;
     std::from_chars(row.value.data(), row.value.data() + row.value.size(), number);
+    if (!std::isfinite(number)) {
+        return; // such as the fuel consumption of air with a lambda of 0
+    }
     if (!row.trend.empty() && now - row.trendTime < trendStep) {
         return;
     }

@@ -101,6 +101,16 @@ TEST_F(Live, ValuesOfASlowBusAreNot)
     EXPECT_EQ(table.rows()[0].value, "700");
 }
 
+TEST_F(Live, TheTrendHasFiniteNumbersOnly)
+{
+    for (char const* text : {"inf", "7.5", "nan", "-inf", "8.5"}) {
+        rpm(text);
+        EXPECT_EQ(table.rows()[0].value, text);
+        now += seconds(1);
+    }
+    EXPECT_EQ(table.rows()[0].trend, (std::deque<double>{7.5, 8.5}));
+}
+
 TEST_F(Live, TheTrendIsShortAndTakesFourValuesASecond)
 {
     for (int i = 0; i < 100; ++i) {
