@@ -1,9 +1,8 @@
 #include "simulator/dialogue.h"
 
 #include "simulator/bytes.h"
+#include "simulator/textfile.h"
 
-#include <fstream>
-#include <iterator>
 #include <numeric>
 #include <sstream>
 #include <utility>
@@ -274,12 +273,11 @@ Dialogue parseDialogue(const std::string& text, const std::string& origin)
 
 Dialogue loadDialogue(const std::string& path)
 {
-    std::ifstream file(path, std::ios::binary);
-    const std::string text{std::istreambuf_iterator<char>(file), std::istreambuf_iterator<char>()};
-    if (!file.is_open() || file.bad()) {
+    const auto text = readTextFile(path);
+    if (!text) {
         throw DialogueError(path + ": cannot be read");
     }
-    return parseDialogue(text, path);
+    return parseDialogue(*text, path);
 }
 
 std::string formatDialogue(const Dialogue& dialogue, const std::vector<std::string>& comment)

@@ -79,6 +79,9 @@ SettingsStore::SettingsStore(std::filesystem::path file) : m_file(std::move(file
     if (!std::filesystem::exists(m_file, error)) {
         return;
     }
+    if (std::filesystem::is_directory(m_file, error)) {
+        failRead(m_file, "it is a folder");
+    }
     try {
         visitLeaves(toml::parse_file(m_file.string()), {}, [this](std::string const& key, toml::node const& node) {
             if (auto const number = node.value_exact<std::int64_t>()) {

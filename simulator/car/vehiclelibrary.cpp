@@ -1,10 +1,9 @@
 #include "simulator/car/vehiclelibrary.h"
 
 #include "simulator/car/embeddedvehicles.h"
+#include "simulator/textfile.h"
 
 #include <algorithm>
-#include <fstream>
-#include <iterator>
 
 namespace obdsim {
 
@@ -12,16 +11,15 @@ namespace {
 
 std::string readFile(const std::string& path)
 {
-    std::ifstream file(path, std::ios::binary);
-    std::string text{std::istreambuf_iterator<char>(file), std::istreambuf_iterator<char>()};
-    if (!file.is_open() || file.bad()) {
+    auto text = readTextFile(path);
+    if (!text) {
         std::string names;
         for (const auto& name : vehicleNames()) {
             names += names.empty() ? name : ", " + name;
         }
         throw VehicleFileError(path + ": no such file, and no vehicle of that name; the vehicles are " + names);
     }
-    return text;
+    return *std::move(text);
 }
 
 } // namespace

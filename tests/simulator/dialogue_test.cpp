@@ -76,6 +76,7 @@ TEST(Dialogue, malformedFileIsToldWithItsLine)
         }
     }
     EXPECT_THROW(obdsim::loadDialogue("/no/such/file"), DialogueError);
+    EXPECT_THROW(obdsim::loadDialogue(testing::TempDir()), DialogueError);
 }
 
 TEST(Dialogue, isWrittenInTheFormThatIsRead)

@@ -42,6 +42,11 @@ TEST_F(Settings, FileThatDoesNotExistIsAnEmptyStore)
     EXPECT_FALSE(std::filesystem::exists(m_file)) << "reading writes nothing";
 }
 
+TEST_F(Settings, FolderIsNoStore)
+{
+    EXPECT_THROW(SettingsStore(m_folder.string()), Failure);
+}
+
 TEST_F(Settings, ReadsTablesAsGroupsOfKeys)
 {
     write("[common]\nunitsystem = 1\n[velmora]\nport = \"sim:\"\n[bluetooth.device1]\nname = \"OBDII\"\n");

@@ -95,12 +95,8 @@ std::unique_ptr<IPort> openSimulatorPort(SimulatorAddress const& address)
     try {
         return std::make_unique<PeerPort>(obdsim::simulate(options), address.instant);
     } catch (obdsim::SimulatorError const& error) {
-        std::string names;
-        for (std::string const& name : obdsim::simulatedVehicles()) {
-            names += (names.empty() ? "" : ", ") + name;
-        }
         throw Failure(ExitCode::PortFailed, std::string("Could not start the simulated car: ") + error.what(),
-                      {"the built-in cars are: " + names});
+                      {"sim:NAME takes a built-in car or a vehicle file; `velmora simulate --list` lists the cars"});
     }
 }
 
@@ -109,7 +105,8 @@ std::unique_ptr<IPort> openReplayPort(ReplayAddress const& address)
     try {
         return std::make_unique<PeerPort>(obdsim::replay(address.file));
     } catch (obdsim::SimulatorError const& error) {
-        throw Failure(ExitCode::PortFailed, std::string("Could not replay the recorded dialogue: ") + error.what());
+        throw Failure(ExitCode::PortFailed, std::string("Could not replay the recorded dialogue: ") + error.what(),
+                      {"replay:FILE takes a file that `velmora record FILE` has written"});
     }
 }
 

@@ -25,6 +25,10 @@ namespace {
         throw Failure(ExitCode::PortFailed, what,
                       {"your user may not use serial ports: add it to the group dialout and log in again"});
     }
+    if (error == asio::error_code(ENOTTY, asio::error::get_system_category())) {
+        throw Failure(ExitCode::PortFailed, address.device + " is no serial port",
+                      {"`velmora ports` lists what is there", "a recorded car is replay:FILE"});
+    }
     throw Failure(ExitCode::PortFailed, what,
                   {"does another program hold the port?", "is it the right port? `velmora ports` lists what is there"});
 }

@@ -1,0 +1,11 @@
+#pragma once
+
+#include <optional>
+#include <string>
+
+namespace obdsim {
+
+/// The whole file, nothing if it can't be read.
+std::optional<std::string> readTextFile(const std::string& path);
+
+} // namespace obdsim
