@@ -1,14 +1,17 @@
 #include "velmora/commandline.h"
 
 #include "velmora/failure.h"
+#include "velmora/output.h"
 #include "velmora/version.h"
 
 #include <CLI/Config.hpp>
 #include <CLI/Formatter.hpp>
+#include <cerrno>
 #include <cstdio>
 #include <exception>
 #include <fmt/format.h>
 #include <map>
+#include <system_error>
 #include <utility>
 
 namespace velmora {
@@ -26,6 +29,17 @@ void report(Failure const& failure)
     for (std::string const& hint : failure.hints()) {
         fmt::print(stderr, "  - {}\n", hint);
     }
+}
+
+// A reader of standard output that has gone, such as head, has read enough and needs no message.
+ExitCode judge(std::system_error const& error)
+{
+    if (std::ferror(stdout) == 0) {
+        fmt::print(stderr, "velmora: {}\n", error.what());
+    } else if (error.code().value() != EPIPE) {
+        report(outputFailure(error.code().value()));
+    }
+    return ExitCode::Failed;
 }
 
 template <typename Value, typename Parse>
@@ -124,8 +138,11 @@ ExitCode CommandLine::run(int argc, char const* const* argv)
     try {
         m_app.parse(argc, argv);
     } catch (CLI::Success const& wanted) {
-        m_app.exit(wanted);
-        return ExitCode::Done;
+        m_action = [&](GlobalOptions const& /*options*/) {
+            m_app.exit(wanted);
+            return ExitCode::Done;
+        };
+        return runAction();
     } catch (CLI::ParseError const& error) {
         std::vector<std::string> const unknown = m_app.remaining();
         fmt::print(stderr, "velmora: {}\n  - velmora --help tells the options and commands\n",
@@ -138,10 +155,14 @@ ExitCode CommandLine::run(int argc, char const* const* argv)
 ExitCode CommandLine::runAction()
 {
     try {
-        return m_action(m_options);
+        ExitCode const code = m_action(m_options);
+        flushOutput();
+        return code;
     } catch (Failure const& failure) {
         report(failure);
         return failure.code();
+    } catch (std::system_error const& error) {
+        return judge(error);
     } catch (std::exception const& error) {
         fmt::print(stderr, "velmora: {}\n", error.what());
         return ExitCode::Failed;

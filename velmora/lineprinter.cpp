@@ -1,6 +1,6 @@
 #include "velmora/lineprinter.h"
+#include "velmora/output.h"
 
-#include <cstdio>
 #include <utility>
 
 namespace velmora {
@@ -9,12 +9,25 @@ LinePrinter::LinePrinter() : m_thread([this] { run(); }) {}
 
 LinePrinter::~LinePrinter()
 {
+    stop();
+}
+
+void LinePrinter::stop()
+{
     {
         std::lock_guard const lock(m_mutex);
         m_stop = true;
         m_wake.notify_one();
     }
-    m_thread.join();
+    if (m_thread.joinable()) {
+        m_thread.join();
+    }
+}
+
+void LinePrinter::finish()
+{
+    stop();
+    readerGone();
 }
 
 void LinePrinter::print(std::string const& line)
@@ -34,6 +47,9 @@ std::size_t LinePrinter::lines() const
 bool LinePrinter::readerGone() const
 {
     std::lock_guard const lock(m_mutex);
+    if (m_failure != nullptr) {
+        std::rethrow_exception(m_failure);
+    }
     return m_readerGone;
 }
 
@@ -44,10 +60,16 @@ void LinePrinter::run()
         m_wake.wait(lock, [this] { return m_stop || !m_text.empty(); });
         std::string const text = std::exchange(m_text, {});
         lock.unlock();
-        bool const written =
-            std::fwrite(text.data(), 1, text.size(), stdout) == text.size() && std::fflush(stdout) == 0;
+        bool written = false;
+        std::exception_ptr failure;
+        try {
+            written = writeOutput(text);
+        } catch (Failure const&) {
+            failure = std::current_exception();
+        }
         lock.lock();
         m_readerGone = m_readerGone || !written;
+        m_failure = failure != nullptr ? failure : m_failure;
     }
 }
 

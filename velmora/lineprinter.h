@@ -2,6 +2,7 @@
 
 #include <condition_variable>
 #include <cstddef>
+#include <exception>
 #include <mutex>
 #include <string>
 #include <thread>
@@ -21,19 +22,24 @@ public:
     // Queues one line, its end included. Any thread.
     void print(std::string const& line);
 
+    // Prints what was handed in; nothing more may be. Throws Failure if the output can't be written.
+    void finish();
+
     // How many lines were handed in. Any thread.
     std::size_t lines() const;
-    // Whether nobody reads any more, or the output can't be written. Any thread.
+    // Whether nobody reads any more. Throws Failure if the output can't be written. Any thread.
     bool readerGone() const;
 
 private:
     void run();
+    void stop();
 
     mutable std::mutex m_mutex;
     std::condition_variable m_wake;
     std::string m_text; // protected by m_mutex, as what follows
     std::size_t m_lines = 0;
     bool m_readerGone = false;
+    std::exception_ptr m_failure;
     bool m_stop = false;
     std::thread m_thread;
 };

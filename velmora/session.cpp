@@ -15,7 +15,6 @@
 #include <obd/idevice.h>
 #include <obd/iecu.h>
 #include <obd/ivelmorasettings.h>
-#include <obd/library.h>
 #include <obd/obdvelmorabuilder.h>
 #include <thread>
 
@@ -38,9 +37,9 @@ std::string portKey()
 Session::Session(GlobalOptions const& options)
     : m_options(options), m_deadline([this] { m_bridge->invalidate(); }),
       m_settings(std::make_shared<SettingsStore>(
-          options.settingsFile.empty() ? SettingsStore::defaultFile() : std::filesystem::path(options.settingsFile)))
+          options.settingsFile.empty() ? SettingsStore::defaultFile() : std::filesystem::path(options.settingsFile))),
+      m_library(options.logFile)
 {
-    obd::LIBOBDOpen(m_options.logFile);
     m_obd = obd::ObdVelmoraBuilder::createObdVelmora(0, 0, 0, m_settings);
     if (m_options.units) {
         m_obd->getSettings()->setUnitSystem(*m_options.units);
@@ -58,7 +57,6 @@ Session::~Session()
         m_obd->getConnectionManager()->removeLogger(m_trace.get());
     }
     m_obd.reset();
-    obd::LIBOBDClose();
 }
 
 std::shared_ptr<obd::IObdProxy> Session::proxy() const
@@ -116,7 +114,20 @@ void Session::connect()
     if (!openOnThread()) {
         failOpening(address);
     }
+    if (m_options.verbose) {
+        tellConnected();
+    }
     selectEcu();
+}
+
+void Session::tellConnected() const
+{
+    std::shared_ptr<obd::IAdapter> const found = adapter();
+    fmt::print(stderr, "Connected: {} {}, {}\n", found->device(), found->description(),
+               found->getProtocolDescription());
+    for (std::shared_ptr<obd::IEcu> const& ecu : m_obd->getEcuManager()->getEcus()) {
+        fmt::print(stderr, "Control module {:X}: {} ({})\n", ecu->id(), ecu->name(), ecu->description());
+    }
 }
 
 // The opening may take minutes; meanwhile this thread dispatches and listens for Ctrl-C.

@@ -3,6 +3,7 @@
 #include "velmora/deadline.h"
 #include "velmora/dispatchloop.h"
 #include "velmora/globaloptions.h"
+#include "velmora/libraryuse.h"
 #include "velmora/port/bridgepump.h"
 #include "velmora/port/portaddress.h"
 
@@ -59,6 +60,7 @@ private:
     obd::VehicleProtocol protocol() const;
     bool openOnThread();
     [[noreturn]] void failOpening(PortAddress const& address);
+    void tellConnected() const;
     void selectEcu();
     void close();
 
@@ -66,6 +68,7 @@ private:
     // Ends the waiting for a silent adapter soon after a close or an interruption began.
     Deadline m_deadline;
     std::shared_ptr<SettingsStore> m_settings;
+    LibraryUse const m_library;
     DispatchLoop m_loop;
     std::shared_ptr<obd::IObdVelmora> m_obd;
     std::shared_ptr<obd::DataBridge> m_bridge;

@@ -75,7 +75,7 @@ VehicleReport readVehicle(Session& session)
     report.adapter = readAdapter(session);
     report.protocol = readProtocol(session);
     CodeReader reader(session);
-    for (auto const& ecu : session.obd().getEcuManager()->getEcus()) {
+    for (auto const& ecu : session.selectedModules()) {
         if (!session.options().quiet) {
             fmt::print(stderr, "Reading {:X} {} ...\n", ecu->id(), ecu->name());
         }

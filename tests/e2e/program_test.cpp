@@ -4,8 +4,10 @@
 #include "tests/support/jsonschema.h"
 
 #include <chrono>
+#include <cstdlib>
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
+#include <sys/wait.h>
 #include <thread>
 
 namespace {
@@ -53,10 +55,11 @@ TEST(Program, WrongUseIsExitCodeTwoAndSaysWhatToDo)
 
 TEST(Program, PortThatDoesNotExistIsExitCodeThree)
 {
-    for (char const* port : {"/dev/no-such-port", "127.0.0.1:1", "sim:no-such-car", "replay:/no/such/file"}) {
+    for (char const* port : {"/dev/no-such-port", "127.0.0.1:1", "/dev/null", "sim:no-such-car", "sim:/",
+                             "replay:/no/such/file", "replay:/"}) {
         Outcome const outcome = runVelmora({"-p", port, "scan"});
         EXPECT_EQ(outcome.exitCode, 3) << port << outcome.err;
-        EXPECT_FALSE(outcome.err.empty());
+        EXPECT_TRUE(holds(outcome.err, "\n  - ")) << port << outcome.err;
     }
 }
 
@@ -71,6 +74,23 @@ TEST(Program, SettingsFileThatIsBrokenIsToldWithItsLine)
     EXPECT_EQ(outcome.exitCode, 1);
     EXPECT_TRUE(holds(outcome.err, "line 2")) << outcome.err;
     std::remove(file.c_str());
+}
+
+TEST(Program, FileThatCantBeWrittenIsExitCodeOneAndTold)
+{
+    for (char const* option : {"--log", "--trace"}) {
+        Outcome const outcome = runVelmora({"-p", "sim:", option, "/no/such/folder/file", "info"});
+        EXPECT_EQ(outcome.exitCode, 1) << option;
+        EXPECT_TRUE(holds(outcome.err, "/no/such/folder/file\n  - ")) << outcome.err;
+    }
+}
+
+TEST(Program, OutputThatCantBeWrittenIsExitCodeOne)
+{
+    for (std::string const arguments : {"dtc P0420", "dtc --dump", "--help"}) {
+        std::string const command = VELMORA_PROGRAM " " + arguments + " > /dev/full 2>&1";
+        EXPECT_EQ(WEXITSTATUS(std::system(command.c_str())), 1) << arguments;
+    }
 }
 
 TEST(Program, SilentAdapterIsExitCodeFour)

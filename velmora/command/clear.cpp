@@ -2,6 +2,7 @@
 #include "velmora/command/confirm.h"
 #include "velmora/commandline.h"
 #include "velmora/failure.h"
+#include "velmora/output.h"
 #include "velmora/servicereplies.h"
 #include "velmora/session.h"
 #include "velmora/view/json.h"
@@ -127,7 +128,7 @@ ExitCode clear(GlobalOptions const& options)
     } else {
         printText(outcomes);
     }
-    std::fflush(stdout);
+    flushOutput();
     return judge(outcomes);
 }
 

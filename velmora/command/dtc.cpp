@@ -2,13 +2,15 @@
 #include "velmora/command/commands.h"
 #include "velmora/commandline.h"
 #include "velmora/failure.h"
+#include "velmora/libraryuse.h"
+#include "velmora/output.h"
+#include "velmora/text.h"
 #include "velmora/view/json.h"
 #include "velmora/view/troublecode.h"
 
 #include <algorithm>
 #include <fmt/format.h>
 #include <memory>
-#include <obd/library.h>
 #include <obd/troublecodecatalogue.h>
 
 namespace velmora {
@@ -22,23 +24,6 @@ struct DtcOptions
     std::string maker;
     bool dump = false;
 };
-
-class OpenCatalogue
-{
-public:
-    explicit OpenCatalogue(std::string const& logFile) { obd::LIBOBDOpen(logFile); }
-    ~OpenCatalogue() { obd::LIBOBDClose(); }
-    OpenCatalogue(OpenCatalogue const&) = delete;
-    OpenCatalogue& operator=(OpenCatalogue const&) = delete;
-};
-
-std::string upperCase(std::string text)
-{
-    std::transform(text.begin(), text.end(), text.begin(), [](char character) {
-        return character >= 'a' && character <= 'z' ? static_cast<char>(character - 'a' + 'A') : character;
-    });
-    return text;
-}
 
 // A generic meaning holds for every maker's vehicles.
 void keepMaker(std::vector<TroubleCode::Meaning>& meanings, std::string const& maker)
@@ -56,7 +41,7 @@ ExitCode explain(DtcOptions const& options, std::string const& maker, bool json)
     std::vector<TroubleCode> found;
     std::vector<std::string> wrong;
     for (std::string const& text : options.codes) {
-        auto const models = obd::TroubleCodeCatalogue::getTroubleCodes(upperCase(text));
+        auto const models = obd::TroubleCodeCatalogue::getTroubleCodes(toUpper(text));
         if (models.empty()) {
             wrong.push_back("\"" + text + "\"");
             continue;
@@ -76,7 +61,7 @@ ExitCode explain(DtcOptions const& options, std::string const& maker, bool json)
         }
     }
     if (!wrong.empty()) {
-        std::fflush(stdout);
+        flushOutput();
         throw Failure(ExitCode::WrongUse,
                       fmt::format("{} {}", fmt::join(wrong, ", "),
                                   wrong.size() == 1 ? "is no trouble code" : "are no trouble codes"),
@@ -130,7 +115,7 @@ ExitCode explainCodes(DtcOptions const& options, GlobalOptions const& global)
                       {"velmora dtc P0420 explains a code; velmora dtc --search catalyst finds codes"});
     }
     std::string const maker = options.maker.empty() ? std::string() : findMaker(options.maker);
-    OpenCatalogue const catalogue(global.logFile);
+    LibraryUse const catalogue(global.logFile);
     return options.codes.empty() ? listRows(options, maker, global.json) : explain(options, maker, global.json);
 }
 

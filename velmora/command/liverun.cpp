@@ -2,10 +2,10 @@
 
 #include "velmora/failure.h"
 #include "velmora/interrupt.h"
+#include "velmora/output.h"
 #include "velmora/view/livelines.h"
 
 #include <algorithm>
-#include <cerrno>
 #include <cstdio>
 #include <fmt/format.h>
 
@@ -20,16 +20,6 @@ using std::chrono::seconds;
 constexpr milliseconds step{50};
 constexpr seconds silence{3};
 constexpr seconds longSilence{15};
-
-// False if the reader has gone.
-bool writeOut(std::string const& text)
-{
-    bool const written = std::fwrite(text.data(), 1, text.size(), stdout) == text.size() && std::fflush(stdout) == 0;
-    if (!written && errno != EPIPE) {
-        throw Failure(ExitCode::Failed, "Could not write to standard output");
-    }
-    return written;
-}
 
 } // namespace
 
@@ -103,7 +93,7 @@ void LiveRun::finish()
         FrameStyle whole;
         whole.columns = 200;
         whole.rows = m_table.rows().size() + whole.rows;
-        writeOut(drawTable(m_table.rows(), 0, title(), {}, whole));
+        writeOutput(drawTable(m_table.rows(), 0, title(), {}, whole));
     }
     if (m_session.options().verbose) {
         tellRate();
@@ -182,7 +172,7 @@ void LiveRun::print(int pid)
     for (LiveRow const* row : m_table.rowsOf(pid)) {
         text += m_session.options().json ? toJsonLine(*row, time) : toLine(*row);
     }
-    m_readerGone = m_readerGone || !writeOut(text);
+    m_readerGone = m_readerGone || !writeOutput(text);
 }
 
 // Requests that fail are tried again without a word, so silence is all that tells.

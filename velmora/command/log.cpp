@@ -36,18 +36,27 @@ public:
         m_service->attach(this);
         m_service->startLogging();
     }
-    ~TrafficLog() override
-    {
-        m_service->stopLogging();
-        m_service->detach(this);
-    }
+    ~TrafficLog() override { stop(); }
     TrafficLog(TrafficLog const&) = delete;
     TrafficLog& operator=(TrafficLog const&) = delete;
 
     bool printed(std::size_t entries) const { return m_printer.lines() >= entries; }
     bool readerGone() const { return m_printer.readerGone(); }
 
+    // Ends with what was logged so far. Throws Failure if it can't be printed.
+    void finish()
+    {
+        stop();
+        m_printer.finish();
+    }
+
 private:
+    void stop()
+    {
+        m_service->stopLogging();
+        m_service->detach(this);
+    }
+
     void onLogEntryAdded(std::shared_ptr<obd::MessageDataModel> const& entry) override
     {
         m_printer.print(m_json ? toJsonLine(*entry) : toLine(*entry));
@@ -66,7 +75,7 @@ SensorIds chosenSensors(std::vector<std::string> const& names, obd::ISensorServi
 ExitCode log(LogOptions const& chosen, GlobalOptions const& options)
 {
     Session session(options);
-    TrafficLog const traffic(options.json);
+    TrafficLog traffic(options.json);
     session.connect();
     auto const sensors = obd::SensorServiceBuilder::createSensorService();
     sensors->startUpdates(chosenSensors(chosen.sensors, *sensors));
@@ -82,6 +91,7 @@ ExitCode log(LogOptions const& chosen, GlobalOptions const& options)
         session.loop().runUntil([&] { return Interrupt::instance().raised() || Clock::now() >= limit; }, limit);
         session.check();
     }
+    traffic.finish();
     return ExitCode::Done;
 }
 

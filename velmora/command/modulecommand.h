@@ -1,11 +1,11 @@
 #pragma once
 
 #include "velmora/failure.h"
+#include "velmora/output.h"
 #include "velmora/session.h"
 #include "velmora/view/moduletopic.h"
 
 #include <algorithm>
-#include <cstdio>
 #include <fmt/format.h>
 #include <obd/iecu.h>
 #include <type_traits>
@@ -31,7 +31,7 @@ template <typename Report>
 void print(std::vector<ModuleTopic<Report>> const& modules, GlobalOptions const& options)
 {
     fmt::print("{}", options.json ? toJson(modules) : toText(modules, outputStyle(options)));
-    std::fflush(stdout);
+    flushOutput();
 }
 
 // Throws, if no module told anything: that the vehicle is silent, if one offers it, else what is given.

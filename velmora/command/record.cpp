@@ -33,8 +33,8 @@ std::string headerText(std::string text, char const* otherwise)
 void readSensors(Session& session)
 {
     auto const service = obd::SensorServiceBuilder::createSensorService();
-    for (auto const& ecu : session.obd().getEcuManager()->getEcus()) {
-        session.obd().getEcuManager()->setCurrentEcu(ecu->id());
+    for (auto const& ecu : session.selectedModules()) {
+        session.select(*ecu);
         for (obd::ParameterIdentifier::Id const id : service->getSupportedIds()) {
             service->fetchSensors(id);
             session.check();

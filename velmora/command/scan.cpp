@@ -1,11 +1,11 @@
 #include "velmora/command/commands.h"
 #include "velmora/commandline.h"
 #include "velmora/failure.h"
+#include "velmora/output.h"
 #include "velmora/session.h"
 #include "velmora/vehiclereader.h"
 
 #include <algorithm>
-#include <cstdio>
 #include <fmt/format.h>
 
 namespace velmora {
@@ -23,7 +23,7 @@ ExitCode check(VehicleReport const& report)
         return ExitCode::Findings;
     }
     if (!anyModule(canBeChecked)) {
-        std::fflush(stdout);
+        flushOutput();
         throw Failure(ExitCode::NotSupported, "No control module told its trouble codes, so there is nothing to check",
                       {"is the ignition on?"});
     }

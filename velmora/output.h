@@ -1,0 +1,20 @@
+#pragma once
+
+#include "velmora/failure.h"
+
+#include <string>
+
+// Standard output: what is printed there is buffered, so that it may fail late.
+
+namespace velmora {
+
+// Writes at once. False if the reader has gone, who has read enough then. Throws Failure if the text can't be written.
+bool writeOutput(std::string const& text);
+
+// Writes what was printed so far; throws std::system_error, as printing does, if that fails.
+void flushOutput();
+
+// What to tell of an error number of standard output.
+Failure outputFailure(int error);
+
+} // namespace velmora
