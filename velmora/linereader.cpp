@@ -30,6 +30,7 @@ bool LineReader::fill()
     while (::poll(&input, 1, 100) <= 0) {
         m_session.check();
     }
+    m_session.check();
     char bytes[512];
     ssize_t const count = ::read(STDIN_FILENO, bytes, sizeof bytes);
     if (count > 0) {

@@ -31,6 +31,16 @@ TEST(Keys, ArrowsComeInBothOfTheirForms)
               (std::vector<int>{static_cast<int>(Key::PageUp), static_cast<int>(Key::PageDown)}));
 }
 
+TEST(Keys, CursorKeysComeInAllTheirForms)
+{
+    EXPECT_EQ(keys("\033[D\033OD\033[C\033OC"),
+              (std::vector<int>{static_cast<int>(Key::Left), static_cast<int>(Key::Left), static_cast<int>(Key::Right),
+                                static_cast<int>(Key::Right)}));
+    EXPECT_EQ(keys("\033[H\033[1~\033[F\033[4~\033[3~"),
+              (std::vector<int>{static_cast<int>(Key::Home), static_cast<int>(Key::Home), static_cast<int>(Key::End),
+                                static_cast<int>(Key::End), static_cast<int>(Key::Delete)}));
+}
+
 TEST(Keys, EscapeAloneIsAKey)
 {
     EXPECT_EQ(keys("\033"), std::vector<int>{static_cast<int>(Key::Escape)});

@@ -1,10 +1,13 @@
 #include "velmora/command/commands.h"
 #include "velmora/commandline.h"
 #include "velmora/linereader.h"
+#include "velmora/output.h"
+#include "velmora/promptreader.h"
 #include "velmora/session.h"
 
 #include <cstdio>
 #include <fmt/format.h>
+#include <optional>
 #include <unistd.h>
 
 namespace velmora {
@@ -24,37 +27,61 @@ void answer(Session& session, std::string const& command)
         // The driver takes the adapter's error words and "?" off every reply.
         fmt::print("(no data)\n");
     }
-    std::fflush(stdout);
+    flushOutput();
 }
+
+// Asks for each command if a user is there to be asked.
+class CommandSource
+{
+public:
+    explicit CommandSource(Session const& session)
+        : m_lines(session), m_asking(::isatty(STDIN_FILENO) != 0 && !session.options().quiet)
+    {
+        if (m_asking && PromptReader::isUsable()) {
+            m_prompt.emplace(session);
+        }
+    }
+
+    // False at the end of the input.
+    bool read(std::string& command)
+    {
+        if (m_prompt) {
+            return m_prompt->read(command);
+        }
+        if (m_asking) {
+            fmt::print(stderr, "> ");
+        }
+        return m_lines.read(command);
+    }
+
+private:
+    LineReader m_lines;
+    bool m_asking;
+    std::optional<PromptReader> m_prompt;
+};
 
 ExitCode console(GlobalOptions const& options)
 {
     Session session(options);
     session.connect();
-    bool const prompting = ::isatty(STDIN_FILENO) != 0 && !options.quiet;
-    LineReader lines(session);
+    CommandSource commands(session);
     std::string command;
-    while (true) {
-        if (prompting) {
-            fmt::print(stderr, "> ");
-        }
-        if (!lines.read(command)) {
-            return ExitCode::Done;
-        }
-        if (command == "exit" || command == "quit") {
-            return ExitCode::Done;
-        }
+    while (commands.read(command) && command != "exit" && command != "quit") {
         if (!command.empty()) {
             answer(session, command);
         }
     }
+    return ExitCode::Done;
 }
 
 } // namespace
 
 void addConsoleCommand(CommandLine& commandLine)
 {
-    commandLine.addCommand("console", "Talk to the adapter, line by line; reads commands from a pipe as well", console);
+    commandLine.addCommand(
+        "console",
+        "Talk to the adapter, line by line, earlier lines with the arrow keys; reads commands from a pipe as well",
+        console);
 }
 
 } // namespace velmora
