@@ -158,7 +158,7 @@ std::string ReplayScript::banner() const
 {
     for (const auto& row : m_rows) {
         if (row.key == "ATI" || row.key == "ATZ" || row.key == "ATWS") {
-            const std::string name = firstName(withoutEcho(row.exchange->received(), row.key));
+            std::string name = firstName(withoutEcho(row.exchange->received(), row.key));
             if (!name.empty()) {
                 return name;
             }

@@ -24,7 +24,7 @@ Adapter::Adapter(AdapterProfile profile, std::shared_ptr<Vehicle> vehicle, std::
     : m_profile(std::move(profile)), m_script(std::move(script)), m_bus(std::move(vehicle), m_profile.quirks)
 {
     m_settings.linefeeds = has(Quirk::LinefeedsOn);
-    connect();
+    Adapter::connect();
 }
 
 void Adapter::receive(std::string_view bytes)

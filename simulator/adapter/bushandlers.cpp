@@ -38,7 +38,7 @@ CommandReply tryProtocol(CommandContext& context, const std::string& argument)
 /// Unlike the protocol that is only tried, this one outlasts a reset.
 CommandReply setProtocol(CommandContext& context, const std::string& argument)
 {
-    const CommandReply reply = tryProtocol(context, argument);
+    CommandReply reply = tryProtocol(context, argument);
     context.bus.store();
     return reply;
 }

@@ -73,8 +73,7 @@ std::string FrameWriter::serialLine(const Frame& frame) const
 std::string FrameWriter::header(const Frame& frame) const
 {
     const std::string blank = m_settings.spaces ? " " : "";
-    const std::string id =
-        m_protocol.family == BusFamily::Can11 ? hexNumber(frame.source, 3) + blank : text(frame.header);
+    std::string id = m_protocol.family == BusFamily::Can11 ? hexNumber(frame.source, 3) + blank : text(frame.header);
     if (!m_settings.lengths) {
         return id;
     }

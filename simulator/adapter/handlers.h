@@ -2,10 +2,8 @@
 
 #include "simulator/adapter/command.h"
 
-namespace obdsim {
-
 /// The commands behind the table in command.cpp.
-namespace handler {
+namespace obdsim::handler {
 
 CommandReply accept(CommandContext& context, const std::string& argument);
 CommandReply reset(CommandContext& context, const std::string& argument);
@@ -53,6 +51,4 @@ CommandReply onOff(CommandContext& context, const std::string& argument)
     return ok();
 }
 
-} // namespace handler
-
-} // namespace obdsim
+} // namespace obdsim::handler

@@ -18,6 +18,7 @@ constexpr std::uint32_t replyOffset11 = 8; // 7E0 is answered by 7E8
 Bytes bigEndian(std::uint32_t number, std::size_t size)
 {
     Bytes bytes(size);
+    // NOLINTNEXTLINE(modernize-loop-convert): clang before 16 can't compile the library's reversing views
     for (auto byte = bytes.rbegin(); byte != bytes.rend(); ++byte) {
         *byte = static_cast<std::uint8_t>(number & 0xFF);
         number >>= 8;
