@@ -84,7 +84,8 @@ OxygenReport readOxygen(Session& session, obd::IEcu const& ecu)
     OxygenReport report;
     report.answer = TopicAnswer::Read;
     report.onCan = ecu.protocol() == obd::ObdProtocolCan11 || ecu.protocol() == obd::ObdProtocolCan29;
-    if (ecu.isSupported(obd::ObdMode::CurrentData, monitorStatus, 0)) {
+    // Whether the monitor has run means nothing of a module that does not tell what monitors it has.
+    if (ecu.isSupported(obd::ObdMode::CurrentData, monitorStatus, 0) && !service->fetchReadinessMonitors().empty()) {
         report.complete = service->isOxygenSensorTestComplete();
     }
     for (obd::OxygenSensorLocation const location : locations) {

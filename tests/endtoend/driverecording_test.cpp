@@ -152,14 +152,18 @@ void DriveRecording::compare(DriveColumn const& column)
     }
 }
 
-// A sensor that the drive does not move, once it has been read. Some are never told.
+// A sensor that the drive does not move. Some are never told; and on a slow machine the application may hear of a reading
+// so late that the table drops the one before.
 void DriveRecording::expectConstant(std::size_t column) const
 {
-    std::string const& value = m_recorded->rows.back().at(column);
-    bool read = false;
+    std::map<std::string, int> times;
     for (auto const& row : m_recorded->rows) {
-        read = read || row.at(column) != "-";
-        EXPECT_TRUE(!read || row.at(column) == value) << m_recorded->titles[column] << " " << row.at(column);
+        ++times[row.at(column)];
+    }
+    times.erase("-");
+    EXPECT_LE(times.size(), 1U) << m_recorded->titles[column];
+    if (!times.empty()) {
+        EXPECT_GE(times.begin()->second, 15) << m_recorded->titles[column];
     }
 }
 
