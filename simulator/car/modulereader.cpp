@@ -146,7 +146,7 @@ Routine readRoutine(TableReader& table)
 
 std::vector<std::uint8_t> readLive(TableReader& table)
 {
-    const Bytes pids = table.bytes("live");
+    Bytes pids = table.bytes("live");
     for (const auto pid : pids) {
         if (!isLivePid(pid)) {
             table.fail("live", "the drive model has no PID " + hexByte(pid));
