@@ -1,6 +1,8 @@
 #include "velmora/diagnosticreaders.h"
+#include "velmora/text.h"
 #include "velmora/view/unitlabel.h"
 
+#include <algorithm>
 #include <obd/iecuservice.h>
 #include <obd/itroublecodeservice.h>
 
@@ -27,6 +29,17 @@ InfoReport::Travel readTravel(Session& session, bool sinceMil)
     return travel;
 }
 
+std::string shown(std::string const& text)
+{
+    return readable(text);
+}
+
+std::vector<std::string> shown(std::vector<std::string> texts)
+{
+    std::transform(texts.begin(), texts.end(), texts.begin(), readable);
+    return texts;
+}
+
 // Asks the vehicle only for what the module says it has.
 class InfoFetch
 {
@@ -41,9 +54,9 @@ public:
         if (!((*m_service).*has)()) {
             return {};
         }
-        Value value = ((*m_service).*fetch)();
+        Value const value = ((*m_service).*fetch)();
         m_session.check();
-        return value;
+        return shown(value);
     }
 
 private:
@@ -59,7 +72,7 @@ InfoReport readInfo(Session& session, obd::IEcu const& ecu)
     session.select(ecu);
     InfoFetch const fetch(session);
     InfoReport report;
-    report.description = fetch.service().ecuDescription();
+    report.description = readable(fetch.service().ecuDescription());
     report.standard = fetch.service().standardDescription();
     report.protocol = fetch.service().protocolDescription();
     report.vin = fetch(&Service::hasVehicleIdentificationNumber, &Service::fetchVehicleIdentificationNumber);

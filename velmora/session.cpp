@@ -5,6 +5,7 @@
 #include "velmora/port/openport.h"
 #include "velmora/port/recordedport.h"
 #include "velmora/settingsstore.h"
+#include "velmora/text.h"
 #include "velmora/traffictrace.h"
 
 #include <atomic>
@@ -123,10 +124,11 @@ void Session::connect()
 void Session::tellConnected() const
 {
     std::shared_ptr<obd::IAdapter> const found = adapter();
-    fmt::print(stderr, "Connected: {} {}, {}\n", found->device(), found->description(),
-               found->getProtocolDescription());
+    fmt::print(stderr, "Connected: {} {}, {}\n", readable(found->device()), readable(found->description()),
+               readable(found->getProtocolDescription()));
     for (std::shared_ptr<obd::IEcu> const& ecu : m_obd->getEcuManager()->getEcus()) {
-        fmt::print(stderr, "Control module {:X}: {} ({})\n", ecu->id(), ecu->name(), ecu->description());
+        fmt::print(stderr, "Control module {:X}: {} ({})\n", ecu->id(), readable(ecu->name()),
+                   readable(ecu->description()));
     }
 }
 
@@ -170,7 +172,8 @@ void Session::failOpening(PortAddress const& address)
                        "pull the adapter and plug it in again, or try --reset"});
     }
     throw Failure(ExitCode::VehicleSilent,
-                  "The adapter (" + found->device() + ") on " + port + " works, but no control module answers",
+                  "The adapter (" + readable(found->device()) + ") on " + port +
+                      " works, but no control module answers",
                   {"is the ignition on?", "is the adapter firmly in the car's OBD socket?",
                    "a car that is not found automatically may answer on a protocol you choose: --protocol 1 to 9"});
 }

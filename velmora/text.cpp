@@ -27,7 +27,37 @@ std::string firstCharacters(std::string const& text, std::size_t count)
     return text.substr(0, end);
 }
 
+// How many bytes the UTF-8 character at the place has; 0 if there is none that may be shown.
+std::size_t characterLength(std::string const& text, std::size_t at)
+{
+    auto const lead = static_cast<unsigned char>(text[at]);
+    if (lead < 0x80) {
+        return lead >= ' ' && lead != 0x7F ? 1 : 0;
+    }
+    std::size_t const length = lead >= 0xC2 && lead < 0xE0   ? 2
+                               : lead >= 0xE0 && lead < 0xF0 ? 3
+                               : lead >= 0xF0 && lead < 0xF5 ? 4
+                                                             : 0;
+    for (std::size_t i = 1; i < length; ++i) {
+        if (at + i >= text.size() || !isContinuation(text[at + i])) {
+            return 0;
+        }
+    }
+    return length;
+}
+
 } // namespace
+
+std::string readable(std::string const& text)
+{
+    std::string result;
+    for (std::size_t at = 0; at < text.size();) {
+        std::size_t const length = characterLength(text, at);
+        result += length == 0 ? "\xEF\xBF\xBD" : text.substr(at, length);
+        at += std::max<std::size_t>(length, 1);
+    }
+    return result;
+}
 
 std::string toUpper(std::string text)
 {

@@ -16,6 +16,10 @@ std::optional<unsigned int> parseHex(std::string const& text, unsigned int highe
 // The parts between blanks, '_' and '-'.
 std::vector<std::string> splitWords(std::string const& text);
 
+// What an adapter or a vehicle said, for people: each control character, and each byte that is no UTF-8, becomes
+// U+FFFD.
+std::string readable(std::string const& text);
+
 // How many characters a UTF-8 text shows.
 std::size_t displayWidth(std::string const& text);
 

@@ -3,6 +3,7 @@
 #include "velmora/codereader.h"
 #include "velmora/diagnosticreaders.h"
 #include "velmora/freezereader.h"
+#include "velmora/text.h"
 
 #include <cstdio>
 #include <fmt/format.h>
@@ -17,7 +18,7 @@ constexpr unsigned int replyLimitMs = 500;
 // The driver keeps the bus family only; the adapter tells the number, behind an A if it searched for it.
 ProtocolReport readProtocol(Session& session)
 {
-    ProtocolReport report{std::nullopt, session.adapter()->getProtocolDescription()};
+    ProtocolReport report{std::nullopt, readable(session.adapter()->getProtocolDescription())};
     std::string reply;
     if (session.proxy()->execute("ATDPN", reply, replyLimitMs) == obd::IDevice::Status::Ok) {
         std::size_t const digit = reply.find_first_of("123456789");
@@ -32,7 +33,7 @@ AdapterReport readAdapter(Session& session)
 {
     std::shared_ptr<obd::IAdapter> const adapter = session.adapter();
     float const volts = session.proxy()->batteryVoltage();
-    return {adapter->device(), adapter->description(), adapter->identification(),
+    return {readable(adapter->device()), readable(adapter->description()), readable(adapter->identification()),
             volts > 0.0F ? std::optional(volts) : std::nullopt};
 }
 
@@ -56,7 +57,7 @@ ModuleReport readModule(Session& session, obd::IEcu const& ecu, CodeReader& read
 {
     constexpr unsigned char newestFrame = 0;
     return {ecu.id(),
-            ecu.name(),
+            readable(ecu.name()),
             sensorsOf(ecu),
             readInfo(session, ecu),
             reader.read(ecu, {CodeKind::Confirmed, CodeKind::Pending, CodeKind::Permanent}),
@@ -77,7 +78,7 @@ VehicleReport readVehicle(Session& session)
     CodeReader reader(session);
     for (auto const& ecu : session.selectedModules()) {
         if (!session.options().quiet) {
-            fmt::print(stderr, "Reading {:X} {} ...\n", ecu->id(), ecu->name());
+            fmt::print(stderr, "Reading {:X} {} ...\n", ecu->id(), readable(ecu->name()));
         }
         report.modules.push_back(readModule(session, *ecu, reader));
     }

@@ -152,8 +152,8 @@ void DriveRecording::compare(DriveColumn const& column)
     }
 }
 
-// A sensor that the drive does not move. Some are never told; and on a slow machine the application may hear of a reading
-// so late that the table drops the one before.
+// A sensor that the drive does not move. Some are never told; and on a slow machine the application may hear of a
+// reading so late that the table drops the one before.
 void DriveRecording::expectConstant(std::size_t column) const
 {
     std::map<std::string, int> times;

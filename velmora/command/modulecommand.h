@@ -3,6 +3,7 @@
 #include "velmora/failure.h"
 #include "velmora/output.h"
 #include "velmora/session.h"
+#include "velmora/text.h"
 #include "velmora/view/moduletopic.h"
 
 #include <algorithm>
@@ -21,7 +22,7 @@ auto readModules(Session& session, Read const& read)
     using Report = std::invoke_result_t<Read const&, Session&, obd::IEcu const&>;
     std::vector<ModuleTopic<Report>> modules;
     for (std::shared_ptr<obd::IEcu> const& ecu : session.selectedModules()) {
-        modules.push_back({ecu->id(), ecu->name(), read(session, *ecu)});
+        modules.push_back({ecu->id(), readable(ecu->name()), read(session, *ecu)});
         session.check();
     }
     return modules;

@@ -1,6 +1,7 @@
 #include "velmora/command/commands.h"
 #include "velmora/commandline.h"
 #include "velmora/session.h"
+#include "velmora/text.h"
 #include "velmora/view/json.h"
 #include "velmora/view/unitlabel.h"
 
@@ -85,7 +86,7 @@ void printOffer(Offer const& offer, bool all)
 
 void printText(obd::IEcu const& ecu, bool all)
 {
-    fmt::print("Control module {:X}: {} ({})\n", ecu.id(), ecu.name(), ecu.description());
+    fmt::print("Control module {:X}: {} ({})\n", ecu.id(), readable(ecu.name()), readable(ecu.description()));
     for (Service const& service : services) {
         std::vector<std::string> const ids = identifiers(ecu, service.mode);
         fmt::print("  {:<24} {}\n", service.title, ids.empty() ? "-" : fmt::format("{}", fmt::join(ids, " ")));
