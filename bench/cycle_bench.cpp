@@ -74,7 +74,7 @@ void cycle(benchmark::State& state)
     double cpu = 0;
     double lost = 0;
     for ([[maybe_unused]] auto _ : state) {
-        velmora::CycleTap const tap(manager);
+        velmora::CycleTap const tap(manager, loop);
         auto const begin = Clock::now();
         double const cpuBefore = cpuSeconds();
         service->startUpdates(firstIds(*service, static_cast<std::size_t>(state.range(0))));

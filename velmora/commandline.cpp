@@ -25,9 +25,9 @@ constexpr char const* exitCodes =
 
 void report(Failure const& failure)
 {
-    fmt::print(stderr, "velmora: {}\n", failure.what());
+    tell(fmt::format("velmora: {}\n", failure.what()));
     for (std::string const& hint : failure.hints()) {
-        fmt::print(stderr, "  - {}\n", hint);
+        tell(fmt::format("  - {}\n", hint));
     }
 }
 
@@ -35,7 +35,7 @@ void report(Failure const& failure)
 ExitCode judge(std::system_error const& error)
 {
     if (std::ferror(stdout) == 0) {
-        fmt::print(stderr, "velmora: {}\n", error.what());
+        tell(fmt::format("velmora: {}\n", error.what()));
     } else if (error.code().value() != EPIPE) {
         report(outputFailure(error.code().value()));
     }
@@ -145,8 +145,8 @@ ExitCode CommandLine::run(int argc, char const* const* argv)
         return runAction();
     } catch (CLI::ParseError const& error) {
         std::vector<std::string> const unknown = m_app.remaining();
-        fmt::print(stderr, "velmora: {}\n  - velmora --help tells the options and commands\n",
-                   unknown.empty() ? error.what() : "\"" + unknown.front() + "\" is no command or option");
+        tell(fmt::format("velmora: {}\n  - velmora --help tells the options and commands\n",
+                         unknown.empty() ? error.what() : "\"" + unknown.front() + "\" is no command or option"));
         return ExitCode::WrongUse;
     }
     return runAction();
@@ -164,7 +164,7 @@ ExitCode CommandLine::runAction()
     } catch (std::system_error const& error) {
         return judge(error);
     } catch (std::exception const& error) {
-        fmt::print(stderr, "velmora: {}\n", error.what());
+        tell(fmt::format("velmora: {}\n", error.what()));
         return ExitCode::Failed;
     }
 }

@@ -1,7 +1,5 @@
 #include "velmora/cyclemeter.h"
 
-#include <obd/dispatcher.h>
-
 namespace velmora {
 
 void CycleMeter::onRequest(Time now)
@@ -34,15 +32,15 @@ double CycleMeter::lostShare() const
     return all > 0.0 ? lost / all : 0.0;
 }
 
-CycleTap::CycleTap(obd::IConnectionManager& manager) : m_manager(manager)
+CycleTap::CycleTap(obd::IConnectionManager& manager, DispatchLoop& loop) : m_manager(manager), m_loop(loop)
 {
     m_manager.addLogger(this);
-    obd::Dispatcher::getInstance().attach(this);
+    m_loop.setListener([this] { m_meter.onDone(std::chrono::steady_clock::now()); });
 }
 
 CycleTap::~CycleTap()
 {
-    obd::Dispatcher::getInstance().detach(this);
+    m_loop.setListener(nullptr);
     m_manager.removeLogger(this);
 }
 
@@ -52,10 +50,5 @@ void CycleTap::onDataSent(std::vector<unsigned char> const& /*data*/)
 }
 
 void CycleTap::onDataReceived(std::vector<unsigned char> const& /*data*/) {}
-
-void CycleTap::onDispatchRequested()
-{
-    m_meter.onDone(std::chrono::steady_clock::now());
-}
 
 } // namespace velmora

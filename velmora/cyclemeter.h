@@ -1,11 +1,11 @@
 #pragma once
 
+#include "velmora/dispatchloop.h"
+
 #include <chrono>
-#include <common/observer.h>
 #include <mutex>
 #include <obd/iconnectionlogger.h>
 #include <obd/iconnectionmanager.h>
-#include <obd/idispatchrunner.h>
 
 namespace velmora {
 
@@ -31,12 +31,12 @@ private:
     Time::duration m_lost{0};
 };
 
-// Feeds a meter from a connection and from the dispatcher for as long as it lives.
-class CycleTap : public obd::IConnectionLogger, public tervex::Observer<obd::IDispatchRunner>
+// Feeds a meter from a connection and from the loop that dispatches for as long as it lives.
+class CycleTap : public obd::IConnectionLogger
 {
 public:
-    // The manager must outlive it.
-    explicit CycleTap(obd::IConnectionManager& manager);
+    // Both must outlive it.
+    CycleTap(obd::IConnectionManager& manager, DispatchLoop& loop);
     ~CycleTap() override;
     CycleTap(CycleTap const&) = delete;
     CycleTap& operator=(CycleTap const&) = delete;
@@ -46,9 +46,9 @@ public:
 private:
     void onDataSent(std::vector<unsigned char> const& data) override;
     void onDataReceived(std::vector<unsigned char> const& data) override;
-    void onDispatchRequested() override;
 
     obd::IConnectionManager& m_manager;
+    DispatchLoop& m_loop;
     CycleMeter m_meter;
 };
 

@@ -20,6 +20,15 @@ void DispatchLoop::onDispatchRequested()
     std::lock_guard const lock(m_mutex);
     ++m_requests;
     m_wake.notify_one();
+    if (m_listener) {
+        m_listener();
+    }
+}
+
+void DispatchLoop::setListener(std::function<void()> listener)
+{
+    std::lock_guard const lock(m_mutex);
+    m_listener = std::move(listener);
 }
 
 void DispatchLoop::wake()

@@ -21,6 +21,9 @@ public:
 
     // Any thread.
     void onDispatchRequested() override;
+    // Called with every request to dispatch, on the thread that makes it, which it must not hold up. Null removes it;
+    // once that has returned, it isn't running any more.
+    void setListener(std::function<void()> listener);
     // Makes runUntil look at its condition. Any thread.
     void wake();
 
@@ -32,8 +35,9 @@ public:
 private:
     std::mutex m_mutex;
     std::condition_variable m_wake;
-    unsigned int m_requests = 0; // protected by m_mutex
-    bool m_woken = false;        // protected by m_mutex
+    std::function<void()> m_listener; // protected by m_mutex
+    unsigned int m_requests = 0;      // protected by m_mutex
+    bool m_woken = false;             // protected by m_mutex
 };
 
 } // namespace velmora

@@ -23,6 +23,11 @@ void flushOutput()
     }
 }
 
+void tell(std::string const& text)
+{
+    std::fputs(text.c_str(), stderr);
+}
+
 Failure outputFailure(int error)
 {
     return {ExitCode::Failed,

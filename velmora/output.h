@@ -14,6 +14,9 @@ bool writeOutput(std::string const& text);
 // Writes what was printed so far; throws std::system_error, as printing does, if that fails.
 void flushOutput();
 
+// Writes to standard error. Where that can't be written to there is nobody to be told.
+void tell(std::string const& text);
+
 // What to tell of an error number of standard output.
 Failure outputFailure(int error);
 

@@ -2,6 +2,7 @@
 
 #include "velmora/failure.h"
 #include "velmora/interrupt.h"
+#include "velmora/output.h"
 #include "velmora/session.h"
 
 #include <cstdlib>
@@ -33,11 +34,11 @@ bool PromptReader::read(std::string& line)
     draw();
     try {
         LineEditor::State const state = typeOn();
-        fmt::print(stderr, "\n");
+        tell("\n");
         line = m_editor.take();
         return state == LineEditor::State::Entered;
     } catch (Failure const&) {
-        fmt::print(stderr, "\n"); // what is told next has a line of its own
+        tell("\n"); // what is told next has a line of its own
         throw;
     }
 }
@@ -64,7 +65,7 @@ LineEditor::State PromptReader::typeOn()
 void PromptReader::draw() const
 {
     std::size_t const behind = m_editor.text().size() - m_editor.cursor();
-    fmt::print(stderr, "\r> {}\033[K{}", m_editor.text(), behind > 0 ? fmt::format("\033[{}D", behind) : "");
+    tell(fmt::format("\r> {}\033[K{}", m_editor.text(), behind > 0 ? fmt::format("\033[{}D", behind) : ""));
 }
 
 } // namespace velmora

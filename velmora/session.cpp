@@ -2,6 +2,7 @@
 
 #include "velmora/failure.h"
 #include "velmora/interrupt.h"
+#include "velmora/output.h"
 #include "velmora/port/openport.h"
 #include "velmora/port/recordedport.h"
 #include "velmora/settingsstore.h"
@@ -110,7 +111,7 @@ void Session::connect()
     }
     m_pump = std::make_unique<BridgePump>(std::move(port), m_bridge);
     if (!m_options.quiet) {
-        fmt::print(stderr, "Connecting to {} ...\n", toString(address));
+        tell(fmt::format("Connecting to {} ...\n", toString(address)));
     }
     if (!openOnThread()) {
         failOpening(address);
@@ -124,11 +125,11 @@ void Session::connect()
 void Session::tellConnected() const
 {
     std::shared_ptr<obd::IAdapter> const found = adapter();
-    fmt::print(stderr, "Connected: {} {}, {}\n", readable(found->device()), readable(found->description()),
-               readable(found->getProtocolDescription()));
+    tell(fmt::format("Connected: {} {}, {}\n", readable(found->device()), readable(found->description()),
+                     readable(found->getProtocolDescription())));
     for (std::shared_ptr<obd::IEcu> const& ecu : m_obd->getEcuManager()->getEcus()) {
-        fmt::print(stderr, "Control module {:X}: {} ({})\n", ecu->id(), readable(ecu->name()),
-                   readable(ecu->description()));
+        tell(fmt::format("Control module {:X}: {} ({})\n", ecu->id(), readable(ecu->name()),
+                         readable(ecu->description())));
     }
 }
 

@@ -3,6 +3,7 @@
 #include "velmora/codereader.h"
 #include "velmora/diagnosticreaders.h"
 #include "velmora/freezereader.h"
+#include "velmora/output.h"
 #include "velmora/text.h"
 
 #include <cstdio>
@@ -78,7 +79,7 @@ VehicleReport readVehicle(Session& session)
     CodeReader reader(session);
     for (auto const& ecu : session.selectedModules()) {
         if (!session.options().quiet) {
-            fmt::print(stderr, "Reading {:X} {} ...\n", ecu->id(), readable(ecu->name()));
+            tell(fmt::format("Reading {:X} {} ...\n", ecu->id(), readable(ecu->name())));
         }
         report.modules.push_back(readModule(session, *ecu, reader));
     }

@@ -119,7 +119,7 @@ ExitCode clear(GlobalOptions const& options)
     Session session(options);
     session.connect();
     if (!confirmed(session, warning, "Clear now?")) {
-        fmt::print(stderr, "Nothing was cleared.\n");
+        tell("Nothing was cleared.\n");
         return ExitCode::Failed;
     }
     std::vector<ModuleOutcome> const outcomes = clearCodes(session);

@@ -2,6 +2,7 @@
 
 #include "velmora/failure.h"
 #include "velmora/linereader.h"
+#include "velmora/output.h"
 
 #include <fmt/format.h>
 #include <unistd.h>
@@ -21,7 +22,7 @@ bool confirmed(Session const& session, std::string const& warning, std::string c
     if (session.options().yes) {
         return true;
     }
-    fmt::print(stderr, "{}{} [y/N] ", warning, question);
+    tell(fmt::format("{}{} [y/N] ", warning, question));
     std::string answer;
     return LineReader(session).read(answer) && (answer == "y" || answer == "Y" || answer == "yes");
 }

@@ -49,7 +49,7 @@ public:
             return m_prompt->read(command);
         }
         if (m_asking) {
-            fmt::print(stderr, "> ");
+            tell("> ");
         }
         return m_lines.read(command);
     }

@@ -25,7 +25,7 @@ constexpr seconds longSilence{15};
 
 LiveRun::LiveRun(Session& session, LiveOptions const& options, LiveCsv* csv)
     : m_session(session), m_options(options), m_csv(csv), m_service(obd::SensorServiceBuilder::createSensorService()),
-      m_tap(*m_session.obd().getConnectionManager())
+      m_tap(*m_session.obd().getConnectionManager(), m_session.loop())
 {
     select(chooseSensors(m_options.sensors, offeredSensors(*m_service)));
     m_service->attach(this);
@@ -190,7 +190,7 @@ void LiveRun::watchSilence(LiveTime now)
         throw Failure(ExitCode::VehicleSilent, "The vehicle no longer answers", {"is the ignition still on?"});
     }
     if (!m_silenceTold && m_terminal == nullptr && !m_session.options().quiet) {
-        fmt::print(stderr, "No values come from the vehicle; still asking. Is the ignition on?\n");
+        tell("No values come from the vehicle; still asking. Is the ignition on?\n");
     }
     m_silenceTold = true;
 }

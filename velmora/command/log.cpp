@@ -36,7 +36,7 @@ public:
         m_service->attach(this);
         m_service->startLogging();
     }
-    ~TrafficLog() override { stop(); }
+    ~TrafficLog() override = default;
     TrafficLog(TrafficLog const&) = delete;
     TrafficLog& operator=(TrafficLog const&) = delete;
 
@@ -46,17 +46,11 @@ public:
     // Ends with what was logged so far. Throws Failure if it can't be printed.
     void finish()
     {
-        stop();
+        m_service.reset();
         m_printer.finish();
     }
 
 private:
-    void stop()
-    {
-        m_service->stopLogging();
-        m_service->detach(this);
-    }
-
     void onLogEntryAdded(std::shared_ptr<obd::MessageDataModel> const& entry) override
     {
         m_printer.print(m_json ? toJsonLine(*entry) : toLine(*entry));
@@ -64,6 +58,7 @@ private:
 
     bool const m_json;
     LinePrinter m_printer;
+    // Its end waits for an entry that is under way on another thread, which detaching would not.
     std::shared_ptr<obd::ITroubleshootingService> m_service;
 };
 

@@ -1,5 +1,6 @@
 #include "velmora/command/commands.h"
 #include "velmora/commandline.h"
+#include "velmora/output.h"
 #include "velmora/port/serialportlist.h"
 #include "velmora/view/json.h"
 
@@ -24,8 +25,7 @@ ExitCode listPorts(GlobalOptions const& options)
         fmt::print("{}{}{}\n", port.device, port.description.empty() ? "" : "  ", port.description);
     }
     if (ports.empty()) {
-        fmt::print(stderr,
-                   "No serial port that looks like an adapter. A network adapter needs none: --port HOST:PORT\n");
+        tell("No serial port that looks like an adapter. A network adapter needs none: --port HOST:PORT\n");
     }
     return ExitCode::Done;
 }

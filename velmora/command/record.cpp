@@ -3,6 +3,7 @@
 #include "velmora/dialoguefile.h"
 #include "velmora/dialoguerecorder.h"
 #include "velmora/failure.h"
+#include "velmora/output.h"
 #include "velmora/vehiclereader.h"
 #include "velmora/vinmask.h"
 
@@ -56,7 +57,7 @@ void save(DialogueRecorder const& recorder, Session const& session, RecordOption
     }
     file.save(dialogue);
     if (!session.options().quiet) {
-        fmt::print(stderr, "Recorded {} requests and commands to {}\n", dialogue.exchanges.size(), chosen.file);
+        tell(fmt::format("Recorded {} requests and commands to {}\n", dialogue.exchanges.size(), chosen.file));
     }
 }
 

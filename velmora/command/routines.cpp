@@ -2,6 +2,7 @@
 #include "velmora/command/confirm.h"
 #include "velmora/command/modulecommand.h"
 #include "velmora/commandline.h"
+#include "velmora/output.h"
 #include "velmora/routinereader.h"
 #include "velmora/text.h"
 #include "velmora/view/layout.h"
@@ -85,7 +86,7 @@ ExitCode run(std::string const& text, GlobalOptions const& options)
     session.connect();
     Candidate const candidate = find(session, id);
     if (!confirmed(session, warning(candidate), "Run now?")) {
-        fmt::print(stderr, "Nothing was run.\n");
+        tell("Nothing was run.\n");
         return ExitCode::Failed;
     }
     RoutineRun const outcome = runRoutine(session, *candidate.ecu, candidate.routine);

@@ -9,7 +9,9 @@
 
 namespace obd {
 
-// The raw view on the adapter: a console and a log of the traffic. Attach and detach observers while logging is off.
+// The raw view on the adapter: a console and a log of the traffic. Attach observers while logging is off. An entry may
+// still be under way on another thread when stopLogging returns, so detach without a connection only, or let go of the
+// service, whose end waits for it.
 class ITroubleshootingService : public virtual tervex::INotifier<ITroubleshootingServiceObserver>
 {
 public:
