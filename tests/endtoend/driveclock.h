@@ -2,9 +2,10 @@
 
 #include <common/clock.h>
 
+#include "tests/support/dispatchloop.h"
 #include "tests/support/peerconnection.h"
 
-#include <chrono>
+#include <atomic>
 #include <memory>
 #include <thread>
 
@@ -29,10 +30,18 @@ public:
         static constexpr unsigned int pollMs = 10;
         if (ms == pollMs) {
             std::this_thread::sleep_for(std::chrono::microseconds(10));
-        } else {
-            m_car->pass(obdsim::Time(ms));
+            return;
         }
+        if (support::DispatchLoop* const loop = m_followed) {
+            loop->awaitCaughtUp();
+        }
+        m_car->pass(obdsim::Time(ms));
     }
+
+    // From now on no pause passes before the loop has dispatched what was asked of it, so that a busy machine, on which
+    // the application hears of readings late, drives the same as an idle one. Null ends it.
+    void follow(support::DispatchLoop* loop) { m_followed = loop; }
+
     std::time_t wallSeconds() override { return 1709802302; }
 
 private:
@@ -40,4 +49,5 @@ private:
 
     std::shared_ptr<PeerConnection> m_car;
     unsigned int const m_begin;
+    std::atomic<support::DispatchLoop*> m_followed{nullptr};
 };

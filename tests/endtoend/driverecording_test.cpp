@@ -128,11 +128,14 @@ void DriveRecording::record()
     for (auto const& descriptor : service->getDescriptors()) {
         ids.push_back(obd::ParameterIdentifier(descriptor->pid()).id());
     }
+    m_clock.follow(&m_loop);
     service->startUpdates(ids);
     // In steps, each with the loop's own patience, for a build with sanitizers.
     for (Time until = recordingStep; recording.last < driven; until += recordingStep) {
         ASSERT_TRUE(m_loop.runUntil([&] { return recording.last >= until; }));
     }
+    m_clock.follow(nullptr);
+    m_loop.runPending(); // lets go of a pause that waits
     service->reset();
     service->detach(&recording);
     m_recorded.emplace(m_file.string(), recording.windowsAt);
@@ -152,18 +155,14 @@ void DriveRecording::compare(DriveColumn const& column)
     }
 }
 
-// A sensor that the drive does not move. Some are never told; and on a slow machine the application may hear of a
-// reading so late that the table drops the one before.
+// A sensor that the drive does not move, once it has been read. Some are never told.
 void DriveRecording::expectConstant(std::size_t column) const
 {
-    std::map<std::string, int> times;
+    std::string const& value = m_recorded->rows.back().at(column);
+    bool read = false;
     for (auto const& row : m_recorded->rows) {
-        ++times[row.at(column)];
-    }
-    times.erase("-");
-    EXPECT_LE(times.size(), 1U) << m_recorded->titles[column];
-    if (!times.empty()) {
-        EXPECT_GE(times.begin()->second, 15) << m_recorded->titles[column];
+        read = read || row.at(column) != "-";
+        EXPECT_TRUE(!read || row.at(column) == value) << m_recorded->titles[column] << " " << row.at(column);
     }
 }
 

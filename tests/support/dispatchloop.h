@@ -43,11 +43,18 @@ public:
         return m_changed.wait_for(lock, patience, [this, count] { return m_requested >= count; });
     }
 
+    // Waits until every request so far has been dispatched, by the thread of the test. False if that takes too long.
+    bool awaitCaughtUp()
+    {
+        std::unique_lock lock(m_mutex);
+        return m_changed.wait_for(lock, patience, [this] { return m_done >= m_requested; });
+    }
+
     // Dispatches once for each request that is open.
     void runPending()
     {
         while (takeRequest(std::chrono::milliseconds(0))) {
-            obd::Dispatcher::getInstance().dispatch();
+            dispatch();
         }
     }
 
@@ -60,7 +67,7 @@ public:
                 return false;
             }
             if (takeRequest(std::chrono::milliseconds(1))) {
-                obd::Dispatcher::getInstance().dispatch();
+                dispatch();
             }
         }
         return true;
@@ -77,10 +84,19 @@ private:
         return true;
     }
 
+    void dispatch()
+    {
+        obd::Dispatcher::getInstance().dispatch();
+        std::lock_guard const lock(m_mutex);
+        ++m_done;
+        m_changed.notify_all();
+    }
+
     mutable std::mutex m_mutex;
     std::condition_variable m_changed;
     int m_requested = 0;
     int m_dispatched = 0;
+    int m_done = 0;
 };
 
 } // namespace support
