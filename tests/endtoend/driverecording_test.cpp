@@ -57,6 +57,7 @@ public:
                          std::vector<std::shared_ptr<obd::SensorValueDataModel>> const& values) override
     {
         RequestWindow const window = m_windows.take();
+        expectRequestOf(descriptor->pid(), window);
         for (std::size_t i = 0; i < m_table.rows().size(); ++i) {
             if (obd::Uid2Pid(m_table.rows()[i].uid) == descriptor->pid()) {
                 m_latest[i] = window;
@@ -74,6 +75,15 @@ public:
     Time last{};
 
 private:
+    // Derived parameters ask for several others.
+    static void expectRequestOf(int pid, RequestWindow const& window)
+    {
+        bool const derived = pid >= obd::ParameterIdentifier::FuelConsumption;
+        std::string const request = "01" + obd::ParameterIdentifier(pid).toString().substr(1);
+        EXPECT_TRUE(derived ? !window.command.empty() : window.command.starts_with(request))
+            << window.command << " for " << pid << " at " << window.sent.count();
+    }
+
     RequestWindows& m_windows;
     velmora::LiveTable m_table;
     velmora::LiveCsv m_csv;

@@ -54,10 +54,7 @@ public:
     void onDispatchRequested() override
     {
         std::lock_guard const lock(m_mutex);
-        if (!m_current.command.empty()) {
-            m_done.push_back(m_current);
-            m_current = {};
-        }
+        finishCurrent();
     }
 
     // Forgets what was said so far.
@@ -67,10 +64,14 @@ public:
         m_current = {};
         m_done.clear();
     }
-    // The oldest window; an empty one if there is none.
+    // The oldest window; an empty one if there is none. A dispatch that is under way may publish an update before the
+    // worker has come to ask for one: the window it takes then is the worker's last.
     RequestWindow take()
     {
         std::lock_guard const lock(m_mutex);
+        if (m_done.empty()) {
+            finishCurrent();
+        }
         if (m_done.empty()) {
             return {};
         }
@@ -80,6 +81,14 @@ public:
     }
 
 private:
+    void finishCurrent() // under m_mutex
+    {
+        if (!m_current.command.empty()) {
+            m_done.push_back(m_current);
+            m_current = {};
+        }
+    }
+
     std::shared_ptr<PeerConnection> m_car;
     std::mutex m_mutex;
     RequestWindow m_current;
