@@ -62,6 +62,12 @@ std::string hexNumber(std::uint32_t number, std::size_t width)
     return text;
 }
 
+void appendWord(Bytes& bytes, std::uint16_t word)
+{
+    bytes.push_back(static_cast<std::uint8_t>(word >> 8));
+    bytes.push_back(static_cast<std::uint8_t>(word & 0xFF));
+}
+
 std::optional<Bytes> parseHex(std::string_view text)
 {
     const std::string packed = normaliseCommand(text);

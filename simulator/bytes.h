@@ -26,6 +26,9 @@ std::string hexText(const Bytes& bytes, std::string_view separator = "");
 /// `number` in upper-case hexadecimal, zero-filled to `digits`.
 std::string hexNumber(std::uint32_t number, std::size_t digits);
 
+/// Appends `word`, its high byte first.
+void appendWord(Bytes& bytes, std::uint16_t word);
+
 /// Bytes of a text such as "41 0C 1A F8" or "410C1AF8"; nothing if a character
 /// is neither digit nor blank, or if the count of digits is odd.
 std::optional<Bytes> parseHex(std::string_view text);

@@ -63,7 +63,7 @@ double probability(const std::string& fault, const std::string& text)
     return value;
 }
 
-Time milliseconds(const std::string& fault, const std::string& text)
+Time timeOf(const std::string& fault, const std::string& text)
 {
     const auto value = wholeNumber(text);
     if (!value) {
@@ -89,7 +89,7 @@ Fault parseAtPlace(const std::string& text, const FaultForm& form, Fault fault, 
     const auto [number, time] = splitAtLast(place, ':');
     fault.position = position(text, number);
     if (form.time) {
-        fault.duration = milliseconds(text, time);
+        fault.duration = timeOf(text, time);
     } else if (number != place) {
         fail(text, usage);
     }
@@ -101,7 +101,7 @@ Fault parseByValue(const std::string& text, const FaultForm& form, Fault fault, 
     if (form.chance) {
         fault.probability = probability(text, value);
     } else if (form.time && !form.place) {
-        fault.duration = milliseconds(text, value);
+        fault.duration = timeOf(text, value);
     } else {
         fail(text, usage);
     }

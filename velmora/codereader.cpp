@@ -6,7 +6,7 @@ namespace velmora {
 
 namespace {
 
-constexpr unsigned int replyLimitMs = 1500;
+constexpr unsigned int codesLimitMs = 1500;
 
 struct KindRow
 {
@@ -86,7 +86,7 @@ ServiceReply CodeReader::reply(obd::IEcu const& ecu, CodeKind kind)
 {
     auto found = m_replies.find(kind);
     if (found == m_replies.end()) {
-        found = m_replies.emplace(kind, ServiceReplies(*m_session.proxy(), row(kind).service, replyLimitMs)).first;
+        found = m_replies.emplace(kind, ServiceReplies(*m_session.proxy(), row(kind).service, codesLimitMs)).first;
     }
     return found->second.of(ecu.id());
 }

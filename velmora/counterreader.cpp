@@ -8,7 +8,7 @@ namespace velmora {
 
 namespace {
 
-constexpr unsigned int replyLimitMs = 1500;
+constexpr unsigned int countersLimitMs = 1500;
 // Info types of service 09: counters of engines with spark and with compression ignition.
 constexpr unsigned char infoTypes[] = {0x08, 0x0B};
 
@@ -23,7 +23,7 @@ TopicAnswer answerWithoutCounters(Session& session, obd::IEcu const& ecu)
     auto const offered = std::find_if(std::begin(infoTypes), std::end(infoTypes),
                                       [&ecu](unsigned char infoType) { return isOffered(ecu, infoType); });
     obd::ResponseMap responses;
-    session.proxy()->execute({0x09, *offered}, responses, replyLimitMs);
+    session.proxy()->execute({0x09, *offered}, responses, countersLimitMs);
     return judgeWithoutCounters(responses[ecu.id()], ecu.protocol());
 }
 

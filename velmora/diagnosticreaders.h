@@ -14,6 +14,8 @@
 
 namespace velmora {
 
+// Whether the module reports PID 0x01.
+bool tellsReadiness(obd::IEcu const& ecu);
 ReadinessReport readReadiness(Session& session, obd::IEcu const& ecu);
 // Asks once for each monitor, which takes seconds.
 MonitorsReport readMonitors(Session& session, obd::IEcu const& ecu);

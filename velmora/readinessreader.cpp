@@ -8,8 +8,6 @@ namespace velmora {
 
 namespace {
 
-constexpr unsigned char monitorStatus = 0x01;
-
 using Monitors = std::vector<std::shared_ptr<obd::ReadinessMonitorDataModel>>;
 
 std::optional<ReadinessStatus> statusOf(Monitors const& monitors, std::string const& name)
@@ -27,10 +25,15 @@ std::optional<bool> readLamp()
 
 } // namespace
 
+bool tellsReadiness(obd::IEcu const& ecu)
+{
+    return ecu.isSupported(obd::ObdMode::CurrentData, 0x01, 0);
+}
+
 ReadinessReport readReadiness(Session& session, obd::IEcu const& ecu)
 {
     session.select(ecu);
-    if (!ecu.isSupported(obd::ObdMode::CurrentData, monitorStatus, 0)) {
+    if (!tellsReadiness(ecu)) {
         return {};
     }
     auto const service = obd::DiagnosticsServiceBuilder::create();

@@ -8,8 +8,6 @@ namespace velmora {
 
 namespace {
 
-constexpr unsigned char monitorStatus = 0x01;
-
 LimitTest::Verdict toVerdict(obd::DiagnosticTestDataModel::Status status)
 {
     switch (status) {
@@ -85,7 +83,7 @@ OxygenReport readOxygen(Session& session, obd::IEcu const& ecu)
     report.answer = TopicAnswer::Read;
     report.onCan = ecu.protocol() == obd::ObdProtocolCan11 || ecu.protocol() == obd::ObdProtocolCan29;
     // Whether the monitor has run means nothing of a module that does not tell what monitors it has.
-    if (ecu.isSupported(obd::ObdMode::CurrentData, monitorStatus, 0) && !service->fetchReadinessMonitors().empty()) {
+    if (tellsReadiness(ecu) && !service->fetchReadinessMonitors().empty()) {
         report.complete = service->isOxygenSensorTestComplete();
     }
     for (obd::OxygenSensorLocation const location : locations) {

@@ -14,14 +14,14 @@ namespace velmora {
 
 namespace {
 
-constexpr unsigned int replyLimitMs = 500;
+constexpr unsigned int protocolLimitMs = 500;
 
 // The driver keeps the bus family only; the adapter tells the number, behind an A if it searched for it.
 ProtocolReport readProtocol(Session& session)
 {
     ProtocolReport report{std::nullopt, readable(session.adapter()->getProtocolDescription())};
     std::string reply;
-    if (session.proxy()->execute("ATDPN", reply, replyLimitMs) == obd::IDevice::Status::Ok) {
+    if (session.proxy()->execute("ATDPN", reply, protocolLimitMs) == obd::IDevice::Status::Ok) {
         std::size_t const digit = reply.find_first_of("123456789");
         if (digit != std::string::npos) {
             report.number = reply[digit] - '0';

@@ -9,9 +9,8 @@
 namespace obd {
 namespace {
 
-constexpr std::size_t headerLength = 3; // service, info type, number of items
-constexpr std::size_t itemLength = 16;
-constexpr std::size_t linesPerItem = itemLength / SaeLines::dataLength;
+constexpr std::size_t idLength = 16;
+constexpr std::size_t linesPerItem = idLength / SaeLines::dataLength;
 
 } // namespace
 
@@ -27,17 +26,17 @@ std::vector<std::string> CalibrationIds::calibrationIds(std::shared_ptr<IEcu> co
 
 bool CalibrationIds::fromCanSystem(unsigned int ecuId, std::vector<unsigned char> const& data)
 {
-    if (data.size() < headerLength + itemLength) {
+    if (data.size() < infoHeaderLength + idLength) {
         return refuseLength(data);
     }
     unsigned int const count = data[2];
     TERVEX_LOG(Info) << "Number of CALID items: " << count;
     for (std::size_t item = 0; item < count; ++item) {
-        std::size_t const offset = headerLength + item * itemLength;
-        if (offset + itemLength > data.size()) {
+        std::size_t const offset = infoHeaderLength + item * idLength;
+        if (offset + idLength > data.size()) {
             return refuseLength(data);
         }
-        m_ids[ecuId].push_back(compactText(slice(data, offset, itemLength)));
+        m_ids[ecuId].push_back(compactText(slice(data, offset, idLength)));
     }
     return true;
 }
@@ -54,7 +53,7 @@ bool CalibrationIds::fromSaeSystem(unsigned int ecuId, std::vector<unsigned char
     }
     TERVEX_LOG(Info) << "Number of CalID items: " << count;
     for (std::size_t item = 0; item < count; ++item) {
-        std::vector<unsigned char> text(itemLength);
+        std::vector<unsigned char> text(idLength);
         if (!assembleItem(lines, item * linesPerItem, text)) {
             return false;
         }

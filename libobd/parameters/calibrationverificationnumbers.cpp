@@ -9,8 +9,7 @@
 namespace obd {
 namespace {
 
-constexpr std::size_t headerLength = 3; // service, info type, number of items
-constexpr std::size_t itemLength = 4;
+constexpr std::size_t numberLength = 4;
 
 } // namespace
 
@@ -26,16 +25,16 @@ std::vector<std::string> CalibrationVerificationNumbers::verificationNumbers(std
 
 bool CalibrationVerificationNumbers::fromCanSystem(unsigned int ecuId, std::vector<unsigned char> const& data)
 {
-    if (data.size() < headerLength + itemLength) {
+    if (data.size() < infoHeaderLength + numberLength) {
         return refuseLength(data);
     }
     unsigned int const count = data[2];
     TERVEX_LOG(Info) << "Number of verification items: " << count;
-    if (headerLength + itemLength * count > data.size()) {
+    if (infoHeaderLength + numberLength * count > data.size()) {
         return refuseLength(data);
     }
     for (std::size_t item = 0; item < count; ++item) {
-        m_numbers[ecuId].push_back(hexText(slice(data, headerLength + item * itemLength, itemLength)));
+        m_numbers[ecuId].push_back(hexText(slice(data, infoHeaderLength + item * numberLength, numberLength)));
     }
     return true;
 }

@@ -12,9 +12,9 @@ namespace obd {
 namespace {
 
 constexpr std::size_t codeLength = 2;
-constexpr std::size_t canHeaderLength = 2;                // service, number of codes
-constexpr std::size_t saeCodesLength = 3 * codeLength;    // of one line
-constexpr std::size_t saeLineLength = 1 + saeCodesLength; // with the service, without a checksum
+constexpr std::size_t canHeaderLength = 2;                  // service, number of codes
+constexpr std::size_t saeCodesLength = 3 * codeLength;      // of one line
+constexpr std::size_t codesLineLength = 1 + saeCodesLength; // with the service, without a checksum
 
 bool refuseShort(std::vector<unsigned char> const& data)
 {
@@ -55,14 +55,14 @@ bool DtcParameter::fromCanSystem(unsigned int ecuId, std::vector<unsigned char> 
 
 bool DtcParameter::fromSaeSystem(unsigned int ecuId, std::vector<unsigned char> const& data)
 {
-    if (data.size() < saeLineLength) {
+    if (data.size() < codesLineLength) {
         return refuseShort(data);
     }
     int const checksumLength = findSaeChecksumLength(data);
     if (checksumLength < 0) {
         return refuse("Invalid data received");
     }
-    std::size_t const step = saeLineLength + static_cast<std::size_t>(checksumLength);
+    std::size_t const step = codesLineLength + static_cast<std::size_t>(checksumLength);
     for (std::size_t line = 0; line + step <= data.size(); line += step) {
         parseCodes(ecuId, slice(data, line + 1, saeCodesLength));
     }

@@ -11,10 +11,9 @@
 namespace obd {
 namespace {
 
-constexpr std::size_t headerLength = 3; // service, info type, number of items
 constexpr std::size_t acronymLength = 4;
-constexpr std::size_t textLength = 15;
-constexpr std::size_t fieldLength = acronymLength + 1 + textLength; // with the delimiter between the two
+constexpr std::size_t nameLength = 15;
+constexpr std::size_t fieldLength = acronymLength + 1 + nameLength; // with the delimiter between the two
 constexpr std::size_t linesPerName = fieldLength / SaeLines::dataLength;
 
 struct AcronymRow
@@ -98,10 +97,10 @@ std::string EcuName::fullDescription(IEcu const& ecu) const
 
 bool EcuName::fromCanSystem(unsigned int ecuId, std::vector<unsigned char> const& data)
 {
-    if (data.size() < headerLength + fieldLength) {
+    if (data.size() < infoHeaderLength + fieldLength) {
         return refuseLength(data);
     }
-    store(ecuId, slice(data, headerLength, fieldLength));
+    store(ecuId, slice(data, infoHeaderLength, fieldLength));
     return true;
 }
 
@@ -128,7 +127,7 @@ void EcuName::store(unsigned int ecuId, std::vector<unsigned char> const& field)
         TERVEX_LOG(Error) << "No delimeter found!";
     }
     m_names[ecuId] = {compactText(slice(field, 0, acronymLength)),
-                      compactText(slice(field, acronymLength + 1, textLength))};
+                      compactText(slice(field, acronymLength + 1, nameLength))};
 }
 
 } // namespace obd

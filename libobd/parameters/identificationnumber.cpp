@@ -3,12 +3,12 @@
 namespace obd {
 namespace {
 
-constexpr std::size_t textLength = 20;
+constexpr std::size_t vehicleNumberLength = 20;
 
 } // namespace
 
 IdentificationNumber::IdentificationNumber(unsigned char infoType)
-    : VehicleInformation(infoType), m_parser({0x49, infoType}, textLength)
+    : VehicleInformation(infoType), m_parser({0x49, infoType}, vehicleNumberLength)
 {}
 
 unsigned int IdentificationNumber::timeout() const

@@ -3,6 +3,7 @@
 #include "libobd/parameters/bytetext.h"
 #include "libobd/parameters/replychecks.h"
 #include "libobd/parameters/saelines.h"
+#include "libobd/parameters/vehicleinformation.h"
 #include "libobd/src/bytereader.h"
 
 #include <common/logrecord.h>
@@ -10,11 +11,6 @@
 #include <utility>
 
 namespace obd {
-namespace {
-
-constexpr std::size_t headerLength = 3; // service, info type, number of items
-
-} // namespace
 
 IdentificationNumberParser::IdentificationNumberParser(std::vector<unsigned char> signature, std::size_t length)
     : m_signature(std::move(signature)), m_length(length)
@@ -29,7 +25,7 @@ bool IdentificationNumberParser::fromCanSystem(unsigned int ecuId, std::vector<u
         return refuse("Invalid data received: signature mismatch");
     }
     TERVEX_LOG(Info) << "Number of items: " << static_cast<unsigned int>(data[2]);
-    m_numbers[ecuId] = trimmedText(slice(data, headerLength, m_length - headerLength));
+    m_numbers[ecuId] = trimmedText(slice(data, infoHeaderLength, m_length - infoHeaderLength));
     return true;
 }
 

@@ -11,7 +11,6 @@
 namespace obd {
 namespace {
 
-constexpr std::size_t headerLength = 3;      // service, info type, number of counters
 constexpr std::size_t canMinimumLength = 35; // with the 16 counters that SAE J1979 asks for at least
 
 } // namespace
@@ -65,8 +64,8 @@ bool PerformanceTracking::fromCanSystem(unsigned int ecuId, std::vector<unsigned
         return refuseLength(data);
     }
     Counters counters;
-    for (std::size_t index = 0; headerLength + 2 * index + 1 < data.size(); ++index) {
-        store(counters, index, readUint16(data, headerLength + 2 * index));
+    for (std::size_t index = 0; infoHeaderLength + 2 * index + 1 < data.size(); ++index) {
+        store(counters, index, readUint16(data, infoHeaderLength + 2 * index));
     }
     m_counters[ecuId] = std::move(counters);
     return true;

@@ -5,12 +5,12 @@
 namespace obd {
 namespace {
 
-constexpr DerivedRow row{
+constexpr DerivedRow batteryVoltageRow{
     ParameterIdentifier::BatteryVoltage, "Battery voltage", 1, {UnitVolt, 0.0, 24.0}, {UnitVolt, 0.0, 24.0}};
 
 } // namespace
 
-BatteryVoltage::BatteryVoltage() : DerivedParameter(row) {}
+BatteryVoltage::BatteryVoltage() : DerivedParameter(batteryVoltageRow) {}
 
 IQuery::UpdateStatus BatteryVoltage::update(std::shared_ptr<IObdProxy> const& proxy)
 {

@@ -10,15 +10,15 @@
 namespace obd {
 namespace {
 
-constexpr DerivedRow row{ParameterIdentifier::BoostPressure,
-                         "Boost pressure",
-                         1,
-                         {UnitKilopascal, 0.0, 255.0},
-                         {UnitPsi, 0.0, unitconversion::kilopascalToPsi(255.0)}};
+constexpr DerivedRow boostPressureRow{ParameterIdentifier::BoostPressure,
+                                      "Boost pressure",
+                                      1,
+                                      {UnitKilopascal, 0.0, 255.0},
+                                      {UnitPsi, 0.0, unitconversion::kilopascalToPsi(255.0)}};
 
 constexpr unsigned char neededPids[] = {0x0B};
 constexpr unsigned char barometricPressurePid = 0x33;
-constexpr std::int32_t windowMillis = 750;
+constexpr std::int32_t boostWindowMillis = 750;
 constexpr unsigned int barometricPressureMillis = 5000; // the weather changes slowly
 
 } // namespace
@@ -28,11 +28,12 @@ EcuHistory<BoostPressureData> BoostPressure::s_history;
 void BoostPressureData::addManifoldPressure(Sample const& sample)
 {
     m_samples.add({sample.time, sample.value - m_barometricPressure});
-    m_samples.dropOlderThan(windowMillis, sample.time);
+    m_samples.dropOlderThan(boostWindowMillis, sample.time);
 }
 
 BoostPressure::BoostPressure()
-    : DerivedParameter(row), m_manifoldPressure(ObdMode::CurrentData, 0), m_barometricPressure(ObdMode::CurrentData, 0)
+    : DerivedParameter(boostPressureRow), m_manifoldPressure(ObdMode::CurrentData, 0),
+      m_barometricPressure(ObdMode::CurrentData, 0)
 {}
 
 bool BoostPressure::isValid(IEcu const& ecu)

@@ -7,11 +7,11 @@
 namespace obd {
 namespace {
 
-constexpr DerivedRow row{
+constexpr DerivedRow enginePowerRow{
     ParameterIdentifier::EnginePower, "Engine power", 0, {UnitKilowatt, 0.0, 1000.0}, {UnitHorsepower, 0.0, 1300.0}};
 
 constexpr double metrePerSecond = 0.2777777777777778; // in a km/h
-constexpr std::int32_t windowMillis = 1000;
+constexpr std::int32_t powerWindowMillis = 1000;
 
 // From the speed before to the speed now, in m/s, within dt seconds; in kW. The force that accelerates is taken twice,
 // as the gain of kinetic energy and by Newton's law, and halved. The drag is half the air's density of 1.2242 kg/m3
@@ -37,11 +37,11 @@ void EnginePowerData::addSpeed(Sample const& sample, double weight)
     if (before.time != 0 && now.value - before.value > 0.0 && dt > 0.0) {
         m_powers.add({now.time, roadLoad(before.value, now.value, dt, weight)});
     }
-    m_powers.dropOlderThan(windowMillis, now.time);
+    m_powers.dropOlderThan(powerWindowMillis, now.time);
 }
 
 EnginePower::EnginePower(unsigned int weight)
-    : DerivedParameter(row), m_speed(ObdMode::CurrentData, 0), m_weight(weight)
+    : DerivedParameter(enginePowerRow), m_speed(ObdMode::CurrentData, 0), m_weight(weight)
 {}
 
 IQuery::UpdateStatus EnginePower::update(std::shared_ptr<IObdProxy> const& proxy)

@@ -12,11 +12,11 @@
 namespace obd {
 namespace {
 
-constexpr DerivedRow row{ParameterIdentifier::FuelConsumption,
-                         "Fuel consumption",
-                         1,
-                         {UnitConsumptionMetric, 0.0, 500.0},
-                         {UnitConsumptionImperial, 0.0, 500.0}};
+constexpr DerivedRow fuelConsumptionRow{ParameterIdentifier::FuelConsumption,
+                                        "Fuel consumption",
+                                        1,
+                                        {UnitConsumptionMetric, 0.0, 500.0},
+                                        {UnitConsumptionImperial, 0.0, 500.0}};
 
 constexpr unsigned char gasPids[] = {0x10, 0x0D};
 constexpr unsigned char gasMapPids[] = {0x0F, 0x0D, 0x0C, 0x0B};
@@ -26,7 +26,7 @@ constexpr double milesPerGallonAtOneLitre = 235.214583; // at one litre per 100 
 
 } // namespace
 
-FuelConsumption::FuelConsumption() : DerivedParameter(row) {}
+FuelConsumption::FuelConsumption() : DerivedParameter(fuelConsumptionRow) {}
 
 void FuelConsumption::addInput(ConsumptionInput input, std::unique_ptr<TableParameter> parameter)
 {

@@ -5,7 +5,7 @@
 namespace obd {
 namespace {
 
-constexpr char const* texts[] = {
+constexpr char const* monitorTexts[] = {
     // in the order of ReadinessMonitorTest
     "Misfire",
     "Fuel System",
@@ -26,7 +26,7 @@ constexpr char const* texts[] = {
     "PM filter",
     "EGR and/or VVT System",
 };
-static_assert(std::size(texts) == MonitorStatusWord::TEST_INFO_ARRAY_SIZE);
+static_assert(std::size(monitorTexts) == MonitorStatusWord::TEST_INFO_ARRAY_SIZE);
 
 void append(std::vector<ReadinessMonitorTest>& tests, ReadinessMonitorTest first, ReadinessMonitorTest last)
 {
@@ -40,7 +40,7 @@ void append(std::vector<ReadinessMonitorTest>& tests, ReadinessMonitorTest first
 std::string readinessMonitorText(ReadinessMonitorTest test)
 {
     auto const index = static_cast<std::size_t>(test);
-    return index < std::size(texts) ? texts[index] : "NA";
+    return index < std::size(monitorTexts) ? monitorTexts[index] : "NA";
 }
 
 std::vector<ReadinessMonitorTest> readinessMonitorTests(IgnitionType ignition)

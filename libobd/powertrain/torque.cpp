@@ -6,7 +6,7 @@
 namespace obd {
 namespace {
 
-constexpr DerivedRow row{
+constexpr DerivedRow torqueRow{
     ParameterIdentifier::Torque, "Engine torque", 0, {UnitNewtonMetre, 0.0, 2000.0}, {UnitNewtonMetre, 0.0, 2000.0}};
 
 constexpr double fullCircle = 6.283185307179586; // 2 pi
@@ -22,7 +22,7 @@ void TorqueData::addPower(Sample const& sample)
     }
 }
 
-Torque::Torque(unsigned int weight) : DerivedParameter(row), m_power(weight), m_rpm(ObdMode::CurrentData, 0) {}
+Torque::Torque(unsigned int weight) : DerivedParameter(torqueRow), m_power(weight), m_rpm(ObdMode::CurrentData, 0) {}
 
 IQuery::UpdateStatus Torque::update(std::shared_ptr<IObdProxy> const& proxy)
 {

@@ -3,6 +3,7 @@
 #include "libobd/powertrain/consumptionchoice.h"
 #include "libobd/src/hexformat.h"
 #include "libobd/src/parameterfactory.h"
+#include "libobd/src/sensorpids.h"
 
 #include <algorithm>
 #include <common/logrecord.h>
@@ -19,7 +20,6 @@ namespace obd {
 namespace {
 
 constexpr unsigned int priority = 0;
-constexpr unsigned char freezeFrameCodePid = 0x02;
 
 // The identifiers of service 01, with that of the freeze frame's trouble code, which some modules report in service 02
 // alone, at its place.

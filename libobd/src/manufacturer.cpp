@@ -6,7 +6,7 @@ namespace obd {
 namespace {
 
 // By value of the enumeration.
-constexpr std::array<char const*, 45> names = {
+constexpr std::array<char const*, 45> makers = {
     "Generic", "Acura",  "Alfa Romeo", "Audi",   "BMW",        "Buick",   "Cadillac", "Chrysler",   "Citroen",
     "Daewoo",  "Dodge",  "Fiat",       "Ford",   "Geo",        "GM",      "Honda",    "Hyundai",    "Infinity",
     "Isuzu",   "Jaguar", "Jeep",       "Kia",    "Land Rover", "Lexus",   "Lincoln",  "Mazda",      "Mercedes-Benz",
@@ -18,7 +18,7 @@ constexpr std::array<char const*, 45> names = {
 
 std::string Manufacturer::manufacturerToString(AutoManufacturer maker)
 {
-    return names.at(static_cast<std::size_t>(maker));
+    return makers.at(static_cast<std::size_t>(maker));
 }
 
 } // namespace obd

@@ -6,6 +6,7 @@
 #include "libobd/powertrain/torque.h"
 #include "libobd/src/parameterfactory.h"
 #include "libobd/src/sensormodels.h"
+#include "libobd/src/sensorpids.h"
 
 #include <obd/iecu.h>
 #include <obd/parameterdescriptor.h>
@@ -18,7 +19,6 @@ namespace {
 using Parameters = std::vector<std::shared_ptr<PowertrainParameter>>;
 
 constexpr int lastPid = 0x7F;
-constexpr int freezeFrameCodePid = 0x02;
 constexpr unsigned int anyWeight = 1500;           // kg; no description depends on it
 constexpr ConsumptionSettings anyVehicle{0, 0, 0}; // nor on these
 

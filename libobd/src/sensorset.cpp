@@ -4,6 +4,7 @@
 #include "libobd/powertrain/consumptionchoice.h"
 #include "libobd/powertrain/torque.h"
 #include "libobd/src/parameterfactory.h"
+#include "libobd/src/sensorpids.h"
 
 #include <common/tracestream.h>
 #include <obd/iecu.h>
@@ -17,12 +18,6 @@
 
 namespace obd {
 namespace {
-
-// The support masks, the readiness and the trouble code of the freeze frame have their own ways.
-bool isSensor(unsigned char id)
-{
-    return (id & 0x1F) != 0 && id != 0x01 && id != 0x02;
-}
 
 IgnitionType ignitionType(IEcu const& ecu, IVelmoraSettings const& settings)
 {

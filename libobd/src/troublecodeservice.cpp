@@ -8,6 +8,7 @@
 #include "libobd/src/fetcher.h"
 #include "libobd/src/parameterfactory.h"
 #include "libobd/src/sensormodels.h"
+#include "libobd/src/sensorpids.h"
 #include "libobd/src/velmorainstance.h"
 
 #include <common/logrecord.h>
@@ -17,15 +18,6 @@
 namespace obd {
 
 namespace {
-
-constexpr unsigned char monitorStatusPid = 0x01;
-constexpr unsigned char freezeFrameCodePid = 0x02;
-
-// Readiness, the frame's own code and the support masks are no sensors.
-bool isFrameSensor(unsigned char id)
-{
-    return id != monitorStatusPid && id != freezeFrameCodePid && (id & 0x1FU) != 0;
-}
 
 std::shared_ptr<PowertrainParameter> makeFrameParameter(ParameterIdentifier::Id id, unsigned char frame)
 {
@@ -166,7 +158,7 @@ std::vector<ParameterIdentifier::Id> TroubleCodeService::fetchFreezeFramePids(un
     }
     std::vector<ParameterIdentifier::Id> pids;
     for (unsigned char const id : module->supportedIds(ObdMode::FreezeFrame, frame)) {
-        if (isFrameSensor(id)) {
+        if (isSensor(id)) {
             pids.push_back(ParameterIdentifier(id).id());
         }
     }

@@ -4,20 +4,13 @@ namespace obdsim {
 
 namespace {
 
-constexpr std::uint8_t positive = 0x40;
 constexpr std::size_t codesPerLine = 3;
-
-void append(Bytes& message, std::uint16_t code)
-{
-    message.push_back(static_cast<std::uint8_t>(code >> 8));
-    message.push_back(static_cast<std::uint8_t>(code & 0xFF));
-}
 
 Bytes countedCodes(std::uint8_t service, const std::vector<std::uint16_t>& codes)
 {
     Bytes message = {service, static_cast<std::uint8_t>(codes.size())};
     for (const auto code : codes) {
-        append(message, code);
+        appendWord(message, code);
     }
     return message;
 }
@@ -29,7 +22,7 @@ std::vector<Bytes> codeLines(std::uint8_t service, const std::vector<std::uint16
     for (std::size_t at = 0; at == 0 || at < codes.size(); at += codesPerLine) {
         Bytes line = {service};
         for (std::size_t i = at; i < at + codesPerLine; ++i) {
-            append(line, i < codes.size() ? codes[i] : std::uint16_t{0});
+            appendWord(line, i < codes.size() ? codes[i] : std::uint16_t{0});
         }
         lines.push_back(line);
     }
@@ -38,7 +31,7 @@ std::vector<Bytes> codeLines(std::uint8_t service, const std::vector<std::uint16
 
 Answer tellCodes(const ServiceCall& call, const std::vector<std::uint16_t>& codes)
 {
-    const auto service = static_cast<std::uint8_t>(call.request[0] + positive);
+    const auto service = call.positiveService();
     return call.onCan() ? Answer{0, {countedCodes(service, codes)}} : Answer{0, codeLines(service, codes)};
 }
 
@@ -65,7 +58,7 @@ Answer clearCodes(const ServiceCall& call)
         return {refusal::conditionsNotCorrect, {}};
     }
     call.module.clear(call.now);
-    return {0, {{static_cast<std::uint8_t>(call.request[0] + positive)}}};
+    return {0, {{call.positiveService()}}};
 }
 
 } // namespace obdsim

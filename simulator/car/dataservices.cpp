@@ -6,7 +6,6 @@ namespace obdsim {
 
 namespace {
 
-constexpr std::uint8_t positive = 0x40;
 constexpr std::size_t pidsPerRequest = 6; // SAE J1979, on CAN only
 constexpr std::uint8_t freezeFrameCode = 0x02;
 
@@ -70,7 +69,7 @@ std::optional<Bytes> missingFrameItem(std::uint8_t number, std::uint8_t pid)
 
 Answer currentData(const ServiceCall& call)
 {
-    Bytes message = {static_cast<std::uint8_t>(call.request[0] + positive)};
+    Bytes message = {call.positiveService()};
     const std::size_t count = call.onCan() ? pidsPerRequest : 1;
     for (std::size_t i = 1; i <= count && i < call.request.size(); ++i) {
         const std::uint8_t pid = call.request[i];
@@ -94,7 +93,7 @@ Answer freezeFrame(const ServiceCall& call)
     if (!data) {
         return {};
     }
-    Bytes message = {static_cast<std::uint8_t>(call.request[0] + positive), *pid, *number};
+    Bytes message = {call.positiveService(), *pid, *number};
     message.insert(message.end(), data->begin(), data->end());
     return {0, {message}};
 }

@@ -6,7 +6,6 @@ namespace obdsim {
 
 namespace {
 
-constexpr std::uint8_t positive = 0x40;
 constexpr std::size_t lineData = 4; // data bytes in one numbered message
 
 /// An item of service 09: `data` holds `count` pieces one behind the other.
@@ -118,7 +117,7 @@ std::set<std::uint8_t> ids(const std::vector<Item>& items, bool onCan)
 
 Answer tellItem(const ServiceCall& call, const Item& item)
 {
-    const Bytes head = {static_cast<std::uint8_t>(call.request[0] + positive), item.id};
+    const Bytes head = {call.positiveService(), item.id};
     if (call.onCan()) {
         Bytes message = head;
         message.push_back(item.count);
@@ -139,7 +138,7 @@ Answer tellItem(const ServiceCall& call, const Item& item)
 
 Answer tellLineCount(const ServiceCall& call, const Item& item)
 {
-    const auto service = static_cast<std::uint8_t>(call.request[0] + positive);
+    const auto service = call.positiveService();
     return {0, {{service, static_cast<std::uint8_t>(item.id - 1), static_cast<std::uint8_t>(lineCount(item))}}};
 }
 

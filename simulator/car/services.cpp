@@ -8,7 +8,6 @@ namespace obdsim {
 namespace {
 
 constexpr std::size_t range = 0x20;
-constexpr std::uint8_t positive = 0x40;
 
 const Service services[] = {
     {0x01, currentData, [](const ModuleData& d) { return !d.live.empty() || !d.fixed.empty() || d.monitors; }},
@@ -88,7 +87,7 @@ Answer tellRange(const ServiceCall& call, const std::set<std::uint8_t>& ids)
     if (!mask) {
         return {};
     }
-    Bytes message = {static_cast<std::uint8_t>(call.request[0] + positive), base};
+    Bytes message = {call.positiveService(), base};
     const auto filler = rangeFiller(call.request[0]);
     if (filler && !call.onCan()) {
         message.push_back(*filler);

@@ -23,6 +23,9 @@ struct ServiceCall
 
     bool onCan() const;
 
+    /// The service byte of a positive answer.
+    std::uint8_t positiveService() const { return static_cast<std::uint8_t>(request[0] + 0x40); }
+
     /// Byte `index` of the request; nothing behind its end.
     std::optional<std::uint8_t> at(std::size_t index) const;
 };

@@ -4,23 +4,16 @@ namespace obdsim {
 
 namespace {
 
-constexpr std::uint8_t positive = 0x40;
 constexpr std::size_t routineData = 5;
 
 Bytes head(const ServiceCall& call, std::uint8_t id)
 {
-    return {static_cast<std::uint8_t>(call.request[0] + positive), id};
+    return {call.positiveService(), id};
 }
 
 void append(Bytes& message, const Bytes& data)
 {
     message.insert(message.end(), data.begin(), data.end());
-}
-
-void append(Bytes& message, std::uint16_t word)
-{
-    message.push_back(static_cast<std::uint8_t>(word >> 8));
-    message.push_back(static_cast<std::uint8_t>(word & 0xFF));
 }
 
 std::set<std::uint8_t> testIds(const std::vector<MonitorTest>& tests)
@@ -35,12 +28,12 @@ std::set<std::uint8_t> testIds(const std::vector<MonitorTest>& tests)
 /// CAN: one message with a record of nine bytes for each test of the monitor.
 Answer tellMonitor(const ServiceCall& call, std::uint8_t id)
 {
-    Bytes message = {static_cast<std::uint8_t>(call.request[0] + positive)};
+    Bytes message = {call.positiveService()};
     for (const auto& test : call.module.data().monitorTests) {
         if (test.id == id) {
             append(message, Bytes{id, test.test, test.scaling});
             for (const auto word : test.words) {
-                append(message, word);
+                appendWord(message, word);
             }
         }
     }
@@ -56,7 +49,7 @@ Answer tellComponents(const ServiceCall& call, std::uint8_t id)
             Bytes message = head(call, id);
             message.push_back(test.test);
             for (const auto word : test.words) {
-                append(message, word);
+                appendWord(message, word);
             }
             answer.messages.push_back(message);
         }

@@ -16,9 +16,9 @@ namespace {
 
 constexpr unsigned char clearService = 0x04;
 // Some modules write their memory before they answer.
-constexpr unsigned int replyLimitMs = 5000;
+constexpr unsigned int clearLimitMs = 5000;
 
-constexpr char const* warning =
+constexpr char const* clearWarning =
     R"(This clears the confirmed and pending trouble codes of all control modules and turns the lamp off.
 It also erases: freeze frames, readiness (the vehicle must be driven before it can pass an emissions
 test), monitor test results, and the distance and time since codes were cleared.
@@ -52,7 +52,7 @@ void checkOptions(GlobalOptions const& options)
 // others would clear twice.
 std::vector<ModuleOutcome> clearCodes(Session& session)
 {
-    ServiceReplies const replies(*session.proxy(), clearService, replyLimitMs);
+    ServiceReplies const replies(*session.proxy(), clearService, clearLimitMs);
     session.check();
     obd::IEcuManager& modules = *session.obd().getEcuManager();
     std::vector<unsigned int> known;
@@ -118,7 +118,7 @@ ExitCode clear(GlobalOptions const& options)
     checkOptions(options);
     Session session(options);
     session.connect();
-    if (!confirmed(session, warning, "Clear now?")) {
+    if (!confirmed(session, clearWarning, "Clear now?")) {
         tell("Nothing was cleared.\n");
         return ExitCode::Failed;
     }

@@ -14,12 +14,12 @@ namespace velmora {
 
 namespace {
 
-constexpr unsigned int replyLimitMs = 5000;
+constexpr unsigned int consoleLimitMs = 5000;
 
 void answer(Session& session, std::string const& command)
 {
     std::string reply;
-    obd::IDevice::Status const status = session.proxy()->execute(command, reply, replyLimitMs);
+    obd::IDevice::Status const status = session.proxy()->execute(command, reply, consoleLimitMs);
     session.check();
     if (status == obd::IDevice::Status::Ok) {
         fmt::print("{}\n", reply);

@@ -17,7 +17,7 @@ namespace {
 
 using Clock = std::chrono::steady_clock;
 
-constexpr std::chrono::milliseconds step{50};
+constexpr std::chrono::milliseconds lookInterval{50};
 
 struct LogOptions
 {
@@ -82,7 +82,7 @@ ExitCode log(LogOptions const& chosen, GlobalOptions const& options)
         return counted || expired || traffic.readerGone();
     };
     while (!done()) {
-        Clock::time_point const limit = Clock::now() + step;
+        Clock::time_point const limit = Clock::now() + lookInterval;
         session.loop().runUntil([&] { return Interrupt::instance().raised() || Clock::now() >= limit; }, limit);
         session.check();
     }

@@ -51,7 +51,7 @@ Candidate find(Session& session, unsigned char id)
                   {"`velmora routines` lists those that can be run"});
 }
 
-std::string warning(Candidate const& candidate)
+std::string routineWarning(Candidate const& candidate)
 {
     return fmt::format(
         "This asks control module {:X} {} to run routine {}: {}\n{}"
@@ -85,7 +85,7 @@ ExitCode run(std::string const& text, GlobalOptions const& options)
     Session session(options);
     session.connect();
     Candidate const candidate = find(session, id);
-    if (!confirmed(session, warning(candidate), "Run now?")) {
+    if (!confirmed(session, routineWarning(candidate), "Run now?")) {
         tell("Nothing was run.\n");
         return ExitCode::Failed;
     }
