@@ -2,6 +2,7 @@
 
 #include <obd/iconnectionmanager.h>
 #include <obd/iobdvelmora.h>
+#include <obd/parameteridentifier.h>
 
 #include "libobd/src/configuration.h"
 #include "libobd/src/connectionnotifier.h"
@@ -15,6 +16,11 @@
 #include <vector>
 
 namespace support {
+
+inline obd::ParameterIdentifier::Id pid(int id)
+{
+    return obd::ParameterIdentifier(id).id();
+}
 
 // Hands out the proxy of a test, and keeps the loggers that are to hear of the traffic; opens and closes nothing.
 class FakeConnectionManager : public obd::IConnectionManager

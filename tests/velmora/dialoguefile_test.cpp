@@ -20,8 +20,6 @@ protected:
     std::filesystem::path const m_path = m_folder / "car.dialogue";
 };
 
-} // namespace
-
 TEST_F(DialogueFileTest, holdsWhatWasSaved)
 {
     obdsim::Dialogue dialogue;
@@ -61,3 +59,5 @@ TEST_F(DialogueFileTest, tellsAFolderThatIsNotThere)
 {
     EXPECT_THROW(DialogueFile(m_folder / "nowhere" / "car.dialogue"), Failure);
 }
+
+} // namespace

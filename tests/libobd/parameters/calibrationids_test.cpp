@@ -10,10 +10,9 @@ using namespace obd;
 using namespace diagnosticsrig;
 using Texts = std::vector<std::string>;
 
-auto const canEcu = makeEcu(ObdProtocolCan29, 0x18DAF110);
-auto const vpwEcu = makeEcu(ObdProtocolJ1850, 0x10);
+auto const can29Ecu = makeEcu(ObdProtocolCan29, 0x18DAF110);
 
-struct Exposed : CalibrationIds
+struct ExposedCalibrationIds : CalibrationIds
 {
     using CalibrationIds::fromBytes;
 };
@@ -41,10 +40,10 @@ TEST(CalibrationIds, ReadsAListOnCanWithoutZeroBytes)
 {
     support::LogCapture log;
     CalibrationIds parameter;
-    ASSERT_TRUE(offer(parameter, canEcu,
+    ASSERT_TRUE(offer(parameter, can29Ecu,
                       "49 04 02 30 35 45 30 31 39 45 42 34 31 38 30 42 45 41 4A "
                       "00 35 36 30 32 00 38 39 34 39 41 43 00 00 00 00 00"));
-    EXPECT_EQ(parameter.calibrationIds(canEcu), (Texts{"05E019EB4180BEAJ", "56028949AC"}));
+    EXPECT_EQ(parameter.calibrationIds(can29Ecu), (Texts{"05E019EB4180BEAJ", "56028949AC"}));
     EXPECT_EQ(log.lines(), Texts{"INFO Number of CALID items: 2"});
 }
 
@@ -53,8 +52,8 @@ TEST(CalibrationIds, AnItemThatIsNotWholeStopsTheListAndKeepsWhatCameBefore)
     support::LogCapture log;
     CalibrationIds parameter;
     EXPECT_FALSE(
-        offer(parameter, canEcu, "49 04 02 30 35 45 30 31 39 45 42 34 31 38 30 42 45 41 4A 35 36 30 32 38 39 34 39"));
-    EXPECT_EQ(parameter.calibrationIds(canEcu), Texts{"05E019EB4180BEAJ"});
+        offer(parameter, can29Ecu, "49 04 02 30 35 45 30 31 39 45 42 34 31 38 30 42 45 41 4A 35 36 30 32 38 39 34 39"));
+    EXPECT_EQ(parameter.calibrationIds(can29Ecu), Texts{"05E019EB4180BEAJ"});
     EXPECT_EQ(log.lines(), (Texts{"INFO Number of CALID items: 2", "ERROR Invalid number of data bytes: 27"}));
 }
 
@@ -62,17 +61,17 @@ TEST(CalibrationIds, ReplyWithoutAWholeItemIsRefused)
 {
     support::LogCapture log;
     CalibrationIds parameter;
-    EXPECT_FALSE(offer(parameter, canEcu, "49 04 01 30 35 45 30 31 39 45 42 34 31 38 30 42 45 41"));
+    EXPECT_FALSE(offer(parameter, can29Ecu, "49 04 01 30 35 45 30 31 39 45 42 34 31 38 30 42 45 41"));
     EXPECT_EQ(log.lines(), Texts{"ERROR Invalid number of data bytes: 18"});
-    EXPECT_TRUE(parameter.calibrationIds(canEcu).empty());
+    EXPECT_TRUE(parameter.calibrationIds(can29Ecu).empty());
 }
 
 TEST(CalibrationIds, ACountOfZeroIsAnEmptyList)
 {
     CalibrationIds parameter;
     EXPECT_TRUE(parameter.setResponseData(
-        canEcu, Bytes{0x49, 0x04, 0x00, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15, 16}));
-    EXPECT_TRUE(parameter.calibrationIds(canEcu).empty());
+        can29Ecu, Bytes{0x49, 0x04, 0x00, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15, 16}));
+    EXPECT_TRUE(parameter.calibrationIds(can29Ecu).empty());
 }
 
 TEST(CalibrationIds, AFurtherReplyIsAppendedAndClearForgets)
@@ -153,7 +152,7 @@ TEST(CalibrationIds, TooFewLinesAreRefused)
 TEST(CalibrationIds, RefusesAnotherSignature)
 {
     support::LogCapture log;
-    Exposed parameter;
+    ExposedCalibrationIds parameter;
     EXPECT_FALSE(parameter.fromBytes(vpwEcu, Bytes(28, 0x49)));
     EXPECT_TRUE(log.contains("ERROR Invalid data received; signature mismatch"));
 }

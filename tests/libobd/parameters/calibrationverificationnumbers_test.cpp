@@ -10,9 +10,6 @@ using namespace obd;
 using namespace diagnosticsrig;
 using Texts = std::vector<std::string>;
 
-auto const canEcu = makeEcu(ObdProtocolCan11);
-auto const vpwEcu = makeEcu(ObdProtocolJ1850, 0x10);
-
 TEST(CalibrationVerificationNumbers, AsksForInfoType06)
 {
     EXPECT_EQ(requestOf(CalibrationVerificationNumbers()), (Bytes{0x09, 0x06}));
@@ -60,7 +57,6 @@ TEST(CalibrationVerificationNumbers, ReadsEightLinesOfARealCarWithChecksums)
 
 TEST(CalibrationVerificationNumbers, ReadsLinesWithoutChecksums)
 {
-    auto const kwpEcu = makeEcu(ObdProtocolIso14230, 0x12);
     CalibrationVerificationNumbers parameter;
     ASSERT_TRUE(offer(parameter, kwpEcu, "49 06 01 00 00 FA 22 49 06 02 00 00 E7 65"));
     EXPECT_EQ(parameter.verificationNumbers(kwpEcu), (Texts{"0000FA22", "0000E765"}));

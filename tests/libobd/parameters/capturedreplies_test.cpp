@@ -6,6 +6,7 @@
 #include "libobd/parameters/identificationnumber.h"
 #include "libobd/parameters/monitortestresult.h"
 #include "tests/libobd/parameters/diagnosticsrig.h"
+#include "tests/support/dialoguefolder.h"
 
 #include <gtest/gtest.h>
 
@@ -38,7 +39,7 @@ std::vector<std::string> cellsOf(std::string const& line)
 
 std::vector<Row> rowsNamed(std::string const& name)
 {
-    std::ifstream file(std::string(VELMORA_SOURCE_DIR) + "/tests/dialogues/decoded.txt");
+    std::ifstream file(support::dialogueFolder / "decoded.txt");
     std::vector<Row> rows;
     for (std::string line; std::getline(file, line);) {
         std::vector<std::string> cells = cellsOf(line);

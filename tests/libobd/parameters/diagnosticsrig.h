@@ -20,6 +20,12 @@ inline std::shared_ptr<obd::IEcu> makeEcu(obd::ObdProtocol protocol, unsigned in
     return ecu;
 }
 
+// A module of each family.
+inline std::shared_ptr<obd::IEcu> const canEcu = makeEcu(obd::ObdProtocolCan11);
+inline std::shared_ptr<obd::IEcu> const isoEcu = makeEcu(obd::ObdProtocolIso9141, 0x10);
+inline std::shared_ptr<obd::IEcu> const kwpEcu = makeEcu(obd::ObdProtocolIso14230, 0x12);
+inline std::shared_ptr<obd::IEcu> const vpwEcu = makeEcu(obd::ObdProtocolJ1850, 0x10);
+
 // Hands a parameter a reply such as "49 02 01 31" of a module.
 inline bool offer(obd::ObdParameter& parameter, std::shared_ptr<obd::IEcu> const& ecu, std::string_view reply)
 {

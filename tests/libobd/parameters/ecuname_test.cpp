@@ -11,14 +11,11 @@ using namespace obd;
 using namespace diagnosticsrig;
 using Texts = std::vector<std::string>;
 
-auto const canEcu = makeEcu(ObdProtocolCan11);
-auto const isoEcu = makeEcu(ObdProtocolIso9141, 0x10);
-
 constexpr char const* engineControl = "49 0A 01 45 43 4D 00 2D 45 6E 67 69 6E 65 43 6F 6E 74 72 6F 6C 00 00";
 constexpr char const* engineLines =
     "49 0A 01 45 43 4D 31 49 0A 02 2D 45 6E 67 49 0A 03 69 6E 65 43 49 0A 04 6F 6E 74 72 49 0A 05 6F 6C 00 00";
 
-struct Exposed : EcuName
+struct ExposedEcuName : EcuName
 {
     using EcuName::fromBytes;
 };
@@ -134,7 +131,7 @@ TEST(EcuName, ShortRepliesAreRefusedAndTheOldNameStays)
 TEST(EcuName, RefusesAnotherSignature)
 {
     support::LogCapture log;
-    Exposed parameter;
+    ExposedEcuName parameter;
     EXPECT_FALSE(parameter.fromBytes(isoEcu, Bytes(35, 0x49)));
     EXPECT_TRUE(log.contains("ERROR Invalid data received; signature mismatch"));
 }

@@ -9,10 +9,6 @@ namespace {
 using namespace obd;
 using namespace diagnosticsrig;
 
-auto const canEcu = makeEcu(ObdProtocolCan11);
-auto const isoEcu = makeEcu(ObdProtocolIso9141, 0x10);
-auto const kwpEcu = makeEcu(ObdProtocolIso14230, 0x12);
-
 std::string vin(VehicleIdentificationNumber const& parameter, std::shared_ptr<IEcu> const& ecu)
 {
     return parameter.vehicleIdentificationNumber(ecu);

@@ -10,11 +10,7 @@ using namespace obd;
 using namespace diagnosticsrig;
 using Texts = std::vector<std::string>;
 
-auto const canEcu = makeEcu(ObdProtocolCan11);
-auto const isoEcu = makeEcu(ObdProtocolIso9141, 0x10);
-auto const kwpEcu = makeEcu(ObdProtocolIso14230, 0x10);
-
-struct Exposed : MonitorTestResult
+struct ExposedMonitorTestResult : MonitorTestResult
 {
     using MonitorTestResult::fromBytes;
     using MonitorTestResult::MonitorTestResult;
@@ -41,7 +37,7 @@ TEST(MonitorTestResult, AsksForItsMonitor)
 
 TEST(MonitorTestResult, ACanReplyOf1ByteIsAMonitorWithoutResults)
 {
-    Exposed parameter(0x01);
+    ExposedMonitorTestResult parameter(0x01);
     EXPECT_TRUE(parameter.fromBytes(canEcu, Bytes{0x46}));
     auto const monitors = parameter.getItems(*canEcu);
     ASSERT_EQ(monitors.size(), 1U);
@@ -54,7 +50,7 @@ TEST(MonitorTestResult, ACanReplyOf1ByteIsAMonitorWithoutResults)
 TEST(MonitorTestResult, ACanReplyWith46And10BytesIsRefused)
 {
     support::LogCapture log;
-    Exposed parameter(0x01);
+    ExposedMonitorTestResult parameter(0x01);
     EXPECT_FALSE(offer(parameter, canEcu, "46 01 01 0A 00 01 00 00 00 02 01"));
     EXPECT_FALSE(parameter.fromBytes(canEcu, Bytes{}));
     EXPECT_EQ(log.lines(), (Texts{"ERROR Invalid number of data bytes: 11", "ERROR Invalid number of data bytes: 0"}));

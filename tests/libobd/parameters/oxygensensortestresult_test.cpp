@@ -11,7 +11,6 @@ using namespace obd;
 using namespace diagnosticsrig;
 using Texts = std::vector<std::string>;
 
-auto const isoEcu = makeEcu(ObdProtocolIso9141, 0x10);
 constexpr OxygenSensorLocation front = OxygenSensorLocation::Bank1Sensor1;
 
 // "0.500 (0.000 to 1.275) 4 status 0"

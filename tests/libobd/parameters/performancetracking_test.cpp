@@ -16,9 +16,6 @@ using Compression = PerformanceTrackingCompression;
 using Numbers = std::vector<int>;
 using Texts = std::vector<std::string>;
 
-auto const canEcu = makeEcu(ObdProtocolCan11);
-auto const isoEcu = makeEcu(ObdProtocolIso9141, 0x10);
-
 // A reply on CAN whose counter i reads first + i.
 Bytes canReply(unsigned char infoType, int count, int first)
 {

@@ -6,6 +6,7 @@
 #include "libobd/src/hexformat.h"
 #include "libobd/src/protocolfamily.h"
 
+#include "tests/support/dialoguefolder.h"
 #include "tests/support/dtcrows.h"
 #include "tests/support/fakeecu.h"
 #include "tests/support/hexbytes.h"
@@ -28,7 +29,7 @@ namespace fs = std::filesystem;
 using Bytes = std::vector<unsigned char>;
 using Messages = std::vector<Bytes>;
 
-fs::path const folder = fs::path(VELMORA_SOURCE_DIR) / "tests" / "dialogues";
+using support::dialogueFolder;
 
 // The bus family by the beginning of a dialogue's name.
 obd::ObdProtocol protocolOf(std::string const& dialogue)
@@ -51,7 +52,7 @@ Bytes joined(Messages const& messages)
 }
 
 // Lines of one module make one reply on the buses before CAN; on CAN each message is one.
-bool offer(obd::ObdParameter& parameter, std::shared_ptr<obd::IEcu> const& ecu, Messages const& messages)
+bool offerAll(obd::ObdParameter& parameter, std::shared_ptr<obd::IEcu> const& ecu, Messages const& messages)
 {
     if (!isCan(ecu->protocol())) {
         return parameter.setResponseData(ecu, joined(messages));
@@ -72,32 +73,32 @@ std::string codesIn(obd::DtcParameter const& parameter, obd::IEcu const& ecu)
     return codes.empty() ? "none" : codes;
 }
 
-using Reader = std::function<std::string(std::shared_ptr<obd::IEcu> const&, Messages const&)>;
+using CodeReader = std::function<std::string(std::shared_ptr<obd::IEcu> const&, Messages const&)>;
 
 template <typename Codes>
 std::string readCodes(std::shared_ptr<obd::IEcu> const& ecu, Messages const& messages)
 {
     Codes codes;
-    return offer(codes, ecu, messages) ? codesIn(codes, *ecu) : "refused";
+    return offerAll(codes, ecu, messages) ? codesIn(codes, *ecu) : "refused";
 }
 
 std::string readClearing(std::shared_ptr<obd::IEcu> const& ecu, Messages const& messages)
 {
     obd::ClearTroubleCodes clearing;
-    return offer(clearing, ecu, messages) && clearing.isCleared(*ecu) ? "yes" : "refused";
+    return offerAll(clearing, ecu, messages) && clearing.isCleared(*ecu) ? "yes" : "refused";
 }
 
 std::string readFreezeFrameCode(std::shared_ptr<obd::IEcu> const& ecu, Messages const& messages)
 {
     obd::FreezeFrameTroubleCode code(0);
-    if (!offer(code, ecu, messages)) {
+    if (!offerAll(code, ecu, messages)) {
         return "refused";
     }
     return code.getTroubleCode(*ecu) != nullptr ? code.getTroubleCode(*ecu)->code : "none";
 }
 
 // By the request without its blanks.
-std::map<std::string, Reader> const readers = {
+std::map<std::string, CodeReader> const readers = {
     {"03", readCodes<obd::ConfirmedTroubleCodes>},
     {"04", readClearing},
     {"07", readCodes<obd::PendingTroubleCodes>},
@@ -126,7 +127,7 @@ void tell(std::vector<std::string>& lines, std::string const& dialogue, std::str
 void forEachReply(std::function<void(std::string const& dialogue, std::string const& request, int occurrence,
                                      support::ExpectedPayloads const& payloads)> const& take)
 {
-    for (fs::directory_entry const& entry : fs::directory_iterator(folder)) {
+    for (fs::directory_entry const& entry : fs::directory_iterator(dialogueFolder)) {
         if (entry.path().extension() != ".payloads") {
             continue;
         }
@@ -168,8 +169,8 @@ std::vector<std::shared_ptr<obd::DtcDataModel>> readModels(std::shared_ptr<obd::
                                                            Messages const& messages)
 {
     Codes codes;
-    return offer(codes, ecu, messages) ? codes.getTroubleCodes(*ecu)
-                                       : std::vector<std::shared_ptr<obd::DtcDataModel>>();
+    return offerAll(codes, ecu, messages) ? codes.getTroubleCodes(*ecu)
+                                          : std::vector<std::shared_ptr<obd::DtcDataModel>>();
 }
 
 // In the form of recordedtexts.txt.
@@ -226,7 +227,7 @@ std::vector<obd::ObdProtocol> busesOf(std::string const& name)
 TEST(RecordedCodes, WorkedDecodesComeOutTheSame)
 {
     int rows = 0;
-    std::ifstream in(folder / "decoded.txt");
+    std::ifstream in(dialogueFolder / "decoded.txt");
     for (std::string line; std::getline(in, line);) {
         std::vector<std::string> const fields = split(line, "  +");
         if (fields.size() < 5 || !readers.contains(withoutBlanks(fields[0]))) {

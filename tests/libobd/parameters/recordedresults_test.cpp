@@ -10,6 +10,7 @@
 #include "libobd/src/hexformat.h"
 #include "libobd/src/protocolfamily.h"
 
+#include "tests/support/dialoguefolder.h"
 #include "tests/support/fakeecu.h"
 #include "tests/support/recordedreply.h"
 #include "tests/support/tablefile.h"
@@ -26,7 +27,7 @@ using Ecu = std::shared_ptr<obd::IEcu>;
 using Bytes = std::vector<unsigned char>;
 using Texts = std::vector<std::string>;
 
-fs::path const folder = fs::path(VELMORA_SOURCE_DIR) / "tests" / "dialogues";
+using support::dialogueFolder;
 
 std::string joined(Texts const& texts, std::string const& separator)
 {
@@ -153,7 +154,7 @@ void tell(Texts& lines, std::string const& name, support::RecordedDialogue const
 TEST(RecordedResults, AreReadAsTheyWereMeant)
 {
     Texts lines;
-    for (fs::directory_entry const& entry : fs::directory_iterator(folder)) {
+    for (fs::directory_entry const& entry : fs::directory_iterator(dialogueFolder)) {
         if (entry.path().extension() == ".dialogue") {
             tell(lines, entry.path().stem().string(), support::readDialogue(entry.path()));
         }

@@ -9,10 +9,7 @@ namespace {
 using namespace obd;
 using namespace diagnosticsrig;
 
-auto const canEcu = makeEcu(ObdProtocolCan11);
-auto const isoEcu = makeEcu(ObdProtocolIso9141, 0x10);
-
-struct Exposed : TestRoutine
+struct ExposedTestRoutine : TestRoutine
 {
     using TestRoutine::fromBytes;
     using TestRoutine::TestRoutine;
@@ -59,7 +56,7 @@ TEST(TestRoutine, OlderBusReplyOf6BytesStoresNothing)
 
 TEST(TestRoutine, CanReplyOf1ByteStoresNothing)
 {
-    Exposed routine(1, ObdProtocolCan11);
+    ExposedTestRoutine routine(1, ObdProtocolCan11);
     EXPECT_FALSE(routine.fromBytes(canEcu, Bytes{0x48}));
     EXPECT_EQ(routine.result(*canEcu), TestRoutine::NoAnswer);
 }

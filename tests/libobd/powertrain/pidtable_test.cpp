@@ -46,7 +46,7 @@ struct TableRow
     ScaleCells imperial;
 };
 
-std::vector<TableRow> rows()
+std::vector<TableRow> tableRows()
 {
     std::vector<TableRow> result;
     for (auto const& cells : support::readTable("tests/libobd/powertrain/pid_table.txt")) {
@@ -111,7 +111,7 @@ void replyOfAllSensors(obd::PowertrainParameter& parameter, std::shared_ptr<obd:
 
 TEST_F(PidTable, EverySensorIsCalledAndScaledAsTheTableSays)
 {
-    for (TableRow const& row : rows()) {
+    for (TableRow const& row : tableRows()) {
         SCOPED_TRACE(row.className + " sensor " + std::to_string(row.index));
         auto const parameter = support::liveParameter(row.className);
         EXPECT_EQ(parameter->pid(), row.pid);
@@ -129,7 +129,7 @@ TEST_F(PidTable, EverySensorIsCalledAndScaledAsTheTableSays)
 TEST_F(PidTable, EverySensorPublishesTheTypeAndDecimalsThatTheTableSays)
 {
     obd::FuelTrim::setByteBInUse(true);
-    for (TableRow const& row : rows()) {
+    for (TableRow const& row : tableRows()) {
         SCOPED_TRACE(row.className + " sensor " + std::to_string(row.index));
         auto const parameter = support::liveParameter(row.className);
         ASSERT_NO_FATAL_FAILURE(replyOfAllSensors(*parameter, m_ecu, row.bytes + 1));
@@ -147,7 +147,7 @@ TEST_F(PidTable, EverySensorPublishesTheTypeAndDecimalsThatTheTableSays)
 
 TEST_F(PidTable, PayloadsShorterThanTheTableSaysAreRefused)
 {
-    for (TableRow const& row : rows()) {
+    for (TableRow const& row : tableRows()) {
         SCOPED_TRACE(row.className);
         auto const parameter = support::liveParameter(row.className);
         EXPECT_FALSE(support::reply(*parameter, m_ecu, support::Bytes(row.bytes - 1, 0xFE)));
@@ -158,7 +158,7 @@ TEST_F(PidTable, PayloadsShorterThanTheTableSaysAreRefused)
 TEST_F(PidTable, NoClassAndNoSensorIsMissingFromTheTable)
 {
     std::set<std::pair<std::string, std::size_t>> told;
-    for (TableRow const& row : rows()) {
+    for (TableRow const& row : tableRows()) {
         told.emplace(row.className, row.index);
     }
     std::size_t sensors = 0;

@@ -10,7 +10,7 @@ using namespace obd;
 using Bytes = std::vector<unsigned char>;
 using Model = ReadinessMonitorDataModel;
 
-std::shared_ptr<IEcu> const engine = std::make_shared<support::FakeEcu>(0x7E8);
+std::shared_ptr<IEcu> const engineModule = std::make_shared<support::FakeEcu>(0x7E8);
 
 TEST(ReadinessMonitors, TableAgreesRowByRow)
 {
@@ -49,16 +49,17 @@ void expectStates(ReadinessMonitorTest test, unsigned int availableBit, unsigned
     bool const others = (bits & 16U) != 0;
     MonitorStatus status;
     MonitorStatusThisCycle cycle;
-    ASSERT_TRUE(status.setResponseData(engine, wordOf(0x01, availableBit, available, completeBit, incomplete, others)));
     ASSERT_TRUE(
-        cycle.setResponseData(engine, wordOf(0x41, availableBit, enabled, completeBit, cycleIncomplete, others)));
-    EXPECT_EQ(readinessSinceCleared(*engine, status, test), !available   ? Model::NotAvailable
-                                                            : incomplete ? Model::NotComplete
-                                                                         : Model::Complete);
-    EXPECT_EQ(readinessThisCycle(*engine, status, cycle, test), !available        ? Model::NotAvailable
-                                                                : !enabled        ? Model::DisabledThisCycle
-                                                                : cycleIncomplete ? Model::NotComplete
-                                                                                  : Model::Complete);
+        status.setResponseData(engineModule, wordOf(0x01, availableBit, available, completeBit, incomplete, others)));
+    ASSERT_TRUE(
+        cycle.setResponseData(engineModule, wordOf(0x41, availableBit, enabled, completeBit, cycleIncomplete, others)));
+    EXPECT_EQ(readinessSinceCleared(*engineModule, status, test), !available   ? Model::NotAvailable
+                                                                  : incomplete ? Model::NotComplete
+                                                                               : Model::Complete);
+    EXPECT_EQ(readinessThisCycle(*engineModule, status, cycle, test), !available        ? Model::NotAvailable
+                                                                      : !enabled        ? Model::DisabledThisCycle
+                                                                      : cycleIncomplete ? Model::NotComplete
+                                                                                        : Model::Complete);
 }
 
 TEST(ReadinessMonitors, EveryMonitorFollowsTheBitsOfTheTable)
@@ -96,23 +97,24 @@ TEST(ReadinessMonitors, ListFollowsTheIgnitionType)
 TEST(ReadinessMonitors, StatusSinceCleared)
 {
     MonitorStatus status;
-    ASSERT_TRUE(status.setResponseData(engine, Bytes{0x41, 0x01, 0x81, 0x07, 0x65, 0x04}));
-    EXPECT_EQ(readinessSinceCleared(*engine, status, ReadinessMisfire), Model::Complete);
-    EXPECT_EQ(readinessSinceCleared(*engine, status, ReadinessEvaporativeSystem), Model::NotComplete);
-    EXPECT_EQ(readinessSinceCleared(*engine, status, ReadinessHeatedCatalyst), Model::NotAvailable);
+    ASSERT_TRUE(status.setResponseData(engineModule, Bytes{0x41, 0x01, 0x81, 0x07, 0x65, 0x04}));
+    EXPECT_EQ(readinessSinceCleared(*engineModule, status, ReadinessMisfire), Model::Complete);
+    EXPECT_EQ(readinessSinceCleared(*engineModule, status, ReadinessEvaporativeSystem), Model::NotComplete);
+    EXPECT_EQ(readinessSinceCleared(*engineModule, status, ReadinessHeatedCatalyst), Model::NotAvailable);
 }
 
 TEST(ReadinessMonitors, StatusThisCycle)
 {
     MonitorStatus status;
     MonitorStatusThisCycle thisCycle;
-    ASSERT_TRUE(status.setResponseData(engine, Bytes{0x41, 0x01, 0x00, 0x07, 0x07, 0x07}));
-    ASSERT_TRUE(thisCycle.setResponseData(engine, Bytes{0x41, 0x41, 0x00, 0x07, 0x0B, 0x02}));
-    EXPECT_EQ(readinessThisCycle(*engine, status, thisCycle, ReadinessCatalyst), Model::Complete);
-    EXPECT_EQ(readinessThisCycle(*engine, status, thisCycle, ReadinessHeatedCatalyst), Model::NotComplete);
-    EXPECT_EQ(readinessThisCycle(*engine, status, thisCycle, ReadinessEvaporativeSystem), Model::DisabledThisCycle);
+    ASSERT_TRUE(status.setResponseData(engineModule, Bytes{0x41, 0x01, 0x00, 0x07, 0x07, 0x07}));
+    ASSERT_TRUE(thisCycle.setResponseData(engineModule, Bytes{0x41, 0x41, 0x00, 0x07, 0x0B, 0x02}));
+    EXPECT_EQ(readinessThisCycle(*engineModule, status, thisCycle, ReadinessCatalyst), Model::Complete);
+    EXPECT_EQ(readinessThisCycle(*engineModule, status, thisCycle, ReadinessHeatedCatalyst), Model::NotComplete);
+    EXPECT_EQ(readinessThisCycle(*engineModule, status, thisCycle, ReadinessEvaporativeSystem),
+              Model::DisabledThisCycle);
     // Enabled in the cycle's word, but the vehicle says that it has no such monitor.
-    EXPECT_EQ(readinessThisCycle(*engine, status, thisCycle, ReadinessSecondaryAirSystem), Model::NotAvailable);
+    EXPECT_EQ(readinessThisCycle(*engineModule, status, thisCycle, ReadinessSecondaryAirSystem), Model::NotAvailable);
 }
 
 TEST(ReadinessMonitors, StatusNumbersStandFirm)

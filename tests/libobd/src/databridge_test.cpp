@@ -20,9 +20,9 @@ using testing::ElementsAre;
 using testing::IsEmpty;
 using Bytes = std::vector<unsigned char>;
 
-struct Tap : obd::IConnectionLogger
+struct NamedTap : obd::IConnectionLogger
 {
-    explicit Tap(std::vector<std::string>& sink, std::string tag = {}) : lines(sink), name(std::move(tag)) {}
+    explicit NamedTap(std::vector<std::string>& sink, std::string tag = {}) : lines(sink), name(std::move(tag)) {}
     void onDataSent(Bytes const& data) override { lines.push_back(name + ">" + text(data)); }
     void onDataReceived(Bytes const& data) override { lines.push_back(name + "<" + text(data)); }
 
@@ -246,8 +246,8 @@ TEST_F(DataBridge, ChangedDelimiterLeavesQueuedMessagesAndRescansTheRest)
 TEST_F(DataBridge, TapsSeeWhatIsSentAndWhatIsTakenInTheOrderOfRegistration)
 {
     std::vector<std::string> lines;
-    Tap first(lines, "1");
-    Tap second(lines, "2");
+    NamedTap first(lines, "1");
+    NamedTap second(lines, "2");
     m_bridge.addLogger(&first);
     m_bridge.addLogger(&second);
     m_bridge.send(bytes("ATI\r"));
@@ -260,7 +260,7 @@ TEST_F(DataBridge, TapsSeeWhatIsSentAndWhatIsTakenInTheOrderOfRegistration)
 TEST_F(DataBridge, TapAddedTwiceIsCalledTwiceAndRemovedOneAtATime)
 {
     std::vector<std::string> lines;
-    Tap tap(lines);
+    NamedTap tap(lines);
     m_bridge.addLogger(&tap);
     m_bridge.addLogger(&tap);
     m_bridge.send(bytes("a"));
@@ -276,8 +276,8 @@ TEST_F(DataBridge, TapAddedTwiceIsCalledTwiceAndRemovedOneAtATime)
 TEST_F(DataBridge, RemovingATapThatWasNeverAddedDoesNothing)
 {
     std::vector<std::string> lines;
-    Tap tap(lines);
-    Tap stranger(lines);
+    NamedTap tap(lines);
+    NamedTap stranger(lines);
     m_bridge.addLogger(&tap);
     m_bridge.removeLogger(&stranger);
     m_bridge.removeLogger(nullptr);

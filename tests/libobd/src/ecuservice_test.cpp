@@ -12,7 +12,7 @@ using obd::ObdMode;
 using testing::ElementsAre;
 using testing::IsEmpty;
 using Lines = std::vector<std::string>;
-using Models = std::vector<std::shared_ptr<obd::ParameterDataModel>>;
+using ParameterModels = std::vector<std::shared_ptr<obd::ParameterDataModel>>;
 
 class EcuService : public support::ServiceTest
 {
@@ -68,7 +68,7 @@ protected:
     std::shared_ptr<obd::IEcuService> m_service = obd::EcuServiceBuilder::createEcuService();
 };
 
-std::vector<int> ids(Models const& models)
+std::vector<int> ids(ParameterModels const& models)
 {
     std::vector<int> all;
     for (auto const& model : models) {
@@ -78,7 +78,7 @@ std::vector<int> ids(Models const& models)
 }
 
 // Null if there is none.
-std::shared_ptr<obd::ParameterDataModel> find(Models const& models, int id)
+std::shared_ptr<obd::ParameterDataModel> find(ParameterModels const& models, int id)
 {
     auto const found = std::find_if(models.begin(), models.end(), [id](auto const& model) { return model->id == id; });
     return found != models.end() ? *found : nullptr;

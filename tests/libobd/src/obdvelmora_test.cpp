@@ -29,7 +29,7 @@ using support::MemorySettings;
 using testing::ElementsAre;
 using testing::IsEmpty;
 
-constexpr auto automatic = obd::VehicleProtocol::Automatic;
+constexpr auto automaticProtocol = obd::VehicleProtocol::Automatic;
 
 // A store whose disk is gone.
 class BrokenSettings : public MemorySettings
@@ -46,7 +46,7 @@ public:
     bool broken = true;
 };
 
-class PhaseRecorder : public obd::IConnectionPhaseListener, public obd::IConnectionNotifierListener
+class ConnectionRecorder : public obd::IConnectionPhaseListener, public obd::IConnectionNotifierListener
 {
 public:
     void onPhaseChanged(int phase) override { calls.push_back(std::to_string(phase)); }
@@ -129,7 +129,7 @@ TEST_F(ObdVelmora, AnOpeningReachesModulesThenServicesThenTheApplication)
     auto const obd = create();
     auto const service = obd::ConnectionServiceBuilder::createConnectionService();
     obd::BaseService const plain(obd.get());
-    ASSERT_TRUE(obd->getConnectionManager()->openConnection(workingChannel(), automatic, false));
+    ASSERT_TRUE(obd->getConnectionManager()->openConnection(workingChannel(), automaticProtocol, false));
     EXPECT_TRUE(obd->getConnectionNotifier()->isConnected());
     EXPECT_EQ(obd->getEcuManager()->getCurrentEcu()->id(), 0x7E8U);
     EXPECT_TRUE(plain.isConnected());
@@ -151,9 +151,9 @@ TEST_F(ObdVelmora, TheAdapterIsThereWithoutAVehicleThoughNotConnected)
     support::expectInitialize(*channel);
     channel->expect("ATTP0").reply("OK\r\r>");
     channel->expect("0100").loseLink();
-    PhaseRecorder recorder;
+    ConnectionRecorder recorder;
     obd->getConnectionNotifier()->attach(0, &recorder);
-    EXPECT_FALSE(obd->getConnectionManager()->openConnection(channel, automatic, false));
+    EXPECT_FALSE(obd->getConnectionManager()->openConnection(channel, automaticProtocol, false));
     EXPECT_FALSE(service->isConnected());
     EXPECT_EQ(service->adapter(), obd->getConnectionManager()->getAdapter());
     EXPECT_NE(service->adapter(), nullptr);
@@ -165,12 +165,12 @@ TEST_F(ObdVelmora, TheAdapterIsThereWithoutAVehicleThoughNotConnected)
 TEST_F(ObdVelmora, DestroyingItClosesTheConnectionWithoutTellingServices)
 {
     auto obd = create();
-    PhaseRecorder recorder;
+    ConnectionRecorder recorder;
     auto const manager = obd->getConnectionManager();
     manager->addPhaseListener(&recorder);
     obd->getConnectionNotifier()->attach(1, &recorder);
     auto const channel = workingChannel();
-    ASSERT_TRUE(manager->openConnection(channel, automatic, false));
+    ASSERT_TRUE(manager->openConnection(channel, automaticProtocol, false));
     recorder.calls.clear();
     obd.reset();
     EXPECT_THAT(recorder.calls, ElementsAre("0"));
@@ -183,7 +183,7 @@ TEST_F(ObdVelmora, AManagerThatIsHeldLongerStaysUsable)
     auto obd = create();
     auto const manager = obd->getConnectionManager();
     obd.reset();
-    EXPECT_TRUE(manager->openConnection(workingChannel(), automatic, false));
+    EXPECT_TRUE(manager->openConnection(workingChannel(), automaticProtocol, false));
     manager->closeConnection();
 }
 
@@ -191,7 +191,7 @@ TEST_F(ObdVelmora, ServicesMayComeAndGoOnAConnectionInAnyOrder)
 {
     auto const obd = create();
     auto first = obd::TroubleCodeServiceBuilder::createTroubleCodeService();
-    ASSERT_TRUE(obd->getConnectionManager()->openConnection(workingChannel(), automatic, false));
+    ASSERT_TRUE(obd->getConnectionManager()->openConnection(workingChannel(), automaticProtocol, false));
     auto second = obd::TroubleCodeServiceBuilder::createTroubleCodeService();
     EXPECT_NE(first, second);
     first.reset();
@@ -218,7 +218,7 @@ TEST_F(ObdVelmora, AServiceWhoseStoreFailsIsNotLeftInAnyList)
     store->broken = true;
     EXPECT_THROW(obd::BaseService service(obd.get()), std::runtime_error);
     store->broken = false;
-    ASSERT_TRUE(obd->getConnectionManager()->openConnection(workingChannel(), automatic, false));
+    ASSERT_TRUE(obd->getConnectionManager()->openConnection(workingChannel(), automaticProtocol, false));
     obd->getSettings()->setUnitSystem(obd::UnitSystem::Imperial);
     obd->getConnectionManager()->closeConnection();
     m_loop.runPending();
@@ -229,7 +229,7 @@ TEST_F(ObdVelmora, AStoreWithoutValuesGivesDefaults)
     m_store->failReads(true);
     auto const obd = create();
     EXPECT_EQ(obd->getSettings()->unitSystem(), obd::UnitSystem::Metric);
-    EXPECT_TRUE(obd->getConnectionManager()->openConnection(workingChannel(), automatic, false));
+    EXPECT_TRUE(obd->getConnectionManager()->openConnection(workingChannel(), automaticProtocol, false));
     obd->getConnectionManager()->closeConnection();
 }
 

@@ -14,11 +14,6 @@
 
 namespace support {
 
-inline obd::ParameterIdentifier::Id pid(int id)
-{
-    return obd::ParameterIdentifier(id).id();
-}
-
 // Writes down what it hears, as "0C 1726" for a reading, and does inside a call what a test says.
 class SensorRecorder : public tervex::Observer<obd::ISensorServiceObserver>
 {

@@ -1,6 +1,7 @@
 // Feeds every reply of the recorded dialogues that was printed with headers through the way that replies take in the
 // driver, and compares what comes out with payloads that were worked out by hand.
 
+#include "tests/support/dialoguefolder.h"
 #include "tests/support/payloadfile.h"
 #include "tests/support/recordedreply.h"
 
@@ -18,12 +19,12 @@ namespace {
 namespace fs = std::filesystem;
 using obd::ResponseMap;
 
-fs::path const folder = fs::path(VELMORA_SOURCE_DIR) / "tests" / "dialogues";
+using support::dialogueFolder;
 
 std::vector<std::string> recordings()
 {
     std::vector<std::string> names;
-    for (fs::directory_entry const& entry : fs::directory_iterator(folder)) {
+    for (fs::directory_entry const& entry : fs::directory_iterator(dialogueFolder)) {
         if (entry.path().extension() == ".payloads") {
             names.push_back(entry.path().stem().string());
         }
@@ -73,8 +74,8 @@ std::string printed(support::ModuleMessages const& messages)
 class Transcript : public testing::TestWithParam<std::string>
 {
 protected:
-    support::RecordedDialogue dialogue = support::readDialogue(folder / (GetParam() + ".dialogue"));
-    support::PayloadFile payloads = support::readPayloads(folder / (GetParam() + ".payloads"));
+    support::RecordedDialogue dialogue = support::readDialogue(dialogueFolder / (GetParam() + ".dialogue"));
+    support::PayloadFile payloads = support::readPayloads(dialogueFolder / (GetParam() + ".payloads"));
 };
 
 INSTANTIATE_TEST_SUITE_P(Recorded, Transcript, testing::ValuesIn(recordings()),
@@ -124,7 +125,7 @@ TEST(Transcripts, CoverEveryBusFamily)
 {
     std::map<obd::ObdProtocol, int> replies;
     for (std::string const& name : recordings()) {
-        support::RecordedDialogue const dialogue = support::readDialogue(folder / (name + ".dialogue"));
+        support::RecordedDialogue const dialogue = support::readDialogue(dialogueFolder / (name + ".dialogue"));
         for (support::Question const& question : questionsWithHeaders(dialogue)) {
             replies[support::familyOf(dialogue)] += isVehicleRequest(question.request) ? 1 : 0;
         }

@@ -14,15 +14,11 @@ using obd::ObdMode;
 using obd::ParameterIdentifier;
 using support::FakeEcu;
 using support::FakeProxy;
+using support::pid;
 using testing::ElementsAre;
 using testing::IsEmpty;
 using Lines = std::vector<std::string>;
 using MilStatus = obd::ITroubleCodeService::MilStatus;
-
-ParameterIdentifier::Id pid(int id)
-{
-    return ParameterIdentifier(id).id();
-}
 
 class TroubleCodeService : public testing::Test
 {
@@ -67,7 +63,7 @@ protected:
     std::shared_ptr<obd::ITroubleCodeService> m_service;
 };
 
-std::vector<std::string> texts(std::vector<std::shared_ptr<obd::DtcDataModel>> const& models)
+std::vector<std::string> codesOf(std::vector<std::shared_ptr<obd::DtcDataModel>> const& models)
 {
     std::vector<std::string> codes;
     for (auto const& model : models) {
@@ -128,7 +124,7 @@ TEST_F(TroubleCodeService, AServiceBuiltOnAConnectionWorksAtOnce)
     proxy().answer("03", "43 01 04 20");
     auto const late = obd::TroubleCodeServiceBuilder::createTroubleCodeService();
     EXPECT_NE(late, m_service);
-    EXPECT_THAT(texts(late->fetchConfirmedCodes()), ElementsAre("P0420"));
+    EXPECT_THAT(codesOf(late->fetchConfirmedCodes()), ElementsAre("P0420"));
 }
 
 TEST_F(TroubleCodeService, CodesOfTheThreeKindsComeWithTheirMeanings)
@@ -139,10 +135,10 @@ TEST_F(TroubleCodeService, CodesOfTheThreeKindsComeWithTheirMeanings)
     proxy().answer("07", "47 01 01 48");
     proxy().answer("0A", "4A 01 07 00");
     auto const confirmed = m_service->fetchConfirmedCodes();
-    EXPECT_THAT(texts(confirmed), ElementsAre("P0420", "P0133"));
+    EXPECT_THAT(codesOf(confirmed), ElementsAre("P0420", "P0133"));
     EXPECT_EQ(confirmed[0]->description, "Catalyst");
-    EXPECT_THAT(texts(m_service->fetchPendingCodes()), ElementsAre("P0148"));
-    EXPECT_THAT(texts(m_service->fetchPermanentCodes()), ElementsAre("P0700"));
+    EXPECT_THAT(codesOf(m_service->fetchPendingCodes()), ElementsAre("P0148"));
+    EXPECT_THAT(codesOf(m_service->fetchPermanentCodes()), ElementsAre("P0700"));
     EXPECT_THAT(m_log.lines(), IsEmpty());
 }
 
@@ -150,9 +146,9 @@ TEST_F(TroubleCodeService, OnlyTheCurrentModulesCodesAreGiven)
 {
     open();
     proxy().answer("03", {{0x7E8, "43 01 04 20"}, {0x7E9, "43 01 07 00"}});
-    EXPECT_THAT(texts(m_service->fetchConfirmedCodes()), ElementsAre("P0420"));
+    EXPECT_THAT(codesOf(m_service->fetchConfirmedCodes()), ElementsAre("P0420"));
     m_rig.getEcuManager()->setCurrentEcu(0x7E9);
-    EXPECT_THAT(texts(m_service->fetchConfirmedCodes()), ElementsAre("P0700"));
+    EXPECT_THAT(codesOf(m_service->fetchConfirmedCodes()), ElementsAre("P0700"));
     EXPECT_EQ(proxy().count("03"), 2);
 }
 
@@ -171,7 +167,7 @@ TEST_F(TroubleCodeService, AModuleMayAnswerTo03AndNotTo0A)
     open();
     proxy().answer("03", "43 01 04 20");
     proxy().answer("0A", "7F 0A 11");
-    EXPECT_THAT(texts(m_service->fetchConfirmedCodes()), ElementsAre("P0420"));
+    EXPECT_THAT(codesOf(m_service->fetchConfirmedCodes()), ElementsAre("P0420"));
     EXPECT_THAT(m_service->fetchPermanentCodes(), IsEmpty());
 }
 

@@ -16,7 +16,7 @@ using support::bytes;
 using testing::ElementsAre;
 using testing::IsEmpty;
 using Lines = std::vector<std::string>;
-using Status = obd::IDevice::Status;
+using DeviceStatus = obd::IDevice::Status;
 
 // Keeps the entries as ">> ATI". Safe from any thread, as every such observer has to be.
 class Reader : public tervex::Observer<obd::ITroubleshootingServiceObserver>
@@ -100,7 +100,8 @@ TEST_F(TroubleshootingService, WithNoConnectionAQueryReturnsAnEmptyStringAndIsLo
 TEST_F(TroubleshootingService, AQueryThatTheAdapterRefusesReturnsAnEmptyStringAndIsLogged)
 {
     open();
-    for (Status const status : {Status::NotSent, Status::NotEnabled, Status::NoResponse, Status::Unparsed}) {
+    for (DeviceStatus const status :
+         {DeviceStatus::NotSent, DeviceStatus::NotEnabled, DeviceStatus::NoResponse, DeviceStatus::Unparsed}) {
         proxy().failCommand("AT@2", status);
         m_log.clear();
         EXPECT_EQ(m_service->query("AT@2", 1000), "");
@@ -245,7 +246,8 @@ TEST(ConsoleQuery, EveryStatusAbove0IsAFailure)
 {
     auto const proxy = std::make_shared<support::FakeProxy>();
     obd::ConsoleQuery query("ATI", 700);
-    for (Status const status : {Status::NotSent, Status::NotEnabled, Status::NoResponse, Status::Unparsed}) {
+    for (DeviceStatus const status :
+         {DeviceStatus::NotSent, DeviceStatus::NotEnabled, DeviceStatus::NoResponse, DeviceStatus::Unparsed}) {
         proxy->failCommand("ATI", status);
         EXPECT_EQ(static_cast<int>(query.update(proxy)), 2);
     }

@@ -12,7 +12,7 @@ namespace {
 using namespace obd;
 using UnitScalingFactory::createForCan;
 using UnitScalingFactory::createForTest;
-using Row = std::vector<std::string>;
+using Cells = std::vector<std::string>;
 
 unsigned int hex(std::string const& text)
 {
@@ -24,7 +24,7 @@ std::string shown(IUnitScaling const& scaling, unsigned int raw)
     return scaling.toString(scaling.value(raw));
 }
 
-void expectRow(Row const& row, ScalingRow const& scaling)
+void expectRow(Cells const& row, ScalingRow const& scaling)
 {
     EXPECT_EQ(hex(row.at(0)), scaling.id) << row.at(0);
     EXPECT_EQ(std::stod(row.at(1)), scaling.factor) << row.at(0);
@@ -161,7 +161,7 @@ TEST(UnitScalingFactory, UnknownIdsGiveNoScalingAndALogLine)
 // The raw words whose texts stand in the files of texts: both ends, the ends of the signed range, and one between.
 constexpr unsigned int writtenWords[] = {0x0000, 0x0001, 0x3039, 0x7FFF, 0x8000, 0xCFC7, 0xFFFF};
 
-void expectTexts(Row const& row, IUnitScaling const* scaling)
+void expectTexts(Cells const& row, IUnitScaling const* scaling)
 {
     ASSERT_NE(scaling, nullptr) << row.at(0);
     ASSERT_EQ(row.size(), std::size(writtenWords) + 1) << row.at(0);
@@ -174,7 +174,7 @@ TEST(UnitScalingFactory, EveryMetricScalingShowsTheWrittenTexts)
 {
     auto const rows = support::readTable("tests/libobd/src/scaledtexts_metric.txt");
     ASSERT_EQ(rows.size(), 109U);
-    for (Row const& row : rows) {
+    for (Cells const& row : rows) {
         expectTexts(row, createForCan(static_cast<unsigned char>(hex(row.at(0))), UnitSystem::Metric).get());
     }
 }
@@ -183,7 +183,7 @@ TEST(UnitScalingFactory, EveryImperialScalingShowsTheWrittenTexts)
 {
     auto const rows = support::readTable("tests/libobd/src/scaledtexts_imperial.txt");
     ASSERT_EQ(rows.size(), 30U);
-    for (Row const& row : rows) {
+    for (Cells const& row : rows) {
         expectTexts(row, createForCan(static_cast<unsigned char>(hex(row.at(0))), UnitSystem::Imperial).get());
     }
 }
@@ -191,7 +191,7 @@ TEST(UnitScalingFactory, EveryImperialScalingShowsTheWrittenTexts)
 struct TestScaling
 {
     float factor;
-    Row row;
+    Cells row;
 };
 
 // The identifiers of a cell such as "01-04, 07".
@@ -214,7 +214,7 @@ std::vector<unsigned char> identifiersIn(std::string const& cell)
 std::map<unsigned int, TestScaling> writtenTestScalings()
 {
     std::map<unsigned int, TestScaling> scalings;
-    for (Row const& row : support::readTable("tests/libobd/src/scalings_tests.txt")) {
+    for (Cells const& row : support::readTable("tests/libobd/src/scalings_tests.txt")) {
         for (unsigned char const id : identifiersIn(row.at(0))) {
             scalings[id] = {std::stof(row.at(1)), row};
         }
@@ -247,7 +247,7 @@ TEST(UnitScalingFactory, TestScalingsAgreeForEveryTest)
 TEST(UnitScalingFactory, EveryTestScalingShowsTheWrittenTexts)
 {
     std::size_t tests = 0;
-    for (Row const& row : support::readTable("tests/libobd/src/scaledtexts_tests.txt")) {
+    for (Cells const& row : support::readTable("tests/libobd/src/scaledtexts_tests.txt")) {
         for (unsigned char const id : identifiersIn(row.at(0))) {
             expectTexts(row, createForTest(id).get());
             ++tests;

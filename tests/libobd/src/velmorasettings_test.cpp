@@ -11,7 +11,7 @@ namespace {
 
 using obd::VelmoraSettingsEvent;
 
-struct EventRecorder : tervex::IEventListener<VelmoraSettingsEvent>
+struct SettingsEventRecorder : tervex::IEventListener<VelmoraSettingsEvent>
 {
     std::vector<VelmoraSettingsEvent> events;
     void onEvent(VelmoraSettingsEvent const& event) override { events.push_back(event); }
@@ -133,7 +133,7 @@ TEST_F(VelmoraSettings, AnyStoredNumberButZeroOverridesTheFuelType)
 
 TEST_F(VelmoraSettings, SettersWriteTheirKeyAsItIsAndFireTheirEvent)
 {
-    EventRecorder recorder;
+    SettingsEventRecorder recorder;
     settings.attach(&recorder);
     settings.setUnitSystem(obd::UnitSystem::Imperial);
     settings.setLanguage(77);
@@ -172,7 +172,7 @@ TEST_F(VelmoraSettings, EventsHaveTheirNumbers)
 
 TEST_F(VelmoraSettings, AnEqualValueIsWrittenAndFiredAgain)
 {
-    EventRecorder recorder;
+    SettingsEventRecorder recorder;
     settings.attach(&recorder);
     settings.setLanguage(3);
     settings.setLanguage(3);
@@ -196,7 +196,7 @@ TEST_F(VelmoraSettings, TheEventComesAfterTheWrite)
 
 TEST_F(VelmoraSettings, AChangeBehindTheLibrarysBackIsSeenAtTheNextReadWithoutAnEvent)
 {
-    EventRecorder recorder;
+    SettingsEventRecorder recorder;
     settings.attach(&recorder);
     store->setInt("common/unitsystem", 1);
     EXPECT_EQ(settings.unitSystem(), obd::UnitSystem::Imperial);
@@ -227,7 +227,7 @@ TEST_F(VelmoraSettings, StoreThatCannotReadGivesTheDefaults)
 
 TEST_F(VelmoraSettings, StoreThatCannotWriteReachesTheCallerAndFiresNothing)
 {
-    EventRecorder recorder;
+    SettingsEventRecorder recorder;
     settings.attach(&recorder);
     store->failWrites(true);
     EXPECT_THROW(settings.setVehicleWeight(900), std::runtime_error);

@@ -8,7 +8,7 @@ using namespace velmora;
 using obd::OxygenSensorLocation;
 using Verdict = LimitTest::Verdict;
 
-OxygenReport const report{TopicAnswer::Read,
+OxygenReport const oxygen{TopicAnswer::Read,
                           true,
                           false,
                           {{OxygenSensorLocation::Bank1Sensor1,
@@ -18,7 +18,7 @@ OxygenReport const report{TopicAnswer::Read,
 
 TEST(OxygenReportView, ShowsSensorsAndTheirTests)
 {
-    EXPECT_EQ(toText(report, Style()), "  Oxygen monitor complete\n"
+    EXPECT_EQ(toText(oxygen, Style()), "  Oxygen monitor complete\n"
                                        "  O2 sensors     Bank 1 sensor 1, Bank 4 sensor 2\n"
                                        "      Result  Test  Value  Minimum  Maximum  Unit  Description\n"
                                        "    Bank 1 sensor 1\n"
@@ -44,7 +44,7 @@ TEST(OxygenReportView, TellsWhyThereIsNone)
 
 TEST(OxygenReportView, JsonHasNoResultForAConstant)
 {
-    EXPECT_EQ(toJsonValue(report), Json::parse(R"({"answer": "read", "complete": true, "sensors": [
+    EXPECT_EQ(toJsonValue(oxygen), Json::parse(R"({"answer": "read", "complete": true, "sensors": [
         {"bank": 1, "sensor": 1, "tests": [
             {"id": "05", "description": "Switch time", "result": "failed",
              "value": "0.200", "minimum": "0.000", "maximum": "0.160", "unit": "s"},

@@ -7,22 +7,22 @@ namespace {
 using namespace velmora;
 using Status = obd::ReadinessMonitorDataModel;
 
-ReadinessReport const report{TopicAnswer::Read,
-                             true,
-                             {{"Misfire", Status::Complete, Status::NotComplete},
-                              {"Secondary Air System", Status::NotAvailable, Status::NotAvailable},
-                              {"Catalyst", Status::NotComplete, Status::DisabledThisCycle},
-                              {"Fuel System", Status::Complete, std::nullopt}}};
+ReadinessReport const readiness{TopicAnswer::Read,
+                                true,
+                                {{"Misfire", Status::Complete, Status::NotComplete},
+                                 {"Secondary Air System", Status::NotAvailable, Status::NotAvailable},
+                                 {"Catalyst", Status::NotComplete, Status::DisabledThisCycle},
+                                 {"Fuel System", Status::Complete, std::nullopt}}};
 
 TEST(ReadinessReportView, ShowsTheVerdictAndWhatIsNotCompleteFirst)
 {
-    EXPECT_EQ(toText(report, Style()), "  Lamp           on\n"
-                                       "  Readiness      1 monitor not complete\n"
-                                       "    Monitor      Since cleared  This driving cycle\n"
-                                       "    Catalyst     not complete   disabled this cycle\n"
-                                       "    Misfire      complete       not complete\n"
-                                       "    Fuel System  complete       -\n"
-                                       "    Not available: Secondary Air System\n");
+    EXPECT_EQ(toText(readiness, Style()), "  Lamp           on\n"
+                                          "  Readiness      1 monitor not complete\n"
+                                          "    Monitor      Since cleared  This driving cycle\n"
+                                          "    Catalyst     not complete   disabled this cycle\n"
+                                          "    Misfire      complete       not complete\n"
+                                          "    Fuel System  complete       -\n"
+                                          "    Not available: Secondary Air System\n");
 }
 
 TEST(ReadinessReportView, IsReadyWhenAllThatTheVehicleHasIsComplete)
@@ -46,7 +46,7 @@ TEST(ReadinessReportView, TellsWhyThereIsNone)
 
 TEST(ReadinessReportView, JsonHoldsTheSame)
 {
-    EXPECT_EQ(toJsonValue(report), Json::parse(R"({"answer": "read", "lamp": true, "ready": false, "notComplete": 1,
+    EXPECT_EQ(toJsonValue(readiness), Json::parse(R"({"answer": "read", "lamp": true, "ready": false, "notComplete": 1,
         "monitors": [
             {"name": "Catalyst", "sinceCleared": "not complete", "thisCycle": "disabled this cycle"},
             {"name": "Misfire", "sinceCleared": "complete", "thisCycle": "not complete"},
