@@ -2,7 +2,8 @@
 add_library(velmoraWarnings INTERFACE)
 target_compile_options(
     velmoraWarnings
-    INTERFACE -Wall -Wextra -Wpedantic -Wshadow -Wconversion -Wnon-virtual-dtor -Woverloaded-virtual
+    INTERFACE -Wall -Wextra -Wpedantic -Wconversion -Wnon-virtual-dtor -Woverloaded-virtual
+              $<$<NOT:$<BOOL:$<TARGET_PROPERTY:UNITY_BUILD>>>:-Wshadow>
               $<$<BOOL:${VELMORA_WERROR}>:-Werror>
 )
 # Two warnings of g++ 12's optimiser that it gives for plain standard library code: "text" + std::string(...) as an
