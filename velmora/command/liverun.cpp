@@ -187,7 +187,10 @@ void LiveRun::watchSilence(LiveTime now)
         throw Failure(ExitCode::LinkLost, "The adapter no longer answers", {"is it still plugged in and in reach?"});
     }
     if (m_options.count > 0 && now - m_lastReading > longSilence) {
-        throw Failure(ExitCode::VehicleSilent, "The vehicle no longer answers", {"is the ignition still on?"});
+        throw Failure(ExitCode::VehicleSilent,
+                      m_table.readings() == 0 ? "The vehicle gives none of the chosen values"
+                                              : "The vehicle no longer answers",
+                      {"is the ignition still on?"});
     }
     if (!m_silenceTold && m_terminal == nullptr && !m_session.options().quiet) {
         tell("No values come from the vehicle; still asking. Is the ignition on?\n");

@@ -84,6 +84,9 @@ TcpAddress parseTcp(std::string const& whole, std::string_view rest)
         if (port.empty()) {
             reject(whole, "the port number behind the colon is missing");
         }
+        if (host.find(':') != std::string_view::npos) {
+            reject(whole, "only in brackets may a host hold colons, such as [fe80::1]:35000");
+        }
     }
     if (host.empty() || host.find_first_of("/ \t") != std::string_view::npos) {
         reject(whole, "the host is missing or holds what no host name holds");
@@ -134,10 +137,8 @@ PortAddress parsePortAddress(std::string const& text, unsigned int baud)
     if (takePrefix(rest, "serial://") || takePrefix(rest, "serial:") || rest.starts_with('/')) {
         return parseSerial(text, rest, baud);
     }
-    if (takePrefix(rest, "tcp://") || takePrefix(rest, "socket://")) {
-        return parseTcp(text, rest);
-    }
-    if (rest.find("://") != std::string_view::npos) {
+    if (!takePrefix(rest, "tcp://") && !takePrefix(rest, "tcp:") && !takePrefix(rest, "socket://") &&
+        rest.find("://") != std::string_view::npos) {
         reject(text, "the kind before :// is unknown");
     }
     return parseTcp(text, rest);

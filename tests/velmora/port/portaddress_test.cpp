@@ -24,6 +24,7 @@ TEST(PortAddress, UnderstandsEveryForm)
         {"192.168.0.10", TcpAddress{"192.168.0.10", 35000}},
         {"wican.local:3333", TcpAddress{"wican.local", 3333}},
         {"tcp://10.0.0.1:23", TcpAddress{"10.0.0.1", 23}},
+        {"tcp:10.0.0.1:23", TcpAddress{"10.0.0.1", 23}},
         {"socket://10.0.0.1", TcpAddress{"10.0.0.1", 35000}},
         {"[fe80::1]:35000", TcpAddress{"fe80::1", 35000}},
         {"tcp://[::1]", TcpAddress{"::1", 35000}},
@@ -46,9 +47,9 @@ TEST(PortAddress, BaudOptionHoldsWhereTheAddressNamesNone)
 
 TEST(PortAddress, RefusesWhatIsNoAddressAndTellsTheForms)
 {
-    for (char const* text :
-         {"", ":35000", "host:", "host:0", "host:65536", "host:12a", "[::1", "[::1]x", "ftp://host",
-          "replay:", "serial://", "/dev/ttyUSB0?rate=1", "/dev/ttyUSB0?baud=x", "sim:x?", "sim:x?fast", "two words"}) {
+    for (char const* text : {"", ":35000", "host:", "host:0", "host:65536", "host:12a", "[::1", "[::1]x", "ftp://host",
+                             "ftp:host:21", "fe80::1", "replay:", "serial://", "/dev/ttyUSB0?rate=1",
+                             "/dev/ttyUSB0?baud=x", "sim:x?", "sim:x?fast", "two words"}) {
         try {
             parsePortAddress(text);
             ADD_FAILURE() << text << " was taken";
