@@ -45,6 +45,16 @@ TEST_F(Live, HasARowForEachSensor)
     EXPECT_EQ(nameWithUnit(table.rows()[3]), "Fuel system");
 }
 
+TEST_F(Live, KeepsTheReadingAndItsStatistics)
+{
+    table.update(0x0C, {std::make_shared<obd::SensorValueDataModel>(120, "800", "700", "900", "850")}, now);
+    LiveRow const& row = table.rows()[0];
+    EXPECT_EQ(row.value, "800");
+    EXPECT_EQ(row.minimum, "700");
+    EXPECT_EQ(row.maximum, "900");
+    EXPECT_EQ(row.mean, "850");
+}
+
 TEST_F(Live, ASensorThatIsNotAmongTheValuesHasNone)
 {
     table.update(0x06, {liveValue(60, "1.0"), liveValue(61, "2.0")}, now);
