@@ -66,12 +66,12 @@ std::string heading(Columns const& columns)
     return text + (columns.trend ? " Trend" : "");
 }
 
-std::string line(LiveRow const& row, Columns const& columns, std::size_t width)
+std::string line(LiveRow const& row, Columns const& columns)
 {
     std::string text = fitted(row.name, columns.name);
     if (!row.numeric) {
         // A text has neither unit nor statistics, so it may take their place.
-        return text + " " + fitted(orDash(row.value), width - std::min(width, columns.name + 1));
+        return text + " " + orDash(row.value);
     }
     text += right(orDash(row.value), columns) + " " + fitted(row.unit, columns.unit);
     if (columns.statistics) {
@@ -124,7 +124,7 @@ std::string drawTable(std::vector<LiveRow> const& rows, std::size_t first, std::
     text += emphasised(cut(heading(columns), style.columns), style) + "\n";
     std::size_t const end = std::min(rows.size(), first + roomForRows(style));
     for (std::size_t i = first; i < end; ++i) {
-        text += cut(line(rows[i], columns, style.columns), style.columns) + "\n";
+        text += cut(line(rows[i], columns), style.columns) + "\n";
     }
     std::size_t const hidden = rows.size() - (end - std::min(first, end));
     std::string const more = hidden > 0 ? fmt::format("({} more: up and down) ", hidden) : "";

@@ -63,6 +63,7 @@ TEST(LiveLines, JsonHasNumbersAndNull)
     }
     auto const json = nlohmann::json::parse(toJsonLine(numberRow("x", "-8.30", "°"), "t"));
     EXPECT_DOUBLE_EQ(json["value"].get<double>(), -8.3);
+    EXPECT_THAT(toJsonLine(numberRow("x", "21", "°C"), "t"), HasSubstr("\"unit\":\"°C\""));
 }
 
 TEST(LiveLines, JsonOfATextIsAText)
@@ -190,6 +191,7 @@ TEST(LiveScreen, DrawsATrend)
     EXPECT_EQ(trendLine({0, 1, 2, 3, 4, 5, 6, 7}, 8), "▁▂▃▄▅▆▇█");
     EXPECT_EQ(trendLine({5, 5}, 4), "  ▁▁");
     EXPECT_EQ(trendLine({9, 0, 7}, 2), "▁█");
+    EXPECT_EQ(trendLine({-10, -3, -6.5}, 3), "▁█▅");
     EXPECT_EQ(trendLine({}, 3), "   ");
 }
 
@@ -220,6 +222,30 @@ TEST(LiveScreen, ShowsValueUnitAndStatistics)
     EXPECT_EQ(frame[4], "status");
 }
 
+TEST(LiveScreen, ShowsStatisticsAndTrendWhereThereIsRoom)
+{
+    std::vector<LiveRow> const rows = {numberRow(std::string(100, 'n'), "1726", "rpm")};
+    std::size_t const plain = 18 + std::string(" 1234567 unit").size();
+    std::size_t const statistics = plain + 3 * std::string(" Minimum").size();
+    std::size_t const all = statistics + 1 + LiveTable::trendLength;
+    auto const heading = [&rows](std::size_t width) { return lines(drawTable(rows, 0, "t", "s", {width, 24}))[1]; };
+    EXPECT_EQ(heading(plain), "Sensor               Value Unit");
+    EXPECT_EQ(heading(statistics - 1), heading(plain).insert(6, statistics - 1 - plain, ' '));
+    EXPECT_EQ(heading(statistics), "Sensor               Value Unit Minimum    Mean Maximum");
+    EXPECT_EQ(heading(all - 1), heading(statistics).insert(6, LiveTable::trendLength, ' '));
+    EXPECT_EQ(heading(all), heading(statistics) + " Trend");
+    EXPECT_EQ(heading(all + 9), heading(all).insert(6, 9, ' ')) << "the name takes what is left";
+}
+
+TEST(LiveScreen, ATextTakesThePlaceOfUnitAndStatistics)
+{
+    LiveRow row = numberRow("Fuel system", "Closed loop, using oxygen sensor feedback", "");
+    row.numeric = false;
+    EXPECT_THAT(drawTable({row}, 0, "t", "s", {80, 24}),
+                HasSubstr("Fuel system        Closed loop, using oxygen sensor feedback\n"));
+    EXPECT_THAT(drawTable({row}, 0, "t", "s", {30, 24}), HasSubstr("\nFuel system       Closed loop…\n"));
+}
+
 TEST(LiveScreen, NeverCutsANumber)
 {
     std::string const frame = drawTable({numberRow("Run time", "4294967295", "s")}, 0, "t", "s", {60, 24});
@@ -232,6 +258,16 @@ TEST(LiveScreen, ShowsADashForAMissingValueAndTellsWhatIsHidden)
     std::string const frame = drawTable(rows, 0, "t", "s", {80, 7});
     EXPECT_THAT(frame, HasSubstr("A                        - V"));
     EXPECT_THAT(frame, HasSubstr("(2 more: up and down) s"));
+    EXPECT_THAT(drawTable(rows, 1, "t", "s", {80, 7}), HasSubstr("(2 more: up and down) s"));
+    EXPECT_THAT(drawTable(rows, 4, "t", "s", {80, 7}), HasSubstr("(4 more: up and down) s"));
+    EXPECT_THAT(drawTable(rows, 0, "t", "s", {80, 9}), HasSubstr("\n\ns\n"));
+}
+
+TEST(LiveScreen, TheSmallestScreenHasARow)
+{
+    EXPECT_EQ(roomForRows({80, 1}), 1U);
+    EXPECT_EQ(roomForRows({80, 4}), 1U);
+    EXPECT_EQ(roomForRows({80, 6}), 2U);
 }
 
 TEST(LivePicker, MarksAndKeepsTheOrder)
@@ -261,6 +297,15 @@ TEST(LivePicker, ScrollsWithTheCursor)
     std::string const frame = picker.draw({40, 8});
     EXPECT_THAT(frame, HasSubstr("> [ ] 12 x"));
     EXPECT_EQ(lines(frame).size(), 8U);
+    EXPECT_THAT(lines(picker.draw({40, 3})), ElementsAre("Which sensors?", "> [ ] 12 x", "", testing::_));
+}
+
+TEST(LivePicker, AVehicleWithoutSensorsLeavesNothingToMark)
+{
+    SensorPicker picker({}, {});
+    picker.move(1);
+    picker.toggle();
+    EXPECT_TRUE(picker.chosen().empty());
 }
 
 } // namespace
