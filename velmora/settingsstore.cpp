@@ -71,6 +71,15 @@ void writeWhole(std::filesystem::path const& target, std::string const& text)
     }
 }
 
+// A value that a user wrote in the place of a group gives way to it.
+toml::table& groupIn(toml::table& table, std::string const& name)
+{
+    if (!table[name].is_table()) {
+        table.insert_or_assign(name, toml::table{});
+    }
+    return *table[name].as_table();
+}
+
 } // namespace
 
 SettingsStore::SettingsStore(std::filesystem::path file) : m_file(std::move(file))
@@ -85,6 +94,9 @@ SettingsStore::SettingsStore(std::filesystem::path file) : m_file(std::move(file
     try {
         visitLeaves(toml::parse_file(m_file.string()), {}, [this](std::string const& key, toml::node const& node) {
             if (auto const number = node.value_exact<std::int64_t>()) {
+                if (!std::in_range<int>(*number)) {
+                    failRead(m_file, key + " is too large a number");
+                }
                 m_values[key] = static_cast<int>(*number);
             } else if (auto const text = node.value_exact<std::string>()) {
                 m_values[key] = *text;
@@ -140,7 +152,7 @@ std::string SettingsStore::toToml() const
         toml::table* table = &root;
         std::size_t begin = 0;
         for (std::size_t slash = key.find('/'); slash != std::string::npos; slash = key.find('/', begin)) {
-            table = table->insert(key.substr(begin, slash - begin), toml::table{}).first->second.as_table();
+            table = &groupIn(*table, key.substr(begin, slash - begin));
             begin = slash + 1;
         }
         std::string const name = key.substr(begin);

@@ -19,9 +19,10 @@ protected:
     ~Settings() override { std::filesystem::remove_all(m_folder); }
 
     void write(std::string const& text) const { std::ofstream(m_file) << text; }
-    std::string content() const
+    std::string content() const { return content(m_file); }
+    static std::string content(std::filesystem::path const& file)
     {
-        std::ifstream in(m_file);
+        std::ifstream in(file);
         return {std::istreambuf_iterator<char>(in), {}};
     }
 
@@ -71,6 +72,8 @@ TEST_F(Settings, WhatIsSyncedIsReadBack)
         store.setString("bluetooth/1/name", "quote \" and ü");
         store.sync();
     }
+    EXPECT_EQ(content(m_folder / "new" / "settings.toml"),
+              "[bluetooth.1]\nname = 'quote \" and ü'\n\n[common]\nunitsystem = 0\n");
     SettingsStore store(m_folder / "new" / "settings.toml");
     int number = 5;
     std::string text;
@@ -82,11 +85,21 @@ TEST_F(Settings, WhatIsSyncedIsReadBack)
 
 TEST_F(Settings, BrokenFileIsToldWithItsLineAndLeftAlone)
 {
-    for (char const* broken : {"[common\n", "a = \n", "[common]\nunitsystem = 1.5\n", "x = [1]\n"}) {
+    for (char const* broken :
+         {"[common\n", "a = \n", "[common]\nunitsystem = 1.5\n", "x = [1]\n", "x = 9999999999\n"}) {
         write(broken);
         EXPECT_THROW(SettingsStore{m_file}, Failure) << broken;
         EXPECT_EQ(content(), broken);
     }
+}
+
+TEST_F(Settings, AValueInThePlaceOfAGroupGivesWay)
+{
+    write("common = 1\n");
+    SettingsStore store(m_file);
+    store.setInt("common/unitsystem", 1);
+    store.sync();
+    EXPECT_EQ(content(), "[common]\nunitsystem = 1\n");
 }
 
 TEST_F(Settings, FailingWriteLeavesTheOldFile)
