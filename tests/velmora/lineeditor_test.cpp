@@ -80,6 +80,8 @@ TEST(LineEditor, ArrowsBringEarlierLinesBackAndKeepTheNewOne)
     editor.press(Key::Down);
     editor.press(Key::Down);
     EXPECT_EQ(editor.text(), "AT");
+    editor.press(Key::Up);
+    EXPECT_EQ(editor.text(), "0100") << "no further below than the new line";
 }
 
 TEST(LineEditor, ControlDEndsAnEmptyLineOnly)

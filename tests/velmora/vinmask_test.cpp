@@ -84,6 +84,8 @@ TEST(VinMask, dropsAReplyThatItCannotRead)
     EXPECT_EQ(masked(0, "0902", "7E81014490201314E34\r7E821414C3341503744\r7E82243313233343536\r\r>"), "NO DATA\r\r>");
     EXPECT_EQ(masked(6, "0902", "7E81014490201314E34\r7E821414C3341503744\r\r>"), "NO DATA\r\r>")
         << "the last frame may stand in another reply";
+    EXPECT_EQ(masked(5, "0902", "87F110490201000000572B\r87F110490202\r\r>"), "NO DATA\r\r>") << "a line cut off";
+    EXPECT_EQ(masked(5, "0902", "87F11049\r\r>"), "87F11049\r\r>") << "too short to tell what it is";
 }
 
 TEST(VinMask, blanksALateReplyBehindAnotherRequest)

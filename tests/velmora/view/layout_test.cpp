@@ -39,6 +39,8 @@ TEST(Layout, ColoursDoNotMoveColumns)
 TEST(Layout, TextIsWrappedBetweenWords)
 {
     EXPECT_EQ(wrapped("one two three unbreakable", 8, "> "), "> one two\n> three\n> unbreakable\n");
+    EXPECT_EQ(wrapped("four five six", 9, ""), "four five\nsix\n");
+    EXPECT_EQ(wrapped("four five six", 8, ""), "four\nfive six\n");
     EXPECT_EQ(wrapped("", 8, "> "), "");
 }
 

@@ -25,6 +25,17 @@ TEST(MonitorsReportView, ShowsFailedTestsFirst)
                                        "      passed     81    0.450    0.400        -  V     Amplitude\n");
 }
 
+TEST(MonitorsReportView, HeadingsOfNumbersStandOverTheirEnds)
+{
+    MonitorsReport const wide{
+        TopicAnswer::Read,
+        {{0x21, "A", {{0x81, "B", "1.00000000", "2.00000000", "3.00000000", "V", Verdict::Passed}}}}};
+    EXPECT_EQ(toText(wide, Style()), "  Monitor tests  1 passed\n"
+                                     "      Result  Test       Value     Minimum     Maximum  Unit  Description\n"
+                                     "    21 A\n"
+                                     "      passed  81    1.00000000  2.00000000  3.00000000  V     B\n");
+}
+
 TEST(MonitorsReportView, ColoursFailures)
 {
     std::string const text = toText(report, Style(true));
