@@ -121,6 +121,20 @@ TEST(Program, ScansARecordedRealCarOverTcp)
     ASSERT_EQ(report["modules"].size(), 3U);
     EXPECT_EQ(report["modules"][0]["id"], "7E8");
     EXPECT_EQ(report["modules"][2]["id"], "7EB");
+    // 98 18 00 01 and 80 01 80 01 without readiness and masks, then what is derived from them.
+    EXPECT_EQ(report["modules"][2]["sensors"],
+              (std::vector<std::string>{"04", "05", "0C", "0D", "21", "30", "31", "F4", "F5", "F6"}));
+}
+
+TEST(Program, ReadsTheControlModuleThatIsAskedFor)
+{
+    Outcome const second = runVelmora({"-q", "-p", "sim:petrol-can11?instant", "--ecu", "0x7e9", "info"});
+    EXPECT_EQ(second.exitCode, 0) << second.err;
+    EXPECT_TRUE(second.out.starts_with("Control module 7E9: TCM\n")) << second.out;
+    EXPECT_FALSE(holds(second.out, "7E8")) << second.out;
+    Outcome const none = runVelmora({"-q", "-p", "sim:petrol-can11?instant", "--ecu", "7EA", "info"});
+    EXPECT_EQ(none.exitCode, 6);
+    EXPECT_TRUE(holds(none.err, "no control module 7EA\n  - these answer: 7E8, 7E9\n")) << none.err;
 }
 
 TEST(Program, ReadsARecordedRealCarLive)
@@ -154,6 +168,13 @@ TEST(Program, ConsoleReadsCommandsFromAPipe)
     ASSERT_EQ(outcome.exitCode, 0) << outcome.err;
     EXPECT_TRUE(outcome.out.starts_with("ELM327 v1.5\n")) << outcome.out;
     EXPECT_TRUE(outcome.out.ends_with("V\n(no data)\n")) << outcome.out;
+}
+
+TEST(Program, ConsoleEndsWithItsInput)
+{
+    Outcome const outcome = runVelmora({"-q", "-p", "sim:petrol-can11?instant", "console"}, "\nATI"); // no line end
+    EXPECT_EQ(outcome.exitCode, 0) << outcome.err;
+    EXPECT_EQ(outcome.out, "ELM327 v1.5\n");
 }
 
 TEST(Program, InterruptEndsWithinASecond)
