@@ -13,7 +13,7 @@ std::uint8_t digitValue(char character)
     if (character >= '0' && character <= '9') {
         return static_cast<std::uint8_t>(character - '0');
     }
-    const char lower = static_cast<char>(character | 0x20);
+    char const lower = static_cast<char>(character | 0x20);
     return static_cast<std::uint8_t>(lower - 'a' + 10);
 }
 
@@ -40,10 +40,10 @@ std::string hexByte(std::uint8_t byte)
     return {digits[byte >> 4], digits[byte & 0x0F]};
 }
 
-std::string hexText(const Bytes& bytes, std::string_view separator)
+std::string hexText(Bytes const& bytes, std::string_view separator)
 {
     std::string text;
-    for (const auto byte : bytes) {
+    for (auto const byte : bytes) {
         if (!text.empty()) {
             text += separator;
         }
@@ -87,7 +87,7 @@ std::optional<std::uint32_t> parseHexNumber(std::string_view text)
         return std::nullopt;
     }
     std::uint32_t number = 0;
-    for (const char character : text) {
+    for (char const character : text) {
         number = number << 4 | digitValue(character);
     }
     return number;
@@ -96,9 +96,9 @@ std::optional<std::uint32_t> parseHexNumber(std::string_view text)
 std::string normaliseCommand(std::string_view text)
 {
     std::string result;
-    for (const char character : text) {
+    for (char const character : text) {
         if (!isBlank(character)) {
-            const bool lower = character >= 'a' && character <= 'z';
+            bool const lower = character >= 'a' && character <= 'z';
             result += lower ? static_cast<char>(character - 0x20) : character;
         }
     }

@@ -21,7 +21,7 @@ bool isHexText(std::string_view text);
 std::string hexByte(std::uint8_t byte);
 
 /// Each byte as two upper-case digits, with `separator` between them.
-std::string hexText(const Bytes& bytes, std::string_view separator = "");
+std::string hexText(Bytes const& bytes, std::string_view separator = "");
 
 /// `number` in upper-case hexadecimal, zero-filled to `digits`.
 std::string hexNumber(std::uint32_t number, std::size_t digits);

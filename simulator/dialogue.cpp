@@ -16,7 +16,7 @@ constexpr long long longestPauseMs = 24LL * 3600 * 1000;
 struct HeadersName
 {
     DialogueHeaders value;
-    const char* name;
+    char const* name;
 };
 
 constexpr HeadersName headersNames[] = {
@@ -28,7 +28,7 @@ class Reader
 public:
     explicit Reader(std::string origin) : m_origin(std::move(origin)) {}
 
-    Dialogue read(const std::string& text)
+    Dialogue read(std::string const& text)
     {
         std::istringstream lines(text);
         std::string line;
@@ -49,7 +49,7 @@ public:
     }
 
 private:
-    void readLine(const std::string& line)
+    void readLine(std::string const& line)
     {
         if (!line.empty() && line[0] == '#') {
             return;
@@ -61,10 +61,10 @@ private:
         m_inHeader ? readHeader(line) : readTurn(line);
     }
 
-    void readHeader(const std::string& line)
+    void readHeader(std::string const& line)
     {
         m_hasHeader = true;
-        const auto colon = line.find(": ");
+        auto const colon = line.find(": ");
         if (colon == std::string::npos) {
             fail("a header line is \"name: value\"");
         }
@@ -85,11 +85,11 @@ private:
         }
     }
 
-    void readTurn(const std::string& line)
+    void readTurn(std::string const& line)
     {
         const std::string mark = line.substr(0, 2);
         const std::string rest = line.size() > 3 ? line.substr(3) : "";
-        const bool spaced = line.size() == 2 || line[2] == ' ';
+        bool const spaced = line.size() == 2 || line[2] == ' ';
         if (mark == "->" && spaced) {
             if (m_pause != Time(0)) {
                 fail("no received line follows the pause before");
@@ -104,7 +104,7 @@ private:
         }
     }
 
-    void addReceived(const std::string& bytes)
+    void addReceived(std::string const& bytes)
     {
         if (m_dialogue.exchanges.empty()) {
             fail("bytes are received before anything is sent");
@@ -117,7 +117,7 @@ private:
         chunks.push_back({std::exchange(m_pause, Time(0)), bytes});
     }
 
-    std::string unescape(const std::string& text) const
+    std::string unescape(std::string const& text) const
     {
         std::string bytes;
         for (std::size_t i = 0; i < text.size(); ++i) {
@@ -127,7 +127,7 @@ private:
     }
 
     /// The character of the escape at `i`, which is moved to its last character.
-    char escaped(const std::string& text, std::size_t& i) const
+    char escaped(std::string const& text, std::size_t& i) const
     {
         ++i;
         switch (i < text.size() ? text[i] : '\0') {
@@ -141,7 +141,7 @@ private:
             return '\\';
         case 'x': {
             const std::string digits = text.substr(i + 1, 2);
-            const auto value = digits.size() == 2 ? parseHexNumber(digits) : std::nullopt;
+            auto const value = digits.size() == 2 ? parseHexNumber(digits) : std::nullopt;
             if (value) {
                 i += 2;
                 return static_cast<char>(*value);
@@ -154,7 +154,7 @@ private:
         fail("wrong escape; there are \\r \\n \\t \\\\ and \\xNN");
     }
 
-    int protocol(const std::string& value) const
+    int protocol(std::string const& value) const
     {
         if (value.size() != 1 || value[0] < '0' || value[0] > '9') {
             fail("the protocol is a number from 0 to 9");
@@ -162,9 +162,9 @@ private:
         return value[0] - '0';
     }
 
-    DialogueHeaders headers(const std::string& value) const
+    DialogueHeaders headers(std::string const& value) const
     {
-        for (const auto& row : headersNames) {
+        for (auto const& row : headersNames) {
             if (value == row.name) {
                 return row.value;
             }
@@ -172,7 +172,7 @@ private:
         fail("headers are \"on\", \"off\" or \"late\"");
     }
 
-    bool yes(const std::string& value) const
+    bool yes(std::string const& value) const
     {
         if (value != "yes" && value != "no") {
             fail("raw is \"yes\" or \"no\"");
@@ -180,9 +180,9 @@ private:
         return value == "yes";
     }
 
-    Time pause(const std::string& text) const
+    Time pause(std::string const& text) const
     {
-        const bool digits =
+        bool const digits =
             !text.empty() && text.size() < 10 && text.find_first_not_of("0123456789") == std::string::npos;
         if (!digits || std::stoll(text) > longestPauseMs) {
             fail("a pause is \".. \" and a number of milliseconds up to a day");
@@ -190,7 +190,7 @@ private:
         return Time(std::stoll(text));
     }
 
-    [[noreturn]] void fail(const std::string& what) const
+    [[noreturn]] void fail(std::string const& what) const
     {
         throw DialogueError(m_origin + ":" + std::to_string(m_line) + ": " + what);
     }
@@ -204,12 +204,12 @@ private:
 };
 
 /// Escapes what a text file cannot hold; blanks at the ends, which editors cut.
-std::string escape(const std::string& bytes)
+std::string escape(std::string const& bytes)
 {
     std::string text;
     for (std::size_t i = 0; i < bytes.size(); ++i) {
-        const char character = bytes[i];
-        const bool atEnd = i == 0 || i + 1 == bytes.size();
+        char const character = bytes[i];
+        bool const atEnd = i == 0 || i + 1 == bytes.size();
         switch (character) {
         case '\r':
             text += "\\r";
@@ -224,8 +224,8 @@ std::string escape(const std::string& bytes)
             text += "\\\\";
             break;
         default:
-            const bool plain = character > ' ' && character < '\x7F';
-            const bool blank = character == ' ' && !atEnd;
+            bool const plain = character > ' ' && character < '\x7F';
+            bool const blank = character == ' ' && !atEnd;
             text += plain || blank ? std::string(1, character) : "\\x" + hexByte(static_cast<std::uint8_t>(character));
         }
     }
@@ -233,7 +233,7 @@ std::string escape(const std::string& bytes)
 }
 
 /// One "<-" line for each line of a reply; the prompt stays with the last.
-std::string receivedLines(const std::string& bytes)
+std::string receivedLines(std::string const& bytes)
 {
     std::string text;
     std::size_t from = 0;
@@ -248,11 +248,11 @@ std::string receivedLines(const std::string& bytes)
     return text;
 }
 
-std::string headerText(const Dialogue& dialogue)
+std::string headerText(Dialogue const& dialogue)
 {
     std::string text = "vehicle: " + dialogue.vehicle + "\nadapter: " + dialogue.adapter +
                        "\nprotocol: " + std::to_string(dialogue.protocol) + "\n";
-    for (const auto& row : headersNames) {
+    for (auto const& row : headersNames) {
         text += row.value == dialogue.headers ? std::string("headers: ") + row.name + "\n" : "";
     }
     return text + (dialogue.raw ? "raw: yes\n" : "");
@@ -263,33 +263,33 @@ std::string headerText(const Dialogue& dialogue)
 std::string Exchange::received() const
 {
     return std::accumulate(chunks.begin(), chunks.end(), std::string(),
-                           [](std::string all, const DialogueChunk& chunk) { return std::move(all) + chunk.bytes; });
+                           [](std::string all, DialogueChunk const& chunk) { return std::move(all) + chunk.bytes; });
 }
 
-Dialogue parseDialogue(const std::string& text, const std::string& origin)
+Dialogue parseDialogue(std::string const& text, std::string const& origin)
 {
     return Reader(origin).read(text);
 }
 
-Dialogue loadDialogue(const std::string& path)
+Dialogue loadDialogue(std::string const& path)
 {
-    const auto text = readTextFile(path);
+    auto const text = readTextFile(path);
     if (!text) {
         throw DialogueError(path + ": cannot be read");
     }
     return parseDialogue(*text, path);
 }
 
-std::string formatDialogue(const Dialogue& dialogue, const std::vector<std::string>& comment)
+std::string formatDialogue(Dialogue const& dialogue, std::vector<std::string> const& comment)
 {
     std::string text;
-    for (const auto& line : comment) {
+    for (auto const& line : comment) {
         text += "# " + line + "\n";
     }
     text += headerText(dialogue) + "\n";
-    for (const auto& exchange : dialogue.exchanges) {
+    for (auto const& exchange : dialogue.exchanges) {
         text += exchange.sent.empty() ? "->\n" : "-> " + escape(exchange.sent) + "\n";
-        for (const auto& chunk : exchange.chunks) {
+        for (auto const& chunk : exchange.chunks) {
             text += chunk.pause == Time(0) ? "" : ".. " + std::to_string(chunk.pause.count()) + "\n";
             text += receivedLines(chunk.bytes);
         }

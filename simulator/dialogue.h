@@ -49,12 +49,12 @@ struct Dialogue
 };
 
 /// Reads the text of a dialogue file; `origin` is its name in error messages.
-Dialogue parseDialogue(const std::string& text, const std::string& origin);
+Dialogue parseDialogue(std::string const& text, std::string const& origin);
 
 /// Reads a file. Throws DialogueError if it cannot be read or is malformed.
-Dialogue loadDialogue(const std::string& path);
+Dialogue loadDialogue(std::string const& path);
 
 /// The text that parseDialogue() reads back; `comment` lines stand on top.
-std::string formatDialogue(const Dialogue& dialogue, const std::vector<std::string>& comment = {});
+std::string formatDialogue(Dialogue const& dialogue, std::vector<std::string> const& comment = {});
 
 } // namespace obdsim

@@ -12,7 +12,7 @@ namespace {
 /// The forms of one kind of fault: NAME=P by chance, NAME@N at a place, NAME=MS.
 struct FaultForm
 {
-    const char* name;
+    char const* name;
     FaultKind kind;
     bool chance;
     bool place;
@@ -26,32 +26,32 @@ constexpr FaultForm forms[] = {
     {"loss", FaultKind::Loss, false, true, false},       {"error", FaultKind::Error, true, true, false},
 };
 
-constexpr const char* usage =
+constexpr char const* usage =
     "the faults are garbage=P, nul=P, prompt=P, prompt@COMMAND, cut@BYTE, stall@BYTE:MS, slow=MS, loss@BYTE, "
     "error:WORDS@COMMAND, error:WORDS=P, echo, quirk:NAME and seed=N";
 
-[[noreturn]] void fail(const std::string& text, const std::string& why)
+[[noreturn]] void fail(std::string const& text, std::string const& why)
 {
     throw FaultError("fault \"" + text + "\": " + why);
 }
 
 /// Splits at the last of `character`; the second part is empty if there is none.
-std::pair<std::string, std::string> splitAtLast(const std::string& text, char character)
+std::pair<std::string, std::string> splitAtLast(std::string const& text, char character)
 {
-    const auto at = text.rfind(character);
+    auto const at = text.rfind(character);
     if (at == std::string::npos) {
         return {text, ""};
     }
     return {text.substr(0, at), text.substr(at + 1)};
 }
 
-std::optional<std::uint64_t> wholeNumber(const std::string& text)
+std::optional<std::uint64_t> wholeNumber(std::string const& text)
 {
-    const bool digits = !text.empty() && text.size() < 10 && text.find_first_not_of("0123456789") == std::string::npos;
+    bool const digits = !text.empty() && text.size() < 10 && text.find_first_not_of("0123456789") == std::string::npos;
     return digits ? std::optional<std::uint64_t>(std::stoull(text)) : std::nullopt;
 }
 
-double probability(const std::string& fault, const std::string& text)
+double probability(std::string const& fault, std::string const& text)
 {
     std::istringstream stream(text);
     stream.imbue(std::locale::classic());
@@ -63,30 +63,30 @@ double probability(const std::string& fault, const std::string& text)
     return value;
 }
 
-Time timeOf(const std::string& fault, const std::string& text)
+Time timeOf(std::string const& fault, std::string const& text)
 {
-    const auto value = wholeNumber(text);
+    auto const value = wholeNumber(text);
     if (!value) {
         fail(fault, "a time is a whole number of milliseconds");
     }
     return Time(*value);
 }
 
-std::uint64_t position(const std::string& fault, const std::string& text)
+std::uint64_t position(std::string const& fault, std::string const& text)
 {
-    const auto value = wholeNumber(text);
+    auto const value = wholeNumber(text);
     if (!value || *value == 0) {
         fail(fault, "a place is a whole number from 1 on");
     }
     return *value;
 }
 
-Fault parseAtPlace(const std::string& text, const FaultForm& form, Fault fault, const std::string& place)
+Fault parseAtPlace(std::string const& text, FaultForm const& form, Fault fault, std::string const& place)
 {
     if (!form.place) {
         fail(text, usage);
     }
-    const auto [number, time] = splitAtLast(place, ':');
+    auto const [number, time] = splitAtLast(place, ':');
     fault.position = position(text, number);
     if (form.time) {
         fault.duration = timeOf(text, time);
@@ -96,7 +96,7 @@ Fault parseAtPlace(const std::string& text, const FaultForm& form, Fault fault, 
     return fault;
 }
 
-Fault parseByValue(const std::string& text, const FaultForm& form, Fault fault, const std::string& value)
+Fault parseByValue(std::string const& text, FaultForm const& form, Fault fault, std::string const& value)
 {
     if (form.chance) {
         fault.probability = probability(text, value);
@@ -108,12 +108,12 @@ Fault parseByValue(const std::string& text, const FaultForm& form, Fault fault, 
     return fault;
 }
 
-Fault parseFault(const std::string& text)
+Fault parseFault(std::string const& text)
 {
-    const auto mark = text.find_first_of("=@:");
+    auto const mark = text.find_first_of("=@:");
     const std::string name = text.substr(0, mark);
-    const auto form =
-        std::find_if(std::begin(forms), std::end(forms), [&](const FaultForm& f) { return f.name == name; });
+    auto const form =
+        std::find_if(std::begin(forms), std::end(forms), [&](FaultForm const& f) { return f.name == name; });
     if (form == std::end(forms) || mark == std::string::npos) {
         fail(text, usage);
     }
@@ -121,7 +121,7 @@ Fault parseFault(const std::string& text)
     fault.kind = form->kind;
     std::string rest = text.substr(mark);
     if (form->kind == FaultKind::Error) {
-        const auto end = rest.find_last_of("=@");
+        auto const end = rest.find_last_of("=@");
         if (rest[0] != ':' || end == std::string::npos || end < 2) {
             fail(text, usage);
         }
@@ -137,12 +137,12 @@ Fault parseFault(const std::string& text)
     fail(text, usage);
 }
 
-Quirk parseQuirk(const std::string& text, const std::string& name)
+Quirk parseQuirk(std::string const& text, std::string const& name)
 {
-    const auto quirk = findQuirk(name);
+    auto const quirk = findQuirk(name);
     if (!quirk) {
         std::string names;
-        for (const auto& known : quirkNames()) {
+        for (auto const& known : quirkNames()) {
             names += names.empty() ? known : ", " + known;
         }
         fail(text, "the quirks are " + names);
@@ -150,9 +150,9 @@ Quirk parseQuirk(const std::string& text, const std::string& name)
     return *quirk;
 }
 
-std::uint32_t parseSeed(const std::string& text, const std::string& number)
+std::uint32_t parseSeed(std::string const& text, std::string const& number)
 {
-    const auto value = wholeNumber(number);
+    auto const value = wholeNumber(number);
     if (!value) {
         fail(text, "a seed is a whole number");
     }
@@ -161,12 +161,12 @@ std::uint32_t parseSeed(const std::string& text, const std::string& number)
 
 } // namespace
 
-FaultPlan parseFaults(const std::vector<std::string>& texts)
+FaultPlan parseFaults(std::vector<std::string> const& texts)
 {
     const std::string quirk = "quirk:";
     const std::string seed = "seed=";
     FaultPlan plan;
-    for (const auto& text : texts) {
+    for (auto const& text : texts) {
         if (text == "echo") {
             plan.quirks.add(Quirk::EchoStuck);
         } else if (text.compare(0, quirk.size(), quirk) == 0) {

@@ -49,6 +49,6 @@ struct FaultPlan
 
 /// Reads texts such as "garbage=0.01", "cut@120", "error:BUS BUSY@3", "stall@80:500",
 /// "quirk:prompt-late", "seed=7". Throws FaultError for any other.
-FaultPlan parseFaults(const std::vector<std::string>& texts);
+FaultPlan parseFaults(std::vector<std::string> const& texts);
 
 } // namespace obdsim

@@ -17,7 +17,7 @@ FaultyPeer::FaultyPeer(std::shared_ptr<IPeer> inner, FaultPlan plan)
 
 void FaultyPeer::receive(std::string_view bytes)
 {
-    for (const char byte : bytes) {
+    for (char const byte : bytes) {
         if (!m_linkUp) {
             return;
         }
@@ -33,7 +33,7 @@ void FaultyPeer::startCommand()
     ++m_command;
     m_dropping = false;
     m_promptLost = false;
-    for (const auto& fault : m_plan.faults) {
+    for (auto const& fault : m_plan.faults) {
         if (fault.kind == FaultKind::Prompt && happens(fault, m_command)) {
             m_promptLost = true;
         }
@@ -47,8 +47,8 @@ void FaultyPeer::startCommand()
 
 std::optional<Time> FaultyPeer::nextOutput() const
 {
-    const auto inner = m_linkUp ? m_inner->nextOutput() : std::nullopt;
-    const auto own = m_output.next();
+    auto const inner = m_linkUp ? m_inner->nextOutput() : std::nullopt;
+    auto const own = m_output.next();
     if (!inner || !own) {
         return inner ? inner : own;
     }
@@ -89,7 +89,7 @@ void FaultyPeer::pull(Time time)
 {
     for (auto next = m_inner->nextOutput(); next && *next <= time; next = m_inner->nextOutput()) {
         const Time due = *next;
-        for (const char byte : m_inner->advanceTo(due)) {
+        for (char const byte : m_inner->advanceTo(due)) {
             pass(byte, due);
         }
     }
@@ -103,7 +103,7 @@ void FaultyPeer::pass(char byte, Time time)
     }
     addNoise(time);
     ++m_byte;
-    for (const auto& fault : m_plan.faults) {
+    for (auto const& fault : m_plan.faults) {
         if (fault.position != m_byte) {
             continue;
         }
@@ -122,7 +122,7 @@ void FaultyPeer::pass(char byte, Time time)
 
 void FaultyPeer::addNoise(Time time)
 {
-    for (const auto& fault : m_plan.faults) {
+    for (auto const& fault : m_plan.faults) {
         if (fault.kind == FaultKind::Garbage && chance(fault.probability)) {
             put(static_cast<char>(1 + m_random() % 0xFF), time);
         }
@@ -132,7 +132,7 @@ void FaultyPeer::addNoise(Time time)
     }
 }
 
-bool FaultyPeer::happens(const Fault& fault, std::uint64_t position)
+bool FaultyPeer::happens(Fault const& fault, std::uint64_t position)
 {
     return fault.position == 0 ? chance(fault.probability) : fault.position == position;
 }
@@ -145,7 +145,7 @@ bool FaultyPeer::chance(double probability)
 void FaultyPeer::put(char byte, Time time)
 {
     Time delay = m_delay;
-    for (const auto& fault : m_plan.faults) {
+    for (auto const& fault : m_plan.faults) {
         delay += fault.kind == FaultKind::Slow ? fault.duration : Time(0);
     }
     m_output.push(time + delay, std::string(1, byte));

@@ -27,7 +27,7 @@ private:
     void pull(Time time);
     void pass(char byte, Time time);
     void addNoise(Time time);
-    bool happens(const Fault& fault, std::uint64_t position);
+    bool happens(Fault const& fault, std::uint64_t position);
     bool chance(double probability);
     void put(char byte, Time time);
 

@@ -54,14 +54,14 @@ void PeerPlayer::arm()
     if (!m_output) {
         return;
     }
-    const auto next = m_peer->nextOutput();
+    auto const next = m_peer->nextOutput();
     if (!next && m_peer->linkIsUp()) {
         m_timer.cancel();
         return;
     }
     const RealMs wait{next ? static_cast<double>((*next - m_offset).count()) / m_speed : 0};
     m_timer.expires_at(m_start + std::chrono::ceil<Clock::duration>(wait));
-    m_timer.async_wait([this](const asio::error_code& error) {
+    m_timer.async_wait([this](asio::error_code const& error) {
         if (!error) {
             play();
         }

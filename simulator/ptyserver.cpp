@@ -14,7 +14,7 @@ namespace obdsim {
 
 namespace {
 
-[[noreturn]] void fail(const std::string& what)
+[[noreturn]] void fail(std::string const& what)
 {
     throw ServerError("cannot open a pseudo-terminal: " + what + ": " + std::strerror(errno));
 }
@@ -37,7 +37,7 @@ class PtyServer : public ServerLoop
 public:
     PtyServer(std::shared_ptr<IPeer> peer, double speed) : ServerLoop(std::move(peer), speed), m_master(context())
     {
-        const int master = posix_openpt(O_RDWR | O_NOCTTY | O_NONBLOCK | O_CLOEXEC);
+        int const master = posix_openpt(O_RDWR | O_NOCTTY | O_NONBLOCK | O_CLOEXEC);
         if (master < 0) {
             fail("posix_openpt");
         }
@@ -66,14 +66,14 @@ public:
 protected:
     void begin() override
     {
-        player().connect([this](const std::string& bytes) { send(bytes); }, [this] { hangUp(); });
+        player().connect([this](std::string const& bytes) { send(bytes); }, [this] { hangUp(); });
         read();
     }
 
 private:
     void read()
     {
-        m_master.async_read_some(asio::buffer(m_buffer), [this](const asio::error_code& error, std::size_t size) {
+        m_master.async_read_some(asio::buffer(m_buffer), [this](asio::error_code const& error, std::size_t size) {
             if (!error) {
                 player().receive(std::string_view(m_buffer.data(), size));
                 read();
@@ -82,7 +82,7 @@ private:
     }
 
     /// A terminal that nobody reads fills up; what does not fit is lost, as on a wire.
-    void send(const std::string& bytes)
+    void send(std::string const& bytes)
     {
         asio::error_code ignored;
         m_master.non_blocking(true, ignored);

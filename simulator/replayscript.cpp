@@ -6,43 +6,43 @@ namespace obdsim {
 
 namespace {
 
-constexpr const char* errorWords[] = {"NODATA", "UNABLE", "ERROR", "BUSBUSY", "BUFFERFULL", "STOPPED", "?"};
+constexpr char const* errorWords[] = {"NODATA", "UNABLE", "ERROR", "BUSBUSY", "BUFFERFULL", "STOPPED", "?"};
 
 /// Requests are the same with and without the digit that tells how many answers
 /// to wait for.
-std::string keyOf(const std::string& normalised)
+std::string keyOf(std::string const& normalised)
 {
-    const bool counted = isHexText(normalised) && normalised.size() > 2 && normalised.size() % 2 != 0;
+    bool const counted = isHexText(normalised) && normalised.size() > 2 && normalised.size() % 2 != 0;
     return counted ? normalised.substr(0, normalised.size() - 1) : normalised;
 }
 
-bool isAnswerOfCar(const std::string& key, const std::string& reply)
+bool isAnswerOfCar(std::string const& key, std::string const& reply)
 {
     const std::string text = normaliseCommand(reply);
-    const bool failed = std::any_of(std::begin(errorWords), std::end(errorWords),
-                                    [&](const char* word) { return text.find(word) != std::string::npos; });
+    bool const failed = std::any_of(std::begin(errorWords), std::end(errorWords),
+                                    [&](char const* word) { return text.find(word) != std::string::npos; });
     return isHexText(key) && !failed && text.find_first_of("0123456789") != std::string::npos;
 }
 
-bool isProtocolQuestion(const std::string& key)
+bool isProtocolQuestion(std::string const& key)
 {
     return key == "ATDPN" || key == "ATDP" || key == "ATN";
 }
 
-std::string withoutEcho(const std::string& bytes, const std::string& sent)
+std::string withoutEcho(std::string const& bytes, std::string const& sent)
 {
-    const auto end = bytes.find('\r');
-    const bool echoed = end != std::string::npos && !sent.empty() && normaliseCommand(bytes.substr(0, end)) == sent;
+    auto const end = bytes.find('\r');
+    bool const echoed = end != std::string::npos && !sent.empty() && normaliseCommand(bytes.substr(0, end)) == sent;
     return echoed ? bytes.substr(end + 1) : bytes;
 }
 
 /// The first line of a reply that is long enough to be the name of an adapter.
-std::string firstName(const std::string& reply)
+std::string firstName(std::string const& reply)
 {
     constexpr std::size_t shortestName = 5;
     std::string line;
-    for (const char character : reply + '\r') {
-        const bool printable = character >= ' ' && character < '\x7F' && character != '>';
+    for (char const character : reply + '\r') {
+        bool const printable = character >= ' ' && character < '\x7F' && character != '>';
         if (printable) {
             line += character;
             continue;
@@ -56,13 +56,13 @@ std::string firstName(const std::string& reply)
 }
 
 /// "ELM327 v2.3" out of a description such as "clone, ELM327 v2.3 on USB".
-std::string elmName(const std::string& description)
+std::string elmName(std::string const& description)
 {
-    const auto from = description.find("ELM327 v");
+    auto const from = description.find("ELM327 v");
     if (from == std::string::npos) {
         return "";
     }
-    const auto blank = description.find_first_of(" ,", from + std::string("ELM327 v").size());
+    auto const blank = description.find_first_of(" ,", from + std::string("ELM327 v").size());
     return description.substr(from, blank == std::string::npos ? blank : blank - from);
 }
 
@@ -70,9 +70,9 @@ std::string elmName(const std::string& description)
 std::string withoutSearchNotice(std::string bytes)
 {
     for (const std::string notice : {"SEARCHING...", "BUS INIT: ...OK", "BUS INIT: OK"}) {
-        const auto at = bytes.find(notice);
+        auto const at = bytes.find(notice);
         if (at != std::string::npos) {
-            const auto end = bytes.find_first_not_of("\r\n", at + notice.size());
+            auto const end = bytes.find_first_not_of("\r\n", at + notice.size());
             bytes.erase(at, (end == std::string::npos ? bytes.size() : end) - at);
         }
     }
@@ -80,19 +80,19 @@ std::string withoutSearchNotice(std::string bytes)
 }
 
 /// What is missing of an empty line and the prompt.
-std::string missingEnd(const std::string& bytes)
+std::string missingEnd(std::string const& bytes)
 {
     if (bytes.find('>') != std::string::npos) {
         return "";
     }
-    const auto last = bytes.find_last_not_of('\r');
+    auto const last = bytes.find_last_not_of('\r');
     const std::size_t returns = bytes.size() - (last == std::string::npos ? 0 : last + 1);
     return (returns == 0 ? "\r\r>" : returns == 1 ? "\r>" : ">");
 }
 
 } // namespace
 
-ReplayScript::ReplayScript(const Dialogue& dialogue) : m_dialogue(dialogue)
+ReplayScript::ReplayScript(Dialogue const& dialogue) : m_dialogue(dialogue)
 {
     addRows();
     findProtocol();
@@ -103,7 +103,7 @@ void ReplayScript::addRows()
     bool headersOn = m_dialogue.headers == DialogueHeaders::On;
     bool beforeBus = true;
     std::string key;
-    for (const auto& exchange : m_dialogue.exchanges) {
+    for (auto const& exchange : m_dialogue.exchanges) {
         const std::string command = normaliseCommand(exchange.sent);
         key = command.empty() ? key : keyOf(command); // an empty line repeats the last command
         m_rows.push_back({key, &exchange, headersOn, beforeBus});
@@ -117,24 +117,24 @@ void ReplayScript::addRows()
 void ReplayScript::findProtocol()
 {
     m_protocol = m_dialogue.protocol;
-    for (const auto& row : m_rows) {
+    for (auto const& row : m_rows) {
         const std::string reply = row.key == "ATDPN" ? row.exchange->received() : "";
-        const auto digit = reply.find_first_of("123456789");
+        auto const digit = reply.find_first_of("123456789");
         if (m_protocol == 0 && digit != std::string::npos) {
             m_protocol = reply[digit] - '0';
         }
     }
 }
 
-std::optional<std::vector<TimedText>> ReplayScript::toCommand(const std::string& command, const Settings& settings)
+std::optional<std::vector<TimedText>> ReplayScript::toCommand(std::string const& command, Settings const& settings)
 {
     return serve(command, settings);
 }
 
-std::optional<std::vector<TimedText>> ReplayScript::toRequest(const std::string& request, const Settings& settings,
+std::optional<std::vector<TimedText>> ReplayScript::toRequest(std::string const& request, Settings const& settings,
                                                               BusLink& bus)
 {
-    const bool otherProtocol = !bus.automatic() && m_protocol != 0 && bus.number() != m_protocol;
+    bool const otherProtocol = !bus.automatic() && m_protocol != 0 && bus.number() != m_protocol;
     if (otherProtocol) {
         return std::nullopt;
     }
@@ -144,7 +144,7 @@ std::optional<std::vector<TimedText>> ReplayScript::toRequest(const std::string&
         return std::vector<TimedText>{{settings.timeout(), isHexText(key) ? "NO DATA\r\r>" : "?\r\r>"}};
     }
     std::string all;
-    for (const auto& part : *reply) {
+    for (auto const& part : *reply) {
         all += part.text;
     }
     if (isAnswerOfCar(key, all)) {
@@ -156,7 +156,7 @@ std::optional<std::vector<TimedText>> ReplayScript::toRequest(const std::string&
 
 std::string ReplayScript::banner() const
 {
-    for (const auto& row : m_rows) {
+    for (auto const& row : m_rows) {
         if (row.key == "ATI" || row.key == "ATZ" || row.key == "ATWS") {
             std::string name = firstName(withoutEcho(row.exchange->received(), row.key));
             if (!name.empty()) {
@@ -167,10 +167,10 @@ std::string ReplayScript::banner() const
     return elmName(m_dialogue.adapter);
 }
 
-std::optional<std::vector<TimedText>> ReplayScript::serve(const std::string& key, const Settings& settings)
+std::optional<std::vector<TimedText>> ReplayScript::serve(std::string const& key, Settings const& settings)
 {
-    std::vector<const Row*> rows;
-    for (const auto& row : m_rows) {
+    std::vector<Row const*> rows;
+    for (auto const& row : m_rows) {
         if (fits(row, key, settings)) {
             rows.push_back(&row);
         }
@@ -178,10 +178,10 @@ std::optional<std::vector<TimedText>> ReplayScript::serve(const std::string& key
     if (rows.empty()) {
         return std::nullopt;
     }
-    const bool separate = m_dialogue.headers == DialogueHeaders::Late && settings.headers && isHexText(key);
+    bool const separate = m_dialogue.headers == DialogueHeaders::Late && settings.headers && isHexText(key);
     std::size_t& next = m_served[{key, separate}];
-    const bool repeated = next >= rows.size();
-    const Row& row = *rows[std::min(next, rows.size() - 1)];
+    bool const repeated = next >= rows.size();
+    Row const& row = *rows[std::min(next, rows.size() - 1)];
     ++next;
     auto reply = texts(row, settings);
     for (auto& part : reply) {
@@ -190,23 +190,23 @@ std::optional<std::vector<TimedText>> ReplayScript::serve(const std::string& key
     return reply;
 }
 
-bool ReplayScript::fits(const Row& row, const std::string& key, const Settings& settings) const
+bool ReplayScript::fits(Row const& row, std::string const& key, Settings const& settings) const
 {
-    const bool hidden =
+    bool const hidden =
         m_dialogue.headers == DialogueHeaders::Late && isHexText(key) && settings.headers && !row.headersOn;
-    const bool outdated = isProtocolQuestion(key) && m_busServed && row.beforeBus;
+    bool const outdated = isProtocolQuestion(key) && m_busServed && row.beforeBus;
     return row.key == key && !hidden && !outdated;
 }
 
-std::vector<TimedText> ReplayScript::texts(const Row& row, const Settings& settings) const
+std::vector<TimedText> ReplayScript::texts(Row const& row, Settings const& settings) const
 {
     std::vector<TimedText> result;
     Time delay{};
     std::string all;
-    for (const auto& chunk : row.exchange->chunks) {
+    for (auto const& chunk : row.exchange->chunks) {
         delay += chunk.pause;
-        const bool first = result.empty();
-        const bool cutEcho = first && (settings.echo || !m_dialogue.raw);
+        bool const first = result.empty();
+        bool const cutEcho = first && (settings.echo || !m_dialogue.raw);
         result.push_back(
             {delay, cutEcho ? withoutEcho(chunk.bytes, normaliseCommand(row.exchange->sent)) : chunk.bytes});
         all += chunk.bytes;

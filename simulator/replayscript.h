@@ -20,10 +20,10 @@ namespace obdsim {
 class ReplayScript : public IScript
 {
 public:
-    explicit ReplayScript(const Dialogue& dialogue);
+    explicit ReplayScript(Dialogue const& dialogue);
 
-    std::optional<std::vector<TimedText>> toCommand(const std::string& command, const Settings& settings) override;
-    std::optional<std::vector<TimedText>> toRequest(const std::string& request, const Settings& settings,
+    std::optional<std::vector<TimedText>> toCommand(std::string const& command, Settings const& settings) override;
+    std::optional<std::vector<TimedText>> toRequest(std::string const& request, Settings const& settings,
                                                     BusLink& bus) override;
 
     /// The recorded name of the adapter, such as "ELM327 v2.3"; empty if the
@@ -34,14 +34,14 @@ private:
     struct Row
     {
         std::string key;
-        const Exchange* exchange;
+        Exchange const* exchange;
         bool headersOn;
         bool beforeBus; ///< recorded before the first answer of a car
     };
 
-    std::optional<std::vector<TimedText>> serve(const std::string& key, const Settings& settings);
-    bool fits(const Row& row, const std::string& key, const Settings& settings) const;
-    std::vector<TimedText> texts(const Row& row, const Settings& settings) const;
+    std::optional<std::vector<TimedText>> serve(std::string const& key, Settings const& settings);
+    bool fits(Row const& row, std::string const& key, Settings const& settings) const;
+    std::vector<TimedText> texts(Row const& row, Settings const& settings) const;
     void addRows();
     void findProtocol();
 

@@ -38,7 +38,7 @@ public:
 
 /// Listens on a TCP port; port 0 takes a free one. `speed` makes the simulated
 /// time run faster. Throws ServerError.
-std::unique_ptr<IServer> serveTcp(std::shared_ptr<IPeer> peer, const std::string& host, std::uint16_t port,
+std::unique_ptr<IServer> serveTcp(std::shared_ptr<IPeer> peer, std::string const& host, std::uint16_t port,
                                   double speed = 1);
 
 /// Opens a pseudo-terminal, whose device any program for serial adapters can use.

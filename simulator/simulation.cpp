@@ -8,12 +8,12 @@ namespace obdsim {
 
 namespace {
 
-AdapterProfile adapterProfile(const std::string& key)
+AdapterProfile adapterProfile(std::string const& key)
 {
-    const AdapterProfile* profile = findProfile(key);
+    AdapterProfile const* profile = findProfile(key);
     if (profile == nullptr) {
         std::string keys;
-        for (const auto& known : profileKeys()) {
+        for (auto const& known : profileKeys()) {
             keys += keys.empty() ? known : ", " + known;
         }
         throw SimulatorError("no adapter \"" + key + "\"; the adapters are " + keys);
@@ -21,14 +21,14 @@ AdapterProfile adapterProfile(const std::string& key)
     return *profile;
 }
 
-std::shared_ptr<IPeer> withFaults(std::shared_ptr<IPeer> peer, const FaultPlan& plan)
+std::shared_ptr<IPeer> withFaults(std::shared_ptr<IPeer> peer, FaultPlan const& plan)
 {
     return plan.empty() ? peer : std::make_shared<FaultyPeer>(std::move(peer), plan);
 }
 
 } // namespace
 
-std::shared_ptr<IPeer> simulate(const SimulationOptions& options)
+std::shared_ptr<IPeer> simulate(SimulationOptions const& options)
 {
     const FaultPlan plan = parseFaults(options.faults);
     AdapterProfile profile = adapterProfile(options.adapter);
@@ -37,7 +37,7 @@ std::shared_ptr<IPeer> simulate(const SimulationOptions& options)
     return withFaults(std::make_shared<Adapter>(std::move(profile), std::move(vehicle)), plan);
 }
 
-std::shared_ptr<IPeer> replay(const std::string& path, const std::vector<std::string>& faults)
+std::shared_ptr<IPeer> replay(std::string const& path, std::vector<std::string> const& faults)
 {
     const FaultPlan plan = parseFaults(faults);
     auto script = std::make_shared<ReplayScript>(loadDialogue(path));

@@ -17,11 +17,11 @@ struct SimulationOptions
 };
 
 /// An adapter with a car. Throws SimulatorError for a wrong name, file or fault.
-std::shared_ptr<IPeer> simulate(const SimulationOptions& options);
+std::shared_ptr<IPeer> simulate(SimulationOptions const& options);
 
 /// A recorded dialogue in the part of the adapter; whatever it lacks is answered
 /// as an adapter of its kind would, requests to the bus with NO DATA.
-std::shared_ptr<IPeer> replay(const std::string& path, const std::vector<std::string>& faults = {});
+std::shared_ptr<IPeer> replay(std::string const& path, std::vector<std::string> const& faults = {});
 
 /// Names of the built-in vehicles and of the adapters, for help texts.
 std::vector<std::string> simulatedVehicles();

@@ -17,7 +17,7 @@ using asio::ip::tcp;
 class TcpServer : public ServerLoop
 {
 public:
-    TcpServer(std::shared_ptr<IPeer> peer, const std::string& host, std::uint16_t port, double speed)
+    TcpServer(std::shared_ptr<IPeer> peer, std::string const& host, std::uint16_t port, double speed)
         : ServerLoop(std::move(peer), speed), m_acceptor(context()), m_socket(context())
     {
         listen(host, port);
@@ -31,30 +31,30 @@ protected:
     void begin() override { accept(); }
 
 private:
-    static std::string textOf(const tcp::endpoint& endpoint)
+    static std::string textOf(tcp::endpoint const& endpoint)
     {
         const std::string host = endpoint.address().to_string();
         return (endpoint.address().is_v6() ? "[" + host + "]" : host) + ":" + std::to_string(endpoint.port());
     }
 
-    void listen(const std::string& host, std::uint16_t port)
+    void listen(std::string const& host, std::uint16_t port)
     {
         try {
-            const auto endpoints = tcp::resolver(context()).resolve(host, std::to_string(port));
+            auto const endpoints = tcp::resolver(context()).resolve(host, std::to_string(port));
             const tcp::endpoint endpoint = *endpoints.begin();
             m_acceptor.open(endpoint.protocol());
             m_acceptor.set_option(tcp::acceptor::reuse_address(true));
             m_acceptor.bind(endpoint);
             m_acceptor.listen();
             m_address = textOf(m_acceptor.local_endpoint());
-        } catch (const std::system_error& error) {
+        } catch (std::system_error const& error) {
             throw ServerError("cannot listen on " + host + ":" + std::to_string(port) + ": " + error.code().message());
         }
     }
 
     void accept()
     {
-        m_acceptor.async_accept([this](const asio::error_code& error, tcp::socket socket) {
+        m_acceptor.async_accept([this](asio::error_code const& error, tcp::socket socket) {
             if (error) {
                 return;
             }
@@ -68,7 +68,7 @@ private:
 
     void read()
     {
-        m_socket.async_read_some(asio::buffer(m_buffer), [this](const asio::error_code& error, std::size_t size) {
+        m_socket.async_read_some(asio::buffer(m_buffer), [this](asio::error_code const& error, std::size_t size) {
             if (error) {
                 hangUp();
                 accept();
@@ -90,7 +90,7 @@ private:
     void write()
     {
         asio::async_write(m_socket, asio::buffer(m_unsent.front()),
-                          [this](const asio::error_code& error, std::size_t /*size*/) {
+                          [this](asio::error_code const& error, std::size_t /*size*/) {
                               if (error || m_unsent.empty()) {
                                   return; // the pending read sees the end, too
                               }
@@ -120,7 +120,7 @@ private:
 
 } // namespace
 
-std::unique_ptr<IServer> serveTcp(std::shared_ptr<IPeer> peer, const std::string& host, std::uint16_t port,
+std::unique_ptr<IServer> serveTcp(std::shared_ptr<IPeer> peer, std::string const& host, std::uint16_t port,
                                   double speed)
 {
     return std::make_unique<TcpServer>(std::move(peer), host, port, speed);

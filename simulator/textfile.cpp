@@ -6,7 +6,7 @@
 
 namespace obdsim {
 
-std::optional<std::string> readTextFile(const std::string& path)
+std::optional<std::string> readTextFile(std::string const& path)
 {
     std::ifstream file(path, std::ios::binary);
     std::error_code ignored;

@@ -6,6 +6,6 @@
 namespace obdsim {
 
 /// The whole file, nothing if it can't be read.
-std::optional<std::string> readTextFile(const std::string& path);
+std::optional<std::string> readTextFile(std::string const& path);
 
 } // namespace obdsim

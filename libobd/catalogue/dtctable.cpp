@@ -11,7 +11,7 @@ std::size_t DtcTable::size() noexcept
 
 DtcRow DtcTable::row(std::size_t index) noexcept
 {
-    const PackedDtcRow& packed = packedDtcRows[index];
+    PackedDtcRow const& packed = packedDtcRows[index];
     return {packed.maker, packed.code, dtcTextBlocks[packed.textBlock] + packed.textOffset};
 }
 

@@ -10,8 +10,8 @@ namespace obd {
 struct DtcRow
 {
     std::int32_t maker; // value of Manufacturer::AutoManufacturer, 0 is the generic group
-    const char* code;   // such as "P0420"
-    const char* text;   // 1 to 140 ASCII characters
+    char const* code;   // such as "P0420"
+    char const* text;   // 1 to 140 ASCII characters
 };
 
 // The constant table of trouble codes. Rows are grouped by maker in rising order and sorted by code within a maker; a
@@ -26,7 +26,7 @@ public:
         using iterator_category = std::input_iterator_tag;
         using value_type = DtcRow;
         using difference_type = std::ptrdiff_t;
-        using pointer = const DtcRow*;
+        using pointer = DtcRow const*;
         using reference = DtcRow;
 
         explicit Iterator(std::size_t index = 0) noexcept : m_index(index) {}
@@ -38,7 +38,7 @@ public:
             return *this;
         }
         Iterator operator++(int) noexcept { return Iterator(m_index++); }
-        bool operator==(const Iterator& other) const noexcept { return m_index == other.m_index; }
+        bool operator==(Iterator const& other) const noexcept { return m_index == other.m_index; }
 
     private:
         std::size_t m_index;

@@ -19,6 +19,6 @@ extern const PackedDtcRow packedDtcRows[];
 extern const std::size_t packedDtcRowCount;
 
 // The texts, each stored once and ended by a zero, in blocks that a 16 bit offset reaches.
-extern const char* const dtcTextBlocks[];
+extern char const* const dtcTextBlocks[];
 
 } // namespace obd

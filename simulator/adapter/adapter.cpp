@@ -13,7 +13,7 @@ constexpr Time slowPrompt{250};
 constexpr std::size_t longestLine = 254;
 constexpr std::size_t canDataLimit = 8;
 
-std::string chipCommand(const std::string& line)
+std::string chipCommand(std::string const& line)
 {
     return line.substr(0, 2);
 }
@@ -32,7 +32,7 @@ void Adapter::receive(std::string_view bytes)
     if (m_profile.family == AdapterFamily::Silent) {
         return;
     }
-    for (const char character : bytes) {
+    for (char const character : bytes) {
         receiveOne(character);
     }
 }
@@ -70,7 +70,7 @@ bool Adapter::linkIsUp() const
     return true;
 }
 
-const AdapterProfile& Adapter::profile() const
+AdapterProfile const& Adapter::profile() const
 {
     return m_profile;
 }
@@ -115,7 +115,7 @@ void Adapter::receiveOne(char character)
 /// Ends states that last for a time only.
 void Adapter::settle()
 {
-    const bool timed = m_state == State::Busy || m_state == State::Deaf || m_state == State::AwaitingRate;
+    bool const timed = m_state == State::Busy || m_state == State::Deaf || m_state == State::AwaitingRate;
     if (timed && m_now >= m_stateUntil) {
         m_state = State::Ready;
     }
@@ -132,10 +132,10 @@ void Adapter::stop()
     m_stateUntil = m_now + commandTime;
 }
 
-void Adapter::execute(const std::string& line)
+void Adapter::execute(std::string const& line)
 {
     std::string command = normaliseCommand(line);
-    const bool first = std::exchange(m_firstCommand, false);
+    bool const first = std::exchange(m_firstCommand, false);
     if (first && has(Quirk::StoppedFirst)) {
         answer(obdsim::line("STOPPED"));
         return;
@@ -157,7 +157,7 @@ void Adapter::execute(const std::string& line)
     }
 }
 
-void Adapter::executeCommand(const std::string& command)
+void Adapter::executeCommand(std::string const& command)
 {
     const Settings before = m_settings;
     const CommandReply reply = run(command);
@@ -177,17 +177,17 @@ void Adapter::executeCommand(const std::string& command)
     answer(reply);
 }
 
-CommandReply Adapter::run(const std::string& command)
+CommandReply Adapter::run(std::string const& command)
 {
     CommandContext context{m_profile, m_settings, m_bus, m_now};
-    if (const auto call = findCommand(m_profile, command.substr(2))) {
+    if (auto const call = findCommand(m_profile, command.substr(2))) {
         return call->command->handler(context, call->argument);
     }
     return has(Quirk::OkToAll) ? ok() : refused();
 }
 
 /// Commands of the STN chips, which begin with ST, and of the programs on them.
-void Adapter::answerChip(const std::string& command)
+void Adapter::answerChip(std::string const& command)
 {
     if (playScript(m_script ? m_script->toCommand(command, m_settings) : std::nullopt)) {
         return;
@@ -199,14 +199,14 @@ void Adapter::answerChip(const std::string& command)
     }
 }
 
-void Adapter::executeRequest(const std::string& request)
+void Adapter::executeRequest(std::string const& request)
 {
     if (playScript(m_script ? m_script->toRequest(request, m_settings, m_bus) : std::nullopt)) {
         return;
     }
-    const bool counted = request.size() % 2 != 0;
-    const auto data = parseHex(counted ? request.substr(0, request.size() - 1) : request);
-    const bool countRefused = counted && has(Quirk::NoCountDigit);
+    bool const counted = request.size() % 2 != 0;
+    auto const data = parseHex(counted ? request.substr(0, request.size() - 1) : request);
+    bool const countRefused = counted && has(Quirk::NoCountDigit);
     if (!data || data->empty() || data->size() > canDataLimit || countRefused) {
         answer(refused());
         return;
@@ -216,36 +216,36 @@ void Adapter::executeRequest(const std::string& request)
         busRequest.expected = static_cast<int>(parseHexNumber(request.substr(request.size() - 1)).value_or(1));
     }
     const BusReply reply = m_bus.request(busRequest, m_settings, m_now);
-    for (const auto& part : reply.texts) {
+    for (auto const& part : reply.texts) {
         say(commandTime + part.delay, part.text);
     }
     m_state = State::Busy;
     m_stateUntil = m_now + commandTime + reply.end;
-    const bool cutShort = !m_bus.isOpen() || reply.texts.empty() || reply.texts.back().text != "OK\r";
+    bool const cutShort = !m_bus.isOpen() || reply.texts.empty() || reply.texts.back().text != "OK\r";
     if (cutShort) {
         finish(commandTime + reply.end);
     }
 }
 
-bool Adapter::playScript(const std::optional<std::vector<TimedText>>& texts)
+bool Adapter::playScript(std::optional<std::vector<TimedText>> const& texts)
 {
     if (!texts) {
         return false;
     }
-    for (const auto& part : *texts) {
+    for (auto const& part : *texts) {
         sayRaw(commandTime + part.delay, part.text);
     }
     return true;
 }
 
-void Adapter::answer(const CommandReply& reply)
+void Adapter::answer(CommandReply const& reply)
 {
     const Time delay = commandTime + reply.delay;
     if (reply.after == After::Monitor) {
         m_state = State::Monitoring;
         return;
     }
-    for (const auto& text : reply.lines) {
+    for (auto const& text : reply.lines) {
         say(delay, text + "\r");
     }
     if (reply.after == After::BaudRate) {
@@ -258,7 +258,7 @@ void Adapter::answer(const CommandReply& reply)
     }
 }
 
-void Adapter::answerReset(const CommandReply& reply)
+void Adapter::answerReset(CommandReply const& reply)
 {
     const Time delay = commandTime + reply.delay;
     if (has(Quirk::QuestionBeforeBanner)) {
@@ -307,21 +307,21 @@ void Adapter::finish(Time delay)
     sayRaw(prompt, ">");
 }
 
-void Adapter::say(Time delay, const std::string& text)
+void Adapter::say(Time delay, std::string const& text)
 {
     if (!m_settings.linefeeds) {
         sayRaw(delay, text);
         return;
     }
     std::string withFeeds;
-    for (const char character : text) {
+    for (char const character : text) {
         withFeeds += character;
         withFeeds += character == carriageReturn ? "\n" : "";
     }
     sayRaw(delay, withFeeds);
 }
 
-void Adapter::sayRaw(Time delay, const std::string& text)
+void Adapter::sayRaw(Time delay, std::string const& text)
 {
     constexpr std::size_t piece = 5;
     constexpr Time gap{15};

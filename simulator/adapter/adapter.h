@@ -15,10 +15,10 @@ public:
     /// The bytes that answer an AT command, without its echo; nothing to let the
     /// adapter answer. The effect on its settings takes place either way;
     /// `settings` are those before it.
-    virtual std::optional<std::vector<TimedText>> toCommand(const std::string& command, const Settings& settings) = 0;
+    virtual std::optional<std::vector<TimedText>> toCommand(std::string const& command, Settings const& settings) = 0;
 
     /// The same for a request to the bus. `bus` may be told the protocol in use.
-    virtual std::optional<std::vector<TimedText>> toRequest(const std::string& request, const Settings& settings,
+    virtual std::optional<std::vector<TimedText>> toRequest(std::string const& request, Settings const& settings,
                                                             BusLink& bus) = 0;
 };
 
@@ -29,8 +29,8 @@ class Adapter : public IPeer
 public:
     /// `vehicle` may be null: nothing is plugged in.
     Adapter(AdapterProfile profile, std::shared_ptr<Vehicle> vehicle, std::shared_ptr<IScript> script = nullptr);
-    Adapter(const Adapter&) = delete;
-    Adapter& operator=(const Adapter&) = delete;
+    Adapter(Adapter const&) = delete;
+    Adapter& operator=(Adapter const&) = delete;
 
     void receive(std::string_view bytes) override;
     std::optional<Time> nextOutput() const override;
@@ -39,7 +39,7 @@ public:
     void connect() override;
     bool linkIsUp() const override;
 
-    const AdapterProfile& profile() const;
+    AdapterProfile const& profile() const;
 
 private:
     enum class State : int
@@ -55,19 +55,19 @@ private:
     void receiveOne(char character);
     void settle();
     void stop();
-    void execute(const std::string& line);
-    void executeCommand(const std::string& command);
-    void executeRequest(const std::string& request);
-    CommandReply run(const std::string& command);
-    bool playScript(const std::optional<std::vector<TimedText>>& texts);
-    void answer(const CommandReply& reply);
-    void answerReset(const CommandReply& reply);
+    void execute(std::string const& line);
+    void executeCommand(std::string const& command);
+    void executeRequest(std::string const& request);
+    CommandReply run(std::string const& command);
+    bool playScript(std::optional<std::vector<TimedText>> const& texts);
+    void answer(CommandReply const& reply);
+    void answerReset(CommandReply const& reply);
     void answerBaudRate();
     void confirmRate();
-    void answerChip(const std::string& command);
+    void answerChip(std::string const& command);
     void finish(Time delay);
-    void say(Time delay, const std::string& text);
-    void sayRaw(Time delay, const std::string& text);
+    void say(Time delay, std::string const& text);
+    void sayRaw(Time delay, std::string const& text);
     bool has(Quirk quirk) const;
 
     AdapterProfile m_profile;

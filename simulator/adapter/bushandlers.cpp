@@ -7,15 +7,15 @@ namespace {
 constexpr std::uint32_t largestProtocol = 0xC;
 
 /// The bytes of a header of 3, 6 or 8 digits; 11-bit identifiers take two bytes.
-Bytes headerBytes(const std::string& digits)
+Bytes headerBytes(std::string const& digits)
 {
     return parseHex(digits.size() % 2 == 0 ? digits : "0" + digits).value_or(Bytes{});
 }
 
-CommandReply fromBus(const BusReply& reply)
+CommandReply fromBus(BusReply const& reply)
 {
     std::string text;
-    for (const auto& part : reply.texts) {
+    for (auto const& part : reply.texts) {
         text += part.text;
     }
     text.pop_back();
@@ -24,10 +24,10 @@ CommandReply fromBus(const BusReply& reply)
 
 } // namespace
 
-CommandReply tryProtocol(CommandContext& context, const std::string& argument)
+CommandReply tryProtocol(CommandContext& context, std::string const& argument)
 {
-    const bool searches = argument.size() > 1 && argument[0] == 'A';
-    const auto number = parseHexNumber(searches ? argument.substr(1) : argument).value_or(0);
+    bool const searches = argument.size() > 1 && argument[0] == 'A';
+    auto const number = parseHexNumber(searches ? argument.substr(1) : argument).value_or(0);
     if (number > largestProtocol) {
         return refused();
     }
@@ -36,30 +36,30 @@ CommandReply tryProtocol(CommandContext& context, const std::string& argument)
 }
 
 /// Unlike the protocol that is only tried, this one outlasts a reset.
-CommandReply setProtocol(CommandContext& context, const std::string& argument)
+CommandReply setProtocol(CommandContext& context, std::string const& argument)
 {
     CommandReply reply = tryProtocol(context, argument);
     context.bus.store();
     return reply;
 }
 
-CommandReply describeProtocol(CommandContext& context, const std::string& /*argument*/)
+CommandReply describeProtocol(CommandContext& context, std::string const& /*argument*/)
 {
     return line(context.bus.description());
 }
 
-CommandReply protocolNumber(CommandContext& context, const std::string& /*argument*/)
+CommandReply protocolNumber(CommandContext& context, std::string const& /*argument*/)
 {
     return line(context.bus.numberText());
 }
 
-CommandReply closeProtocol(CommandContext& context, const std::string& /*argument*/)
+CommandReply closeProtocol(CommandContext& context, std::string const& /*argument*/)
 {
     context.bus.close();
     return ok();
 }
 
-CommandReply header(CommandContext& context, const std::string& argument)
+CommandReply header(CommandContext& context, std::string const& argument)
 {
     constexpr std::size_t fourBytes = 8;
     if (argument.size() == fourBytes && context.profile.level < 20) {
@@ -69,39 +69,39 @@ CommandReply header(CommandContext& context, const std::string& argument)
     return ok();
 }
 
-CommandReply priority(CommandContext& context, const std::string& argument)
+CommandReply priority(CommandContext& context, std::string const& argument)
 {
     context.settings.priority = static_cast<std::uint8_t>(parseHexNumber(argument).value_or(0));
     return ok();
 }
 
-CommandReply canFilter(CommandContext& context, const std::string& argument)
+CommandReply canFilter(CommandContext& context, std::string const& argument)
 {
     context.settings.canFilter = parseHexNumber(argument);
     return ok();
 }
 
-CommandReply canMask(CommandContext& context, const std::string& argument)
+CommandReply canMask(CommandContext& context, std::string const& argument)
 {
     context.settings.canMask = parseHexNumber(argument);
     return ok();
 }
 
 /// Filter and mask in one; without an address back to hearing all.
-CommandReply canAddress(CommandContext& context, const std::string& argument)
+CommandReply canAddress(CommandContext& context, std::string const& argument)
 {
     context.settings.canFilter = parseHexNumber(argument);
     context.settings.canMask.reset();
     return ok();
 }
 
-CommandReply receiveAddress(CommandContext& context, const std::string& argument)
+CommandReply receiveAddress(CommandContext& context, std::string const& argument)
 {
     context.settings.receiveAddress = static_cast<std::uint8_t>(parseHexNumber(argument).value_or(0));
     return ok();
 }
 
-CommandReply automaticReceive(CommandContext& context, const std::string& /*argument*/)
+CommandReply automaticReceive(CommandContext& context, std::string const& /*argument*/)
 {
     context.settings.receiveAddress.reset();
     context.settings.canFilter.reset();
@@ -109,31 +109,31 @@ CommandReply automaticReceive(CommandContext& context, const std::string& /*argu
     return ok();
 }
 
-CommandReply slowInit(CommandContext& context, const std::string& /*argument*/)
+CommandReply slowInit(CommandContext& context, std::string const& /*argument*/)
 {
     return fromBus(context.bus.wake(BusInit::FiveBaud));
 }
 
-CommandReply fastInit(CommandContext& context, const std::string& /*argument*/)
+CommandReply fastInit(CommandContext& context, std::string const& /*argument*/)
 {
     return fromBus(context.bus.wake(BusInit::Fast));
 }
 
-CommandReply monitor(CommandContext& /*context*/, const std::string& /*argument*/)
+CommandReply monitor(CommandContext& /*context*/, std::string const& /*argument*/)
 {
     return {{}, After::Monitor, Time(0)};
 }
 
-CommandReply canStatus(CommandContext& /*context*/, const std::string& /*argument*/)
+CommandReply canStatus(CommandContext& /*context*/, std::string const& /*argument*/)
 {
     return line("T:00 R:00 ");
 }
 
 /// The adapter's message buffer: its length, and twelve bytes.
-CommandReply bufferDump(CommandContext& context, const std::string& /*argument*/)
+CommandReply bufferDump(CommandContext& context, std::string const& /*argument*/)
 {
     Bytes buffer(13, 0);
-    const Bytes* header = context.settings.header ? &*context.settings.header : nullptr;
+    Bytes const* header = context.settings.header ? &*context.settings.header : nullptr;
     buffer[0] = header == nullptr ? std::uint8_t{0} : static_cast<std::uint8_t>(header->size());
     for (std::size_t i = 0; header != nullptr && i < header->size(); ++i) {
         buffer[i + 1] = (*header)[i];
@@ -142,9 +142,9 @@ CommandReply bufferDump(CommandContext& context, const std::string& /*argument*/
 }
 
 /// Key words exist once a K line has been woken: 08 08 on ISO 9141-2, 8F E9 on KWP.
-CommandReply keywords(CommandContext& context, const std::string& /*argument*/)
+CommandReply keywords(CommandContext& context, std::string const& /*argument*/)
 {
-    const Protocol* protocol = context.bus.protocol();
+    Protocol const* protocol = context.bus.protocol();
     if (protocol == nullptr || protocol->init == BusInit::None || !context.bus.isOpen()) {
         return line("1:-- 2:--");
     }
@@ -152,14 +152,14 @@ CommandReply keywords(CommandContext& context, const std::string& /*argument*/)
 }
 
 /// Diamex adapters repeat the chosen number: "6=ISO 15765-4 (CAN 11/500)".
-CommandReply diamexTryProtocol(CommandContext& context, const std::string& argument)
+CommandReply diamexTryProtocol(CommandContext& context, std::string const& argument)
 {
     const CommandReply reply = tryProtocol(context, argument);
-    const bool chosen = reply.lines.front() == "OK";
+    bool const chosen = reply.lines.front() == "OK";
     return chosen ? line(argument + "=" + context.bus.description()) : reply;
 }
 
-CommandReply diamexProtocol(CommandContext& context, const std::string& argument)
+CommandReply diamexProtocol(CommandContext& context, std::string const& argument)
 {
     CommandReply reply = diamexTryProtocol(context, argument);
     context.bus.store();

@@ -13,52 +13,52 @@ constexpr int searchOrder[] = {6, 7, 8, 9, 1, 2, 3, 5, 4};
 constexpr Time flowControlTime{4};
 constexpr double unpoweredVolts = 12.2;
 
-bool isFirstFrame(const Frame& frame)
+bool isFirstFrame(Frame const& frame)
 {
     return !frame.data.empty() && frame.data[0] >> 4 == 0x1;
 }
 
-bool isConsecutiveFrame(const Frame& frame)
+bool isConsecutiveFrame(Frame const& frame)
 {
     return !frame.data.empty() && frame.data[0] >> 4 == 0x2;
 }
 
 /// Frames of one message follow each other; on CAN those of several modules may
 /// come in between, on the other buses each has the wire for itself.
-std::vector<TimedFrame> schedule(const Vehicle& vehicle, const std::vector<ModuleMessage>& messages, bool everyone)
+std::vector<TimedFrame> schedule(Vehicle const& vehicle, std::vector<ModuleMessage> const& messages, bool everyone)
 {
-    const Protocol& protocol = vehicle.protocol();
+    Protocol const& protocol = vehicle.protocol();
     std::vector<TimedFrame> frames;
     std::map<std::uint32_t, Time> freeAt;
-    for (const auto& message : messages) {
+    for (auto const& message : messages) {
         const std::uint32_t lane = isCan(protocol) ? message.source : 0;
         Time time = std::max(message.delay, freeAt[lane]);
         for (auto& frame : frameReply(protocol, message.source, everyone, message.payload, vehicle.padding())) {
-            const bool waits = isCan(protocol) && isFirstFrame(frame);
+            bool const waits = isCan(protocol) && isFirstFrame(frame);
             frames.push_back({time, std::move(frame)});
             time += protocol.frameGap + (waits ? flowControlTime : Time(0));
         }
         freeAt[lane] = time;
     }
     std::stable_sort(frames.begin(), frames.end(),
-                     [](const TimedFrame& a, const TimedFrame& b) { return a.time < b.time; });
+                     [](TimedFrame const& a, TimedFrame const& b) { return a.time < b.time; });
     return frames;
 }
 
 /// The filters of the host. Without flow control a module sends no frame behind
 /// the first one of a message.
-bool passes(const Protocol& protocol, const Settings& settings, const Frame& frame)
+bool passes(Protocol const& protocol, Settings const& settings, Frame const& frame)
 {
     if (!isCan(protocol)) {
         return !settings.receiveAddress || *settings.receiveAddress == frame.source;
     }
     const std::uint32_t mask = settings.canMask.value_or(settings.canFilter ? 0x1FFFFFFF : 0);
-    const bool wanted = (frame.source & mask) == (settings.canFilter.value_or(0) & mask);
+    bool const wanted = (frame.source & mask) == (settings.canFilter.value_or(0) & mask);
     return wanted && (settings.flowControl || !isConsecutiveFrame(frame));
 }
 
 /// The bytes of the header in the length that the bus has.
-Bytes headerOf(const Protocol& protocol, const Settings& settings)
+Bytes headerOf(Protocol const& protocol, Settings const& settings)
 {
     if (!settings.header) {
         return functionalHeader(protocol);
@@ -73,7 +73,7 @@ Bytes headerOf(const Protocol& protocol, const Settings& settings)
     return header;
 }
 
-bool isPending(const Protocol& protocol, const Frame& frame)
+bool isPending(Protocol const& protocol, Frame const& frame)
 {
     const std::size_t first = isCan(protocol) ? 1 : 0;
     return frame.data.size() > first + 2 && frame.data[first] == 0x7F && frame.data[first + 2] == 0x78;
@@ -81,7 +81,7 @@ bool isPending(const Protocol& protocol, const Frame& frame)
 
 /// How long an adapter listens for one more frame behind the last. Adaptive timing
 /// has learnt that modules answer much faster than the time-out allows.
-Time patience(const Settings& settings)
+Time patience(Settings const& settings)
 {
     switch (settings.adaptiveTiming) {
     case 0:
@@ -95,7 +95,7 @@ Time patience(const Settings& settings)
 
 } // namespace
 
-BusLink::BusLink(std::shared_ptr<Vehicle> vehicle, const Quirks& quirks)
+BusLink::BusLink(std::shared_ptr<Vehicle> vehicle, Quirks const& quirks)
     : m_vehicle(std::move(vehicle)), m_quirks(quirks)
 {}
 
@@ -141,17 +141,17 @@ std::string BusLink::numberText() const
 std::string BusLink::description() const
 {
     // Beyond the nine OBD protocols an ELM327 has a J1939 and two user-defined ones.
-    constexpr const char* others[] = {"SAE J1939 (CAN 29/250)", "USER1 (CAN 11/125)", "USER2 (CAN 11/50)"};
+    constexpr char const* others[] = {"SAE J1939 (CAN 29/250)", "USER1 (CAN 11/125)", "USER2 (CAN 11/50)"};
     if (m_number == 0) {
         return "AUTO";
     }
-    const Protocol* chosen = findProtocol(m_number);
+    Protocol const* chosen = findProtocol(m_number);
     const std::string name = chosen != nullptr ? chosen->name : others[(m_number - 10) % 3];
     const std::string comma = m_quirks.has(Quirk::TightDescription) ? "," : ", ";
     return m_automatic ? "AUTO" + comma + name : name;
 }
 
-const Protocol* BusLink::protocol() const
+Protocol const* BusLink::protocol() const
 {
     return findProtocol(m_number);
 }
@@ -171,20 +171,20 @@ double BusLink::volts(Time now) const
     return m_vehicle ? m_vehicle->volts(now) : unpoweredVolts;
 }
 
-BusReply BusLink::request(const BusRequest& request, const Settings& settings, Time now)
+BusReply BusLink::request(BusRequest const& request, Settings const& settings, Time now)
 {
     BusReply reply;
     if (!m_open && !establish(reply)) {
         return reply;
     }
-    const bool first = !m_asked;
+    bool const first = !m_asked;
     m_asked = true;
     if (first && m_quirks.has(Quirk::FirstNoData)) {
         reply.end += settings.timeout();
         reply.texts.push_back({reply.end, "NO DATA\r"});
         return reply;
     }
-    const bool woken = !reply.texts.empty() && !m_automatic;
+    bool const woken = !reply.texts.empty() && !m_automatic;
     if (woken && m_quirks.has(Quirk::BusInitSplit)) {
         return reply;
     }
@@ -199,8 +199,8 @@ bool BusLink::establish(BusReply& reply)
 bool BusLink::search(BusReply& reply)
 {
     reply.texts.push_back({Time(0), "SEARCHING..."});
-    for (const int number : searchOrder) {
-        const Protocol& candidate = *findProtocol(number);
+    for (int const number : searchOrder) {
+        Protocol const& candidate = *findProtocol(number);
         reply.end += candidate.probe;
         if (reaches(candidate)) {
             m_number = number;
@@ -216,7 +216,7 @@ bool BusLink::search(BusReply& reply)
 /// Opens the bus of a protocol that the host has chosen.
 bool BusLink::start(BusReply& reply)
 {
-    const Protocol* chosen = protocol();
+    Protocol const* chosen = protocol();
     if (chosen == nullptr || chosen->init == BusInit::None) {
         if (chosen == nullptr || !reaches(*chosen)) {
             fail(reply);
@@ -233,7 +233,7 @@ bool BusLink::start(BusReply& reply)
 
 BusReply BusLink::wake(BusInit init)
 {
-    const Protocol* chosen = protocol();
+    Protocol const* chosen = protocol();
     BusReply reply;
     if (chosen == nullptr || isCan(*chosen) || chosen->init == BusInit::None) {
         reply.texts.push_back({Time(0), "?\r"});
@@ -241,7 +241,7 @@ BusReply BusLink::wake(BusInit init)
     }
     m_open = chosen->init == init && reaches(*chosen);
     reply.texts.push_back({Time(0), "BUS INIT: "});
-    const bool dots = init == BusInit::FiveBaud && !m_quirks.has(Quirk::InitWithoutDots);
+    bool const dots = init == BusInit::FiveBaud && !m_quirks.has(Quirk::InitWithoutDots);
     for (int i = 1; dots && i <= 3; ++i) {
         reply.texts.push_back({chosen->probe * i / 4, "."});
     }
@@ -250,7 +250,7 @@ BusReply BusLink::wake(BusInit init)
     return reply;
 }
 
-bool BusLink::reaches(const Protocol& candidate) const
+bool BusLink::reaches(Protocol const& candidate) const
 {
     return m_vehicle && &m_vehicle->protocol() == &candidate;
 }
@@ -260,24 +260,24 @@ bool BusLink::reaches(const Protocol& candidate) const
 /// rate nobody listens to identifiers of the wrong length; J1850 stays quiet.
 void BusLink::fail(BusReply& reply) const
 {
-    const Protocol* chosen = protocol();
-    const bool canOrOther = chosen == nullptr || isCan(*chosen);
-    const bool sameRate = chosen != nullptr && m_vehicle && isCan(m_vehicle->protocol()) &&
+    Protocol const* chosen = protocol();
+    bool const canOrOther = chosen == nullptr || isCan(*chosen);
+    bool const sameRate = chosen != nullptr && m_vehicle && isCan(m_vehicle->protocol()) &&
                           m_vehicle->protocol().kilobaud == chosen->kilobaud;
     reply.end += chosen == nullptr ? Time(100) : chosen->probe;
     reply.texts.push_back({reply.end, canOrOther && !sameRate ? "CAN ERROR\r" : "NO DATA\r"});
 }
 
-BusReply BusLink::exchange(const BusRequest& request, const Settings& settings, BusReply reply, Time now)
+BusReply BusLink::exchange(BusRequest const& request, Settings const& settings, BusReply reply, Time now)
 {
-    const Protocol& bus = m_vehicle->protocol();
+    Protocol const& bus = m_vehicle->protocol();
     const FrameWriter writer(bus, settings, m_quirks);
     const Time sent = reply.end;
     Time deadline = sent + settings.timeout();
     Time promised{}; // a module asked for patience until then, whatever the others say meanwhile
     int count = 0;
-    for (const auto& [time, frame] : send(request, settings, now + sent)) {
-        const bool enough = request.expected && count == *request.expected;
+    for (auto const& [time, frame] : send(request, settings, now + sent)) {
+        bool const enough = request.expected && count == *request.expected;
         if (enough || sent + time > deadline) {
             break;
         }
@@ -288,7 +288,7 @@ BusReply BusLink::exchange(const BusRequest& request, const Settings& settings, 
             ++count;
         }
     }
-    const bool complete = count > 0 && request.expected && count == *request.expected;
+    bool const complete = count > 0 && request.expected && count == *request.expected;
     reply.end = complete ? reply.texts.back().delay : deadline;
     if (!settings.responses) {
         reply.end = sent;
@@ -299,12 +299,12 @@ BusReply BusLink::exchange(const BusRequest& request, const Settings& settings, 
 }
 
 /// Puts the request on the bus; the frames that come back, in the order of time.
-std::vector<TimedFrame> BusLink::send(const BusRequest& request, const Settings& settings, Time at)
+std::vector<TimedFrame> BusLink::send(BusRequest const& request, Settings const& settings, Time at)
 {
-    const Protocol& bus = m_vehicle->protocol();
-    const bool wrapped = settings.formatting || m_quirks.has(Quirk::FormattingStuck) || !isCan(bus);
-    const auto data = wrapped ? std::optional<Bytes>(request.data) : unwrapSingleFrame(request.data);
-    const auto target = targetOf(bus, headerOf(bus, settings));
+    Protocol const& bus = m_vehicle->protocol();
+    bool const wrapped = settings.formatting || m_quirks.has(Quirk::FormattingStuck) || !isCan(bus);
+    auto const data = wrapped ? std::optional<Bytes>(request.data) : unwrapSingleFrame(request.data);
+    auto const target = targetOf(bus, headerOf(bus, settings));
     if (!data || !target) {
         return {};
     }

@@ -42,7 +42,7 @@ class BusLink
 {
 public:
     /// `vehicle` may be null: a socket without a car. `quirks` must outlive this.
-    BusLink(std::shared_ptr<Vehicle> vehicle, const Quirks& quirks);
+    BusLink(std::shared_ptr<Vehicle> vehicle, Quirks const& quirks);
 
     /// ATSP and ATTP: 0 for automatic. `automatic`: search if it fails.
     void select(int number, bool automatic);
@@ -66,9 +66,9 @@ public:
     std::string description() const;
 
     /// The protocol whose formats are in use; null before a search has found it.
-    const Protocol* protocol() const;
+    Protocol const* protocol() const;
 
-    BusReply request(const BusRequest& request, const Settings& settings, Time now);
+    BusReply request(BusRequest const& request, Settings const& settings, Time now);
 
     /// ATSI and ATFI: wakes the bus.
     BusReply wake(BusInit init);
@@ -85,13 +85,13 @@ private:
     bool establish(BusReply& reply);
     bool search(BusReply& reply);
     bool start(BusReply& reply);
-    bool reaches(const Protocol& protocol) const;
-    BusReply exchange(const BusRequest& request, const Settings& settings, BusReply reply, Time now);
-    std::vector<TimedFrame> send(const BusRequest& request, const Settings& settings, Time at);
+    bool reaches(Protocol const& protocol) const;
+    BusReply exchange(BusRequest const& request, Settings const& settings, BusReply reply, Time now);
+    std::vector<TimedFrame> send(BusRequest const& request, Settings const& settings, Time at);
     void fail(BusReply& reply) const;
 
     std::shared_ptr<Vehicle> m_vehicle;
-    const Quirks& m_quirks;
+    Quirks const& m_quirks;
     int m_number = 0;
     bool m_automatic = true;
     int m_storedNumber = 0;

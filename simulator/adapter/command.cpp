@@ -122,7 +122,7 @@ bool fits(char token, char character)
     }
 }
 
-bool matchesOne(std::string_view shape, const std::string& argument)
+bool matchesOne(std::string_view shape, std::string const& argument)
 {
     if (shape == "*") {
         return isHexText(argument);
@@ -130,10 +130,10 @@ bool matchesOne(std::string_view shape, const std::string& argument)
     return shape.size() == argument.size() && std::equal(shape.begin(), shape.end(), argument.begin(), fits);
 }
 
-bool matches(std::string_view shape, const std::string& argument)
+bool matches(std::string_view shape, std::string const& argument)
 {
     while (true) {
-        const auto bar = shape.find('|');
+        auto const bar = shape.find('|');
         if (matchesOne(shape.substr(0, bar), argument)) {
             return true;
         }
@@ -144,14 +144,14 @@ bool matches(std::string_view shape, const std::string& argument)
     }
 }
 
-bool knows(const AdapterProfile& profile, const Command& command)
+bool knows(AdapterProfile const& profile, Command const& command)
 {
     return (command.families & mask(profile.family)) != 0 && command.level <= profile.level;
 }
 
-std::optional<CommandCall> findExact(const AdapterProfile& profile, const std::string& text)
+std::optional<CommandCall> findExact(AdapterProfile const& profile, std::string const& text)
 {
-    for (const auto& command : commands) {
+    for (auto const& command : commands) {
         const std::string_view name = command.name;
         if (text.compare(0, name.size(), name) == 0 && knows(profile, command)) {
             const std::string argument = text.substr(name.size());
@@ -165,7 +165,7 @@ std::optional<CommandCall> findExact(const AdapterProfile& profile, const std::s
 
 } // namespace
 
-std::optional<CommandCall> findCommand(const AdapterProfile& profile, const std::string& text)
+std::optional<CommandCall> findCommand(AdapterProfile const& profile, std::string const& text)
 {
     auto call = findExact(profile, text);
     if (!call && profile.quirks.has(Quirk::FirstLettersOnly) && text.size() > 1) {

@@ -25,13 +25,13 @@ struct CommandReply
 /// What a command may read and change.
 struct CommandContext
 {
-    const AdapterProfile& profile;
+    AdapterProfile const& profile;
     Settings& settings;
     BusLink& bus;
     Time now;
 };
 
-using CommandHandler = CommandReply (*)(CommandContext& context, const std::string& argument);
+using CommandHandler = CommandReply (*)(CommandContext& context, std::string const& argument);
 
 /// One AT command.
 ///
@@ -40,8 +40,8 @@ using CommandHandler = CommandReply (*)(CommandContext& context, const std::stri
 /// digits, any other character for itself.
 struct Command
 {
-    const char* name;
-    const char* shape;
+    char const* name;
+    char const* shape;
     int level; ///< since this version of the ELM327, times ten
     unsigned int families;
     CommandHandler handler;
@@ -50,12 +50,12 @@ struct Command
 /// A command with what stands behind its name.
 struct CommandCall
 {
-    const Command* command;
+    Command const* command;
     std::string argument;
 };
 
 /// Finds the AT command in `text` (normalised, without "AT") for an adapter.
-std::optional<CommandCall> findCommand(const AdapterProfile& profile, const std::string& text);
+std::optional<CommandCall> findCommand(AdapterProfile const& profile, std::string const& text);
 
 CommandReply ok();
 CommandReply refused();

@@ -9,31 +9,31 @@ namespace {
 constexpr std::uint8_t singleFrame = 0x0;
 constexpr std::uint8_t firstFrame = 0x1;
 
-std::uint8_t kind(const Frame& frame)
+std::uint8_t kind(Frame const& frame)
 {
     return static_cast<std::uint8_t>(frame.data.empty() ? 0 : frame.data[0] >> 4);
 }
 
-Bytes from(const Bytes& data, std::size_t index)
+Bytes from(Bytes const& data, std::size_t index)
 {
     return {data.begin() + static_cast<std::ptrdiff_t>(std::min(index, data.size())), data.end()};
 }
 
 } // namespace
 
-FrameWriter::FrameWriter(const Protocol& protocol, const Settings& settings, const Quirks& quirks)
+FrameWriter::FrameWriter(Protocol const& protocol, Settings const& settings, Quirks const& quirks)
     : m_protocol(protocol), m_settings(settings), m_quirks(quirks)
 {}
 
-std::string FrameWriter::lines(const Frame& frame) const
+std::string FrameWriter::lines(Frame const& frame) const
 {
     const std::string once = isCan(m_protocol) ? canLines(frame) : serialLine(frame);
     return m_quirks.has(Quirk::FramesTwice) ? once + once : once;
 }
 
-std::string FrameWriter::canLines(const Frame& frame) const
+std::string FrameWriter::canLines(Frame const& frame) const
 {
-    const bool formatting = m_settings.formatting || m_quirks.has(Quirk::FormattingStuck);
+    bool const formatting = m_settings.formatting || m_quirks.has(Quirk::FormattingStuck);
     if (!headersShown()) {
         return formatting ? formattedCan(frame) : text(frame.data) + "\r";
     }
@@ -42,21 +42,21 @@ std::string FrameWriter::canLines(const Frame& frame) const
 }
 
 /// Headers off: the PCI bytes become a length line and line numbers.
-std::string FrameWriter::formattedCan(const Frame& frame) const
+std::string FrameWriter::formattedCan(Frame const& frame) const
 {
     if (kind(frame) == singleFrame) {
         return text(from(withoutPadding(frame.data), 1)) + "\r";
     }
     const std::string blank = m_settings.spaces ? " " : "";
     if (kind(frame) == firstFrame) {
-        const auto length = static_cast<std::uint32_t>((frame.data[0] & 0x0F) << 8 | frame.data[1]);
+        auto const length = static_cast<std::uint32_t>((frame.data[0] & 0x0F) << 8 | frame.data[1]);
         return hexNumber(length, 3) + "\r0:" + blank + text(from(frame.data, 2)) + "\r";
     }
-    const auto number = static_cast<std::uint32_t>(frame.data[0] & 0x0F);
+    auto const number = static_cast<std::uint32_t>(frame.data[0] & 0x0F);
     return hexNumber(number, 1) + ":" + blank + text(from(frame.data, 1)) + "\r";
 }
 
-std::string FrameWriter::serialLine(const Frame& frame) const
+std::string FrameWriter::serialLine(Frame const& frame) const
 {
     if (!headersShown()) {
         return text(frame.data) + "\r";
@@ -70,7 +70,7 @@ std::string FrameWriter::serialLine(const Frame& frame) const
 }
 
 /// The identifier of a CAN frame: three digits for 11 bits, four bytes for 29.
-std::string FrameWriter::header(const Frame& frame) const
+std::string FrameWriter::header(Frame const& frame) const
 {
     const std::string blank = m_settings.spaces ? " " : "";
     std::string id = m_protocol.family == BusFamily::Can11 ? hexNumber(frame.source, 3) + blank : text(frame.header);
@@ -80,11 +80,11 @@ std::string FrameWriter::header(const Frame& frame) const
     return id + hexNumber(static_cast<std::uint32_t>(frame.data.size()), 1) + blank;
 }
 
-std::string FrameWriter::text(const Bytes& bytes) const
+std::string FrameWriter::text(Bytes const& bytes) const
 {
     const std::string separator = m_quirks.has(Quirk::BytePerLine) ? "\r" : m_settings.spaces ? " " : "";
     std::string line;
-    for (const auto byte : bytes) {
+    for (auto const byte : bytes) {
         line += hexByte(byte) + separator;
     }
     if (separator == "\r" && !line.empty()) {
@@ -95,7 +95,7 @@ std::string FrameWriter::text(const Bytes& bytes) const
 
 /// The adapter cuts a single frame to the length in its PCI byte, and prints
 /// consecutive frames as they come.
-Bytes FrameWriter::withoutPadding(const Bytes& data) const
+Bytes FrameWriter::withoutPadding(Bytes const& data) const
 {
     if (data.empty() || data[0] >> 4 != singleFrame || m_quirks.has(Quirk::PaddingShown)) {
         return data;

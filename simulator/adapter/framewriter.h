@@ -11,23 +11,23 @@ class FrameWriter
 {
 public:
     /// All three must outlive the writer.
-    FrameWriter(const Protocol& protocol, const Settings& settings, const Quirks& quirks);
+    FrameWriter(Protocol const& protocol, Settings const& settings, Quirks const& quirks);
 
     /// The lines for one frame, each ended by CR.
-    std::string lines(const Frame& frame) const;
+    std::string lines(Frame const& frame) const;
 
 private:
-    std::string canLines(const Frame& frame) const;
-    std::string formattedCan(const Frame& frame) const;
-    std::string serialLine(const Frame& frame) const;
-    std::string header(const Frame& frame) const;
-    std::string text(const Bytes& bytes) const;
-    Bytes withoutPadding(const Bytes& data) const;
+    std::string canLines(Frame const& frame) const;
+    std::string formattedCan(Frame const& frame) const;
+    std::string serialLine(Frame const& frame) const;
+    std::string header(Frame const& frame) const;
+    std::string text(Bytes const& bytes) const;
+    Bytes withoutPadding(Bytes const& data) const;
     bool headersShown() const;
 
-    const Protocol& m_protocol;
-    const Settings& m_settings;
-    const Quirks& m_quirks;
+    Protocol const& m_protocol;
+    Settings const& m_settings;
+    Quirks const& m_quirks;
 };
 
 } // namespace obdsim

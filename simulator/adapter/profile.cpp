@@ -7,7 +7,7 @@ namespace obdsim {
 
 namespace {
 
-constexpr const char* elmDescription = "OBDII to RS232 Interpreter";
+constexpr char const* elmDescription = "OBDII to RS232 Interpreter";
 
 // clang-format off
 const AdapterProfile profiles[] = {
@@ -35,8 +35,8 @@ const AdapterProfile profiles[] = {
 
 struct FamilyWord
 {
-    const char* word;
-    const char* key;
+    char const* word;
+    char const* key;
 };
 
 constexpr FamilyWord familyWords[] = {
@@ -53,10 +53,10 @@ std::string upperCase(std::string text)
     return text;
 }
 
-const AdapterProfile& familyProfile(const std::string& banner)
+AdapterProfile const& familyProfile(std::string const& banner)
 {
     const std::string text = upperCase(banner);
-    for (const auto& row : familyWords) {
+    for (auto const& row : familyWords) {
         if (text.find(row.word) != std::string::npos) {
             return *findProfile(row.key);
         }
@@ -66,26 +66,26 @@ const AdapterProfile& familyProfile(const std::string& banner)
 
 } // namespace
 
-const AdapterProfile* findProfile(std::string_view key)
+AdapterProfile const* findProfile(std::string_view key)
 {
-    const auto found =
-        std::find_if(std::begin(profiles), std::end(profiles), [key](const AdapterProfile& p) { return p.key == key; });
+    auto const found =
+        std::find_if(std::begin(profiles), std::end(profiles), [key](AdapterProfile const& p) { return p.key == key; });
     return found == std::end(profiles) ? nullptr : &*found;
 }
 
 std::vector<std::string> profileKeys()
 {
     std::vector<std::string> keys;
-    for (const auto& profile : profiles) {
+    for (auto const& profile : profiles) {
         keys.push_back(profile.key);
     }
     return keys;
 }
 
-AdapterProfile profileForBanner(const std::string& banner)
+AdapterProfile profileForBanner(std::string const& banner)
 {
-    const auto same = std::find_if(std::begin(profiles), std::end(profiles),
-                                   [&](const AdapterProfile& p) { return !banner.empty() && p.banner == banner; });
+    auto const same = std::find_if(std::begin(profiles), std::end(profiles),
+                                   [&](AdapterProfile const& p) { return !banner.empty() && p.banner == banner; });
     if (same != std::end(profiles)) {
         return *same;
     }

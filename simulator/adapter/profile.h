@@ -30,12 +30,12 @@ struct AdapterProfile
 };
 
 /// The profile of that key; null if there is none.
-const AdapterProfile* findProfile(std::string_view key);
+AdapterProfile const* findProfile(std::string_view key);
 
 std::vector<std::string> profileKeys();
 
 /// The profile that a recorded banner such as "ELM327 v2.1" stands for: one of the
 /// table, or the nearest one of the same family with that banner put in.
-AdapterProfile profileForBanner(const std::string& banner);
+AdapterProfile profileForBanner(std::string const& banner);
 
 } // namespace obdsim

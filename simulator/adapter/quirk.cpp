@@ -47,7 +47,7 @@ std::uint32_t bit(Quirk quirk)
 
 Quirks::Quirks(std::initializer_list<Quirk> quirks)
 {
-    for (const auto quirk : quirks) {
+    for (auto const quirk : quirks) {
         add(quirk);
     }
 }
@@ -57,7 +57,7 @@ void Quirks::add(Quirk quirk)
     m_bits |= bit(quirk);
 }
 
-void Quirks::add(const Quirks& others)
+void Quirks::add(Quirks const& others)
 {
     m_bits |= others.m_bits;
 }
@@ -69,7 +69,7 @@ bool Quirks::has(Quirk quirk) const
 
 std::optional<Quirk> findQuirk(std::string_view name)
 {
-    const auto found = std::find(std::begin(names), std::end(names), name);
+    auto const found = std::find(std::begin(names), std::end(names), name);
     if (found == std::end(names)) {
         return std::nullopt;
     }

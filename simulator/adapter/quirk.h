@@ -49,7 +49,7 @@ public:
     Quirks(std::initializer_list<Quirk> quirks);
 
     void add(Quirk quirk);
-    void add(const Quirks& others);
+    void add(Quirks const& others);
     bool has(Quirk quirk) const;
 
 private:

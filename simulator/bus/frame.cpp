@@ -26,22 +26,22 @@ Bytes bigEndian(std::uint32_t number, std::size_t size)
     return bytes;
 }
 
-std::uint32_t fromBigEndian(const Bytes& bytes)
+std::uint32_t fromBigEndian(Bytes const& bytes)
 {
     std::uint32_t number = 0;
-    for (const auto byte : bytes) {
+    for (auto const byte : bytes) {
         number = number << 8 | byte;
     }
     return number;
 }
 
-Bytes slice(const Bytes& bytes, std::size_t from, std::size_t count)
+Bytes slice(Bytes const& bytes, std::size_t from, std::size_t count)
 {
-    const auto end = std::min(bytes.size(), from + count);
+    auto const end = std::min(bytes.size(), from + count);
     return {bytes.begin() + static_cast<std::ptrdiff_t>(from), bytes.begin() + static_cast<std::ptrdiff_t>(end)};
 }
 
-Frame canFrame(const Protocol& protocol, std::uint32_t source, Bytes pci, const Bytes& part, Padding padding)
+Frame canFrame(Protocol const& protocol, std::uint32_t source, Bytes pci, Bytes const& part, Padding padding)
 {
     pci.insert(pci.end(), part.begin(), part.end());
     if (padding) {
@@ -50,10 +50,10 @@ Frame canFrame(const Protocol& protocol, std::uint32_t source, Bytes pci, const 
     return {source, bigEndian(source, protocol.family == BusFamily::Can11 ? 2 : 4), std::move(pci), std::nullopt};
 }
 
-std::vector<Frame> canReply(const Protocol& protocol, std::uint32_t source, const Bytes& payload, Padding padding)
+std::vector<Frame> canReply(Protocol const& protocol, std::uint32_t source, Bytes const& payload, Padding padding)
 {
     if (payload.size() <= nextFramePayload) {
-        const auto length = static_cast<std::uint8_t>(payload.size());
+        auto const length = static_cast<std::uint8_t>(payload.size());
         return {canFrame(protocol, source, {length}, payload, padding)};
     }
     const Bytes lengthPci = {static_cast<std::uint8_t>(0x10 | payload.size() >> 8),
@@ -62,7 +62,7 @@ std::vector<Frame> canReply(const Protocol& protocol, std::uint32_t source, cons
         canFrame(protocol, source, lengthPci, slice(payload, 0, firstFramePayload), std::nullopt)};
     std::uint8_t sequence = 1;
     for (std::size_t at = firstFramePayload; at < payload.size(); at += nextFramePayload) {
-        const auto pci = static_cast<std::uint8_t>(0x20 | (sequence++ & 0x0F));
+        auto const pci = static_cast<std::uint8_t>(0x20 | (sequence++ & 0x0F));
         frames.push_back(canFrame(protocol, source, {pci}, slice(payload, at, nextFramePayload), padding));
     }
     return frames;
@@ -77,7 +77,7 @@ Bytes kwpHeader(std::uint8_t source, std::size_t length)
     return {0x80, tester, source, static_cast<std::uint8_t>(length)};
 }
 
-Bytes replyHeader(const Protocol& protocol, std::uint8_t source, bool everyone, std::size_t length)
+Bytes replyHeader(Protocol const& protocol, std::uint8_t source, bool everyone, std::size_t length)
 {
     switch (protocol.family) {
     case BusFamily::J1850Pwm:
@@ -91,12 +91,12 @@ Bytes replyHeader(const Protocol& protocol, std::uint8_t source, bool everyone, 
     }
 }
 
-bool isJ1850(const Protocol& protocol)
+bool isJ1850(Protocol const& protocol)
 {
     return protocol.family == BusFamily::J1850Pwm || protocol.family == BusFamily::J1850Vpw;
 }
 
-Frame serialReply(const Protocol& protocol, std::uint32_t source, bool everyone, const Bytes& payload)
+Frame serialReply(Protocol const& protocol, std::uint32_t source, bool everyone, Bytes const& payload)
 {
     Frame frame{source, replyHeader(protocol, static_cast<std::uint8_t>(source), everyone, payload.size()), payload,
                 std::nullopt};
@@ -127,10 +127,10 @@ std::optional<Target> target29(std::uint32_t id)
     return std::nullopt;
 }
 
-std::optional<Target> targetOnWire(const Protocol& protocol, const Bytes& header)
+std::optional<Target> targetOnWire(Protocol const& protocol, Bytes const& header)
 {
     const Bytes standard = functionalHeader(protocol);
-    const bool functionalKwp = protocol.family == BusFamily::Kwp && header[0] >= 0xC0;
+    bool const functionalKwp = protocol.family == BusFamily::Kwp && header[0] >= 0xC0;
     if (functionalKwp || (header[0] == standard[0] && header[1] == standard[1])) {
         return Target{true, 0};
     }
@@ -139,7 +139,7 @@ std::optional<Target> targetOnWire(const Protocol& protocol, const Bytes& header
 
 } // namespace
 
-Bytes functionalHeader(const Protocol& protocol)
+Bytes functionalHeader(Protocol const& protocol)
 {
     switch (protocol.family) {
     case BusFamily::Can11:
@@ -155,7 +155,7 @@ Bytes functionalHeader(const Protocol& protocol)
     }
 }
 
-std::optional<Target> targetOf(const Protocol& protocol, const Bytes& header)
+std::optional<Target> targetOf(Protocol const& protocol, Bytes const& header)
 {
     if (protocol.family == BusFamily::Can11 && header.size() == 2) {
         return target11(fromBigEndian(header));
@@ -169,7 +169,7 @@ std::optional<Target> targetOf(const Protocol& protocol, const Bytes& header)
     return std::nullopt;
 }
 
-std::vector<Frame> frameReply(const Protocol& protocol, std::uint32_t source, bool everyone, const Bytes& payload,
+std::vector<Frame> frameReply(Protocol const& protocol, std::uint32_t source, bool everyone, Bytes const& payload,
                               Padding padding)
 {
     if (isCan(protocol)) {
@@ -178,7 +178,7 @@ std::vector<Frame> frameReply(const Protocol& protocol, std::uint32_t source, bo
     return {serialReply(protocol, source, everyone, payload)};
 }
 
-std::optional<Bytes> unwrapSingleFrame(const Bytes& data)
+std::optional<Bytes> unwrapSingleFrame(Bytes const& data)
 {
     if (data.empty() || data[0] == 0 || data[0] > nextFramePayload || data.size() <= data[0]) {
         return std::nullopt;

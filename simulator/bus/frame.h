@@ -27,19 +27,19 @@ struct Target
 using Padding = std::optional<std::uint8_t>;
 
 /// The header of a request to all modules: 7DF, 18 DB 33 F1, 68 6A F1, ...
-Bytes functionalHeader(const Protocol& protocol);
+Bytes functionalHeader(Protocol const& protocol);
 
 /// The reading of a request header: 11-bit identifiers are two bytes, 29-bit
 /// ones four, the others three. Nothing if no OBD module would listen to it.
-std::optional<Target> targetOf(const Protocol& protocol, const Bytes& header);
+std::optional<Target> targetOf(Protocol const& protocol, Bytes const& header);
 
 /// The frames in which a module sends `payload`.
 /// `everyone`: the request had been to all modules. `padding` matters on CAN only.
-std::vector<Frame> frameReply(const Protocol& protocol, std::uint32_t source, bool everyone, const Bytes& payload,
+std::vector<Frame> frameReply(Protocol const& protocol, std::uint32_t source, bool everyone, Bytes const& payload,
                               Padding padding);
 
 /// The service bytes of a request's CAN data field (ISO 15765-2 single frame);
 /// nothing if it is no single frame.
-std::optional<Bytes> unwrapSingleFrame(const Bytes& data);
+std::optional<Bytes> unwrapSingleFrame(Bytes const& data);
 
 } // namespace obdsim

@@ -25,14 +25,14 @@ constexpr Protocol protocols[] = {
 
 } // namespace
 
-const Protocol* findProtocol(int number)
+Protocol const* findProtocol(int number)
 {
-    const auto row = std::find_if(std::begin(protocols), std::end(protocols),
-                                  [number](const Protocol& p) { return p.number == number; });
+    auto const row = std::find_if(std::begin(protocols), std::end(protocols),
+                                  [number](Protocol const& p) { return p.number == number; });
     return row == std::end(protocols) ? nullptr : &*row;
 }
 
-bool isCan(const Protocol& protocol)
+bool isCan(Protocol const& protocol)
 {
     return protocol.family == BusFamily::Can11 || protocol.family == BusFamily::Can29;
 }

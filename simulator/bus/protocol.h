@@ -26,7 +26,7 @@ enum class BusInit : int
 struct Protocol
 {
     int number;
-    const char* name; ///< as an ELM327 prints it
+    char const* name; ///< as an ELM327 prints it
     BusFamily family;
     int kilobaud;
     BusInit init;
@@ -35,8 +35,8 @@ struct Protocol
 };
 
 /// The protocol of that number (1 to 9), null for any other number.
-const Protocol* findProtocol(int number);
+Protocol const* findProtocol(int number);
 
-bool isCan(const Protocol& protocol);
+bool isCan(Protocol const& protocol);
 
 } // namespace obdsim

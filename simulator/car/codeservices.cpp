@@ -6,17 +6,17 @@ namespace {
 
 constexpr std::size_t codesPerLine = 3;
 
-Bytes countedCodes(std::uint8_t service, const std::vector<std::uint16_t>& codes)
+Bytes countedCodes(std::uint8_t service, std::vector<std::uint16_t> const& codes)
 {
     Bytes message = {service, static_cast<std::uint8_t>(codes.size())};
-    for (const auto code : codes) {
+    for (auto const code : codes) {
         appendWord(message, code);
     }
     return message;
 }
 
 /// Three codes a line, filled with zeros; one empty line if there are none.
-std::vector<Bytes> codeLines(std::uint8_t service, const std::vector<std::uint16_t>& codes)
+std::vector<Bytes> codeLines(std::uint8_t service, std::vector<std::uint16_t> const& codes)
 {
     std::vector<Bytes> lines;
     for (std::size_t at = 0; at == 0 || at < codes.size(); at += codesPerLine) {
@@ -29,30 +29,30 @@ std::vector<Bytes> codeLines(std::uint8_t service, const std::vector<std::uint16
     return lines;
 }
 
-Answer tellCodes(const ServiceCall& call, const std::vector<std::uint16_t>& codes)
+Answer tellCodes(ServiceCall const& call, std::vector<std::uint16_t> const& codes)
 {
-    const auto service = call.positiveService();
+    auto const service = call.positiveService();
     return call.onCan() ? Answer{0, {countedCodes(service, codes)}} : Answer{0, codeLines(service, codes)};
 }
 
 } // namespace
 
-Answer storedCodes(const ServiceCall& call)
+Answer storedCodes(ServiceCall const& call)
 {
     return tellCodes(call, call.module.data().stored);
 }
 
-Answer pendingCodes(const ServiceCall& call)
+Answer pendingCodes(ServiceCall const& call)
 {
     return tellCodes(call, call.module.data().pending);
 }
 
-Answer permanentCodes(const ServiceCall& call)
+Answer permanentCodes(ServiceCall const& call)
 {
     return tellCodes(call, call.module.data().permanent);
 }
 
-Answer clearCodes(const ServiceCall& call)
+Answer clearCodes(ServiceCall const& call)
 {
     if (!call.module.data().clearsWhileRunning && call.module.engineRuns(call.now)) {
         return {refusal::conditionsNotCorrect, {}};

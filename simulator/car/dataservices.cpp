@@ -9,35 +9,35 @@ namespace {
 constexpr std::size_t pidsPerRequest = 6; // SAE J1979, on CAN only
 constexpr std::uint8_t freezeFrameCode = 0x02;
 
-std::set<std::uint8_t> currentIds(const Module& module)
+std::set<std::uint8_t> currentIds(Module const& module)
 {
-    const auto pids = module.currentPids();
+    auto const pids = module.currentPids();
     return {pids.begin(), pids.end()};
 }
 
-std::optional<Bytes> currentItem(const ServiceCall& call, std::uint8_t pid)
+std::optional<Bytes> currentItem(ServiceCall const& call, std::uint8_t pid)
 {
     return isRangeRequest(pid) ? supportedMask(currentIds(call.module), pid) : call.module.currentData(pid, call.now);
 }
 
-const FreezeFrame* findFrame(const ModuleData& data, std::uint8_t number)
+FreezeFrame const* findFrame(ModuleData const& data, std::uint8_t number)
 {
-    const auto frame = std::find_if(data.frames.begin(), data.frames.end(),
-                                    [number](const FreezeFrame& f) { return f.number == number; });
+    auto const frame = std::find_if(data.frames.begin(), data.frames.end(),
+                                    [number](FreezeFrame const& f) { return f.number == number; });
     return frame == data.frames.end() ? nullptr : &*frame;
 }
 
-std::set<std::uint8_t> frameIds(const FreezeFrame& frame)
+std::set<std::uint8_t> frameIds(FreezeFrame const& frame)
 {
     std::set<std::uint8_t> ids(frame.pids.begin(), frame.pids.end());
     ids.insert(freezeFrameCode);
-    for (const auto& [pid, data] : frame.values) {
+    for (auto const& [pid, data] : frame.values) {
         ids.insert(pid);
     }
     return ids;
 }
 
-std::optional<Bytes> frameItem(const Module& module, const FreezeFrame& frame, std::uint8_t pid)
+std::optional<Bytes> frameItem(Module const& module, FreezeFrame const& frame, std::uint8_t pid)
 {
     if (isRangeRequest(pid)) {
         return supportedMask(frameIds(frame), pid);
@@ -48,10 +48,10 @@ std::optional<Bytes> frameItem(const Module& module, const FreezeFrame& frame, s
     if (frame.code == 0) {
         return std::nullopt;
     }
-    if (const auto value = frame.values.find(pid); value != frame.values.end()) {
+    if (auto const value = frame.values.find(pid); value != frame.values.end()) {
         return value->second;
     }
-    const bool kept = std::find(frame.pids.begin(), frame.pids.end(), pid) != frame.pids.end();
+    bool const kept = std::find(frame.pids.begin(), frame.pids.end(), pid) != frame.pids.end();
     return kept ? module.currentData(pid, frame.takenAt) : std::nullopt;
 }
 
@@ -67,13 +67,13 @@ std::optional<Bytes> missingFrameItem(std::uint8_t number, std::uint8_t pid)
 
 } // namespace
 
-Answer currentData(const ServiceCall& call)
+Answer currentData(ServiceCall const& call)
 {
     Bytes message = {call.positiveService()};
     const std::size_t count = call.onCan() ? pidsPerRequest : 1;
     for (std::size_t i = 1; i <= count && i < call.request.size(); ++i) {
         const std::uint8_t pid = call.request[i];
-        if (const auto data = currentItem(call, pid)) {
+        if (auto const data = currentItem(call, pid)) {
             message.push_back(pid);
             message.insert(message.end(), data->begin(), data->end());
         }
@@ -81,15 +81,15 @@ Answer currentData(const ServiceCall& call)
     return message.size() > 1 ? Answer{0, {message}} : Answer{};
 }
 
-Answer freezeFrame(const ServiceCall& call)
+Answer freezeFrame(ServiceCall const& call)
 {
-    const auto pid = call.at(1);
-    const auto number = call.at(2);
+    auto const pid = call.at(1);
+    auto const number = call.at(2);
     if (!pid || !number) {
         return {};
     }
-    const FreezeFrame* frame = findFrame(call.module.data(), *number);
-    const auto data = frame == nullptr ? missingFrameItem(*number, *pid) : frameItem(call.module, *frame, *pid);
+    FreezeFrame const* frame = findFrame(call.module.data(), *number);
+    auto const data = frame == nullptr ? missingFrameItem(*number, *pid) : frameItem(call.module, *frame, *pid);
     if (!data) {
         return {};
     }

@@ -27,14 +27,14 @@ constexpr Gear gears[] = {{18, 118}, {36, 68}, {56, 46}, {76, 35}, {400, 28.5}};
 
 double smoothStep(double from, double to, double x)
 {
-    const double part = std::clamp((x - from) / (to - from), 0.0, 1.0);
+    double const part = std::clamp((x - from) / (to - from), 0.0, 1.0);
     return part * part * (3 - 2 * part);
 }
 
 /// Part of the cruising speed that is driven at `t` seconds of the cycle.
 double speedPart(double t)
 {
-    const double ripple = t > cruiseAt && t < brakeAt ? 0.03 * std::sin((t - cruiseAt) * pi / 10) : 0;
+    double const ripple = t > cruiseAt && t < brakeAt ? 0.03 * std::sin((t - cruiseAt) * pi / 10) : 0;
     return smoothStep(accelerateAt, cruiseAt, t) - smoothStep(brakeAt, standAt, t) + ripple;
 }
 
@@ -52,8 +52,8 @@ double wayPart(double t)
 
 double gearRatio(double speedKmh)
 {
-    const auto gear =
-        std::find_if(std::begin(gears), std::end(gears), [speedKmh](const Gear& g) { return speedKmh <= g.upToKmh; });
+    auto const gear =
+        std::find_if(std::begin(gears), std::end(gears), [speedKmh](Gear const& g) { return speedKmh <= g.upToKmh; });
     return gear->rpmPerKmh;
 }
 
@@ -65,7 +65,7 @@ double warmUp(double start, double end, double seconds, double constant)
 
 } // namespace
 
-DriveModel::DriveModel(const EngineData& engine) : m_engine(engine) {}
+DriveModel::DriveModel(EngineData const& engine) : m_engine(engine) {}
 
 DriveState DriveModel::at(Time time) const
 {
@@ -82,19 +82,19 @@ DriveState DriveModel::at(Time time) const
 
 void DriveModel::addMotion(DriveState& state) const
 {
-    const double t = std::fmod(state.seconds, cycle);
-    const double cycles = std::floor(state.seconds / cycle);
-    const double top = m_engine.topSpeedKmh;
+    double const t = std::fmod(state.seconds, cycle);
+    double const cycles = std::floor(state.seconds / cycle);
+    double const top = m_engine.topSpeedKmh;
     state.speedKmh = std::max(0.0, top * speedPart(t));
     state.kilometres = top / 3600.0 * (cycles * wayPart(cycle) + wayPart(t));
     state.odometerKm = m_engine.startOdometerKm + state.kilometres;
 
-    const double wobble = 8 * std::sin(state.seconds * 2.1);
-    const double driven = state.speedKmh * gearRatio(state.speedKmh) * (m_engine.compression ? 0.75 : 1.0);
+    double const wobble = 8 * std::sin(state.seconds * 2.1);
+    double const driven = state.speedKmh * gearRatio(state.speedKmh) * (m_engine.compression ? 0.75 : 1.0);
     state.rpm = std::max(m_engine.idleRpm, driven) + wobble;
 
-    const double accelerationKmhPerS = top * (speedPart(t + 0.5) - speedPart(t));
-    const double cruiseLoad = 24 + state.speedKmh * 0.16;
+    double const accelerationKmhPerS = top * (speedPart(t + 0.5) - speedPart(t));
+    double const cruiseLoad = 24 + state.speedKmh * 0.16;
     state.loadPercent = std::clamp(cruiseLoad + accelerationKmhPerS * 12, 3.0, 92.0);
     state.pedalPercent = state.loadPercent > 25 ? std::min(100.0, (state.loadPercent - 22) * 0.9) : 0;
     state.throttlePercent = m_engine.compression ? 88 : 11 + state.pedalPercent * 0.72;
@@ -104,8 +104,8 @@ void DriveModel::addMotion(DriveState& state) const
 
 void DriveModel::addAir(DriveState& state) const
 {
-    const double vacuumKpa = 24 + state.loadPercent * 0.78;
-    const double boostKpa = 98 + state.loadPercent * (m_engine.compression ? 1.15 : 0.9);
+    double const vacuumKpa = 24 + state.loadPercent * 0.78;
+    double const boostKpa = 98 + state.loadPercent * (m_engine.compression ? 1.15 : 0.9);
     if (m_engine.boosted) {
         state.manifoldKpa = m_engine.compression || state.loadPercent > 70 ? boostKpa : vacuumKpa;
     } else {
@@ -114,7 +114,7 @@ void DriveModel::addAir(DriveState& state) const
     // Four-stroke: half the displacement is filled at each turn.
     constexpr double airGramsPerLitre = 1.19;
     constexpr double filling = 0.82;
-    const double litresPerSecond = m_engine.litres * state.rpm / 120.0;
+    double const litresPerSecond = m_engine.litres * state.rpm / 120.0;
     state.airGramsPerSecond = litresPerSecond * airGramsPerLitre * filling * state.manifoldKpa / 101.0;
     state.railKpa = m_engine.compression ? 28000 + state.loadPercent * 1250 : 380 + state.loadPercent * 0.4;
     state.egrPercent = std::clamp(45 - state.loadPercent * 0.6, 0.0, 40.0);
@@ -123,7 +123,7 @@ void DriveModel::addAir(DriveState& state) const
 
 void DriveModel::addTemperatures(DriveState& state) const
 {
-    const double s = state.seconds;
+    double const s = state.seconds;
     state.coolantCelsius = warmUp(m_engine.startCoolantCelsius, 91, s, 180) + 0.4 * std::sin(s / 20);
     state.oilCelsius = warmUp(m_engine.startCoolantCelsius - 6, 96, s, 320);
     state.intakeCelsius = m_engine.ambientCelsius + 14 - state.speedKmh * 0.06;
@@ -132,7 +132,7 @@ void DriveModel::addTemperatures(DriveState& state) const
 
 void DriveModel::addMixture(DriveState& state) const
 {
-    const double s = state.seconds;
+    double const s = state.seconds;
     state.closedLoop = state.coolantCelsius > 50;
     state.shortTrimPercent = 1.6 * std::sin(s * 1.3);
     state.longTrimPercent = 2.3;
@@ -142,8 +142,8 @@ void DriveModel::addMixture(DriveState& state) const
     state.lambda = m_engine.compression ? 4.2 - state.loadPercent * 0.031 : 1.0 + 0.012 * std::sin(s * 5);
 
     // Stoichiometric mixtures: 14.7 (petrol, 745 g/l) and 14.5 (diesel, 835 g/l).
-    const double mixture = (m_engine.compression ? 14.5 : 14.7) * state.lambda;
-    const double density = m_engine.compression ? 835.0 : 745.0;
+    double const mixture = (m_engine.compression ? 14.5 : 14.7) * state.lambda;
+    double const density = m_engine.compression ? 835.0 : 745.0;
     state.fuelLitresPerHour = state.airGramsPerSecond * 3600 / mixture / density;
     state.fuelLevelPercent = std::max(4.0, m_engine.startFuelPercent - state.kilometres * 0.12);
 }

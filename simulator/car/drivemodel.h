@@ -58,7 +58,7 @@ struct DriveState
 class DriveModel
 {
 public:
-    explicit DriveModel(const EngineData& engine);
+    explicit DriveModel(EngineData const& engine);
 
     DriveState at(Time time) const;
 

@@ -7,8 +7,8 @@ namespace obdsim {
 /// A vehicle file that the build has put into the library.
 struct EmbeddedVehicle
 {
-    const char* name;
-    const char* text;
+    char const* name;
+    char const* text;
 };
 
 /// All of them, by name; the source is made by embedvehicles.cmake.

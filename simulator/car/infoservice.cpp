@@ -16,7 +16,7 @@ struct Item
     Bytes data;
 };
 
-Bytes characters(const std::string& text)
+Bytes characters(std::string const& text)
 {
     return {text.begin(), text.end()};
 }
@@ -34,7 +34,7 @@ Bytes rightAligned(Bytes data, std::size_t size)
     return data;
 }
 
-Item numberItem(std::uint8_t id, const std::string& text, bool onCan)
+Item numberItem(std::uint8_t id, std::string const& text, bool onCan)
 {
     constexpr std::size_t onCanSize = 17;
     constexpr std::size_t onLinesSize = 20;
@@ -42,37 +42,37 @@ Item numberItem(std::uint8_t id, const std::string& text, bool onCan)
     return {id, 1, onCan ? data : rightAligned(data, onLinesSize)};
 }
 
-Item countersItem(std::uint8_t id, const std::vector<std::uint16_t>& counters)
+Item countersItem(std::uint8_t id, std::vector<std::uint16_t> const& counters)
 {
     Item item{id, static_cast<std::uint8_t>(counters.size()), {}};
-    for (const auto counter : counters) {
+    for (auto const counter : counters) {
         item.data.push_back(static_cast<std::uint8_t>(counter >> 8));
         item.data.push_back(static_cast<std::uint8_t>(counter & 0xFF));
     }
     return item;
 }
 
-Item calibrationsItem(const std::vector<std::string>& calibrations)
+Item calibrationsItem(std::vector<std::string> const& calibrations)
 {
     constexpr std::size_t size = 16;
     Item item{0x04, static_cast<std::uint8_t>(calibrations.size()), {}};
-    for (const auto& calibration : calibrations) {
+    for (auto const& calibration : calibrations) {
         const Bytes data = resized(characters(calibration), size);
         item.data.insert(item.data.end(), data.begin(), data.end());
     }
     return item;
 }
 
-Item verificationsItem(const std::vector<Bytes>& verifications)
+Item verificationsItem(std::vector<Bytes> const& verifications)
 {
     Item item{0x06, static_cast<std::uint8_t>(verifications.size()), {}};
-    for (const auto& verification : verifications) {
+    for (auto const& verification : verifications) {
         item.data.insert(item.data.end(), verification.begin(), verification.end());
     }
     return item;
 }
 
-std::vector<Item> itemsOf(const VehicleInfo& info, bool onCan)
+std::vector<Item> itemsOf(VehicleInfo const& info, bool onCan)
 {
     constexpr std::size_t nameSize = 20;
     std::vector<Item> items = {
@@ -85,28 +85,28 @@ std::vector<Item> itemsOf(const VehicleInfo& info, bool onCan)
         numberItem(0x0D, info.serial, onCan),
         numberItem(0x0F, info.typeApproval, onCan),
     };
-    const auto isEmpty = [](const Item& item) {
+    auto const isEmpty = [](Item const& item) {
         return std::all_of(item.data.begin(), item.data.end(), [](std::uint8_t byte) { return byte == 0; });
     };
     items.erase(std::remove_if(items.begin(), items.end(), isEmpty), items.end());
     return items;
 }
 
-std::size_t lineCount(const Item& item)
+std::size_t lineCount(Item const& item)
 {
     return (item.data.size() + lineData - 1) / lineData;
 }
 
 /// Off CAN the odd id before an item tells how many messages it takes.
-bool hasCountItem(const Item& item)
+bool hasCountItem(Item const& item)
 {
     return item.id <= 0x0A;
 }
 
-std::set<std::uint8_t> ids(const std::vector<Item>& items, bool onCan)
+std::set<std::uint8_t> ids(std::vector<Item> const& items, bool onCan)
 {
     std::set<std::uint8_t> result;
-    for (const auto& item : items) {
+    for (auto const& item : items) {
         result.insert(item.id);
         if (!onCan && hasCountItem(item)) {
             result.insert(static_cast<std::uint8_t>(item.id - 1));
@@ -115,7 +115,7 @@ std::set<std::uint8_t> ids(const std::vector<Item>& items, bool onCan)
     return result;
 }
 
-Answer tellItem(const ServiceCall& call, const Item& item)
+Answer tellItem(ServiceCall const& call, Item const& item)
 {
     const Bytes head = {call.positiveService(), item.id};
     if (call.onCan()) {
@@ -129,32 +129,32 @@ Answer tellItem(const ServiceCall& call, const Item& item)
     for (std::size_t line = 0; line < lineCount(item); ++line) {
         Bytes message = head;
         message.push_back(static_cast<std::uint8_t>(line + 1));
-        const auto from = data.begin() + static_cast<std::ptrdiff_t>(line * lineData);
+        auto const from = data.begin() + static_cast<std::ptrdiff_t>(line * lineData);
         message.insert(message.end(), from, from + static_cast<std::ptrdiff_t>(lineData));
         answer.messages.push_back(message);
     }
     return answer;
 }
 
-Answer tellLineCount(const ServiceCall& call, const Item& item)
+Answer tellLineCount(ServiceCall const& call, Item const& item)
 {
-    const auto service = call.positiveService();
+    auto const service = call.positiveService();
     return {0, {{service, static_cast<std::uint8_t>(item.id - 1), static_cast<std::uint8_t>(lineCount(item))}}};
 }
 
 } // namespace
 
-Answer vehicleInformation(const ServiceCall& call)
+Answer vehicleInformation(ServiceCall const& call)
 {
-    const auto id = call.at(1);
+    auto const id = call.at(1);
     if (!id) {
         return {};
     }
-    const auto items = itemsOf(call.module.data().info, call.onCan());
+    auto const items = itemsOf(call.module.data().info, call.onCan());
     if (isRangeRequest(*id)) {
         return tellRange(call, ids(items, call.onCan()));
     }
-    for (const auto& item : items) {
+    for (auto const& item : items) {
         if (item.id == *id) {
             return tellItem(call, item);
         }
@@ -165,7 +165,7 @@ Answer vehicleInformation(const ServiceCall& call)
     return {};
 }
 
-bool hasVehicleInformation(const ModuleData& data)
+bool hasVehicleInformation(ModuleData const& data)
 {
     return !itemsOf(data.info, true).empty();
 }

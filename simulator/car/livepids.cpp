@@ -10,8 +10,8 @@ namespace {
 
 struct Moment
 {
-    const DriveState& drive;
-    const SinceCleared& cleared;
+    DriveState const& drive;
+    SinceCleared const& cleared;
 };
 
 /// One field of a PID: its width in bytes and its raw number before rounding.
@@ -26,7 +26,7 @@ using Fields = std::vector<Field>;
 struct LiveRow
 {
     std::uint8_t pid;
-    Fields (*fields)(const Moment&);
+    Fields (*fields)(Moment const&);
 };
 
 Field percent(double value)
@@ -128,17 +128,17 @@ const LiveRow liveRows[] = { // in PID order; the formulas are those of SAE J197
 };
 // clang-format on
 
-const LiveRow* findLiveRow(std::uint8_t pid)
+LiveRow const* findLiveRow(std::uint8_t pid)
 {
-    const auto row =
-        std::find_if(std::begin(liveRows), std::end(liveRows), [pid](const LiveRow& r) { return r.pid == pid; });
+    auto const row =
+        std::find_if(std::begin(liveRows), std::end(liveRows), [pid](LiveRow const& r) { return r.pid == pid; });
     return row == std::end(liveRows) ? nullptr : &*row;
 }
 
-void append(Bytes& data, const Field& field)
+void append(Bytes& data, Field const& field)
 {
-    const double highest = std::pow(256.0, field.bytes) - 1;
-    const auto raw = static_cast<std::uint32_t>(std::clamp(std::round(field.raw), 0.0, highest));
+    double const highest = std::pow(256.0, field.bytes) - 1;
+    auto const raw = static_cast<std::uint32_t>(std::clamp(std::round(field.raw), 0.0, highest));
     for (int shift = 8 * (field.bytes - 1); shift >= 0; shift -= 8) {
         data.push_back(static_cast<std::uint8_t>(raw >> shift & 0xFF));
     }
@@ -151,14 +151,14 @@ bool isLivePid(std::uint8_t pid)
     return findLiveRow(pid) != nullptr;
 }
 
-std::optional<Bytes> livePid(std::uint8_t pid, const DriveState& drive, const SinceCleared& cleared)
+std::optional<Bytes> livePid(std::uint8_t pid, DriveState const& drive, SinceCleared const& cleared)
 {
-    const LiveRow* row = findLiveRow(pid);
+    LiveRow const* row = findLiveRow(pid);
     if (row == nullptr) {
         return std::nullopt;
     }
     Bytes data;
-    for (const Field& field : row->fields({drive, cleared})) {
+    for (Field const& field : row->fields({drive, cleared})) {
         append(data, field);
     }
     return data;

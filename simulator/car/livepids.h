@@ -20,6 +20,6 @@ bool isLivePid(std::uint8_t pid);
 
 /// Data bytes of a mode 01 PID by SAE J1979; values beyond the range of the PID
 /// are cut to it. Nothing for a PID that the model does not feed.
-std::optional<Bytes> livePid(std::uint8_t pid, const DriveState& drive, const SinceCleared& cleared);
+std::optional<Bytes> livePid(std::uint8_t pid, DriveState const& drive, SinceCleared const& cleared);
 
 } // namespace obdsim

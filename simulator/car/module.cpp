@@ -18,7 +18,7 @@ void setAllIncomplete(MonitorBits& bits)
 
 } // namespace
 
-Module::Module(ModuleData data, const EngineData& engine, DataLayout layout)
+Module::Module(ModuleData data, EngineData const& engine, DataLayout layout)
     : m_data(std::move(data)), m_drive(engine), m_layout(layout)
 {
     if (engine.compression && m_data.monitors) {
@@ -27,9 +27,9 @@ Module::Module(ModuleData data, const EngineData& engine, DataLayout layout)
     }
 }
 
-Answer Module::answer(const Bytes& request, Time now)
+Answer Module::answer(Bytes const& request, Time now)
 {
-    if (const auto recorded = m_data.raw.find(request); recorded != m_data.raw.end()) {
+    if (auto const recorded = m_data.raw.find(request); recorded != m_data.raw.end()) {
         return {0, recorded->second};
     }
     Answer result = fromServices(request, now);
@@ -43,14 +43,14 @@ Answer Module::answer(const Bytes& request, Time now)
     return result;
 }
 
-Answer Module::fromServices(const Bytes& request, Time now)
+Answer Module::fromServices(Bytes const& request, Time now)
 {
-    const Service* service = findService(request[0]);
-    const bool has = service != nullptr && service->present(m_data);
+    Service const* service = findService(request[0]);
+    bool const has = service != nullptr && service->present(m_data);
     return has ? service->answer({*this, request, now}) : Answer{};
 }
 
-const ModuleData& Module::data() const
+ModuleData const& Module::data() const
 {
     return m_data;
 }
@@ -65,10 +65,10 @@ std::optional<Bytes> Module::currentData(std::uint8_t pid, Time now) const
     if (m_data.monitors && (pid == monitorsSinceCleared || pid == monitorsThisCycle)) {
         return monitorWord(pid == monitorsThisCycle);
     }
-    if (const auto fixed = m_data.fixed.find(pid); fixed != m_data.fixed.end()) {
+    if (auto const fixed = m_data.fixed.find(pid); fixed != m_data.fixed.end()) {
         return fixed->second;
     }
-    for (const auto live : m_data.live) {
+    for (auto const live : m_data.live) {
         if (live == pid) {
             const DriveState drive = m_drive.at(now);
             return livePid(pid, drive, sinceCleared(drive));
@@ -80,7 +80,7 @@ std::optional<Bytes> Module::currentData(std::uint8_t pid, Time now) const
 std::vector<std::uint8_t> Module::currentPids() const
 {
     std::vector<std::uint8_t> pids = m_data.live;
-    for (const auto& [pid, data] : m_data.fixed) {
+    for (auto const& [pid, data] : m_data.fixed) {
         pids.push_back(pid);
     }
     if (m_data.monitors) {
@@ -117,15 +117,15 @@ void Module::clear(Time now)
 
 Bytes Module::monitorWord(bool thisCycle) const
 {
-    const MonitorBits& bits = thisCycle ? m_data.monitors->thisCycle : m_data.monitors->sinceCleared;
+    MonitorBits const& bits = thisCycle ? m_data.monitors->thisCycle : m_data.monitors->sinceCleared;
     // Byte A of the driving cycle's word is reserved.
-    const auto lampAndCount = static_cast<std::uint8_t>((m_data.lamp ? 0x80U : 0U) | (m_data.stored.size() & 0x7FU));
+    auto const lampAndCount = static_cast<std::uint8_t>((m_data.lamp ? 0x80U : 0U) | (m_data.stored.size() & 0x7FU));
     return {thisCycle ? std::uint8_t{0} : lampAndCount,
             static_cast<std::uint8_t>(bits.continuous | bits.continuousIncomplete << 4), bits.once,
             bits.onceIncomplete};
 }
 
-SinceCleared Module::sinceCleared(const DriveState& drive) const
+SinceCleared Module::sinceCleared(DriveState const& drive) const
 {
     SinceCleared result;
     result.seconds = drive.seconds;

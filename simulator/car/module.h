@@ -27,12 +27,12 @@ struct Answer
 class Module
 {
 public:
-    Module(ModuleData data, const EngineData& engine, DataLayout layout);
+    Module(ModuleData data, EngineData const& engine, DataLayout layout);
 
     /// The answer to `request` (service byte first) at `now`.
-    Answer answer(const Bytes& request, Time now);
+    Answer answer(Bytes const& request, Time now);
 
-    const ModuleData& data() const;
+    ModuleData const& data() const;
     DataLayout layout() const;
 
     /// Data bytes of a mode 01 PID; nothing if the module does not have it.
@@ -50,9 +50,9 @@ public:
     void clear(Time now);
 
 private:
-    Answer fromServices(const Bytes& request, Time now);
+    Answer fromServices(Bytes const& request, Time now);
     Bytes monitorWord(bool thisCycle) const;
-    SinceCleared sinceCleared(const DriveState& drive) const;
+    SinceCleared sinceCleared(DriveState const& drive) const;
 
     ModuleData m_data;
     DriveModel m_drive;

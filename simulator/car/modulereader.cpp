@@ -12,9 +12,9 @@ namespace {
 constexpr int largestWord = 0xFFFF;
 constexpr int longestDelayMs = 60000;
 
-std::uint16_t readCode(TableReader& table, std::string_view key, const std::string& text)
+std::uint16_t readCode(TableReader& table, std::string_view key, std::string const& text)
 {
-    const auto code = parseCode(text);
+    auto const code = parseCode(text);
     if (!code) {
         table.fail(key, "\"" + text + "\" is no trouble code such as P0133");
     }
@@ -24,7 +24,7 @@ std::uint16_t readCode(TableReader& table, std::string_view key, const std::stri
 std::vector<std::uint16_t> readCodes(TableReader& table, std::string_view key)
 {
     std::vector<std::uint16_t> codes;
-    for (const auto& text : table.texts(key)) {
+    for (auto const& text : table.texts(key)) {
         codes.push_back(readCode(table, key, text));
     }
     return codes;
@@ -32,7 +32,7 @@ std::vector<std::uint16_t> readCodes(TableReader& table, std::string_view key)
 
 void readMonitorNames(TableReader& table, std::string_view key, bool compression, bool incomplete, MonitorBits& bits)
 {
-    for (const auto& name : table.texts(key)) {
+    for (auto const& name : table.texts(key)) {
         if (!markMonitor(name, compression, incomplete, bits)) {
             table.fail(key, "\"" + name + "\" is no monitor of this kind of engine");
         }
@@ -53,7 +53,7 @@ Monitors readMonitors(TableReader& table, bool compression)
 std::map<std::uint8_t, Bytes> readByteRows(TableReader& table)
 {
     std::map<std::uint8_t, Bytes> rows;
-    table.entries([&](const Bytes& key, const std::vector<Bytes>& values) {
+    table.entries([&](Bytes const& key, std::vector<Bytes> const& values) {
         if (key.size() != 1 || values.size() != 1) {
             table.fail(hexText(key), "a row is one byte and its data");
         }
@@ -80,16 +80,16 @@ MonitorTest readMonitorTest(TableReader& table, bool onCan)
     test.test = table.byte(onCan ? "test" : "component");
     test.scaling = onCan ? table.byte("scaling") : std::uint8_t{0};
     using Keys = std::vector<std::string_view>;
-    for (const auto key : onCan ? Keys{"value", "minimum", "maximum"} : Keys{"value", "limit"}) {
+    for (auto const key : onCan ? Keys{"value", "minimum", "maximum"} : Keys{"value", "limit"}) {
         test.words.push_back(static_cast<std::uint16_t>(table.integer(key, 0, largestWord)));
     }
     return test;
 }
 
-Bytes readVerification(TableReader& table, const std::string& text)
+Bytes readVerification(TableReader& table, std::string const& text)
 {
     constexpr std::size_t size = 4;
-    const auto value = parseHex(text);
+    auto const value = parseHex(text);
     if (!value || value->size() != size) {
         table.fail("verifications", "a calibration verification number is four bytes");
     }
@@ -97,7 +97,7 @@ Bytes readVerification(TableReader& table, const std::string& text)
 }
 
 /// "ECM-EngineControl": the acronym fills four bytes, the dash is the fifth.
-std::string layOutName(const std::string& text)
+std::string layOutName(std::string const& text)
 {
     constexpr std::size_t acronymSize = 4;
     std::string acronym = text.substr(0, text.find('-'));
@@ -106,7 +106,7 @@ std::string layOutName(const std::string& text)
     return acronym + rest;
 }
 
-void checkLength(TableReader& table, std::string_view key, const std::string& text, std::size_t most)
+void checkLength(TableReader& table, std::string_view key, std::string const& text, std::size_t most)
 {
     if (text.size() > most) {
         table.fail(key, "\"" + std::string(key) + "\" is longer than " + std::to_string(most) + " characters");
@@ -124,7 +124,7 @@ VehicleInfo readInfo(TableReader& table)
     info.typeApproval = table.text("type_approval", "");
     info.ecuName = layOutName(table.text("ecu_name", ""));
     info.calibrations = table.texts("calibrations");
-    for (const auto& text : table.texts("verifications")) {
+    for (auto const& text : table.texts("verifications")) {
         info.verifications.push_back(readVerification(table, text));
     }
     info.sparkCounters = table.words("spark_counters");
@@ -133,7 +133,7 @@ VehicleInfo readInfo(TableReader& table)
     checkLength(table, "serial", info.serial, numberSize);
     checkLength(table, "type_approval", info.typeApproval, numberSize);
     checkLength(table, "ecu_name", info.ecuName, nameSize);
-    for (const auto& calibration : info.calibrations) {
+    for (auto const& calibration : info.calibrations) {
         checkLength(table, "calibrations", calibration, calibrationSize);
     }
     return info;
@@ -147,7 +147,7 @@ Routine readRoutine(TableReader& table)
 std::vector<std::uint8_t> readLive(TableReader& table)
 {
     Bytes pids = table.bytes("live");
-    for (const auto pid : pids) {
+    for (auto const pid : pids) {
         if (!isLivePid(pid)) {
             table.fail("live", "the drive model has no PID " + hexByte(pid));
         }
@@ -197,10 +197,10 @@ void readRecordedOf(ModuleData& module, TableReader& table)
     });
 }
 
-std::uint32_t readId(TableReader& table, const Protocol& protocol)
+std::uint32_t readId(TableReader& table, Protocol const& protocol)
 {
     const std::string text = table.text("id");
-    const auto id = parseHexNumber(text);
+    auto const id = parseHexNumber(text);
     const std::size_t digits = protocol.family == BusFamily::Can11 ? 3 : protocol.family == BusFamily::Can29 ? 8 : 2;
     if (!id || text.size() != digits) {
         table.fail("id", "\"id\" must have " + std::to_string(digits) + " hexadecimal digits on this bus");
@@ -210,9 +210,9 @@ std::uint32_t readId(TableReader& table, const Protocol& protocol)
 
 } // namespace
 
-ModuleData readModule(TableReader& table, const VehicleData& vehicle)
+ModuleData readModule(TableReader& table, VehicleData const& vehicle)
 {
-    const Protocol& protocol = *findProtocol(vehicle.protocol);
+    Protocol const& protocol = *findProtocol(vehicle.protocol);
     ModuleData module;
     module.id = readId(table, protocol);
     module.latency = Time(table.integer("latency", 0, longestDelayMs, static_cast<int>(module.latency.count())));

@@ -7,6 +7,6 @@ namespace obdsim {
 
 /// Reads one [[module]] of a vehicle whose protocol and engine are known already.
 /// Throws VehicleFileError.
-ModuleData readModule(TableReader& table, const VehicleData& vehicle);
+ModuleData readModule(TableReader& table, VehicleData const& vehicle);
 
 } // namespace obdsim

@@ -16,7 +16,7 @@ enum class Engine : int
 
 struct MonitorName
 {
-    const char* name;
+    char const* name;
     Engine engine;
     bool continuous; ///< byte B; else bytes C and D
     std::uint8_t bit;
@@ -45,10 +45,10 @@ constexpr MonitorName monitorNames[] = {
 
 } // namespace
 
-bool markMonitor(const std::string& name, bool compression, bool incomplete, MonitorBits& bits)
+bool markMonitor(std::string const& name, bool compression, bool incomplete, MonitorBits& bits)
 {
     const Engine engine = compression ? Engine::Compression : Engine::Spark;
-    const auto row = std::find_if(std::begin(monitorNames), std::end(monitorNames), [&](const MonitorName& m) {
+    auto const row = std::find_if(std::begin(monitorNames), std::end(monitorNames), [&](MonitorName const& m) {
         return m.name == name && (m.engine == Engine::Any || m.engine == engine);
     });
     if (row == std::end(monitorNames)) {
@@ -60,12 +60,12 @@ bool markMonitor(const std::string& name, bool compression, bool incomplete, Mon
     return true;
 }
 
-std::optional<std::uint16_t> parseCode(const std::string& text)
+std::optional<std::uint16_t> parseCode(std::string const& text)
 {
     constexpr std::size_t codeSize = 5;
     const std::string systems = "PCBU";
-    const auto system = text.size() == codeSize ? systems.find(text[0]) : std::string::npos;
-    const auto number = parseHexNumber(std::string_view(text).substr(std::min<std::size_t>(1, text.size())));
+    auto const system = text.size() == codeSize ? systems.find(text[0]) : std::string::npos;
+    auto const number = parseHexNumber(std::string_view(text).substr(std::min<std::size_t>(1, text.size())));
     if (system == std::string::npos || !number || *number > 0x3FFF) {
         return std::nullopt;
     }

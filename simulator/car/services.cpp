@@ -10,16 +10,16 @@ namespace {
 constexpr std::size_t range = 0x20;
 
 const Service services[] = {
-    {0x01, currentData, [](const ModuleData& d) { return !d.live.empty() || !d.fixed.empty() || d.monitors; }},
-    {0x02, freezeFrame, [](const ModuleData& d) { return d.hasStored; }},
-    {0x03, storedCodes, [](const ModuleData& d) { return d.hasStored; }},
-    {0x04, clearCodes, [](const ModuleData& d) { return d.hasStored; }},
-    {0x05, sensorTests, [](const ModuleData& d) { return !d.sensorTests.empty(); }},
-    {0x06, monitorTests, [](const ModuleData& d) { return !d.monitorTests.empty(); }},
-    {0x07, pendingCodes, [](const ModuleData& d) { return d.hasPending; }},
-    {0x08, runRoutine, [](const ModuleData& d) { return !d.routines.empty(); }},
+    {0x01, currentData, [](ModuleData const& d) { return !d.live.empty() || !d.fixed.empty() || d.monitors; }},
+    {0x02, freezeFrame, [](ModuleData const& d) { return d.hasStored; }},
+    {0x03, storedCodes, [](ModuleData const& d) { return d.hasStored; }},
+    {0x04, clearCodes, [](ModuleData const& d) { return d.hasStored; }},
+    {0x05, sensorTests, [](ModuleData const& d) { return !d.sensorTests.empty(); }},
+    {0x06, monitorTests, [](ModuleData const& d) { return !d.monitorTests.empty(); }},
+    {0x07, pendingCodes, [](ModuleData const& d) { return d.hasPending; }},
+    {0x08, runRoutine, [](ModuleData const& d) { return !d.routines.empty(); }},
     {0x09, vehicleInformation, hasVehicleInformation},
-    {0x0A, permanentCodes, [](const ModuleData& d) { return d.hasPermanent; }},
+    {0x0A, permanentCodes, [](ModuleData const& d) { return d.hasPermanent; }},
 };
 
 } // namespace
@@ -37,26 +37,26 @@ std::optional<std::uint8_t> ServiceCall::at(std::size_t index) const
     return request[index];
 }
 
-const Service* findService(std::uint8_t id)
+Service const* findService(std::uint8_t id)
 {
-    const auto row =
-        std::find_if(std::begin(services), std::end(services), [id](const Service& s) { return s.id == id; });
+    auto const row =
+        std::find_if(std::begin(services), std::end(services), [id](Service const& s) { return s.id == id; });
     return row == std::end(services) ? nullptr : &*row;
 }
 
-bool hasService(const Module& module, std::uint8_t id)
+bool hasService(Module const& module, std::uint8_t id)
 {
-    const Service* service = findService(id);
+    Service const* service = findService(id);
     return service != nullptr && service->present(module.data());
 }
 
-std::optional<Bytes> supportedMask(const std::set<std::uint8_t>& ids, std::uint8_t base)
+std::optional<Bytes> supportedMask(std::set<std::uint8_t> const& ids, std::uint8_t base)
 {
     if (base != 0 && ids.upper_bound(base) == ids.end()) {
         return std::nullopt;
     }
     Bytes mask(4, 0);
-    for (const auto id : ids) {
+    for (auto const id : ids) {
         if (id <= base) {
             continue;
         }
@@ -80,15 +80,15 @@ std::optional<std::uint8_t> rangeFiller(std::uint8_t service)
     }
 }
 
-Answer tellRange(const ServiceCall& call, const std::set<std::uint8_t>& ids)
+Answer tellRange(ServiceCall const& call, std::set<std::uint8_t> const& ids)
 {
     const std::uint8_t base = call.request[1];
-    const auto mask = ids.empty() ? std::nullopt : supportedMask(ids, base);
+    auto const mask = ids.empty() ? std::nullopt : supportedMask(ids, base);
     if (!mask) {
         return {};
     }
     Bytes message = {call.positiveService(), base};
-    const auto filler = rangeFiller(call.request[0]);
+    auto const filler = rangeFiller(call.request[0]);
     if (filler && !call.onCan()) {
         message.push_back(*filler);
     }
@@ -96,13 +96,13 @@ Answer tellRange(const ServiceCall& call, const std::set<std::uint8_t>& ids)
     return {0, {message}};
 }
 
-Answer recordedRange(const ServiceCall& call)
+Answer recordedRange(ServiceCall const& call)
 {
     if (call.request.size() < 2 || !isRangeRequest(call.request[1])) {
         return {};
     }
     std::set<std::uint8_t> ids;
-    for (const auto& [request, messages] : call.module.data().raw) {
+    for (auto const& [request, messages] : call.module.data().raw) {
         if (request.size() == 2 && request[0] == call.request[0]) {
             ids.insert(request[1]);
         }

@@ -18,7 +18,7 @@ constexpr std::uint8_t pending = 0x78;
 struct ServiceCall
 {
     Module& module;
-    const Bytes& request; ///< service byte first, never empty
+    Bytes const& request; ///< service byte first, never empty
     Time now;
 
     bool onCan() const;
@@ -34,45 +34,45 @@ struct ServiceCall
 struct Service
 {
     std::uint8_t id;
-    Answer (*answer)(const ServiceCall& call);
-    bool (*present)(const ModuleData& data); ///< the module has anything to tell there
+    Answer (*answer)(ServiceCall const& call);
+    bool (*present)(ModuleData const& data); ///< the module has anything to tell there
 };
 
 /// Null for a number that is no service.
-const Service* findService(std::uint8_t id);
+Service const* findService(std::uint8_t id);
 
-bool hasService(const Module& module, std::uint8_t id);
+bool hasService(Module const& module, std::uint8_t id);
 
 /// The four bytes that tell which of base + 1 to base + 32 are in `ids`; the last
 /// bit also stands for anything beyond. Nothing if there is nothing above a base
 /// other than 0: such a range is not answered.
-std::optional<Bytes> supportedMask(const std::set<std::uint8_t>& ids, std::uint8_t base);
+std::optional<Bytes> supportedMask(std::set<std::uint8_t> const& ids, std::uint8_t base);
 
 /// The byte that stands before the mask on the buses without CAN; services 01, 02
 /// and 05 have none.
 std::optional<std::uint8_t> rangeFiller(std::uint8_t service);
 
 /// The answer to a request for a range. Silent if `ids` has nothing to tell there.
-Answer tellRange(const ServiceCall& call, const std::set<std::uint8_t>& ids);
+Answer tellRange(ServiceCall const& call, std::set<std::uint8_t> const& ids);
 
 /// The same for a module with recorded answers, of which that to the request was
 /// not recorded: from the ids of those that were.
-Answer recordedRange(const ServiceCall& call);
+Answer recordedRange(ServiceCall const& call);
 
 /// True for 00, 20, 40, ... E0: the ids that ask for a range.
 bool isRangeRequest(std::uint8_t id);
 
 // The services, in files of their own; see the table in services.cpp.
-Answer currentData(const ServiceCall& call);
-Answer freezeFrame(const ServiceCall& call);
-Answer storedCodes(const ServiceCall& call);
-Answer clearCodes(const ServiceCall& call);
-Answer sensorTests(const ServiceCall& call);
-Answer monitorTests(const ServiceCall& call);
-Answer pendingCodes(const ServiceCall& call);
-Answer runRoutine(const ServiceCall& call);
-Answer vehicleInformation(const ServiceCall& call);
-Answer permanentCodes(const ServiceCall& call);
-bool hasVehicleInformation(const ModuleData& data);
+Answer currentData(ServiceCall const& call);
+Answer freezeFrame(ServiceCall const& call);
+Answer storedCodes(ServiceCall const& call);
+Answer clearCodes(ServiceCall const& call);
+Answer sensorTests(ServiceCall const& call);
+Answer monitorTests(ServiceCall const& call);
+Answer pendingCodes(ServiceCall const& call);
+Answer runRoutine(ServiceCall const& call);
+Answer vehicleInformation(ServiceCall const& call);
+Answer permanentCodes(ServiceCall const& call);
+bool hasVehicleInformation(ModuleData const& data);
 
 } // namespace obdsim

@@ -6,7 +6,7 @@ namespace obdsim {
 
 namespace {
 
-std::string place(const std::string& origin, const toml::source_region& source)
+std::string place(std::string const& origin, toml::source_region const& source)
 {
     return origin + ":" + std::to_string(source.begin.line) + ": ";
 }
@@ -18,7 +18,7 @@ std::string quoted(std::string_view text)
 
 } // namespace
 
-TableReader::TableReader(const toml::table& table, std::string origin, std::string title)
+TableReader::TableReader(toml::table const& table, std::string origin, std::string title)
     : m_table(table), m_origin(std::move(origin)), m_title(std::move(title))
 {}
 
@@ -32,15 +32,15 @@ std::string TableReader::text(std::string_view key)
     return string(need(key), key);
 }
 
-std::string TableReader::text(std::string_view key, const std::string& otherwise)
+std::string TableReader::text(std::string_view key, std::string const& otherwise)
 {
-    const toml::node* node = find(key);
+    toml::node const* node = find(key);
     return node == nullptr ? otherwise : string(*node, key);
 }
 
 bool TableReader::flag(std::string_view key, bool otherwise)
 {
-    const toml::node* node = find(key);
+    toml::node const* node = find(key);
     if (node == nullptr) {
         return otherwise;
     }
@@ -52,11 +52,11 @@ bool TableReader::flag(std::string_view key, bool otherwise)
 
 double TableReader::number(std::string_view key, double otherwise)
 {
-    const toml::node* node = find(key);
+    toml::node const* node = find(key);
     if (node == nullptr) {
         return otherwise;
     }
-    const auto value = node->value<double>();
+    auto const value = node->value<double>();
     if (!value) {
         failAt(*node, quoted(key) + " must be a number");
     }
@@ -65,8 +65,8 @@ double TableReader::number(std::string_view key, double otherwise)
 
 int TableReader::integer(std::string_view key, int lowest, int highest)
 {
-    const toml::node& node = need(key);
-    const auto value = node.is_integer() ? node.value<std::int64_t>() : std::nullopt;
+    toml::node const& node = need(key);
+    auto const value = node.is_integer() ? node.value<std::int64_t>() : std::nullopt;
     if (!value || *value < lowest || *value > highest) {
         failAt(node, quoted(key) + " must be a whole number from " + std::to_string(lowest) + " to " +
                          std::to_string(highest));
@@ -81,13 +81,13 @@ int TableReader::integer(std::string_view key, int lowest, int highest, int othe
 
 Bytes TableReader::bytes(std::string_view key)
 {
-    const toml::node* node = find(key);
+    toml::node const* node = find(key);
     return node == nullptr ? Bytes{} : hex(*node);
 }
 
 std::uint8_t TableReader::byte(std::string_view key)
 {
-    const toml::node& node = need(key);
+    toml::node const& node = need(key);
     const Bytes value = hex(node);
     if (value.size() != 1) {
         failAt(node, quoted(key) + " must be one byte of two hexadecimal digits");
@@ -98,15 +98,15 @@ std::uint8_t TableReader::byte(std::string_view key)
 std::vector<std::string> TableReader::texts(std::string_view key)
 {
     std::vector<std::string> result;
-    const toml::node* node = find(key);
+    toml::node const* node = find(key);
     if (node == nullptr) {
         return result;
     }
-    const toml::array* array = node->as_array();
+    toml::array const* array = node->as_array();
     if (array == nullptr) {
         failAt(*node, quoted(key) + " must be an array of texts");
     }
-    for (const auto& element : *array) {
+    for (auto const& element : *array) {
         result.push_back(string(element, key));
     }
     return result;
@@ -115,16 +115,16 @@ std::vector<std::string> TableReader::texts(std::string_view key)
 std::vector<std::uint16_t> TableReader::words(std::string_view key)
 {
     std::vector<std::uint16_t> result;
-    const toml::node* node = find(key);
+    toml::node const* node = find(key);
     if (node == nullptr) {
         return result;
     }
-    const toml::array* array = node->as_array();
+    toml::array const* array = node->as_array();
     if (array == nullptr) {
         failAt(*node, quoted(key) + " must be an array of numbers");
     }
-    for (const auto& element : *array) {
-        const auto value = element.is_integer() ? element.value<std::int64_t>() : std::nullopt;
+    for (auto const& element : *array) {
+        auto const value = element.is_integer() ? element.value<std::int64_t>() : std::nullopt;
         if (!value || *value < 0 || *value > 0xFFFF) {
             failAt(element, quoted(key) + " must hold whole numbers from 0 to 65535");
         }
@@ -133,9 +133,9 @@ std::vector<std::uint16_t> TableReader::words(std::string_view key)
     return result;
 }
 
-void TableReader::table(std::string_view key, const std::function<void(TableReader&)>& read)
+void TableReader::table(std::string_view key, std::function<void(TableReader&)> const& read)
 {
-    const toml::node* node = find(key);
+    toml::node const* node = find(key);
     if (node == nullptr) {
         return;
     }
@@ -147,16 +147,16 @@ void TableReader::table(std::string_view key, const std::function<void(TableRead
     reader.finish();
 }
 
-void TableReader::tables(std::string_view key, const std::function<void(TableReader&)>& read)
+void TableReader::tables(std::string_view key, std::function<void(TableReader&)> const& read)
 {
-    const toml::node* node = find(key);
+    toml::node const* node = find(key);
     if (node == nullptr) {
         return;
     }
     if (!node->is_array()) {
         failAt(*node, quoted(key) + " must be an array of tables");
     }
-    for (const auto& element : *node->as_array()) {
+    for (auto const& element : *node->as_array()) {
         if (!element.is_table()) {
             failAt(element, quoted(key) + " must be an array of tables");
         }
@@ -166,12 +166,12 @@ void TableReader::tables(std::string_view key, const std::function<void(TableRea
     }
 }
 
-void TableReader::entries(const std::function<void(const Bytes&, const std::vector<Bytes>&)>& read)
+void TableReader::entries(std::function<void(const Bytes&, const std::vector<Bytes>&)> const& read)
 {
-    for (const auto& [key, node] : m_table) {
+    for (auto const& [key, node] : m_table) {
         std::vector<Bytes> values;
-        if (const toml::array* array = node.as_array()) {
-            for (const auto& element : *array) {
+        if (toml::array const* array = node.as_array()) {
+            for (auto const& element : *array) {
                 values.push_back(hex(element));
             }
         } else {
@@ -181,9 +181,9 @@ void TableReader::entries(const std::function<void(const Bytes&, const std::vect
     }
 }
 
-void TableReader::tableEntries(const std::function<void(const Bytes&, TableReader&)>& read)
+void TableReader::tableEntries(std::function<void(const Bytes&, TableReader&)> const& read)
 {
-    for (const auto& [key, node] : m_table) {
+    for (auto const& [key, node] : m_table) {
         if (!node.is_table()) {
             failAt(node, quoted(key.str()) + " must be a table");
         }
@@ -195,7 +195,7 @@ void TableReader::tableEntries(const std::function<void(const Bytes&, TableReade
 
 void TableReader::finish()
 {
-    for (const auto& [key, node] : m_table) {
+    for (auto const& [key, node] : m_table) {
         if (!m_known.contains(key.str())) {
             throw VehicleFileError(place(m_origin, key.source()) + "unknown key " + quoted(key.str()) + " in " +
                                    m_title);
@@ -203,31 +203,31 @@ void TableReader::finish()
     }
 }
 
-void TableReader::fail(std::string_view key, const std::string& what) const
+void TableReader::fail(std::string_view key, std::string const& what) const
 {
-    const toml::node* node = m_table.get(key);
+    toml::node const* node = m_table.get(key);
     failAt(node == nullptr ? m_table : *node, what);
 }
 
-const toml::node* TableReader::find(std::string_view key)
+toml::node const* TableReader::find(std::string_view key)
 {
     m_known.emplace(key);
     return m_table.get(key);
 }
 
-const toml::node& TableReader::need(std::string_view key)
+toml::node const& TableReader::need(std::string_view key)
 {
-    const toml::node* node = find(key);
+    toml::node const* node = find(key);
     if (node == nullptr) {
         failAt(m_table, m_title + " needs " + quoted(key));
     }
     return *node;
 }
 
-Bytes TableReader::keyBytes(const toml::key& key)
+Bytes TableReader::keyBytes(toml::key const& key)
 {
     m_known.emplace(key.str());
-    const auto value = parseHex(key.str());
+    auto const value = parseHex(key.str());
     if (!value || value->empty()) {
         throw VehicleFileError(place(m_origin, key.source()) + "the key " + quoted(key.str()) +
                                " must be bytes in hexadecimal digits");
@@ -235,16 +235,16 @@ Bytes TableReader::keyBytes(const toml::key& key)
     return *value;
 }
 
-Bytes TableReader::hex(const toml::node& node) const
+Bytes TableReader::hex(toml::node const& node) const
 {
-    const auto value = node.is_string() ? parseHex(node.ref<std::string>()) : std::nullopt;
+    auto const value = node.is_string() ? parseHex(node.ref<std::string>()) : std::nullopt;
     if (!value) {
         failAt(node, "bytes must be a text of pairs of hexadecimal digits");
     }
     return *value;
 }
 
-std::string TableReader::string(const toml::node& node, std::string_view key) const
+std::string TableReader::string(toml::node const& node, std::string_view key) const
 {
     if (!node.is_string()) {
         failAt(node, quoted(key) + " must be a text");
@@ -252,7 +252,7 @@ std::string TableReader::string(const toml::node& node, std::string_view key) co
     return node.ref<std::string>();
 }
 
-void TableReader::failAt(const toml::node& node, const std::string& what) const
+void TableReader::failAt(toml::node const& node, std::string const& what) const
 {
     throw VehicleFileError(place(m_origin, node.source()) + what);
 }

@@ -16,12 +16,12 @@ namespace obdsim {
 class TableReader
 {
 public:
-    TableReader(const toml::table& table, std::string origin, std::string title);
+    TableReader(toml::table const& table, std::string origin, std::string title);
 
     bool has(std::string_view key);
 
     std::string text(std::string_view key);
-    std::string text(std::string_view key, const std::string& otherwise);
+    std::string text(std::string_view key, std::string const& otherwise);
     bool flag(std::string_view key, bool otherwise);
     double number(std::string_view key, double otherwise);
     int integer(std::string_view key, int lowest, int highest);
@@ -37,31 +37,31 @@ public:
     std::vector<std::uint16_t> words(std::string_view key);
 
     /// Calls `read` with the table at `key`, if it is there, and then finishes it.
-    void table(std::string_view key, const std::function<void(TableReader&)>& read);
+    void table(std::string_view key, std::function<void(TableReader&)> const& read);
 
     /// The same for each table of an array.
-    void tables(std::string_view key, const std::function<void(TableReader&)>& read);
+    void tables(std::string_view key, std::function<void(TableReader&)> const& read);
 
     /// For tables whose keys are hexadecimal bytes: each key with its value,
     /// which is one text or an array of texts.
-    void entries(const std::function<void(const Bytes& key, const std::vector<Bytes>& values)>& read);
+    void entries(std::function<void(const Bytes& key, const std::vector<Bytes>& values)> const& read);
 
     /// The same for keys with a table behind each.
-    void tableEntries(const std::function<void(const Bytes& key, TableReader& value)>& read);
+    void tableEntries(std::function<void(const Bytes& key, TableReader& value)> const& read);
 
     void finish();
 
-    [[noreturn]] void fail(std::string_view key, const std::string& what) const;
+    [[noreturn]] void fail(std::string_view key, std::string const& what) const;
 
 private:
-    const toml::node* find(std::string_view key);
-    const toml::node& need(std::string_view key);
-    Bytes keyBytes(const toml::key& key);
-    Bytes hex(const toml::node& node) const;
-    std::string string(const toml::node& node, std::string_view key) const;
-    [[noreturn]] void failAt(const toml::node& node, const std::string& what) const;
+    toml::node const* find(std::string_view key);
+    toml::node const& need(std::string_view key);
+    Bytes keyBytes(toml::key const& key);
+    Bytes hex(toml::node const& node) const;
+    std::string string(toml::node const& node, std::string_view key) const;
+    [[noreturn]] void failAt(toml::node const& node, std::string const& what) const;
 
-    const toml::table& m_table;
+    toml::table const& m_table;
     std::string m_origin;
     std::string m_title;
     std::set<std::string, std::less<>> m_known;

@@ -6,33 +6,33 @@ namespace {
 
 constexpr std::size_t routineData = 5;
 
-Bytes head(const ServiceCall& call, std::uint8_t id)
+Bytes head(ServiceCall const& call, std::uint8_t id)
 {
     return {call.positiveService(), id};
 }
 
-void append(Bytes& message, const Bytes& data)
+void append(Bytes& message, Bytes const& data)
 {
     message.insert(message.end(), data.begin(), data.end());
 }
 
-std::set<std::uint8_t> testIds(const std::vector<MonitorTest>& tests)
+std::set<std::uint8_t> testIds(std::vector<MonitorTest> const& tests)
 {
     std::set<std::uint8_t> ids;
-    for (const auto& test : tests) {
+    for (auto const& test : tests) {
         ids.insert(test.id);
     }
     return ids;
 }
 
 /// CAN: one message with a record of nine bytes for each test of the monitor.
-Answer tellMonitor(const ServiceCall& call, std::uint8_t id)
+Answer tellMonitor(ServiceCall const& call, std::uint8_t id)
 {
     Bytes message = {call.positiveService()};
-    for (const auto& test : call.module.data().monitorTests) {
+    for (auto const& test : call.module.data().monitorTests) {
         if (test.id == id) {
             append(message, Bytes{id, test.test, test.scaling});
-            for (const auto word : test.words) {
+            for (auto const word : test.words) {
                 appendWord(message, word);
             }
         }
@@ -41,14 +41,14 @@ Answer tellMonitor(const ServiceCall& call, std::uint8_t id)
 }
 
 /// The other buses: one message for each component of the test.
-Answer tellComponents(const ServiceCall& call, std::uint8_t id)
+Answer tellComponents(ServiceCall const& call, std::uint8_t id)
 {
     Answer answer;
-    for (const auto& test : call.module.data().monitorTests) {
+    for (auto const& test : call.module.data().monitorTests) {
         if (test.id == id) {
             Bytes message = head(call, id);
             message.push_back(test.test);
-            for (const auto word : test.words) {
+            for (auto const word : test.words) {
                 appendWord(message, word);
             }
             answer.messages.push_back(message);
@@ -57,15 +57,15 @@ Answer tellComponents(const ServiceCall& call, std::uint8_t id)
     return answer;
 }
 
-Answer tellSensorRange(const ServiceCall& call, std::uint8_t base, std::uint8_t sensor)
+Answer tellSensorRange(ServiceCall const& call, std::uint8_t base, std::uint8_t sensor)
 {
     std::set<std::uint8_t> ids;
-    for (const auto& test : call.module.data().sensorTests) {
+    for (auto const& test : call.module.data().sensorTests) {
         if (test.sensor == sensor) {
             ids.insert(test.test);
         }
     }
-    const auto mask = supportedMask(ids, base);
+    auto const mask = supportedMask(ids, base);
     if (!mask || ids.empty()) {
         return {};
     }
@@ -77,17 +77,17 @@ Answer tellSensorRange(const ServiceCall& call, std::uint8_t base, std::uint8_t 
 
 } // namespace
 
-Answer sensorTests(const ServiceCall& call)
+Answer sensorTests(ServiceCall const& call)
 {
-    const auto id = call.at(1);
-    const auto sensor = call.at(2);
+    auto const id = call.at(1);
+    auto const sensor = call.at(2);
     if (call.onCan() || !id || !sensor) {
         return {};
     }
     if (isRangeRequest(*id)) {
         return tellSensorRange(call, *id, *sensor);
     }
-    for (const auto& test : call.module.data().sensorTests) {
+    for (auto const& test : call.module.data().sensorTests) {
         if (test.test == *id && test.sensor == *sensor) {
             Bytes message = head(call, *id);
             message.push_back(*sensor);
@@ -98,9 +98,9 @@ Answer sensorTests(const ServiceCall& call)
     return {};
 }
 
-Answer monitorTests(const ServiceCall& call)
+Answer monitorTests(ServiceCall const& call)
 {
-    const auto id = call.at(1);
+    auto const id = call.at(1);
     if (!id) {
         return {};
     }
@@ -110,21 +110,21 @@ Answer monitorTests(const ServiceCall& call)
     return call.onCan() ? tellMonitor(call, *id) : tellComponents(call, *id);
 }
 
-Answer runRoutine(const ServiceCall& call)
+Answer runRoutine(ServiceCall const& call)
 {
-    const auto id = call.at(1);
+    auto const id = call.at(1);
     if (!id) {
         return {};
     }
-    const auto& routines = call.module.data().routines;
+    auto const& routines = call.module.data().routines;
     if (isRangeRequest(*id)) {
         std::set<std::uint8_t> ids;
-        for (const auto& [number, routine] : routines) {
+        for (auto const& [number, routine] : routines) {
             ids.insert(number);
         }
         return tellRange(call, ids);
     }
-    const auto routine = routines.find(*id);
+    auto const routine = routines.find(*id);
     if (routine == routines.end()) {
         return {};
     }

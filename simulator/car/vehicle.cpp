@@ -11,28 +11,28 @@ namespace {
 
 constexpr std::uint8_t negativeResponse = 0x7F;
 
-const Protocol& protocolOf(const VehicleData& data)
+Protocol const& protocolOf(VehicleData const& data)
 {
-    const Protocol* protocol = findProtocol(data.protocol);
+    Protocol const* protocol = findProtocol(data.protocol);
     if (protocol == nullptr) {
         throw std::invalid_argument("no OBD protocol has the number " + std::to_string(data.protocol));
     }
     return *protocol;
 }
 
-Pending pendingOf(const ModuleData& data, const Bytes& request)
+Pending pendingOf(ModuleData const& data, Bytes const& request)
 {
-    const auto found = data.delays.find(request);
+    auto const found = data.delays.find(request);
     return found == data.delays.end() ? Pending{0, Time(0)} : found->second;
 }
 
-void tell(std::vector<ModuleMessage>& messages, Module& module, const Bytes& request, Time now)
+void tell(std::vector<ModuleMessage>& messages, Module& module, Bytes const& request, Time now)
 {
     const Answer answer = module.answer(request, now);
     if (answer.isSilent()) {
         return;
     }
-    const ModuleData& data = module.data();
+    ModuleData const& data = module.data();
     const Pending pending = pendingOf(data, request);
     Time delay = data.latency;
     for (int i = 0; i < pending.times; ++i) {
@@ -42,29 +42,29 @@ void tell(std::vector<ModuleMessage>& messages, Module& module, const Bytes& req
     if (answer.refusal != 0) {
         messages.push_back({data.id, delay, {negativeResponse, request[0], answer.refusal}});
     }
-    for (const auto& payload : answer.messages) {
+    for (auto const& payload : answer.messages) {
         messages.push_back({data.id, delay, payload});
     }
 }
 
 } // namespace
 
-Vehicle::Vehicle(const VehicleData& data)
+Vehicle::Vehicle(VehicleData const& data)
     : m_name(data.name), m_protocol(protocolOf(data)), m_padding(data.padding), m_volts(data.volts),
       m_drive(data.engine)
 {
     const DataLayout layout = isCan(m_protocol) ? DataLayout::Can : DataLayout::Numbered;
-    for (const auto& module : data.modules) {
+    for (auto const& module : data.modules) {
         m_modules.emplace_back(module, data.engine, layout);
     }
 }
 
-const std::string& Vehicle::name() const
+std::string const& Vehicle::name() const
 {
     return m_name;
 }
 
-const Protocol& Vehicle::protocol() const
+Protocol const& Vehicle::protocol() const
 {
     return m_protocol;
 }
@@ -79,7 +79,7 @@ double Vehicle::volts(Time now) const
     return m_volts.value_or(m_drive.at(now).volts);
 }
 
-std::vector<ModuleMessage> Vehicle::request(const Target& target, const Bytes& payload, Time now)
+std::vector<ModuleMessage> Vehicle::request(Target const& target, Bytes const& payload, Time now)
 {
     std::vector<ModuleMessage> messages;
     if (payload.empty()) {
@@ -91,7 +91,7 @@ std::vector<ModuleMessage> Vehicle::request(const Target& target, const Bytes& p
         }
     }
     std::stable_sort(messages.begin(), messages.end(),
-                     [](const ModuleMessage& a, const ModuleMessage& b) { return a.delay < b.delay; });
+                     [](ModuleMessage const& a, ModuleMessage const& b) { return a.delay < b.delay; });
     return messages;
 }
 

@@ -16,21 +16,21 @@ struct ModuleMessage
 class Vehicle
 {
 public:
-    explicit Vehicle(const VehicleData& data);
+    explicit Vehicle(VehicleData const& data);
 
-    const std::string& name() const;
-    const Protocol& protocol() const;
+    std::string const& name() const;
+    Protocol const& protocol() const;
     Padding padding() const;
 
     /// Voltage at the diagnostic socket.
     double volts(Time now) const;
 
     /// What the modules say to a request, in the order of time.
-    std::vector<ModuleMessage> request(const Target& target, const Bytes& payload, Time now);
+    std::vector<ModuleMessage> request(Target const& target, Bytes const& payload, Time now);
 
 private:
     std::string m_name;
-    const Protocol& m_protocol;
+    Protocol const& m_protocol;
     Padding m_padding;
     std::optional<double> m_volts;
     DriveModel m_drive;

@@ -46,7 +46,7 @@ VehicleData readVehicle(TableReader& table)
 
 } // namespace
 
-VehicleData parseVehicle(std::string_view text, const std::string& origin)
+VehicleData parseVehicle(std::string_view text, std::string const& origin)
 {
     try {
         const toml::table table = toml::parse(text, std::string_view(origin));
@@ -54,7 +54,7 @@ VehicleData parseVehicle(std::string_view text, const std::string& origin)
         VehicleData vehicle = readVehicle(reader);
         reader.finish();
         return vehicle;
-    } catch (const toml::parse_error& error) {
+    } catch (toml::parse_error const& error) {
         throw VehicleFileError(origin + ":" + std::to_string(error.source().begin.line) + ": " +
                                std::string(error.description()));
     }

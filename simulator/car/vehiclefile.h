@@ -17,6 +17,6 @@ public:
 /// Reads the text of a vehicle file; `origin` is its name in error messages.
 /// Throws VehicleFileError for broken TOML, an unknown key, a value of the wrong
 /// kind or out of its range, and a missing one.
-VehicleData parseVehicle(std::string_view text, const std::string& origin);
+VehicleData parseVehicle(std::string_view text, std::string const& origin);
 
 } // namespace obdsim

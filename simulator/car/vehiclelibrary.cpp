@@ -9,12 +9,12 @@ namespace obdsim {
 
 namespace {
 
-std::string readFile(const std::string& path)
+std::string readFile(std::string const& path)
 {
     auto text = readTextFile(path);
     if (!text) {
         std::string names;
-        for (const auto& name : vehicleNames()) {
+        for (auto const& name : vehicleNames()) {
             names += names.empty() ? name : ", " + name;
         }
         throw VehicleFileError(path + ": no such file, and no vehicle of that name; the vehicles are " + names);
@@ -34,7 +34,7 @@ std::vector<std::string> vehicleNames()
     return names;
 }
 
-VehicleData loadVehicle(const std::string& nameOrPath)
+VehicleData loadVehicle(std::string const& nameOrPath)
 {
     for (std::size_t i = 0; i < embeddedVehicleCount; ++i) {
         if (nameOrPath == embeddedVehicles[i].name) {

@@ -12,6 +12,6 @@ std::vector<std::string> vehicleNames();
 
 /// The vehicle of that name, or else of that file. Throws VehicleFileError if
 /// neither exists or the file is broken.
-VehicleData loadVehicle(const std::string& nameOrPath);
+VehicleData loadVehicle(std::string const& nameOrPath);
 
 } // namespace obdsim

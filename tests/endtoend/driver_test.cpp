@@ -23,8 +23,8 @@ struct Bench
           device(std::make_shared<ElmScantool>(connection))
     {}
 
-    explicit Bench(const std::string& vehicle, const std::string& adapter = "elm327-v1.5",
-                   const std::vector<std::string>& faults = {})
+    explicit Bench(std::string const& vehicle, std::string const& adapter = "elm327-v1.5",
+                   std::vector<std::string> const& faults = {})
         : Bench(obdsim::simulate({vehicle, adapter, faults}))
     {}
 
@@ -39,7 +39,7 @@ struct Bench
 
 struct CarCase
 {
-    const char* vehicle;
+    char const* vehicle;
     obd::ObdProtocol protocol;
     std::set<unsigned int> modules;
 };
@@ -64,7 +64,7 @@ const CarCase carCases[] = {
 std::set<unsigned int> modulesOf(ObdProxy& proxy)
 {
     std::set<unsigned int> ids;
-    for (const auto& ecu : proxy.ecus()) {
+    for (auto const& ecu : proxy.ecus()) {
         ids.insert(ecu->id());
     }
     return ids;
@@ -72,11 +72,11 @@ std::set<unsigned int> modulesOf(ObdProxy& proxy)
 
 TEST(DriverOnSimulator, findsEveryVehicleAndItsModules)
 {
-    for (const auto& row : carCases) {
+    for (auto const& row : carCases) {
         Bench bench(row.vehicle);
         ASSERT_TRUE(bench.bringUp()) << row.vehicle;
         EXPECT_EQ(bench.device->getProtocol(), row.protocol) << row.vehicle;
-        const auto proxy = std::make_shared<ObdProxy>();
+        auto const proxy = std::make_shared<ObdProxy>();
         proxy->setDevice(bench.device);
         EXPECT_TRUE(proxy->initialize()) << row.vehicle;
         EXPECT_EQ(modulesOf(*proxy), row.modules) << row.vehicle;
@@ -86,7 +86,7 @@ TEST(DriverOnSimulator, findsEveryVehicleAndItsModules)
 
 TEST(DriverOnSimulator, comesUpOnEveryAdapterThatSpeaks)
 {
-    for (const auto& key : obdsim::simulatedAdapters()) {
+    for (auto const& key : obdsim::simulatedAdapters()) {
         Bench bench("petrol-can11", key);
         EXPECT_EQ(bench.bringUp(), key != "silent") << key;
         ResponseMap responses;
@@ -111,14 +111,14 @@ TEST(DriverOnSimulator, readsLongMessages)
     ASSERT_TRUE(bench.bringUp());
     ResponseMap responses;
     EXPECT_EQ(bench.device->execute({0x09, 0x02}, responses, 3000), IDevice::Status::Ok);
-    const auto& reply = responses[0x7E8];
+    auto const& reply = responses[0x7E8];
     ASSERT_EQ(reply.size(), 20U);
     EXPECT_EQ(std::string(reply.begin() + 3, reply.end()), "VELMRAS1MM0000001");
 }
 
 TEST(DriverOnSimulator, quirksDoNotKeepItFromTheCar)
 {
-    for (const char* quirk :
+    for (char const* quirk :
          {"prompt-slow", "single-return", "double-prompt", "linefeeds-on", "junk-before-banner",
           "question-before-banner", "leftover-questions", "greeting", "echo-kept-off", "formatting-stuck", "ok-to-all",
           "first-letters-only", "no-count-digit", "pieces", "search-ok", "tight-description"}) {
@@ -131,7 +131,7 @@ TEST(DriverOnSimulator, quirksDoNotKeepItFromTheCar)
 // time.
 TEST(DriverOnSimulator, someQuirksKeepItFromTheCar)
 {
-    for (const char* quirk : {"prompt-late", "first-no-data"}) {
+    for (char const* quirk : {"prompt-late", "first-no-data"}) {
         Bench bench("petrol-can11", "elm327-v1.5", {std::string("quirk:") + quirk});
         EXPECT_FALSE(bench.bringUp()) << quirk;
     }
@@ -139,7 +139,7 @@ TEST(DriverOnSimulator, someQuirksKeepItFromTheCar)
 
 TEST(DriverOnSimulator, noFaultMakesItHangOrCrash)
 {
-    for (const char* fault : {"garbage=0.001",
+    for (char const* fault : {"garbage=0.001",
                               "garbage=0.05",
                               "garbage=1",
                               "nul=0.1",
@@ -167,14 +167,14 @@ TEST(DriverOnSimulator, noFaultMakesItHangOrCrash)
                               "quirk:padding-shown",
                               "quirk:stopped-first",
                               "quirk:bus-init-split"}) {
-        for (const char* vehicle : {"petrol-can11", "petrol-vpw", "petrol-kwp-fast"}) {
+        for (char const* vehicle : {"petrol-can11", "petrol-vpw", "petrol-kwp-fast"}) {
             Bench bench(vehicle, "elm327-v1.5", {fault, "seed=5"});
-            const bool up = bench.bringUp();
+            bool const up = bench.bringUp();
             for (int i = 0; i < 5; ++i) {
                 ResponseMap responses;
                 try {
                     bench.device->execute({0x01, 0x0C}, responses, 1500);
-                } catch (const std::exception&) {
+                } catch (std::exception const&) {
                     // A damaged reply may run out of the bytes that its header promises.
                 }
             }
@@ -196,7 +196,7 @@ TEST(DriverOnSimulator, nulBytesDoNotMatter)
 
 struct ReplayCase
 {
-    const char* dialogue;
+    char const* dialogue;
     obd::ObdProtocol protocol;
     std::set<unsigned int> modules;
 };
@@ -217,11 +217,11 @@ const ReplayCase replayCases[] = {
 
 TEST(DriverOnReplay, recordedCarsComeUp)
 {
-    for (const auto& row : replayCases) {
+    for (auto const& row : replayCases) {
         Bench bench(obdsim::replay(std::string(VELMORA_SOURCE_DIR "/tests/dialogues/") + row.dialogue + ".dialogue"));
         ASSERT_TRUE(bench.bringUp()) << row.dialogue;
         EXPECT_EQ(bench.device->getProtocol(), row.protocol) << row.dialogue;
-        const auto proxy = std::make_shared<ObdProxy>();
+        auto const proxy = std::make_shared<ObdProxy>();
         proxy->setDevice(bench.device);
         proxy->initialize();
         EXPECT_EQ(modulesOf(*proxy), row.modules) << row.dialogue;

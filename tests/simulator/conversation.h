@@ -17,17 +17,17 @@ public:
     explicit Conversation(std::shared_ptr<obdsim::IPeer> peer) : m_peer(std::move(peer)) {}
 
     /// Sends `line` and a CR; all that comes back until nothing more is under way.
-    std::string ask(const std::string& line)
+    std::string ask(std::string const& line)
     {
         m_peer->receive(line + "\r");
         return listen();
     }
 
     /// The reply to the last of `lines`.
-    std::string ask(std::initializer_list<const char*> lines)
+    std::string ask(std::initializer_list<char const*> lines)
     {
         std::string reply;
-        for (const char* line : lines) {
+        for (char const* line : lines) {
             reply = ask(std::string(line));
         }
         return reply;
@@ -37,7 +37,7 @@ public:
     {
         const obdsim::Time start = m_peer->now();
         std::string text;
-        while (const auto next = m_peer->nextOutput()) {
+        while (auto const next = m_peer->nextOutput()) {
             text += m_peer->advanceTo(*next);
             m_lastWait = *next - start;
         }
@@ -57,14 +57,14 @@ private:
     obdsim::Time m_lastWait{};
 };
 
-inline Conversation simulated(const std::string& vehicle, const std::string& adapter = "elm327-v1.5",
-                              const std::vector<std::string>& faults = {})
+inline Conversation simulated(std::string const& vehicle, std::string const& adapter = "elm327-v1.5",
+                              std::vector<std::string> const& faults = {})
 {
     return Conversation(obdsim::simulate({vehicle, adapter, faults}));
 }
 
 /// An adapter with the car of a vehicle file's text.
-inline Conversation withVehicle(const std::string& toml, const std::string& adapter = "elm327-v1.5",
+inline Conversation withVehicle(std::string const& toml, std::string const& adapter = "elm327-v1.5",
                                 obdsim::Quirks quirks = {})
 {
     obdsim::AdapterProfile profile = *obdsim::findProfile(adapter);
@@ -74,7 +74,7 @@ inline Conversation withVehicle(const std::string& toml, const std::string& adap
 }
 
 /// An adapter with nothing plugged in.
-inline Conversation unplugged(const std::string& adapter = "elm327-v1.5", obdsim::Quirks quirks = {})
+inline Conversation unplugged(std::string const& adapter = "elm327-v1.5", obdsim::Quirks quirks = {})
 {
     obdsim::AdapterProfile profile = *obdsim::findProfile(adapter);
     profile.quirks.add(quirks);

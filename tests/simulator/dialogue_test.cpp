@@ -42,7 +42,7 @@ TEST(Dialogue, isReadWithEscapesAndPauses)
 struct ErrorCase
 {
     std::string text;
-    const char* error;
+    char const* error;
 };
 
 TEST(Dialogue, malformedFileIsToldWithItsLine)
@@ -67,11 +67,11 @@ TEST(Dialogue, malformedFileIsToldWithItsLine)
         {head + "-> ATZ\n.. 5\n", "a.dialogue:7: no received line follows"},
         {head + "-> ATZ\n.. 5\n-> ATI\n", "a.dialogue:8: no received line follows"},
     };
-    for (const auto& row : cases) {
+    for (auto const& row : cases) {
         try {
             parseDialogue(row.text, "a.dialogue");
             ADD_FAILURE() << row.text;
-        } catch (const DialogueError& error) {
+        } catch (DialogueError const& error) {
             EXPECT_EQ(std::string(error.what()).substr(0, std::string(row.error).size()), row.error);
         }
     }
@@ -98,7 +98,7 @@ TEST(Dialogue, isWrittenInTheFormThatIsRead)
 TEST(Dialogue, everyRecordedOneIsReadAndWrittenBack)
 {
     int count = 0;
-    for (const auto& file : std::filesystem::directory_iterator(VELMORA_SOURCE_DIR "/tests/dialogues")) {
+    for (auto const& file : std::filesystem::directory_iterator(VELMORA_SOURCE_DIR "/tests/dialogues")) {
         if (file.path().extension() != ".dialogue") {
             continue;
         }

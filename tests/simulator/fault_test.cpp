@@ -11,14 +11,14 @@ using obdsim::FaultKind;
 using obdsim::parseFaults;
 using obdsim::Time;
 
-Conversation faulty(const std::vector<std::string>& faults)
+Conversation faulty(std::vector<std::string> const& faults)
 {
     return simulated("petrol-can11", "elm327-v1.5", faults);
 }
 
 TEST(Fault, textsAreRead)
 {
-    const auto plan =
+    auto const plan =
         parseFaults({"garbage=0.25", "nul=1", "cut@120", "stall@80:500", "slow=30", "loss@99", "error:BUS BUSY@3",
                      "error:CAN ERROR=0.5", "prompt@2", "prompt=0.1", "echo", "quirk:prompt-late", "seed=7"});
     ASSERT_EQ(plan.faults.size(), 10U);
@@ -39,7 +39,7 @@ TEST(Fault, textsAreRead)
 
 TEST(Fault, wrongTextIsToldWithTheFormsThereAre)
 {
-    for (const char* text :
+    for (char const* text :
          {"",           "garbage", "garbage=", "garbage=2", "garbage=-1", "garbage=x",      "garbage@5",
           "cut=3",      "cut@0",   "cut@x",    "cut@5:3",   "stall@5",    "stall=5",        "stall@5:x",
           "slow=x",     "slow@5",  "loss=3",   "error@3",   "error:@3",   "error:BUS BUSY", "error:X@",
@@ -47,7 +47,7 @@ TEST(Fault, wrongTextIsToldWithTheFormsThereAre)
         try {
             parseFaults({text});
             ADD_FAILURE() << text;
-        } catch (const FaultError& error) {
+        } catch (FaultError const& error) {
             const std::string what = error.what();
             EXPECT_EQ(what.find("fault \"" + std::string(text) + "\": "), 0U) << what;
         }
@@ -56,7 +56,7 @@ TEST(Fault, wrongTextIsToldWithTheFormsThereAre)
 
 TEST(FaultyPeer, sameSeedGivesTheSameGarbage)
 {
-    const auto run = [](const char* seed) {
+    auto const run = [](char const* seed) {
         auto host = faulty({"garbage=0.05", "nul=0.02", seed});
         return host.ask("ATZ") + host.ask("ATE0") + host.ask("0100") + host.ask("0902");
     };

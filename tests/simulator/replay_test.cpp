@@ -8,7 +8,7 @@ namespace {
 
 using obdsim::Time;
 
-Conversation replaying(const std::string& header, const std::string& turns)
+Conversation replaying(std::string const& header, std::string const& turns)
 {
     auto script =
         std::make_shared<obdsim::ReplayScript>(obdsim::parseDialogue("vehicle: car\n" + header + "\n" + turns, "test"));
@@ -16,7 +16,7 @@ Conversation replaying(const std::string& header, const std::string& turns)
     return Conversation(std::make_shared<obdsim::Adapter>(std::move(profile), nullptr, script));
 }
 
-Conversation recorded(const std::string& name)
+Conversation recorded(std::string const& name)
 {
     return Conversation(obdsim::replay(VELMORA_SOURCE_DIR "/tests/dialogues/" + name + ".dialogue"));
 }
@@ -153,9 +153,9 @@ TEST(Replay, adapterNameComesFromTheReplyOrTheHeader)
 
 struct BringUpCase
 {
-    const char* dialogue;
-    const char* number;
-    const char* reply; ///< first characters of the second reply to 0100
+    char const* dialogue;
+    char const* number;
+    char const* reply; ///< first characters of the second reply to 0100
 };
 
 // Real cars that a driver can bring up from their recording alone.
@@ -171,10 +171,10 @@ const BringUpCase bringUpCases[] = {
 
 TEST(Replay, realCarsComeUpWithTheCommandsOfADriver)
 {
-    for (const auto& row : bringUpCases) {
+    for (auto const& row : bringUpCases) {
         auto host = recorded(row.dialogue);
         EXPECT_NE(host.ask("ATI").find("ELM327"), std::string::npos) << row.dialogue;
-        for (const char* command : {"ATE0", "ATL0", "ATS0", "ATM0", "ATST64", "ATTP0"}) {
+        for (char const* command : {"ATE0", "ATL0", "ATS0", "ATM0", "ATST64", "ATTP0"}) {
             EXPECT_NE(host.ask(command).find("OK"), std::string::npos) << row.dialogue << " " << command;
         }
         const std::string probe = host.ask("0100");

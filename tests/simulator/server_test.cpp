@@ -28,10 +28,10 @@ class Line
 public:
     explicit Line(int descriptor) : m_descriptor(descriptor) {}
     ~Line() { ::close(m_descriptor); }
-    Line(const Line&) = delete;
-    Line& operator=(const Line&) = delete;
+    Line(Line const&) = delete;
+    Line& operator=(Line const&) = delete;
 
-    void send(const std::string& text) const
+    void send(std::string const& text) const
     {
         ASSERT_EQ(::write(m_descriptor, text.data(), text.size()), static_cast<ssize_t>(text.size()));
     }
@@ -52,7 +52,7 @@ public:
         return text;
     }
 
-    std::string ask(const std::string& command)
+    std::string ask(std::string const& command)
     {
         send(command + "\r");
         return readReply();
@@ -65,27 +65,27 @@ private:
     bool m_ended = false;
 };
 
-int connectTo(const std::string& address)
+int connectTo(std::string const& address)
 {
-    const auto colon = address.rfind(':');
+    auto const colon = address.rfind(':');
     asio::io_context context;
     tcp::socket socket(context);
     asio::connect(socket, tcp::resolver(context).resolve(address.substr(0, colon), address.substr(colon + 1)));
-    const int descriptor = ::dup(socket.native_handle());
+    int const descriptor = ::dup(socket.native_handle());
     ::fcntl(descriptor, F_SETFL, ::fcntl(descriptor, F_GETFL) & ~O_NONBLOCK);
     return descriptor;
 }
 
-milliseconds timeOf(const std::function<void()>& action)
+milliseconds timeOf(std::function<void()> const& action)
 {
-    const auto start = steady_clock::now();
+    auto const start = steady_clock::now();
     action();
     return std::chrono::duration_cast<milliseconds>(steady_clock::now() - start);
 }
 
 TEST(TcpServer, servesOneClientAfterAnother)
 {
-    const auto server = obdsim::serveTcp(obdsim::simulate({}), "127.0.0.1", 0, fast);
+    auto const server = obdsim::serveTcp(obdsim::simulate({}), "127.0.0.1", 0, fast);
     server->start();
     EXPECT_EQ(server->address().substr(0, 10), "127.0.0.1:");
     {
@@ -100,7 +100,7 @@ TEST(TcpServer, servesOneClientAfterAnother)
 
 TEST(TcpServer, secondClientWaitsForTheFirstToGo)
 {
-    const auto server = obdsim::serveTcp(obdsim::simulate({}), "127.0.0.1", 0, fast);
+    auto const server = obdsim::serveTcp(obdsim::simulate({}), "127.0.0.1", 0, fast);
     server->start();
     auto first = std::make_unique<Line>(connectTo(server->address()));
     EXPECT_EQ(first->ask("ATE0"), "ATE0\rOK\r\r>");
@@ -113,7 +113,7 @@ TEST(TcpServer, secondClientWaitsForTheFirstToGo)
 
 TEST(TcpServer, stopsAtOnceWithAClientOnTheLine)
 {
-    const auto server = obdsim::serveTcp(obdsim::simulate({}), "127.0.0.1", 0, 1);
+    auto const server = obdsim::serveTcp(obdsim::simulate({}), "127.0.0.1", 0, 1);
     server->start();
     Line client(connectTo(server->address()));
     client.ask("ATE0");
@@ -124,7 +124,7 @@ TEST(TcpServer, stopsAtOnceWithAClientOnTheLine)
 
 TEST(TcpServer, runsOnTheCallersThreadToo)
 {
-    const auto server = obdsim::serveTcp(obdsim::simulate({}), "127.0.0.1", 0, fast);
+    auto const server = obdsim::serveTcp(obdsim::simulate({}), "127.0.0.1", 0, fast);
     std::thread thread([&] { server->run(); });
     {
         Line client(connectTo(server->address()));
@@ -136,15 +136,15 @@ TEST(TcpServer, runsOnTheCallersThreadToo)
 
 TEST(TcpServer, stoppedBeforeItRunsItReturns)
 {
-    const auto server = obdsim::serveTcp(obdsim::simulate({}), "127.0.0.1", 0);
+    auto const server = obdsim::serveTcp(obdsim::simulate({}), "127.0.0.1", 0);
     server->stop();
     server->run();
 }
 
 TEST(TcpServer, lostLinkClosesTheConnectionAndTheNextOneIsServed)
 {
-    const auto peer = obdsim::simulate({"petrol-can11", "elm327-v1.5", {"loss@14"}});
-    const auto server = obdsim::serveTcp(peer, "127.0.0.1", 0, fast);
+    auto const peer = obdsim::simulate({"petrol-can11", "elm327-v1.5", {"loss@14"}});
+    auto const server = obdsim::serveTcp(peer, "127.0.0.1", 0, fast);
     server->start();
     {
         Line client(connectTo(server->address()));
@@ -158,13 +158,13 @@ TEST(TcpServer, lostLinkClosesTheConnectionAndTheNextOneIsServed)
 
 TEST(TcpServer, portInUseIsTold)
 {
-    const auto server = obdsim::serveTcp(obdsim::simulate({}), "127.0.0.1", 0);
+    auto const server = obdsim::serveTcp(obdsim::simulate({}), "127.0.0.1", 0);
     const std::string address = server->address();
-    const auto port = static_cast<std::uint16_t>(std::stoi(address.substr(address.rfind(':') + 1)));
+    auto const port = static_cast<std::uint16_t>(std::stoi(address.substr(address.rfind(':') + 1)));
     try {
         obdsim::serveTcp(obdsim::simulate({}), "127.0.0.1", port);
         FAIL();
-    } catch (const obdsim::ServerError& error) {
+    } catch (obdsim::ServerError const& error) {
         EXPECT_EQ(std::string(error.what()).find("cannot listen on " + address), 0U) << error.what();
     }
     EXPECT_THROW(obdsim::serveTcp(obdsim::simulate({}), "256.1.1.1.1", 0), obdsim::ServerError);
@@ -172,7 +172,7 @@ TEST(TcpServer, portInUseIsTold)
 
 TEST(PtyServer, servesProgramsThatOpenItsDevice)
 {
-    const auto server = obdsim::servePseudoTerminal(obdsim::simulate({}), fast);
+    auto const server = obdsim::servePseudoTerminal(obdsim::simulate({}), fast);
     server->start();
     {
         Line first(::open(server->address().c_str(), O_RDWR | O_NOCTTY));
@@ -195,8 +195,8 @@ TEST(PtyServer, stopsAtOnceAndTakesItsDeviceAway)
 
 TEST(PtyServer, lostLinkTakesTheDeviceAway)
 {
-    const auto peer = obdsim::simulate({"petrol-can11", "elm327-v1.5", {"loss@14"}});
-    const auto server = obdsim::servePseudoTerminal(peer, fast);
+    auto const peer = obdsim::simulate({"petrol-can11", "elm327-v1.5", {"loss@14"}});
+    auto const server = obdsim::servePseudoTerminal(peer, fast);
     server->start();
     Line client(::open(server->address().c_str(), O_RDWR | O_NOCTTY));
     EXPECT_EQ(client.ask("ATE0"), "ATE0\rOK\r\r>");

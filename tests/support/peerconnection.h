@@ -34,14 +34,14 @@ public:
         const obdsim::Time deadline = m_peer->now() + obdsim::Time(std::max(0, timeoutMs));
         pull(m_peer->now());
         while (m_pending.find(m_delimiter) == std::string::npos) {
-            const auto next = m_peer->nextOutput();
+            auto const next = m_peer->nextOutput();
             if (!next || *next > deadline) {
                 pull(deadline);
                 return false;
             }
             pull(*next);
         }
-        const auto end = m_pending.find(m_delimiter);
+        auto const end = m_pending.find(m_delimiter);
         out.assign(m_pending.begin(), m_pending.begin() + static_cast<std::ptrdiff_t>(end));
         m_pending.erase(0, end + 1);
         for (auto* logger : m_loggers) {
@@ -50,7 +50,7 @@ public:
         return true;
     }
 
-    void send(const std::vector<unsigned char>& bytes) override
+    void send(std::vector<unsigned char> const& bytes) override
     {
         const std::lock_guard lock(m_mutex);
         m_peer->receive(std::string(bytes.begin(), bytes.end()));
@@ -66,7 +66,7 @@ public:
     void removeLogger(obd::IConnectionLogger* logger) override
     {
         const std::lock_guard lock(m_mutex);
-        const auto found = std::find(m_loggers.begin(), m_loggers.end(), logger);
+        auto const found = std::find(m_loggers.begin(), m_loggers.end(), logger);
         if (found != m_loggers.end()) {
             m_loggers.erase(found);
         }

@@ -29,10 +29,10 @@ struct Options
     std::vector<std::string> sources;
 };
 
-bool parseOptions(const std::vector<std::string>& arguments, Options& options)
+bool parseOptions(std::vector<std::string> const& arguments, Options& options)
 {
     for (std::size_t i = 0; i < arguments.size(); ++i) {
-        const std::string& argument = arguments[i];
+        std::string const& argument = arguments[i];
         if (argument == "--counts") {
             options.counts = true;
         } else if (argument == "--dump") {
@@ -48,10 +48,10 @@ bool parseOptions(const std::vector<std::string>& arguments, Options& options)
     return !options.sources.empty();
 }
 
-catalogue::Source readSources(const std::vector<std::string>& files)
+catalogue::Source readSources(std::vector<std::string> const& files)
 {
     catalogue::Source source;
-    for (const std::string& file : files) {
+    for (std::string const& file : files) {
         std::ifstream input(file, std::ios::binary);
         if (input) {
             catalogue::readSource(input, file, source);
@@ -62,7 +62,7 @@ catalogue::Source readSources(const std::vector<std::string>& files)
     return source;
 }
 
-bool writeOutput(const std::string& file, const std::vector<catalogue::Row>& table)
+bool writeOutput(std::string const& file, std::vector<catalogue::Row> const& table)
 {
     std::ofstream output(file, std::ios::binary);
     catalogue::writeTable(output, table);
@@ -85,7 +85,7 @@ int main(int argc, char** argv)
     }
     catalogue::Source source = readSources(options.sources);
     const std::vector<catalogue::Row> table = catalogue::buildTable(source);
-    for (const std::string& problem : source.problems) {
+    for (std::string const& problem : source.problems) {
         std::cerr << problem << '\n';
     }
     if (!source.problems.empty()) {

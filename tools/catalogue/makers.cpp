@@ -31,7 +31,7 @@ std::string_view makerName(std::size_t maker)
 
 std::optional<std::size_t> findMaker(std::string_view name)
 {
-    const auto found = std::find(makerNames.begin(), makerNames.end(), name);
+    auto const found = std::find(makerNames.begin(), makerNames.end(), name);
     if (found == makerNames.end()) {
         return std::nullopt;
     }

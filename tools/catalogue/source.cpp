@@ -40,7 +40,7 @@ std::vector<std::string> takeCodes(std::string_view& line)
 // Texts are plain ASCII, so that they show the same in every terminal and need no encoding.
 void requirePrintable(std::string_view line)
 {
-    const auto printable = [](char character) { return character >= ' ' && character <= '~'; };
+    auto const printable = [](char character) { return character >= ' ' && character <= '~'; };
     if (!std::all_of(line.begin(), line.end(), printable)) {
         throw SourceError("a control character, a tab or a character outside ASCII");
     }
@@ -62,7 +62,7 @@ void requireText(std::string_view text)
 
 std::size_t requireMaker(std::string_view name)
 {
-    const auto maker = findMaker(name);
+    auto const maker = findMaker(name);
     if (!maker) {
         throw SourceError("unknown maker '" + std::string(name) + "'");
     }
@@ -73,7 +73,7 @@ std::size_t requireMaker(std::string_view name)
 class FileReader
 {
 public:
-    FileReader(const std::string& file, Source& source)
+    FileReader(std::string const& file, Source& source)
         : m_source(source), m_lists(source.sharedLists), m_place{file, 0}
     {}
 
@@ -84,7 +84,7 @@ public:
             ++m_place.line;
             try {
                 readLine(line);
-            } catch (const SourceError& error) {
+            } catch (SourceError const& error) {
                 m_source.problems.push_back(toString(m_place) + ": " + error.what());
             }
         }
@@ -213,7 +213,7 @@ std::size_t FileReader::currentMaker() const
 
 } // namespace
 
-void readSource(std::istream& input, const std::string& file, Source& source)
+void readSource(std::istream& input, std::string const& file, Source& source)
 {
     FileReader(file, source).read(input);
 }

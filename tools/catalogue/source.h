@@ -45,6 +45,6 @@ struct Source
 };
 
 // Reads one file into `source`. A line that is refused adds a problem and nothing else.
-void readSource(std::istream& input, const std::string& file, Source& source);
+void readSource(std::istream& input, std::string const& file, Source& source);
 
 } // namespace catalogue

@@ -21,7 +21,7 @@ struct Place
 };
 
 // "file:line", the form that editors jump to.
-inline std::string toString(const Place& place)
+inline std::string toString(Place const& place)
 {
     return place.file + ':' + std::to_string(place.line);
 }

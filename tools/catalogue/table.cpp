@@ -17,12 +17,12 @@ public:
 
     std::vector<Row> build()
     {
-        for (const Twin& twin : m_source.twins) {
+        for (Twin const& twin : m_source.twins) {
             copyTwin(twin);
         }
-        const auto key = [](const Row& row) { return std::tie(row.maker, row.code); };
+        auto const key = [](Row const& row) { return std::tie(row.maker, row.code); };
         std::stable_sort(m_table.begin(), m_table.end(),
-                         [key](const Row& left, const Row& right) { return key(left) < key(right); });
+                         [key](Row const& left, Row const& right) { return key(left) < key(right); });
         checkRepeats();
         if (m_table.empty()) {
             m_source.problems.emplace_back("the sources hold no row");
@@ -31,17 +31,17 @@ public:
     }
 
 private:
-    void copyTwin(const Twin& twin);
-    void checkExceptions(const Twin& twin);
+    void copyTwin(Twin const& twin);
+    void checkExceptions(Twin const& twin);
     void checkRepeats();
     bool isTwin(std::size_t maker) const;
-    void report(const Place& place, const std::string& message);
+    void report(Place const& place, std::string const& message);
 
     Source& m_source;
     std::vector<Row> m_table;
 };
 
-void TableBuilder::copyTwin(const Twin& twin)
+void TableBuilder::copyTwin(Twin const& twin)
 {
     const std::string name(makerName(twin.original));
     if (isTwin(twin.original)) {
@@ -50,7 +50,7 @@ void TableBuilder::copyTwin(const Twin& twin)
     }
     checkExceptions(twin);
     bool any = false;
-    for (const Row& row : m_source.rows) {
+    for (Row const& row : m_source.rows) {
         if (row.maker != twin.original) {
             continue;
         }
@@ -65,10 +65,10 @@ void TableBuilder::copyTwin(const Twin& twin)
     }
 }
 
-void TableBuilder::checkExceptions(const Twin& twin)
+void TableBuilder::checkExceptions(Twin const& twin)
 {
-    for (const std::string& code : twin.exceptions) {
-        const auto matches = [&](const Row& row) { return row.maker == twin.original && row.code == code; };
+    for (std::string const& code : twin.exceptions) {
+        auto const matches = [&](Row const& row) { return row.maker == twin.original && row.code == code; };
         if (std::none_of(m_source.rows.begin(), m_source.rows.end(), matches)) {
             report(twin.place, "'" + std::string(makerName(twin.original)) + "' has no code " + code + " to leave out");
         }
@@ -78,9 +78,9 @@ void TableBuilder::checkExceptions(const Twin& twin)
 // A second row of one maker and code is nearly always a slip, so it has to be asked for.
 void TableBuilder::checkRepeats()
 {
-    const Row* previous = nullptr;
-    for (const Row& row : m_table) {
-        const bool again = previous != nullptr && previous->maker == row.maker && previous->code == row.code;
+    Row const* previous = nullptr;
+    for (Row const& row : m_table) {
+        bool const again = previous != nullptr && previous->maker == row.maker && previous->code == row.code;
         if (again && !row.repeat) {
             report(row.place, row.code + " of '" + std::string(makerName(row.maker)) + "' stands already at " +
                                   toString(previous->place) + "; write 'repeat' before it if both are wanted");
@@ -95,10 +95,10 @@ void TableBuilder::checkRepeats()
 bool TableBuilder::isTwin(std::size_t maker) const
 {
     return std::any_of(m_source.twins.begin(), m_source.twins.end(),
-                       [maker](const Twin& twin) { return twin.maker == maker; });
+                       [maker](Twin const& twin) { return twin.maker == maker; });
 }
 
-void TableBuilder::report(const Place& place, const std::string& message)
+void TableBuilder::report(Place const& place, std::string const& message)
 {
     m_source.problems.push_back(toString(place) + ": " + message);
 }

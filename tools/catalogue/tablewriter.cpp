@@ -23,7 +23,7 @@ struct TextPosition
 std::string escape(std::string_view text)
 {
     std::string escaped;
-    for (const char character : text) {
+    for (char const character : text) {
         if (character == '"' || character == '\\') {
             escaped += '\\';
         }
@@ -36,9 +36,9 @@ std::string escape(std::string_view text)
 class TextBlocks
 {
 public:
-    TextPosition add(const std::string& text)
+    TextPosition add(std::string const& text)
     {
-        const auto known = m_positions.find(text);
+        auto const known = m_positions.find(text);
         if (known != m_positions.end()) {
             return known->second;
         }
@@ -57,8 +57,8 @@ public:
     {
         for (std::size_t block = 0; block < m_blocks.size(); ++block) {
             output << "constexpr char block" << block << "[] =\n";
-            const char* separator = "";
-            for (const std::string& text : m_blocks[block]) {
+            char const* separator = "";
+            for (std::string const& text : m_blocks[block]) {
                 output << separator << "    \"" << escape(text) << "\\0\"";
                 separator = "\n";
             }
@@ -83,11 +83,11 @@ private:
 
 } // namespace
 
-void writeTable(std::ostream& output, const std::vector<Row>& table)
+void writeTable(std::ostream& output, std::vector<Row> const& table)
 {
     TextBlocks blocks;
     std::vector<TextPosition> positions;
-    for (const Row& row : table) {
+    for (Row const& row : table) {
         positions.push_back(blocks.add(row.text));
     }
     output

@@ -20,7 +20,7 @@ constexpr unsigned int maximumNumber = 255;
 std::optional<unsigned int> parseNumber(std::string_view text)
 {
     unsigned int number = 0;
-    const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
+    auto const [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
     if (error != std::errc() || end != text.data() + text.size() || number > maximumNumber) {
         return std::nullopt;
     }
@@ -42,7 +42,7 @@ std::optional<Alternatives> expandRange(std::string_view group)
     const std::string_view first = group.substr(0, dash);
     const std::string_view last = group.substr(dash + 1);
     Alternatives entries;
-    if (const auto from = parseNumber(first), to = parseNumber(last); from && to) {
+    if (auto const from = parseNumber(first), to = parseNumber(last); from && to) {
         for (unsigned int number = *from; number <= *to; ++number) {
             entries.push_back(std::to_string(number));
         }
@@ -59,7 +59,7 @@ std::optional<Alternatives> expandRange(std::string_view group)
     return entries;
 }
 
-Alternatives expandGroup(std::string_view group, const Lists& lists)
+Alternatives expandGroup(std::string_view group, Lists const& lists)
 {
     if (auto range = expandRange(group)) {
         return *range;
@@ -67,7 +67,7 @@ Alternatives expandGroup(std::string_view group, const Lists& lists)
     if (group.find('|') != std::string_view::npos) {
         return splitAlternatives(group);
     }
-    const auto list = lists.find(group);
+    auto const list = lists.find(group);
     if (list == lists.end()) {
         throw SourceError("'{" + std::string(group) + "}' is no range, no choice and no known list");
     }
@@ -75,7 +75,7 @@ Alternatives expandGroup(std::string_view group, const Lists& lists)
 }
 
 // Cuts a pattern into plain stretches and groups.
-std::vector<Alternatives> splitPattern(std::string_view pattern, const Lists& lists)
+std::vector<Alternatives> splitPattern(std::string_view pattern, Lists const& lists)
 {
     std::vector<Alternatives> parts;
     while (!pattern.empty()) {
@@ -112,17 +112,17 @@ std::vector<std::string> splitAlternatives(std::string_view text)
     return entries;
 }
 
-std::vector<std::string> expandText(std::string_view pattern, std::size_t count, const Lists& lists)
+std::vector<std::string> expandText(std::string_view pattern, std::size_t count, Lists const& lists)
 {
     const std::vector<Alternatives> parts = splitPattern(pattern, lists);
     if (pattern.find('{') == std::string_view::npos) {
         return std::vector<std::string>(count, std::string(pattern));
     }
     std::vector<std::string> texts(1);
-    for (const Alternatives& part : parts) {
+    for (Alternatives const& part : parts) {
         std::vector<std::string> longer;
-        for (const std::string& text : texts) {
-            for (const std::string& entry : part) {
+        for (std::string const& text : texts) {
+            for (std::string const& entry : part) {
                 longer.push_back(text + entry);
             }
         }

@@ -18,6 +18,6 @@ std::vector<std::string> splitAlternatives(std::string_view text);
 // number or letter, "{name}" one for each entry of that list. Of several groups the last one changes fastest. A pattern
 // without a group stands `count` times. Throws SourceError for an open brace, an empty or falling group, an unknown
 // list, and when groups do not give exactly `count` texts.
-std::vector<std::string> expandText(std::string_view pattern, std::size_t count, const Lists& lists);
+std::vector<std::string> expandText(std::string_view pattern, std::size_t count, Lists const& lists);
 
 } // namespace catalogue

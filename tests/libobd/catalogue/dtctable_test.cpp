@@ -52,7 +52,7 @@ std::map<std::pair<std::string, std::string>, std::size_t> countRows()
     std::map<std::pair<std::string, std::string>, std::size_t> counts;
     std::set<std::string_view> codes;
     std::set<std::string_view> texts;
-    for (const DtcRow& row : DtcTable()) {
+    for (DtcRow const& row : DtcTable()) {
         ++counts[{"maker", std::string(catalogue::makerName(static_cast<std::size_t>(row.maker)))}];
         ++counts[{row.maker == 0 ? "generic" : "makers", std::string(row.code, 2)}];
         codes.insert(row.code);
@@ -68,7 +68,7 @@ std::map<std::pair<std::string, std::string>, std::size_t> countRows()
 std::vector<std::string> textsOf(std::string_view maker, std::string_view code)
 {
     std::vector<std::string> texts;
-    for (const DtcRow& row : DtcTable()) {
+    for (DtcRow const& row : DtcTable()) {
         if (catalogue::makerName(static_cast<std::size_t>(row.maker)) == maker && row.code == code) {
             texts.emplace_back(row.text);
         }
@@ -84,21 +84,21 @@ bool isWellFormed(std::string_view code)
 
 TEST(DtcTable, CountsAreThoseOfTheManifest)
 {
-    const auto manifest = readManifest();
+    auto const manifest = readManifest();
     auto counted = countRows();
     ASSERT_FALSE(manifest.empty());
-    for (const auto& [key, count] : manifest) {
+    for (auto const& [key, count] : manifest) {
         EXPECT_EQ(counted[key], count.rows) << key.first << ' ' << key.second;
         counted.erase(key);
     }
-    for (const auto& [key, rows] : counted) {
+    for (auto const& [key, rows] : counted) {
         ADD_FAILURE() << key.first << ' ' << key.second << " has " << rows << " rows and no line in the manifest";
     }
 }
 
 TEST(DtcTable, ManifestNamesEveryMaker)
 {
-    const auto manifest = readManifest();
+    auto const manifest = readManifest();
     for (std::size_t maker = 0; maker < catalogue::makerCount(); ++maker) {
         EXPECT_EQ(manifest.count({"maker", std::string(catalogue::makerName(maker))}), 1U)
             << catalogue::makerName(maker);
@@ -108,7 +108,7 @@ TEST(DtcTable, ManifestNamesEveryMaker)
 TEST(DtcTable, ShapeIsTheWholeOfEighteenThousandRows)
 {
     std::size_t target = 0;
-    for (const auto& [key, count] : readManifest()) {
+    for (auto const& [key, count] : readManifest()) {
         target += key.first == "maker" ? count.target : 0;
     }
     EXPECT_EQ(target, 18201U);
@@ -117,7 +117,7 @@ TEST(DtcTable, ShapeIsTheWholeOfEighteenThousandRows)
 TEST(DtcTable, MakersRiseAndCodesRiseWithin)
 {
     DtcRow previous = DtcTable::row(0);
-    for (const DtcRow& row : DtcTable()) {
+    for (DtcRow const& row : DtcTable()) {
         ASSERT_LE(previous.maker, row.maker);
         if (previous.maker == row.maker) {
             ASSERT_LE(std::string_view(previous.code), std::string_view(row.code));
@@ -129,7 +129,7 @@ TEST(DtcTable, MakersRiseAndCodesRiseWithin)
 TEST(DtcTable, GenericCodesStandOnce)
 {
     std::set<std::string_view> codes;
-    for (const DtcRow& row : DtcTable()) {
+    for (DtcRow const& row : DtcTable()) {
         if (row.maker == 0) {
             EXPECT_TRUE(codes.insert(row.code).second) << row.code;
         }
@@ -138,7 +138,7 @@ TEST(DtcTable, GenericCodesStandOnce)
 
 TEST(DtcTable, TextsArePrintableAndOfTheRightLength)
 {
-    for (const DtcRow& row : DtcTable()) {
+    for (DtcRow const& row : DtcTable()) {
         const std::string_view text = row.text;
         EXPECT_TRUE(!text.empty() && text.size() <= 140) << row.code;
         EXPECT_TRUE(std::all_of(text.begin(), text.end(), [](char c) { return c >= ' ' && c <= '~'; })) << text;
@@ -150,16 +150,16 @@ TEST(DtcTable, TextsArePrintableAndOfTheRightLength)
 
 TEST(DtcTable, EachTextIsStoredOnce)
 {
-    std::map<std::string_view, const char*> places;
-    for (const DtcRow& row : DtcTable()) {
-        const auto place = places.emplace(row.text, row.text).first->second;
+    std::map<std::string_view, char const*> places;
+    for (DtcRow const& row : DtcTable()) {
+        auto const place = places.emplace(row.text, row.text).first->second;
         EXPECT_EQ(place, row.text) << row.text;
     }
 }
 
 TEST(DtcTable, GenericSamplesWordForWord)
 {
-    const std::pair<const char*, const char*> samples[] = {
+    const std::pair<char const*, char const*> samples[] = {
         {"B0001", "Driver Frontal Stage 1 Deployment Control"},
         {"C0035", "Right Front Wheel Speed Sensor Supply"},
         {"P0105", "Manifold Absolute Pressure/Barometric Pressure Sensor Circuit"},
@@ -169,14 +169,14 @@ TEST(DtcTable, GenericSamplesWordForWord)
         {"U0101", "Lost Communication with TCM"},
         {"U350C", "Control Module Cooling Fan Circuit/Open"},
     };
-    for (const auto& [code, text] : samples) {
+    for (auto const& [code, text] : samples) {
         EXPECT_EQ(textsOf("Generic", code), std::vector<std::string>{text});
     }
 }
 
 TEST(DtcTable, MakersSamplesWordForWord)
 {
-    const std::array<const char*, 3> samples[] = {
+    const std::array<char const*, 3> samples[] = {
         {"Buick", "P1300]", "Ignitor Circuit"},
         {"Chrysler", "P1000", "Cooling System Heat Valve Control Circuit"},
         {"Dodge", "P1000", "Cooling System Heat Valve Control Circuit"},
@@ -187,7 +187,7 @@ TEST(DtcTable, MakersSamplesWordForWord)
         {"Land Rover", "P15O9", "Idle Speed Control Short Circuit Fault"},
         {"Volvo", "P1770", "CMP Sensor Intake/Exhaust Signal Error"},
     };
-    for (const auto& [maker, code, text] : samples) {
+    for (auto const& [maker, code, text] : samples) {
         EXPECT_EQ(textsOf(maker, code), std::vector<std::string>{text}) << maker << ' ' << code;
     }
 }
@@ -201,11 +201,11 @@ TEST(DtcTable, MisspelledSampleIsKept)
 TEST(DtcTable, RepeatedCodesStandTwoToFourTimes)
 {
     std::map<std::pair<std::int32_t, std::string_view>, int> rows;
-    for (const DtcRow& row : DtcTable()) {
+    for (DtcRow const& row : DtcTable()) {
         ++rows[{row.maker, row.code}];
     }
     std::map<std::string_view, int> repeated;
-    for (const auto& [key, count] : rows) {
+    for (auto const& [key, count] : rows) {
         EXPECT_LE(count, 4) << key.second;
         if (count > 1) {
             ++repeated["all"];
@@ -223,7 +223,7 @@ TEST(DtcTable, MakersOfOnePlatformHaveTheSameRows)
 {
     using Rows = std::vector<std::pair<std::string_view, std::string_view>>;
     std::map<std::string_view, Rows> rows;
-    for (const DtcRow& row : DtcTable()) {
+    for (DtcRow const& row : DtcTable()) {
         rows[catalogue::makerName(static_cast<std::size_t>(row.maker))].emplace_back(row.code, row.text);
     }
     EXPECT_FALSE(rows["Chrysler"].empty() || rows["Citroen"].empty() || rows["Lincoln"].empty());
@@ -238,7 +238,7 @@ TEST(DtcTable, MakersOfOnePlatformHaveTheSameRows)
 TEST(DtcTable, GenericRowsStayInTheControlledRanges)
 {
     const std::set<std::string> generic = {"P0", "P2", "P3", "U0", "U3", "B0", "B3", "C0"};
-    for (const DtcRow& row : DtcTable()) {
+    for (DtcRow const& row : DtcTable()) {
         if (row.maker == 0) {
             EXPECT_EQ(generic.count(std::string(row.code, 2)), 1U) << row.code;
         }
@@ -248,7 +248,7 @@ TEST(DtcTable, GenericRowsStayInTheControlledRanges)
 TEST(DtcTable, AllCodesButTwoAreWellFormed)
 {
     std::set<std::string> malformed;
-    for (const DtcRow& row : DtcTable()) {
+    for (DtcRow const& row : DtcTable()) {
         if (!isWellFormed(row.code)) {
             malformed.emplace(row.code);
         }

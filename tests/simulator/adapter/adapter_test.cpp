@@ -51,7 +51,7 @@ TEST(Adapter, refusesWhatItDoesNotKnow)
 {
     auto host = unplugged();
     host.ask("ATE0");
-    for (const char* command : {"ATXYZ", "ATAL1", "ATE2", "ATSPF", "BRD08", "ATBRD099", "ATAMC", "ATCERF1", "1",
+    for (char const* command : {"ATXYZ", "ATAL1", "ATE2", "ATSPF", "BRD08", "ATBRD099", "ATAMC", "ATCERF1", "1",
                                 "HELLO", "AT", "ATCF0", "ATSH12", "STI", "VTI", "AT@2"}) {
         EXPECT_EQ(host.ask(command), "?\r\r>") << command;
     }
@@ -61,7 +61,7 @@ TEST(Adapter, knowsTheCommandsOfItsVersion)
 {
     auto host = unplugged();
     host.ask("ATE0");
-    for (const char* command :
+    for (char const* command :
          {"ATAL",    "ATNL",           "ATAR",      "ATAT0",   "ATAT1",    "ATAT2",         "ATBI",       "ATBRT0F",
           "ATCAF0",  "ATCAF1",         "ATCEA",     "ATCEA04", "ATCF111",  "ATCF00000111",  "ATCFC0",     "ATCFC1",
           "ATCM7FF", "ATCM1FFFFFFF",   "ATCP18",    "ATCRA",   "ATCRA7C0", "ATCRA000007C0", "ATCV1234",   "ATD0",
@@ -195,9 +195,9 @@ TEST(Adapter, newClientFindsTheSettingsAndNoOldBytes)
 
 struct FamilyCase
 {
-    const char* adapter;
-    const char* command;
-    const char* reply;
+    char const* adapter;
+    char const* command;
+    char const* reply;
 };
 
 const FamilyCase familyCases[] = {
@@ -233,7 +233,7 @@ const FamilyCase familyCases[] = {
 
 TEST(Adapter, familiesDifferInTheirCommands)
 {
-    for (const auto& row : familyCases) {
+    for (auto const& row : familyCases) {
         auto host = unplugged(row.adapter);
         host.ask("ATE0");
         EXPECT_EQ(host.ask(row.command), std::string(row.reply) + "\r\r>") << row.adapter << " " << row.command;
@@ -249,7 +249,7 @@ TEST(Adapter, silentOneSaysNothing)
 
 TEST(Adapter, everyProfileAnswersItsName)
 {
-    for (const auto& key : obdsim::profileKeys()) {
+    for (auto const& key : obdsim::profileKeys()) {
         auto host = unplugged(key);
         const std::string reply = host.ask("ATI");
         const std::string banner = obdsim::findProfile(key)->banner;

@@ -6,7 +6,7 @@ namespace {
 
 using obdsim::Time;
 
-constexpr const char* twoModules = R"(
+constexpr char const* twoModules = R"(
 name = "Two modules"
 protocol = 6
 padding = "00"
@@ -25,7 +25,7 @@ latency = 12
 "0904" = "49 04 01 30 43 57 39 30 36 35 35 36 45 43 2B 30 35 36 32"
 )";
 
-Conversation ready(const std::string& toml, std::initializer_list<const char*> commands)
+Conversation ready(std::string const& toml, std::initializer_list<char const*> commands)
 {
     auto host = withVehicle(toml, "elm327-v2.3");
     host.ask("ATE0");
@@ -54,7 +54,7 @@ TEST(BusRequest, longMessageHasLengthAndLineNumbersWithoutHeaders)
 
 TEST(BusRequest, framesOfTwoModulesMixByTheirTimes)
 {
-    constexpr const char* mixed = R"(
+    constexpr char const* mixed = R"(
 name = "Both long"
 protocol = 6
 padding = "00"
@@ -94,7 +94,7 @@ TEST(BusRequest, silenceLastsAsLongAsTheTimeOut)
 
 TEST(BusRequest, moduleSlowerThanTheTimeOutIsNotHeard)
 {
-    constexpr const char* slow = R"(
+    constexpr char const* slow = R"(
 name = "Slow"
 protocol = 6
 [[module]]
@@ -107,7 +107,7 @@ raw = { "010D" = "41 0D 37" }
     EXPECT_EQ(host.ask({"ATSTFF", "010D"}), "410D37\r\r>");
 }
 
-constexpr const char* busy = R"(
+constexpr char const* busy = R"(
 name = "Busy"
 protocol = 6
 padding = "00"
@@ -184,10 +184,10 @@ TEST(BusRequest, tooLongRequestIsRefused)
 
 struct SearchCase
 {
-    const char* vehicle;
+    char const* vehicle;
     int number;
-    const char* description;
-    const char* reply; ///< to 0100 with headers, first characters
+    char const* description;
+    char const* reply; ///< to 0100 with headers, first characters
 };
 
 const SearchCase searchCases[] = {
@@ -204,8 +204,8 @@ const SearchCase searchCases[] = {
 
 TEST(ProtocolSearch, findsEachOfTheNine)
 {
-    for (const auto& row : searchCases) {
-        for (const char* automatic : {"ATSP0", "ATTP0"}) {
+    for (auto const& row : searchCases) {
+        for (char const* automatic : {"ATSP0", "ATTP0"}) {
             auto host = simulated(row.vehicle);
             const std::string reply = host.ask({"ATE0", automatic, "ATH1", "0100"});
             EXPECT_EQ(reply.substr(0, 13), "SEARCHING...\r") << row.vehicle;
@@ -235,9 +235,9 @@ TEST(ProtocolSearch, spaTriesTheRestWhenTheChosenOneFails)
 
 struct WrongCase
 {
-    const char* vehicle;
-    const char* protocol;
-    const char* reply;
+    char const* vehicle;
+    char const* protocol;
+    char const* reply;
 };
 
 const WrongCase wrongCases[] = {
@@ -255,7 +255,7 @@ const WrongCase wrongCases[] = {
 
 TEST(ProtocolSearch, wrongChosenProtocolGivesTheErrorsOfTheChip)
 {
-    for (const auto& row : wrongCases) {
+    for (auto const& row : wrongCases) {
         auto host = simulated(row.vehicle);
         EXPECT_EQ(host.ask({"ATE0", row.protocol, "0100"}), std::string(row.reply) + "\r\r>") << row.protocol;
         EXPECT_EQ(host.ask("0100"), std::string(row.reply) + "\r\r>") << "again";

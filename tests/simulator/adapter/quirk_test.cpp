@@ -9,7 +9,7 @@ namespace {
 using obdsim::Quirk;
 using obdsim::Time;
 
-constexpr const char* car = R"(
+constexpr char const* car = R"(
 name = "Car"
 protocol = 6
 padding = "AA"
@@ -27,7 +27,7 @@ Conversation clone(Quirk quirk)
 
 TEST(Quirk, namesAreUniqueAndFound)
 {
-    const auto names = obdsim::quirkNames();
+    auto const names = obdsim::quirkNames();
     EXPECT_EQ(names.size(), obdsim::quirkCount);
     EXPECT_EQ(std::set<std::string>(names.begin(), names.end()).size(), names.size());
     for (std::size_t i = 0; i < names.size(); ++i) {
@@ -110,7 +110,7 @@ TEST(Quirk, piecesOfAReplyComeApart)
     host.ask("ATE0");
     host.peer().receive("ATI\r");
     std::vector<std::string> pieces;
-    while (const auto next = host.peer().nextOutput()) {
+    while (auto const next = host.peer().nextOutput()) {
         pieces.push_back(host.peer().advanceTo(*next));
     }
     EXPECT_EQ(pieces, (std::vector<std::string>{"ELM32", "7 v1.", "5\r", "\r", ">"}));
@@ -128,7 +128,7 @@ TEST(Quirk, searchNotices)
 
 TEST(Quirk, busStartOfClones)
 {
-    constexpr const char* kLine = R"(
+    constexpr char const* kLine = R"(
 name = "K line"
 protocol = 3
 [[module]]

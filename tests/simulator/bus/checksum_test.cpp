@@ -8,7 +8,7 @@ using obdsim::Bytes;
 
 struct Case
 {
-    const char* message;
+    char const* message;
     std::uint8_t check;
 };
 
@@ -38,14 +38,14 @@ const Case crcCases[] = {
 
 TEST(Checksum, isTheSumOnIso9141AndKwp)
 {
-    for (const auto& row : sumCases) {
+    for (auto const& row : sumCases) {
         EXPECT_EQ(obdsim::sumChecksum(*obdsim::parseHex(row.message)), row.check) << row.message;
     }
 }
 
 TEST(Checksum, isTheCrcOnJ1850)
 {
-    for (const auto& row : crcCases) {
+    for (auto const& row : crcCases) {
         EXPECT_EQ(obdsim::j1850Crc(*obdsim::parseHex(row.message)), row.check) << row.message;
     }
 }

@@ -10,13 +10,13 @@ using obdsim::Frame;
 using obdsim::frameReply;
 using obdsim::Padding;
 
-Bytes bytes(const char* text)
+Bytes bytes(char const* text)
 {
     return *obdsim::parseHex(text);
 }
 
 /// A frame as one line: header, data, check byte.
-std::string text(const Frame& frame)
+std::string text(Frame const& frame)
 {
     Bytes all = frame.header;
     all.insert(all.end(), frame.data.begin(), frame.data.end());
@@ -26,11 +26,11 @@ std::string text(const Frame& frame)
     return obdsim::hexText(all, " ");
 }
 
-std::vector<std::string> texts(int protocol, std::uint32_t source, const char* payload, Padding padding = std::nullopt,
+std::vector<std::string> texts(int protocol, std::uint32_t source, char const* payload, Padding padding = std::nullopt,
                                bool everyone = true)
 {
     std::vector<std::string> result;
-    for (const auto& frame : frameReply(*findProtocol(protocol), source, everyone, bytes(payload), padding)) {
+    for (auto const& frame : frameReply(*findProtocol(protocol), source, everyone, bytes(payload), padding)) {
         result.push_back(text(frame));
     }
     return result;
@@ -76,7 +76,7 @@ TEST(Frame, canLastFrameIsFilledAndThoseBeforeAreFull)
 TEST(Frame, canSequenceNumberWrapsFromFifteenToZero)
 {
     const Bytes payload(6 + 7 * 17, 0x11);
-    const auto frames = frameReply(*findProtocol(6), 0x7E8, true, payload, std::nullopt);
+    auto const frames = frameReply(*findProtocol(6), 0x7E8, true, payload, std::nullopt);
     ASSERT_EQ(frames.size(), 18U);
     EXPECT_EQ(frames[1].data[0], 0x21);
     EXPECT_EQ(frames[15].data[0], 0x2F);
@@ -93,7 +93,7 @@ TEST(Frame, kwpFormatByteHoldsTheLength)
 TEST(Frame, kwpMessageAboveSixtyThreeBytesHasALengthByte)
 {
     const Bytes payload(64, 0x00);
-    const auto frames = frameReply(*findProtocol(5), 0x10, true, payload, std::nullopt);
+    auto const frames = frameReply(*findProtocol(5), 0x10, true, payload, std::nullopt);
     EXPECT_EQ(frames[0].header, (Bytes{0x80, 0xF1, 0x10, 0x40}));
 }
 
@@ -113,7 +113,7 @@ TEST(Frame, physicallyAddressedJ1850HasHeadersOfItsOwn)
 struct TargetCase
 {
     int protocol;
-    const char* header;
+    char const* header;
     bool everyone;
     std::uint32_t module;
 };
@@ -136,8 +136,8 @@ const TargetCase targetCases[] = {
 
 TEST(Frame, requestHeaderTellsWhomItIsFor)
 {
-    for (const auto& row : targetCases) {
-        const auto target = obdsim::targetOf(*findProtocol(row.protocol), bytes(row.header));
+    for (auto const& row : targetCases) {
+        auto const target = obdsim::targetOf(*findProtocol(row.protocol), bytes(row.header));
         ASSERT_TRUE(target) << row.header;
         EXPECT_EQ(target->everyone, row.everyone) << row.header;
         EXPECT_EQ(target->module, row.module) << row.header;
@@ -149,8 +149,8 @@ TEST(Frame, requestHeaderTellsWhomItIsFor)
 TEST(Frame, standardHeaderReachesEveryoneOnEachProtocol)
 {
     for (int number = 1; number <= 9; ++number) {
-        const auto& protocol = *findProtocol(number);
-        const auto target = obdsim::targetOf(protocol, obdsim::functionalHeader(protocol));
+        auto const& protocol = *findProtocol(number);
+        auto const target = obdsim::targetOf(protocol, obdsim::functionalHeader(protocol));
         ASSERT_TRUE(target) << number;
         EXPECT_TRUE(target->everyone) << number;
     }

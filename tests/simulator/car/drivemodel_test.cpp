@@ -63,7 +63,7 @@ TEST(DriveModel, engineWarmsUp)
 
 TEST(DriveModel, valuesStayInTheRangesOfAnEngine)
 {
-    for (const bool compression : {false, true}) {
+    for (bool const compression : {false, true}) {
         EngineData engine;
         engine.compression = compression;
         engine.boosted = compression;
@@ -121,7 +121,7 @@ const PidCase pidCases[] = {
 
 TEST(LivePids, areTheFormulasOfTheStandardTurnedRound)
 {
-    for (const auto& row : pidCases) {
+    for (auto const& row : pidCases) {
         DriveState state;
         row.set(state);
         EXPECT_EQ(obdsim::livePid(row.pid, state, {}), row.data) << obdsim::hexByte(row.pid);

@@ -11,7 +11,7 @@ using obdsim::Bytes;
 using obdsim::Time;
 using obdsim::Vehicle;
 
-constexpr const char* moduleText = R"(
+constexpr char const* moduleText = R"(
 lamp = true
 stored = ["P0100", "P0200", "P0300", "C0300"]
 pending = []
@@ -38,7 +38,7 @@ spark_counters = [831, 3233, 913, 831]
 id = "01"
 )";
 
-constexpr const char* canTests = R"(
+constexpr char const* canTests = R"(
 [[module.routines]]
 id = "02"
 refusal = "22"
@@ -65,7 +65,7 @@ minimum = 65446
 maximum = 160
 )";
 
-constexpr const char* lineTests = R"(
+constexpr char const* lineTests = R"(
 [[module.routines]]
 id = "02"
 data = "01"
@@ -102,10 +102,10 @@ Vehicle kwpCar()
 }
 
 /// The payloads that answer `request`, as texts.
-std::vector<std::string> ask(Vehicle& vehicle, const char* request, Time now = Time(0))
+std::vector<std::string> ask(Vehicle& vehicle, char const* request, Time now = Time(0))
 {
     std::vector<std::string> payloads;
-    for (const auto& message : vehicle.request({true, 0}, *obdsim::parseHex(request), now)) {
+    for (auto const& message : vehicle.request({true, 0}, *obdsim::parseHex(request), now)) {
         payloads.push_back(obdsim::hexText(message.payload, " "));
     }
     return payloads;
@@ -117,7 +117,7 @@ struct MaskCase
 {
     std::set<std::uint8_t> ids;
     std::uint8_t base;
-    const char* mask; ///< null: not answered
+    char const* mask; ///< null: not answered
 };
 
 const MaskCase maskCases[] = {
@@ -133,8 +133,8 @@ const MaskCase maskCases[] = {
 
 TEST(SupportedMask, hasABitForEachIdAndOneForTheRest)
 {
-    for (const auto& row : maskCases) {
-        const auto mask = obdsim::supportedMask(row.ids, row.base);
+    for (auto const& row : maskCases) {
+        auto const mask = obdsim::supportedMask(row.ids, row.base);
         EXPECT_EQ(mask ? obdsim::hexText(*mask) : "none", row.mask == nullptr ? "none" : row.mask);
     }
 }

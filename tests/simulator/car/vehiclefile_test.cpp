@@ -12,11 +12,11 @@ namespace {
 using obdsim::parseVehicle;
 using obdsim::VehicleFileError;
 
-std::string errorOf(const std::string& text)
+std::string errorOf(std::string const& text)
 {
     try {
         parseVehicle(text, "car.toml");
-    } catch (const VehicleFileError& error) {
+    } catch (VehicleFileError const& error) {
         return error.what();
     }
     return "none";
@@ -62,7 +62,7 @@ TEST(VehicleFile, errorsNameFileAndLine)
         {"name = \"Car\"\nprotocol = 6\n[engine]\nfuel = \"coal\"\n",
          "car.toml:4: \"fuel\" must be \"petrol\" or \"diesel\""},
     };
-    for (const auto& row : cases) {
+    for (auto const& row : cases) {
         EXPECT_EQ(errorOf(row.text).substr(0, row.error.size()), row.error) << row.text;
     }
 }
@@ -75,16 +75,16 @@ TEST(VehicleFile, codesAreTwoBytes)
     EXPECT_EQ(obdsim::parseCode("B0200"), 0x8200);
     EXPECT_EQ(obdsim::parseCode("U0100"), 0xC100);
     EXPECT_EQ(obdsim::parseCode("P3FFF"), 0x3FFF);
-    for (const char* text : {"", "P", "P013", "P01333", "X0133", "P4000", "P01G3", "p0133"}) {
+    for (char const* text : {"", "P", "P013", "P01333", "X0133", "P4000", "P01G3", "p0133"}) {
         EXPECT_FALSE(obdsim::parseCode(text)) << text;
     }
 }
 
 TEST(VehicleLibrary, hasTheVehiclesThatAreToldAbout)
 {
-    const auto names = obdsim::vehicleNames();
+    auto const names = obdsim::vehicleNames();
     EXPECT_TRUE(std::is_sorted(names.begin(), names.end()));
-    for (const char* name : {"petrol-can11", "diesel-can29", "petrol-iso9141", "petrol-kwp-fast", "petrol-vpw",
+    for (char const* name : {"petrol-can11", "diesel-can29", "petrol-iso9141", "petrol-kwp-fast", "petrol-vpw",
                              "petrol-pwm", "real-skoda", "real-hyundai-i40"}) {
         EXPECT_NE(std::find(names.begin(), names.end(), name), names.end()) << name;
     }
@@ -92,12 +92,12 @@ TEST(VehicleLibrary, hasTheVehiclesThatAreToldAbout)
 
 TEST(VehicleLibrary, everyVehicleLoads)
 {
-    for (const auto& name : obdsim::vehicleNames()) {
-        const auto data = obdsim::loadVehicle(name);
+    for (auto const& name : obdsim::vehicleNames()) {
+        auto const data = obdsim::loadVehicle(name);
         EXPECT_FALSE(data.name.empty()) << name;
         EXPECT_FALSE(data.modules.empty()) << name;
-        for (const auto& module : data.modules) {
-            const std::string& vin = module.info.vin;
+        for (auto const& module : data.modules) {
+            std::string const& vin = module.info.vin;
             EXPECT_TRUE(vin.empty() || vin.size() == 17U) << name;
             EXPECT_EQ(vin.find_first_of("IOQ"), std::string::npos) << name;
         }
@@ -115,7 +115,7 @@ TEST(VehicleLibrary, readsAFileAndNamesAMissingOne)
     try {
         obdsim::loadVehicle("no-such-car");
         FAIL();
-    } catch (const VehicleFileError& error) {
+    } catch (VehicleFileError const& error) {
         EXPECT_NE(std::string(error.what()).find("no-such-car: no such file"), std::string::npos);
         EXPECT_NE(std::string(error.what()).find("petrol-can11"), std::string::npos) << "tells what there is";
     }

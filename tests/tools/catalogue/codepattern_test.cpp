@@ -10,14 +10,14 @@ using Codes = std::vector<std::string>;
 
 TEST(CodePattern, KnowsTroubleCodes)
 {
-    for (const char* code : {"P0000", "P0420", "P0A0F", "B3FFF", "C1234", "U350C"}) {
+    for (char const* code : {"P0000", "P0420", "P0A0F", "B3FFF", "C1234", "U350C"}) {
         EXPECT_TRUE(isTroubleCode(code)) << code;
     }
 }
 
 TEST(CodePattern, RefusesWhatIsNoTroubleCode)
 {
-    for (const char* code :
+    for (char const* code :
          {"", "P", "P042", "P04200", "X0420", "p0420", "P042g", "P042a", "P4000", "P15O9", "P1300]"}) {
         EXPECT_FALSE(isTroubleCode(code)) << code;
     }
@@ -43,7 +43,7 @@ TEST(CodePattern, RefusesRangesThatDoNotRise)
 
 TEST(CodePattern, RefusesRangesOfNoCodes)
 {
-    for (const char* word : {"-", "P0420-", "-P0420", "P0420-P04", "P0420-P0421-P0422"}) {
+    for (char const* word : {"-", "P0420-", "-P0420", "P0420-P04", "P0420-P0421-P0422"}) {
         EXPECT_THROW(expandCodes(word), catalogue::SourceError) << word;
     }
 }

@@ -20,7 +20,7 @@ TEST(Makers, FindsEachNameUnderItsNumber)
 
 TEST(Makers, FindsNoOtherName)
 {
-    for (const char* name : {"", "ford", "Ford ", "Tesla"}) {
+    for (char const* name : {"", "ford", "Ford ", "Tesla"}) {
         EXPECT_FALSE(catalogue::findMaker(name)) << name;
     }
 }

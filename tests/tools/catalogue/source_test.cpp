@@ -7,14 +7,14 @@ namespace {
 using catalogue::Source;
 using Problems = std::vector<std::string>;
 
-Source read(const std::string& text, Source source = {})
+Source read(std::string const& text, Source source = {})
 {
     std::istringstream input(text);
     catalogue::readSource(input, "test.codes", source);
     return source;
 }
 
-Problems problemsOf(const std::string& text)
+Problems problemsOf(std::string const& text)
 {
     return read(text).problems;
 }

@@ -9,21 +9,21 @@ using catalogue::Source;
 using Problems = std::vector<std::string>;
 
 // Reads texts as files "1.codes", "2.codes" and so on.
-Source read(const std::vector<std::string>& files)
+Source read(std::vector<std::string> const& files)
 {
     Source source;
     int number = 0;
-    for (const std::string& text : files) {
+    for (std::string const& text : files) {
         std::istringstream input(text);
         catalogue::readSource(input, std::to_string(++number) + ".codes", source);
     }
     return source;
 }
 
-std::string summary(const std::vector<Row>& table)
+std::string summary(std::vector<Row> const& table)
 {
     std::string text;
-    for (const Row& row : table) {
+    for (Row const& row : table) {
         text += std::to_string(row.maker) + ' ' + row.code + ' ' + row.text + '\n';
     }
     return text;

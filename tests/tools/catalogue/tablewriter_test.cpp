@@ -6,14 +6,14 @@ namespace {
 
 using catalogue::Row;
 
-std::string write(const std::vector<Row>& table)
+std::string write(std::vector<Row> const& table)
 {
     std::ostringstream output;
     catalogue::writeTable(output, table);
     return output.str();
 }
 
-std::size_t occurrences(const std::string& text, const std::string& part)
+std::size_t occurrences(std::string const& text, std::string const& part)
 {
     std::size_t count = 0;
     for (std::size_t at = text.find(part); at != std::string::npos; at = text.find(part, at + 1)) {

@@ -50,14 +50,14 @@ TEST(TextPattern, RefusesAnotherNumberOfTextsThanCodes)
 
 TEST(TextPattern, RefusesBracesThatDoNotMatch)
 {
-    for (const char* pattern : {"{pair", "pair}", "{{pair}}", "}pair{"}) {
+    for (char const* pattern : {"{pair", "pair}", "{{pair}}", "}pair{"}) {
         EXPECT_THROW(expandText(pattern, 2, lists), SourceError) << pattern;
     }
 }
 
 TEST(TextPattern, RefusesGroupsWithoutMeaning)
 {
-    for (const char* pattern :
+    for (char const* pattern :
          {"{}", "{other}", "{4-1}", "{A-A}", "{a-c}", "{1-C}", "{Low|}", "{|}", "{1-99999999999}"}) {
         EXPECT_THROW(expandText(pattern, 2, lists), SourceError) << pattern;
     }
