@@ -1,4 +1,4 @@
-#include "libobd/src/dtcreader.h"
+#include "libobd/catalogue/dtcreader.h"
 
 #include <benchmark/benchmark.h>
 #include <obd/library.h>

@@ -6,11 +6,11 @@
 // passes between the end of a reading on the worker and the next request, for the way by the application's thread; with
 // one parameter nothing else is queued meanwhile, and the worker polls the empty queue every 10 ms.
 
+#include "libvelmora/session/cyclemeter.h"
+#include "libvelmora/session/dispatchloop.h"
 #include "simulator/simulation.h"
 #include "tests/support/memorysettings.h"
 #include "tests/support/peerconnection.h"
-#include "velmora/cyclemeter.h"
-#include "velmora/dispatchloop.h"
 
 #include <benchmark/benchmark.h>
 #include <obd/iconnectionmanager.h>

@@ -10,7 +10,7 @@
 #include <obd/iobdproxy.h>
 #include <obd/iquery.h>
 
-#include "libobd/src/fetcher.h"
+#include "libobd/dispatch/fetcher.h"
 
 #include <sys/resource.h>
 #include <thread>

@@ -2,8 +2,8 @@
 // keeps: decodeText into one piece, decodeFrames into one piece for each frame, as the parser must hand it out. Items
 // are characters of the reply, so the rates of replies of different length compare: linear cost shows as the same rate.
 
-#include "libobd/src/hextext.h"
-#include "libobd/src/messageparser.h"
+#include "libobd/bytes/hextext.h"
+#include "libobd/message/messageparser.h"
 
 #include <benchmark/benchmark.h>
 

@@ -4,7 +4,7 @@
 // The counters tell classes an iteration, and memory allocations a class.
 
 #include "bench/allocationcount.h"
-#include "libobd/src/parameterfactory.h"
+#include "libobd/module/parameterfactory.h"
 #include "tests/support/fakeecu.h"
 #include "tests/support/payload.h"
 

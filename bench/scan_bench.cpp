@@ -3,8 +3,8 @@
 // waits_ms: what the dialogue itself prescribes between a reply and the next request: 200 ms behind a command to the
 // adapter, which may have more to say, and 30 ms behind a request of a service. over_ms: all the rest.
 
-#include "velmora/interrupt.h"
-#include "velmora/vehiclereader.h"
+#include "libvelmora/read/vehiclereader.h"
+#include "program/terminal/interrupt.h"
 
 #include <atomic>
 #include <benchmark/benchmark.h>

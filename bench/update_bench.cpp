@@ -2,10 +2,10 @@
 // a prepared reply map, whose copying is part of the figure, as the parser's filling of it is on the real road.
 
 #include "bench/allocationcount.h"
-#include "libobd/src/parameterfactory.h"
+#include "libobd/module/parameterfactory.h"
 #include "tests/support/fakedevice.h"
 
-#include "libobd/src/obdproxy.h"
+#include "libobd/module/obdproxy.h"
 
 #include <benchmark/benchmark.h>
 #include <obd/powertrainparameter.h>

@@ -1,7 +1,7 @@
 #pragma once
 
-#include <common/ieventproducer.h>
 #include <common/logrecord.h>
+#include <tervex/ieventproducer.h>
 
 #include <mutex>
 #include <shared_mutex>

@@ -7,10 +7,10 @@
 //   - a whole frame in front of the text adds its payload and changes nothing else;
 //   - on CAN the plain reading, which decodes everything that is left for every frame, gives the same.
 
-#include "libobd/src/bytefilter.h"
-#include "libobd/src/elmtransport.h"
-#include "libobd/src/hextext.h"
-#include "libobd/src/messageparser.h"
+#include "libobd/adapter/elmtransport.h"
+#include "libobd/bytes/bytefilter.h"
+#include "libobd/bytes/hextext.h"
+#include "libobd/message/messageparser.h"
 
 #include "tests/support/plaincanparser.h"
 

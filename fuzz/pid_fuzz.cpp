@@ -3,8 +3,8 @@
 // payloads at the length that the third byte tells. Each is either refused and changes nothing, or is read into values
 // of the sensors that the parameter announces.
 
+#include "libobd/module/parameterfactory.h"
 #include "libobd/powertrain/fueltrim.h"
-#include "libobd/src/parameterfactory.h"
 #include "tests/support/fakeecu.h"
 #include "tests/support/payloadproperty.h"
 

@@ -1,17 +1,7 @@
 include(CMakePackageConfigHelpers)
 
 install(TARGETS obd EXPORT velmoraTargets)
-install(DIRECTORY include/obd DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/velmora FILES_MATCHING PATTERN "*.h")
-# The public face is built on these templates of the common room.
-install(
-    FILES ${PROJECT_SOURCE_DIR}/common/event.h
-          ${PROJECT_SOURCE_DIR}/common/ieventlistener.h
-          ${PROJECT_SOURCE_DIR}/common/ieventproducer.h
-          ${PROJECT_SOURCE_DIR}/common/inotifier.h
-          ${PROJECT_SOURCE_DIR}/common/notifier.h
-          ${PROJECT_SOURCE_DIR}/common/observer.h
-    DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/velmora/common
-)
+install(DIRECTORY include/obd include/tervex DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/velmora FILES_MATCHING PATTERN "*.h")
 install(
     EXPORT velmoraTargets
     NAMESPACE velmora::

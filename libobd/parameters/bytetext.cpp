@@ -1,6 +1,6 @@
 #include "libobd/parameters/bytetext.h"
 
-#include "libobd/src/hexformat.h"
+#include "libobd/bytes/hexformat.h"
 
 #include <algorithm>
 

@@ -1,10 +1,10 @@
 #include "libobd/parameters/dtcparameter.h"
 
+#include "libobd/catalogue/dtcreader.h"
+#include "libobd/message/protocolfamily.h"
 #include "libobd/parameters/bytetext.h"
 #include "libobd/parameters/dtctostring.h"
 #include "libobd/parameters/replychecks.h"
-#include "libobd/src/dtcreader.h"
-#include "libobd/src/protocolfamily.h"
 
 #include <common/logrecord.h>
 

@@ -1,7 +1,7 @@
 #include "libobd/parameters/dtctostring.h"
 
-#include "libobd/src/bytereader.h"
-#include "libobd/src/hexformat.h"
+#include "libobd/bytes/bytereader.h"
+#include "libobd/bytes/hexformat.h"
 
 namespace obd {
 

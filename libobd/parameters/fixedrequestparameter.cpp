@@ -1,7 +1,7 @@
 #include "libobd/parameters/fixedrequestparameter.h"
 
+#include "libobd/message/protocolfamily.h"
 #include "libobd/parameters/replychecks.h"
-#include "libobd/src/protocolfamily.h"
 
 #include <utility>
 

@@ -1,10 +1,10 @@
 #include "libobd/parameters/identificationnumberparser.h"
 
+#include "libobd/bytes/bytereader.h"
 #include "libobd/parameters/bytetext.h"
 #include "libobd/parameters/replychecks.h"
 #include "libobd/parameters/saelines.h"
 #include "libobd/parameters/vehicleinformation.h"
-#include "libobd/src/bytereader.h"
 
 #include <common/logrecord.h>
 

@@ -1,7 +1,7 @@
 #pragma once
 
 #include "libobd/parameters/imonitortestitem.h"
-#include "libobd/src/iunitscaling.h"
+#include "libobd/value/iunitscaling.h"
 
 #include <memory>
 

@@ -1,9 +1,9 @@
 #include "libobd/parameters/monitortestitemparser.h"
 
+#include "libobd/bytes/bytereader.h"
 #include "libobd/parameters/canmonitortestitem.h"
 #include "libobd/parameters/monitortestitem.h"
-#include "libobd/src/bytereader.h"
-#include "libobd/src/unitscalingfactory.h"
+#include "libobd/value/unitscalingfactory.h"
 
 #include <common/logrecord.h>
 

@@ -1,11 +1,11 @@
 #include "libobd/parameters/monitortestresult.h"
 
+#include "libobd/message/protocolfamily.h"
 #include "libobd/parameters/bytetext.h"
 #include "libobd/parameters/monitortestitemparser.h"
 #include "libobd/parameters/monitortesttexts.h"
 #include "libobd/parameters/replychecks.h"
 #include "libobd/parameters/saelines.h"
-#include "libobd/src/protocolfamily.h"
 
 #include <common/logrecord.h>
 

@@ -1,6 +1,6 @@
 #include "libobd/parameters/monitortesttexts.h"
 
-#include "libobd/src/hexformat.h"
+#include "libobd/bytes/hexformat.h"
 
 namespace obd {
 namespace {

@@ -2,7 +2,7 @@
 
 #include "libobd/parameters/monitortesttexts.h"
 #include "libobd/parameters/replychecks.h"
-#include "libobd/src/unitscalingfactory.h"
+#include "libobd/value/unitscalingfactory.h"
 
 #include <common/logrecord.h>
 

@@ -1,8 +1,8 @@
 #include "libobd/parameters/performancetracking.h"
 
+#include "libobd/bytes/bytereader.h"
 #include "libobd/parameters/replychecks.h"
 #include "libobd/parameters/saelines.h"
-#include "libobd/src/bytereader.h"
 
 #include <common/logrecord.h>
 

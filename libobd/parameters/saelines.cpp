@@ -1,6 +1,6 @@
 #include "libobd/parameters/saelines.h"
 
-#include "libobd/src/bytereader.h"
+#include "libobd/bytes/bytereader.h"
 
 #include <common/logrecord.h>
 

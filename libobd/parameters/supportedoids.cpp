@@ -1,7 +1,7 @@
 #include "libobd/parameters/supportedoids.h"
 
-#include "libobd/src/bytereader.h"
-#include "libobd/src/protocolfamily.h"
+#include "libobd/bytes/bytereader.h"
+#include "libobd/message/protocolfamily.h"
 
 #include <common/logrecord.h>
 

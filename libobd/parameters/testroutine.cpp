@@ -1,7 +1,7 @@
 #include "libobd/parameters/testroutine.h"
 
+#include "libobd/message/protocolfamily.h"
 #include "libobd/parameters/replychecks.h"
-#include "libobd/src/protocolfamily.h"
 
 namespace obd {
 namespace {

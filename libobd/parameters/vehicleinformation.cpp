@@ -1,7 +1,7 @@
 #include "libobd/parameters/vehicleinformation.h"
 
+#include "libobd/message/protocolfamily.h"
 #include "libobd/parameters/saelines.h"
-#include "libobd/src/protocolfamily.h"
 
 #include <common/logrecord.h>
 

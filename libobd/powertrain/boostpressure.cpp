@@ -1,6 +1,6 @@
 #include "libobd/powertrain/boostpressure.h"
 
-#include "libobd/src/unitconversion.h"
+#include "libobd/value/unitconversion.h"
 
 #include <common/clock.h>
 #include <obd/iobdproxy.h>

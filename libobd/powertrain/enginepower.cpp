@@ -1,6 +1,6 @@
 #include "libobd/powertrain/enginepower.h"
 
-#include "libobd/src/unitconversion.h"
+#include "libobd/value/unitconversion.h"
 
 #include <obd/iobdproxy.h>
 

@@ -1,8 +1,8 @@
 #include "libobd/powertrain/freezeframetroublecode.h"
 
+#include "libobd/catalogue/dtcreader.h"
 #include "libobd/parameters/dtctostring.h"
 #include "libobd/parameters/replychecks.h"
-#include "libobd/src/dtcreader.h"
 
 #include <obd/sensorvalue.h>
 

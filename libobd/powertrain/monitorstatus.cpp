@@ -1,6 +1,6 @@
 #include "libobd/powertrain/monitorstatus.h"
 
-#include "libobd/src/bytereader.h"
+#include "libobd/bytes/bytereader.h"
 
 #include <obd/sensorinfo.h>
 #include <obd/sensorvalue.h>

@@ -1,7 +1,7 @@
 #pragma once
 
 #include "libobd/powertrain/quantity.h"
-#include "libobd/src/unitconversion.h"
+#include "libobd/value/unitconversion.h"
 
 // The quantities that sensors measure, with their display ranges and decimals in both unit systems.
 namespace obd::quantities {

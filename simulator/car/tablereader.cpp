@@ -166,7 +166,7 @@ void TableReader::tables(std::string_view key, std::function<void(TableReader&)>
     }
 }
 
-void TableReader::entries(std::function<void(const Bytes&, const std::vector<Bytes>&)> const& read)
+void TableReader::entries(std::function<void(Bytes const&, std::vector<Bytes> const&)> const& read)
 {
     for (auto const& [key, node] : m_table) {
         std::vector<Bytes> values;
@@ -181,7 +181,7 @@ void TableReader::entries(std::function<void(const Bytes&, const std::vector<Byt
     }
 }
 
-void TableReader::tableEntries(std::function<void(const Bytes&, TableReader&)> const& read)
+void TableReader::tableEntries(std::function<void(Bytes const&, TableReader&)> const& read)
 {
     for (auto const& [key, node] : m_table) {
         if (!node.is_table()) {

@@ -44,10 +44,10 @@ public:
 
     /// For tables whose keys are hexadecimal bytes: each key with its value,
     /// which is one text or an array of texts.
-    void entries(std::function<void(const Bytes& key, const std::vector<Bytes>& values)> const& read);
+    void entries(std::function<void(Bytes const& key, std::vector<Bytes> const& values)> const& read);
 
     /// The same for keys with a table behind each.
-    void tableEntries(std::function<void(const Bytes& key, TableReader& value)> const& read);
+    void tableEntries(std::function<void(Bytes const& key, TableReader& value)> const& read);
 
     void finish();
 

@@ -1,5 +1,5 @@
-#include <common/notifier.h>
 #include <gtest/gtest.h>
+#include <tervex/notifier.h>
 
 #include <functional>
 #include <memory>

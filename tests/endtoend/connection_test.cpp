@@ -1,8 +1,8 @@
 // The life of connections of the whole library, on simulated cars in virtual time, with the worker running.
 
-#include "libobd/src/callback.h"
-#include "libobd/src/fetcher.h"
-#include "libobd/src/freezeframeconfigurationquery.h"
+#include "libobd/dispatch/callback.h"
+#include "libobd/dispatch/fetcher.h"
+#include "libobd/query/freezeframeconfigurationquery.h"
 #include "simulator/simulation.h"
 #include "tests/support/dispatchloop.h"
 #include "tests/support/failingallocation.h"
@@ -12,7 +12,6 @@
 #include "tests/support/workerclock.h"
 
 #include <atomic>
-#include <common/observer.h>
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <obd/databridge.h>
@@ -27,6 +26,7 @@
 #include <obd/iobdvelmora.h>
 #include <obd/itroublecodeservice.h>
 #include <obd/obdvelmorabuilder.h>
+#include <tervex/observer.h>
 #include <thread>
 
 namespace {

@@ -1,5 +1,5 @@
-#include "libobd/src/elmscantool.h"
-#include "libobd/src/obdproxy.h"
+#include "libobd/adapter/elmscantool.h"
+#include "libobd/module/obdproxy.h"
 #include "simulator/simulation.h"
 #include "tests/support/peerconnection.h"
 

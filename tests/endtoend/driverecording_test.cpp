@@ -2,6 +2,7 @@
 // back as a spreadsheet would, and held against the drive model.
 
 #include "libobd/powertrain/torque.h"
+#include "program/view/livecsv.h"
 #include "simulator/car/vehiclelibrary.h"
 #include "simulator/simulation.h"
 #include "tests/endtoend/driveclock.h"
@@ -10,7 +11,6 @@
 #include "tests/support/dispatchloop.h"
 #include "tests/support/logcapture.h"
 #include "tests/support/memorysettings.h"
-#include "velmora/view/livecsv.h"
 
 #include <algorithm>
 #include <filesystem>

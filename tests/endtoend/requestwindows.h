@@ -1,9 +1,9 @@
 #pragma once
 
-#include <common/observer.h>
 #include <obd/dispatcher.h>
 #include <obd/iconnectionlogger.h>
 #include <obd/idispatchrunner.h>
+#include <tervex/observer.h>
 
 #include "tests/support/peerconnection.h"
 

@@ -1,7 +1,7 @@
 // What the library learns of recorded cars, against what a person reads from the captured masks.
 
-#include "libobd/src/elmscantool.h"
-#include "libobd/src/obdproxy.h"
+#include "libobd/adapter/elmscantool.h"
+#include "libobd/module/obdproxy.h"
 #include "simulator/simulation.h"
 #include "tests/support/peerconnection.h"
 

@@ -1,5 +1,6 @@
 #!/usr/bin/env bash
-# Checks what the rooms include, by the floors of floors.txt. Prints each include that should not be.
+# Checks what the rooms include, by the floors of floors.txt. Prints each include that should not be, and each circle
+# between rooms of one floor.
 #   floors.sh SOURCE_FOLDER [FLOORS]
 set -euo pipefail
 floors=$(realpath "${2:-$(dirname "$0")/floors.txt}")
@@ -8,14 +9,15 @@ cd "$1"
 # Every include of a folder's C++ files as "file:including line".
 includes() { grep -rHE '^ *# *include' --include='*.h' --include='*.cpp' "$@" || true; }
 
-# The headers of the common room that are installed beside the public face.
-installed=$(grep -oE 'common/[a-z]+\.h' libobd/install.cmake | tr '\n' ' ')
-
-includes common libobd velmora simulator $([[ -d examples ]] && echo examples) |
-    awk -v installed="$installed" -v floorFile="$floors" '
+includes common libobd libvelmora program simulator $([[ -d examples ]] && echo examples) |
+    awk -v floorFile="$floors" '
     function wrong(why) { print file ": " target ": " why; failures++ }
 
+    # A row that ends in a slash is a room, any other a pattern of files.
     function matches(path, pattern) {
+        if (pattern ~ /\/$/) {
+            return index(path, pattern) == 1
+        }
         gsub(/[.]/, "[.]", pattern)
         gsub(/[*]/, ".*", pattern)
         return path ~ ("^" pattern "$")
@@ -34,22 +36,28 @@ includes common libobd velmora simulator $([[ -d examples ]] && echo examples) |
         return known[path] = -1
     }
 
-    # The path of an included file of the library, or nothing.
-    function libraryPath() {
-        if (target ~ /^obd\//) {
+    # The folder of a file; both parts of the public face are of every room.
+    function roomOf(path) {
+        sub(/\/[^\/]*$/, "", path)
+        return path
+    }
+
+    # The path in the tree of what is included, or nothing.
+    function treePath() {
+        if (target ~ /^(obd|tervex)\//) {
             return "libobd/include/" target
         }
-        return target ~ /^(common|libobd)\// ? target : ""
+        if (target ~ /^velmora\// && !(target in generated)) {
+            return "libvelmora/include/" target
+        }
+        return target ~ /^(common|libobd|libvelmora|program)\// ? target : ""
     }
 
     function isStandard() { return target ~ /^[a-z_]+$/ }
 
-    function checkLibrary(   path) {
-        path = libraryPath()
+    function checkFloor(   path) {
+        path = treePath()
         if (path == "") {
-            if (!isStandard()) {
-                wrong("the library includes only itself and the standard library")
-            }
             return
         }
         if (floorOf(file) < 0) {
@@ -58,41 +66,86 @@ includes common libobd velmora simulator $([[ -d examples ]] && echo examples) |
             wrong(path " has no floor")
         } else if (floorOf(path) > floorOf(file)) {
             wrong("floor " floorOf(path) " seen from floor " floorOf(file))
+        } else if (floorOf(path) == floorOf(file) && (path file) !~ /\/include\// && file ~ /^libobd/) {
+            noteRooms(roomOf(file), roomOf(path))
         }
-        if (file ~ /^libobd\/include\// && target ~ /^common\// && !(target in faceOfCommon)) {
-            wrong("is not installed with the public face")
+    }
+
+    function noteRooms(from, to) {
+        if (from != to) {
+            seen[from, to] = file
+            rooms[from] = rooms[to] = 1
         }
-        if (file ~ /^libobd\/include\// && target ~ /^libobd\//) {
+    }
+
+    function checkLibrary() {
+        if (treePath() == "" && !isStandard()) {
+            wrong("the library includes only itself and the standard library")
+        }
+        if (file ~ /^libobd\/include\// && target ~ /^(libobd|common)\//) {
             wrong("is private to the library")
         }
     }
 
     function checkUser() {
-        if (target ~ /^libobd\// || target ~ /^tests\//) {
+        if (target ~ /^(libobd|tests)\//) {
             wrong("is private to the library")
-        } else if (target ~ /^common\// && !(target in faceOfCommon)) {
+        }
+    }
+
+    function checkCompanion() {
+        checkUser()
+        if (file ~ /^libvelmora\/include\// && target ~ /^(libvelmora|common|simulator)\//) {
+            wrong("is private to the companion")
+        } else if (target ~ /^common\// && target !~ /^common\/(clock|cthread|logrecord|loglevel)[.]h$/) {
+            wrong("is private to the library")
+        }
+    }
+
+    function checkProgram() {
+        checkUser()
+        if (target ~ /^common\//) {
             wrong("is private to the library")
         }
     }
 
     function checkExample() {
         checkUser()
-        if (target ~ /^(velmora|simulator)\//) {
+        if (target ~ /^(common|libvelmora|program|simulator)\//) {
             wrong("is not in the installed package")
         }
     }
 
     function checkSimulator() {
-        if (target ~ /^(obd|common|libobd|velmora|tests)\//) {
+        if (target ~ /^(obd|tervex|velmora|common|libobd|libvelmora|program|tests)\//) {
             wrong("the simulator shares nothing with the library")
         }
     }
 
-    BEGIN {
-        split(installed, list, " ")
-        for (i in list) {
-            faceOfCommon[list[i]] = 1
+    # Ways through the rooms of one floor; one that comes back to its start is a circle.
+    function checkCircles(   pair, between, from, to, grew, parts) {
+        for (grew = 1; grew;) {
+            grew = 0
+            for (pair in seen) {
+                split(pair, parts, SUBSEP)
+                for (to in rooms) {
+                    if ((parts[2], to) in seen && !((parts[1], to) in seen)) {
+                        seen[parts[1], to] = seen[parts[2], to]
+                        grew = 1
+                    }
+                }
+            }
         }
+        for (from in rooms) {
+            if ((from, from) in seen) {
+                print from ": stands in a circle of rooms, by " seen[from, from]
+                failures++
+            }
+        }
+    }
+
+    BEGIN {
+        generated["velmora/version.h"] = 1
         while ((getline line < floorFile) > 0) {
             if (line ~ /^[0-9]/) {
                 split(line, words, " ")
@@ -111,12 +164,15 @@ includes common libobd velmora simulator $([[ -d examples ]] && echo examples) |
         target = substr($0, RSTART + 1, RLENGTH - 2)
         checked++
     }
+    file ~ /^(common|libobd|libvelmora|program)\// { checkFloor() }
     file ~ /^(common|libobd)\// { checkLibrary() }
-    file ~ /^velmora\// { checkUser() }
+    file ~ /^libvelmora\// { checkCompanion() }
+    file ~ /^program\// { checkProgram() }
     file ~ /^examples\// { checkExample() }
     file ~ /^simulator\// { checkSimulator() }
 
     END {
+        checkCircles()
         print checked + 0 " includes looked at, " failures + 0 " wrong"
         exit failures > 0 || checked == 0
     }'

@@ -8,10 +8,11 @@ failures=0
 
 fresh() {
     rm -rf "${tree:?}"/*
-    mkdir -p "$tree"/{common,libobd/include/obd,libobd/src,velmora,simulator,examples}
-    echo 'install(FILES common/observer.h)' >"$tree/libobd/install.cmake"
-    printf '2 libobd/src/driver\n1 libobd/include/obd/*\n0 common/*\n' >"$tree/floors.txt"
-    echo '#include <string>' >"$tree/libobd/src/driver.h"
+    mkdir -p "$tree"/{common,libobd/{include/obd,include/tervex,adapter,cellar,value,query},libvelmora,program,simulator,examples}
+    printf '%s\n' '1 libobd/include/obd/*' '0 libobd/include/tervex/*' '10 program/' '10 libvelmora/' \
+        '3 libobd/value/' '3 libobd/query/' '2 libobd/adapter/' '0 common/' >"$tree/floors.txt"
+    echo '#include <string>' >"$tree/libobd/adapter/driver.h"
+    echo '#include "libobd/value/unit.h"' >"$tree/libobd/query/query.h"
 }
 
 # expect STATUS FILE INCLUDE: what the checker says of a tree with this one include more.
@@ -27,32 +28,37 @@ expect() {
     fi
 }
 
-expect 0 libobd/src/driver.h '<obd/idevice.h>'
-expect 0 libobd/src/driver.cpp '"libobd/src/driver.h"'
-expect 0 libobd/include/obd/idevice.h '<common/observer.h>'
+expect 0 libobd/adapter/driver.h '<obd/idevice.h>'
+expect 0 libobd/adapter/driver.cpp '"libobd/adapter/driver.h"'
+expect 0 libobd/include/obd/idevice.h '<tervex/observer.h>'
 expect 1 libobd/include/obd/idevice.h '<common/clock.h>'
-expect 1 libobd/include/obd/idevice.h '"libobd/src/driver.h"'
+expect 1 libobd/include/obd/idevice.h '"libobd/adapter/driver.h"'
 expect 1 common/clock.h '<obd/idevice.h>'
-expect 1 common/clock.h '"libobd/src/driver.h"'
-expect 1 libobd/src/driver.cpp '<asio.hpp>'
-expect 1 libobd/src/driver.cpp '<sys/types.h>'
-expect 1 libobd/src/driver.cpp '"velmora/session.h"'
-expect 1 libobd/src/driver.cpp '"libobd/src/unknown.h"'
-expect 1 libobd/src/unknown.cpp '<obd/idevice.h>'
-expect 0 velmora/main.cpp '<obd/idevice.h>'
-expect 0 velmora/main.cpp '<common/observer.h>'
-expect 0 velmora/main.cpp '"simulator/peer.h"'
-expect 0 velmora/main.cpp '<asio.hpp>'
-expect 1 velmora/main.cpp '<common/clock.h>'
-expect 1 velmora/main.cpp '"libobd/src/driver.h"'
-expect 1 velmora/main.cpp '"tests/support/gate.h"'
+expect 1 common/clock.h '"libobd/adapter/driver.h"'
+expect 1 libobd/adapter/driver.cpp '<asio.hpp>'
+expect 1 libobd/adapter/driver.cpp '<sys/types.h>'
+expect 1 libobd/adapter/driver.cpp '"libvelmora/session.h"'
+expect 1 libobd/adapter/driver.cpp '"libobd/cellar/unknown.h"'
+expect 1 libobd/cellar/unknown.cpp '<obd/idevice.h>'
+expect 0 program/main.cpp '<obd/idevice.h>'
+expect 0 program/main.cpp '<tervex/observer.h>'
+expect 0 program/main.cpp '"simulator/peer.h"'
+expect 0 program/main.cpp '<asio.hpp>'
+expect 1 program/main.cpp '<common/clock.h>'
+expect 1 program/main.cpp '"libobd/adapter/driver.h"'
+expect 1 program/main.cpp '"tests/support/gate.h"'
+expect 1 libobd/adapter/driver.cpp '"libobd/value/unit.h"'
+expect 0 libobd/query/query.cpp '"libobd/value/unit.h"'
+expect 1 libobd/value/unit.h '"libobd/query/query.h"'
+expect 1 libvelmora/session.cpp '"libobd/adapter/driver.h"'
+expect 0 libvelmora/session.cpp '<common/clock.h>'
 expect 0 simulator/peer.h '"simulator/bytes.h"'
 expect 1 simulator/peer.h '<obd/idevice.h>'
-expect 1 simulator/peer.h '<common/observer.h>'
-expect 1 simulator/peer.h '"libobd/src/driver.h"'
-expect 1 simulator/peer.h '"velmora/session.h"'
+expect 1 simulator/peer.h '<tervex/observer.h>'
+expect 1 simulator/peer.h '"libobd/adapter/driver.h"'
+expect 1 simulator/peer.h '"libvelmora/session.h"'
 expect 0 examples/main.cpp '<obd/idevice.h>'
-expect 1 examples/main.cpp '"velmora/session.h"'
-expect 1 examples/main.cpp '"libobd/src/driver.h"'
+expect 1 examples/main.cpp '"libvelmora/session.h"'
+expect 1 examples/main.cpp '"libobd/adapter/driver.h"'
 
 [[ $failures -eq 0 ]]

@@ -1,7 +1,7 @@
 #pragma once
 
-#include <common/observer.h>
 #include <obd/dispatcher.h>
+#include <tervex/observer.h>
 
 #include "tests/support/gate.h"
 

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "libobd/src/dtcreader.h"
+#include "libobd/catalogue/dtcreader.h"
 
 #include <cstddef>
 #include <initializer_list>

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "libobd/src/idispatchable.h"
+#include "libobd/dispatch/idispatchable.h"
 
 #include <atomic>
 #include <functional>

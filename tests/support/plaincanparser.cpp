@@ -1,6 +1,6 @@
 #include "tests/support/plaincanparser.h"
 
-#include "libobd/src/hextext.h"
+#include "libobd/bytes/hextext.h"
 
 #include <algorithm>
 #include <cstddef>

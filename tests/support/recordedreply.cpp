@@ -1,10 +1,10 @@
 #include "tests/support/recordedreply.h"
 
-#include "libobd/src/bytefilter.h"
-#include "libobd/src/elmtransport.h"
-#include "libobd/src/hexformat.h"
-#include "libobd/src/messageparser.h"
-#include "libobd/src/proxyerror.h"
+#include "libobd/adapter/elmtransport.h"
+#include "libobd/adapter/proxyerror.h"
+#include "libobd/bytes/bytefilter.h"
+#include "libobd/bytes/hexformat.h"
+#include "libobd/message/messageparser.h"
 
 #include <obd/connectionprotocol.h>
 

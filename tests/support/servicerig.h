@@ -4,11 +4,11 @@
 #include <obd/iobdvelmora.h>
 #include <obd/parameteridentifier.h>
 
-#include "libobd/src/configuration.h"
-#include "libobd/src/connectionnotifier.h"
-#include "libobd/src/ecumanager.h"
-#include "libobd/src/velmorainstance.h"
-#include "libobd/src/velmorasettings.h"
+#include "libobd/connection/configuration.h"
+#include "libobd/connection/connectionnotifier.h"
+#include "libobd/connection/ecumanager.h"
+#include "libobd/connection/velmorasettings.h"
+#include "libobd/service/velmorainstance.h"
 #include "tests/support/dispatcherrig.h"
 #include "tests/support/memorysettings.h"
 

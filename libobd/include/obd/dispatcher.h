@@ -1,8 +1,8 @@
 #pragma once
 
-#include <common/notifier.h>
 #include <obd/export.h>
 #include <obd/idispatchrunner.h>
+#include <tervex/notifier.h>
 
 #include <memory>
 #include <mutex>

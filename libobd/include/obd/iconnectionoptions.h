@@ -1,11 +1,11 @@
 #pragma once
 
-#include <common/ieventproducer.h>
 #include <obd/bluetoothdescriptor.h>
 #include <obd/connectionoptionsevent.h>
 #include <obd/serialdescriptor.h>
 #include <obd/tcpdescriptor.h>
 #include <obd/vehicleprotocol.h>
+#include <tervex/ieventproducer.h>
 
 #include <vector>
 

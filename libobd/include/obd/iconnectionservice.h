@@ -1,8 +1,8 @@
 #pragma once
 
-#include <common/inotifier.h>
 #include <obd/export.h>
 #include <obd/iconnectionserviceobserver.h>
+#include <tervex/inotifier.h>
 
 #include <memory>
 #include <string>

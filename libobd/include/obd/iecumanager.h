@@ -1,6 +1,6 @@
 #pragma once
 
-#include <common/ieventproducer.h>
+#include <tervex/ieventproducer.h>
 
 #include <memory>
 #include <string>

@@ -1,9 +1,9 @@
 #pragma once
 
-#include <common/inotifier.h>
 #include <obd/export.h>
 #include <obd/isensorserviceobserver.h>
 #include <obd/parameteridentifier.h>
+#include <tervex/inotifier.h>
 
 #include <memory>
 #include <vector>

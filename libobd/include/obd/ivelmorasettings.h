@@ -1,9 +1,9 @@
 #pragma once
 
-#include <common/ieventproducer.h>
 #include <obd/ignitiontype.h>
 #include <obd/unitsystem.h>
 #include <obd/velmorasettingsevent.h>
+#include <tervex/ieventproducer.h>
 
 namespace obd {
 

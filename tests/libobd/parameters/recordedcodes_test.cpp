@@ -1,10 +1,10 @@
 // Trouble codes out of what real cars and bench simulators sent.
 
+#include "libobd/bytes/hexformat.h"
+#include "libobd/message/protocolfamily.h"
 #include "libobd/parameters/cleartroublecodes.h"
 #include "libobd/parameters/troublecodelists.h"
 #include "libobd/powertrain/freezeframetroublecode.h"
-#include "libobd/src/hexformat.h"
-#include "libobd/src/protocolfamily.h"
 
 #include "tests/support/dialoguefolder.h"
 #include "tests/support/dtcrows.h"

@@ -1,14 +1,14 @@
 // Test results and vehicle information out of what real cars and bench simulators sent: from the printed reply, through
 // the parser, to what a user reads.
 
+#include "libobd/bytes/hexformat.h"
+#include "libobd/message/protocolfamily.h"
 #include "libobd/parameters/calibrationids.h"
 #include "libobd/parameters/calibrationverificationnumbers.h"
 #include "libobd/parameters/ecuname.h"
 #include "libobd/parameters/identificationnumber.h"
 #include "libobd/parameters/monitortestresult.h"
 #include "libobd/parameters/performancetracking.h"
-#include "libobd/src/hexformat.h"
-#include "libobd/src/protocolfamily.h"
 
 #include "tests/support/dialoguefolder.h"
 #include "tests/support/fakeecu.h"

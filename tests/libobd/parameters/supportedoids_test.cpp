@@ -1,6 +1,6 @@
 #include "libobd/parameters/supportedoids.h"
 
-#include "libobd/src/obdproxy.h"
+#include "libobd/module/obdproxy.h"
 #include "tests/support/fakedevice.h"
 #include "tests/support/logcapture.h"
 

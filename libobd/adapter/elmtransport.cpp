@@ -1,0 +1,86 @@
+#include "libobd/adapter/elmtransport.h"
+
+#include "libobd/bytes/bytefilter.h"
+
+#include <common/logrecord.h>
+#include <common/tracestream.h>
+
+#include <algorithm>
+#include <string>
+
+namespace obd {
+namespace {
+
+// The longest wait at a stretch: nothing wakes a waiter when the connection dies.
+constexpr unsigned int waitSliceMs = 250;
+
+void discardStaleReplies(IDataConnection& connection)
+{
+    std::vector<unsigned char> stale;
+    while (connection.receive(stale, 0)) {
+        tervex::TraceStream << "Payload data discarded: " << std::string(stale.begin(), stale.end());
+    }
+}
+
+// False if the time ran out or the connection died first.
+bool waitForMessage(IDataConnection& connection, std::vector<unsigned char>& message, unsigned int timeoutMs)
+{
+    unsigned int remaining = timeoutMs;
+    while (connection.isValid()) {
+        unsigned int const slice = std::min(remaining, waitSliceMs);
+        if (connection.receive(message, static_cast<int>(slice))) {
+            return true;
+        }
+        if (remaining == slice) {
+            return false;
+        }
+        remaining -= slice;
+    }
+    return false;
+}
+
+} // namespace
+
+TransportStatus elmTransportSend(std::shared_ptr<IDataConnection>& connection,
+                                 std::vector<unsigned char> const& payload)
+{
+    if (!connection->isValid()) {
+        TERVEX_LOG(Error) << "Invalid connection -> skip";
+        return TransportStatus::Timeout;
+    }
+    discardStaleReplies(*connection);
+    std::vector<unsigned char> line = payload;
+    line.push_back(static_cast<unsigned char>(elmLineEnd));
+    connection->send(line);
+    return TransportStatus::Ok;
+}
+
+void cleanReply(std::vector<unsigned char>& data)
+{
+    removeBytes(data, lineFraming);
+    std::erase(data, '?');
+}
+
+TransportStatus elmTransportReceive(std::shared_ptr<IDataConnection>& connection, std::vector<unsigned char>& data,
+                                    unsigned int timeoutMs)
+{
+    data.clear();
+    if (waitForMessage(*connection, data, timeoutMs)) {
+        cleanReply(data);
+    }
+    if (!connection->isValid()) {
+        TERVEX_LOG(Error) << "Invalid connection -> skip";
+        return TransportStatus::Failure;
+    }
+    if (!data.empty()) {
+        return TransportStatus::Ok;
+    }
+    if (timeoutMs != 0) {
+        tervex::TraceStream << "Connection timeout: " << timeoutMs << " ms";
+        return TransportStatus::Timeout;
+    }
+    TERVEX_LOG(Error) << "Failed to receive data";
+    return TransportStatus::Failure;
+}
+
+} // namespace obd

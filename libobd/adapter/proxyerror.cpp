@@ -1,0 +1,41 @@
+#include "libobd/adapter/proxyerror.h"
+
+#include "libobd/adapter/elmtext.h"
+
+#include <algorithm>
+#include <iterator>
+#include <string>
+#include <string_view>
+
+namespace obd {
+namespace {
+
+struct ErrorWord
+{
+    std::string_view word; // as it reads without blanks
+    ProxyError error;
+};
+
+// In the order of search. "ERR" is last, since others hold it.
+constexpr ErrorWord errorWords[] = {
+    {"NODATA", ProxyError::NoData},         {"UNABLETOCONNECT", ProxyError::UnableToConnect},
+    {"BUFFERFULL", ProxyError::BufferFull}, {"BUSBUSY", ProxyError::BusBusy},
+    {"BUSERROR", ProxyError::BusError},     {"CANERROR", ProxyError::CanError},
+    {"DATAERROR", ProxyError::DataError},   {"FBERROR", ProxyError::FbError},
+    {"LVRESET", ProxyError::LvReset},       {"RXERROR", ProxyError::RxError},
+    {"STOPPED", ProxyError::Stopped},       {"ERR", ProxyError::GenericError},
+};
+
+} // namespace
+
+ProxyError checkForErrors(std::vector<unsigned char> const& reply)
+{
+    std::string text = toUpper(std::string(reply.begin(), reply.end()));
+    removeSpaces(text);
+    cropWord("SEARCHING...", text);
+    auto const found = std::find_if(std::begin(errorWords), std::end(errorWords),
+                                    [&text](ErrorWord const& row) { return hasResponse(text, row.word); });
+    return found != std::end(errorWords) ? found->error : ProxyError::None;
+}
+
+} // namespace obd

@@ -1,0 +1,44 @@
+#pragma once
+
+#include <tervex/event.h>
+#include <tervex/inotifier.h>
+
+#include <cstddef>
+#include <utility>
+#include <vector>
+
+namespace tervex {
+
+// The observer list behind an INotifier, a base class only. No lock at all: its owner decides which thread touches it.
+template <typename T>
+class Notifier : public virtual INotifier<T>
+{
+public:
+    void attach(Observer<T>* observer) override { m_observers.push_back(observer); }
+    void detach(Observer<T>* observer) override { std::erase(m_observers, observer); }
+
+protected:
+    Notifier() = default;
+
+    // Calls a member function of T on every observer: notify(&T::onSomething, arguments...). Arguments are passed on as
+    // the function declares them, references as references.
+    template <typename... Declared, typename... Given>
+    void notify(void (T::*function)(Declared...), Given&&... arguments)
+    {
+        dispatch(Event<T, void (T::*)(Declared...), Declared...>(function, std::forward<Given>(arguments)...));
+    }
+
+private:
+    // The list may change during the walk, so its size is read afresh at each step. An observer's exception passes to
+    // the caller.
+    void dispatch(AbstractEvent<T> const& event)
+    {
+        for (std::size_t i = 0; i < m_observers.size(); ++i) {
+            event(m_observers[i]);
+        }
+    }
+
+    std::vector<Observer<T>*> m_observers; // not owned
+};
+
+} // namespace tervex

@@ -1,0 +1,18 @@
+#pragma once
+
+#include "libobd/bytes/checkedbytes.h"
+
+#include <obd/obdprotocol.h>
+#include <obd/responsemap.h>
+
+#include <vector>
+
+namespace obd {
+
+// Reads a reply of the buses before CAN into responses: ISO 14230 frames, which tell their length, for
+// ObdProtocolIso14230, and frames that end where the next header begins for ObdProtocolIso9141 and ObdProtocolJ1850.
+// The frames of one module are joined; those of the latter kind keep their checksum bytes. False if no module's frame
+// could be read. Cost is linear in the text.
+bool parseLegacyMessages(ObdProtocol protocol, std::vector<unsigned char> const& text, ResponseMap& responses);
+
+} // namespace obd

@@ -1,0 +1,18 @@
+#pragma once
+
+#include "libobd/service/baseservice.h"
+
+#include <obd/iroutineservice.h>
+
+namespace obd {
+
+class RoutineService : public BaseService, public IRoutineService
+{
+public:
+    explicit RoutineService(IObdVelmora const* obd);
+
+    std::vector<std::shared_ptr<TestRoutineDataModel>> getRoutines() override;
+    std::shared_ptr<TestRoutineDataModel> runRoutine(unsigned char id) override;
+};
+
+} // namespace obd

@@ -1,0 +1,247 @@
+#include "libobd/service/sensorservice.h"
+
+#include "libobd/dispatch/fetcher.h"
+#include "libobd/service/parametercatalogue.h"
+#include "libobd/service/sensormodels.h"
+#include "libobd/service/velmorainstance.h"
+
+#include <common/logrecord.h>
+#include <obd/iecu.h>
+#include <obd/iobdvelmora.h>
+#include <obd/ivelmorasettings.h>
+#include <obd/parameterdatamodel.h>
+#include <obd/parameterdescriptor.h>
+#include <obd/powertrainparameter.h>
+#include <obd/sensordatamodel.h>
+#include <obd/sensorvalue.h>
+#include <utility>
+
+namespace obd {
+
+SensorService::SensorService(IObdVelmora const* obd) : BaseService(obd), m_settings(obd->getSettings())
+{
+    if (BaseService::isConnected()) {
+        rebuild();
+    }
+}
+
+SensorService::~SensorService()
+{
+    std::lock_guard const lock(m_mutex);
+    m_set.cancelAll();
+}
+
+std::vector<std::shared_ptr<ParameterDescriptor>> SensorService::getDescriptors()
+{
+    std::lock_guard const lock(m_mutex);
+    return m_set.descriptors(unitSystem());
+}
+
+void SensorService::updateOnce(std::vector<ParameterIdentifier::Id> const& ids)
+{
+    startUpdates(ids);
+    m_singleShot = true;
+}
+
+void SensorService::startUpdates(std::vector<ParameterIdentifier::Id> const& ids)
+{
+    m_singleShot = false;
+    for (ParameterIdentifier::Id const id : ids) {
+        if (std::shared_ptr<ParameterQuery> const query = find(id)) {
+            update(query);
+        }
+    }
+}
+
+void SensorService::reset()
+{
+    clear();
+    rebuild();
+}
+
+std::vector<ParameterIdentifier::Id> SensorService::getSupportedIds()
+{
+    std::shared_ptr<IEcu> const current = ecu();
+    return current != nullptr ? SensorSet::supportedIds(*current) : std::vector<ParameterIdentifier::Id>();
+}
+
+bool SensorService::isSupported(ParameterIdentifier::Id id)
+{
+    std::shared_ptr<IEcu> const current = ecu();
+    bool const isByte = id >= 0 && id <= 0xFF;
+    return current != nullptr && isByte &&
+           current->isSupported(ObdMode::CurrentData, ParameterIdentifier(id).toOid(), 0);
+}
+
+std::shared_ptr<ParameterDataModel> SensorService::getParameter(ParameterIdentifier::Id id)
+{
+    std::shared_ptr<IEcu> const current = ecu();
+    if (current == nullptr) {
+        return nullptr;
+    }
+    std::shared_ptr<PowertrainParameter> const parameter = SensorSet::createParameter(*current, *m_settings, id);
+    if (parameter == nullptr) {
+        TERVEX_LOG(Error) << "No such parameter (" << static_cast<int>(id) << ")";
+        return nullptr;
+    }
+    return describeParameter(parameter, current, unitSystem());
+}
+
+std::vector<std::shared_ptr<SensorDataModel>> SensorService::fetchSensors(ParameterIdentifier::Id id)
+{
+    std::shared_ptr<IEcu> const current = ecu();
+    std::shared_ptr<PowertrainParameter> const parameter =
+        current != nullptr ? SensorSet::createParameter(*current, *m_settings, id) : nullptr;
+    if (parameter == nullptr || !fetch(parameter)) {
+        return {};
+    }
+    UnitSystem const system = unitSystem();
+    std::shared_ptr<ParameterDataModel> const description = describeParameter(parameter, current, system);
+    auto const values = parameter->values(*current, system);
+    for (std::size_t i = 0; i < description->sensors.size(); ++i) {
+        SensorDataModel& sensor = *description->sensors[i];
+        // By uid, not by position: a parameter leaves the sensors out that the reply told nothing of.
+        if (std::shared_ptr<SensorValue> const value = findValue(values, sensor.uid)) {
+            sensor.value = record(*current, value);
+        } else {
+            TERVEX_LOG(Error) << "No value for " << i << " (" << description->name << ")";
+        }
+    }
+    return description->sensors;
+}
+
+// A module that is no longer the current one has no part in the statistics.
+std::shared_ptr<SensorValueDataModel> SensorService::record(IEcu const& ecu, std::shared_ptr<SensorValue> const& value)
+{
+    std::lock_guard const lock(m_mutex);
+    return m_set.ecu().get() == &ecu ? m_set.record(value) : SensorSet().record(value);
+}
+
+void SensorService::onServiceConnected()
+{
+    clear();
+    rebuild();
+}
+
+void SensorService::onServiceDisconnected()
+{
+    clear();
+}
+
+void SensorService::onEcuChanged()
+{
+    clear();
+    rebuild();
+    notify(&ISensorServiceObserver::onInvalidated);
+}
+
+void SensorService::onUnitSystemChanged()
+{
+    {
+        std::lock_guard const lock(m_mutex);
+        m_set.restartStatistics();
+    }
+    notify(&ISensorServiceObserver::onInvalidated);
+}
+
+SensorService::VehicleListener::VehicleListener(SensorService& service) : m_service(service)
+{
+    m_service.m_settings->attach(this);
+}
+
+SensorService::VehicleListener::~VehicleListener()
+{
+    m_service.m_settings->detach(this);
+}
+
+void SensorService::VehicleListener::onEvent(VelmoraSettingsEvent const& event)
+{
+    if (event != VelmoraSettingsEvent::UnitSystemChanged && event != VelmoraSettingsEvent::LanguageChanged) {
+        m_service.onVehicleChanged();
+    }
+}
+
+void SensorService::onVehicleChanged()
+{
+    clear();
+    if (isConnected()) {
+        rebuild();
+    }
+    notify(&ISensorServiceObserver::onInvalidated);
+}
+
+void SensorService::update(std::shared_ptr<ParameterQuery> const& query)
+{
+    // The query does not hold itself: once the set lets go of it, it is gone.
+    std::weak_ptr<ParameterQuery> const finished = query;
+    query->start([this, finished](bool success, std::shared_ptr<PowertrainParameter> const& parameter) {
+        onQueryFinished(success, finished, parameter);
+    });
+}
+
+void SensorService::onQueryFinished(bool success, std::weak_ptr<ParameterQuery> const& finished,
+                                    std::shared_ptr<PowertrainParameter> const& parameter)
+{
+    std::shared_ptr<ParameterQuery> const query = finished.lock();
+    if (query == nullptr) {
+        return;
+    }
+    if (success) {
+        publish(*query, parameter);
+    }
+    // An observer, or another thread, may have put a new set in place of the query's.
+    if (!m_singleShot && find(parameter->pid()) == query) {
+        update(query);
+    }
+}
+
+void SensorService::publish(ParameterQuery const& query, std::shared_ptr<PowertrainParameter> const& parameter)
+{
+    std::shared_ptr<ParameterDescriptor> descriptor;
+    SensorSet::Models models;
+    {
+        std::lock_guard const lock(m_mutex);
+        if (m_set.query(parameter->pid()).get() != &query) {
+            return;
+        }
+        // Units and statistics belong together, so both are settled under the lock.
+        UnitSystem const system = unitSystem();
+        models = m_set.record(parameter->values(*m_set.ecu(), system));
+        descriptor = std::make_shared<ParameterDescriptor>(parameter, m_set.ecu(), system);
+    }
+    notify(&ISensorServiceObserver::onSensorUpdated, true, descriptor, models);
+}
+
+std::shared_ptr<SensorService::ParameterQuery> SensorService::find(ParameterIdentifier::Id id) const
+{
+    std::lock_guard const lock(m_mutex);
+    return m_set.query(id);
+}
+
+void SensorService::clear()
+{
+    std::lock_guard const lock(m_mutex);
+    m_set.cancelAll();
+    m_set.clear();
+}
+
+void SensorService::rebuild()
+{
+    while (true) {
+        std::shared_ptr<IEcu> const current = ecu();
+        SensorSet fresh(current, *m_settings);
+        std::lock_guard const lock(m_mutex);
+        // Another module may have been selected meanwhile; whoever did that may have been here already.
+        if (ecu() == current) {
+            std::swap(m_set, fresh);
+            return;
+        }
+    }
+}
+
+std::shared_ptr<ISensorService> SensorServiceBuilder::createSensorService()
+{
+    return std::make_shared<SensorService>(VelmoraInstance::get());
+}
+
+} // namespace obd

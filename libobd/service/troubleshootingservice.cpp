@@ -1,0 +1,75 @@
+#include "libobd/service/troubleshootingservice.h"
+
+#include "libobd/dispatch/fetcher.h"
+#include "libobd/message/messageentry.h"
+#include "libobd/service/consolequery.h"
+#include "libobd/service/velmorainstance.h"
+
+#include <common/logrecord.h>
+#include <obd/iconnectionmanager.h>
+#include <obd/iobdvelmora.h>
+
+namespace obd {
+
+namespace {
+
+// Null, with a log line, if there is none.
+std::shared_ptr<IConnectionManager> findManager(IObdVelmora const& obd)
+{
+    std::shared_ptr<IConnectionManager> manager = obd.getConnectionManager();
+    if (manager == nullptr) {
+        TERVEX_LOG(Fatal) << "No IConnectionManager";
+    }
+    return manager;
+}
+
+} // namespace
+
+TroubleshootingService::TroubleshootingService(IObdVelmora const* obd) : BaseService(obd)
+{
+    if (auto const manager = findManager(*obd)) {
+        manager->addLogger(this);
+    }
+}
+
+TroubleshootingService::~TroubleshootingService()
+{
+    if (auto const manager = findManager(*obd())) {
+        manager->removeLogger(this);
+    }
+}
+
+std::string TroubleshootingService::query(std::string const& request, int timeout)
+{
+    auto const console = std::make_shared<ConsoleQuery>(request, timeout);
+    if (!fetch(console)) {
+        TERVEX_LOG(Error) << "Failed to query request: " << request;
+        return {};
+    }
+    return console->response();
+}
+
+void TroubleshootingService::onDataSent(std::vector<unsigned char> const& data)
+{
+    addEntry(data, MessageDataModel::Sent);
+}
+
+void TroubleshootingService::onDataReceived(std::vector<unsigned char> const& data)
+{
+    addEntry(data, MessageDataModel::Received);
+}
+
+void TroubleshootingService::addEntry(std::vector<unsigned char> const& data, int direction)
+{
+    if (!m_logging) {
+        return;
+    }
+    notify(&ITroubleshootingServiceObserver::onLogEntryAdded, makeMessageEntry(data, direction));
+}
+
+std::shared_ptr<ITroubleshootingService> TroubleshootingServiceBuilder::createTroubleshootingService()
+{
+    return std::make_shared<TroubleshootingService>(VelmoraInstance::get());
+}
+
+} // namespace obd

@@ -1,0 +1,152 @@
+#include "libvelmora/port/portaddress.h"
+
+#include <velmora/error.h>
+
+#include <charconv>
+#include <optional>
+#include <string_view>
+
+namespace velmora {
+
+namespace {
+
+[[noreturn]] void reject(std::string const& text, std::string const& why)
+{
+    throw Error(ErrorKind::WrongUse, "\"" + text + "\" is no port: " + why,
+                {"a serial port: /dev/ttyUSB0 or serial:///dev/ttyUSB0?baud=38400",
+                 "a network adapter: 192.168.0.10:35000 or tcp://192.168.0.10:35000",
+                 "a simulated car: sim:petrol-can11", "a recorded car: replay:FILE"});
+}
+
+template <typename Number>
+std::optional<Number> readNumber(std::string_view text)
+{
+    Number value{};
+    auto const [end, error] = std::from_chars(text.data(), text.data() + text.size(), value);
+    return error == std::errc() && end == text.data() + text.size() && value != 0 ? std::optional(value) : std::nullopt;
+}
+
+bool takePrefix(std::string_view& text, std::string_view prefix)
+{
+    if (!text.starts_with(prefix)) {
+        return false;
+    }
+    text.remove_prefix(prefix.size());
+    return true;
+}
+
+SerialAddress parseSerial(std::string const& whole, std::string_view rest, unsigned int baud)
+{
+    std::size_t const query = rest.find('?');
+    SerialAddress address{std::string(rest.substr(0, query)), baud};
+    if (address.device.empty()) {
+        reject(whole, "the device is missing");
+    }
+    if (query != std::string_view::npos) {
+        std::string_view option = rest.substr(query + 1);
+        std::optional<unsigned int> const rate =
+            takePrefix(option, "baud=") ? readNumber<unsigned int>(option) : std::nullopt;
+        if (!rate) {
+            reject(whole, "after ? only baud=NUMBER is understood");
+        }
+        address.baud = *rate;
+    }
+    return address;
+}
+
+SimulatorAddress parseSimulator(std::string const& whole, std::string_view rest)
+{
+    std::size_t const query = rest.find('?');
+    if (query != std::string_view::npos && rest.substr(query) != "?instant") {
+        reject(whole, "after ? only instant is understood");
+    }
+    return {std::string(rest.substr(0, query)), query != std::string_view::npos};
+}
+
+// A host in square brackets holds colons of its own (IPv6).
+TcpAddress parseTcp(std::string const& whole, std::string_view rest)
+{
+    std::string_view host = rest;
+    std::string_view port;
+    if (rest.starts_with('[')) {
+        std::size_t const end = rest.find(']');
+        if (end == std::string_view::npos) {
+            reject(whole, "the closing ] is missing");
+        }
+        host = rest.substr(1, end - 1);
+        port = rest.substr(end + 1);
+        if (!port.empty() && !takePrefix(port, ":")) {
+            reject(whole, "after ] only :PORT is understood");
+        }
+    } else if (std::size_t const colon = rest.rfind(':'); colon != std::string_view::npos) {
+        host = rest.substr(0, colon);
+        port = rest.substr(colon + 1);
+        if (port.empty()) {
+            reject(whole, "the port number behind the colon is missing");
+        }
+        if (host.find(':') != std::string_view::npos) {
+            reject(whole, "only in brackets may a host hold colons, such as [fe80::1]:35000");
+        }
+    }
+    if (host.empty() || host.find_first_of("/ \t") != std::string_view::npos) {
+        reject(whole, "the host is missing or holds what no host name holds");
+    }
+    TcpAddress address{std::string(host), defaultTcpPort};
+    if (!port.empty()) {
+        std::optional<unsigned short> const number = readNumber<unsigned short>(port);
+        if (!number) {
+            reject(whole, "the port number must be from 1 to 65535");
+        }
+        address.port = *number;
+    }
+    return address;
+}
+
+struct Printer
+{
+    std::string operator()(SerialAddress const& address) const
+    {
+        return address.device + " (" + std::to_string(address.baud) + " baud)";
+    }
+    std::string operator()(TcpAddress const& address) const
+    {
+        bool const bracketed = address.host.find(':') != std::string::npos;
+        return (bracketed ? "[" + address.host + "]" : address.host) + ":" + std::to_string(address.port);
+    }
+    std::string operator()(SimulatorAddress const& address) const
+    {
+        return "sim:" + address.vehicle + (address.instant ? "?instant" : "");
+    }
+    std::string operator()(ReplayAddress const& address) const { return "replay:" + address.file; }
+};
+
+} // namespace
+
+PortAddress parsePortAddress(std::string const& text, unsigned int baud)
+{
+    std::string_view rest = text;
+    if (takePrefix(rest, "sim:")) {
+        return parseSimulator(text, rest);
+    }
+    if (takePrefix(rest, "replay:")) {
+        if (rest.empty()) {
+            reject(text, "the file is missing");
+        }
+        return ReplayAddress{std::string(rest)};
+    }
+    if (takePrefix(rest, "serial://") || takePrefix(rest, "serial:") || rest.starts_with('/')) {
+        return parseSerial(text, rest, baud);
+    }
+    if (!takePrefix(rest, "tcp://") && !takePrefix(rest, "tcp:") && !takePrefix(rest, "socket://") &&
+        rest.find("://") != std::string_view::npos) {
+        reject(text, "the kind before :// is unknown");
+    }
+    return parseTcp(text, rest);
+}
+
+std::string toString(PortAddress const& address)
+{
+    return std::visit(Printer{}, address);
+}
+
+} // namespace velmora

@@ -1,0 +1,53 @@
+#pragma once
+
+#include <string>
+#include <variant>
+
+namespace velmora {
+
+struct SerialAddress
+{
+    std::string device;
+    unsigned int baud;
+
+    bool operator==(SerialAddress const&) const = default;
+};
+
+struct TcpAddress
+{
+    std::string host;
+    unsigned short port;
+
+    bool operator==(TcpAddress const&) const = default;
+};
+
+// A vehicle of the simulator, by name or file.
+struct SimulatorAddress
+{
+    std::string vehicle;
+    bool instant = false; // the adapter answers at once, in place of the time that adapters and cars take
+
+    bool operator==(SimulatorAddress const&) const = default;
+};
+
+// A recorded dialogue.
+struct ReplayAddress
+{
+    std::string file;
+
+    bool operator==(ReplayAddress const&) const = default;
+};
+
+using PortAddress = std::variant<SerialAddress, TcpAddress, SimulatorAddress, ReplayAddress>;
+
+constexpr unsigned int defaultBaud = 38400;
+constexpr unsigned short defaultTcpPort = 35000; // what Wi-Fi adapters listen on
+
+// Reads what a user gives to --port. baud holds for a serial port whose address names no other.
+// Throws Error (wrong use) for a text that is no address.
+PortAddress parsePortAddress(std::string const& text, unsigned int baud = defaultBaud);
+
+// The address as the user may write it, for messages.
+std::string toString(PortAddress const& address);
+
+} // namespace velmora

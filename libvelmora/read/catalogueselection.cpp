@@ -1,0 +1,97 @@
+#include "libvelmora/read/catalogueselection.h"
+
+#include <velmora/error.h>
+
+#include <algorithm>
+#include <fmt/format.h>
+#include <iterator>
+#include <obd/manufacturer.h>
+
+namespace velmora {
+
+namespace {
+
+// By hand, for the answer must not hang on the user's locale.
+char lowerCase(char character)
+{
+    return character >= 'A' && character <= 'Z' ? static_cast<char>(character - 'A' + 'a') : character;
+}
+
+bool isWordCharacter(char lower)
+{
+    return (lower >= 'a' && lower <= 'z') || (lower >= '0' && lower <= '9');
+}
+
+std::vector<std::string> splitWords(std::string const& text)
+{
+    std::vector<std::string> words;
+    std::string word;
+    for (char const character : text + ' ') {
+        char const lower = lowerCase(character);
+        if (isWordCharacter(lower)) {
+            word += lower;
+        } else if (!word.empty()) {
+            words.push_back(std::move(word));
+            word.clear();
+        }
+    }
+    return words;
+}
+
+std::string joined(std::string const& name)
+{
+    return fmt::format("{}", fmt::join(splitWords(name), ""));
+}
+
+std::vector<std::string> makers()
+{
+    std::vector<std::string> names;
+    for (int maker = obd::Manufacturer::Generic; maker <= obd::Manufacturer::Volvo; ++maker) {
+        names.push_back(
+            obd::Manufacturer::manufacturerToString(static_cast<obd::Manufacturer::AutoManufacturer>(maker)));
+    }
+    return names;
+}
+
+bool holdsAll(std::vector<std::string> const& words, std::vector<std::string> const& wanted)
+{
+    return std::all_of(wanted.begin(), wanted.end(), [&words](std::string const& start) {
+        return std::any_of(words.begin(), words.end(),
+                           [&start](std::string const& word) { return word.starts_with(start); });
+    });
+}
+
+} // namespace
+
+std::string findMaker(std::string const& name)
+{
+    std::vector<std::string> const names = makers();
+    auto const found = std::find_if(names.begin(), names.end(), [&name](std::string const& candidate) {
+        return joined(candidate) == joined(name);
+    });
+    if (found == names.end()) {
+        throw Error(ErrorKind::WrongUse, "The catalogue has no maker \"" + name + "\"",
+                    {fmt::format("these it has: {}", fmt::join(names, ", "))});
+    }
+    return *found;
+}
+
+CatalogueRows selectMaker(CatalogueRows const& rows, std::string const& maker)
+{
+    CatalogueRows selected;
+    std::copy_if(rows.begin(), rows.end(), std::back_inserter(selected),
+                 [&maker](auto const& row) { return row->manufacturer == maker; });
+    return selected;
+}
+
+CatalogueRows selectWords(CatalogueRows const& rows, std::vector<std::string> const& words)
+{
+    std::vector<std::string> const wanted = splitWords(fmt::format("{}", fmt::join(words, " ")));
+    CatalogueRows selected;
+    std::copy_if(rows.begin(), rows.end(), std::back_inserter(selected), [&wanted](auto const& row) {
+        return holdsAll(splitWords(row->code + ' ' + row->description), wanted);
+    });
+    return selected;
+}
+
+} // namespace velmora

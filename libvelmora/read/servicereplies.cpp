@@ -1,0 +1,60 @@
+#include "libvelmora/read/servicereplies.h"
+
+#include <fmt/format.h>
+#include <obd/nack.h>
+#include <utility>
+
+namespace velmora {
+
+namespace {
+
+constexpr unsigned char negative = 0x7F;
+
+std::string describe(unsigned char responseCode)
+{
+    std::string text = obd::NackToString(static_cast<obd::Nack>(responseCode));
+    if (text == "Unknown") {
+        return fmt::format("response code {:02X}", responseCode);
+    }
+    text.front() = static_cast<char>(text.front() - 'A' + 'a');
+    return fmt::format("{} ({:02X})", text, responseCode);
+}
+
+} // namespace
+
+ServiceReplies::ServiceReplies(obd::IObdProxy& proxy, unsigned char service, unsigned int timeoutMs)
+    : m_service(service)
+{
+    proxy.execute(std::vector<unsigned char>{service}, m_responses, timeoutMs);
+}
+
+ServiceReplies::ServiceReplies(unsigned char service, obd::ResponseMap responses)
+    : m_service(service), m_responses(std::move(responses))
+{}
+
+ServiceReply ServiceReplies::of(unsigned int ecu) const
+{
+    auto const found = m_responses.find(ecu);
+    if (found == m_responses.end() || found->second.empty()) {
+        return {};
+    }
+    std::vector<unsigned char> const& bytes = found->second;
+    if (bytes[0] == m_service + 0x40) {
+        return {ServiceReply::Kind::Positive, bytes, {}};
+    }
+    if (bytes[0] == negative && bytes.size() >= 3 && bytes[1] == m_service) {
+        return {ServiceReply::Kind::Refused, bytes, describe(bytes[2])};
+    }
+    return {ServiceReply::Kind::Foreign, bytes, {}};
+}
+
+std::vector<unsigned int> ServiceReplies::answering() const
+{
+    std::vector<unsigned int> ids;
+    for (auto const& response : m_responses) {
+        ids.push_back(response.first);
+    }
+    return ids;
+}
+
+} // namespace velmora

@@ -1,0 +1,90 @@
+#include "libvelmora/read/vehiclereader.h"
+
+#include "libvelmora/read/codereader.h"
+#include "libvelmora/read/diagnosticreaders.h"
+#include "libvelmora/read/freezereader.h"
+#include "libvelmora/text/text.h"
+#include "program/terminal/output.h"
+
+#include <cstdio>
+#include <fmt/format.h>
+#include <obd/iecu.h>
+
+namespace velmora {
+
+namespace {
+
+constexpr unsigned int protocolLimitMs = 500;
+
+// The driver keeps the bus family only; the adapter tells the number, behind an A if it searched for it.
+ProtocolReport readProtocol(Session& session)
+{
+    ProtocolReport report{std::nullopt, readable(session.adapter()->getProtocolDescription())};
+    std::string reply;
+    if (session.proxy()->execute("ATDPN", reply, protocolLimitMs) == obd::IDevice::Status::Ok) {
+        std::size_t const digit = reply.find_first_of("123456789");
+        if (digit != std::string::npos) {
+            report.number = reply[digit] - '0';
+        }
+    }
+    return report;
+}
+
+AdapterReport readAdapter(Session& session)
+{
+    std::shared_ptr<obd::IAdapter> const adapter = session.adapter();
+    float const volts = session.proxy()->batteryVoltage();
+    return {readable(adapter->device()), readable(adapter->description()), readable(adapter->identification()),
+            volts > 0.0F ? std::optional(volts) : std::nullopt};
+}
+
+bool isSensor(unsigned char id)
+{
+    return (id & 0x1F) != 0 && id > 0x02;
+}
+
+std::vector<unsigned int> sensorsOf(obd::IEcu const& ecu)
+{
+    std::vector<unsigned int> sensors;
+    for (unsigned char const id : ecu.supportedIds(obd::ObdMode::CurrentData, 0)) {
+        if (isSensor(id)) {
+            sensors.push_back(id);
+        }
+    }
+    return sensors;
+}
+
+ModuleReport readModule(Session& session, obd::IEcu const& ecu, CodeReader& reader)
+{
+    constexpr unsigned char newestFrame = 0;
+    return {ecu.id(),
+            readable(ecu.name()),
+            sensorsOf(ecu),
+            readInfo(session, ecu),
+            reader.read(ecu, {CodeKind::Confirmed, CodeKind::Pending, CodeKind::Permanent}),
+            readFreeze(session, ecu, newestFrame),
+            readReadiness(session, ecu),
+            readMonitors(session, ecu),
+            readOxygen(session, ecu),
+            readCounters(session, ecu)};
+}
+
+} // namespace
+
+VehicleReport readVehicle(Session& session)
+{
+    VehicleReport report;
+    report.adapter = readAdapter(session);
+    report.protocol = readProtocol(session);
+    CodeReader reader(session);
+    for (auto const& ecu : session.selectedModules()) {
+        if (!session.options().quiet) {
+            tell(fmt::format("Reading {:X} {} ...\n", ecu->id(), readable(ecu->name())));
+        }
+        report.modules.push_back(readModule(session, *ecu, reader));
+    }
+    session.check();
+    return report;
+}
+
+} // namespace velmora

@@ -1,0 +1,28 @@
+#pragma once
+
+#include <filesystem>
+#include <fstream>
+#include <mutex>
+#include <obd/iconnectionlogger.h>
+#include <string_view>
+
+namespace velmora {
+
+// Writes the traffic with the adapter to a file, a line each way, with the time to the millisecond.
+class TrafficTrace : public obd::IConnectionLogger
+{
+public:
+    // Throws Error if the file can't be written.
+    explicit TrafficTrace(std::filesystem::path const& file);
+
+    void onDataSent(std::vector<unsigned char> const& data) override;
+    void onDataReceived(std::vector<unsigned char> const& data) override;
+
+private:
+    void write(std::string_view arrow, std::vector<unsigned char> const& data);
+
+    std::mutex m_mutex;
+    std::ofstream m_out; // protected by m_mutex
+};
+
+} // namespace velmora

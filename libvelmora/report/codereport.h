@@ -1,0 +1,62 @@
+#pragma once
+
+#include "libvelmora/report/moduletopic.h"
+#include "libvelmora/report/troublecode.h"
+
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace velmora {
+
+enum class CodeKind : int
+{
+    Confirmed, // stored, and as a rule the reason for the lamp
+    Pending,   // seen in this or the last driving cycle
+    Permanent, // not to be cleared by a tool
+};
+
+// What a control module tells of its codes of one kind.
+struct CodeList
+{
+    enum class Answer : int
+    {
+        Read,
+        Refused,
+        Silent,
+        Unreadable,
+    };
+
+    CodeKind kind;
+    Answer answer;
+    std::string reason; // of a refusal
+    std::vector<TroubleCode> codes;
+};
+
+struct CodeReport
+{
+    std::optional<bool> lamp; // whether the malfunction indicator is on
+    std::vector<CodeList> lists;
+};
+
+using ModuleCodes = ModuleTopic<CodeReport>;
+
+// "on", "off" or "-".
+std::string lampText(std::optional<bool> const& lamp, Style const& style);
+
+// Whether the lamp is on, or a code is confirmed or permanent. A pending code is no finding yet.
+bool hasFindings(CodeReport const& report);
+
+// Whether the module told at least one of its lists.
+bool hasAnswer(CodeReport const& report);
+
+// Whether the module told lamp or confirmed codes, without which no findings mean nothing.
+bool canBeChecked(CodeReport const& report);
+
+// Indented lines under the heading of a control module.
+std::string toText(CodeReport const& report, Style const& style);
+
+// "lamp", and for each list its codes, or null and a word for why there are none.
+Json toJsonValue(CodeReport const& report);
+
+} // namespace velmora

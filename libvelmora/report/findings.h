@@ -1,0 +1,25 @@
+#pragma once
+
+#include "libvelmora/report/vehiclereport.h"
+
+#include <string>
+#include <vector>
+
+namespace velmora {
+
+// Something that is wrong, or not known to be right yet.
+struct Finding
+{
+    Mark mark;
+    std::string module; // "7E8 ECM"
+    std::string what;   // such as "confirmed, permanent"
+    std::string text;
+};
+
+// All of a vehicle: lamps first, then codes, failed tests and what has not been tested.
+std::vector<Finding> findings(VehicleReport const& report);
+
+// The findings under a heading, or that there are none.
+std::string toText(std::vector<Finding> const& findings, Style const& style);
+
+} // namespace velmora

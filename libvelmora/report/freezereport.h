@@ -1,0 +1,45 @@
+#pragma once
+
+#include "libvelmora/report/moduletopic.h"
+#include "libvelmora/report/troublecode.h"
+
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace velmora {
+
+// What the vehicle froze when a code was set.
+struct FreezeFrame
+{
+    struct Reading
+    {
+        std::string name;
+        std::optional<std::string> value; // nothing if the module did not tell it
+        std::string unit;
+    };
+
+    TroubleCode code;
+    std::vector<Reading> readings;
+};
+
+// One frame of a control module, by number.
+struct FreezeReport
+{
+    unsigned int number;
+    bool answered; // whether the module told what its frame holds
+    std::optional<FreezeFrame> frame;
+};
+
+inline bool hasAnswer(FreezeReport const& report)
+{
+    return report.answered;
+}
+
+// Indented lines under the heading of a control module.
+std::string toText(FreezeReport const& report, Style const& style);
+
+// "frame", "answered" and "freeze", which is null for a frame that holds nothing.
+Json toJsonValue(FreezeReport const& report);
+
+} // namespace velmora

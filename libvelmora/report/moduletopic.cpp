@@ -1,0 +1,16 @@
+#include "libvelmora/report/moduletopic.h"
+
+namespace velmora {
+
+char const* answerWord(TopicAnswer answer)
+{
+    static constexpr char const* words[] = {"read", "not supported", "no answer", "unreadable"};
+    return words[static_cast<int>(answer)];
+}
+
+std::string moduleHeading(unsigned int id, std::string const& name)
+{
+    return fmt::format("Control module {:X}{}{}", id, name.empty() ? "" : ": ", name);
+}
+
+} // namespace velmora

@@ -1,0 +1,77 @@
+#pragma once
+
+#include "libvelmora/report/json.h"
+#include "program/view/style.h"
+
+#include <algorithm>
+#include <concepts>
+#include <fmt/format.h>
+#include <string>
+#include <vector>
+
+namespace velmora {
+
+// Whether a control module told of a topic.
+enum class TopicAnswer
+{
+    Read,
+    NotOffered, // by what the module says it supports, so that it was not asked
+    Silent,
+    Unreadable, // it answered in a form that can't be decoded
+};
+
+// "read", "not supported", "no answer" or "unreadable".
+char const* answerWord(TopicAnswer answer);
+
+// What one control module told of one topic. For each Report there are toText(Report, Style), indented lines without a
+// heading; toJsonValue(Report), an object; and hasAnswer(Report), whether it holds anything.
+template <typename Report>
+struct ModuleTopic
+{
+    unsigned int id;
+    std::string name;
+    Report report;
+};
+
+template <typename Report>
+concept HasTopicAnswer = requires(Report const& report)
+{
+    {
+        report.answer
+        } -> std::convertible_to<TopicAnswer>;
+};
+
+template <HasTopicAnswer Report>
+bool hasAnswer(Report const& report)
+{
+    return report.answer == TopicAnswer::Read;
+}
+
+// "Control module 7E8: ECM"
+std::string moduleHeading(unsigned int id, std::string const& name);
+
+template <typename Report>
+std::string toText(std::vector<ModuleTopic<Report>> const& modules, Style const& style)
+{
+    std::string text;
+    for (ModuleTopic<Report> const& module : modules) {
+        text +=
+            (text.empty() ? "" : "\n") + moduleHeading(module.id, module.name) + "\n" + toText(module.report, style);
+    }
+    return text;
+}
+
+// A list of modules: "id", "name", and what the topic's own object holds.
+template <typename Report>
+std::string toJson(std::vector<ModuleTopic<Report>> const& modules)
+{
+    Json list = Json::array();
+    for (ModuleTopic<Report> const& module : modules) {
+        Json entry = {{"id", fmt::format("{:X}", module.id)}, {"name", textOrNull(module.name)}};
+        entry.update(toJsonValue(module.report));
+        list.push_back(entry);
+    }
+    return printed(list);
+}
+
+} // namespace velmora

@@ -1,0 +1,29 @@
+#pragma once
+
+#include "libvelmora/report/limittest.h"
+#include "libvelmora/report/moduletopic.h"
+
+#include <string>
+#include <vector>
+
+namespace velmora {
+
+// An on-board monitor with the results of its tests.
+struct OnBoardMonitor
+{
+    int id;
+    std::string description;
+    std::vector<LimitTest> tests;
+};
+
+struct MonitorsReport
+{
+    TopicAnswer answer = TopicAnswer::NotOffered;
+    std::vector<OnBoardMonitor> monitors;
+};
+
+// A summary, then the tests by monitor; monitors with failed tests first, and in each the failed tests first.
+std::string toText(MonitorsReport const& report, Style const& style);
+Json toJsonValue(MonitorsReport const& report);
+
+} // namespace velmora

@@ -1,0 +1,39 @@
+#pragma once
+
+#include "libvelmora/report/moduletopic.h"
+
+#include <obd/readinessmonitordatamodel.h>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace velmora {
+
+using ReadinessStatus = obd::ReadinessMonitorDataModel::Status;
+
+struct ReadinessMonitor
+{
+    std::string name;
+    ReadinessStatus sinceCleared;
+    std::optional<ReadinessStatus> thisCycle; // nothing if the module does not tell it
+};
+
+// Which monitors have run, as an emissions test asks for.
+struct ReadinessReport
+{
+    TopicAnswer answer = TopicAnswer::NotOffered;
+    std::optional<bool> lamp;
+    std::vector<ReadinessMonitor> monitors;
+};
+
+// How many monitors the module has that have not run since the codes were cleared.
+std::size_t countNotComplete(ReadinessReport const& report);
+
+// Whether the module has monitors and all have run; nothing if it has none or told nothing.
+std::optional<bool> isReady(ReadinessReport const& report);
+
+// A verdict, then the monitors: what is not complete first, what the vehicle does not have last.
+std::string toText(ReadinessReport const& report, Style const& style);
+Json toJsonValue(ReadinessReport const& report);
+
+} // namespace velmora

@@ -1,0 +1,55 @@
+#include "libvelmora/report/troublecode.h"
+
+#include "libvelmora/report/json.h"
+
+#include <algorithm>
+#include <fmt/format.h>
+
+namespace velmora {
+
+std::vector<TroubleCode> groupByCode(std::vector<std::shared_ptr<obd::DtcDataModel>> const& models)
+{
+    std::vector<TroubleCode> codes;
+    for (std::shared_ptr<obd::DtcDataModel> const& model : models) {
+        auto found = std::find_if(codes.begin(), codes.end(),
+                                  [&model](TroubleCode const& code) { return code.code == model->code; });
+        if (found == codes.end()) {
+            found = codes.insert(codes.end(), {model->code, model->system, {}});
+        }
+        TroubleCode::Meaning const meaning{model->manufacturer, model->description};
+        if (std::find(found->meanings.begin(), found->meanings.end(), meaning) == found->meanings.end()) {
+            found->meanings.push_back(meaning);
+        }
+    }
+    return codes;
+}
+
+std::string toText(TroubleCode const& code, std::string const& indent)
+{
+    std::string text;
+    for (TroubleCode::Meaning const& meaning : code.meanings) {
+        text +=
+            fmt::format("{}{:<5}  {:<13}  {}\n", indent, text.empty() ? code.code : "", meaning.maker, meaning.text);
+    }
+    return text;
+}
+
+Json toJsonValue(TroubleCode const& code)
+{
+    Json meanings = Json::array();
+    for (TroubleCode::Meaning const& meaning : code.meanings) {
+        meanings.push_back({{"maker", meaning.maker}, {"text", meaning.text}});
+    }
+    return {{"code", code.code}, {"system", code.system}, {"meanings", meanings}};
+}
+
+Json toJsonValue(std::vector<TroubleCode> const& codes)
+{
+    Json list = Json::array();
+    for (TroubleCode const& code : codes) {
+        list.push_back(toJsonValue(code));
+    }
+    return list;
+}
+
+} // namespace velmora

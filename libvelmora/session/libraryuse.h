@@ -1,0 +1,18 @@
+#pragma once
+
+#include <string>
+
+namespace velmora {
+
+// The library, open for as long as the object lives.
+class LibraryUse
+{
+public:
+    // Throws Error if the log file can't be written. Empty for no log.
+    explicit LibraryUse(std::string const& logFile);
+    ~LibraryUse();
+    LibraryUse(LibraryUse const&) = delete;
+    LibraryUse& operator=(LibraryUse const&) = delete;
+};
+
+} // namespace velmora

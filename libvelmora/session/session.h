@@ -1,0 +1,80 @@
+#pragma once
+
+#include "libvelmora/port/bridgepump.h"
+#include "libvelmora/port/portaddress.h"
+#include "libvelmora/session/deadline.h"
+#include "libvelmora/session/dispatchloop.h"
+#include "libvelmora/session/libraryuse.h"
+#include "program/globaloptions.h"
+
+#include <memory>
+#include <obd/iadapter.h>
+#include <obd/iecumanager.h>
+#include <obd/iobdproxy.h>
+#include <obd/iobdvelmora.h>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace velmora {
+
+class DialogueRecorder;
+class SettingsStore;
+class TrafficTrace;
+
+// The library in use by one command: settings, log and top-level object from the start, a connection after connect. The
+// main thread's.
+class Session
+{
+public:
+    explicit Session(GlobalOptions const& options);
+    // Closes what is open. Services must be gone.
+    ~Session();
+    Session(Session const&) = delete;
+    Session& operator=(Session const&) = delete;
+
+    // Takes down all that passes the port from connect on. The recorder must outlive the session.
+    void record(DialogueRecorder& recorder) { m_recorder = &recorder; }
+
+    // Opens the port and brings up adapter and vehicle, and selects the control module that the options name. Throws
+    // Error that tells how far it came.
+    void connect();
+
+    obd::IObdVelmora& obd() const { return *m_obd; }
+    // The control modules that the options select: one, or all.
+    std::vector<std::shared_ptr<obd::IEcu>> selectedModules() const;
+    // Makes a module the one that the library's services work with.
+    void select(obd::IEcu const& ecu) const;
+    std::shared_ptr<obd::IObdProxy> proxy() const;
+    std::shared_ptr<obd::IAdapter> adapter() const;
+    // The port's address, for messages and reports.
+    std::string port() const { return toString(portAddress()); }
+    DispatchLoop& loop() { return m_loop; }
+    GlobalOptions const& options() const { return m_options; }
+
+    // Throws Error if the link has broken or the user has interrupted meanwhile.
+    void check() const;
+
+private:
+    PortAddress portAddress() const;
+    obd::VehicleProtocol protocol() const;
+    bool openOnThread();
+    [[noreturn]] void failOpening(PortAddress const& address);
+    void tellConnected() const;
+    void selectEcu();
+    void close();
+
+    GlobalOptions const m_options;
+    // Ends the waiting for a silent adapter soon after a close or an interruption began.
+    Deadline m_deadline;
+    std::shared_ptr<SettingsStore> m_settings;
+    LibraryUse const m_library;
+    DispatchLoop m_loop;
+    std::shared_ptr<obd::IObdVelmora> m_obd;
+    std::shared_ptr<obd::DataBridge> m_bridge;
+    std::unique_ptr<BridgePump> m_pump;
+    DialogueRecorder* m_recorder = nullptr;
+    std::unique_ptr<TrafficTrace> m_trace;
+};
+
+} // namespace velmora

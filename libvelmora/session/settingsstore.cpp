@@ -1,0 +1,186 @@
+#include "libvelmora/session/settingsstore.h"
+
+#include <velmora/error.h>
+
+#include <cerrno>
+#include <cstdlib>
+#include <cstring>
+#include <fcntl.h>
+#include <sstream>
+#include <toml++/toml.h>
+#include <unistd.h>
+#include <utility>
+
+namespace velmora {
+
+namespace {
+
+[[noreturn]] void failRead(std::filesystem::path const& file, std::string const& why)
+{
+    throw Error(ErrorKind::Failed, "Could not read the settings file " + file.string() + ": " + why,
+                {"mend the file, or move it away to start with the defaults", "--settings FILE names another"});
+}
+
+[[noreturn]] void failWrite(std::filesystem::path const& file, int error)
+{
+    throw Error(ErrorKind::Failed, "Could not write the settings file " + file.string() + ": " + std::strerror(error),
+                {"is there room on the disk, and may you write there? the old file is untouched",
+                 "--settings FILE names another"});
+}
+
+template <typename Visit>
+void visitLeaves(toml::table const& table, std::string const& prefix, Visit visit)
+{
+    for (auto const& [key, node] : table) {
+        std::string const path = prefix + std::string(key.str());
+        if (toml::table const* inner = node.as_table()) {
+            visitLeaves(*inner, path + "/", visit);
+        } else {
+            visit(path, node);
+        }
+    }
+}
+
+void writeWhole(std::filesystem::path const& target, std::string const& text)
+{
+    std::filesystem::path const temporary = target.string() + ".new";
+    int const file = ::open(temporary.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0600);
+    if (file < 0) {
+        failWrite(target, errno);
+    }
+    std::size_t written = 0;
+    int error = 0;
+    while (written < text.size() && error == 0) {
+        ssize_t const count = ::write(file, text.data() + written, text.size() - written);
+        if (count < 0 && errno != EINTR) {
+            error = errno;
+        } else if (count > 0) {
+            written += static_cast<std::size_t>(count);
+        }
+    }
+    if (error == 0 && ::fsync(file) != 0) {
+        error = errno;
+    }
+    ::close(file);
+    if (error == 0 && std::rename(temporary.c_str(), target.c_str()) != 0) {
+        error = errno;
+    }
+    if (error != 0) {
+        ::unlink(temporary.c_str());
+        failWrite(target, error);
+    }
+}
+
+// A value that a user wrote in the place of a group gives way to it.
+toml::table& groupIn(toml::table& table, std::string const& name)
+{
+    if (!table[name].is_table()) {
+        table.insert_or_assign(name, toml::table{});
+    }
+    return *table[name].as_table();
+}
+
+} // namespace
+
+SettingsStore::SettingsStore(std::filesystem::path file) : m_file(std::move(file))
+{
+    std::error_code error;
+    if (!std::filesystem::exists(m_file, error)) {
+        return;
+    }
+    if (std::filesystem::is_directory(m_file, error)) {
+        failRead(m_file, "it is a folder");
+    }
+    try {
+        visitLeaves(toml::parse_file(m_file.string()), {}, [this](std::string const& key, toml::node const& node) {
+            if (auto const number = node.value_exact<std::int64_t>()) {
+                if (!std::in_range<int>(*number)) {
+                    failRead(m_file, key + " is too large a number");
+                }
+                m_values[key] = static_cast<int>(*number);
+            } else if (auto const text = node.value_exact<std::string>()) {
+                m_values[key] = *text;
+            } else {
+                failRead(m_file, key + " is neither a whole number nor a text");
+            }
+        });
+    } catch (toml::parse_error const& problem) {
+        std::ostringstream place;
+        place << problem.description() << " (line " << problem.source().begin.line << ")";
+        failRead(m_file, place.str());
+    }
+}
+
+void SettingsStore::setInt(std::string const& key, int value)
+{
+    std::lock_guard const lock(m_mutex);
+    m_values[key] = value;
+}
+
+void SettingsStore::setString(std::string const& key, std::string const& value)
+{
+    std::lock_guard const lock(m_mutex);
+    m_values[key] = value;
+}
+
+template <typename T>
+bool SettingsStore::get(std::string const& key, T& value)
+{
+    std::lock_guard const lock(m_mutex);
+    auto const found = m_values.find(key);
+    if (found == m_values.end() || !std::holds_alternative<T>(found->second)) {
+        return false;
+    }
+    value = std::get<T>(found->second);
+    return true;
+}
+
+bool SettingsStore::getInt(std::string const& key, int& value)
+{
+    return get(key, value);
+}
+
+bool SettingsStore::getString(std::string const& key, std::string& value)
+{
+    return get(key, value);
+}
+
+std::string SettingsStore::toToml() const
+{
+    toml::table root;
+    for (auto const& [key, value] : m_values) {
+        toml::table* table = &root;
+        std::size_t begin = 0;
+        for (std::size_t slash = key.find('/'); slash != std::string::npos; slash = key.find('/', begin)) {
+            table = &groupIn(*table, key.substr(begin, slash - begin));
+            begin = slash + 1;
+        }
+        std::string const name = key.substr(begin);
+        std::visit([&](auto const& plain) { table->insert_or_assign(name, plain); }, value);
+    }
+    std::ostringstream text;
+    text << root << "\n";
+    return text.str();
+}
+
+void SettingsStore::sync()
+{
+    std::lock_guard const lock(m_mutex);
+    std::error_code error;
+    if (m_file.has_parent_path()) {
+        std::filesystem::create_directories(m_file.parent_path(), error);
+    }
+    writeWhole(m_file, toToml());
+}
+
+std::filesystem::path SettingsStore::defaultFile()
+{
+    char const* const configured = std::getenv("XDG_CONFIG_HOME");
+    char const* const home = std::getenv("HOME");
+    std::filesystem::path const folder = configured != nullptr && *configured != '\0'
+                                             ? std::filesystem::path(configured)
+                                             : std::filesystem::path(home != nullptr ? home : ".") / ".config";
+    return folder / "velmora" / "settings.toml";
+}
+
+} // namespace velmora

@@ -1,0 +1,78 @@
+#include "libvelmora/read/codereader.h"
+#include "program/command/commands.h"
+#include "program/command/modulecommand.h"
+#include "program/commandline.h"
+
+#include <algorithm>
+
+namespace velmora {
+
+namespace {
+
+struct CodesOptions
+{
+    bool confirmed = false;
+    bool pending = false;
+    bool permanent = false;
+};
+
+std::vector<CodeKind> chosenKinds(CodesOptions const& options)
+{
+    bool const all = !options.confirmed && !options.pending && !options.permanent;
+    std::vector<CodeKind> kinds;
+    for (auto const& [kind, chosen] : {std::pair(CodeKind::Confirmed, options.confirmed),
+                                       {CodeKind::Pending, options.pending},
+                                       {CodeKind::Permanent, options.permanent}}) {
+        if (chosen || all) {
+            kinds.push_back(kind);
+        }
+    }
+    return kinds;
+}
+
+bool anyRefused(std::vector<ModuleCodes> const& modules)
+{
+    return std::any_of(modules.begin(), modules.end(), [](ModuleCodes const& module) {
+        return std::any_of(module.report.lists.begin(), module.report.lists.end(),
+                           [](CodeList const& list) { return list.answer == CodeList::Answer::Refused; });
+    });
+}
+
+Error withoutAnswer(std::vector<ModuleCodes> const& modules)
+{
+    if (anyRefused(modules)) {
+        return {ErrorKind::Refused,
+                "The vehicle refused to tell these codes",
+                {"try again with the ignition on and the engine off"}};
+    }
+    return {ErrorKind::NotSupported,
+            "No control module told these codes",
+            {"is the ignition on?", "pending codes are not told by all vehicles, permanent ones only by newer"}};
+}
+
+ExitCode codes(CodesOptions const& chosen, GlobalOptions const& options)
+{
+    Session session(options);
+    session.connect();
+    CodeReader reader(session);
+    auto const modules = readModules(
+        session, [&](Session& /*session*/, obd::IEcu const& ecu) { return reader.read(ecu, chosenKinds(chosen)); });
+    print(modules, options);
+    requireAnswer(modules, withoutAnswer(modules));
+    return ExitCode::Done;
+}
+
+} // namespace
+
+void addCodesCommand(CommandLine& commandLine)
+{
+    auto const chosen = std::make_shared<CodesOptions>();
+    CLI::App* const command =
+        commandLine.addCommand("codes", "Show trouble codes; all kinds, if none is chosen",
+                               [chosen](GlobalOptions const& options) { return codes(*chosen, options); });
+    command->add_flag("--confirmed", chosen->confirmed, "The stored codes");
+    command->add_flag("--pending", chosen->pending, "Codes of this or the last driving cycle");
+    command->add_flag("--permanent", chosen->permanent, "Codes that only the vehicle itself erases");
+}
+
+} // namespace velmora

@@ -1,0 +1,27 @@
+#include "program/command/commands.h"
+
+namespace velmora {
+
+void addCommands(CommandLine& commandLine)
+{
+    addScanCommand(commandLine);
+    addLiveCommand(commandLine);
+    addSensorsCommand(commandLine);
+    addCodesCommand(commandLine);
+    addClearCommand(commandLine);
+    addFreezeCommand(commandLine);
+    addReadinessCommand(commandLine);
+    addMonitorsCommand(commandLine);
+    addOxygenCommand(commandLine);
+    addCountersCommand(commandLine);
+    addInfoCommand(commandLine);
+    addRoutinesCommand(commandLine);
+    addDtcCommand(commandLine);
+    addConsoleCommand(commandLine);
+    addLogCommand(commandLine);
+    addRecordCommand(commandLine);
+    addSimulateCommand(commandLine);
+    addPortsCommand(commandLine);
+}
+
+} // namespace velmora

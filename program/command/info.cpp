@@ -1,0 +1,25 @@
+#include "libvelmora/read/diagnosticreaders.h"
+#include "program/command/commands.h"
+#include "program/command/modulecommand.h"
+#include "program/commandline.h"
+
+namespace velmora {
+
+namespace {
+
+ExitCode info(GlobalOptions const& options)
+{
+    Session session(options);
+    session.connect();
+    print(readModules(session, readInfo), options);
+    return ExitCode::Done;
+}
+
+} // namespace
+
+void addInfoCommand(CommandLine& commandLine)
+{
+    commandLine.addCommand("info", "Show what the control modules tell of themselves and the vehicle", info);
+}
+
+} // namespace velmora

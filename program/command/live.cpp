@@ -1,0 +1,39 @@
+#include "program/command/commands.h"
+#include "program/command/liverun.h"
+#include "program/commandline.h"
+
+namespace velmora {
+
+namespace {
+
+ExitCode live(GlobalOptions const& global, LiveOptions const& options)
+{
+    std::unique_ptr<LiveCsv> const csv = options.csv.empty() ? nullptr : std::make_unique<LiveCsv>(options.csv);
+    Session session(global);
+    session.connect();
+    LiveRun run(session, options, csv.get());
+    run.run();
+    return ExitCode::Done;
+}
+
+} // namespace
+
+void addLiveCommand(CommandLine& commandLine)
+{
+    auto const options = std::make_shared<LiveOptions>();
+    CLI::App* const command = commandLine.addCommand(
+        "live", "Show live values", [options](GlobalOptions const& global) { return live(global, *options); });
+    command->add_option("SENSOR", options->sensors,
+                        "PIDs (0C, 0x0C), names (RPM, COOLANT_TEMP), words of a title, or all;\n"
+                        "without: speed, engine speed, coolant, load and throttle");
+    command->add_option("--csv", options->csv, "Record there, one column a sensor; - is standard output")
+        ->type_name("FILE");
+    command->add_option("-n,--count", options->count, "Stop after N readings of every sensor")
+        ->type_name("N")
+        ->check(CLI::Range(1UL, 1000000000UL));
+    command->add_option("--duration", options->duration, "Stop after S seconds")
+        ->type_name("S")
+        ->check(CLI::Range(0.001, 1e9));
+}
+
+} // namespace velmora

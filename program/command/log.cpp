@@ -1,0 +1,111 @@
+#include "libvelmora/read/sensorchoice.h"
+#include "libvelmora/session/session.h"
+#include "program/command/commands.h"
+#include "program/commandline.h"
+#include "program/terminal/interrupt.h"
+#include "program/terminal/lineprinter.h"
+#include "program/view/trafficlog.h"
+
+#include <chrono>
+#include <obd/isensorservice.h>
+#include <obd/itroubleshootingservice.h>
+#include <tervex/observer.h>
+
+namespace velmora {
+
+namespace {
+
+using Clock = std::chrono::steady_clock;
+
+constexpr std::chrono::milliseconds lookInterval{50};
+
+struct LogOptions
+{
+    std::vector<std::string> sensors;
+    std::size_t count = 0; // entries; 0: no end
+    double duration = 0.0; // seconds after the connection stands; 0: no end
+};
+
+// Prints the traffic from its construction on, that of connecting too.
+class TrafficLog : public tervex::Observer<obd::ITroubleshootingServiceObserver>
+{
+public:
+    explicit TrafficLog(bool json)
+        : m_json(json), m_service(obd::TroubleshootingServiceBuilder::createTroubleshootingService())
+    {
+        m_service->attach(this);
+        m_service->startLogging();
+    }
+    ~TrafficLog() override = default;
+    TrafficLog(TrafficLog const&) = delete;
+    TrafficLog& operator=(TrafficLog const&) = delete;
+
+    bool printed(std::size_t entries) const { return m_printer.lines() >= entries; }
+    bool readerGone() const { return m_printer.readerGone(); }
+
+    // Ends with what was logged so far. Throws Error if it can't be printed.
+    void finish()
+    {
+        m_service.reset();
+        m_printer.finish();
+    }
+
+private:
+    void onLogEntryAdded(std::shared_ptr<obd::MessageDataModel> const& entry) override
+    {
+        m_printer.print(m_json ? toJsonLine(*entry) : toLine(*entry));
+    }
+
+    bool const m_json;
+    LinePrinter m_printer;
+    // Its end waits for an entry that is under way on another thread, which detaching would not.
+    std::shared_ptr<obd::ITroubleshootingService> m_service;
+};
+
+SensorIds chosenSensors(std::vector<std::string> const& names, obd::ISensorService& service)
+{
+    return names.empty() ? SensorIds() : chooseSensors(names, offeredSensors(service));
+}
+
+ExitCode log(LogOptions const& chosen, GlobalOptions const& options)
+{
+    Session session(options);
+    TrafficLog traffic(options.json);
+    session.connect();
+    auto const sensors = obd::SensorServiceBuilder::createSensorService();
+    sensors->startUpdates(chosenSensors(chosen.sensors, *sensors));
+    Clock::time_point const start = Clock::now();
+    auto const done = [&] {
+        bool const counted = chosen.count > 0 && traffic.printed(chosen.count);
+        bool const expired =
+            chosen.duration > 0.0 && Clock::now() - start >= std::chrono::duration<double>(chosen.duration);
+        return counted || expired || traffic.readerGone();
+    };
+    while (!done()) {
+        Clock::time_point const limit = Clock::now() + lookInterval;
+        session.loop().runUntil([&] { return Interrupt::instance().raised() || Clock::now() >= limit; }, limit);
+        session.check();
+    }
+    traffic.finish();
+    return ExitCode::Done;
+}
+
+} // namespace
+
+void addLogCommand(CommandLine& commandLine)
+{
+    auto const chosen = std::make_shared<LogOptions>();
+    CLI::App* const command =
+        commandLine.addCommand("log", "Show the traffic with the adapter as it happens",
+                               [chosen](GlobalOptions const& options) { return log(*chosen, options); });
+    command->add_option("SENSOR", chosen->sensors,
+                        "What to ask for meanwhile, named as for live; without, only the connection is kept up");
+    command->add_option("-n,--count", chosen->count, "Stop after N entries")
+        ->type_name("N")
+        ->check(CLI::Range(1UL, 1000000000UL));
+    command->add_option("--duration", chosen->duration, "Stop S seconds after the connection stands")
+        ->type_name("S")
+        ->check(CLI::Range(0.001, 1e9));
+}
+
+} // namespace velmora

@@ -1,0 +1,71 @@
+#pragma once
+
+#include "libvelmora/report/moduletopic.h"
+#include "libvelmora/session/session.h"
+#include "libvelmora/text/text.h"
+#include "program/exitcode.h"
+#include "program/terminal/output.h"
+#include <velmora/error.h>
+
+#include <algorithm>
+#include <fmt/format.h>
+#include <obd/iecu.h>
+#include <type_traits>
+
+// The common shape of the commands that show one topic of every control module.
+
+namespace velmora {
+
+// read: a Report of a Session and one of its modules, which it selects as the current one.
+template <typename Read>
+auto readModules(Session& session, Read const& read)
+{
+    using Report = std::invoke_result_t<Read const&, Session&, obd::IEcu const&>;
+    std::vector<ModuleTopic<Report>> modules;
+    for (std::shared_ptr<obd::IEcu> const& ecu : session.selectedModules()) {
+        modules.push_back({ecu->id(), readable(ecu->name()), read(session, *ecu)});
+        session.check();
+    }
+    return modules;
+}
+
+template <typename Report>
+void print(std::vector<ModuleTopic<Report>> const& modules, GlobalOptions const& options)
+{
+    fmt::print("{}", options.json ? toJson(modules) : toText(modules, outputStyle(options)));
+    flushOutput();
+}
+
+// Throws, if no module told anything: that the vehicle is silent, if one offers it, else what is given.
+template <typename Report>
+void requireAnswer(std::vector<ModuleTopic<Report>> const& modules, Error const& notOffered)
+{
+    auto const any = [&modules](auto const& holds) {
+        return std::any_of(modules.begin(), modules.end(),
+                           [&holds](ModuleTopic<Report> const& module) { return holds(module.report); });
+    };
+    if (any([](Report const& report) { return hasAnswer(report); })) {
+        return;
+    }
+    if constexpr (HasTopicAnswer<Report>) {
+        if (any([](Report const& report) { return report.answer == TopicAnswer::Silent; })) {
+            throw Error(ErrorKind::VehicleSilent, "The vehicle offers this, but did not answer",
+                        {"is the ignition still on?", "some vehicles answer only with the engine running, or only "
+                                                      "with it off"});
+        }
+    }
+    throw notOffered;
+}
+
+template <typename Read>
+ExitCode showTopic(GlobalOptions const& options, Read const& read, Error const& notOffered)
+{
+    Session session(options);
+    session.connect();
+    auto const modules = readModules(session, read);
+    print(modules, options);
+    requireAnswer(modules, notOffered);
+    return ExitCode::Done;
+}
+
+} // namespace velmora

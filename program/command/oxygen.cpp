@@ -1,0 +1,19 @@
+#include "libvelmora/read/diagnosticreaders.h"
+#include "program/command/commands.h"
+#include "program/command/modulecommand.h"
+#include "program/commandline.h"
+
+namespace velmora {
+
+void addOxygenCommand(CommandLine& commandLine)
+{
+    commandLine.addCommand("oxygen", "Show the oxygen sensors, and their tests on buses before CAN",
+                           [](GlobalOptions const& options) {
+                               return showTopic(options, readOxygen,
+                                                {ErrorKind::NotSupported,
+                                                 "No control module reports oxygen sensors",
+                                                 {"diesel engines have none, or don't report them"}});
+                           });
+}
+
+} // namespace velmora

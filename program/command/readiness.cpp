@@ -1,0 +1,19 @@
+#include "libvelmora/read/diagnosticreaders.h"
+#include "program/command/commands.h"
+#include "program/command/modulecommand.h"
+#include "program/commandline.h"
+
+namespace velmora {
+
+void addReadinessCommand(CommandLine& commandLine)
+{
+    commandLine.addCommand("readiness", "Show which monitors have run since codes were cleared",
+                           [](GlobalOptions const& options) {
+                               return showTopic(options, readReadiness,
+                                                {ErrorKind::NotSupported,
+                                                 "No control module tells its readiness",
+                                                 {"some gearboxes and brakes don't; leave --ecu out to ask all"}});
+                           });
+}
+
+} // namespace velmora

@@ -1,0 +1,54 @@
+#include "libvelmora/read/vehiclereader.h"
+#include "libvelmora/session/session.h"
+#include "program/command/commands.h"
+#include "program/commandline.h"
+#include "program/terminal/output.h"
+#include <velmora/error.h>
+
+#include <algorithm>
+#include <fmt/format.h>
+
+namespace velmora {
+
+namespace {
+
+// A car that tells none of its codes is not known to be free of them.
+ExitCode check(VehicleReport const& report)
+{
+    auto const anyModule = [&report](bool (*holds)(CodeReport const&)) {
+        return std::any_of(report.modules.begin(), report.modules.end(),
+                           [holds](ModuleReport const& module) { return holds(module.codes); });
+    };
+    if (anyModule(hasFindings)) {
+        return ExitCode::Findings;
+    }
+    if (!anyModule(canBeChecked)) {
+        flushOutput();
+        throw Error(ErrorKind::NotSupported, "No control module told its trouble codes, so there is nothing to check",
+                    {"is the ignition on?"});
+    }
+    return ExitCode::Done;
+}
+
+ExitCode scan(bool checking, GlobalOptions const& options)
+{
+    Session session(options);
+    session.connect();
+    VehicleReport const report = readVehicle(session);
+    fmt::print("{}", options.json ? toJson(report) : toText(report, outputStyle(options)));
+    return checking ? check(report) : ExitCode::Done;
+}
+
+} // namespace
+
+void addScanCommand(CommandLine& commandLine)
+{
+    auto const checking = std::make_shared<bool>(false);
+    CLI::App* const command =
+        commandLine.addCommand("scan", "Report on the adapter and all control modules",
+                               [checking](GlobalOptions const& options) { return scan(*checking, options); });
+    command->add_flag("--check", *checking,
+                      "Exit with code 10 if the lamp is on or a code is confirmed or permanent; a pending one is none");
+}
+
+} // namespace velmora

@@ -1,0 +1,163 @@
+#include "libvelmora/report/json.h"
+#include "libvelmora/report/unitlabel.h"
+#include "libvelmora/session/session.h"
+#include "libvelmora/text/text.h"
+#include "program/command/commands.h"
+#include "program/commandline.h"
+
+#include <fmt/format.h>
+#include <obd/iecu.h>
+#include <obd/iecuservice.h>
+
+namespace velmora {
+
+namespace {
+
+struct Service
+{
+    obd::ObdMode mode;
+    char const* title;
+};
+
+constexpr Service services[] = {
+    {obd::ObdMode::CurrentData, "01 current data"},
+    {obd::ObdMode::MonitorTests, "06 monitor tests"},
+    {obd::ObdMode::SystemControl, "08 system control"},
+    {obd::ObdMode::VehicleInformation, "09 vehicle information"},
+};
+
+// Without the markers that only tell of the next range.
+std::vector<std::string> identifiers(obd::IEcu const& ecu, obd::ObdMode mode)
+{
+    std::vector<std::string> texts;
+    for (unsigned char const id : ecu.supportedIds(mode, 0)) {
+        if ((id & 0x1F) != 0) {
+            texts.push_back(fmt::format("{:02X}", id));
+        }
+    }
+    return texts;
+}
+
+struct SensorsOptions
+{
+    bool all = false;
+};
+
+struct Offer
+{
+    std::shared_ptr<obd::ParameterDataModel> parameter;
+    bool offered;
+};
+
+// What the library can show of the selected module; all of it, or what the module offers.
+std::vector<Offer> offers(bool all)
+{
+    std::vector<Offer> list;
+    auto const service = obd::EcuServiceBuilder::createEcuService();
+    for (auto const& parameter : service->supportedParameters()) {
+        bool const offered = service->isParameterSupported(parameter);
+        if (offered || all) {
+            list.push_back({parameter, offered});
+        }
+    }
+    return list;
+}
+
+std::string range(obd::SensorDataModel const& sensor)
+{
+    return sensor.numeric != nullptr ? fmt::format("{} to {}", sensor.numeric->minimum, sensor.numeric->maximum)
+                                     : "text";
+}
+
+void printOffer(Offer const& offer, bool all)
+{
+    std::string lead = fmt::format("{:02X}", static_cast<int>(offer.parameter->id));
+    for (auto const& sensor : offer.parameter->sensors) {
+        std::string const line =
+            fmt::format("  {:<2}  {:<58}  {:<8}  {}", lead, sensor->name, unitLabel(sensor->unit), range(*sensor));
+        if (all) {
+            fmt::print("{:<92}{}\n", line, offer.offered ? "offered" : "-");
+        } else {
+            fmt::print("{}\n", line);
+        }
+        lead.clear();
+    }
+}
+
+void printText(obd::IEcu const& ecu, bool all)
+{
+    fmt::print("Control module {:X}: {} ({})\n", ecu.id(), readable(ecu.name()), readable(ecu.description()));
+    for (Service const& service : services) {
+        std::vector<std::string> const ids = identifiers(ecu, service.mode);
+        fmt::print("  {:<24} {}\n", service.title, ids.empty() ? "-" : fmt::format("{}", fmt::join(ids, " ")));
+    }
+    fmt::print("\n");
+    for (Offer const& offer : offers(all)) {
+        printOffer(offer, all);
+    }
+    fmt::print("\n");
+}
+
+Json sensorJson(obd::SensorDataModel const& sensor)
+{
+    Json json = {{"uid", sensor.uid}, {"name", sensor.name}, {"unit", textOrNull(unitLabel(sensor.unit))}};
+    json["minimum"] = sensor.numeric != nullptr ? Json(sensor.numeric->minimum) : Json(nullptr);
+    json["maximum"] = sensor.numeric != nullptr ? Json(sensor.numeric->maximum) : Json(nullptr);
+    return json;
+}
+
+Json toJson(obd::IEcu const& ecu, bool all)
+{
+    Json supported;
+    for (Service const& service : services) {
+        supported[std::string(service.title, 2)] = identifiers(ecu, service.mode);
+    }
+    Json parameters = Json::array();
+    for (Offer const& offer : offers(all)) {
+        Json sensorList = Json::array();
+        for (auto const& sensor : offer.parameter->sensors) {
+            sensorList.push_back(sensorJson(*sensor));
+        }
+        parameters.push_back({{"id", fmt::format("{:02X}", static_cast<int>(offer.parameter->id))},
+                              {"name", offer.parameter->name},
+                              {"offered", offer.offered},
+                              {"sensors", sensorList}});
+    }
+    return {{"id", fmt::format("{:X}", ecu.id())},
+            {"name", textOrNull(ecu.name())},
+            {"description", textOrNull(ecu.description())},
+            {"supported", supported},
+            {"parameters", parameters}};
+}
+
+ExitCode sensors(GlobalOptions const& options, bool all)
+{
+    Session session(options);
+    session.connect();
+    Json modules = Json::array();
+    for (std::shared_ptr<obd::IEcu> const& ecu : session.selectedModules()) {
+        session.select(*ecu);
+        if (options.json) {
+            modules.push_back(toJson(*ecu, all));
+        } else {
+            printText(*ecu, all);
+        }
+    }
+    if (options.json) {
+        fmt::print("{}", printed(modules));
+    }
+    return ExitCode::Done;
+}
+
+} // namespace
+
+void addSensorsCommand(CommandLine& commandLine)
+{
+    auto const chosen = std::make_shared<SensorsOptions>();
+    CLI::App* const command =
+        commandLine.addCommand("sensors", "List what the vehicle offers, by control module",
+                               [chosen](GlobalOptions const& options) { return sensors(options, chosen->all); });
+    command->add_flag("--all", chosen->all, "Also what the vehicle does not offer");
+}
+
+} // namespace velmora

@@ -1,0 +1,172 @@
+#include "program/commandline.h"
+
+#include "program/terminal/output.h"
+#include "velmora/version.h"
+#include <velmora/error.h>
+
+#include <CLI/Config.hpp>
+#include <CLI/Formatter.hpp>
+#include <cerrno>
+#include <cstdio>
+#include <exception>
+#include <fmt/format.h>
+#include <map>
+#include <system_error>
+#include <utility>
+
+namespace velmora {
+
+namespace {
+
+constexpr char const* exitCodes =
+    R"(Exit codes: 0 done; 1 failed otherwise; 2 wrong use; 3 port not opened; 4 adapter silent;
+5 vehicle silent; 6 not supported by the vehicle; 7 refused by the vehicle; 8 link lost;
+10 findings, with --check; 130 interrupted.)";
+
+void report(Error const& failure)
+{
+    tell(fmt::format("velmora: {}\n", failure.what()));
+    for (std::string const& hint : failure.hints()) {
+        tell(fmt::format("  - {}\n", hint));
+    }
+}
+
+// A reader of standard output that has gone, such as head, has read enough and needs no message.
+ExitCode judge(std::system_error const& error)
+{
+    if (std::ferror(stdout) == 0) {
+        tell(fmt::format("velmora: {}\n", error.what()));
+    } else if (error.code().value() != EPIPE) {
+        report(outputFailure(error.code().value()));
+    }
+    return ExitCode::Failed;
+}
+
+template <typename Value, typename Parse>
+CLI::Option* addParsed(CLI::App& app, std::string const& names, std::optional<Value>& target, Parse parse,
+                       std::string const& expected, std::string const& help)
+{
+    return app.add_option_function<std::string>(
+        names,
+        [&target, parse, expected](std::string const& text) {
+            target = parse(text);
+            if (!target) {
+                throw CLI::ValidationError("\"" + text + "\" is not understood; expected " + expected);
+            }
+        },
+        help);
+}
+
+template <typename Value>
+std::optional<Value> parseWord(std::map<std::string, Value> const& words, std::string const& text)
+{
+    auto const found = words.find(text);
+    return found != words.end() ? std::optional(found->second) : std::nullopt;
+}
+
+std::optional<obd::UnitSystem> parseUnits(std::string const& text)
+{
+    return parseWord<obd::UnitSystem>({{"metric", obd::UnitSystem::Metric}, {"imperial", obd::UnitSystem::Imperial}},
+                                      text);
+}
+
+std::optional<ColorMode> parseColor(std::string const& text)
+{
+    return parseWord<ColorMode>({{"auto", ColorMode::Auto}, {"always", ColorMode::Always}, {"never", ColorMode::Never}},
+                                text);
+}
+
+} // namespace
+
+CommandLine::CommandLine() : m_app("Reads live data, trouble codes and vehicle data from a car.", "velmora")
+{
+    m_app.require_subcommand(1);
+    m_app.set_version_flag("-V,--version", std::string("velmora ") + versionText);
+    m_app.set_help_flag("-h,--help", "Print this help");
+    m_app.set_help_all_flag("--help-all", "Print the help of all commands");
+    m_app.footer(exitCodes);
+    addGlobalOptions();
+}
+
+void CommandLine::addGlobalOptions()
+{
+    m_app.fallthrough();
+    m_app
+        .add_option("-p,--port", m_options.port,
+                    "Where the adapter is: /dev/ttyUSB0, serial:///dev/ttyUSB0?baud=38400,\n"
+                    "HOST:PORT, tcp://HOST:PORT, sim:VEHICLE, replay:FILE")
+        ->type_name("PORT")
+        ->envname("VELMORA_PORT");
+    m_app.add_option("-b,--baud", m_options.baud, "Line rate of a serial port (38400)")
+        ->type_name("N")
+        ->check(CLI::Range(300, 4000000));
+    addParsed(m_app, "-P,--protocol", m_options.protocol, parseProtocol, "auto or a number from 1 to 9",
+              "Bus protocol: auto or 1 to 9")
+        ->type_name("N");
+    addParsed(m_app, "-u,--units", m_options.units, parseUnits, "metric or imperial",
+              "Unit system for this run: metric or imperial")
+        ->type_name("SYSTEM");
+    addParsed(m_app, "--ecu", m_options.ecu, parseEcuId, "a control module id in hexadecimal, such as 7E8",
+              "Control module, hexadecimal (the first)")
+        ->type_name("ID");
+    m_app.add_flag("--json", m_options.json, "One JSON document on standard output");
+    m_app.add_option("--log", m_options.logFile, "Write the library's log there")->type_name("FILE");
+    m_app.add_option("--trace", m_options.traceFile, "Write the adapter traffic there, with times")->type_name("FILE");
+    m_app
+        .add_option("--settings", m_options.settingsFile,
+                    "Settings file (velmora/settings.toml in the user's configuration folder)")
+        ->type_name("FILE")
+        ->envname("VELMORA_SETTINGS");
+    m_app.add_flag("--reset", m_options.reset, "Restore and reset the adapter before use");
+    m_app.add_flag("-y,--yes", m_options.yes, "Don't ask before clearing codes or running a routine");
+    m_app.add_flag("-q,--quiet", m_options.quiet, "No progress on standard error");
+    m_app.add_flag("-v,--verbose", m_options.verbose, "More progress on standard error");
+    addParsed(m_app, "--color", m_options.color, parseColor, "auto, always or never",
+              "Colours: auto, always or never (also NO_COLOR)")
+        ->type_name("WHEN");
+}
+
+CLI::App* CommandLine::addCommand(std::string const& name, std::string const& help, Action action)
+{
+    CLI::App* command = m_app.add_subcommand(name, help);
+    command->callback([this, chosen = std::move(action)] { m_action = chosen; });
+    return command;
+}
+
+ExitCode CommandLine::run(int argc, char const* const* argv)
+{
+    try {
+        m_app.parse(argc, argv);
+    } catch (CLI::Success const& wanted) {
+        m_action = [&](GlobalOptions const& /*options*/) {
+            m_app.exit(wanted);
+            return ExitCode::Done;
+        };
+        return runAction();
+    } catch (CLI::ParseError const& error) {
+        std::vector<std::string> const unknown = m_app.remaining();
+        tell(fmt::format("velmora: {}\n  - velmora --help tells the options and commands\n",
+                         unknown.empty() ? error.what() : "\"" + unknown.front() + "\" is no command or option"));
+        return ExitCode::WrongUse;
+    }
+    return runAction();
+}
+
+ExitCode CommandLine::runAction()
+{
+    try {
+        ExitCode const code = m_action(m_options);
+        flushOutput();
+        return code;
+    } catch (Error const& failure) {
+        report(failure);
+        return exitCode(failure);
+    } catch (std::system_error const& error) {
+        return judge(error);
+    } catch (std::exception const& error) {
+        tell(fmt::format("velmora: {}\n", error.what()));
+        return ExitCode::Failed;
+    }
+}
+
+} // namespace velmora

@@ -1,0 +1,42 @@
+#include "program/terminal/linereader.h"
+
+#include "libvelmora/session/session.h"
+
+#include <poll.h>
+#include <unistd.h>
+#include <utility>
+
+namespace velmora {
+
+bool LineReader::read(std::string& line)
+{
+    while (true) {
+        std::size_t const end = m_buffer.find('\n');
+        if (end != std::string::npos) {
+            line = m_buffer.substr(0, end);
+            m_buffer.erase(0, end + 1);
+            return true;
+        }
+        if (!fill()) {
+            line = std::exchange(m_buffer, {});
+            return !line.empty();
+        }
+    }
+}
+
+bool LineReader::fill()
+{
+    pollfd input{STDIN_FILENO, POLLIN, 0};
+    while (::poll(&input, 1, 100) <= 0) {
+        m_session.check();
+    }
+    m_session.check();
+    char bytes[512];
+    ssize_t const count = ::read(STDIN_FILENO, bytes, sizeof bytes);
+    if (count > 0) {
+        m_buffer.append(bytes, static_cast<std::size_t>(count));
+    }
+    return count > 0;
+}
+
+} // namespace velmora

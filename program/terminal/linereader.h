@@ -1,0 +1,25 @@
+#pragma once
+
+#include <string>
+
+namespace velmora {
+
+class Session;
+
+// Lines of standard input, without losing Ctrl-C while waiting for one.
+class LineReader
+{
+public:
+    explicit LineReader(Session const& session) : m_session(session) {}
+
+    // False at the end of the input. Throws Error if the link breaks or the user interrupts meanwhile.
+    bool read(std::string& line);
+
+private:
+    bool fill();
+
+    Session const& m_session;
+    std::string m_buffer;
+};
+
+} // namespace velmora

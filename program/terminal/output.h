@@ -1,0 +1,23 @@
+#pragma once
+
+#include <velmora/error.h>
+
+#include <string>
+
+// Standard output: what is printed there is buffered, so that it may fail late.
+
+namespace velmora {
+
+// Writes at once. False if the reader has gone, who has read enough then. Throws Error if the text can't be written.
+bool writeOutput(std::string const& text);
+
+// Writes what was printed so far; throws std::system_error, as printing does, if that fails.
+void flushOutput();
+
+// Writes to standard error. Where that can't be written to there is nobody to be told.
+void tell(std::string const& text);
+
+// What to tell of an error number of standard output.
+Error outputFailure(int error);
+
+} // namespace velmora

@@ -1,0 +1,71 @@
+#include "program/terminal/promptreader.h"
+
+#include "libvelmora/session/session.h"
+#include "program/terminal/interrupt.h"
+#include "program/terminal/output.h"
+#include <velmora/error.h>
+
+#include <cstdlib>
+#include <cstring>
+#include <fmt/format.h>
+#include <unistd.h>
+
+namespace velmora {
+
+bool PromptReader::isUsable()
+{
+    char const* const kind = std::getenv("TERM");
+    return ::isatty(STDIN_FILENO) != 0 && ::isatty(STDERR_FILENO) != 0 && kind != nullptr && *kind != '\0' &&
+           std::strcmp(kind, "dumb") != 0;
+}
+
+PromptReader::PromptReader(Session const& session) : m_session(session)
+{
+    Interrupt::instance().setLastAct([this] { m_keys.restore(); });
+}
+
+PromptReader::~PromptReader()
+{
+    Interrupt::instance().setLastAct(nullptr);
+}
+
+bool PromptReader::read(std::string& line)
+{
+    draw();
+    try {
+        LineEditor::State const state = typeOn();
+        tell("\n");
+        line = m_editor.take();
+        return state == LineEditor::State::Entered;
+    } catch (Error const&) {
+        tell("\n"); // what is told next has a line of its own
+        throw;
+    }
+}
+
+LineEditor::State PromptReader::typeOn()
+{
+    constexpr std::chrono::milliseconds step{100};
+    while (true) {
+        m_session.check();
+        std::optional<Key> const key = m_keys.read(step);
+        LineEditor::State const state = key ? m_editor.press(*key) : LineEditor::State::Typing;
+        if (m_keys.ended()) {
+            return LineEditor::State::Ended;
+        }
+        if (state != LineEditor::State::Typing) {
+            return state;
+        }
+        if (key) {
+            draw();
+        }
+    }
+}
+
+void PromptReader::draw() const
+{
+    std::size_t const behind = m_editor.text().size() - m_editor.cursor();
+    tell(fmt::format("\r> {}\033[K{}", m_editor.text(), behind > 0 ? fmt::format("\033[{}D", behind) : ""));
+}
+
+} // namespace velmora

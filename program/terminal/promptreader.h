@@ -1,0 +1,37 @@
+#pragma once
+
+#include "program/terminal/keyinput.h"
+#include "program/terminal/lineeditor.h"
+
+#include <string>
+
+namespace velmora {
+
+class Session;
+
+// Lines that a user types at a prompt on standard error, with the lines before them behind the arrow keys. However the
+// program ends short of being killed, the terminal is as before.
+class PromptReader
+{
+public:
+    // Whether both ends are a terminal that the cursor can be moved on.
+    static bool isUsable();
+
+    explicit PromptReader(Session const& session);
+    ~PromptReader();
+    PromptReader(PromptReader const&) = delete;
+    PromptReader& operator=(PromptReader const&) = delete;
+
+    // False if the user ends the input. Throws Error if the link breaks or the user interrupts meanwhile.
+    bool read(std::string& line);
+
+private:
+    LineEditor::State typeOn();
+    void draw() const;
+
+    Session const& m_session;
+    KeyInput m_keys;
+    LineEditor m_editor;
+};
+
+} // namespace velmora

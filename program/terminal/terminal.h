@@ -1,0 +1,44 @@
+#pragma once
+
+#include "program/terminal/keyinput.h"
+
+#include <cstddef>
+#include <optional>
+#include <string>
+
+namespace velmora {
+
+// The screen of a terminal for as long as the object lives: keys come singly and are not shown, frames replace each
+// other on a page of their own. However the program ends short of being killed, the terminal is as before. Ctrl-C goes
+// on to interrupt; Ctrl-Z does nothing.
+class Terminal
+{
+public:
+    struct Size
+    {
+        std::size_t columns;
+        std::size_t rows;
+    };
+
+    // Whether standard output is a terminal that can be drawn on.
+    static bool isUsable();
+
+    Terminal();
+    ~Terminal();
+    Terminal(Terminal const&) = delete;
+    Terminal& operator=(Terminal const&) = delete;
+
+    Size size() const;
+    // Shows lines from the top; none may be wider than the screen.
+    void draw(std::string const& frame);
+    // The next key that was pressed, if any.
+    std::optional<Key> readKey();
+
+private:
+    void leave();
+
+    KeyInput m_keys;
+    bool m_inside = false;
+};
+
+} // namespace velmora

@@ -1,0 +1,29 @@
+#pragma once
+
+#include "program/view/style.h"
+
+#include <string>
+#include <vector>
+
+namespace velmora {
+
+// One line under the heading of a control module: label and value in columns. A value that was not told is "-".
+std::string labelledLine(std::string const& label, std::string const& value);
+
+struct Cell
+{
+    std::string text;
+    Mark mark = Mark::None;
+    bool rightAligned = false;
+};
+
+// A line a row behind the indent, each column as wide as its widest cell. A row of one cell stands across all columns.
+std::string drawColumns(std::vector<std::vector<Cell>> const& rows, std::string const& indent, Style const& style);
+
+// The text in lines of at most that many characters, where words allow it, each behind the indent.
+std::string wrapped(std::string const& text, std::size_t width, std::string const& indent);
+
+// "1 code", "2 codes", "0 codes".
+std::string counted(std::size_t count, std::string const& noun);
+
+} // namespace velmora

@@ -1,0 +1,74 @@
+#include "libvelmora/report/findings.h"
+#include "libvelmora/report/vehiclereport.h"
+#include "program/view/layout.h"
+
+#include <fmt/format.h>
+
+namespace velmora {
+
+namespace {
+
+void addLine(std::string& text, char const* label, std::string const& value)
+{
+    if (!value.empty()) {
+        text += labelledLine(label, value);
+    }
+}
+
+std::string adapterText(AdapterReport const& adapter)
+{
+    std::string text = "Adapter\n";
+    addLine(text, "Device", adapter.device);
+    addLine(text, "Description", adapter.description);
+    addLine(text, "Identifier", adapter.identification);
+    return text + labelledLine("Voltage", adapter.volts ? fmt::format("{:.1f} V", *adapter.volts) : "");
+}
+
+std::string protocolText(ProtocolReport const& protocol)
+{
+    std::string text = "Protocol\n";
+    text += labelledLine("Number", protocol.number ? std::to_string(*protocol.number) : "");
+    addLine(text, "Name", protocol.name);
+    return text;
+}
+
+// What a module does not offer is left out.
+template <typename Report>
+std::string topicText(Report const& report, Style const& style)
+{
+    return report.answer == TopicAnswer::NotOffered ? std::string() : toText(report, style);
+}
+
+// The lamp stands with the codes.
+std::string readinessText(ReadinessReport report, Style const& style)
+{
+    report.lamp.reset();
+    return topicText(report, style);
+}
+
+std::string moduleText(ModuleReport const& module, Style const& style)
+{
+    std::string text = moduleHeading(module.id, module.name) + "\n" + toText(module.info, style) +
+                       labelledLine("Live sensors", std::to_string(module.supported.size()));
+    for (std::string const& topic :
+         {toText(module.codes, style), hasAnswer(module.freeze) ? toText(module.freeze, style) : std::string(),
+          readinessText(module.readiness, style), topicText(module.monitors, style), topicText(module.oxygen, style),
+          topicText(module.counters, style)}) {
+        text += topic.empty() ? "" : "\n" + topic;
+    }
+    return text;
+}
+
+} // namespace
+
+std::string toText(VehicleReport const& report, Style const& style)
+{
+    std::string text =
+        adapterText(report.adapter) + "\n" + protocolText(report.protocol) + "\n" + toText(findings(report), style);
+    for (ModuleReport const& module : report.modules) {
+        text += "\n" + moduleText(module, style);
+    }
+    return text;
+}
+
+} // namespace velmora

@@ -1,0 +1,60 @@
+#include "libobd/catalogue/dtcreader.h"
+
+#include <common/logrecord.h>
+#include <gtest/gtest.h>
+#include <obd/library.h>
+
+#include <filesystem>
+#include <fstream>
+#include <unistd.h>
+
+namespace {
+
+std::filesystem::path logPath()
+{
+    return std::filesystem::temp_directory_path() / ("velmora-library-" + std::to_string(::getpid()));
+}
+
+std::string content(std::filesystem::path const& path)
+{
+    std::ifstream in(path);
+    return {std::istreambuf_iterator<char>(in), {}};
+}
+
+TEST(Library, OpenAndCloseAreLoggedAndLaterLinesAreDropped)
+{
+    EXPECT_TRUE(obd::LIBOBDOpen(logPath()));
+    EXPECT_TRUE(content(logPath()).ends_with(" INFO - Lib OBD init\n"));
+    obd::LIBOBDClose();
+    EXPECT_TRUE(content(logPath()).ends_with(" INFO - Lib OBD cleanup done\n"));
+    TERVEX_LOG(Info) << "after the end";
+    EXPECT_EQ(content(logPath()).find("after the end"), std::string::npos);
+    std::filesystem::remove(logPath());
+}
+
+TEST(Library, OpenSucceedsWithoutALog)
+{
+    EXPECT_TRUE(obd::LIBOBDOpen(""));
+    EXPECT_NO_THROW(TERVEX_LOG(Fatal) << "lost");
+    obd::LIBOBDClose();
+}
+
+TEST(Library, OpenSucceedsThoughTheFolderDoesNotExist)
+{
+    std::filesystem::path const missing = logPath() / "no" / "log.txt";
+    EXPECT_TRUE(obd::LIBOBDOpen(missing));
+    EXPECT_FALSE(std::filesystem::exists(missing));
+    obd::LIBOBDClose();
+}
+
+TEST(Library, TroubleCodeTextsAreThereFromOpenToClose)
+{
+    auto const meaning = [] { return obd::DtcReader().getTroubleCodes("P0420").front()->description; };
+    EXPECT_EQ(meaning(), "ISO/SAE Reserved");
+    obd::LIBOBDOpen("");
+    EXPECT_EQ(meaning(), "Catalyst System Efficiency Below Threshold Bank 1");
+    obd::LIBOBDClose();
+    EXPECT_EQ(meaning(), "ISO/SAE Reserved");
+}
+
+} // namespace

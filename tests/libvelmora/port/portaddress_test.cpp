@@ -1,0 +1,72 @@
+#include "libvelmora/port/portaddress.h"
+
+#include <velmora/error.h>
+
+#include <gtest/gtest.h>
+
+namespace {
+
+using namespace velmora;
+
+struct AddressCase
+{
+    char const* text;
+    PortAddress expected;
+};
+
+TEST(PortAddress, UnderstandsEveryForm)
+{
+    AddressCase const cases[] = {
+        {"/dev/ttyUSB0", SerialAddress{"/dev/ttyUSB0", 38400}},
+        {"serial:///dev/ttyUSB0?baud=115200", SerialAddress{"/dev/ttyUSB0", 115200}},
+        {"serial:/dev/rfcomm0", SerialAddress{"/dev/rfcomm0", 38400}},
+        {"192.168.0.10:35000", TcpAddress{"192.168.0.10", 35000}},
+        {"192.168.0.10", TcpAddress{"192.168.0.10", 35000}},
+        {"wican.local:3333", TcpAddress{"wican.local", 3333}},
+        {"tcp://10.0.0.1:23", TcpAddress{"10.0.0.1", 23}},
+        {"tcp:10.0.0.1:23", TcpAddress{"10.0.0.1", 23}},
+        {"socket://10.0.0.1", TcpAddress{"10.0.0.1", 35000}},
+        {"[fe80::1]:35000", TcpAddress{"fe80::1", 35000}},
+        {"tcp://[::1]", TcpAddress{"::1", 35000}},
+        {"sim:petrol-can11", SimulatorAddress{"petrol-can11"}},
+        {"sim:", SimulatorAddress{""}},
+        {"sim:petrol-can11?instant", SimulatorAddress{"petrol-can11", true}},
+        {"replay:car.dialogue", ReplayAddress{"car.dialogue"}},
+    };
+    for (AddressCase const& row : cases) {
+        EXPECT_EQ(parsePortAddress(row.text), row.expected) << row.text;
+    }
+}
+
+TEST(PortAddress, BaudOptionHoldsWhereTheAddressNamesNone)
+{
+    EXPECT_EQ(parsePortAddress("/dev/ttyS0", 9600), PortAddress(SerialAddress{"/dev/ttyS0", 9600}));
+    EXPECT_EQ(parsePortAddress("serial:///dev/ttyS0?baud=500000", 9600),
+              PortAddress(SerialAddress{"/dev/ttyS0", 500000}));
+}
+
+TEST(PortAddress, RefusesWhatIsNoAddressAndTellsTheForms)
+{
+    for (char const* text : {"", ":35000", "host:", "host:0", "host:65536", "host:12a", "[::1", "[::1]x", "ftp://host",
+                             "ftp:host:21", "fe80::1", "replay:", "serial://", "/dev/ttyUSB0?rate=1",
+                             "/dev/ttyUSB0?baud=x", "sim:x?", "sim:x?fast", "two words"}) {
+        try {
+            parsePortAddress(text);
+            ADD_FAILURE() << text << " was taken";
+        } catch (Error const& failure) {
+            EXPECT_EQ(failure.kind(), ErrorKind::WrongUse);
+            EXPECT_NE(std::string(failure.what()).find("is no port"), std::string::npos) << text;
+            EXPECT_FALSE(failure.hints().empty());
+        }
+    }
+}
+
+TEST(PortAddress, PrintsItselfForMessages)
+{
+    EXPECT_EQ(toString(parsePortAddress("/dev/ttyUSB0")), "/dev/ttyUSB0 (38400 baud)");
+    EXPECT_EQ(toString(parsePortAddress("[::1]:1")), "[::1]:1");
+    EXPECT_EQ(toString(parsePortAddress("sim:x")), "sim:x");
+    EXPECT_EQ(toString(parsePortAddress("sim:x?instant")), "sim:x?instant");
+}
+
+} // namespace

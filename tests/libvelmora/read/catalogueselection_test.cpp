@@ -1,0 +1,72 @@
+#include "libvelmora/read/catalogueselection.h"
+
+#include <velmora/error.h>
+
+#include <gtest/gtest.h>
+
+namespace {
+
+using namespace velmora;
+
+CatalogueRows rows()
+{
+    auto const row = [](char const* code, char const* text, char const* maker) {
+        return std::make_shared<obd::DtcDataModel>(code, text, "Powertrain", maker);
+    };
+    return {row("P0420", "Catalyst System Efficiency Below Threshold Bank 1", "Generic"),
+            row("P0430", "Catalyst System Efficiency Below Threshold Bank 2", "Generic"),
+            row("P1000", "OBD-II Monitor Testing Incomplete", "Ford")};
+}
+
+TEST(CatalogueSelection, FindsWordsInAnyOrderAndCase)
+{
+    auto const found = selectWords(rows(), {"bank", "1", "CATALYST"});
+    ASSERT_EQ(found.size(), 1U);
+    EXPECT_EQ(found[0]->code, "P0420");
+    EXPECT_EQ(selectWords(rows(), {"threshold catal"}).size(), 2U);
+    EXPECT_EQ(selectWords(rows(), {"obd-ii"}).size(), 1U);
+    EXPECT_EQ(selectWords(rows(), {"p1000"}).size(), 1U);
+}
+
+TEST(CatalogueSelection, WordMatchesByItsBeginningOnly)
+{
+    EXPECT_TRUE(selectWords(rows(), {"alyst"}).empty());
+    EXPECT_TRUE(selectWords(rows(), {"catalyst", "monitor"}).empty());
+}
+
+TEST(CatalogueSelection, NoWordsSelectAll)
+{
+    EXPECT_EQ(selectWords(rows(), {}).size(), 3U);
+    EXPECT_EQ(selectWords(rows(), {" - "}).size(), 3U);
+}
+
+TEST(CatalogueSelection, KeepsOneMaker)
+{
+    auto const found = selectMaker(rows(), "Ford");
+    ASSERT_EQ(found.size(), 1U);
+    EXPECT_EQ(found[0]->code, "P1000");
+}
+
+TEST(CatalogueSelection, FindsAMakerHoweverItIsWritten)
+{
+    EXPECT_EQ(findMaker("ford"), "Ford");
+    EXPECT_EQ(findMaker("LANDROVER"), "Land Rover");
+    EXPECT_EQ(findMaker("mercedes benz"), "Mercedes-Benz");
+    EXPECT_EQ(findMaker("volvo"), "Volvo");
+}
+
+TEST(CatalogueSelection, MakerThatIsNotThereIsWrongUseWithTheList)
+{
+    for (char const* name : {"Lada", "", "For"}) {
+        try {
+            findMaker(name);
+            ADD_FAILURE() << name;
+        } catch (Error const& failure) {
+            EXPECT_EQ(failure.kind(), ErrorKind::WrongUse);
+            ASSERT_EQ(failure.hints().size(), 1U);
+            EXPECT_NE(failure.hints()[0].find("Alfa Romeo, Audi"), std::string::npos);
+        }
+    }
+}
+
+} // namespace

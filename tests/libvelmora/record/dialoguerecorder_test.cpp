@@ -1,0 +1,71 @@
+#include "libvelmora/record/dialoguerecorder.h"
+
+#include <gtest/gtest.h>
+
+using namespace velmora;
+
+TEST(DialogueRecorder, takesDownEachCommandWithItsReply)
+{
+    DialogueRecorder recorder;
+    recorder.onSent("ATZ\r");
+    recorder.onReceived("\r\rELM327 v1.5");
+    recorder.onReceived("\r\r>");
+    recorder.onSent("01");
+    recorder.onSent("0C\r");
+    obdsim::Dialogue const dialogue = recorder.dialogue();
+    ASSERT_EQ(dialogue.exchanges.size(), 2U);
+    EXPECT_EQ(dialogue.exchanges[0].sent, "ATZ");
+    EXPECT_EQ(dialogue.exchanges[0].received(), "\r\rELM327 v1.5\r\r>");
+    EXPECT_EQ(dialogue.exchanges[1].sent, "010C");
+    EXPECT_EQ(dialogue.exchanges[1].received(), "");
+}
+
+TEST(DialogueRecorder, partsSeveralCommandsSentAtOnce)
+{
+    DialogueRecorder recorder;
+    recorder.onSent("ATE0\r\r0100\r");
+    obdsim::Dialogue const dialogue = recorder.dialogue();
+    ASSERT_EQ(dialogue.exchanges.size(), 3U);
+    EXPECT_EQ(dialogue.exchanges[1].sent, "") << "an empty line repeats the last command";
+}
+
+TEST(DialogueRecorder, dropsWhatComesBeforeTheFirstCommand)
+{
+    DialogueRecorder recorder;
+    recorder.onReceived("\xFC>");
+    EXPECT_TRUE(recorder.dialogue().exchanges.empty());
+    recorder.onSent("ATI\r");
+    EXPECT_EQ(recorder.dialogue().exchanges[0].received(), "");
+}
+
+TEST(DialogueRecorder, tellsProtocolAndHeadersFromTheBytes)
+{
+    DialogueRecorder recorder;
+    recorder.onSent("ATDPN\r");
+    recorder.onReceived("ATDPN\rA0\r\r>");
+    EXPECT_EQ(recorder.dialogue().protocol, 0);
+    EXPECT_EQ(recorder.dialogue().headers, obdsim::DialogueHeaders::Off);
+    recorder.onSent("AT H1\r");
+    recorder.onReceived("OK\r\r>");
+    recorder.onSent("AT DPN\r");
+    recorder.onReceived("A7\r\r>");
+    EXPECT_EQ(recorder.dialogue().protocol, 7);
+    EXPECT_EQ(recorder.dialogue().headers, obdsim::DialogueHeaders::Late);
+}
+
+TEST(DialogueRecorder, writesWhatItsReaderReadsBack)
+{
+    DialogueRecorder recorder;
+    recorder.onSent("ATZ\r");
+    recorder.onReceived(std::string_view("\0\rELM\\327 \xFC\r\r>", 14));
+    recorder.onSent("0100\r");
+    recorder.onReceived("SEARCHING...\r");
+    obdsim::Dialogue dialogue = recorder.dialogue();
+    dialogue.vehicle = "a car";
+    dialogue.adapter = "an adapter";
+    obdsim::Dialogue const again = obdsim::parseDialogue(obdsim::formatDialogue(dialogue), "recording");
+    ASSERT_EQ(again.exchanges.size(), 2U);
+    EXPECT_EQ(again.exchanges[0].received(), std::string_view("\0\rELM\\327 \xFC\r\r>", 14));
+    EXPECT_EQ(again.exchanges[1].received(), "SEARCHING...\r") << "its prompt never came";
+    EXPECT_TRUE(again.raw);
+}

@@ -1,0 +1,99 @@
+#include "libvelmora/report/findings.h"
+
+#include <gtest/gtest.h>
+
+namespace {
+
+using namespace velmora;
+
+TroubleCode const slow{"P0133", "Powertrain", {{"Generic", "Slow"}, {"Ford", "Slower"}}};
+TroubleCode const lean{"P0171", "Powertrain", {{"Generic", "Lean"}}};
+
+ModuleReport module(unsigned int id, std::string const& name)
+{
+    ModuleReport report{id, name, {}, {}, {}, {}, {}, {}, {}, {}};
+    report.codes.lamp = false;
+    return report;
+}
+
+CodeList list(CodeKind kind, std::vector<TroubleCode> const& codes)
+{
+    return {kind, CodeList::Answer::Read, {}, codes};
+}
+
+LimitTest test(std::string const& description, LimitTest::Verdict verdict)
+{
+    return {1, description, "1", "0", "2", "", verdict};
+}
+
+TEST(Findings, AreNoneForAHealthyVehicle)
+{
+    VehicleReport report;
+    report.modules = {module(0x7E8, "ECM")};
+    report.modules[0].codes = {false, {list(CodeKind::Confirmed, {})}};
+    report.modules[0].readiness = {
+        TopicAnswer::Read,
+        false,
+        {{"Catalyst", ReadinessStatus::Complete, {}}, {"EGR", ReadinessStatus::NotAvailable, {}}}};
+    report.modules[0].monitors = {
+        TopicAnswer::Read,
+        {{1, "A", {test("B", LimitTest::Verdict::Passed), test("C", LimitTest::Verdict::NoResult)}}}};
+    EXPECT_TRUE(findings(report).empty());
+    EXPECT_EQ(toText(findings(report), Style()), "Findings\n  none in what the vehicle told\n");
+}
+
+TEST(Findings, TellACodeOnceWithItsKinds)
+{
+    VehicleReport report;
+    report.modules = {module(0x7E8, "ECM"), module(0x7E9, "")};
+    report.modules[0].codes = {
+        true,
+        {list(CodeKind::Confirmed, {slow, lean}), list(CodeKind::Pending, {lean}), list(CodeKind::Permanent, {slow})}};
+    report.modules[1].codes = {false, {list(CodeKind::Pending, {slow})}};
+    EXPECT_EQ(toText(findings(report), Style()), "Findings\n"
+                                                 "  7E8 ECM  lamp                  the malfunction indicator is on\n"
+                                                 "  7E8 ECM  confirmed, permanent  P0133 Slow\n"
+                                                 "  7E8 ECM  confirmed, pending    P0171 Lean\n"
+                                                 "  7E9      pending               P0133 Slow\n");
+}
+
+TEST(Findings, TellFailedTestsAndWhatIsNotComplete)
+{
+    VehicleReport report;
+    report.modules = {module(0x10, "ECM")};
+    report.modules[0].readiness = {TopicAnswer::Read, false, {{"Catalyst", ReadinessStatus::NotComplete, {}}}};
+    report.modules[0].monitors = {
+        TopicAnswer::Read,
+        {{1, "Monitor", {test("Count", LimitTest::Verdict::Failed), test("C", LimitTest::Verdict::Passed)}}}};
+    report.modules[0].oxygen = {
+        TopicAnswer::Read,
+        true,
+        false,
+        {{obd::OxygenSensorLocation::Bank1Sensor2, {test("Voltage", LimitTest::Verdict::Failed)}}}};
+    EXPECT_EQ(toText(findings(report), Style()), "Findings\n"
+                                                 "  10 ECM  failed test   Monitor: Count\n"
+                                                 "  10 ECM  failed test   Bank 1 sensor 2: Voltage\n"
+                                                 "  10 ECM  not complete  Catalyst\n");
+}
+
+TEST(Findings, TellAModuleThatHidesItsCodes)
+{
+    VehicleReport report;
+    report.modules = {module(0x7E8, "ECM")};
+    report.modules[0].codes = {{}, {{CodeKind::Confirmed, CodeList::Answer::Silent, {}, {}}}};
+    EXPECT_EQ(toText(findings(report), Style()), "Findings\n  7E8 ECM  not told  lamp and confirmed codes\n");
+}
+
+TEST(Findings, AreMarkedByWeight)
+{
+    VehicleReport report;
+    report.modules = {module(0x7E8, "ECM")};
+    report.modules[0].codes = {true, {list(CodeKind::Confirmed, {slow}), list(CodeKind::Pending, {lean})}};
+    std::vector<Finding> const found = findings(report);
+    ASSERT_EQ(found.size(), 3U);
+    EXPECT_EQ(found[0].mark, Mark::Bad);
+    EXPECT_EQ(found[1].mark, Mark::Bad);
+    EXPECT_EQ(found[2].mark, Mark::Warning) << "a pending code is none yet";
+}
+
+} // namespace

@@ -1,0 +1,124 @@
+#include "libvelmora/session/settingsstore.h"
+
+#include <velmora/error.h>
+
+#include <filesystem>
+#include <fstream>
+#include <gtest/gtest.h>
+#include <unistd.h>
+
+namespace {
+
+using velmora::Error;
+using velmora::SettingsStore;
+
+class Settings : public testing::Test
+{
+protected:
+    Settings() { std::filesystem::create_directory(m_folder); }
+    ~Settings() override { std::filesystem::remove_all(m_folder); }
+
+    void write(std::string const& text) const { std::ofstream(m_file) << text; }
+    std::string content() const { return content(m_file); }
+    static std::string content(std::filesystem::path const& file)
+    {
+        std::ifstream in(file);
+        return {std::istreambuf_iterator<char>(in), {}};
+    }
+
+    std::filesystem::path m_folder =
+        std::filesystem::temp_directory_path() / ("velmora-settings-" + std::to_string(::getpid()));
+    std::filesystem::path m_file = m_folder / "settings.toml";
+};
+
+TEST_F(Settings, FileThatDoesNotExistIsAnEmptyStore)
+{
+    SettingsStore store(m_file);
+    int number = 7;
+    std::string text = "before";
+    EXPECT_FALSE(store.getInt("common/unitsystem", number));
+    EXPECT_FALSE(store.getString("velmora/port", text));
+    EXPECT_EQ(number, 7);
+    EXPECT_EQ(text, "before");
+    EXPECT_FALSE(std::filesystem::exists(m_file)) << "reading writes nothing";
+}
+
+TEST_F(Settings, FolderIsNoStore)
+{
+    EXPECT_THROW(SettingsStore(m_folder.string()), Error);
+}
+
+TEST_F(Settings, ReadsTablesAsGroupsOfKeys)
+{
+    write("[common]\nunitsystem = 1\n[velmora]\nport = \"sim:\"\n[bluetooth.device1]\nname = \"OBDII\"\n");
+    SettingsStore store(m_file);
+    int number = 0;
+    std::string text;
+    EXPECT_TRUE(store.getInt("common/unitsystem", number));
+    EXPECT_EQ(number, 1);
+    EXPECT_TRUE(store.getString("velmora/port", text));
+    EXPECT_EQ(text, "sim:");
+    EXPECT_TRUE(store.getString("bluetooth/device1/name", text));
+    EXPECT_EQ(text, "OBDII");
+    EXPECT_FALSE(store.getInt("velmora/port", number)) << "a text is no number";
+}
+
+TEST_F(Settings, WhatIsSyncedIsReadBack)
+{
+    {
+        SettingsStore store(m_folder / "new" / "settings.toml");
+        store.setInt("common/unitsystem", 1);
+        store.setInt("common/unitsystem", 0);
+        store.setString("bluetooth/1/name", "quote \" and ü");
+        store.sync();
+    }
+    EXPECT_EQ(content(m_folder / "new" / "settings.toml"),
+              "[bluetooth.1]\nname = 'quote \" and ü'\n\n[common]\nunitsystem = 0\n");
+    SettingsStore store(m_folder / "new" / "settings.toml");
+    int number = 5;
+    std::string text;
+    EXPECT_TRUE(store.getInt("common/unitsystem", number));
+    EXPECT_EQ(number, 0);
+    EXPECT_TRUE(store.getString("bluetooth/1/name", text));
+    EXPECT_EQ(text, "quote \" and ü");
+}
+
+TEST_F(Settings, BrokenFileIsToldWithItsLineAndLeftAlone)
+{
+    for (char const* broken :
+         {"[common\n", "a = \n", "[common]\nunitsystem = 1.5\n", "x = [1]\n", "x = 9999999999\n"}) {
+        write(broken);
+        EXPECT_THROW(SettingsStore{m_file}, Error) << broken;
+        EXPECT_EQ(content(), broken);
+    }
+}
+
+TEST_F(Settings, AValueInThePlaceOfAGroupGivesWay)
+{
+    write("common = 1\n");
+    SettingsStore store(m_file);
+    store.setInt("common/unitsystem", 1);
+    store.sync();
+    EXPECT_EQ(content(), "[common]\nunitsystem = 1\n");
+}
+
+TEST_F(Settings, FailingWriteLeavesTheOldFile)
+{
+    write("[common]\nunitsystem = 1\n");
+    SettingsStore store(m_file);
+    store.setInt("common/unitsystem", 0);
+    std::filesystem::create_directory(m_file.string() + ".new"); // in the place of the temporary file
+    EXPECT_THROW(store.sync(), Error);
+    EXPECT_EQ(content(), "[common]\nunitsystem = 1\n");
+}
+
+TEST_F(Settings, LivesInTheUsersConfigurationFolder)
+{
+    ::setenv("XDG_CONFIG_HOME", "/some/folder", 1);
+    EXPECT_EQ(SettingsStore::defaultFile(), "/some/folder/velmora/settings.toml");
+    ::setenv("XDG_CONFIG_HOME", "", 1);
+    ::setenv("HOME", "/home/me", 1);
+    EXPECT_EQ(SettingsStore::defaultFile(), "/home/me/.config/velmora/settings.toml");
+}
+
+} // namespace

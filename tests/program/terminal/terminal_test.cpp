@@ -1,0 +1,57 @@
+#include "program/terminal/terminal.h"
+
+#include <gtest/gtest.h>
+
+namespace {
+
+using velmora::Key;
+using velmora::takeKey;
+
+std::vector<int> keys(std::string bytes)
+{
+    std::vector<int> list;
+    while (auto const key = takeKey(bytes)) {
+        list.push_back(static_cast<int>(*key));
+    }
+    EXPECT_TRUE(bytes.empty());
+    return list;
+}
+
+TEST(Keys, LettersAreTheirOwnCodes)
+{
+    EXPECT_EQ(keys("qU \n"), (std::vector<int>{'q', 'U', ' ', '\n'}));
+    EXPECT_EQ(keys("\r"), std::vector<int>{static_cast<int>(Key::Enter)});
+}
+
+TEST(Keys, ArrowsComeInBothOfTheirForms)
+{
+    EXPECT_EQ(keys("\033[A\033[B"), (std::vector<int>{static_cast<int>(Key::Up), static_cast<int>(Key::Down)}));
+    EXPECT_EQ(keys("\033OA\033OB"), (std::vector<int>{static_cast<int>(Key::Up), static_cast<int>(Key::Down)}));
+    EXPECT_EQ(keys("\033[5~\033[6~"),
+              (std::vector<int>{static_cast<int>(Key::PageUp), static_cast<int>(Key::PageDown)}));
+}
+
+TEST(Keys, CursorKeysComeInAllTheirForms)
+{
+    EXPECT_EQ(keys("\033[D\033OD\033[C\033OC"),
+              (std::vector<int>{static_cast<int>(Key::Left), static_cast<int>(Key::Left), static_cast<int>(Key::Right),
+                                static_cast<int>(Key::Right)}));
+    EXPECT_EQ(keys("\033[H\033[1~\033[F\033[4~\033[3~"),
+              (std::vector<int>{static_cast<int>(Key::Home), static_cast<int>(Key::Home), static_cast<int>(Key::End),
+                                static_cast<int>(Key::End), static_cast<int>(Key::Delete)}));
+}
+
+TEST(Keys, EscapeAloneIsAKey)
+{
+    EXPECT_EQ(keys("\033"), std::vector<int>{static_cast<int>(Key::Escape)});
+    EXPECT_EQ(keys("\033q"), (std::vector<int>{static_cast<int>(Key::Escape), 'q'}));
+}
+
+TEST(Keys, UnknownSequencesAreSkippedWhole)
+{
+    EXPECT_EQ(keys("\033[1;5Cq"), std::vector<int>{'q'});
+    EXPECT_EQ(keys("\033["), std::vector<int>{});
+    EXPECT_EQ(keys(""), std::vector<int>{});
+}
+
+} // namespace

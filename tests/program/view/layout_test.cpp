@@ -1,0 +1,54 @@
+#include "program/view/layout.h"
+
+#include <gtest/gtest.h>
+
+namespace {
+
+using namespace velmora;
+
+TEST(Layout, LabelsStandInAColumn)
+{
+    EXPECT_EQ(labelledLine("VIN", "X"), "  VIN            X\n");
+    EXPECT_EQ(labelledLine("Serial", ""), "  Serial         -\n");
+}
+
+TEST(Layout, ColumnsAreAsWideAsTheirWidestCell)
+{
+    EXPECT_EQ(drawColumns({{{"Name"}, {"Value", Mark::None, true}, {"Unit"}},
+                           {{"Résistance"}, {"12", Mark::None, true}, {"Ω"}},
+                           {{"x"}, {"123456", Mark::None, true}, {""}}},
+                          "  ", Style()),
+              "  Name         Value  Unit\n"
+              "  Résistance      12  Ω\n"
+              "  x           123456\n");
+}
+
+TEST(Layout, ARowOfOneCellStandsAcrossTheColumns)
+{
+    EXPECT_EQ(drawColumns({{{"a"}, {"b"}}, {{"a long heading", Mark::Bad}}}, " ", Style()), " a  b\n a long heading\n");
+}
+
+TEST(Layout, ColoursDoNotMoveColumns)
+{
+    EXPECT_EQ(drawColumns({{{"failed", Mark::Bad}, {"1", Mark::Bad, true}}, {{"ok"}, {"22", Mark::None, true}}}, "",
+                          Style(true)),
+              "\033[31mfailed\033[0m   \033[31m1\033[0m\n"
+              "ok      22\n");
+}
+
+TEST(Layout, TextIsWrappedBetweenWords)
+{
+    EXPECT_EQ(wrapped("one two three unbreakable", 8, "> "), "> one two\n> three\n> unbreakable\n");
+    EXPECT_EQ(wrapped("four five six", 9, ""), "four five\nsix\n");
+    EXPECT_EQ(wrapped("four five six", 8, ""), "four\nfive six\n");
+    EXPECT_EQ(wrapped("", 8, "> "), "");
+}
+
+TEST(Layout, CountsOneAndMany)
+{
+    EXPECT_EQ(counted(0, "code"), "0 codes");
+    EXPECT_EQ(counted(1, "code"), "1 code");
+    EXPECT_EQ(counted(2, "code"), "2 codes");
+}
+
+} // namespace

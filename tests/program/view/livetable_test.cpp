@@ -1,0 +1,143 @@
+#include "program/view/livetable.h"
+
+#include "tests/program/view/liveparameter.h"
+
+#include <gtest/gtest.h>
+
+namespace {
+
+using std::chrono::milliseconds;
+using std::chrono::seconds;
+using support::liveParameter;
+using support::liveValue;
+using velmora::LiveRow;
+using velmora::LiveTable;
+using velmora::LiveTime;
+
+class Live : public testing::Test
+{
+protected:
+    Live()
+    {
+        table.select({liveParameter(0x0C, "Engine RPM", {""}, true, UnitRpm),
+                      liveParameter(0x06, "Fuel Trim", {"Bank 1", "Bank 3"}),
+                      liveParameter(0x03, "Fuel system", {""}, false, UnitNone)});
+    }
+
+    void rpm(std::string const& text) { table.update(0x0C, {liveValue(120, text)}, now); }
+    void trim(std::string const& text) { table.update(0x06, {liveValue(60, text)}, now); }
+    void fuel() { table.update(0x03, {std::make_shared<obd::SensorValueDataModel>(30, "Open loop")}, now); }
+
+    LiveTime now = LiveTime() + seconds(1000);
+    LiveTable table;
+};
+
+TEST_F(Live, HasARowForEachSensor)
+{
+    ASSERT_EQ(table.rows().size(), 4U);
+    EXPECT_EQ(table.rows()[0].name, "Engine RPM");
+    EXPECT_EQ(table.rows()[0].unit, "rpm");
+    EXPECT_EQ(table.rows()[1].name, "Fuel Trim: Bank 1");
+    EXPECT_EQ(table.rows()[2].name, "Fuel Trim: Bank 3");
+    EXPECT_FALSE(table.rows()[3].numeric);
+    EXPECT_EQ(table.rowsOf(0x06).size(), 2U);
+    EXPECT_EQ(nameWithUnit(table.rows()[0]), "Engine RPM (rpm)");
+    EXPECT_EQ(nameWithUnit(table.rows()[3]), "Fuel system");
+}
+
+TEST_F(Live, KeepsTheReadingAndItsStatistics)
+{
+    table.update(0x0C, {std::make_shared<obd::SensorValueDataModel>(120, "800", "700", "900", "850")}, now);
+    LiveRow const& row = table.rows()[0];
+    EXPECT_EQ(row.value, "800");
+    EXPECT_EQ(row.minimum, "700");
+    EXPECT_EQ(row.maximum, "900");
+    EXPECT_EQ(row.mean, "850");
+}
+
+TEST_F(Live, ASensorThatIsNotAmongTheValuesHasNone)
+{
+    table.update(0x06, {liveValue(60, "1.0"), liveValue(61, "2.0")}, now);
+    EXPECT_EQ(table.rows()[2].value, "2.0");
+    trim("3.0");
+    EXPECT_EQ(table.rows()[1].value, "3.0");
+    EXPECT_EQ(table.rows()[2].value, "");
+}
+
+TEST_F(Live, ARoundEndsWhenAllHaveHadTheirTurn)
+{
+    rpm("700");
+    trim("0.0");
+    EXPECT_EQ(table.rounds(), 0U);
+    EXPECT_TRUE(table.beginsRound(0x0C));
+    fuel();
+    EXPECT_EQ(table.rounds(), 1U);
+    EXPECT_FALSE(table.beginsRound(0x0C));
+    EXPECT_EQ(table.readings(), 3U);
+}
+
+TEST_F(Live, ASensorThatDoesNotAnswerDoesNotHoldTheRoundUp)
+{
+    rpm("700");
+    trim("0.0");
+    rpm("701");
+    EXPECT_EQ(table.rounds(), 1U);
+    trim("0.0");
+    rpm("702");
+    EXPECT_EQ(table.rounds(), 2U);
+}
+
+TEST_F(Live, OldValuesAreForgotten)
+{
+    rpm("700");
+    now += seconds(2);
+    table.expire(now);
+    EXPECT_EQ(table.rows()[0].value, "700");
+    trim("0.0");
+    rpm("701");
+    now += seconds(30);
+    table.expire(now);
+    EXPECT_EQ(table.rows()[0].value, "");
+    EXPECT_EQ(table.rows()[0].maximum, "701");
+}
+
+TEST_F(Live, ValuesOfASlowBusAreNot)
+{
+    rpm("700");
+    now += seconds(4);
+    trim("0.0");
+    now += seconds(4);
+    table.expire(now);
+    EXPECT_EQ(table.rows()[0].value, "700");
+}
+
+TEST_F(Live, TheTrendHasFiniteNumbersOnly)
+{
+    for (char const* text : {"inf", "7.5", "nan", "-inf", "8.5"}) {
+        rpm(text);
+        EXPECT_EQ(table.rows()[0].value, text);
+        now += seconds(1);
+    }
+    EXPECT_EQ(table.rows()[0].trend, (std::deque<double>{7.5, 8.5}));
+}
+
+TEST_F(Live, TheTrendIsShortAndTakesFourValuesASecond)
+{
+    for (int i = 0; i < 100; ++i) {
+        rpm(std::to_string(i));
+        now += milliseconds(50);
+    }
+    EXPECT_EQ(table.rows()[0].trend.size(), LiveTable::trendLength);
+    EXPECT_EQ(table.rows()[0].trend.back(), 95.0);
+    EXPECT_EQ(table.rows()[0].trend.front(), 20.0);
+    fuel();
+    EXPECT_TRUE(table.rows()[3].trend.empty());
+}
+
+TEST_F(Live, AParameterThatIsNotSelectedIsNotTaken)
+{
+    table.update(0x0D, {liveValue(130, "50")}, now);
+    EXPECT_EQ(table.readings(), 0U);
+}
+
+} // namespace

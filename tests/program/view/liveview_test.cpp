@@ -1,0 +1,311 @@
+#include "libvelmora/text/text.h"
+#include "program/view/livecsv.h"
+#include "program/view/livelines.h"
+#include "program/view/livescreen.h"
+#include "tests/program/view/liveparameter.h"
+#include <velmora/error.h>
+
+#include <filesystem>
+#include <fstream>
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+#include <nlohmann/json.hpp>
+#include <sstream>
+#include <unistd.h>
+
+namespace {
+
+using namespace velmora;
+using std::chrono::milliseconds;
+using std::chrono::seconds;
+using support::liveParameter;
+using support::liveValue;
+using testing::ElementsAre;
+using testing::HasSubstr;
+
+LiveRow numberRow(std::string const& name, std::string const& value, std::string const& unit)
+{
+    LiveRow row{};
+    row.uid = 120;
+    row.name = name;
+    row.unit = unit;
+    row.numeric = true;
+    row.value = row.minimum = row.mean = row.maximum = value;
+    return row;
+}
+
+std::vector<std::string> lines(std::string const& text)
+{
+    std::vector<std::string> list;
+    std::istringstream in(text);
+    for (std::string line; std::getline(in, line);) {
+        list.push_back(line);
+    }
+    return list;
+}
+
+TEST(LiveLines, TellNameValueAndUnit)
+{
+    EXPECT_EQ(toLine(numberRow("Engine RPM", "1726", "rpm")), "Engine RPM: 1726 rpm\n");
+    EXPECT_EQ(toLine(numberRow("Commanded ratio", "0.98", "")), "Commanded ratio: 0.98\n");
+    EXPECT_EQ(toLine(numberRow("Engine RPM", "", "rpm")), "Engine RPM: -\n");
+}
+
+TEST(LiveLines, JsonHasNumbersAndNull)
+{
+    std::string const text = toJsonLine(numberRow("Engine RPM", "1726", "rpm"), "2024-03-07T09:05:02.123Z");
+    EXPECT_EQ(text, "{\"time\":\"2024-03-07T09:05:02.123Z\",\"pid\":\"0C\",\"uid\":120,\"name\":\"Engine RPM\","
+                    "\"value\":1726,\"unit\":\"rpm\",\"minimum\":1726,\"mean\":1726,\"maximum\":1726}\n");
+    for (char const* missing : {"", "nan", "inf", "-"}) {
+        auto const json = nlohmann::json::parse(toJsonLine(numberRow("x", missing, ""), "t"));
+        EXPECT_TRUE(json["value"].is_null()) << missing;
+        EXPECT_TRUE(json["unit"].is_null());
+    }
+    auto const json = nlohmann::json::parse(toJsonLine(numberRow("x", "-8.30", "°"), "t"));
+    EXPECT_DOUBLE_EQ(json["value"].get<double>(), -8.3);
+    EXPECT_THAT(toJsonLine(numberRow("x", "21", "°C"), "t"), HasSubstr("\"unit\":\"°C\""));
+}
+
+TEST(LiveLines, JsonOfATextIsAText)
+{
+    LiveRow row = numberRow("Fuel system", "12", "");
+    row.numeric = false;
+    row.minimum.clear();
+    auto const json = nlohmann::json::parse(toJsonLine(row, "t"));
+    EXPECT_EQ(json["value"], "12");
+    EXPECT_TRUE(json["minimum"].is_null());
+}
+
+TEST(LiveLines, TimesAreIso8601InUtc)
+{
+    std::chrono::system_clock::time_point const time{milliseconds(1709802302007)};
+    EXPECT_EQ(isoTime(time), "2024-03-07T09:05:02.007Z");
+}
+
+TEST(LiveCsv, HasAHeaderWithUnitsAndOneColumnASensor)
+{
+    std::vector<LiveRow> const rows = {numberRow("Engine RPM", "1726", "rpm"),
+                                       numberRow("Bank 1, \"Sensor\" 1", "521", "°C"), numberRow("Ratio", "", "")};
+    EXPECT_EQ(toCsvHeader(rows), "time,Engine RPM (rpm),\"Bank 1, \"\"Sensor\"\" 1 (°C)\",Ratio\n");
+    EXPECT_EQ(toCsvRow(rows, "T"), "T,1726,521,-\n");
+}
+
+class LiveCsvFile : public testing::Test
+{
+protected:
+    LiveCsvFile() { table.select({liveParameter(0x0C, "A"), liveParameter(0x0D, "B")}); }
+    ~LiveCsvFile() override { std::filesystem::remove(file); }
+
+    std::vector<std::string> content() const
+    {
+        std::ifstream in(file);
+        std::vector<std::string> list = lines({std::istreambuf_iterator<char>(in), {}});
+        for (std::string& line : list) {
+            line = line.substr(line.find(',') + 1); // without the time
+        }
+        return list;
+    }
+    void reading(int pid, std::string const& text) { table.update(pid, {liveValue(pid * 10, text)}, now); }
+
+    std::filesystem::path file =
+        std::filesystem::temp_directory_path() / ("velmora-live-" + std::to_string(::getpid()) + ".csv");
+    LiveTime now = LiveTime() + seconds(1000);
+    LiveCsv::WallTime const start{seconds(1709802302)}; // 2024-03-07T09:05:02Z
+    LiveTable table;
+};
+
+TEST_F(LiveCsvFile, TimesCountOnFromItsStart)
+{
+    LiveCsv csv(file.string());
+    csv.begin(table, now, start);
+    now += milliseconds(61250);
+    reading(0x0C, "1");
+    csv.update(table, now);
+    std::ifstream in(file);
+    std::string header;
+    std::string row;
+    std::getline(in, header);
+    std::getline(in, row);
+    EXPECT_EQ(row, "2024-03-07T09:06:03.250Z,1,-");
+}
+
+TEST_F(LiveCsvFile, HasARowForEachRoundAtOnce)
+{
+    LiveCsv csv(file.string());
+    csv.begin(table, now, start);
+    EXPECT_THAT(content(), ElementsAre("A (%),B (%)"));
+    reading(0x0C, "1");
+    EXPECT_TRUE(csv.update(table, now));
+    EXPECT_EQ(content().size(), 1U);
+    reading(0x0D, "2");
+    EXPECT_TRUE(csv.update(table, now));
+    EXPECT_THAT(content(), ElementsAre("A (%),B (%)", "1,2")) << "on the disk without a close";
+}
+
+TEST_F(LiveCsvFile, HasARowASecondOnASlowBus)
+{
+    LiveCsv csv(file.string());
+    csv.begin(table, now, start);
+    reading(0x0C, "1");
+    now += milliseconds(999);
+    csv.update(table, now);
+    EXPECT_EQ(content().size(), 1U);
+    now += milliseconds(1);
+    csv.update(table, now);
+    EXPECT_THAT(content(), ElementsAre("A (%),B (%)", "1,-"));
+    now += seconds(5);
+    csv.update(table, now);
+    EXPECT_EQ(content().size(), 2U) << "nothing new";
+}
+
+TEST_F(LiveCsvFile, FinishWritesWhatIsLeft)
+{
+    LiveCsv csv(file.string());
+    csv.begin(table, now, start);
+    reading(0x0C, "7");
+    csv.finish(table, now);
+    csv.finish(table, now);
+    EXPECT_THAT(content(), ElementsAre("A (%),B (%)", "7,-"));
+}
+
+TEST_F(LiveCsvFile, KeepsAnOldFileUntilItBegins)
+{
+    std::ofstream(file) << "x,old\n";
+    LiveCsv csv(file.string());
+    EXPECT_THAT(content(), ElementsAre("old"));
+    csv.begin(table, now, start);
+    EXPECT_THAT(content(), ElementsAre("A (%),B (%)"));
+}
+
+TEST_F(LiveCsvFile, TellsOfAFileThatCannotBeOpenedOrWritten)
+{
+    EXPECT_THROW(LiveCsv("/nowhere/at/all.csv"), Error);
+    if (std::filesystem::exists("/dev/full")) {
+        LiveCsv full("/dev/full");
+        EXPECT_THROW(full.begin(table, now, start), Error);
+    }
+}
+
+TEST(LiveScreen, DrawsATrend)
+{
+    EXPECT_EQ(trendLine({0, 1, 2, 3, 4, 5, 6, 7}, 8), "▁▂▃▄▅▆▇█");
+    EXPECT_EQ(trendLine({5, 5}, 4), "  ▁▁");
+    EXPECT_EQ(trendLine({9, 0, 7}, 2), "▁█");
+    EXPECT_EQ(trendLine({-10, -3, -6.5}, 3), "▁█▅");
+    EXPECT_EQ(trendLine({}, 3), "   ");
+}
+
+TEST(LiveScreen, NoLineIsWiderThanTheScreenNorTheFrameHigher)
+{
+    std::vector<LiveRow> rows(30, numberRow("Exhaust Gas Temperature Bank 1: Sensor 3", "-1234.56", "mg/stroke"));
+    rows[3].numeric = false;
+    rows[3].value = "Closed loop, using oxygen sensor feedback to determine fuel mix, but with a fault";
+    for (std::size_t const width : {10U, 30U, 59U, 80U, 120U, 300U}) {
+        std::vector<std::string> const frame = lines(drawTable(rows, 2, std::string(200, 't'), "status", {width, 12}));
+        EXPECT_EQ(frame.size(), 12U);
+        for (std::string const& line : frame) {
+            EXPECT_LE(displayWidth(line), width) << line;
+        }
+    }
+}
+
+TEST(LiveScreen, ShowsValueUnitAndStatistics)
+{
+    LiveRow row = numberRow("Engine RPM", "1726", "rpm");
+    row.minimum = "700";
+    row.maximum = "3000";
+    std::vector<std::string> const frame = lines(drawTable({row}, 0, "title", "status", {80, 24}));
+    ASSERT_EQ(frame.size(), 5U);
+    EXPECT_EQ(frame[0], "title");
+    EXPECT_EQ(frame[1], "Sensor               Value Unit Minimum    Mean Maximum Trend");
+    EXPECT_THAT(frame[2], HasSubstr("Engine RPM            1726 rpm      700    1726    3000"));
+    EXPECT_EQ(frame[4], "status");
+}
+
+TEST(LiveScreen, ShowsStatisticsAndTrendWhereThereIsRoom)
+{
+    std::vector<LiveRow> const rows = {numberRow(std::string(100, 'n'), "1726", "rpm")};
+    std::size_t const plain = 18 + std::string(" 1234567 unit").size();
+    std::size_t const statistics = plain + 3 * std::string(" Minimum").size();
+    std::size_t const all = statistics + 1 + LiveTable::trendLength;
+    auto const heading = [&rows](std::size_t width) { return lines(drawTable(rows, 0, "t", "s", {width, 24}))[1]; };
+    EXPECT_EQ(heading(plain), "Sensor               Value Unit");
+    EXPECT_EQ(heading(statistics - 1), heading(plain).insert(6, statistics - 1 - plain, ' '));
+    EXPECT_EQ(heading(statistics), "Sensor               Value Unit Minimum    Mean Maximum");
+    EXPECT_EQ(heading(all - 1), heading(statistics).insert(6, LiveTable::trendLength, ' '));
+    EXPECT_EQ(heading(all), heading(statistics) + " Trend");
+    EXPECT_EQ(heading(all + 9), heading(all).insert(6, 9, ' ')) << "the name takes what is left";
+}
+
+TEST(LiveScreen, ATextTakesThePlaceOfUnitAndStatistics)
+{
+    LiveRow row = numberRow("Fuel system", "Closed loop, using oxygen sensor feedback", "");
+    row.numeric = false;
+    EXPECT_THAT(drawTable({row}, 0, "t", "s", {80, 24}),
+                HasSubstr("Fuel system        Closed loop, using oxygen sensor feedback\n"));
+    EXPECT_THAT(drawTable({row}, 0, "t", "s", {30, 24}), HasSubstr("\nFuel system       Closed loop…\n"));
+}
+
+TEST(LiveScreen, NeverCutsANumber)
+{
+    std::string const frame = drawTable({numberRow("Run time", "4294967295", "s")}, 0, "t", "s", {60, 24});
+    EXPECT_THAT(frame, HasSubstr(" 4294967295 s"));
+}
+
+TEST(LiveScreen, ShowsADashForAMissingValueAndTellsWhatIsHidden)
+{
+    std::vector<LiveRow> const rows(5, numberRow("A", "", "V"));
+    std::string const frame = drawTable(rows, 0, "t", "s", {80, 7});
+    EXPECT_THAT(frame, HasSubstr("A                        - V"));
+    EXPECT_THAT(frame, HasSubstr("(2 more: up and down) s"));
+    EXPECT_THAT(drawTable(rows, 1, "t", "s", {80, 7}), HasSubstr("(2 more: up and down) s"));
+    EXPECT_THAT(drawTable(rows, 4, "t", "s", {80, 7}), HasSubstr("(4 more: up and down) s"));
+    EXPECT_THAT(drawTable(rows, 0, "t", "s", {80, 9}), HasSubstr("\n\ns\n"));
+}
+
+TEST(LiveScreen, TheSmallestScreenHasARow)
+{
+    EXPECT_EQ(roomForRows({80, 1}), 1U);
+    EXPECT_EQ(roomForRows({80, 4}), 1U);
+    EXPECT_EQ(roomForRows({80, 6}), 2U);
+}
+
+TEST(LivePicker, MarksAndKeepsTheOrder)
+{
+    auto const id = [](int pid) { return obd::ParameterIdentifier(pid).id(); };
+    SensorPicker picker({{id(0x04), "Load"}, {id(0x0C), "RPM"}, {id(0x0D), "Speed"}}, {id(0x0D), id(0x0C)});
+    EXPECT_THAT(picker.draw({40, 10}), HasSubstr("> [ ] 04 Load\n  [x] 0C RPM\n"));
+    picker.toggle();
+    picker.move(1);
+    picker.toggle();
+    EXPECT_THAT(picker.chosen(), ElementsAre(id(0x0D), id(0x04)));
+    picker.move(100);
+    picker.toggle();
+    picker.move(-100);
+    EXPECT_THAT(picker.chosen(), ElementsAre(id(0x04)));
+    EXPECT_THAT(picker.draw({40, 10}), HasSubstr("> [x] 04 Load\n  [ ] 0C RPM\n  [ ] 0D Speed\n"));
+}
+
+TEST(LivePicker, ScrollsWithTheCursor)
+{
+    std::vector<OfferedSensor> offered;
+    for (int pid = 3; pid < 0x20; ++pid) {
+        offered.push_back({obd::ParameterIdentifier(pid).id(), "x"});
+    }
+    SensorPicker picker(offered, {});
+    picker.move(15);
+    std::string const frame = picker.draw({40, 8});
+    EXPECT_THAT(frame, HasSubstr("> [ ] 12 x"));
+    EXPECT_EQ(lines(frame).size(), 8U);
+    EXPECT_THAT(lines(picker.draw({40, 3})), ElementsAre("Which sensors?", "> [ ] 12 x", "", testing::_));
+}
+
+TEST(LivePicker, AVehicleWithoutSensorsLeavesNothingToMark)
+{
+    SensorPicker picker({}, {});
+    picker.move(1);
+    picker.toggle();
+    EXPECT_TRUE(picker.chosen().empty());
+}
+
+} // namespace
