@@ -1,7 +1,8 @@
 #include "libobd/catalogue/dtcreader.h"
 
-#include <benchmark/benchmark.h>
 #include <obd/library.h>
+
+#include <benchmark/benchmark.h>
 
 #include <cstdio>
 #include <fstream>

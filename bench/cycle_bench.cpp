@@ -12,12 +12,14 @@
 #include "tests/support/memorysettings.h"
 #include "tests/support/peerconnection.h"
 
-#include <benchmark/benchmark.h>
 #include <obd/iconnectionmanager.h>
 #include <obd/iobdvelmora.h>
 #include <obd/isensorservice.h>
 #include <obd/obdvelmorabuilder.h>
 #include <obd/parameterdescriptor.h>
+
+#include <benchmark/benchmark.h>
+
 #include <sys/resource.h>
 
 namespace {

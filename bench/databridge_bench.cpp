@@ -1,5 +1,6 @@
-#include <benchmark/benchmark.h>
 #include <obd/databridge.h>
+
+#include <benchmark/benchmark.h>
 
 #include <string_view>
 #include <thread>

@@ -6,11 +6,12 @@
 // Idle: a second without work. cpu_percent is the share of one core, wakeups_per_s the voluntary context switches of
 // the process without those of the benchmark's own sleep.
 
-#include <benchmark/benchmark.h>
+#include "libobd/dispatch/fetcher.h"
+
 #include <obd/iobdproxy.h>
 #include <obd/iquery.h>
 
-#include "libobd/dispatch/fetcher.h"
+#include <benchmark/benchmark.h>
 
 #include <sys/resource.h>
 #include <thread>

@@ -6,11 +6,13 @@
 #include "libvelmora/read/vehiclereader.h"
 #include "program/terminal/interrupt.h"
 
-#include <atomic>
-#include <benchmark/benchmark.h>
-#include <chrono>
 #include <obd/iconnectionlogger.h>
 #include <obd/iconnectionmanager.h>
+
+#include <benchmark/benchmark.h>
+
+#include <atomic>
+#include <chrono>
 
 namespace {
 

@@ -2,13 +2,13 @@
 // a prepared reply map, whose copying is part of the figure, as the parser's filling of it is on the real road.
 
 #include "bench/allocationcount.h"
+#include "libobd/module/obdproxy.h"
 #include "libobd/module/parameterfactory.h"
 #include "tests/support/fakedevice.h"
 
-#include "libobd/module/obdproxy.h"
+#include <obd/powertrainparameter.h>
 
 #include <benchmark/benchmark.h>
-#include <obd/powertrainparameter.h>
 
 namespace {
 

@@ -11,7 +11,6 @@
 #include "libobd/bytes/bytefilter.h"
 #include "libobd/bytes/hextext.h"
 #include "libobd/message/messageparser.h"
-
 #include "tests/support/plaincanparser.h"
 
 #include <algorithm>

@@ -2,14 +2,16 @@
 
 #include "program/terminal/output.h"
 #include "velmora/version.h"
+
 #include <velmora/error.h>
 
 #include <CLI/Config.hpp>
 #include <CLI/Formatter.hpp>
+#include <fmt/format.h>
+
 #include <cerrno>
 #include <cstdio>
 #include <exception>
-#include <fmt/format.h>
 #include <map>
 #include <system_error>
 #include <utility>

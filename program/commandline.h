@@ -4,6 +4,7 @@
 #include "program/globaloptions.h"
 
 #include <CLI/App.hpp>
+
 #include <functional>
 
 namespace velmora {

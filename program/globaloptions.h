@@ -2,6 +2,7 @@
 
 #include <obd/unitsystem.h>
 #include <obd/vehicleprotocol.h>
+
 #include <optional>
 #include <string>
 

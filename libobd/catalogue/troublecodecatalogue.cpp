@@ -1,6 +1,6 @@
-#include <obd/troublecodecatalogue.h>
-
 #include "libobd/catalogue/dtcreader.h"
+
+#include <obd/troublecodecatalogue.h>
 
 #include <algorithm>
 #include <string_view>

@@ -3,12 +3,13 @@
 #include "libobd/adapter/elmscantool.h"
 #include "libobd/module/obdproxy.h"
 
-#include <algorithm>
 #include <common/clock.h>
 #include <common/logrecord.h>
 #include <obd/dispatcher.h>
 #include <obd/iconnectionphaselistener.h>
 #include <obd/idataconnection.h>
+
+#include <algorithm>
 #include <utility>
 
 namespace obd {

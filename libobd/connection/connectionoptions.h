@@ -1,10 +1,10 @@
 #pragma once
 
+#include "libobd/connection/rememberedbluetoothdevices.h"
+
 #include <common/eventproducer.h>
 #include <obd/iconnectionoptions.h>
 #include <obd/isettings.h>
-
-#include "libobd/connection/rememberedbluetoothdevices.h"
 
 #include <memory>
 #include <vector>

@@ -5,7 +5,6 @@
 #include "libobd/powertrain/consumptionchoice.h"
 #include "libobd/powertrain/sensorpids.h"
 
-#include <algorithm>
 #include <common/logrecord.h>
 #include <obd/iconnectionnotifier.h>
 #include <obd/iecu.h>
@@ -13,6 +12,8 @@
 #include <obd/ivelmorasettings.h>
 #include <obd/parameterdescriptor.h>
 #include <obd/powertrainparameter.h>
+
+#include <algorithm>
 #include <utility>
 
 namespace obd {

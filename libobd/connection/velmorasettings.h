@@ -1,11 +1,11 @@
 #pragma once
 
+#include "libobd/connection/connectionoptions.h"
+#include "libobd/connection/settingskeys.h"
+
 #include <common/eventproducer.h>
 #include <obd/isettings.h>
 #include <obd/ivelmorasettings.h>
-
-#include "libobd/connection/connectionoptions.h"
-#include "libobd/connection/settingskeys.h"
 
 #include <memory>
 

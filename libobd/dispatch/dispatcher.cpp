@@ -1,8 +1,8 @@
-#include <obd/dispatcher.h>
-
 #include "libobd/dispatch/dispatcherimpl.h"
 #include "libobd/dispatch/dispatchqueue.h"
 #include "libobd/dispatch/idispatchable.h"
+
+#include <obd/dispatcher.h>
 
 #include <utility>
 

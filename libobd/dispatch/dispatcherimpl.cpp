@@ -1,10 +1,10 @@
 #include "libobd/dispatch/dispatcherimpl.h"
 
-#include <common/clock.h>
-#include <common/logrecord.h>
-
 #include "libobd/dispatch/idispatchable.h"
 #include "libobd/dispatch/keepalivedispatchable.h"
+
+#include <common/clock.h>
+#include <common/logrecord.h>
 
 namespace obd {
 namespace {

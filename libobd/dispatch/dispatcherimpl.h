@@ -1,9 +1,9 @@
 #pragma once
 
-#include <obd/dispatcher.h>
-
 #include "libobd/dispatch/dispatchertask.h"
 #include "libobd/dispatch/dispatchertaskobserver.h"
+
+#include <obd/dispatcher.h>
 
 #include <atomic>
 #include <memory>

@@ -1,12 +1,12 @@
 #include "libobd/dispatch/dispatchertask.h"
 
+#include "libobd/dispatch/dispatchertaskobserver.h"
+#include "libobd/dispatch/idispatchable.h"
+
 #include <common/clock.h>
 #include <common/logrecord.h>
 #include <common/tracestream.h>
 #include <obd/iobdproxy.h>
-
-#include "libobd/dispatch/dispatchertaskobserver.h"
-#include "libobd/dispatch/idispatchable.h"
 
 namespace obd {
 namespace {

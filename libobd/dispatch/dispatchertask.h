@@ -1,8 +1,8 @@
 #pragma once
 
-#include <common/cthread.h>
-
 #include "libobd/dispatch/dispatchqueue.h"
+
+#include <common/cthread.h>
 
 #include <atomic>
 #include <memory>

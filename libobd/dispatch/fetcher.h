@@ -1,9 +1,9 @@
 #pragma once
 
+#include "libobd/dispatch/fetchtask.h"
+
 #include <common/logrecord.h>
 #include <obd/dispatcher.h>
-
-#include "libobd/dispatch/fetchtask.h"
 
 #include <chrono>
 #include <future>

@@ -1,9 +1,9 @@
 #pragma once
 
-#include <obd/dispatcher.h>
-
 #include "libobd/dispatch/idispatchable.h"
 #include "libobd/dispatch/pacedupdate.h"
+
+#include <obd/dispatcher.h>
 
 #include <atomic>
 #include <functional>

@@ -1,6 +1,6 @@
-#include <obd/nack.h>
-
 #include "libobd/bytes/hexformat.h"
+
+#include <obd/nack.h>
 
 namespace obd {
 

@@ -1,10 +1,10 @@
+#include "libobd/bytes/bytereader.h"
+#include "libobd/bytes/hexformat.h"
+
 #include <common/logrecord.h>
 #include <common/tracestream.h>
 #include <obd/iobdproxy.h>
 #include <obd/obdparameter.h>
-
-#include "libobd/bytes/bytereader.h"
-#include "libobd/bytes/hexformat.h"
 
 namespace obd {
 namespace {

@@ -1,6 +1,5 @@
-#include <obd/parameterdescriptor.h>
-
 #include <obd/iecu.h>
+#include <obd/parameterdescriptor.h>
 #include <obd/powertrainparameter.h>
 
 #include <algorithm>

@@ -2,12 +2,13 @@
 
 #include "libobd/service/velmorainstance.h"
 
-#include <mutex>
 #include <obd/iconnectionmanager.h>
 #include <obd/idevice.h>
 #include <obd/iecu.h>
 #include <obd/iobdvelmora.h>
 #include <obd/ivelmorasettings.h>
+
+#include <mutex>
 
 namespace obd {
 

@@ -1,8 +1,9 @@
 #include "libobd/service/sensordata.h"
 
-#include <algorithm>
 #include <obd/sensorvalue.h>
 #include <obd/sensorvaluedatamodel.h>
+
+#include <algorithm>
 
 namespace obd {
 

@@ -14,6 +14,7 @@
 #include <obd/powertrainparameter.h>
 #include <obd/sensordatamodel.h>
 #include <obd/sensorvalue.h>
+
 #include <utility>
 
 namespace obd {

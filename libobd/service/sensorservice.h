@@ -1,10 +1,10 @@
 #pragma once
 
-#include <obd/isensorservice.h>
-#include <tervex/notifier.h>
-
 #include "libobd/service/baseservice.h"
 #include "libobd/service/sensorset.h"
+
+#include <obd/isensorservice.h>
+#include <tervex/notifier.h>
 
 #include <atomic>
 #include <mutex>

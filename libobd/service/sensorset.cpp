@@ -14,6 +14,7 @@
 #include <obd/sensorinfo.h>
 #include <obd/sensorvalue.h>
 #include <obd/sensorvaluedatamodel.h>
+
 #include <utility>
 
 namespace obd {

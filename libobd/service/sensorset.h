@@ -1,10 +1,10 @@
 #pragma once
 
-#include <obd/parameteridentifier.h>
-#include <obd/unitsystem.h>
-
 #include "libobd/dispatch/query.h"
 #include "libobd/service/sensordata.h"
+
+#include <obd/parameteridentifier.h>
+#include <obd/unitsystem.h>
 
 #include <map>
 #include <memory>

@@ -2,11 +2,12 @@
 
 #include "libvelmora/port/iport.h"
 
-#include <array>
 #include <asio/buffer.hpp>
 #include <asio/io_context.hpp>
 #include <asio/post.hpp>
 #include <asio/write.hpp>
+
+#include <array>
 #include <memory>
 #include <string>
 #include <thread>

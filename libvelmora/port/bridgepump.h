@@ -2,9 +2,10 @@
 
 #include "libvelmora/port/iport.h"
 
+#include <obd/databridge.h>
+
 #include <atomic>
 #include <memory>
-#include <obd/databridge.h>
 #include <thread>
 
 namespace velmora {

@@ -2,6 +2,7 @@
 
 #include "simulator/error.h"
 #include "simulator/simulation.h"
+
 #include <velmora/error.h>
 
 #include <algorithm>

@@ -1,9 +1,11 @@
 #include "libvelmora/port/serialport.h"
 
 #include "libvelmora/port/asioport.h"
+
 #include <velmora/error.h>
 
 #include <asio/serial_port.hpp>
+
 #include <cerrno>
 #include <fcntl.h>
 #include <sys/ioctl.h>

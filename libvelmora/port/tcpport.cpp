@@ -1,10 +1,12 @@
 #include "libvelmora/port/tcpport.h"
 
 #include "libvelmora/port/asioport.h"
+
 #include <velmora/error.h>
 
 #include <asio/connect.hpp>
 #include <asio/ip/tcp.hpp>
+
 #include <chrono>
 
 namespace velmora {

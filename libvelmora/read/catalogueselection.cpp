@@ -1,11 +1,12 @@
 #include "libvelmora/read/catalogueselection.h"
 
+#include <obd/manufacturer.h>
 #include <velmora/error.h>
 
-#include <algorithm>
 #include <fmt/format.h>
+
+#include <algorithm>
 #include <iterator>
-#include <obd/manufacturer.h>
 
 namespace velmora {
 

@@ -1,7 +1,8 @@
 #pragma once
 
-#include <memory>
 #include <obd/dtcdatamodel.h>
+
+#include <memory>
 #include <string>
 #include <vector>
 

@@ -4,10 +4,11 @@
 #include "libvelmora/report/codereport.h"
 #include "libvelmora/session/session.h"
 
-#include <map>
-#include <memory>
 #include <obd/iecu.h>
 #include <obd/itroublecodeservice.h>
+
+#include <map>
+#include <memory>
 
 namespace velmora {
 

@@ -1,8 +1,9 @@
 #include "libvelmora/read/diagnosticreaders.h"
 
+#include <obd/idiagnosticsservice.h>
+
 #include <algorithm>
 #include <charconv>
-#include <obd/idiagnosticsservice.h>
 
 namespace velmora {
 

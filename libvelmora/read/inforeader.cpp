@@ -2,9 +2,10 @@
 #include "libvelmora/report/unitlabel.h"
 #include "libvelmora/text/text.h"
 
-#include <algorithm>
 #include <obd/iecuservice.h>
 #include <obd/itroublecodeservice.h>
+
+#include <algorithm>
 
 namespace velmora {
 

@@ -1,8 +1,9 @@
 #include "libvelmora/read/diagnosticreaders.h"
 
-#include <algorithm>
 #include <obd/idiagnosticsservice.h>
 #include <obd/itroublecodeservice.h>
+
+#include <algorithm>
 
 namespace velmora {
 

@@ -1,8 +1,9 @@
 #include "libvelmora/read/routinereader.h"
 
-#include <cctype>
 #include <obd/iroutineservice.h>
 #include <obd/nack.h>
+
+#include <cctype>
 
 namespace velmora {
 

@@ -2,12 +2,14 @@
 
 #include "libvelmora/read/sensornames.h"
 #include "libvelmora/text/text.h"
+
+#include <obd/parameterdescriptor.h>
 #include <velmora/error.h>
+
+#include <fmt/format.h>
 
 #include <algorithm>
 #include <charconv>
-#include <fmt/format.h>
-#include <obd/parameterdescriptor.h>
 #include <optional>
 #include <string_view>
 

@@ -2,6 +2,7 @@
 
 #include <obd/isensorservice.h>
 #include <obd/parameteridentifier.h>
+
 #include <string>
 #include <vector>
 

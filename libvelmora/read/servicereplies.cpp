@@ -1,7 +1,9 @@
 #include "libvelmora/read/servicereplies.h"
 
-#include <fmt/format.h>
 #include <obd/nack.h>
+
+#include <fmt/format.h>
+
 #include <utility>
 
 namespace velmora {

@@ -2,6 +2,7 @@
 
 #include <obd/iobdproxy.h>
 #include <obd/responsemap.h>
+
 #include <string>
 #include <vector>
 

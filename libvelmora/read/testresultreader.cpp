@@ -1,8 +1,9 @@
 #include "libvelmora/read/diagnosticreaders.h"
 #include "libvelmora/report/unitlabel.h"
 
-#include <algorithm>
 #include <obd/idiagnosticsservice.h>
+
+#include <algorithm>
 
 namespace velmora {
 

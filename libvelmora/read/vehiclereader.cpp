@@ -6,9 +6,11 @@
 #include "libvelmora/text/text.h"
 #include "program/terminal/output.h"
 
-#include <cstdio>
-#include <fmt/format.h>
 #include <obd/iecu.h>
+
+#include <fmt/format.h>
+
+#include <cstdio>
 
 namespace velmora {
 

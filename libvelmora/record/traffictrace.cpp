@@ -2,10 +2,11 @@
 
 #include <velmora/error.h>
 
-#include <chrono>
-#include <ctime>
 #include <fmt/chrono.h>
 #include <fmt/ostream.h>
+
+#include <chrono>
+#include <ctime>
 
 namespace velmora {
 

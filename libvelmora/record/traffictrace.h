@@ -1,9 +1,10 @@
 #pragma once
 
+#include <obd/iconnectionlogger.h>
+
 #include <filesystem>
 #include <fstream>
 #include <mutex>
-#include <obd/iconnectionlogger.h>
 #include <string_view>
 
 namespace velmora {

@@ -1,7 +1,8 @@
 #include "libvelmora/report/limittest.h"
 
-#include <algorithm>
 #include <fmt/format.h>
+
+#include <algorithm>
 
 namespace velmora {
 

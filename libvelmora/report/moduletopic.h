@@ -3,9 +3,10 @@
 #include "libvelmora/report/json.h"
 #include "program/view/style.h"
 
+#include <fmt/format.h>
+
 #include <algorithm>
 #include <concepts>
-#include <fmt/format.h>
 #include <string>
 #include <vector>
 

@@ -4,6 +4,7 @@
 #include "libvelmora/report/moduletopic.h"
 
 #include <obd/oxygensensorlocation.h>
+
 #include <optional>
 #include <string>
 #include <vector>

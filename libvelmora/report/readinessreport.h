@@ -3,6 +3,7 @@
 #include "libvelmora/report/moduletopic.h"
 
 #include <obd/readinessmonitordatamodel.h>
+
 #include <optional>
 #include <string>
 #include <vector>

@@ -2,8 +2,9 @@
 
 #include "libvelmora/report/json.h"
 
-#include <algorithm>
 #include <fmt/format.h>
+
+#include <algorithm>
 
 namespace velmora {
 

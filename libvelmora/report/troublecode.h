@@ -1,8 +1,10 @@
 #pragma once
 
-#include <memory>
-#include <nlohmann/json_fwd.hpp>
 #include <obd/dtcdatamodel.h>
+
+#include <nlohmann/json_fwd.hpp>
+
+#include <memory>
 #include <string>
 #include <vector>
 

@@ -1,7 +1,8 @@
 #include "libvelmora/report/vehiclereport.h"
 
-#include <cmath>
 #include <fmt/format.h>
+
+#include <cmath>
 
 namespace velmora {
 

@@ -2,10 +2,11 @@
 
 #include "libvelmora/session/dispatchloop.h"
 
-#include <chrono>
-#include <mutex>
 #include <obd/iconnectionlogger.h>
 #include <obd/iconnectionmanager.h>
+
+#include <chrono>
+#include <mutex>
 
 namespace velmora {
 

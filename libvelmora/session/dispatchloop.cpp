@@ -1,6 +1,7 @@
 #include "libvelmora/session/dispatchloop.h"
 
 #include <obd/dispatcher.h>
+
 #include <utility>
 
 namespace velmora {

@@ -1,11 +1,12 @@
 #pragma once
 
+#include <obd/idispatchrunner.h>
+#include <tervex/observer.h>
+
 #include <chrono>
 #include <condition_variable>
 #include <functional>
 #include <mutex>
-#include <obd/idispatchrunner.h>
-#include <tervex/observer.h>
 
 namespace velmora {
 

@@ -1,9 +1,9 @@
 #include "libvelmora/session/libraryuse.h"
 
+#include <obd/library.h>
 #include <velmora/error.h>
 
 #include <fstream>
-#include <obd/library.h>
 
 namespace velmora {
 

@@ -7,10 +7,7 @@
 #include "libvelmora/text/text.h"
 #include "program/terminal/interrupt.h"
 #include "program/terminal/output.h"
-#include <velmora/error.h>
 
-#include <atomic>
-#include <fmt/format.h>
 #include <obd/databridge.h>
 #include <obd/iconnectionmanager.h>
 #include <obd/iconnectionoptions.h>
@@ -18,6 +15,11 @@
 #include <obd/iecu.h>
 #include <obd/ivelmorasettings.h>
 #include <obd/obdvelmorabuilder.h>
+#include <velmora/error.h>
+
+#include <fmt/format.h>
+
+#include <atomic>
 #include <thread>
 
 namespace velmora {

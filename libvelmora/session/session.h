@@ -7,11 +7,12 @@
 #include "libvelmora/session/libraryuse.h"
 #include "program/globaloptions.h"
 
-#include <memory>
 #include <obd/iadapter.h>
 #include <obd/iecumanager.h>
 #include <obd/iobdproxy.h>
 #include <obd/iobdvelmora.h>
+
+#include <memory>
 #include <optional>
 #include <string>
 #include <vector>

@@ -2,12 +2,13 @@
 
 #include <velmora/error.h>
 
+#include <toml++/toml.h>
+
 #include <cerrno>
 #include <cstdlib>
 #include <cstring>
 #include <fcntl.h>
 #include <sstream>
-#include <toml++/toml.h>
 #include <unistd.h>
 #include <utility>
 

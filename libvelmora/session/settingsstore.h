@@ -1,9 +1,10 @@
 #pragma once
 
+#include <obd/isettings.h>
+
 #include <filesystem>
 #include <map>
 #include <mutex>
-#include <obd/isettings.h>
 #include <string>
 #include <variant>
 

@@ -5,9 +5,11 @@
 #include "program/command/confirm.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
+
 #include <velmora/error.h>
 
 #include <fmt/format.h>
+
 #include <set>
 
 namespace velmora {

@@ -2,9 +2,11 @@
 
 #include "program/terminal/linereader.h"
 #include "program/terminal/output.h"
+
 #include <velmora/error.h>
 
 #include <fmt/format.h>
+
 #include <unistd.h>
 
 namespace velmora {

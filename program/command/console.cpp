@@ -5,8 +5,9 @@
 #include "program/terminal/output.h"
 #include "program/terminal/promptreader.h"
 
-#include <cstdio>
 #include <fmt/format.h>
+
+#include <cstdio>
 #include <optional>
 #include <unistd.h>
 

@@ -6,12 +6,14 @@
 #include "program/command/commands.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
+
+#include <obd/troublecodecatalogue.h>
 #include <velmora/error.h>
 
-#include <algorithm>
 #include <fmt/format.h>
+
+#include <algorithm>
 #include <memory>
-#include <obd/troublecodecatalogue.h>
 
 namespace velmora {
 

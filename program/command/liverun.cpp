@@ -3,11 +3,13 @@
 #include "program/terminal/interrupt.h"
 #include "program/terminal/output.h"
 #include "program/view/livelines.h"
+
 #include <velmora/error.h>
+
+#include <fmt/format.h>
 
 #include <algorithm>
 #include <cstdio>
-#include <fmt/format.h>
 
 namespace velmora {
 

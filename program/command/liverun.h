@@ -9,11 +9,12 @@
 #include "program/view/livescreen.h"
 #include "program/view/livetable.h"
 
-#include <memory>
 #include <obd/isensorservice.h>
+#include <tervex/observer.h>
+
+#include <memory>
 #include <optional>
 #include <string>
-#include <tervex/observer.h>
 #include <vector>
 
 namespace velmora {

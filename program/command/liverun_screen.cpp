@@ -1,10 +1,12 @@
 #include "program/command/liverun.h"
 #include "program/view/style.h"
 
-#include <algorithm>
-#include <fmt/format.h>
 #include <obd/iecu.h>
 #include <obd/ivelmorasettings.h>
+
+#include <fmt/format.h>
+
+#include <algorithm>
 
 namespace velmora {
 

@@ -6,10 +6,11 @@
 #include "program/terminal/lineprinter.h"
 #include "program/view/trafficlog.h"
 
-#include <chrono>
 #include <obd/isensorservice.h>
 #include <obd/itroubleshootingservice.h>
 #include <tervex/observer.h>
+
+#include <chrono>
 
 namespace velmora {
 

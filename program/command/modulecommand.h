@@ -5,11 +5,13 @@
 #include "libvelmora/text/text.h"
 #include "program/exitcode.h"
 #include "program/terminal/output.h"
+
+#include <obd/iecu.h>
 #include <velmora/error.h>
 
-#include <algorithm>
 #include <fmt/format.h>
-#include <obd/iecu.h>
+
+#include <algorithm>
 #include <type_traits>
 
 // The common shape of the commands that show one topic of every control module.

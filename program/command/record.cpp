@@ -5,11 +5,13 @@
 #include "program/command/commands.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
+
+#include <obd/isensorservice.h>
 #include <velmora/error.h>
 
-#include <algorithm>
 #include <fmt/format.h>
-#include <obd/isensorservice.h>
+
+#include <algorithm>
 
 namespace velmora {
 

@@ -3,10 +3,12 @@
 #include "program/command/commands.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
+
 #include <velmora/error.h>
 
-#include <algorithm>
 #include <fmt/format.h>
+
+#include <algorithm>
 
 namespace velmora {
 

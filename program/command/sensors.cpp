@@ -5,9 +5,10 @@
 #include "program/command/commands.h"
 #include "program/commandline.h"
 
-#include <fmt/format.h>
 #include <obd/iecu.h>
 #include <obd/iecuservice.h>
+
+#include <fmt/format.h>
 
 namespace velmora {
 

@@ -2,14 +2,15 @@
 #include "program/command/commands.h"
 #include "program/commandline.h"
 #include "program/terminal/interrupt.h"
-#include <velmora/error.h>
-
 #include "simulator/error.h"
 #include "simulator/server.h"
 #include "simulator/simulation.h"
 
-#include <cstdio>
+#include <velmora/error.h>
+
 #include <fmt/format.h>
+
+#include <cstdio>
 #include <memory>
 #include <variant>
 

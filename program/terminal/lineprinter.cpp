@@ -1,4 +1,5 @@
 #include "program/terminal/lineprinter.h"
+
 #include "program/terminal/output.h"
 
 #include <utility>

@@ -3,11 +3,13 @@
 #include "libvelmora/session/session.h"
 #include "program/terminal/interrupt.h"
 #include "program/terminal/output.h"
+
 #include <velmora/error.h>
+
+#include <fmt/format.h>
 
 #include <cstdlib>
 #include <cstring>
-#include <fmt/format.h>
 #include <unistd.h>
 
 namespace velmora {

@@ -2,8 +2,9 @@
 
 #include "libvelmora/text/text.h"
 
-#include <algorithm>
 #include <fmt/format.h>
+
+#include <algorithm>
 #include <sstream>
 
 namespace velmora {

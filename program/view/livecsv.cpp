@@ -1,6 +1,7 @@
 #include "program/view/livecsv.h"
 
 #include "program/view/livelines.h"
+
 #include <velmora/error.h>
 
 #include <algorithm>

@@ -2,9 +2,11 @@
 
 #include "libvelmora/report/json.h"
 
-#include <ctime>
-#include <fmt/format.h>
 #include <obd/parameteridentifier.h>
+
+#include <fmt/format.h>
+
+#include <ctime>
 
 namespace velmora {
 

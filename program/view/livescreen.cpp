@@ -2,9 +2,10 @@
 
 #include "libvelmora/text/text.h"
 
+#include <fmt/format.h>
+
 #include <algorithm>
 #include <cmath>
-#include <fmt/format.h>
 
 namespace velmora {
 

@@ -2,10 +2,11 @@
 
 #include "libvelmora/report/unitlabel.h"
 
+#include <fmt/format.h>
+
 #include <algorithm>
 #include <charconv>
 #include <cmath>
-#include <fmt/format.h>
 
 namespace velmora {
 

@@ -1,10 +1,11 @@
 #pragma once
 
+#include <obd/parameterdescriptor.h>
+#include <obd/sensorvaluedatamodel.h>
+
 #include <chrono>
 #include <deque>
 #include <memory>
-#include <obd/parameterdescriptor.h>
-#include <obd/sensorvaluedatamodel.h>
 #include <set>
 #include <string>
 #include <vector>

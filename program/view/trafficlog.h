@@ -1,6 +1,7 @@
 #pragma once
 
 #include <obd/messagedatamodel.h>
+
 #include <string>
 
 namespace velmora {

@@ -1,8 +1,9 @@
+#include "tests/support/fakeclock.h"
+
 #include <common/cdatetime.h>
 #include <common/localtime.h>
-#include <gtest/gtest.h>
 
-#include "tests/support/fakeclock.h"
+#include <gtest/gtest.h>
 
 namespace {
 

@@ -1,7 +1,8 @@
-#include <common/cthread.h>
-#include <gtest/gtest.h>
-
 #include "tests/support/logcapture.h"
+
+#include <common/cthread.h>
+
+#include <gtest/gtest.h>
 
 #include <atomic>
 #include <optional>

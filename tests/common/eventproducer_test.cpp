@@ -1,7 +1,8 @@
-#include <common/eventproducer.h>
-#include <gtest/gtest.h>
-
 #include "tests/support/logcapture.h"
+
+#include <common/eventproducer.h>
+
+#include <gtest/gtest.h>
 
 #include <atomic>
 #include <functional>

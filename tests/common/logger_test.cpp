@@ -1,10 +1,11 @@
+#include "tests/support/fakeclock.h"
+
 #include <common/debuglogger.h>
 #include <common/localtime.h>
 #include <common/logrecord.h>
 #include <common/tracestream.h>
-#include <gtest/gtest.h>
 
-#include "tests/support/fakeclock.h"
+#include <gtest/gtest.h>
 
 #include <filesystem>
 #include <fstream>

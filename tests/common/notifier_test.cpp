@@ -1,5 +1,6 @@
-#include <gtest/gtest.h>
 #include <tervex/notifier.h>
+
+#include <gtest/gtest.h>
 
 #include <functional>
 #include <memory>

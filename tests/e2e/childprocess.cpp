@@ -1,12 +1,13 @@
 #include "tests/e2e/childprocess.h"
 
+#include <gtest/gtest.h>
+
 #include <array>
 #include <cerrno>
 #include <chrono>
 #include <csignal>
 #include <cstdlib>
 #include <fcntl.h>
-#include <gtest/gtest.h>
 #include <poll.h>
 #include <spawn.h>
 #include <sys/wait.h>

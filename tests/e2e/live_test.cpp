@@ -2,10 +2,11 @@
 
 #include "tests/e2e/childprocess.h"
 
+#include <gtest/gtest.h>
+
 #include <algorithm>
 #include <cstdio>
 #include <fstream>
-#include <gtest/gtest.h>
 
 namespace {
 

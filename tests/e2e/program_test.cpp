@@ -3,10 +3,11 @@
 #include "tests/e2e/childprocess.h"
 #include "tests/support/jsonschema.h"
 
-#include <chrono>
-#include <cstdlib>
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
+
+#include <chrono>
+#include <cstdlib>
 #include <sys/wait.h>
 #include <thread>
 

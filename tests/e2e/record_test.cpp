@@ -3,12 +3,13 @@
 #include "tests/e2e/childprocess.h"
 #include "tests/support/jsonschema.h"
 
+#include <gtest/gtest.h>
+#include <nlohmann/json.hpp>
+
 #include <algorithm>
 #include <cstdio>
 #include <filesystem>
 #include <fstream>
-#include <gtest/gtest.h>
-#include <nlohmann/json.hpp>
 
 namespace {
 

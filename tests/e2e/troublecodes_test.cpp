@@ -3,9 +3,10 @@
 #include "tests/e2e/childprocess.h"
 #include "tests/support/jsonschema.h"
 
-#include <algorithm>
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
+
+#include <algorithm>
 
 namespace {
 

@@ -11,9 +11,6 @@
 #include "tests/support/peerconnection.h"
 #include "tests/support/workerclock.h"
 
-#include <atomic>
-#include <gmock/gmock.h>
-#include <gtest/gtest.h>
 #include <obd/databridge.h>
 #include <obd/iconnectionlogger.h>
 #include <obd/iconnectionmanager.h>
@@ -27,6 +24,11 @@
 #include <obd/itroublecodeservice.h>
 #include <obd/obdvelmorabuilder.h>
 #include <tervex/observer.h>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <atomic>
 #include <thread>
 
 namespace {

@@ -1,9 +1,9 @@
 #pragma once
 
-#include <common/clock.h>
-
 #include "tests/support/dispatchloop.h"
 #include "tests/support/peerconnection.h"
+
+#include <common/clock.h>
 
 #include <atomic>
 #include <memory>

@@ -12,9 +12,6 @@
 #include "tests/support/logcapture.h"
 #include "tests/support/memorysettings.h"
 
-#include <algorithm>
-#include <filesystem>
-#include <gtest/gtest.h>
 #include <obd/iconnectionmanager.h>
 #include <obd/iobdvelmora.h>
 #include <obd/isensorservice.h>
@@ -22,6 +19,11 @@
 #include <obd/obdvelmorabuilder.h>
 #include <obd/parameterdescriptor.h>
 #include <obd/sensorinfo.h>
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <filesystem>
 #include <unistd.h>
 
 namespace {

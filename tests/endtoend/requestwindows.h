@@ -1,11 +1,11 @@
 #pragma once
 
+#include "tests/support/peerconnection.h"
+
 #include <obd/dispatcher.h>
 #include <obd/iconnectionlogger.h>
 #include <obd/idispatchrunner.h>
 #include <tervex/observer.h>
-
-#include "tests/support/peerconnection.h"
 
 #include <deque>
 #include <memory>

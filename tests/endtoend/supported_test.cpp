@@ -5,10 +5,11 @@
 #include "simulator/simulation.h"
 #include "tests/support/peerconnection.h"
 
+#include <gtest/gtest.h>
+
 #include <algorithm>
 #include <filesystem>
 #include <fstream>
-#include <gtest/gtest.h>
 #include <map>
 #include <set>
 #include <sstream>

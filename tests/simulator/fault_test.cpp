@@ -1,5 +1,4 @@
 #include "simulator/fault.h"
-
 #include "tests/simulator/conversation.h"
 
 #include <gtest/gtest.h>

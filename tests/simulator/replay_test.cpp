@@ -1,5 +1,4 @@
 #include "simulator/replayscript.h"
-
 #include "tests/simulator/conversation.h"
 
 #include <gtest/gtest.h>

@@ -1,12 +1,10 @@
 #include "simulator/server.h"
-
 #include "simulator/simulation.h"
-
-#include <gtest/gtest.h>
 
 #include <asio/connect.hpp>
 #include <asio/ip/tcp.hpp>
 #include <asio/write.hpp>
+#include <gtest/gtest.h>
 
 #include <chrono>
 #include <fcntl.h>

@@ -1,10 +1,10 @@
 #pragma once
 
-#include <obd/dispatcher.h>
-
 #include "tests/support/dispatchloop.h"
 #include "tests/support/fakeproxy.h"
 #include "tests/support/workerclock.h"
+
+#include <obd/dispatcher.h>
 
 #include <memory>
 

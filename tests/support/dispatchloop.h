@@ -1,9 +1,9 @@
 #pragma once
 
+#include "tests/support/gate.h"
+
 #include <obd/dispatcher.h>
 #include <tervex/observer.h>
-
-#include "tests/support/gate.h"
 
 #include <chrono>
 #include <condition_variable>

@@ -1,9 +1,10 @@
 #pragma once
 
+#include <obd/idevice.h>
+
 #include <atomic>
 #include <functional>
 #include <map>
-#include <obd/idevice.h>
 #include <string>
 #include <vector>
 

@@ -1,11 +1,11 @@
 #pragma once
 
-#include <obd/iobdproxy.h>
-
 #include "tests/support/fakeecu.h"
 #include "tests/support/gate.h"
 #include "tests/support/hexbytes.h"
 #include "tests/support/scriptedanswers.h"
+
+#include <obd/iobdproxy.h>
 
 #include <algorithm>
 #include <atomic>

@@ -1,10 +1,11 @@
 #include "tests/support/jsonschema.h"
 
+#include <gtest/gtest.h>
+
 #include <array>
 #include <cstdio>
 #include <filesystem>
 #include <fstream>
-#include <gtest/gtest.h>
 #include <unistd.h>
 
 namespace support {

@@ -1,10 +1,11 @@
 #pragma once
 
-#include <gtest/gtest.h>
-#include <obd/databridge.h>
-
 #include "tests/support/bytes.h"
 #include "tests/support/fakeclock.h"
+
+#include <obd/databridge.h>
+
+#include <gtest/gtest.h>
 
 #include <algorithm>
 #include <atomic>

@@ -1,9 +1,5 @@
 #pragma once
 
-#include <obd/iconnectionmanager.h>
-#include <obd/iobdvelmora.h>
-#include <obd/parameteridentifier.h>
-
 #include "libobd/connection/configuration.h"
 #include "libobd/connection/connectionnotifier.h"
 #include "libobd/connection/ecumanager.h"
@@ -11,6 +7,10 @@
 #include "libobd/service/velmorainstance.h"
 #include "tests/support/dispatcherrig.h"
 #include "tests/support/memorysettings.h"
+
+#include <obd/iconnectionmanager.h>
+#include <obd/iobdvelmora.h>
+#include <obd/parameteridentifier.h>
 
 #include <memory>
 #include <vector>

@@ -1,9 +1,9 @@
 #pragma once
 
-#include <gtest/gtest.h>
-
 #include "tests/support/logcapture.h"
 #include "tests/support/servicerig.h"
+
+#include <gtest/gtest.h>
 
 namespace support {
 

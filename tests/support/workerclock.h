@@ -1,8 +1,8 @@
 #pragma once
 
-#include <common/clock.h>
-
 #include "tests/support/gate.h"
+
+#include <common/clock.h>
 
 #include <chrono>
 #include <condition_variable>

@@ -6,11 +6,11 @@
 
 namespace obd {
 
-// How to reach an adapter over Bluetooth.
+/// How to reach an adapter over Bluetooth.
 class BluetoothDescriptor
 {
 public:
-    // White space at both ends of the name is stripped. port is the RFCOMM channel.
+    /// White space at both ends of the name is stripped. port is the RFCOMM channel.
     OBD_EXPORT BluetoothDescriptor(std::string const& name, std::string const& address, int port);
 
     std::string const& name() const { return m_name; }

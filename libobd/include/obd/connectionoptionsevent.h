@@ -2,7 +2,7 @@
 
 namespace obd {
 
-// Which connection option was set. Fired also when the value is the same as before.
+/// Which connection option was set. Fired also when the value is the same as before.
 enum class ConnectionOptionsEvent : int
 {
     BusChanged = 1,

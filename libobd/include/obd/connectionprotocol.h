@@ -8,21 +8,21 @@
 
 namespace obd {
 
-// A bus protocol to choose, with its name for people.
+/// A bus protocol to choose, with its name for people.
 class OBD_EXPORT ConnectionProtocol
 {
 public:
     explicit ConnectionProtocol(VehicleProtocol protocol);
 
     VehicleProtocol protocol() const;
-    // Such as "ISO 9141-2"; empty for a number that no protocol has.
+    /// Such as "ISO 9141-2"; empty for a number that no protocol has.
     std::string description() const;
 
 private:
     VehicleProtocol m_protocol;
 };
 
-// The bus family of a protocol; ObdProtocolUnknown for Automatic and for a number that no protocol has.
+/// The bus family of a protocol; ObdProtocolUnknown for Automatic and for a number that no protocol has.
 OBD_EXPORT ObdProtocol toObdProtocol(VehicleProtocol protocol);
 
 } // namespace obd

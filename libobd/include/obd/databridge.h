@@ -12,16 +12,16 @@
 
 namespace obd {
 
-// The byte channel between the application's port and the library: the application keeps the IDataBridge view for its
-// reader and writer loops and hands the IDataConnection view to the library. One bridge serves one connection; an
-// invalidated one stays so, and only isValid tells: all else goes on working.
-//
-// Threads: send, receive, get, addLogger and removeLogger from any, set from one only.
+/// The byte channel between the application's port and the library: the application keeps the IDataBridge view for its
+/// reader and writer loops and hands the IDataConnection view to the library. One bridge serves one connection; an
+/// invalidated one stays so, and only isValid tells: all else goes on working.
+///
+/// Threads: send, receive, get, addLogger and removeLogger from any, set from one only.
 class OBD_EXPORT DataBridge : public IDataBridge, public IDataConnection
 {
 public:
     DataBridge() = default;
-    // Wakes who still waits; nobody may be inside any more once the members go.
+    /// Wakes who still waits; nobody may be inside any more once the members go.
     ~DataBridge() override;
 
     DataBridge(DataBridge const&) = delete;
@@ -44,14 +44,14 @@ private:
     void queueMessage(Bytes message);
 
     std::atomic<char> m_delimiter{0};
-    // Read under either side's mutex, changed under both.
+    /// Read under either side's mutex, changed under both.
     std::vector<IConnectionLogger*> m_loggers;
 
     Bytes m_outgoing;
     std::mutex m_outgoingMutex;
     std::condition_variable m_outgoingCondition;
 
-    // What set was given after the last delimiter. Belongs to the thread that calls set.
+    /// What set was given after the last delimiter. Belongs to the thread that calls set.
     Bytes m_assembly;
     std::deque<Bytes> m_incoming;
     std::mutex m_incomingMutex;

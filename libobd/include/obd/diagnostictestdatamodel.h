@@ -6,13 +6,13 @@
 
 namespace obd {
 
-// A test result of an on-board monitor for the application, ready for display; a copy that keeps nothing of the library
-// alive.
+/// A test result of an on-board monitor for the application, ready for display; a copy that keeps nothing of the
+/// library alive.
 struct DiagnosticTestDataModel
 {
     enum class Status : int
     {
-        NoResult = 0, // the test has not run since the codes were cleared
+        NoResult = 0, ///< the test has not run since the codes were cleared
         Failed = 1,
         Passed = 2,
     };
@@ -24,11 +24,11 @@ struct DiagnosticTestDataModel
           unit(measurementUnit), status(testStatus)
     {}
 
-    int testId; // test identifier of service 06
+    int testId; ///< test identifier of service 06
     std::string description;
     std::string value;
-    std::string minimum; // empty if there is no lower limit
-    std::string maximum; // empty if there is no upper limit
+    std::string minimum; ///< empty if there is no lower limit
+    std::string maximum; ///< empty if there is no upper limit
     MeasurementUnit unit;
     Status status;
 };

@@ -5,7 +5,7 @@
 
 namespace obd {
 
-// One meaning of a diagnostic trouble code (SAE J2012). The library shares such objects between callers: read only.
+/// One meaning of a diagnostic trouble code (SAE J2012). The library shares such objects between callers: read only.
 struct DtcDataModel
 {
     DtcDataModel(std::string codeText, std::string meaning, std::string systemName, std::string makerName)

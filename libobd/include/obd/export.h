@@ -1,6 +1,6 @@
 #pragma once
 
-// Marks what the library shows to applications; all else stays hidden inside it.
+/// Marks what the library shows to applications; all else stays hidden inside it.
 #if defined(OBD_STATIC)
 #define OBD_EXPORT
 #elif defined(_WIN32)

@@ -6,8 +6,8 @@
 
 namespace obd {
 
-// What an application may ask about the adapter. Texts are copies; they are empty before the adapter was identified
-// and after the connection has ended.
+/// What an application may ask about the adapter. Texts are copies; they are empty before the adapter was identified
+/// and after the connection has ended.
 class IAdapter
 {
 public:
@@ -16,17 +16,17 @@ public:
     IAdapter& operator=(IAdapter const&) = default;
     virtual ~IAdapter() = default;
 
-    // Name and version, such as "ELM327 v1.5".
+    /// Name and version, such as "ELM327 v1.5".
     virtual std::string device() = 0;
-    // The adapter's own description, such as "OBDII to RS232 Interpreter".
+    /// The adapter's own description, such as "OBDII to RS232 Interpreter".
     virtual std::string description() = 0;
-    // The identifier that its owner has stored in it, often empty.
+    /// The identifier that its owner has stored in it, often empty.
     virtual std::string identification() = 0;
-    // Supply voltage in volts, as the adapter measures it. False, with volts untouched, if it gives no number. Talks to
-    // the adapter: only while nothing else does.
+    /// Supply voltage in volts, as the adapter measures it. False, with volts untouched, if it gives no number. Talks
+    /// to the adapter: only while nothing else does.
     virtual bool batteryVoltage(float& volts) = 0;
     virtual ObdProtocol getProtocol() = 0;
-    // The adapter's own words for the protocol in use.
+    /// The adapter's own words for the protocol in use.
     virtual std::string getProtocolDescription() = 0;
 };
 

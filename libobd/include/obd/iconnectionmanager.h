@@ -12,37 +12,37 @@ class IDataConnection;
 class IDevice;
 class IObdProxy;
 
-// Owns the life of one connection. Listeners and loggers are not owned: who adds one removes it before it dies.
+/// Owns the life of one connection. Listeners and loggers are not owned: who adds one removes it before it dies.
 class IConnectionManager
 {
 public:
     virtual ~IConnectionManager() = default;
 
     virtual void addPhaseListener(IConnectionPhaseListener* listener) = 0;
-    // Removes the first equal entry.
+    /// Removes the first equal entry.
     virtual void removePhaseListener(IConnectionPhaseListener* listener) = 0;
 
-    // Identifies the adapter, finds the vehicle and reads what its control modules support. Blocks for seconds to
-    // minutes; invalidate() on the bridge makes it fail within 250 ms. restoreAdapter restores and resets the adapter
-    // first. After a failure call closeConnection, which takes the adapter down, and bring a fresh bridge for the next
-    // attempt. An open connection is replaced without being closed.
+    /// Identifies the adapter, finds the vehicle and reads what its control modules support. Blocks for seconds to
+    /// minutes; invalidate() on the bridge makes it fail within 250 ms. restoreAdapter restores and resets the adapter
+    /// first. After a failure call closeConnection, which takes the adapter down, and bring a fresh bridge for the next
+    /// attempt. An open connection is replaced without being closed.
     virtual bool openConnection(std::shared_ptr<IDataConnection> const& connection, VehicleProtocol protocol,
                                 bool restoreAdapter) = 0;
 
-    // Whether a connection is fully open.
+    /// Whether a connection is fully open.
     virtual bool isBusy() = 0;
 
-    // Sends the adapter to sleep, tells the services and drops all queued work. Waits for an opening and for the
-    // request under way. Not from the dispatcher's worker.
+    /// Sends the adapter to sleep, tells the services and drops all queued work. Waits for an opening and for the
+    /// request under way. Not from the dispatcher's worker.
     virtual void closeConnection() = 0;
 
-    // The adapter: from DeviceReady on, also where no vehicle was found, until the close. May be null.
+    /// The adapter: from DeviceReady on, also where no vehicle was found, until the close. May be null.
     virtual std::shared_ptr<IDevice> getAdapter() = 0;
-    // Never null.
+    /// Never null.
     virtual std::shared_ptr<IObdProxy> getProxy() = 0;
 
-    // A tap on the traffic of this connection and of those to come. Once removeLogger has returned, the logger is not
-    // called any more. Not from a logger's own call.
+    /// A tap on the traffic of this connection and of those to come. Once removeLogger has returned, the logger is not
+    /// called any more. Not from a logger's own call.
     virtual void addLogger(IConnectionLogger* logger) = 0;
     virtual void removeLogger(IConnectionLogger* logger) = 0;
 };

@@ -4,8 +4,8 @@ namespace obd {
 
 class IConnectionNotifierListener;
 
-// Tells opening and closing in the order of three priorities: 0 the control modules, 1 the services, 2 the connection
-// service. Other priorities are ignored. Listeners are not owned.
+/// Tells opening and closing in the order of three priorities: 0 the control modules, 1 the services, 2 the connection
+/// service. Other priorities are ignored. Listeners are not owned.
 class IConnectionNotifier
 {
 public:
@@ -13,7 +13,7 @@ public:
 
     virtual bool isConnected() = 0;
     virtual void attach(unsigned int priority, IConnectionNotifierListener* listener) = 0;
-    // Removes every entry of the listener at that priority.
+    /// Removes every entry of the listener at that priority.
     virtual void detach(unsigned int priority, IConnectionNotifierListener* listener) = 0;
 };
 

@@ -2,8 +2,8 @@
 
 namespace obd {
 
-// Hears a connection's opening and closing on the thread that opens or closes it, while the lists are locked: return at
-// once, and don't attach, detach or build services.
+/// Hears a connection's opening and closing on the thread that opens or closes it, while the lists are locked: return
+/// at once, and don't attach, detach or build services.
 class IConnectionNotifierListener
 {
 public:

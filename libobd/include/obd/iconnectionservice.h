@@ -12,22 +12,22 @@ namespace obd {
 class IAdapter;
 class IConnectionOptions;
 
-// The state of the connection for the application. Opens and closes nothing itself: that is IConnectionManager's.
+/// The state of the connection for the application. Opens and closes nothing itself: that is IConnectionManager's.
 class IConnectionService : public virtual tervex::INotifier<IConnectionServiceObserver>
 {
 public:
     virtual bool isConnected() const = 0;
-    // The OBD standard that the current control module reports; empty if there is none.
+    /// The OBD standard that the current control module reports; empty if there is none.
     virtual std::string standardDescription() const = 0;
     virtual IConnectionOptions* connectionOptions() const = 0;
-    // Null without an adapter.
+    /// Null without an adapter.
     virtual std::shared_ptr<IAdapter> adapter() const = 0;
 };
 
 namespace ConnectionServiceBuilder {
 
-// The one connection service of the process while somebody holds it; a new one after the last holder let go. It belongs
-// to the top-level object that was the latest when it was made.
+/// The one connection service of the process while somebody holds it; a new one after the last holder let go. It
+/// belongs to the top-level object that was the latest when it was made.
 OBD_EXPORT std::shared_ptr<IConnectionService> createConnectionService();
 
 } // namespace ConnectionServiceBuilder

@@ -9,39 +9,39 @@
 
 namespace obd {
 
-// The scan tool driver as the message layer sees it. One thread at a time may talk through it.
+/// The scan tool driver as the message layer sees it. One thread at a time may talk through it.
 class IDevice : public IAdapter
 {
 public:
     enum class Status : int
     {
-        Ok = 0,         // the reply was obtained (and, for bytes, parsed)
-        NotSent = 1,    // device disabled or connection dead
-        NotEnabled = 2, // no usable reply, and no vehicle link stands
-        NoResponse = 3, // no usable reply on a standing link: timeout, or the adapter's error word
-        Unparsed = 4,   // a reply came, but no control module's payload could be made of it
+        Ok = 0,         ///< the reply was obtained (and, for bytes, parsed)
+        NotSent = 1,    ///< device disabled or connection dead
+        NotEnabled = 2, ///< no usable reply, and no vehicle link stands
+        NoResponse = 3, ///< no usable reply on a standing link: timeout, or the adapter's error word
+        Unparsed = 4,   ///< a reply came, but no control module's payload could be made of it
     };
 
-    // Identifies the adapter and puts it into the state that the driver relies on. Takes some seconds.
+    /// Identifies the adapter and puts it into the state that the driver relies on. Takes some seconds.
     virtual bool initialize() = 0;
 
-    // Sets the protocol up and proves that a control module answers; Automatic searches, which may take minutes.
+    /// Sets the protocol up and proves that a control module answers; Automatic searches, which may take minutes.
     virtual bool detectVehicle(VehicleProtocol protocol) = 0;
 
-    // Sends the adapter to sleep and gives the channel up.
+    /// Sends the adapter to sleep and gives the channel up.
     virtual void close() = 0;
 
-    // True while a vehicle link stands.
+    /// True while a vehicle link stands.
     virtual bool isEnabled() const = 0;
 
-    // The raw console: one command, one reply as the adapter wrote it, line ends removed.
+    /// The raw console: one command, one reply as the adapter wrote it, line ends removed.
     virtual Status execute(std::string const& command, std::string& response, unsigned int timeoutMs) = 0;
 
-    // One OBD request; the replies of all control modules are added to responses.
+    /// One OBD request; the replies of all control modules are added to responses.
     virtual Status execute(std::vector<unsigned char> const& payload, ResponseMap& responses,
                            unsigned int timeoutMs) = 0;
 
-    // Narrows what the adapter lets through to one CAN identifier. Not undone by the driver.
+    /// Narrows what the adapter lets through to one CAN identifier. Not undone by the driver.
     virtual bool activateEcu(unsigned int ecu) = 0;
 };
 

@@ -12,39 +12,39 @@
 
 namespace obd {
 
-// Readiness, test results and in-use counters of the current control module. Every operation but oxygenSensorLocations
-// asks the vehicle and blocks its caller meanwhile; call from any thread but the dispatcher's worker. Without a
-// connection or a control module lists are empty and booleans false, and so they are where the vehicle does not answer;
-// the log tells why. What the module does not support is not asked for.
+/// Readiness, test results and in-use counters of the current control module. Every operation but oxygenSensorLocations
+/// asks the vehicle and blocks its caller meanwhile; call from any thread but the dispatcher's worker. Without a
+/// connection or a control module lists are empty and booleans false, and so they are where the vehicle does not
+/// answer; the log tells why. What the module does not support is not asked for.
 class IDiagnosticsService
 {
 public:
     virtual ~IDiagnosticsService() = default;
 
-    // Every monitor that an engine of this ignition type can have, since the codes were cleared.
+    /// Every monitor that an engine of this ignition type can have, since the codes were cleared.
     virtual std::vector<std::shared_ptr<ReadinessMonitorDataModel>> fetchReadinessMonitors() = 0;
-    // The same in the present driving cycle. Empty also where the module does not tell it.
+    /// The same in the present driving cycle. Empty also where the module does not tell it.
     virtual std::vector<std::shared_ptr<ReadinessMonitorDataModel>> fetchReadinessMonitorsThisCycle() = 0;
 
-    // The results of service 06, in the unit system of the settings. Asks once for each monitor, which takes seconds; a
-    // monitor that does not answer is left out.
+    /// The results of service 06, in the unit system of the settings. Asks once for each monitor, which takes seconds;
+    /// a monitor that does not answer is left out.
     virtual std::vector<std::shared_ptr<DiagnosticMonitorDataModel>> fetchMonitorTests() = 0;
 
-    // In-use performance (service 09): the counters that the module keeps.
+    /// In-use performance (service 09): the counters that the module keeps.
     virtual std::vector<std::shared_ptr<PerformanceCounterDataModel>> fetchPerformanceCounters() = 0;
 
-    // The oxygen sensors that the module reports, as known since the connection was opened.
+    /// The oxygen sensors that the module reports, as known since the connection was opened.
     virtual std::vector<OxygenSensorLocation> oxygenSensorLocations() = 0;
-    // The results of service 05, which the buses before CAN have. Asks once for each test.
+    /// The results of service 05, which the buses before CAN have. Asks once for each test.
     virtual std::vector<std::shared_ptr<OxygenSensorMonitorDataModel>>
     fetchOxygenSensorTests(OxygenSensorLocation location) = 0;
-    // Whether the oxygen sensor monitor has run since the codes were cleared: before, its results mean nothing.
+    /// Whether the oxygen sensor monitor has run since the codes were cleared: before, its results mean nothing.
     virtual bool isOxygenSensorTestComplete() = 0;
 };
 
 namespace DiagnosticsServiceBuilder {
 
-// A new service on the top-level object that was built last; it must die before that object.
+/// A new service on the top-level object that was built last; it must die before that object.
 OBD_EXPORT std::shared_ptr<IDiagnosticsService> create();
 
 } // namespace DiagnosticsServiceBuilder

@@ -10,50 +10,50 @@
 
 namespace obd {
 
-// The value of PID 0x1C as the vehicle reported it, 0 while unknown.
+/// The value of PID 0x1C as the vehicle reported it, 0 while unknown.
 using ObdStandard = int;
 
-// What the library knows of one control module. Read from any thread once the connection stands; detection of freeze
-// frames goes to the bus and blocks.
+/// What the library knows of one control module. Read from any thread once the connection stands; detection of freeze
+/// frames goes to the bus and blocks.
 class IEcu
 {
 public:
     virtual ~IEcu() = default;
 
-    // The id by which the whole library knows the module; see ResponseMap.
+    /// The id by which the whole library knows the module; see ResponseMap.
     virtual unsigned int id() const = 0;
 
-    // Reads from the vehicle which PIDs the freeze frame holds, once for each frame. False if it did not answer.
+    /// Reads from the vehicle which PIDs the freeze frame holds, once for each frame. False if it did not answer.
     virtual bool detectFreezeFrameConfiguration(unsigned char frame) = 0;
-    // Forgets all freeze frames, to be read again.
+    /// Forgets all freeze frames, to be read again.
     virtual void resetFreezeFrameConfiguration() = 0;
 
-    // The identifiers that the module supports in a service, in the order of their arrival, the range markers 0x00,
-    // 0x20 and so on among them. Empty for a service or a frame that is not known. frame counts in service 2 only.
+    /// The identifiers that the module supports in a service, in the order of their arrival, the range markers 0x00,
+    /// 0x20 and so on among them. Empty for a service or a frame that is not known. frame counts in service 2 only.
     virtual std::vector<unsigned char> supportedIds(ObdMode mode, unsigned char frame) const = 0;
     virtual bool isSupported(OxygenSensorLocation location, unsigned char tid) const = 0;
     virtual bool isSupported(ObdMode mode, unsigned char id, unsigned char frame) const = 0;
-    // The service 05 tests of a sensor.
+    /// The service 05 tests of a sensor.
     virtual std::vector<unsigned char> supportedTids(OxygenSensorLocation location) const = 0;
 
     virtual ObdProtocol protocol() const = 0;
     virtual std::string protocolDescription() const = 0;
     virtual ObdStandard standard() const = 0;
     virtual std::string standardDescription() const = 0;
-    // Short name, such as "ECM", or "ECU#1" where the module tells none.
+    /// Short name, such as "ECM", or "ECU#1" where the module tells none.
     virtual std::string name() const = 0;
-    // Long name, or "Control Module 0x7E8".
+    /// Long name, or "Control Module 0x7E8".
     virtual std::string description() const = 0;
 
     virtual OxygenSensorBank oxygenSensorBanks() const = 0;
     virtual std::vector<OxygenSensorLocation> oxygenSensorLocations() const = 0;
 
-    // Upper ends of ranges that the module tells in PIDs 0x4F and 0x50, or the standard's defaults.
+    /// Upper ends of ranges that the module tells in PIDs 0x4F and 0x50, or the standard's defaults.
     virtual unsigned int equivalenceRatioMax() const = 0;
-    virtual unsigned int oxygenSensorVoltageMax() const = 0;            // V
-    virtual unsigned int oxygenSensorCurrentMax() const = 0;            // mA
-    virtual unsigned int intakeManifoldAbsolutePressureMax() const = 0; // kPa
-    virtual double airFlowRateMax() const = 0;                          // g/s
+    virtual unsigned int oxygenSensorVoltageMax() const = 0;            ///< V
+    virtual unsigned int oxygenSensorCurrentMax() const = 0;            ///< mA
+    virtual unsigned int intakeManifoldAbsolutePressureMax() const = 0; ///< kPa
+    virtual double airFlowRateMax() const = 0;                          ///< g/s
 
     virtual IgnitionType ignitionType() const = 0;
 };

@@ -9,22 +9,23 @@
 
 namespace obd {
 
-// What is known of the current control module, and what it tells of itself and the vehicle (service 09). The fetch
-// operations ask the vehicle and block their caller meanwhile; call from any thread but the dispatcher's worker. The
-// others read what was learnt when the connection was opened. Without a connection or a control module texts and lists
-// are empty and booleans false, and so are those that are fetched where the vehicle does not answer; the log tells why.
+/// What is known of the current control module, and what it tells of itself and the vehicle (service 09). The fetch
+/// operations ask the vehicle and block their caller meanwhile; call from any thread but the dispatcher's worker. The
+/// others read what was learnt when the connection was opened. Without a connection or a control module texts and lists
+/// are empty and booleans false, and so are those that are fetched where the vehicle does not answer; the log tells
+/// why.
 class IEcuService
 {
 public:
     virtual ~IEcuService() = default;
 
-    // All that the library can show, whether the module supports it or not, in the names, units and ranges of the
-    // module and the unit system of the settings; without readings.
+    /// All that the library can show, whether the module supports it or not, in the names, units and ranges of the
+    /// module and the unit system of the settings; without readings.
     virtual std::vector<std::shared_ptr<ParameterDataModel>> supportedParameters() = 0;
-    // Whether the module reports the parameter. The library's own parameters are no PIDs, so it is no judge of them.
+    /// Whether the module reports the parameter. The library's own parameters are no PIDs, so it is no judge of them.
     virtual bool isParameterSupported(std::shared_ptr<ParameterDataModel> const& parameter) = 0;
 
-    // The OBD standard that the module reports to meet, such as "EOBD".
+    /// The OBD standard that the module reports to meet, such as "EOBD".
     virtual std::string standardDescription() = 0;
     virtual std::string protocolDescription() = 0;
     virtual std::string ecuName() = 0;        // such as "ECM"
@@ -32,21 +33,21 @@ public:
 
     virtual bool hasVehicleIdentificationNumber() = 0;
     virtual std::string fetchVehicleIdentificationNumber() = 0;
-    // Names of the software and calibrations, and their checksums in the same order.
+    /// Names of the software and calibrations, and their checksums in the same order.
     virtual bool hasCalibrationIds() = 0;
     virtual std::vector<std::string> fetchCalibrationIds() = 0;
     virtual bool hasVerificationNumbers() = 0;
     virtual std::vector<std::string> fetchVerificationNumbers() = 0;
     virtual bool hasEngineSerialNumber() = 0;
     virtual std::string fetchEngineSerialNumber() = 0;
-    // The exhaust regulation or type approval number.
+    /// The exhaust regulation or type approval number.
     virtual bool hasErotan() = 0;
     virtual std::string fetchErotan() = 0;
 };
 
 namespace EcuServiceBuilder {
 
-// A new service on the top-level object that was built last; it must die before that object.
+/// A new service on the top-level object that was built last; it must die before that object.
 OBD_EXPORT std::shared_ptr<IEcuService> createEcuService();
 
 } // namespace EcuServiceBuilder

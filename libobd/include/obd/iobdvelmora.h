@@ -10,15 +10,15 @@ class IConnectionNotifier;
 class IEcuManager;
 class IVelmoraSettings;
 
-// Start here: the top-level object, which owns the connection and all that hangs on it. Pointers that it hands out are
-// borrowed and live as long as it does. It must outlive every service that was built while it was the latest one;
-// destroying it closes the connection.
+/// Start here: the top-level object, which owns the connection and all that hangs on it. Pointers that it hands out are
+/// borrowed and live as long as it does. It must outlive every service that was built while it was the latest one;
+/// destroying it closes the connection.
 class IObdVelmora
 {
 public:
     virtual ~IObdVelmora() = default;
 
-    // The three values that the object was built with; the application's own.
+    /// The three values that the object was built with; the application's own.
     virtual unsigned int getHostValue1() const = 0;
     virtual unsigned int getHostValue2() const = 0;
     virtual unsigned int getHostValue3() const = 0;

@@ -8,25 +8,25 @@
 
 namespace obd {
 
-// The on-board test routines of the current control module (service 08).
+/// The on-board test routines of the current control module (service 08).
 class IRoutineService
 {
 public:
     virtual ~IRoutineService() = default;
 
-    // The routines that both the module and the library know. Asks the vehicle nothing. Empty without a connection or a
-    // control module.
+    /// The routines that both the module and the library know. Asks the vehicle nothing. Empty without a connection or
+    /// a control module.
     virtual std::vector<std::shared_ptr<TestRoutineDataModel>> getRoutines() = 0;
 
-    // Starts a routine, any at all, and tells what the vehicle said. The routine acts on the vehicle: the standing
-    // engine may start to burn off a filter. Asks nothing back. Blocks; call from any thread but the dispatcher's
-    // worker. Null without a connection or a control module only.
+    /// Starts a routine, any at all, and tells what the vehicle said. The routine acts on the vehicle: the standing
+    /// engine may start to burn off a filter. Asks nothing back. Blocks; call from any thread but the dispatcher's
+    /// worker. Null without a connection or a control module only.
     virtual std::shared_ptr<TestRoutineDataModel> runRoutine(unsigned char id) = 0;
 };
 
 namespace RoutineServiceBuilder {
 
-// A new service on the top-level object that was built last; it must die before that object.
+/// A new service on the top-level object that was built last; it must die before that object.
 OBD_EXPORT std::shared_ptr<IRoutineService> createRoutineService();
 
 } // namespace RoutineServiceBuilder

@@ -14,47 +14,47 @@ class ParameterDescriptor;
 struct ParameterDataModel;
 struct SensorDataModel;
 
-// Live values of the current control module, and of what is worked out from them: fuel consumption, boost, power,
-// torque, battery voltage. attach, detach, updateOnce, startUpdates and reset belong to the application's thread, the
-// one that dispatches; the others may be called from any thread.
+/// Live values of the current control module, and of what is worked out from them: fuel consumption, boost, power,
+/// torque, battery voltage. attach, detach, updateOnce, startUpdates and reset belong to the application's thread, the
+/// one that dispatches; the others may be called from any thread.
 class ISensorService : public virtual tervex::INotifier<ISensorServiceObserver>
 {
 public:
     virtual bool isConnected() const = 0;
 
-    // What can be read, in rising order of identifiers. Empty without a connection.
+    /// What can be read, in rising order of identifiers. Empty without a connection.
     virtual std::vector<std::shared_ptr<ParameterDescriptor>> getDescriptors() = 0;
 
-    // Requests each parameter once; the readings come to the observers. Turns a running cycle into a last pass.
+    /// Requests each parameter once; the readings come to the observers. Turns a running cycle into a last pass.
     virtual void updateOnce(std::vector<ParameterIdentifier::Id> const& ids) = 0;
 
-    // Requests the parameters over and over, in turn, as fast as the bus and a floor of 30 ms a request allow, until
-    // reset or a change that invalidates. Identifiers that the module does not offer are passed over; parameters that
-    // are running already go on. A request that fails is tried again at its next turn, without a word to the observers;
-    // on a dead link that means as fast as it fails, so reset or close then.
+    /// Requests the parameters over and over, in turn, as fast as the bus and a floor of 30 ms a request allow, until
+    /// reset or a change that invalidates. Identifiers that the module does not offer are passed over; parameters that
+    /// are running already go on. A request that fails is tried again at its next turn, without a word to the
+    /// observers; on a dead link that means as fast as it fails, so reset or close then.
     virtual void startUpdates(std::vector<ParameterIdentifier::Id> const& ids) = 0;
 
-    // Ends all updates and forgets the statistics. To select fewer parameters: reset, then startUpdates.
+    /// Ends all updates and forgets the statistics. To select fewer parameters: reset, then startUpdates.
     virtual void reset() = 0;
 
-    // The PIDs that the current module reports, without those that are no sensors. Empty without a module.
+    /// The PIDs that the current module reports, without those that are no sensors. Empty without a module.
     virtual std::vector<ParameterIdentifier::Id> getSupportedIds() = 0;
 
-    // Describes a parameter without a request on the bus. Null without a module or for an identifier that has no
-    // parameter.
+    /// Describes a parameter without a request on the bus. Null without a module or for an identifier that has no
+    /// parameter.
     virtual std::shared_ptr<ParameterDataModel> getParameter(ParameterIdentifier::Id id) = 0;
 
-    // Reads a parameter once and waits for it, for its time-out at the most. Empty if that fails. A sensor that the
-    // reply did not tell of comes without a value. Any thread but the dispatcher's worker.
+    /// Reads a parameter once and waits for it, for its time-out at the most. Empty if that fails. A sensor that the
+    /// reply did not tell of comes without a value. Any thread but the dispatcher's worker.
     virtual std::vector<std::shared_ptr<SensorDataModel>> fetchSensors(ParameterIdentifier::Id id) = 0;
 
-    // Whether the current module reports the PID.
+    /// Whether the current module reports the PID.
     virtual bool isSupported(ParameterIdentifier::Id id) = 0;
 };
 
 namespace SensorServiceBuilder {
 
-// A new service at every call, on the latest top-level object, which must outlive it.
+/// A new service at every call, on the latest top-level object, which must outlive it.
 OBD_EXPORT std::shared_ptr<ISensorService> createSensorService();
 
 } // namespace SensorServiceBuilder

@@ -11,10 +11,10 @@
 
 namespace obd {
 
-// Trouble codes, malfunction indicator and freeze frames of the current control module. Every operation asks the
-// vehicle once, or a few times, and blocks its caller meanwhile; call from any thread but the dispatcher's worker.
-// Without a connection or a control module, and where the vehicle does not answer or refuses, lists are empty, pointers
-// null and booleans false; the log tells why.
+/// Trouble codes, malfunction indicator and freeze frames of the current control module. Every operation asks the
+/// vehicle once, or a few times, and blocks its caller meanwhile; call from any thread but the dispatcher's worker.
+/// Without a connection or a control module, and where the vehicle does not answer or refuses, lists are empty,
+/// pointers null and booleans false; the log tells why.
 class ITroubleCodeService
 {
 public:
@@ -26,38 +26,38 @@ public:
 
     virtual ~ITroubleCodeService() = default;
 
-    // The codes in the order of the reply, each with all meanings that the catalogue knows.
+    /// The codes in the order of the reply, each with all meanings that the catalogue knows.
     virtual std::vector<std::shared_ptr<DtcDataModel>> fetchConfirmedCodes() = 0;
     virtual std::vector<std::shared_ptr<DtcDataModel>> fetchPendingCodes() = 0;
     virtual std::vector<std::shared_ptr<DtcDataModel>> fetchPermanentCodes() = 0;
 
-    // The malfunction indicator lamp.
+    /// The malfunction indicator lamp.
     virtual std::shared_ptr<MilStatus> fetchMilStatus() = 0;
 
-    // The distance, and the engine's run time, since the lamp came on or else since the codes were cleared. Null also
-    // where the module does not offer it.
+    /// The distance, and the engine's run time, since the lamp came on or else since the codes were cleared. Null also
+    /// where the module does not offer it.
     virtual std::shared_ptr<SensorDataModel> fetchDistance(bool sinceMil) = 0;
     virtual std::shared_ptr<SensorDataModel> fetchRuntime(bool sinceMil) = 0;
 
-    // The code that caused the freeze frame. Null also for a frame that holds none.
+    /// The code that caused the freeze frame. Null also for a frame that holds none.
     virtual std::shared_ptr<DtcDataModel> fetchFreezeFrameTroubleCode(unsigned char frame) = 0;
-    // What the frame holds beside its code. Asks the vehicle only the first time for each frame.
+    /// What the frame holds beside its code. Asks the vehicle only the first time for each frame.
     virtual std::vector<ParameterIdentifier::Id> fetchFreezeFramePids(unsigned char frame) = 0;
-    // The sensors of one parameter of the frame, with full names, such as "Fuel system status: Fuel system A".
+    /// The sensors of one parameter of the frame, with full names, such as "Fuel system status: Fuel system A".
     virtual std::vector<std::shared_ptr<SensorDataModel>> fetchFreezeFrameSensors(unsigned char frame,
                                                                                   ParameterIdentifier::Id id) = 0;
-    // The same as one parameter, whose sensors bear their own names only. A sensor without a reading has no value.
+    /// The same as one parameter, whose sensors bear their own names only. A sensor without a reading has no value.
     virtual std::shared_ptr<ParameterDataModel> fetchFreezeFrameParameter(unsigned char frame,
                                                                           ParameterIdentifier::Id id) = 0;
 
-    // Clears the codes of all control modules, and with them freeze frames, readiness and test results. Asks nothing
-    // back. True if the current control module has done so.
+    /// Clears the codes of all control modules, and with them freeze frames, readiness and test results. Asks nothing
+    /// back. True if the current control module has done so.
     virtual bool resetCodes() const = 0;
 };
 
 namespace TroubleCodeServiceBuilder {
 
-// A new service on the top-level object that was built last; it must die before that object.
+/// A new service on the top-level object that was built last; it must die before that object.
 OBD_EXPORT std::shared_ptr<ITroubleCodeService> createTroubleCodeService();
 
 } // namespace TroubleCodeServiceBuilder

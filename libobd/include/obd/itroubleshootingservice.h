@@ -9,19 +9,19 @@
 
 namespace obd {
 
-// The raw view on the adapter: a console and a log of the traffic. Attach observers while logging is off. An entry may
-// still be under way on another thread when stopLogging returns, so detach without a connection only, or let go of the
-// service, whose end waits for it.
+/// The raw view on the adapter: a console and a log of the traffic. Attach observers while logging is off. An entry may
+/// still be under way on another thread when stopLogging returns, so detach without a connection only, or let go of the
+/// service, whose end waits for it.
 class ITroubleshootingService : public virtual tervex::INotifier<ITroubleshootingServiceObserver>
 {
 public:
-    // Sends a command word for word and gives what the adapter says, line ends removed. Waits up to timeout
-    // milliseconds and 50 more, the time in the dispatcher's queue included; a negative one counts as none. Empty, with
-    // a log line, without a connection or an answer. Blocks; call from any thread but the dispatcher's worker. A
-    // command that changes the adapter's settings may break the connection.
+    /// Sends a command word for word and gives what the adapter says, line ends removed. Waits up to timeout
+    /// milliseconds and 50 more, the time in the dispatcher's queue included; a negative one counts as none. Empty,
+    /// with a log line, without a connection or an answer. Blocks; call from any thread but the dispatcher's worker. A
+    /// command that changes the adapter's settings may break the connection.
     virtual std::string query(std::string const& request, int timeout) = 0;
 
-    // Logging is off at the start, and stays as it is across connections. Any thread.
+    /// Logging is off at the start, and stays as it is across connections. Any thread.
     virtual void startLogging() = 0;
     virtual bool isLogging() = 0;
     virtual void stopLogging() = 0;
@@ -29,7 +29,7 @@ public:
 
 namespace TroubleshootingServiceBuilder {
 
-// A new service on the top-level object that was built last; it must die before that object.
+/// A new service on the top-level object that was built last; it must die before that object.
 OBD_EXPORT std::shared_ptr<ITroubleshootingService> createTroubleshootingService();
 
 } // namespace TroubleshootingServiceBuilder

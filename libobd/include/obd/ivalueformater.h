@@ -4,7 +4,7 @@
 
 namespace obd {
 
-// How a number becomes text.
+/// How a number becomes text.
 class IValueFormater
 {
 public:

@@ -6,11 +6,12 @@
 
 namespace obd {
 
-// Opens the library: starts the log in the file logPath (truncated; no log if empty or if it can't be opened) and loads
-// the trouble code texts. Always true: neither step can keep the library from working. Log lines before it are lost.
+/// Opens the library: starts the log in the file logPath (truncated; no log if empty or if it can't be opened) and
+/// loads the trouble code texts. Always true: neither step can keep the library from working. Log lines before it are
+/// lost.
 OBD_EXPORT bool LIBOBDOpen(std::string const& logPath);
 
-// Releases the trouble code texts and ends the log. Call it last, after every object of the library is gone.
+/// Releases the trouble code texts and ends the log. Call it last, after every object of the library is gone.
 OBD_EXPORT void LIBOBDClose();
 
 } // namespace obd

@@ -6,14 +6,14 @@
 
 namespace obd {
 
-// The vehicle makers that the trouble code catalogue tells apart. The library does not know of what make the vehicle
-// is; it hands out the meanings of all of them.
+/// The vehicle makers that the trouble code catalogue tells apart. The library does not know of what make the vehicle
+/// is; it hands out the meanings of all of them.
 class OBD_EXPORT Manufacturer
 {
 public:
     enum AutoManufacturer : int
     {
-        Generic = 0, // the codes of SAE J2012 that mean the same on every vehicle
+        Generic = 0, ///< the codes of SAE J2012 that mean the same on every vehicle
         Acura = 1,
         AlfaRomeo = 2,
         Audi = 3,
@@ -60,7 +60,8 @@ public:
         Volvo = 44,
     };
 
-    // The name as trouble codes carry it, such as "Alfa Romeo". Throws std::out_of_range for a number that is no maker.
+    /// The name as trouble codes carry it, such as "Alfa Romeo". Throws std::out_of_range for a number that is no
+    /// maker.
     static std::string manufacturerToString(AutoManufacturer maker);
 };
 

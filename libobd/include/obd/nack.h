@@ -6,7 +6,7 @@
 
 namespace obd {
 
-// Response codes of a negative reply, 7F service code (ISO 14229-1, ISO 14230-3).
+/// Response codes of a negative reply, 7F service code (ISO 14229-1, ISO 14230-3).
 enum Nack : int
 {
     NackAcknowledged = 0x00,
@@ -18,10 +18,10 @@ enum Nack : int
     NackResponsePending = 0x78,
 };
 
-// The code's text, such as "Subfunction not supported"; "Unknown" for a code without a name here.
+/// The code's text, such as "Subfunction not supported"; "Unknown" for a code without a name here.
 OBD_EXPORT std::string NackToString(Nack nack);
 
-// An identifier as it is written in SAE J1979, such as "$0C".
+/// An identifier as it is written in SAE J1979, such as "$0C".
 OBD_EXPORT std::string OidToString(unsigned char oid);
 
 } // namespace obd

@@ -1,6 +1,6 @@
 #pragma once
 
-// The whole public face in one include, for applications that would rather not choose.
+/// The whole public face in one include, for applications that would rather not choose.
 
 #include <obd/bluetoothdescriptor.h>
 #include <obd/connectionoptionsevent.h>

@@ -2,7 +2,7 @@
 
 namespace obd {
 
-// OBD services by their number (SAE J1979).
+/// OBD services by their number (SAE J1979).
 enum class ObdMode : int
 {
     CurrentData = 1,

@@ -11,8 +11,8 @@ class ISettings;
 
 namespace ObdVelmoraBuilder {
 
-// A new top-level object on the application's settings. The three values are handed back by getHostValue1 to 3 and not
-// looked at. Services built later belong to the object built last. One thread at a time.
+/// A new top-level object on the application's settings. The three values are handed back by getHostValue1 to 3 and not
+/// looked at. Services built later belong to the object built last. One thread at a time.
 OBD_EXPORT std::shared_ptr<IObdVelmora> createObdVelmora(unsigned int hostValue1, unsigned int hostValue2,
                                                          unsigned int hostValue3,
                                                          std::shared_ptr<ISettings> const& settings);

@@ -4,7 +4,7 @@
 
 namespace obd {
 
-// The arrangement of the oxygen sensors: that of PID 0x13 (two banks of four) or PID 0x1D (four banks of two).
+/// The arrangement of the oxygen sensors: that of PID 0x13 (two banks of four) or PID 0x1D (four banks of two).
 enum class OxygenSensorBank : int
 {
     None = 0,
@@ -12,7 +12,7 @@ enum class OxygenSensorBank : int
     Pid1D = 2
 };
 
-// An oxygen sensor by bank and position.
+/// An oxygen sensor by bank and position.
 enum class OxygenSensorLocation : int
 {
     Bank1Sensor1 = 0,
@@ -29,8 +29,8 @@ enum class OxygenSensorLocation : int
     Bank4Sensor2 = 11,
 };
 
-// The byte that names the sensor in a service 05 request (SAE J1979), 0 for a value outside the enumeration. Sensors of
-// the two arrangements share bytes: an ECU uses one arrangement or the other.
+/// The byte that names the sensor in a service 05 request (SAE J1979), 0 for a value outside the enumeration. Sensors
+/// of the two arrangements share bytes: an ECU uses one arrangement or the other.
 OBD_EXPORT unsigned char oxygenSensorByte(OxygenSensorLocation location);
 
 } // namespace obd

@@ -6,16 +6,16 @@
 
 namespace obd {
 
-// A test result of an oxygen sensor for the application, ready for display; a copy that keeps nothing of the library
-// alive.
+/// A test result of an oxygen sensor for the application, ready for display; a copy that keeps nothing of the library
+/// alive.
 struct OxygenSensorMonitorDataModel
 {
-    int tid{0};              // test identifier of service 05
+    int tid{0};              ///< test identifier of service 05
     std::string description; // such as "Rich to lean sensor switch time (calculated)"
     std::string value;
     std::string minimum;
     std::string maximum;
-    int status{0}; // 0: within the limits, 1: outside
+    int status{0}; ///< 0: within the limits, 1: outside
     MeasurementUnit unit{UnitNone};
 };
 

@@ -9,7 +9,7 @@
 
 namespace obd {
 
-// A parameter with its sensors for the application; a copy that keeps nothing of the library alive.
+/// A parameter with its sensors for the application; a copy that keeps nothing of the library alive.
 struct ParameterDataModel
 {
     ParameterDataModel(ParameterIdentifier::Id parameterId, std::string const& parameterName,

@@ -14,17 +14,17 @@ namespace obd {
 class IEcu;
 class PowertrainParameter;
 
-// A parameter as one control module offers it, in one unit system. A cheap handle, made on demand; keeps parameter and
-// control module alive. Looks at names, units and ranges only, never at readings.
+/// A parameter as one control module offers it, in one unit system. A cheap handle, made on demand; keeps parameter and
+/// control module alive. Looks at names, units and ranges only, never at readings.
 class OBD_EXPORT ParameterDescriptor
 {
 public:
-    // Neither pointer may be null.
+    /// Neither pointer may be null.
     ParameterDescriptor(std::shared_ptr<PowertrainParameter> parameter, std::shared_ptr<IEcu> ecu, UnitSystem system);
 
     ParameterIdentifier::Id pid() const;
     std::string description() const;
-    // One for each sensor of the parameter, in its order.
+    /// One for each sensor of the parameter, in its order.
     std::vector<std::shared_ptr<SensorDescriptor>> sensors() const;
     bool hasNumericSensors() const;
 

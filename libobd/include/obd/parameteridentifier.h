@@ -6,8 +6,8 @@
 
 namespace obd {
 
-// What a parameter is known by: the PID of services 01 and 02 for a parameter of the standard (ParameterIdentifier::Id
-// (0x0C) is the engine speed), and above their range the library's own derived parameters.
+/// What a parameter is known by: the PID of services 01 and 02 for a parameter of the standard (ParameterIdentifier::Id
+/// (0x0C) is the engine speed), and above their range the library's own derived parameters.
 class OBD_EXPORT ParameterIdentifier
 {
 public:
@@ -24,16 +24,16 @@ public:
     explicit ParameterIdentifier(Id id) : m_id(id) {}
 
     Id id() const { return m_id; }
-    // The byte that stands in a request.
+    /// The byte that stands in a request.
     unsigned char toOid() const { return static_cast<unsigned char>(m_id & 0xFF); }
-    // "$" and at least two upper-case hexadecimal digits, such as "$0C".
+    /// "$" and at least two upper-case hexadecimal digits, such as "$0C".
     std::string toString() const;
 
 private:
     Id m_id;
 };
 
-// A sensor's uid is ten times the id of its parameter plus its index within it, 0 to 9.
+/// A sensor's uid is ten times the id of its parameter plus its index within it, 0 to 9.
 constexpr int Pid2Uid(int pid)
 {
     return pid * 10;

@@ -4,7 +4,7 @@
 
 namespace obd {
 
-// A counter of in-use monitor performance for the application; a copy that keeps nothing of the library alive.
+/// A counter of in-use monitor performance for the application; a copy that keeps nothing of the library alive.
 class PerformanceCounterDataModel
 {
 public:
@@ -13,7 +13,7 @@ public:
     {}
 
     std::string description; // such as "Ignition Cycle Counter"
-    std::string value;       // decimal digits, without separators in any locale
+    std::string value;       ///< decimal digits, without separators in any locale
 
 private:
     static std::string buildValue(unsigned int number) { return std::to_string(number); }

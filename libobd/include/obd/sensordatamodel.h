@@ -8,10 +8,10 @@
 
 namespace obd {
 
-// A sensor for the application; a copy that keeps nothing of the library alive.
+/// A sensor for the application; a copy that keeps nothing of the library alive.
 struct SensorDataModel
 {
-    // The range to draw a reading in: rounded, and never narrower than that of the sensor.
+    /// The range to draw a reading in: rounded, and never narrower than that of the sensor.
     struct Numeric
     {
         int minimum{0};
@@ -29,12 +29,12 @@ struct SensorDataModel
           value(reading)
     {}
 
-    bool selectable; // false if the user may not choose the sensor
+    bool selectable; ///< false if the user may not choose the sensor
     int uid;
     std::string name;
     MeasurementUnit unit;
-    std::shared_ptr<Numeric> numeric;            // null for a textual sensor
-    std::shared_ptr<SensorValueDataModel> value; // null if none was taken
+    std::shared_ptr<Numeric> numeric;            ///< null for a textual sensor
+    std::shared_ptr<SensorValueDataModel> value; ///< null if none was taken
 };
 
 } // namespace obd

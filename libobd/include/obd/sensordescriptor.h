@@ -8,11 +8,11 @@
 
 namespace obd {
 
-// A sensor seen in one unit system. A cheap handle, made on demand; keeps the info alive.
+/// A sensor seen in one unit system. A cheap handle, made on demand; keeps the info alive.
 class OBD_EXPORT SensorDescriptor
 {
 public:
-    // info must not be null.
+    /// info must not be null.
     SensorDescriptor(std::shared_ptr<SensorInfo const> info, UnitSystem system);
 
     std::string description() const { return m_info->description(); }

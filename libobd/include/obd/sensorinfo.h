@@ -10,25 +10,25 @@
 
 namespace obd {
 
-// What a sensor of a parameter can deliver: its identity, name, and unit and range in each unit system. Does not change
-// once its parameter is built, and may then be read from any thread.
+/// What a sensor of a parameter can deliver: its identity, name, and unit and range in each unit system. Does not
+/// change once its parameter is built, and may then be read from any thread.
 class OBD_EXPORT SensorInfo
 {
 public:
     SensorInfo(int uid, std::string const& description, bool numeric);
     virtual ~SensorInfo() = default;
 
-    // Says unit and range in one unit system, replacing what was said before. The range is for display: readings may
-    // leave it.
+    /// Says unit and range in one unit system, replacing what was said before. The range is for display: readings may
+    /// leave it.
     void add(UnitSystem system, MeasurementUnit unit, double minimum, double maximum);
 
     int uid() const { return m_uid; }
     ParameterIdentifier::Id pid() const { return Uid2Pid(m_uid); }
     std::string description() const { return m_description; }
-    // False if the readings are texts.
+    /// False if the readings are texts.
     bool isNumeric() const { return m_numeric; }
 
-    // UnitNone, and 0.0 to 0.0, in a unit system of which nothing was said.
+    /// UnitNone, and 0.0 to 0.0, in a unit system of which nothing was said.
     MeasurementUnit unit(UnitSystem system) const;
     double minValue(UnitSystem system) const;
     double maxValue(UnitSystem system) const;

@@ -9,36 +9,36 @@
 
 namespace obd {
 
-// One reading of one sensor. Immutable, so any thread may read it.
+/// One reading of one sensor. Immutable, so any thread may read it.
 class OBD_EXPORT SensorValue
 {
 public:
     explicit SensorValue(int uid) : m_uid(uid) {}
     virtual ~SensorValue() = default;
 
-    // The uid of the sensor, as in its SensorInfo.
+    /// The uid of the sensor, as in its SensorInfo.
     int uid() const { return m_uid; }
-    // The reading as a user sees it, without its unit.
+    /// The reading as a user sees it, without its unit.
     virtual std::string textualValue() = 0;
 
 private:
     int m_uid;
 };
 
-// A reading that is a number, in the unit system in which it was asked for.
+/// A reading that is a number, in the unit system in which it was asked for.
 class OBD_EXPORT NumericSensorValue : public SensorValue
 {
 public:
     using SensorValue::SensorValue;
 
-    // The number as stored, not rounded.
+    /// The number as stored, not rounded.
     virtual double numericValue() const = 0;
-    // Any other number of the same sensor, such as a mean, with the decimals of this one.
+    /// Any other number of the same sensor, such as a mean, with the decimals of this one.
     virtual std::string toString(double value) const = 0;
 };
 
-// T is int, unsigned int or double. Whole numbers are shown by their digits alone; the decimals then serve toString()
-// only.
+/// T is int, unsigned int or double. Whole numbers are shown by their digits alone; the decimals then serve toString()
+/// only.
 template <typename T>
 class ConcreateNumericSensorValue : public NumericSensorValue
 {
@@ -60,7 +60,7 @@ extern template class OBD_EXPORT ConcreateNumericSensorValue<int>;
 extern template class OBD_EXPORT ConcreateNumericSensorValue<unsigned int>;
 extern template class OBD_EXPORT ConcreateNumericSensorValue<double>;
 
-// A reading that is a text.
+/// A reading that is a text.
 class OBD_EXPORT TextualSensorValue : public SensorValue
 {
 public:

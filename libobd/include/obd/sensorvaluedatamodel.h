@@ -4,7 +4,7 @@
 
 namespace obd {
 
-// A reading with its statistics as texts, for the application; a copy that keeps nothing alive.
+/// A reading with its statistics as texts, for the application; a copy that keeps nothing alive.
 struct SensorValueDataModel
 {
     SensorValueDataModel(int sensorUid, std::string const& currentText, std::string const& minimumText,
@@ -12,7 +12,7 @@ struct SensorValueDataModel
         : uid(sensorUid), value(currentText), minimum(minimumText), maximum(maximumText), mean(meanText)
     {}
 
-    // For a textual sensor, which has no statistics.
+    /// For a textual sensor, which has no statistics.
     SensorValueDataModel(int sensorUid, std::string const& currentText) : uid(sensorUid), value(currentText) {}
 
     int uid;

@@ -6,7 +6,7 @@
 
 namespace obd {
 
-// How to reach an adapter over TCP.
+/// How to reach an adapter over TCP.
 class TcpDescriptor
 {
 public:

@@ -2,7 +2,7 @@
 
 namespace obd {
 
-// Which setting was set. Fired also when the value is the same as before.
+/// Which setting was set. Fired also when the value is the same as before.
 enum class VelmoraSettingsEvent : int
 {
     UnitSystemChanged = 0,

@@ -4,7 +4,7 @@
 
 namespace tervex {
 
-// One call that a Notifier makes on each of its observers.
+/// One call that a Notifier makes on each of its observers.
 template <typename T>
 class AbstractEvent
 {
@@ -14,12 +14,12 @@ public:
     virtual void operator()(Observer<T>* observer) const = 0;
 };
 
-// Stands for an argument position that is not in use.
+/// Stands for an argument position that is not in use.
 class DefaultArgument
 {};
 
-// A member function of T with its arguments. Arguments of reference type are held as references: an event is built on
-// the stack, dispatched at once and never stored.
+/// A member function of T with its arguments. Arguments of reference type are held as references: an event is built on
+/// the stack, dispatched at once and never stored.
 template <typename T, typename F, typename A1 = DefaultArgument, typename A2 = DefaultArgument,
           typename A3 = DefaultArgument, typename A4 = DefaultArgument, typename A5 = DefaultArgument>
 class Event : public AbstractEvent<T>

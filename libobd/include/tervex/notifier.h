@@ -9,7 +9,7 @@
 
 namespace tervex {
 
-// The observer list behind an INotifier, a base class only. No lock at all: its owner decides which thread touches it.
+/// The observer list behind an INotifier, a base class only. No lock at all: its owner decides which thread touches it.
 template <typename T>
 class Notifier : public virtual INotifier<T>
 {
@@ -20,8 +20,8 @@ public:
 protected:
     Notifier() = default;
 
-    // Calls a member function of T on every observer: notify(&T::onSomething, arguments...). Arguments are passed on as
-    // the function declares them, references as references.
+    /// Calls a member function of T on every observer: notify(&T::onSomething, arguments...). Arguments are passed on
+    /// as the function declares them, references as references.
     template <typename... Declared, typename... Given>
     void notify(void (T::*function)(Declared...), Given&&... arguments)
     {
@@ -29,8 +29,8 @@ protected:
     }
 
 private:
-    // The list may change during the walk, so its size is read afresh at each step. An observer's exception passes to
-    // the caller.
+    /// The list may change during the walk, so its size is read afresh at each step. An observer's exception passes to
+    /// the caller.
     void dispatch(AbstractEvent<T> const& event)
     {
         for (std::size_t i = 0; i < m_observers.size(); ++i) {
@@ -38,7 +38,7 @@ private:
         }
     }
 
-    std::vector<Observer<T>*> m_observers; // not owned
+    std::vector<Observer<T>*> m_observers; ///< not owned
 };
 
 } // namespace tervex

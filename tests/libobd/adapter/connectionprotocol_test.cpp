@@ -1,5 +1,6 @@
-#include <gtest/gtest.h>
 #include <obd/connectionprotocol.h>
+
+#include <gtest/gtest.h>
 
 namespace {
 

@@ -1,9 +1,10 @@
-#include <gmock/gmock.h>
-#include <gtest/gtest.h>
+#include "tests/support/bytes.h"
+
 #include <obd/databridge.h>
 #include <obd/iconnectionlogger.h>
 
-#include "tests/support/bytes.h"
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
 
 #include <algorithm>
 #include <atomic>

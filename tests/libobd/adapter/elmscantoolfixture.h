@@ -1,12 +1,11 @@
 #pragma once
 
 #include "libobd/adapter/elmscantool.h"
+#include "tests/support/elmdialogue.h"
+#include "tests/support/logcapture.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
-
-#include "tests/support/elmdialogue.h"
-#include "tests/support/logcapture.h"
 
 // A driver on a scripted adapter.
 class ElmScantoolFixture : public testing::Test

@@ -1,10 +1,9 @@
 #include "libobd/adapter/elmtransport.h"
+#include "tests/support/logcapture.h"
+#include "tests/support/scriptedchannel.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
-
-#include "tests/support/logcapture.h"
-#include "tests/support/scriptedchannel.h"
 
 namespace {
 

@@ -1,8 +1,7 @@
 #include "libobd/adapter/proxyerror.h"
+#include "tests/support/bytes.h"
 
 #include <gtest/gtest.h>
-
-#include "tests/support/bytes.h"
 
 namespace {
 

@@ -1,5 +1,4 @@
 #include "libobd/bytes/checkedbytes.h"
-
 #include "tests/support/hexbytes.h"
 
 #include <gtest/gtest.h>

@@ -1,5 +1,4 @@
 #include "libobd/bytes/hextext.h"
-
 #include "tests/support/hexbytes.h"
 
 #include <gtest/gtest.h>

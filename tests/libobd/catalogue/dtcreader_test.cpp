@@ -1,5 +1,4 @@
 #include "libobd/catalogue/dtcreader.h"
-
 #include "tests/support/dtcrows.h"
 #include "tests/support/logcapture.h"
 

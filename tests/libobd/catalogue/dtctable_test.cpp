@@ -1,5 +1,4 @@
 #include "libobd/catalogue/dtctable.h"
-
 #include "tools/catalogue/makers.h"
 
 #include <obd/manufacturer.h>

@@ -1,5 +1,6 @@
-#include <gtest/gtest.h>
 #include <obd/manufacturer.h>
+
+#include <gtest/gtest.h>
 
 #include <stdexcept>
 

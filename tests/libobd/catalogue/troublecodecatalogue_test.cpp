@@ -1,8 +1,9 @@
 #include <obd/library.h>
 #include <obd/troublecodecatalogue.h>
 
-#include <algorithm>
 #include <gtest/gtest.h>
+
+#include <algorithm>
 #include <set>
 
 namespace {

@@ -1,6 +1,6 @@
-#include <gtest/gtest.h>
-
 #include "libobd/connection/configuration.h"
+
+#include <gtest/gtest.h>
 
 namespace {
 

@@ -1,14 +1,15 @@
-#include <gmock/gmock.h>
-#include <gtest/gtest.h>
+#include "libobd/connection/connectionmanager.h"
+#include "tests/support/elmdialogue.h"
+#include "tests/support/fakeclock.h"
+#include "tests/support/logcapture.h"
+
 #include <obd/dispatcher.h>
 #include <obd/iconnectionlogger.h>
 #include <obd/iconnectionphaselistener.h>
 #include <obd/iobdproxy.h>
 
-#include "libobd/connection/connectionmanager.h"
-#include "tests/support/elmdialogue.h"
-#include "tests/support/fakeclock.h"
-#include "tests/support/logcapture.h"
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
 
 #include <functional>
 #include <stdexcept>

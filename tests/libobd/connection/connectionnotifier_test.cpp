@@ -1,8 +1,9 @@
-#include <gmock/gmock.h>
-#include <gtest/gtest.h>
+#include "libobd/connection/connectionnotifier.h"
+
 #include <obd/iconnectionnotifierlistener.h>
 
-#include "libobd/connection/connectionnotifier.h"
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
 
 #include <atomic>
 #include <functional>

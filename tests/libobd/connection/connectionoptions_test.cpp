@@ -1,7 +1,7 @@
-#include <gtest/gtest.h>
-
 #include "libobd/connection/connectionoptions.h"
 #include "tests/support/memorysettings.h"
+
+#include <gtest/gtest.h>
 
 #include <limits>
 

@@ -1,14 +1,15 @@
-#include <gmock/gmock.h>
-#include <gtest/gtest.h>
-#include <obd/parameterdescriptor.h>
-#include <obd/powertrainparameter.h>
-
 #include "libobd/connection/connectionnotifier.h"
 #include "libobd/connection/ecumanager.h"
 #include "libobd/connection/velmorasettings.h"
 #include "tests/support/fakeproxy.h"
 #include "tests/support/logcapture.h"
 #include "tests/support/memorysettings.h"
+
+#include <obd/parameterdescriptor.h>
+#include <obd/powertrainparameter.h>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
 
 #include <functional>
 #include <stdexcept>

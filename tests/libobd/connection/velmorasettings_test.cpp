@@ -1,9 +1,10 @@
-#include <gtest/gtest.h>
-#include <obd/iconnectionoptions.h>
-
 #include "libobd/connection/velmorasettings.h"
 #include "tests/support/logcapture.h"
 #include "tests/support/memorysettings.h"
+
+#include <obd/iconnectionoptions.h>
+
+#include <gtest/gtest.h>
 
 #include <limits>
 

@@ -1,7 +1,7 @@
-#include <gtest/gtest.h>
-
 #include "libobd/dispatch/callback.h"
 #include "tests/support/dispatcherrig.h"
+
+#include <gtest/gtest.h>
 
 namespace {
 

@@ -1,5 +1,3 @@
-#include <gtest/gtest.h>
-
 #include "libobd/dispatch/callback.h"
 #include "libobd/dispatch/fetcher.h"
 #include "libobd/dispatch/query.h"
@@ -7,6 +5,8 @@
 #include "tests/support/fakequery.h"
 #include "tests/support/fakework.h"
 #include "tests/support/logcapture.h"
+
+#include <gtest/gtest.h>
 
 #include <pthread.h>
 #include <thread>

@@ -1,11 +1,11 @@
-#include <gtest/gtest.h>
-
 #include "libobd/dispatch/fetcher.h"
 #include "libobd/powertrain/monitorstatus.h"
 #include "tests/support/dispatcherrig.h"
 #include "tests/support/fakeclock.h"
 #include "tests/support/fakequery.h"
 #include "tests/support/logcapture.h"
+
+#include <gtest/gtest.h>
 
 #include <limits>
 #include <set>

@@ -1,9 +1,9 @@
-#include <gtest/gtest.h>
-
 #include "libobd/dispatch/keepalivedispatchable.h"
 #include "tests/support/dispatcherrig.h"
 #include "tests/support/fakework.h"
 #include "tests/support/logcapture.h"
+
+#include <gtest/gtest.h>
 
 #include <limits>
 

@@ -1,9 +1,9 @@
-#include <gtest/gtest.h>
-
 #include "libobd/dispatch/query.h"
 #include "tests/support/dispatcherrig.h"
 #include "tests/support/fakequery.h"
 #include "tests/support/logcapture.h"
+
+#include <gtest/gtest.h>
 
 #include <functional>
 #include <stdexcept>

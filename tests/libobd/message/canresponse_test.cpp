@@ -1,5 +1,4 @@
 #include "libobd/message/canresponse.h"
-
 #include "tests/support/hexbytes.h"
 #include "tests/support/logcapture.h"
 

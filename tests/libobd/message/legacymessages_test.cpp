@@ -1,5 +1,4 @@
 #include "libobd/message/messageparser.h"
-
 #include "tests/support/hexbytes.h"
 #include "tests/support/logcapture.h"
 

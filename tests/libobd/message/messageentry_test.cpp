@@ -1,10 +1,10 @@
 #include "libobd/message/messageentry.h"
-
-#include <common/localtime.h>
-#include <gtest/gtest.h>
-
 #include "tests/support/bytes.h"
 #include "tests/support/fakeclock.h"
+
+#include <common/localtime.h>
+
+#include <gtest/gtest.h>
 
 namespace {
 

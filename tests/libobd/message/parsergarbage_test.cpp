@@ -1,7 +1,6 @@
 // Replies that no adapter should give: noise, lies and masses of it, on every bus family.
 
 #include "libobd/message/messageparser.h"
-
 #include "tests/support/hexbytes.h"
 #include "tests/support/logcapture.h"
 #include "tests/support/plaincanparser.h"

@@ -1,11 +1,11 @@
 #include "libobd/module/ecu.h"
-
 #include "libobd/module/obdproxy.h"
 #include "tests/support/fakedevice.h"
 #include "tests/support/logcapture.h"
 
-#include <algorithm>
 #include <gtest/gtest.h>
+
+#include <algorithm>
 
 namespace {
 

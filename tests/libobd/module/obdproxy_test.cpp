@@ -1,9 +1,9 @@
 #include "libobd/module/obdproxy.h"
-
 #include "tests/support/fakedevice.h"
 #include "tests/support/logcapture.h"
 
 #include <gtest/gtest.h>
+
 #include <thread>
 
 namespace {

@@ -1,5 +1,4 @@
 #include "libobd/module/parameterfactory.h"
-
 #include "libobd/powertrain/batteryvoltage.h"
 #include "libobd/powertrain/boostpressure.h"
 #include "libobd/powertrain/monitorstatus.h"

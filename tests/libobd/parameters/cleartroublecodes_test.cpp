@@ -1,5 +1,4 @@
 #include "libobd/parameters/cleartroublecodes.h"
-
 #include "tests/libobd/parameters/diagnosticsrig.h"
 #include "tests/support/logcapture.h"
 

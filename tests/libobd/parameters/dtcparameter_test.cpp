@@ -1,5 +1,4 @@
 #include "libobd/parameters/troublecodelists.h"
-
 #include "tests/libobd/parameters/diagnosticsrig.h"
 #include "tests/support/dtcrows.h"
 #include "tests/support/logcapture.h"

@@ -5,7 +5,6 @@
 #include "libobd/parameters/cleartroublecodes.h"
 #include "libobd/parameters/troublecodelists.h"
 #include "libobd/powertrain/freezeframetroublecode.h"
-
 #include "tests/support/dialoguefolder.h"
 #include "tests/support/dtcrows.h"
 #include "tests/support/fakeecu.h"

@@ -9,7 +9,6 @@
 #include "libobd/parameters/identificationnumber.h"
 #include "libobd/parameters/monitortestresult.h"
 #include "libobd/parameters/performancetracking.h"
-
 #include "tests/support/dialoguefolder.h"
 #include "tests/support/fakeecu.h"
 #include "tests/support/recordedreply.h"

@@ -1,6 +1,5 @@
-#include "libobd/parameters/supportedoids.h"
-
 #include "libobd/module/obdproxy.h"
+#include "libobd/parameters/supportedoids.h"
 #include "tests/support/fakedevice.h"
 #include "tests/support/logcapture.h"
 

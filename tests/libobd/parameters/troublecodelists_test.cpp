@@ -1,5 +1,4 @@
 #include "libobd/parameters/troublecodelists.h"
-
 #include "tests/libobd/parameters/diagnosticsrig.h"
 
 #include <gtest/gtest.h>

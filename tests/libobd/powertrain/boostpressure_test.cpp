@@ -1,5 +1,4 @@
 #include "libobd/powertrain/boostpressure.h"
-
 #include "tests/libobd/powertrain/derivedrig.h"
 
 namespace {

@@ -1,5 +1,4 @@
 #include "libobd/powertrain/codedparameters.h"
-
 #include "tests/support/fakeecu.h"
 #include "tests/support/hexbytes.h"
 #include "tests/support/logcapture.h"

@@ -1,5 +1,4 @@
 #include "libobd/powertrain/consumptionchoice.h"
-
 #include "libobd/powertrain/fuelconsumption.h"
 #include "tests/libobd/powertrain/derivedrig.h"
 

@@ -2,14 +2,13 @@
 #include "libobd/powertrain/boostpressure.h"
 #include "libobd/powertrain/fuelconsumption.h"
 #include "libobd/powertrain/torque.h"
-
 #include "tests/support/fakeecu.h"
 #include "tests/support/payload.h"
 #include "tests/support/payloadproperty.h"
 
-#include <gtest/gtest.h>
-
 #include <obd/sensorinfo.h>
+
+#include <gtest/gtest.h>
 
 namespace {
 

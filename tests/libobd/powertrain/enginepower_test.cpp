@@ -1,5 +1,4 @@
 #include "libobd/powertrain/enginepower.h"
-
 #include "tests/libobd/powertrain/derivedrig.h"
 
 namespace {

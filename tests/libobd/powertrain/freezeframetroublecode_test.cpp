@@ -1,13 +1,13 @@
 #include "libobd/powertrain/freezeframetroublecode.h"
-
 #include "tests/support/dtcrows.h"
 #include "tests/support/fakeecu.h"
 #include "tests/support/hexbytes.h"
 #include "tests/support/logcapture.h"
 
+#include <obd/sensorvalue.h>
+
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
-#include <obd/sensorvalue.h>
 
 namespace {
 

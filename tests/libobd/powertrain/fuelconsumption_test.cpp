@@ -1,5 +1,4 @@
 #include "libobd/powertrain/fuelconsumption.h"
-
 #include "tests/libobd/powertrain/derivedrig.h"
 
 #include <thread>

@@ -1,12 +1,12 @@
 #include "libobd/powertrain/fueltrim.h"
-
 #include "tests/support/fakeecu.h"
 #include "tests/support/hexbytes.h"
 #include "tests/support/logcapture.h"
 #include "tests/support/payload.h"
 
-#include <gtest/gtest.h>
 #include <obd/sensorinfo.h>
+
+#include <gtest/gtest.h>
 
 namespace {
 

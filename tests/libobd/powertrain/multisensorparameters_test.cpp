@@ -1,5 +1,4 @@
 #include "libobd/powertrain/multisensorparameters.h"
-
 #include "tests/support/fakeecu.h"
 #include "tests/support/hexbytes.h"
 #include "tests/support/payload.h"

@@ -1,5 +1,4 @@
 #include "libobd/powertrain/oxygensensors.h"
-
 #include "tests/support/fakeecu.h"
 #include "tests/support/hexbytes.h"
 #include "tests/support/parameterclasses.h"

@@ -3,8 +3,9 @@
 #include "tests/support/payload.h"
 #include "tests/support/tablefile.h"
 
-#include <gtest/gtest.h>
 #include <obd/sensorinfo.h>
+
+#include <gtest/gtest.h>
 
 #include <set>
 

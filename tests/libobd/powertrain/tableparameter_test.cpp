@@ -1,7 +1,6 @@
-#include "libobd/powertrain/tableparameter.h"
-
 #include "libobd/powertrain/formula.h"
 #include "libobd/powertrain/quantities.h"
+#include "libobd/powertrain/tableparameter.h"
 #include "tests/support/fakeecu.h"
 #include "tests/support/hexbytes.h"
 #include "tests/support/payload.h"

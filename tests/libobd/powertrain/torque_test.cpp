@@ -1,5 +1,4 @@
 #include "libobd/powertrain/torque.h"
-
 #include "tests/libobd/powertrain/derivedrig.h"
 
 namespace {

@@ -1,6 +1,6 @@
-#include <gtest/gtest.h>
-
 #include "tests/support/fakeproxy.h"
+
+#include <gtest/gtest.h>
 
 #include <stdexcept>
 #include <thread>

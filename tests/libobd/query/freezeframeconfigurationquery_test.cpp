@@ -1,7 +1,7 @@
-#include <gtest/gtest.h>
-
 #include "libobd/query/freezeframeconfigurationquery.h"
 #include "tests/support/fakeproxy.h"
+
+#include <gtest/gtest.h>
 
 namespace {
 

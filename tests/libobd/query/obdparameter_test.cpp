@@ -1,15 +1,16 @@
-#include <obd/obdparameter.h>
-
 #include "libobd/module/obdproxy.h"
 #include "tests/support/fakedevice.h"
 #include "tests/support/logcapture.h"
 
-#include <functional>
-#include <gtest/gtest.h>
 #include <obd/nack.h>
+#include <obd/obdparameter.h>
 #include <obd/powertrainparameter.h>
 #include <obd/sensorinfo.h>
 #include <obd/sensorvalue.h>
+
+#include <gtest/gtest.h>
+
+#include <functional>
 #include <stdexcept>
 
 namespace {

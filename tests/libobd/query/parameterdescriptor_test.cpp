@@ -1,7 +1,7 @@
-#include <obd/parameterdescriptor.h>
-
 #include "libobd/powertrain/numericparameters.h"
 #include "tests/support/fakeecu.h"
+
+#include <obd/parameterdescriptor.h>
 
 #include <gtest/gtest.h>
 

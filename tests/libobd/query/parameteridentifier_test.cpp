@@ -1,5 +1,6 @@
-#include <gtest/gtest.h>
 #include <obd/parameteridentifier.h>
+
+#include <gtest/gtest.h>
 
 namespace {
 

@@ -1,9 +1,10 @@
-#include <gmock/gmock.h>
-#include <gtest/gtest.h>
-#include <obd/ivelmorasettings.h>
-
 #include "libobd/service/baseservice.h"
 #include "tests/support/servicerig.h"
+
+#include <obd/ivelmorasettings.h>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
 
 #include <thread>
 

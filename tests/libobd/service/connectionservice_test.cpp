@@ -1,10 +1,11 @@
-#include <gmock/gmock.h>
-#include <gtest/gtest.h>
+#include "tests/support/servicerig.h"
+
 #include <obd/iconnectionservice.h>
 #include <obd/ivelmorasettings.h>
 #include <tervex/observer.h>
 
-#include "tests/support/servicerig.h"
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
 
 #include <thread>
 

@@ -1,8 +1,9 @@
-#include <gmock/gmock.h>
+#include "tests/support/servicetest.h"
+
 #include <obd/iecuservice.h>
 #include <obd/ivelmorasettings.h>
 
-#include "tests/support/servicetest.h"
+#include <gmock/gmock.h>
 
 #include <algorithm>
 

@@ -1,8 +1,9 @@
 #include "libobd/catalogue/dtcreader.h"
 
 #include <common/logrecord.h>
-#include <gtest/gtest.h>
 #include <obd/library.h>
+
+#include <gtest/gtest.h>
 
 #include <filesystem>
 #include <fstream>

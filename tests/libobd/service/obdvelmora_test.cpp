@@ -1,5 +1,11 @@
-#include <gmock/gmock.h>
-#include <gtest/gtest.h>
+#include "libobd/service/baseservice.h"
+#include "libobd/service/velmorainstance.h"
+#include "tests/support/dispatchloop.h"
+#include "tests/support/elmdialogue.h"
+#include "tests/support/fakeclock.h"
+#include "tests/support/logcapture.h"
+#include "tests/support/memorysettings.h"
+
 #include <obd/iconnectionmanager.h>
 #include <obd/iconnectionnotifier.h>
 #include <obd/iconnectionnotifierlistener.h>
@@ -12,13 +18,8 @@
 #include <obd/ivelmorasettings.h>
 #include <obd/obdvelmorabuilder.h>
 
-#include "libobd/service/baseservice.h"
-#include "libobd/service/velmorainstance.h"
-#include "tests/support/dispatchloop.h"
-#include "tests/support/elmdialogue.h"
-#include "tests/support/fakeclock.h"
-#include "tests/support/logcapture.h"
-#include "tests/support/memorysettings.h"
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
 
 #include <stdexcept>
 

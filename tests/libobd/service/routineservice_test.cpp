@@ -1,7 +1,8 @@
-#include <gmock/gmock.h>
+#include "tests/support/servicetest.h"
+
 #include <obd/iroutineservice.h>
 
-#include "tests/support/servicetest.h"
+#include <gmock/gmock.h>
 
 namespace {
 

@@ -1,8 +1,9 @@
-#include <gtest/gtest.h>
+#include "libobd/service/sensordata.h"
+
 #include <obd/sensorvalue.h>
 #include <obd/sensorvaluedatamodel.h>
 
-#include "libobd/service/sensordata.h"
+#include <gtest/gtest.h>
 
 namespace {
 

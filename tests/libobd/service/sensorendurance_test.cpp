@@ -1,5 +1,4 @@
 #include "tests/libobd/service/sensorservicefixture.h"
-
 #include "tests/support/failingallocation.h"
 
 #include <cstdlib>

@@ -1,7 +1,8 @@
 #include "libobd/service/sensormodels.h"
 
-#include <gtest/gtest.h>
 #include <obd/sensorinfo.h>
+
+#include <gtest/gtest.h>
 
 namespace {
 

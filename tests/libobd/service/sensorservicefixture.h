@@ -1,14 +1,15 @@
 #pragma once
 
-#include <gmock/gmock.h>
-#include <gtest/gtest.h>
+#include "tests/support/logcapture.h"
+#include "tests/support/servicerig.h"
+
 #include <obd/isensorservice.h>
 #include <obd/ivelmorasettings.h>
 #include <obd/parameterdescriptor.h>
 #include <obd/sensorvaluedatamodel.h>
 
-#include "tests/support/logcapture.h"
-#include "tests/support/servicerig.h"
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
 
 #include <functional>
 

@@ -1,12 +1,13 @@
-#include <gmock/gmock.h>
-#include <gtest/gtest.h>
-#include <obd/itroublecodeservice.h>
-#include <obd/ivelmorasettings.h>
-
 #include "libobd/powertrain/fueltrim.h"
 #include "tests/support/dtcrows.h"
 #include "tests/support/logcapture.h"
 #include "tests/support/servicerig.h"
+
+#include <obd/itroublecodeservice.h>
+#include <obd/ivelmorasettings.h>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
 
 namespace {
 

@@ -2,10 +2,11 @@
 #include "tests/support/bytes.h"
 #include "tests/support/servicetest.h"
 
-#include <gmock/gmock.h>
 #include <obd/databridge.h>
 #include <obd/idiagnosticsservice.h>
 #include <obd/itroubleshootingservice.h>
+
+#include <gmock/gmock.h>
 
 #include <mutex>
 #include <thread>

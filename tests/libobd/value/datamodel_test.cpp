@@ -1,5 +1,6 @@
-#include <gtest/gtest.h>
 #include <obd/parameterdatamodel.h>
+
+#include <gtest/gtest.h>
 
 namespace {
 

@@ -1,6 +1,7 @@
-#include <gtest/gtest.h>
 #include <obd/sensordescriptor.h>
 #include <obd/sensorinfo.h>
+
+#include <gtest/gtest.h>
 
 namespace {
 

@@ -1,5 +1,6 @@
-#include <gtest/gtest.h>
 #include <obd/sensorvalue.h>
+
+#include <gtest/gtest.h>
 
 #include <climits>
 

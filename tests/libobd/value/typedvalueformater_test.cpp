@@ -1,5 +1,6 @@
-#include <gtest/gtest.h>
 #include <obd/typedvalueformater.h>
+
+#include <gtest/gtest.h>
 
 #include <limits>
 

@@ -1,9 +1,10 @@
 #include "libobd/value/unitconversion.h"
 
-#include <gtest/gtest.h>
 #include <obd/measurementunit.h>
 #include <obd/typedvalueformater.h>
 #include <obd/unitsystem.h>
+
+#include <gtest/gtest.h>
 
 namespace {
 

@@ -1,8 +1,8 @@
 #include "libvelmora/read/sensornames.h"
-
 #include "libvelmora/text/text.h"
 
 #include <gtest/gtest.h>
+
 #include <set>
 
 namespace {

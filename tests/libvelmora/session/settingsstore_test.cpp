@@ -2,9 +2,10 @@
 
 #include <velmora/error.h>
 
+#include <gtest/gtest.h>
+
 #include <filesystem>
 #include <fstream>
-#include <gtest/gtest.h>
 #include <unistd.h>
 
 namespace {

@@ -1,12 +1,12 @@
 #pragma once
 
+#include "tests/support/fakeecu.h"
+
 #include <obd/parameterdescriptor.h>
 #include <obd/powertrainparameter.h>
 #include <obd/sensorinfo.h>
 #include <obd/sensorvalue.h>
 #include <obd/sensorvaluedatamodel.h>
-
-#include "tests/support/fakeecu.h"
 
 namespace support {
 

@@ -3,13 +3,15 @@
 #include "program/view/livelines.h"
 #include "program/view/livescreen.h"
 #include "tests/program/view/liveparameter.h"
+
 #include <velmora/error.h>
 
-#include <filesystem>
-#include <fstream>
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
+
+#include <filesystem>
+#include <fstream>
 #include <sstream>
 #include <unistd.h>
 

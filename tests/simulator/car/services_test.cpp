@@ -1,5 +1,4 @@
 #include "simulator/car/services.h"
-
 #include "simulator/car/vehicle.h"
 #include "simulator/car/vehiclefile.h"
 

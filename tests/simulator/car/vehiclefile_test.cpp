@@ -1,6 +1,5 @@
-#include "simulator/car/vehiclefile.h"
-
 #include "simulator/car/monitornames.h"
+#include "simulator/car/vehiclefile.h"
 #include "simulator/car/vehiclelibrary.h"
 
 #include <gtest/gtest.h>

@@ -1,5 +1,4 @@
 #include "tools/catalogue/codepattern.h"
-
 #include "tools/catalogue/sourceerror.h"
 
 namespace {

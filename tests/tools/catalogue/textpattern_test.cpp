@@ -1,6 +1,5 @@
-#include "tools/catalogue/textpattern.h"
-
 #include "tools/catalogue/sourceerror.h"
+#include "tools/catalogue/textpattern.h"
 
 namespace {
 
