@@ -4,6 +4,7 @@
 
 #include <common/logrecord.h>
 #include <common/tracestream.h>
+#include <obd/nack.h>
 
 #include <utility>
 
@@ -13,6 +14,8 @@ namespace {
 
 constexpr std::size_t headerBytes = 3;
 constexpr std::size_t sourceIndex = 2;
+constexpr unsigned char negativeReply = 0x7F;
+constexpr std::size_t pendingBytes = 3;
 
 // Removes the first count bytes and returns them.
 ByteView takeFront(ByteView& bytes, std::size_t count)
@@ -22,9 +25,22 @@ ByteView takeFront(ByteView& bytes, std::size_t count)
     return front;
 }
 
-void append(std::vector<unsigned char>& payload, ByteView bytes)
+// Whether the payload is a module's "response pending" and nothing else: 7F, the service, 78, and as many checksum
+// bytes as the bus leaves on it.
+bool isResponsePending(ByteView payload, std::size_t checksumBytes)
 {
-    payload.insert(payload.end(), bytes.begin(), bytes.end());
+    return (payload.size() == pendingBytes || payload.size() == pendingBytes + checksumBytes) &&
+           byteAt(payload, 0) == negativeReply && byteAt(payload, 2) == NackResponsePending;
+}
+
+// Joins a further frame to what came of its module. The answer that a module asked to wait for takes the place of the
+// asking, as it does on CAN.
+void append(std::vector<unsigned char>& payload, ByteView frame, std::size_t checksumBytes)
+{
+    if (isResponsePending(payload, checksumBytes)) {
+        payload.clear();
+    }
+    payload.insert(payload.end(), frame.begin(), frame.end());
 }
 
 // The format byte of ISO 14230 tells the addressing in its top two bits, of which OBD uses 10 only, and the length.
@@ -51,7 +67,7 @@ bool parseKwpFrames(ByteView rest, ResponseMap& payloads)
             TERVEX_LOG(Error) << "Not enough data: " << rest.size() << " vs " << length + checksumLength;
             return !payloads.empty();
         }
-        append(payloads[byteAt(header, sourceIndex)], takeFront(rest, length));
+        append(payloads[byteAt(header, sourceIndex)], takeFront(rest, length), 0);
         takeFront(rest, checksumLength);
     } while (!rest.empty());
     return true;
@@ -71,7 +87,7 @@ std::size_t findNextHeader(ByteView rest, ByteView header)
     return rest.size();
 }
 
-bool parseSaeFrames(ByteView rest, ResponseMap& payloads)
+bool parseSaeFrames(ObdProtocol protocol, ByteView rest, ResponseMap& payloads)
 {
     do {
         if (rest.size() <= headerBytes) {
@@ -79,7 +95,13 @@ bool parseSaeFrames(ByteView rest, ResponseMap& payloads)
             return !payloads.empty();
         }
         ByteView const header = takeFront(rest, headerBytes);
-        append(payloads[byteAt(header, sourceIndex)], takeFront(rest, findNextHeader(rest, header)));
+        std::vector<unsigned char>& payload = payloads[byteAt(header, sourceIndex)];
+        ByteView const frame = takeFront(rest, findNextHeader(rest, header));
+        if (protocol == ObdProtocolIso9141) {
+            append(payload, frame, 1);
+        } else { // SAE J1850 modules don't ask to wait
+            payload.insert(payload.end(), frame.begin(), frame.end());
+        }
     } while (!rest.empty());
     return true;
 }
@@ -92,7 +114,7 @@ bool parseLegacyMessages(ObdProtocol protocol, std::vector<unsigned char> const&
     hexTextToBytes(text, bytes);
     ResponseMap payloads;
     bool const usable =
-        protocol == ObdProtocolIso14230 ? parseKwpFrames(bytes, payloads) : parseSaeFrames(bytes, payloads);
+        protocol == ObdProtocolIso14230 ? parseKwpFrames(bytes, payloads) : parseSaeFrames(protocol, bytes, payloads);
     for (auto& [id, payload] : payloads) {
         responses[id] = std::move(payload);
     }

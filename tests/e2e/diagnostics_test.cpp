@@ -70,6 +70,12 @@ TEST(Diagnostics, CountersAndInformationAreThoseOfTheCar)
     EXPECT_FALSE(info["sinceCleared"]["distance"].is_null());
 }
 
+// The engine module of that car asks for time before it tells the VIN.
+TEST(Diagnostics, ReadsWhatAModuleOnAKLineAsksTimeFor)
+{
+    EXPECT_EQ(runJson("petrol-kwp-fast", "info")[0]["vin"], "VELMRAK1M70000004");
+}
+
 TEST(Diagnostics, WhatNoModuleOffersIsExitCodeSix)
 {
     Outcome const outcome = runVelmora({"-q", "-p", "sim:petrol-iso9141?instant", "counters"});

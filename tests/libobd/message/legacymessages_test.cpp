@@ -245,4 +245,98 @@ TEST_P(SaeMessages, EntriesOfOtherModulesStayAndTheModulesOwnIsReplaced)
     EXPECT_EQ(responses, (ResponseMap{{0x10, hexBytes("41 0D")}, {0x11, hexBytes("02")}}));
 }
 
+// The services a tool asks a module for, 01 to 0A.
+constexpr unsigned char services[] = {1, 2, 3, 4, 5, 6, 7, 8, 9, 10};
+
+std::string hex(unsigned char byte)
+{
+    constexpr char digits[] = "0123456789ABCDEF";
+    return {digits[byte >> 4], digits[byte & 0xF]};
+}
+
+std::string pendingFor(unsigned char service)
+{
+    return "7F" + hex(service) + "78";
+}
+
+std::string answerOf(unsigned char service)
+{
+    return hex(service | 0x40) + "0102";
+}
+
+TEST_F(KwpMessages, AnAnswerTakesThePlaceOfTheResponsePending)
+{
+    for (unsigned char const service : services) {
+        std::string const pending = "83F110" + pendingFor(service) + "CC";
+        std::string const answer = "83F110" + answerOf(service) + "CC";
+        EXPECT_TRUE(parse(pending + answer));
+        EXPECT_EQ(responses, (ResponseMap{{0x10, hexBytes(answerOf(service))}})) << int(service);
+        EXPECT_TRUE(parse(pending + pending + answer + answer)) << "asked twice, answered in two frames";
+        EXPECT_EQ(responses, (ResponseMap{{0x10, hexBytes(answerOf(service) + answerOf(service))}})) << int(service);
+        EXPECT_TRUE(parse(pending));
+        EXPECT_EQ(responses, (ResponseMap{{0x10, hexBytes(pendingFor(service))}})) << "no answer came";
+        EXPECT_TRUE(parse(pending + "83F1107F" + hex(service) + "22CC"));
+        EXPECT_EQ(responses, (ResponseMap{{0x10, hexBytes("7F" + hex(service) + "22")}})) << "refused in the end";
+    }
+    EXPECT_EQ(log.lines(), Lines());
+}
+
+TEST_F(KwpMessages, OnlyAWholeResponsePendingGivesWay)
+{
+    for (std::string const first : {"7F0922", "7F0978CC", "7F09", "490278", ""}) {
+        responses.clear();
+        std::string const length = hex(static_cast<unsigned char>(0x80 + first.size() / 2));
+        EXPECT_TRUE(parse(length + "F110" + first + "00" + "82F110490200"));
+        EXPECT_EQ(responses, (ResponseMap{{0x10, hexBytes(first + "4902")}})) << first;
+    }
+}
+
+TEST_F(KwpMessages, AResponsePendingIsItsOwnModulesAffair)
+{
+    EXPECT_TRUE(parse("83 F1 10 7F 09 78 00  82 F1 18 49 02 00  83 F1 18 7F 09 78 00  82 F1 10 49 04 00"));
+    EXPECT_EQ(responses, (ResponseMap{{0x10, hexBytes("49 04")}, {0x18, hexBytes("49 02 7F 09 78")}}));
+}
+
+class Iso9141Messages : public LegacyMessages
+{
+protected:
+    bool parse(std::string_view text) { return LegacyMessages::parse(obd::ObdProtocolIso9141, text); }
+};
+
+TEST_F(Iso9141Messages, AnAnswerTakesThePlaceOfTheResponsePending)
+{
+    for (unsigned char const service : services) {
+        for (std::string const checksum : {"", "CC"}) {
+            std::string const pending = "486B10" + pendingFor(service) + checksum;
+            std::string const answer = "486B10" + answerOf(service) + checksum;
+            std::string const payload = answerOf(service) + checksum;
+            EXPECT_TRUE(parse(pending + answer));
+            EXPECT_EQ(responses, (ResponseMap{{0x10, hexBytes(payload)}})) << int(service) << checksum;
+            EXPECT_TRUE(parse(pending + pending + answer + answer)) << "asked twice, answered in two frames";
+            EXPECT_EQ(responses, (ResponseMap{{0x10, hexBytes(payload + payload)}})) << int(service) << checksum;
+            EXPECT_TRUE(parse(pending));
+            EXPECT_EQ(responses, (ResponseMap{{0x10, hexBytes(pendingFor(service) + checksum)}})) << "no answer came";
+        }
+    }
+    EXPECT_EQ(log.lines(), Lines());
+}
+
+TEST_F(Iso9141Messages, OnlyAWholeResponsePendingGivesWay)
+{
+    for (std::string const first : {"7F0922CC", "7F0978CCDD", "7F09", "490278CC"}) {
+        responses.clear();
+        EXPECT_TRUE(parse("486B10" + first + "486B104902CC"));
+        EXPECT_EQ(responses, (ResponseMap{{0x10, hexBytes(first + "4902CC")}})) << first;
+    }
+}
+
+TEST_F(LegacyMessages, J1850KnowsNoResponsePending)
+{
+    for (std::string const checksum : {"", "CC"}) {
+        responses.clear();
+        EXPECT_TRUE(parse(obd::ObdProtocolJ1850, "486B107F0978" + checksum + "486B104902" + checksum));
+        EXPECT_EQ(responses, (ResponseMap{{0x10, hexBytes("7F0978" + checksum + "4902" + checksum)}}));
+    }
+}
+
 } // namespace
