@@ -1,0 +1,64 @@
+#include "libvelmora/output/outputfactory.h"
+
+#include "libvelmora/output/csvoutput.h"
+#include "libvelmora/output/influxoutput.h"
+#include "libvelmora/output/ndjsonoutput.h"
+
+#include <velmora/error.h>
+
+namespace velmora {
+
+namespace {
+
+struct Maker
+{
+    char const* kind;
+    std::unique_ptr<IOutput> (*make)(OutputAddress const&);
+};
+
+template <typename Output>
+std::unique_ptr<IOutput> makeOf(OutputAddress const& address)
+{
+    return std::make_unique<Output>(address);
+}
+
+std::vector<Maker> const& makers()
+{
+    static std::vector<Maker> const list = {
+#ifdef VELMORA_OUTPUT_CSV
+        {"csv", makeOf<CsvOutput>},
+        {"csv-long", makeOf<CsvLongOutput>},
+#endif
+#ifdef VELMORA_OUTPUT_NDJSON
+        {"ndjson", makeOf<NdjsonOutput>},
+#endif
+#ifdef VELMORA_OUTPUT_INFLUX
+        {"influx", makeInfluxOutput},
+#endif
+    };
+    return list;
+}
+
+} // namespace
+
+std::vector<std::string> builtInOutputs()
+{
+    std::vector<std::string> kinds;
+    for (Maker const& each : makers()) {
+        kinds.emplace_back(each.kind);
+    }
+    return kinds;
+}
+
+std::unique_ptr<IOutput> makeOutput(OutputAddress const& address)
+{
+    for (Maker const& each : makers()) {
+        if (address.kind == each.kind) {
+            return each.make(address);
+        }
+    }
+    throw Error(ErrorKind::WrongUse, "This build has no output of kind " + address.kind,
+                {"velmora --version tells which outputs it has"});
+}
+
+} // namespace velmora

@@ -1,0 +1,93 @@
+#pragma once
+
+#include <velmora/reading.h>
+
+#include <chrono>
+#include <cstdint>
+#include <memory>
+#include <optional>
+#include <span>
+#include <string>
+#include <variant>
+#include <vector>
+
+namespace velmora {
+
+using WallTime = std::chrono::system_clock::time_point;
+
+// Something that happened: "lamp_on", "code_new", "link_lost", "engine_start", ...
+struct Event
+{
+    WallTime time;
+    std::string vehicle;
+    std::string kind;                   // lower case and '_'
+    std::optional<unsigned int> module; // id, if it concerns one
+    std::string text;                   // for people
+};
+
+// A way from engine start to engine stop, as TripMeter saw it. What was not told stays empty.
+struct Trip
+{
+    WallTime begin;
+    WallTime end;
+    std::string vehicle;
+    bool engineRun = false; // too short in way or time to be called a trip
+    double distanceKm = 0.0;
+    double durationS = 0.0;
+    double idleS = 0.0;
+    double gapS = 0.0; // of the duration, without readings of the speed
+    std::optional<double> fuelL;
+    std::optional<double> odometerKm; // difference of the odometer, or of the distance since codes were cleared
+    std::optional<double> meanKmh;
+    std::optional<double> maxKmh;
+    std::optional<double> maxRpm;
+    std::optional<double> maxCoolantC;
+};
+
+// A control module of the vehicle.
+struct ModuleInfo
+{
+    WallTime time;
+    std::string vehicle;
+    unsigned int id = 0;
+    std::string name;
+    std::string description;
+    std::string vin; // only if the user wants it kept
+};
+
+// A sensor that will be read from now on.
+struct SensorEntry
+{
+    unsigned int module = 0;
+    std::string sensor;
+    std::string pid;
+    std::string name;
+    std::string unit;
+};
+
+// All sensors that will be read from now on; replaces the list before.
+struct SensorList
+{
+    WallTime time;
+    std::string vehicle;
+    std::vector<SensorEntry> sensors;
+};
+
+// A trouble code that came or went.
+struct CodeChange
+{
+    WallTime time;
+    std::string vehicle;
+    unsigned int module = 0;
+    std::string code;
+    std::string kind; // "confirmed", "pending", "permanent"
+    std::string text;
+    bool present = true; // false: it has gone
+};
+
+using Record = std::variant<Reading, Event, Trip, ModuleInfo, SensorList, CodeChange>;
+// Outputs share what they are given, so that one that stands still costs no copies.
+using SharedRecord = std::shared_ptr<Record const>;
+using Records = std::span<SharedRecord const>;
+
+} // namespace velmora

@@ -1,0 +1,86 @@
+#include "libvelmora/output/outputaddress.h"
+#include "libvelmora/output/outputfactory.h"
+#include "libvelmora/output/valuetext.h"
+
+#include <velmora/error.h>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+namespace {
+
+using testing::HasSubstr;
+using velmora::OutputAddress;
+using velmora::parseOutputAddress;
+using velmora::parseSize;
+
+std::string outputComplaint(std::string const& text)
+{
+    try {
+        velmora::makeOutput(parseOutputAddress(text));
+    } catch (velmora::Error const& error) {
+        EXPECT_EQ(error.kind(), velmora::ErrorKind::WrongUse);
+        return error.what();
+    }
+    return "";
+}
+
+TEST(OutputAddress, HasKindTargetAndOptions)
+{
+    OutputAddress const address = parseOutputAddress("csv:/var/log/a:b.csv?rotate=day&queue=50");
+    EXPECT_EQ(address.kind, "csv");
+    EXPECT_EQ(address.target, "/var/log/a:b.csv");
+    EXPECT_EQ(address.option("rotate"), "day");
+    EXPECT_EQ(address.option("queue", "1"), "50");
+    EXPECT_EQ(address.option("other", "1"), "1");
+    EXPECT_EQ(toString(address), "csv:/var/log/a:b.csv");
+}
+
+TEST(OutputAddress, ABrokerIsAUrl)
+{
+    OutputAddress const address = parseOutputAddress("mqtts://broker:8883/cars/van?ca=/etc/ca.pem&qos=1");
+    EXPECT_EQ(address.kind, "mqtts");
+    EXPECT_EQ(address.target, "broker:8883/cars/van");
+    EXPECT_EQ(address.option("ca"), "/etc/ca.pem");
+    EXPECT_EQ(toString(address), "mqtts://broker:8883/cars/van");
+}
+
+TEST(OutputAddress, TellsWhatIsWrong)
+{
+    EXPECT_THAT(outputComplaint("drive.csv"), HasSubstr("known kind"));
+    EXPECT_THAT(outputComplaint("tape:drive"), HasSubstr("known kind"));
+    EXPECT_THAT(outputComplaint("csv:"), HasSubstr("where it goes is missing"));
+    EXPECT_THAT(outputComplaint("csv:?rotate=day"), HasSubstr("where it goes is missing"));
+    EXPECT_THAT(outputComplaint("mqtt:broker/topic"), HasSubstr("// is missing"));
+    EXPECT_THAT(outputComplaint("csv:a?rotate"), HasSubstr("\"rotate\" is not key=value"));
+    EXPECT_THAT(outputComplaint("csv:a?=day"), HasSubstr("not key=value"));
+    EXPECT_THAT(outputComplaint("csv:a?qos=1"), HasSubstr("no setting \"qos\""));
+    EXPECT_THAT(outputComplaint("csv:a?rotate=1k&rotate=day"), HasSubstr("twice"));
+    EXPECT_THAT(outputComplaint("csv:a?rotate=often"), HasSubstr("\"often\" is no size"));
+    EXPECT_THAT(outputComplaint("influx:udp://nowhere"), HasSubstr("needs a host and a port"));
+}
+
+TEST(OutputAddress, SizesHaveBinaryUnits)
+{
+    EXPECT_EQ(parseSize("500"), 500U);
+    EXPECT_EQ(parseSize("10k"), 10240U);
+    EXPECT_EQ(parseSize("10MB"), 10485760U);
+    EXPECT_EQ(parseSize("2G"), 2147483648U);
+    for (char const* const wrong : {"", "0", "-1", "1T", "k", "1kk", "99999999999999999999", "99999999999999G"}) {
+        EXPECT_THROW(parseSize(wrong), velmora::Error) << wrong;
+    }
+}
+
+TEST(ValueText, TimesNumbersAndFields)
+{
+    EXPECT_EQ(velmora::utcTime(velmora::fromMillis(1772352900250)), "2026-03-01T08:15:00.250Z");
+    EXPECT_EQ(velmora::utcTime(velmora::fromMillis(-1)), "1969-12-31T23:59:59.999Z");
+    EXPECT_EQ(velmora::numberText(12.6), "12.6");
+    EXPECT_EQ(velmora::numberText(0.1 + 0.2), "0.3");
+    EXPECT_EQ(velmora::numberText(-0.0), "0");
+    EXPECT_EQ(velmora::numberText(1234567.0), "1234567");
+    EXPECT_EQ(velmora::moduleText(0x7E8), "7E8");
+    EXPECT_EQ(velmora::csvField("a,\"b\""), "\"a,\"\"b\"\"\"");
+}
+
+} // namespace
