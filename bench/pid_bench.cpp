@@ -4,9 +4,10 @@
 // The counters tell classes an iteration, and memory allocations a class.
 
 #include "bench/allocationcount.h"
-#include "libobd/module/parameterfactory.h"
 #include "tests/support/fakeecu.h"
 #include "tests/support/payload.h"
+
+#include <obd/parameterfactory.h>
 
 #include <benchmark/benchmark.h>
 

@@ -3,9 +3,9 @@
 
 #include "bench/allocationcount.h"
 #include "libobd/module/obdproxy.h"
-#include "libobd/module/parameterfactory.h"
 #include "tests/support/fakedevice.h"
 
+#include <obd/parameterfactory.h>
 #include <obd/powertrainparameter.h>
 
 #include <benchmark/benchmark.h>

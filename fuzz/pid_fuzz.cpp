@@ -3,10 +3,11 @@
 // payloads at the length that the third byte tells. Each is either refused and changes nothing, or is read into values
 // of the sensors that the parameter announces.
 
-#include "libobd/module/parameterfactory.h"
 #include "libobd/powertrain/fueltrim.h"
 #include "tests/support/fakeecu.h"
 #include "tests/support/payloadproperty.h"
+
+#include <obd/parameterfactory.h>
 
 #include <algorithm>
 #include <cstdint>

@@ -1,7 +1,6 @@
 #include "libobd/connection/ecumanager.h"
 
 #include "libobd/bytes/hexformat.h"
-#include "libobd/module/parameterfactory.h"
 #include "libobd/powertrain/consumptionchoice.h"
 #include "libobd/powertrain/sensorpids.h"
 
@@ -11,6 +10,7 @@
 #include <obd/iobdproxy.h>
 #include <obd/ivelmorasettings.h>
 #include <obd/parameterdescriptor.h>
+#include <obd/parameterfactory.h>
 #include <obd/powertrainparameter.h>
 
 #include <algorithm>

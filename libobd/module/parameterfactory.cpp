@@ -1,5 +1,3 @@
-#include "libobd/module/parameterfactory.h"
-
 #include "libobd/powertrain/batteryvoltage.h"
 #include "libobd/powertrain/boostpressure.h"
 #include "libobd/powertrain/codedparameters.h"
@@ -9,12 +7,15 @@
 #include "libobd/powertrain/numericparameters.h"
 #include "libobd/powertrain/oxygensensors.h"
 #include "libobd/powertrain/oxygensensorspresent.h"
+#include "libobd/powertrain/sensorpids.h"
 #include "libobd/powertrain/torque.h"
 
 #include <common/logrecord.h>
+#include <obd/parameterfactory.h>
 
 #include <algorithm>
 #include <iterator>
+#include <type_traits>
 
 namespace obd {
 namespace {
@@ -25,6 +26,7 @@ struct FactoryRow
 {
     int pid;
     Maker make;
+    std::size_t (*dataLength)();
 };
 
 template <typename Parameter>
@@ -33,10 +35,18 @@ std::shared_ptr<PowertrainParameter> make(ObdMode mode, unsigned char frame)
     return std::make_shared<Parameter>(mode, frame);
 }
 
+// The shortest payload that a class accepts is the whole of what a module sends, but for the trim of a second bank.
+template <typename Parameter>
+std::size_t dataLength()
+{
+    bool const second = std::is_base_of_v<FuelTrim, Parameter> && FuelTrim::byteBInUse();
+    return second ? Parameter::bytes + 1 : Parameter::bytes;
+}
+
 template <typename Parameter>
 constexpr FactoryRow row(int pid)
 {
-    return {pid, make<Parameter>};
+    return {pid, make<Parameter>, dataLength<Parameter>};
 }
 
 // The PIDs that are read as sensors. Not among them, on purpose: the support masks (0x00, 0x20, ...), the readiness
@@ -166,11 +176,38 @@ constexpr FactoryRow sensors[] = {
 static_assert(pidsRise(sensors), "PIDs must rise, none twice");
 static_assert(std::size(sensors) == 119);
 
-std::shared_ptr<PowertrainParameter> makeSensor(ParameterIdentifier::Id id, ObdMode mode, unsigned char frame)
+// Null for an identifier that is no sensor.
+FactoryRow const* findSensor(ParameterIdentifier::Id id)
 {
     auto const* const found = std::lower_bound(std::begin(sensors), std::end(sensors), static_cast<int>(id),
                                                [](FactoryRow const& row, int pid) { return row.pid < pid; });
-    return found != std::end(sensors) && found->pid == id ? found->make(mode, frame) : nullptr;
+    return found != std::end(sensors) && found->pid == id ? found : nullptr;
+}
+
+std::shared_ptr<PowertrainParameter> makeSensor(ParameterIdentifier::Id id, ObdMode mode, unsigned char frame)
+{
+    FactoryRow const* const found = findSensor(id);
+    return found != nullptr ? found->make(mode, frame) : nullptr;
+}
+
+// Of those that are no sensors: masks, readiness and tester configurations fill four bytes.
+std::optional<std::size_t> otherDataLength(int pid)
+{
+    constexpr std::size_t codeLength = 2;
+    constexpr std::size_t fieldsLength = 4;
+    switch (pid) {
+    case freezeFrameCodePid:
+        return codeLength;
+    case monitorStatusPid:
+    case 0x41:
+    case 0x4F:
+    case 0x50:
+        return fieldsLength;
+    default:
+        break;
+    }
+    bool const isMask = pid >= 0 && pid <= lastSupportMask && pid % supportMaskStep == 0;
+    return isMask ? std::optional(fieldsLength) : std::nullopt;
 }
 
 // Of a usual car, for who does not know the vehicle's.
@@ -208,6 +245,12 @@ std::shared_ptr<PowertrainParameter> ParameterFactory::createFreezeFrameParamete
                                                                                   unsigned char frame)
 {
     return makeSensor(id, ObdMode::FreezeFrame, frame);
+}
+
+std::optional<std::size_t> ParameterFactory::dataLength(ParameterIdentifier::Id id)
+{
+    FactoryRow const* const found = findSensor(id);
+    return found != nullptr ? found->dataLength() : otherDataLength(id);
 }
 
 } // namespace obd

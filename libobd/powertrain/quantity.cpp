@@ -10,11 +10,6 @@ double inUnitOf(Quantity const& quantity, double metric, UnitSystem system)
     return system == UnitSystem::Imperial && quantity.toImperial != nullptr ? quantity.toImperial(metric) : metric;
 }
 
-std::shared_ptr<SensorValue> makeText(int uid, std::string const& text)
-{
-    return std::make_shared<TextualSensorValue>(uid, text);
-}
-
 } // namespace
 
 double convert(Quantity const& quantity, double metric, UnitSystem system)
@@ -26,7 +21,7 @@ double convert(Quantity const& quantity, double metric, UnitSystem system)
 std::shared_ptr<SensorValue> makeValue(int uid, Quantity const& quantity, double converted, UnitSystem system)
 {
     if (quantity.stateText != nullptr) {
-        return makeText(uid, quantity.stateText(static_cast<unsigned int>(converted)));
+        return std::make_shared<TextualSensorValue>(uid, quantity.stateText(static_cast<unsigned int>(converted)));
     }
     Scale const& scale = quantity.scale(system);
     switch (scale.form) {
@@ -36,7 +31,8 @@ std::shared_ptr<SensorValue> makeValue(int uid, Quantity const& quantity, double
         return ConcreateNumericSensorValue<unsigned int>::buildObject(uid, static_cast<unsigned int>(converted),
                                                                       scale.decimals);
     case NumberForm::Digits:
-        return makeText(uid, std::to_string(static_cast<unsigned int>(converted)));
+        return std::make_shared<TextualSensorValue>(uid, std::to_string(static_cast<unsigned int>(converted)),
+                                                    converted);
     case NumberForm::Double:
         break;
     }

@@ -5,10 +5,14 @@ namespace obd {
 inline constexpr unsigned char monitorStatusPid = 0x01;
 inline constexpr unsigned char freezeFrameCodePid = 0x02;
 
+// The support masks, each of which tells of so many PIDs behind it.
+inline constexpr int supportMaskStep = 0x20;
+inline constexpr int lastSupportMask = 0xE0;
+
 // The support masks (0x00, 0x20, ...), the readiness and the trouble code of the freeze frame have their own ways.
 constexpr bool isSensor(unsigned char pid)
 {
-    return (pid & 0x1FU) != 0 && pid != monitorStatusPid && pid != freezeFrameCodePid;
+    return pid % supportMaskStep != 0 && pid != monitorStatusPid && pid != freezeFrameCodePid;
 }
 
 } // namespace obd

@@ -55,6 +55,8 @@ template <typename Base, auto const& rows, int id>
 class RowParameter : public Base
 {
 public:
+    static constexpr std::size_t bytes = rows[rowIndex(rows, id)].bytes;
+
     RowParameter(ObdMode mode, unsigned char frame) : Base(rows[rowIndex(rows, id)], mode, frame) {}
 };
 

@@ -1,6 +1,5 @@
 #include "libobd/service/parametercatalogue.h"
 
-#include "libobd/module/parameterfactory.h"
 #include "libobd/powertrain/batteryvoltage.h"
 #include "libobd/powertrain/boostpressure.h"
 #include "libobd/powertrain/consumptionchoice.h"
@@ -10,6 +9,7 @@
 
 #include <obd/iecu.h>
 #include <obd/parameterdescriptor.h>
+#include <obd/parameterfactory.h>
 #include <obd/powertrainparameter.h>
 
 namespace obd {

@@ -40,9 +40,14 @@ std::string SensorData::text(double number) const
 std::shared_ptr<SensorValueDataModel> SensorData::model() const
 {
     if (numeric() == nullptr) {
-        return std::make_shared<SensorValueDataModel>(m_uid, m_text);
+        auto const text = std::make_shared<SensorValueDataModel>(m_uid, m_text);
+        text->number = m_value != nullptr ? m_value->number() : std::nullopt;
+        return text;
     }
-    return std::make_shared<SensorValueDataModel>(m_uid, current(), minimum(), maximum(), mean());
+    auto const reading = std::make_shared<SensorValueDataModel>(m_uid, current(), minimum(), maximum(), mean());
+    reading->number = m_current;
+    reading->statistics = {m_minimum, m_maximum, m_mean, m_count};
+    return reading;
 }
 
 } // namespace obd

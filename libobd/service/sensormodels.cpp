@@ -26,7 +26,12 @@ bool isSelectable(int uid)
 
 std::shared_ptr<SensorValueDataModel> makeValueModel(std::shared_ptr<SensorValue> const& value)
 {
-    return value != nullptr ? std::make_shared<SensorValueDataModel>(value->uid(), value->textualValue()) : nullptr;
+    if (value == nullptr) {
+        return nullptr;
+    }
+    auto const model = std::make_shared<SensorValueDataModel>(value->uid(), value->textualValue());
+    model->number = value->number();
+    return model;
 }
 
 std::shared_ptr<SensorDataModel> makeSensorModel(SensorDescriptor const& sensor, std::string const& name,

@@ -11,6 +11,7 @@
 #include <obd/ivelmorasettings.h>
 #include <obd/parameterdatamodel.h>
 #include <obd/parameterdescriptor.h>
+#include <obd/parameterfactory.h>
 #include <obd/powertrainparameter.h>
 #include <obd/sensordatamodel.h>
 #include <obd/sensorvalue.h>
@@ -80,7 +81,8 @@ std::shared_ptr<ParameterDataModel> SensorService::getParameter(ParameterIdentif
     if (current == nullptr) {
         return nullptr;
     }
-    std::shared_ptr<PowertrainParameter> const parameter = SensorSet::createParameter(*current, *m_settings, id);
+    std::shared_ptr<PowertrainParameter> const parameter =
+        ParameterFactory().createParameter(*current, *m_settings, id);
     if (parameter == nullptr) {
         TERVEX_LOG(Error) << "No such parameter (" << static_cast<int>(id) << ")";
         return nullptr;
@@ -92,7 +94,7 @@ std::vector<std::shared_ptr<SensorDataModel>> SensorService::fetchSensors(Parame
 {
     std::shared_ptr<IEcu> const current = ecu();
     std::shared_ptr<PowertrainParameter> const parameter =
-        current != nullptr ? SensorSet::createParameter(*current, *m_settings, id) : nullptr;
+        current != nullptr ? ParameterFactory().createParameter(*current, *m_settings, id) : nullptr;
     if (parameter == nullptr || !fetch(parameter)) {
         return {};
     }

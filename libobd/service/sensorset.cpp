@@ -1,15 +1,12 @@
 #include "libobd/service/sensorset.h"
 
-#include "libobd/module/parameterfactory.h"
 #include "libobd/powertrain/boostpressure.h"
-#include "libobd/powertrain/consumptionchoice.h"
 #include "libobd/powertrain/sensorpids.h"
-#include "libobd/powertrain/torque.h"
+#include "libobd/service/sensormodels.h"
 
-#include <common/tracestream.h>
 #include <obd/iecu.h>
-#include <obd/ivelmorasettings.h>
 #include <obd/parameterdescriptor.h>
+#include <obd/parameterfactory.h>
 #include <obd/powertrainparameter.h>
 #include <obd/sensorinfo.h>
 #include <obd/sensorvalue.h>
@@ -18,27 +15,6 @@
 #include <utility>
 
 namespace obd {
-namespace {
-
-IgnitionType ignitionType(IEcu const& ecu, IVelmoraSettings const& settings)
-{
-    if (!settings.fuelTypeOverride()) {
-        return ecu.ignitionType();
-    }
-    tervex::TraceStream << "Override default fuel type";
-    return settings.ignitionType();
-}
-
-std::shared_ptr<PowertrainParameter> createFuelConsumption(IEcu const& ecu, IVelmoraSettings const& settings)
-{
-    ConsumptionSettings const vehicle{settings.fuelCorrectionFactor(),
-                                      static_cast<double>(settings.volumetricEfficiency()),
-                                      settings.engineDisplacement()};
-    return createConsumption(ecu, ignitionType(ecu, settings), vehicle);
-}
-
-} // namespace
-
 SensorSet::SensorSet(std::shared_ptr<IEcu> ecu, IVelmoraSettings const& settings) : m_ecu(std::move(ecu))
 {
     if (m_ecu == nullptr) {
@@ -53,8 +29,9 @@ SensorSet::SensorSet(std::shared_ptr<IEcu> ecu, IVelmoraSettings const& settings
     if (BoostPressure::isValid(*m_ecu)) {
         ids.push_back(ParameterIdentifier::BoostPressure);
     }
+    ParameterFactory factory;
     for (ParameterIdentifier::Id const id : ids) {
-        if (std::shared_ptr<PowertrainParameter> const parameter = createParameter(*m_ecu, settings, id)) {
+        if (std::shared_ptr<PowertrainParameter> const parameter = factory.createParameter(*m_ecu, settings, id)) {
             add(parameter);
         }
     }
@@ -77,21 +54,6 @@ std::vector<ParameterIdentifier::Id> SensorSet::supportedIds(IEcu const& ecu)
         }
     }
     return ids;
-}
-
-std::shared_ptr<PowertrainParameter> SensorSet::createParameter(IEcu const& ecu, IVelmoraSettings const& settings,
-                                                                ParameterIdentifier::Id id)
-{
-    switch (id) {
-    case ParameterIdentifier::FuelConsumption:
-        return createFuelConsumption(ecu, settings);
-    case ParameterIdentifier::EnginePower:
-        return std::make_shared<EnginePower>(static_cast<unsigned int>(settings.vehicleWeight()));
-    case ParameterIdentifier::Torque:
-        return std::make_shared<Torque>(static_cast<unsigned int>(settings.vehicleWeight()));
-    default:
-        return ParameterFactory().createParameter(id);
-    }
 }
 
 std::vector<std::shared_ptr<ParameterDescriptor>> SensorSet::descriptors(UnitSystem system) const
@@ -124,7 +86,7 @@ std::shared_ptr<SensorValueDataModel> SensorSet::record(std::shared_ptr<SensorVa
 {
     auto const found = m_sensorData.find(value->uid());
     if (found == m_sensorData.end()) {
-        return std::make_shared<SensorValueDataModel>(value->uid(), value->textualValue());
+        return makeValueModel(value);
     }
     found->second->update(value);
     return found->second->model();

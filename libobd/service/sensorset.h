@@ -34,9 +34,6 @@ public:
 
     // The PIDs that a module reports, without the support masks and those that are no sensors.
     static std::vector<ParameterIdentifier::Id> supportedIds(IEcu const& ecu);
-    // The parameter of any identifier, for that module, whether it reports it or not. Null if there is none.
-    static std::shared_ptr<PowertrainParameter> createParameter(IEcu const& ecu, IVelmoraSettings const& settings,
-                                                                ParameterIdentifier::Id id);
 
     std::shared_ptr<IEcu> const& ecu() const { return m_ecu; }
     std::vector<std::shared_ptr<ParameterDescriptor>> descriptors(UnitSystem system) const;

@@ -1,7 +1,6 @@
 #include "libobd/service/troublecodeservice.h"
 
 #include "libobd/dispatch/fetcher.h"
-#include "libobd/module/parameterfactory.h"
 #include "libobd/parameters/cleartroublecodes.h"
 #include "libobd/parameters/troublecodelists.h"
 #include "libobd/powertrain/freezeframetroublecode.h"
@@ -14,6 +13,7 @@
 #include <common/logrecord.h>
 #include <common/tracestream.h>
 #include <obd/parameterdescriptor.h>
+#include <obd/parameterfactory.h>
 
 namespace obd {
 

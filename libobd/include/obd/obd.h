@@ -55,6 +55,7 @@
 #include <obd/oxygensensormonitordatamodel.h>
 #include <obd/parameterdatamodel.h>
 #include <obd/parameterdescriptor.h>
+#include <obd/parameterfactory.h>
 #include <obd/parameteridentifier.h>
 #include <obd/performancecounterdatamodel.h>
 #include <obd/powertrainparameter.h>

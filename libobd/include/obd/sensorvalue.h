@@ -4,6 +4,7 @@
 #include <obd/typedvalueformater.h>
 
 #include <memory>
+#include <optional>
 #include <string>
 #include <utility>
 
@@ -20,6 +21,8 @@ public:
     int uid() const { return m_uid; }
     /// The reading as a user sees it, without its unit.
     virtual std::string textualValue() = 0;
+    /// The reading as a number, not rounded. Nothing for a state in words.
+    virtual std::optional<double> number() const { return std::nullopt; }
 
 private:
     int m_uid;
@@ -33,6 +36,7 @@ public:
 
     /// The number as stored, not rounded.
     virtual double numericValue() const = 0;
+    std::optional<double> number() const override { return numericValue(); }
     /// Any other number of the same sensor, such as a mean, with the decimals of this one.
     virtual std::string toString(double value) const = 0;
 };
@@ -60,16 +64,21 @@ extern template class OBD_EXPORT ConcreateNumericSensorValue<int>;
 extern template class OBD_EXPORT ConcreateNumericSensorValue<unsigned int>;
 extern template class OBD_EXPORT ConcreateNumericSensorValue<double>;
 
-/// A reading that is a text.
+/// A reading that is a text: a state in words, or a number that is shown as its digits and has no statistics.
 class OBD_EXPORT TextualSensorValue : public SensorValue
 {
 public:
     TextualSensorValue(int uid, std::string text) : SensorValue(uid), m_text(std::move(text)) {}
+    TextualSensorValue(int uid, std::string digits, double number)
+        : SensorValue(uid), m_text(std::move(digits)), m_number(number)
+    {}
 
     std::string textualValue() override { return m_text; }
+    std::optional<double> number() const override { return m_number; }
 
 private:
     std::string m_text;
+    std::optional<double> m_number;
 };
 
 } // namespace obd

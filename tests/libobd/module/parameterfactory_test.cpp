@@ -1,12 +1,15 @@
-#include "libobd/module/parameterfactory.h"
 #include "libobd/powertrain/batteryvoltage.h"
 #include "libobd/powertrain/boostpressure.h"
+#include "libobd/powertrain/fueltrim.h"
 #include "libobd/powertrain/monitorstatus.h"
 #include "libobd/powertrain/torque.h"
 #include "tests/support/hexbytes.h"
 #include "tests/support/logcapture.h"
 #include "tests/support/parameterclasses.h"
 #include "tests/support/payload.h"
+#include "tests/support/tablefile.h"
+
+#include <obd/parameterfactory.h>
 
 #include <gtest/gtest.h>
 
@@ -102,6 +105,35 @@ TEST(ParameterFactory, MakesNoOtherClassThanTheNamedOnes)
         made += ParameterFactory().createFreezeFrameParameter(id(pid), 0) != nullptr ? 1 : 0;
     }
     EXPECT_EQ(made, support::parameterClasses().size());
+}
+
+TEST(ParameterFactory, TellsTheDataLengthOfEverySensorAsTheTableHasIt)
+{
+    obd::FuelTrim::setByteBInUse(false);
+    std::map<int, std::size_t> expected;
+    for (auto const& cells : support::readTable("tests/libobd/powertrain/pid_table.txt")) {
+        expected[std::stoi(cells.at(0), nullptr, 16)] = std::stoul(cells.at(2));
+    }
+    for (int const pid : {0x00, 0x01, 0x20, 0x40, 0x41, 0x4F, 0x50, 0x60, 0x80, 0xA0, 0xC0, 0xE0}) {
+        expected[pid] = 4;
+    }
+    expected[0x02] = 2;
+    ASSERT_EQ(expected.size(), 132U);
+    for (int pid = -1; pid <= 0x120; ++pid) {
+        std::optional<std::size_t> const length = ParameterFactory::dataLength(id(pid));
+        EXPECT_EQ(length, expected.contains(pid) ? std::optional(expected[pid]) : std::nullopt) << pid;
+    }
+}
+
+TEST(ParameterFactory, AFuelTrimOfFourBanksHasTwoBytes)
+{
+    obd::FuelTrim::setByteBInUse(true);
+    for (int const pid : {0x06, 0x09, 0x55, 0x58}) {
+        EXPECT_EQ(ParameterFactory::dataLength(id(pid)), 2U) << pid;
+    }
+    EXPECT_EQ(ParameterFactory::dataLength(id(0x05)), 1U);
+    obd::FuelTrim::setByteBInUse(false);
+    EXPECT_EQ(ParameterFactory::dataLength(id(0x06)), 1U);
 }
 
 TEST(ParameterFactory, EachCallMakesANewObject)

@@ -79,4 +79,30 @@ TEST(SensorData, ItsModelHoldsAllTexts)
     EXPECT_EQ(model->mean, "2.0");
 }
 
+TEST(SensorData, ItsModelHoldsTheNumbersUnrounded)
+{
+    obd::SensorData data(120);
+    update(data, {1.125, 4.5, 3.0625}, 0);
+    std::shared_ptr<obd::SensorValueDataModel> const model = data.model();
+    EXPECT_EQ(model->value, "3");
+    EXPECT_EQ(model->number, 3.0625);
+    ASSERT_TRUE(model->statistics);
+    EXPECT_EQ(model->statistics->minimum, 1.125);
+    EXPECT_EQ(model->statistics->maximum, 4.5);
+    EXPECT_DOUBLE_EQ(model->statistics->mean, 8.6875 / 3);
+    EXPECT_EQ(model->statistics->count, 3U);
+}
+
+TEST(SensorData, OfDigitsHasANumberWithoutStatisticsAndOfWordsNone)
+{
+    obd::SensorData data(310);
+    EXPECT_EQ(data.model()->number, std::nullopt);
+    data.update(std::make_shared<obd::TextualSensorValue>(310, "1800", 1800));
+    EXPECT_EQ(data.model()->value, "1800");
+    EXPECT_EQ(data.model()->number, 1800);
+    EXPECT_FALSE(data.model()->statistics);
+    data.update(std::make_shared<obd::TextualSensorValue>(310, "Closed loop"));
+    EXPECT_EQ(data.model()->number, std::nullopt);
+}
+
 } // namespace

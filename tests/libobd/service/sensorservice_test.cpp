@@ -223,6 +223,26 @@ TEST_F(SensorService, AFetchOfWhatTheModuleDoesNotReportHasNoStatistics)
     EXPECT_EQ(sensors[0]->value->minimum, "");
 }
 
+TEST_F(SensorService, GivesNumbersBesideTheTexts)
+{
+    open();
+    auto const speed = service->fetchSensors(pid(0x0C)).at(0)->value;
+    EXPECT_EQ(speed->number, 1726.0);
+    ASSERT_TRUE(speed->statistics);
+    EXPECT_EQ(speed->statistics->mean, 1726.0);
+
+    proxy().answer("01 11", "41 11 34");
+    auto const throttle = service->fetchSensors(pid(0x11)).at(0)->value; // of no set, so without statistics
+    EXPECT_EQ(throttle->value, "20.4");
+    EXPECT_DOUBLE_EQ(throttle->number.value(), 52 * 100.0 / 255);
+    EXPECT_FALSE(throttle->statistics);
+
+    proxy().answer("01 21", "41 21 01 02"); // digits, and a state in words
+    EXPECT_EQ(service->fetchSensors(pid(0x21)).at(0)->value->number, 258.0);
+    proxy().answer("01 1C", "41 1C 06");
+    EXPECT_EQ(service->fetchSensors(pid(0x1C)).at(0)->value->number, std::nullopt);
+}
+
 TEST_F(SensorService, AFetchMayRunBesideTheCycleOnAThreadOfItsOwn)
 {
     open();
