@@ -20,9 +20,10 @@ need() {
     as_root env DEBIAN_FRONTEND=noninteractive apt-get install -y -qq --no-install-recommends "${missing[@]}"
 }
 
-build_packages=(g++ cmake ninja-build libasio-dev libcli11-dev nlohmann-json3-dev libfmt-dev libtomlplusplus-dev)
+build_packages=(g++ cmake ninja-build libasio-dev libcli11-dev nlohmann-json3-dev libfmt-dev libtomlplusplus-dev
+    libsqlite3-dev)
 test_packages=(libgtest-dev libgmock-dev libbenchmark-dev python3-jsonschema clang libclang-rt-14-dev clang-format
-    clang-tidy)
+    clang-tidy strace)
 
 # build PRESET [TARGET...]: configures and builds.
 build() {

@@ -3,6 +3,7 @@
 #include "libvelmora/output/csvoutput.h"
 #include "libvelmora/output/influxoutput.h"
 #include "libvelmora/output/ndjsonoutput.h"
+#include "libvelmora/output/sqliteoutput.h"
 
 #include <velmora/error.h>
 
@@ -26,14 +27,16 @@ std::vector<Maker> const& makers()
 {
     static std::vector<Maker> const list = {
 #ifdef VELMORA_OUTPUT_CSV
-        {"csv", makeOf<CsvOutput>},
-        {"csv-long", makeOf<CsvLongOutput>},
+        {"csv", makeOf<CsvOutput>},       {"csv-long", makeOf<CsvLongOutput>},
 #endif
 #ifdef VELMORA_OUTPUT_NDJSON
         {"ndjson", makeOf<NdjsonOutput>},
 #endif
 #ifdef VELMORA_OUTPUT_INFLUX
         {"influx", makeInfluxOutput},
+#endif
+#ifdef VELMORA_OUTPUT_SQLITE
+        {"sqlite", makeOf<SqliteOutput>},
 #endif
     };
     return list;

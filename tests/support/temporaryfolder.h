@@ -13,9 +13,9 @@ namespace testsupport {
 class TemporaryFolder
 {
 public:
-    TemporaryFolder()
+    explicit TemporaryFolder(std::filesystem::path const& parent = std::filesystem::temp_directory_path())
     {
-        std::string name = (std::filesystem::temp_directory_path() / "velmora-test-XXXXXX").string();
+        std::string name = (parent / "velmora-test-XXXXXX").string();
         if (::mkdtemp(name.data()) == nullptr) {
             throw std::runtime_error("no temporary folder");
         }

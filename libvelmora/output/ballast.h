@@ -1,0 +1,27 @@
+#pragma once
+
+#include <filesystem>
+
+namespace velmora {
+
+// A file that holds room on the disk for a database: on a full one not even deleting rows or emptying the write-ahead
+// file works, for both write first.
+class Ballast
+{
+public:
+    // Beside the database, that many bytes.
+    Ballast(std::filesystem::path const& database, unsigned long long size);
+
+    // Writes the file if it is missing and the disk has room for it four times over. False without it.
+    bool keep();
+    // False if there was none.
+    bool drop();
+
+    std::filesystem::path const& file() const { return m_file; }
+
+private:
+    std::filesystem::path const m_file;
+    unsigned long long const m_size;
+};
+
+} // namespace velmora
