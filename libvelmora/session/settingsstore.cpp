@@ -1,10 +1,13 @@
 #include "libvelmora/session/settingsstore.h"
 
+#include "libvelmora/session/vehiclesettings.h"
+
 #include <velmora/error.h>
 
 #include <toml++/toml.h>
 
 #include <cerrno>
+#include <cmath>
 #include <cstdlib>
 #include <cstring>
 #include <fcntl.h>
@@ -42,26 +45,41 @@ void visitLeaves(toml::table const& table, std::string const& prefix, Visit visi
     }
 }
 
+// The number of the error, or 0.
+int writeAll(int file, std::string const& text)
+{
+    std::size_t written = 0;
+    while (written < text.size()) {
+        ssize_t const count = ::write(file, text.data() + written, text.size() - written);
+        if (count < 0 && errno != EINTR) {
+            return errno;
+        }
+        written += count > 0 ? static_cast<std::size_t>(count) : 0;
+    }
+    return ::fsync(file) != 0 ? errno : 0;
+}
+
+// Makes sure that the new name, too, outlives a loss of power.
+void syncFolder(std::filesystem::path const& target)
+{
+    std::filesystem::path const folder = target.has_parent_path() ? target.parent_path() : ".";
+    int const handle = ::open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+    if (handle >= 0) {
+        ::fsync(handle);
+        ::close(handle);
+    }
+}
+
+// Whoever reads the file, and whenever the process ends, finds the old content or the new. Each writer has a temporary
+// file of its own.
 void writeWhole(std::filesystem::path const& target, std::string const& text)
 {
-    std::filesystem::path const temporary = target.string() + ".new";
-    int const file = ::open(temporary.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0600);
+    std::string temporary = target.string() + ".XXXXXX";
+    int const file = ::mkostemp(temporary.data(), O_CLOEXEC);
     if (file < 0) {
         failWrite(target, errno);
     }
-    std::size_t written = 0;
-    int error = 0;
-    while (written < text.size() && error == 0) {
-        ssize_t const count = ::write(file, text.data() + written, text.size() - written);
-        if (count < 0 && errno != EINTR) {
-            error = errno;
-        } else if (count > 0) {
-            written += static_cast<std::size_t>(count);
-        }
-    }
-    if (error == 0 && ::fsync(file) != 0) {
-        error = errno;
-    }
+    int error = writeAll(file, text);
     ::close(file);
     if (error == 0 && std::rename(temporary.c_str(), target.c_str()) != 0) {
         error = errno;
@@ -70,6 +88,7 @@ void writeWhole(std::filesystem::path const& target, std::string const& text)
         ::unlink(temporary.c_str());
         failWrite(target, error);
     }
+    syncFolder(target);
 }
 
 // A value that a user wrote in the place of a group gives way to it.
@@ -101,6 +120,8 @@ SettingsStore::SettingsStore(std::filesystem::path file) : m_file(std::move(file
                 m_values[key] = static_cast<int>(*number);
             } else if (auto const text = node.value_exact<std::string>()) {
                 m_values[key] = *text;
+            } else if (int stored = 0; storedHundredths(key, node.value_exact<double>().value_or(NAN), stored)) {
+                m_values[key] = stored;
             } else {
                 failRead(m_file, key + " is neither a whole number nor a text");
             }
@@ -134,6 +155,12 @@ bool SettingsStore::get(std::string const& key, T& value)
     }
     value = std::get<T>(found->second);
     return true;
+}
+
+void SettingsStore::remove(std::string const& key)
+{
+    std::lock_guard const lock(m_mutex);
+    m_values.erase(key);
 }
 
 bool SettingsStore::getInt(std::string const& key, int& value)

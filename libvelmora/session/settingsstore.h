@@ -12,7 +12,7 @@ namespace velmora {
 
 // The library's settings in a TOML file, one table a group: the key "common/unitsystem" is unitsystem in [common]. The
 // file is read once and written as a whole, to a temporary file first, so that a crash or a full disk never loses the
-// old one.
+// old one. A number with a point is understood where hundredths are stored.
 class SettingsStore : public obd::ISettings
 {
 public:
@@ -23,6 +23,8 @@ public:
     void setString(std::string const& key, std::string const& value) override;
     bool getInt(std::string const& key, int& value) override;
     bool getString(std::string const& key, std::string& value) override;
+    // As if the key had never been set.
+    void remove(std::string const& key);
     // Writes the file. Throws Error if it can't.
     void sync() override;
 

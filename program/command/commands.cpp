@@ -17,9 +17,11 @@ void addCommands(CommandLine& commandLine)
     addInfoCommand(commandLine);
     addRoutinesCommand(commandLine);
     addDtcCommand(commandLine);
+    addVinCommand(commandLine);
     addConsoleCommand(commandLine);
     addLogCommand(commandLine);
     addRecordCommand(commandLine);
+    addSettingsCommand(commandLine);
     addSimulateCommand(commandLine);
     addPortsCommand(commandLine);
 }

@@ -25,6 +25,8 @@ void addRecordCommand(CommandLine& commandLine);
 void addRoutinesCommand(CommandLine& commandLine);
 void addScanCommand(CommandLine& commandLine);
 void addSensorsCommand(CommandLine& commandLine);
+void addSettingsCommand(CommandLine& commandLine);
 void addSimulateCommand(CommandLine& commandLine);
+void addVinCommand(CommandLine& commandLine);
 
 } // namespace velmora

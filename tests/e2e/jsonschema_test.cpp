@@ -23,6 +23,10 @@ TEST(JsonSchema, HoldsForCommandsWithoutAVehicle)
 {
     expectValid(runVelmora({"--json", "ports"}).out, "ports");
     expectValid(runVelmora({"--json", "dtc", "P0420", "P1000"}).out, "dtc");
+    expectValid(runVelmora({"--json", "vin", "1M8GDM9AXKP042788"}).out, "vin");
+    expectValid(runVelmora({"--json", "vin", "TM9ZZZ1Z000000001"}).out, "vin");
+    expectValid(runVelmora({"--json", "--settings", "/no/such/file", "settings"}).out, "settings");
+    expectValid(runVelmora({"--json", "--settings", "/no/such/file", "settings", "weight"}).out, "setting");
     expectValid(runVelmora({"--json", "dtc", "--search", "catalyst"}).out, "dtcRows");
 }
 

@@ -4,8 +4,11 @@
 
 #include <gtest/gtest.h>
 
+#include <csignal>
 #include <filesystem>
 #include <fstream>
+#include <sys/resource.h>
+#include <sys/wait.h>
 #include <unistd.h>
 
 namespace {
@@ -64,6 +67,27 @@ TEST_F(Settings, ReadsTablesAsGroupsOfKeys)
     EXPECT_FALSE(store.getInt("velmora/port", number)) << "a text is no number";
 }
 
+TEST_F(Settings, TakesANumberWithAPointWhereHundredthsAreStored)
+{
+    write("[common]\nenginedisplacement = 1.6\nfuelcorrectionfactor = 1.15\nvolumetricefficiency = 90\n");
+    SettingsStore store(m_file);
+    int number = 0;
+    EXPECT_TRUE(store.getInt("common/enginedisplacement", number));
+    EXPECT_EQ(number, 160);
+    EXPECT_TRUE(store.getInt("common/fuelcorrectionfactor", number));
+    EXPECT_EQ(number, 115) << "not cut to 114";
+}
+
+TEST_F(Settings, ForgetsAKey)
+{
+    SettingsStore store(m_file);
+    store.setInt("common/unitsystem", 1);
+    store.remove("common/unitsystem");
+    store.remove("common/unitsystem");
+    int number = 0;
+    EXPECT_FALSE(store.getInt("common/unitsystem", number));
+}
+
 TEST_F(Settings, WhatIsSyncedIsReadBack)
 {
     {
@@ -87,7 +111,8 @@ TEST_F(Settings, WhatIsSyncedIsReadBack)
 TEST_F(Settings, BrokenFileIsToldWithItsLineAndLeftAlone)
 {
     for (char const* broken :
-         {"[common\n", "a = \n", "[common]\nunitsystem = 1.5\n", "x = [1]\n", "x = 9999999999\n"}) {
+         {"[common\n", "a = \n", "[common]\nunitsystem = 1.5\n", "[common]\nenginedisplacement = 1e9\n",
+          "[common]\nenginedisplacement = nan\n", "x = [1]\n", "x = 9999999999\n"}) {
         write(broken);
         EXPECT_THROW(SettingsStore{m_file}, Error) << broken;
         EXPECT_EQ(content(), broken);
@@ -108,9 +133,43 @@ TEST_F(Settings, FailingWriteLeavesTheOldFile)
     write("[common]\nunitsystem = 1\n");
     SettingsStore store(m_file);
     store.setInt("common/unitsystem", 0);
-    std::filesystem::create_directory(m_file.string() + ".new"); // in the place of the temporary file
+    rlimit old{};
+    ::getrlimit(RLIMIT_FSIZE, &old);
+    rlimit const full{4, old.rlim_max}; // as on a disk with four bytes left
+    auto const handler = std::signal(SIGXFSZ, SIG_IGN);
+    ::setrlimit(RLIMIT_FSIZE, &full);
     EXPECT_THROW(store.sync(), Error);
+    ::setrlimit(RLIMIT_FSIZE, &old);
+    std::signal(SIGXFSZ, handler);
     EXPECT_EQ(content(), "[common]\nunitsystem = 1\n");
+    auto const files = std::filesystem::directory_iterator(m_folder);
+    EXPECT_EQ(std::distance(begin(files), end(files)), 1) << "no half written file stays";
+}
+
+// A child writes without end and is killed in the middle of it.
+TEST_F(Settings, SurviveBeingKilledWhole)
+{
+    std::string const longText(50000, 'x');
+    for (int round = 0; round < 5; ++round) {
+        pid_t const child = ::fork();
+        if (child == 0) {
+            SettingsStore store(m_file);
+            for (int i = 0;; ++i) {
+                store.setString("velmora/name", longText + std::to_string(i));
+                store.sync();
+            }
+        }
+        while (!std::filesystem::exists(m_file)) {
+            ::usleep(100);
+        }
+        ::usleep(2000);
+        ::kill(child, SIGKILL);
+        ::waitpid(child, nullptr, 0);
+        SettingsStore store(m_file);
+        std::string text;
+        EXPECT_TRUE(store.getString("velmora/name", text));
+        EXPECT_TRUE(text.starts_with(longText));
+    }
 }
 
 TEST_F(Settings, LivesInTheUsersConfigurationFolder)

@@ -1,0 +1,13 @@
+#pragma once
+
+#include "libvelmora/vehicle/vin.h"
+#include "program/view/style.h"
+
+#include <string>
+
+namespace velmora {
+
+// What a vehicle identification number says, a line each.
+std::string toText(VinFacts const& facts, Style const& style);
+
+} // namespace velmora

@@ -1,0 +1,124 @@
+#include "libvelmora/session/libraryuse.h"
+#include "libvelmora/session/vehiclesettings.h"
+#include "tests/support/memorysettings.h"
+
+#include <obd/iobdvelmora.h>
+#include <obd/ivelmorasettings.h>
+#include <obd/obdvelmorabuilder.h>
+#include <velmora/error.h>
+#include <velmora/settings.h>
+
+#include <gtest/gtest.h>
+
+#include <set>
+
+namespace {
+
+using namespace velmora;
+
+class VehicleSettings : public testing::Test
+{
+protected:
+    void set(std::string const& name, std::string const& text) { setSetting(findSetting(name), text, *m_store); }
+    std::string shown(std::string const& name) { return shownSetting(findSetting(name), *m_store); }
+
+    std::shared_ptr<support::MemorySettings> m_store = std::make_shared<support::MemorySettings>();
+    LibraryUse m_use{""};
+    std::shared_ptr<obd::IObdVelmora> m_obd = obd::ObdVelmoraBuilder::createObdVelmora(0, 0, 0, m_store);
+    obd::IVelmoraSettings& m_library = *m_obd->getSettings();
+};
+
+TEST_F(VehicleSettings, ReachTheLibrary)
+{
+    set("units", "imperial");
+    EXPECT_EQ(m_library.unitSystem(), obd::UnitSystem::Imperial);
+    set("displacement", "1.6");
+    EXPECT_FLOAT_EQ(m_library.engineDisplacement(), 1.6F);
+    set("efficiency", "90");
+    EXPECT_EQ(m_library.volumetricEfficiency(), 90);
+    set("weight", "1234");
+    EXPECT_EQ(m_library.vehicleWeight(), 1234);
+    set("correction", "1.15");
+    EXPECT_FLOAT_EQ(m_library.fuelCorrectionFactor(), 1.15F);
+    set("fuel", "override");
+    EXPECT_TRUE(m_library.fuelTypeOverride());
+    set("ignition", "compression");
+    EXPECT_EQ(m_library.ignitionType(), obd::IgnitionType::Compression);
+}
+
+TEST_F(VehicleSettings, DefaultsAreTheLibrarys)
+{
+    std::set<std::string> const shownDefaults = {"units metric",    "displacement 2.00", "efficiency 85", "weight 1500",
+                                                 "correction 1.00", "fuel reported",     "ignition spark"};
+    std::set<std::string> found;
+    for (VehicleSetting const& setting : vehicleSettings()) {
+        EXPECT_EQ(shownSetting(setting, *m_store), shownDefault(setting));
+        found.insert(setting.name + (" " + shownDefault(setting)));
+        set(setting.name, shownDefault(setting));
+    }
+    EXPECT_EQ(found, shownDefaults);
+    EXPECT_EQ(m_library.unitSystem(), obd::UnitSystem::Metric);
+    EXPECT_FLOAT_EQ(m_library.engineDisplacement(), 2.0F);
+    EXPECT_EQ(m_library.volumetricEfficiency(), 85);
+    EXPECT_EQ(m_library.vehicleWeight(), 1500);
+    EXPECT_FLOAT_EQ(m_library.fuelCorrectionFactor(), 1.0F);
+    EXPECT_FALSE(m_library.fuelTypeOverride());
+    EXPECT_EQ(m_library.ignitionType(), obd::IgnitionType::Spark);
+}
+
+TEST_F(VehicleSettings, UnitsAreTwoKeys)
+{
+    set("units", "imperial-uk");
+    EXPECT_EQ(m_library.unitSystem(), obd::UnitSystem::Imperial);
+    EXPECT_EQ(shown("units"), "imperial-uk");
+    set("units", "imperial");
+    EXPECT_EQ(shown("units"), "imperial");
+    set("units", "imperial-uk");
+    set("units", "metric");
+    EXPECT_EQ(shown("units"), "metric");
+    m_store->setInt(settings::gallon, 1);
+    EXPECT_EQ(shown("units"), "metric") << "which has no gallons";
+}
+
+TEST_F(VehicleSettings, WhatIsNoValueIsToldWithTheRange)
+{
+    for (auto const& [name, text, range] :
+         {std::tuple("displacement", "1.605", "0.05 to 30.00 l, with at most two digits"),
+          {"displacement", "0.04", "0.05"},
+          {"displacement", "30.01", "30.00"},
+          {"displacement", "1,6", "0.05"},
+          {"displacement", "1.6l", "0.05"},
+          {"displacement", "nan", "0.05"},
+          {"displacement", "", "0.05"},
+          {"efficiency", "85.5", "0 to 100 %"},
+          {"efficiency", "101", "0 to 100 %"},
+          {"efficiency", "-1", "0 to 100 %"},
+          {"weight", "1e99", "1 to 60000 kg"},
+          {"units", "Imperial", "metric, imperial or imperial-uk"},
+          {"ignition", "0", "spark or compression"}}) {
+        try {
+            set(name, text);
+            ADD_FAILURE() << name << " " << text;
+        } catch (Error const& error) {
+            EXPECT_EQ(error.kind(), ErrorKind::WrongUse);
+            EXPECT_NE(error.hints().at(0).find(range), std::string::npos) << error.hints().at(0);
+        }
+    }
+    for (auto const& [name, text] : {std::pair("displacement", "0.05"), {"displacement", "30"}, {"efficiency", "0"}}) {
+        set(name, text);
+    }
+    EXPECT_THROW(findSetting("color"), Error);
+}
+
+TEST_F(VehicleSettings, WhatReadsAsTheDefaultShowsAsTheDefault)
+{
+    m_store->setInt(settings::volumetricEfficiency, 101);
+    m_store->setInt(settings::ignitionType, 2);
+    m_store->setInt(settings::engineDisplacement, 5000);
+    EXPECT_EQ(shown("efficiency"), "85");
+    EXPECT_EQ(shown("ignition"), "spark");
+    EXPECT_EQ(shown("displacement"), "50.00") << "which the library takes";
+    EXPECT_FLOAT_EQ(m_library.engineDisplacement(), 50.0F);
+}
+
+} // namespace
