@@ -2,6 +2,8 @@
 
 #include "libvelmora/text/text.h"
 
+#include <fmt/format.h>
+
 #include <algorithm>
 
 namespace velmora {
@@ -134,6 +136,12 @@ std::string sensorNameOf(int pid)
         }
     }
     return {};
+}
+
+std::string sensorKey(int pid)
+{
+    std::string const name = sensorNameOf(pid);
+    return name.empty() ? fmt::format("PID_{:02X}", pid) : name;
 }
 
 } // namespace velmora

@@ -22,4 +22,7 @@ std::optional<int> findSensorName(std::string const& text);
 // The first name of a PID, empty for one without.
 std::string sensorNameOf(int pid);
 
+// The key of a PID for programs: its first name, or "PID_C2".
+std::string sensorKey(int pid);
+
 } // namespace velmora

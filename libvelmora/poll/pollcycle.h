@@ -1,0 +1,87 @@
+#pragma once
+
+#include "libvelmora/poll/deadlinescheduler.h"
+#include "libvelmora/poll/polledparameter.h"
+#include "libvelmora/poll/pollpace.h"
+#include "libvelmora/poll/pollplan.h"
+
+#include <functional>
+#include <map>
+#include <memory>
+#include <mutex>
+#include <optional>
+#include <set>
+#include <vector>
+
+namespace velmora {
+
+// What a sensor was to be read at, and what came of it.
+struct PollRate
+{
+    unsigned int module = 0;
+    unsigned char pid = 0;
+    std::optional<double> asked; // hertz
+    double reached = 0.0;        // hertz, of late
+    int silent = 0;              // turns in a row that brought no value
+};
+
+// One parameter to be polled, ready made.
+struct PollSource
+{
+    std::shared_ptr<obd::IEcu> ecu;
+    std::shared_ptr<obd::PowertrainParameter> parameter;
+    std::optional<double> hertz;
+};
+
+// The poller without its thread: takes one turn after the other, on one thread.
+class PollCycle
+{
+public:
+    using Sink = std::function<void(PollResult const& result)>;
+
+    PollCycle(std::shared_ptr<obd::IObdProxy> const& proxy, std::vector<PollSource> const& sources,
+              PollPace const& pace, PidLength length, obd::UnitSystem units, Sink sink);
+
+    // How long nothing is to be done yet.
+    std::chrono::milliseconds wait();
+    // Takes the next turn, due or not.
+    void step();
+
+    // Any thread.
+    std::vector<PollRate> rates();
+
+private:
+    using Parts = std::map<unsigned char, std::vector<unsigned char>>; // by PID
+
+    void plan();
+    bool run(PollTask const& task);
+    bool runSingle(PollTask const& task);
+    bool runMulti(PollTask const& task);
+    bool runDerived(std::size_t member);
+    std::vector<unsigned char> usualInputs(PolledParameter const& parameter) const;
+    void lendGroup(PolledParameter& parameter, std::vector<unsigned char> const& pids);
+    std::map<unsigned int, Parts> fetch(std::vector<unsigned char> const& pids, std::set<unsigned int> const& modules);
+    std::optional<Parts> judge(unsigned int module, std::vector<unsigned char> const& pids,
+                               std::vector<unsigned char> const* payload);
+    bool finish(std::size_t member);
+
+    PollWire m_wire;
+    PollPace const m_pace;
+    PidLength const m_length;
+    Sink const m_sink;
+    std::vector<PollWish> m_wishes;
+    std::vector<std::unique_ptr<PolledParameter>> m_parameters; // one for each wish
+    MultiLimits m_limits;
+    std::vector<PollTask> m_tasks;
+    std::vector<int> m_failures; // in a row, for each task
+    DeadlineScheduler m_scheduler;
+    PollTime m_notBefore{};
+    bool m_limitsChanged = false;
+
+    std::mutex m_mutex;
+    PollTime m_now{};                // of the last turn; protected by m_mutex
+    std::vector<RateMeter> m_meters; // one for each wish; protected by m_mutex
+    std::vector<int> m_silent;       // one for each wish; protected by m_mutex
+};
+
+} // namespace velmora

@@ -1,0 +1,56 @@
+#include "libvelmora/poll/poller.h"
+
+#include <common/clock.h>
+#include <obd/parameterfactory.h>
+
+#include <algorithm>
+
+namespace velmora {
+
+namespace {
+
+constexpr std::chrono::milliseconds longestSleep{20}; // so that the end is not waited for
+
+// On a vehicle of four banks some trims come with the value of a second bank, on others without: such are asked alone.
+bool isTrim(unsigned char pid)
+{
+    return (pid >= 0x06 && pid <= 0x09) || (pid >= 0x55 && pid <= 0x58);
+}
+
+PidLength lengths(std::vector<PollSource> const& sources)
+{
+    bool const fourBanks = std::any_of(sources.begin(), sources.end(), [](PollSource const& source) {
+        return source.ecu->oxygenSensorBanks() == obd::OxygenSensorBank::Pid1D;
+    });
+    return [fourBanks](unsigned char pid) {
+        return fourBanks && isTrim(pid) ? std::nullopt
+                                        : obd::ParameterFactory::dataLength(obd::ParameterIdentifier(pid).id());
+    };
+}
+
+} // namespace
+
+Poller::Poller(std::shared_ptr<obd::IObdProxy> const& proxy, std::vector<PollSource> const& sources,
+               PollPace const& pace, obd::UnitSystem units, PollCycle::Sink sink)
+    : m_cycle(proxy, sources, pace, lengths(sources), units, std::move(sink)), m_thread([this] { run(); })
+{}
+
+Poller::~Poller()
+{
+    m_stop = true;
+    m_thread.join();
+}
+
+void Poller::run()
+{
+    while (!m_stop) {
+        std::chrono::milliseconds const wait = std::min(m_cycle.wait(), longestSleep);
+        if (wait.count() > 0) {
+            tervex::sleepMillis(static_cast<unsigned int>(wait.count()));
+        } else {
+            m_cycle.step();
+        }
+    }
+}
+
+} // namespace velmora

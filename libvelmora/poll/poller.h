@@ -1,0 +1,33 @@
+#pragma once
+
+#include "libvelmora/poll/pollcycle.h"
+
+#include <atomic>
+#include <thread>
+
+namespace velmora {
+
+// Reads live values on a thread of its own, straight through the library's proxy, for as long as it lives. It goes on
+// over failed requests; whether the link still stands is for its owner to find out.
+class Poller
+{
+public:
+    // sink is called on the poller's thread for everything that was read; it must not destroy the poller.
+    Poller(std::shared_ptr<obd::IObdProxy> const& proxy, std::vector<PollSource> const& sources, PollPace const& pace,
+           obd::UnitSystem units, PollCycle::Sink sink);
+    // Ends the thread; a request that is on its way is waited for.
+    ~Poller();
+    Poller(Poller const&) = delete;
+    Poller& operator=(Poller const&) = delete;
+
+    std::vector<PollRate> rates() { return m_cycle.rates(); }
+
+private:
+    void run();
+
+    PollCycle m_cycle;
+    std::atomic<bool> m_stop{false};
+    std::thread m_thread;
+};
+
+} // namespace velmora

@@ -1,0 +1,41 @@
+#pragma once
+
+#include "libvelmora/poll/answernotes.h"
+
+#include <obd/iobdproxy.h>
+
+#include <chrono>
+#include <cstdint>
+#include <memory>
+
+namespace velmora {
+
+// The way of the poller's requests to the vehicle: keeps the gap between them, and notes who answered what and when.
+class PollWire
+{
+public:
+    using Time = AnswerNotes::Time;
+
+    PollWire(std::shared_ptr<obd::IObdProxy> proxy, std::chrono::milliseconds gap);
+
+    obd::IDevice::Status execute(std::vector<unsigned char> const& request, obd::ResponseMap& responses,
+                                 unsigned int timeoutMs);
+
+    obd::IObdProxy& proxy() const { return *m_proxy; }
+    AnswerNotes& notes() { return m_notes; }
+
+    // The library's clock, unwrapped.
+    Time now();
+
+private:
+    void keepGap();
+
+    std::shared_ptr<obd::IObdProxy> m_proxy;
+    std::chrono::milliseconds m_gap;
+    AnswerNotes m_notes;
+    Time m_next; // no request before
+    Time m_now{std::chrono::hours(1)};
+    std::uint32_t m_millis;
+};
+
+} // namespace velmora

@@ -1,0 +1,42 @@
+#include "libvelmora/read/oxygencurrent.h"
+
+#include <fmt/format.h>
+
+#include <charconv>
+
+namespace velmora {
+
+namespace {
+
+constexpr int firstUid = 0x34 * 10 + 1;
+constexpr int lastUid = 0x3B * 10 + 1;
+constexpr double offset = 128.0; // mA
+
+} // namespace
+
+bool isOxygenCurrent(int uid)
+{
+    return uid >= firstUid && uid <= lastUid && uid % 10 == 1;
+}
+
+double shownNumber(int uid, double number)
+{
+    return isOxygenCurrent(uid) ? number - offset : number;
+}
+
+std::string shownText(int uid, std::string const& text)
+{
+    if (!isOxygenCurrent(uid)) {
+        return text;
+    }
+    double number = 0.0;
+    auto const [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
+    if (error != std::errc() || end != text.data() + text.size()) {
+        return text;
+    }
+    std::size_t const point = text.find('.');
+    std::size_t const decimals = point == std::string::npos ? 0 : text.size() - point - 1;
+    return fmt::format("{:.{}f}", shownNumber(uid, number), decimals);
+}
+
+} // namespace velmora
