@@ -187,7 +187,7 @@ private:
         if (!digits || std::stoll(text) > longestPauseMs) {
             fail("a pause is \".. \" and a number of milliseconds up to a day");
         }
-        return Time(std::stoll(text));
+        return Ms(std::stoll(text));
     }
 
     [[noreturn]] void fail(std::string const& what) const
@@ -290,7 +290,9 @@ std::string formatDialogue(Dialogue const& dialogue, std::vector<std::string> co
     for (auto const& exchange : dialogue.exchanges) {
         text += exchange.sent.empty() ? "->\n" : "-> " + escape(exchange.sent) + "\n";
         for (auto const& chunk : exchange.chunks) {
-            text += chunk.pause == Time(0) ? "" : ".. " + std::to_string(chunk.pause.count()) + "\n";
+            text += chunk.pause == Time(0)
+                        ? ""
+                        : ".. " + std::to_string(std::chrono::duration_cast<Ms>(chunk.pause).count()) + "\n";
             text += receivedLines(chunk.bytes);
         }
     }

@@ -28,7 +28,7 @@ constexpr FaultForm forms[] = {
 
 constexpr char const* usage =
     "the faults are garbage=P, nul=P, prompt=P, prompt@COMMAND, cut@BYTE, stall@BYTE:MS, slow=MS, loss@BYTE, "
-    "error:WORDS@COMMAND, error:WORDS=P, echo, quirk:NAME and seed=N";
+    "error:WORDS@COMMAND, error:WORDS=P, echo, quirk:NAME, command=MS, wait=MS, baud=RATE and seed=N";
 
 [[noreturn]] void fail(std::string const& text, std::string const& why)
 {
@@ -43,6 +43,13 @@ std::pair<std::string, std::string> splitAtLast(std::string const& text, char ch
         return {text, ""};
     }
     return {text.substr(0, at), text.substr(at + 1)};
+}
+
+std::pair<std::string, std::string> splitAtFirst(std::string const& text, char character)
+{
+    auto const at = text.find(character);
+    return at == std::string::npos ? std::pair(text, std::string())
+                                   : std::pair(text.substr(0, at), text.substr(at + 1));
 }
 
 std::optional<std::uint64_t> wholeNumber(std::string const& text)
@@ -69,7 +76,7 @@ Time timeOf(std::string const& fault, std::string const& text)
     if (!value) {
         fail(fault, "a time is a whole number of milliseconds");
     }
-    return Time(*value);
+    return Ms(*value);
 }
 
 std::uint64_t position(std::string const& fault, std::string const& text)
@@ -159,20 +166,38 @@ std::uint32_t parseSeed(std::string const& text, std::string const& number)
     return static_cast<std::uint32_t>(*value);
 }
 
+/// The line rates that adapters are made for lie in between.
+int parseBaud(std::string const& text, std::string const& value)
+{
+    constexpr std::uint64_t slowest = 300;
+    constexpr std::uint64_t fastest = 4'000'000;
+    auto const baud = wholeNumber(value);
+    if (!baud || *baud < slowest || *baud > fastest) {
+        fail(text, "a line rate is a number from 300 to 4000000");
+    }
+    return static_cast<int>(*baud);
+}
+
 } // namespace
 
 FaultPlan parseFaults(std::vector<std::string> const& texts)
 {
     const std::string quirk = "quirk:";
-    const std::string seed = "seed=";
     FaultPlan plan;
     for (auto const& text : texts) {
+        auto const [name, value] = splitAtFirst(text, '=');
         if (text == "echo") {
             plan.quirks.add(Quirk::EchoStuck);
         } else if (text.compare(0, quirk.size(), quirk) == 0) {
             plan.quirks.add(parseQuirk(text, text.substr(quirk.size())));
-        } else if (text.compare(0, seed.size(), seed) == 0) {
-            plan.seed = parseSeed(text, text.substr(seed.size()));
+        } else if (name == "seed") {
+            plan.seed = parseSeed(text, value);
+        } else if (name == "command") {
+            plan.command = timeOf(text, value);
+        } else if (name == "wait") {
+            plan.wait = timeOf(text, value);
+        } else if (name == "baud") {
+            plan.baud = parseBaud(text, value);
         } else {
             plan.faults.push_back(parseFault(text));
         }

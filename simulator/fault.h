@@ -42,6 +42,9 @@ struct FaultPlan
 {
     std::vector<Fault> faults;
     Quirks quirks;
+    std::optional<Time> command; ///< in place of the adapter's AdapterTiming; likewise the next two
+    std::optional<Time> wait;
+    std::optional<int> baud;
     std::uint32_t seed = 1;
 
     bool empty() const { return faults.empty(); }

@@ -7,7 +7,7 @@ namespace obdsim {
 namespace {
 
 constexpr char prompt = '>';
-constexpr Time errorTime{20};
+constexpr Time errorTime = Ms(20);
 
 } // namespace
 
@@ -40,7 +40,7 @@ void FaultyPeer::startCommand()
         if (fault.kind == FaultKind::Error && happens(fault, m_command)) {
             pull(now()); // the echo, which has been said before
             m_dropping = true;
-            m_output.push(now() + errorTime + m_delay, fault.word + "\r\r>");
+            m_output.push(now() + errorTime, fault.word + "\r\r>");
         }
     }
 }
@@ -73,7 +73,6 @@ void FaultyPeer::connect()
     m_output.clear();
     m_byte = 0;
     m_command = 0;
-    m_delay = Time(0);
     m_dropping = false;
     m_promptLost = false;
     m_linkUp = true;
@@ -109,7 +108,7 @@ void FaultyPeer::pass(char byte, Time time)
         }
         m_linkUp = m_linkUp && fault.kind != FaultKind::Loss;
         m_dropping = m_dropping || fault.kind == FaultKind::Cut;
-        m_delay += fault.kind == FaultKind::Stall ? fault.duration : Time(0);
+        time += fault.kind == FaultKind::Stall ? fault.duration : Time(0);
     }
     if (m_dropping || !m_linkUp) {
         m_dropping = m_dropping && byte != prompt;
@@ -144,7 +143,7 @@ bool FaultyPeer::chance(double probability)
 
 void FaultyPeer::put(char byte, Time time)
 {
-    Time delay = m_delay;
+    Time delay{};
     for (auto const& fault : m_plan.faults) {
         delay += fault.kind == FaultKind::Slow ? fault.duration : Time(0);
     }

@@ -37,7 +37,6 @@ private:
     std::mt19937 m_random;
     std::uint64_t m_byte = 0;    ///< bytes of output so far
     std::uint64_t m_command = 0; ///< commands received so far
-    Time m_delay{};              ///< by which stalls have shifted the output
     bool m_dropping = false;     ///< the rest of a reply, up to its prompt
     bool m_promptLost = false;   ///< the reply under way will lack its prompt
     bool m_linkUp = true;

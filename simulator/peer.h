@@ -7,8 +7,9 @@
 
 namespace obdsim {
 
-/// Virtual time of a simulated adapter, counted from its power-up.
-using Time = std::chrono::milliseconds;
+/// Virtual time of a simulated adapter, counted from its power-up. A character at 115200 baud takes 87 of these.
+using Time = std::chrono::microseconds;
+using Ms = std::chrono::milliseconds;
 
 /// The far end of a byte channel: an adapter with a car behind it.
 ///

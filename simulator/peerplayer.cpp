@@ -1,6 +1,5 @@
 #include "simulator/peerplayer.h"
 
-#include <cmath>
 #include <utility>
 
 namespace obdsim {
@@ -45,7 +44,7 @@ void PeerPlayer::disconnect()
 Time PeerPlayer::virtualNow() const
 {
     const RealMs passed = Clock::now() - m_start;
-    return m_offset + Time(static_cast<Time::rep>(std::floor(passed.count() * m_speed)));
+    return m_offset + std::chrono::floor<Time>(passed * m_speed);
 }
 
 /// Sets the timer to the peer's next output. A broken link is told at once.
@@ -59,7 +58,7 @@ void PeerPlayer::arm()
         m_timer.cancel();
         return;
     }
-    const RealMs wait{next ? static_cast<double>((*next - m_offset).count()) / m_speed : 0};
+    const RealMs wait = RealMs(next ? *next - m_offset : Time(0)) / m_speed;
     m_timer.expires_at(m_start + std::chrono::ceil<Clock::duration>(wait));
     m_timer.async_wait([this](asio::error_code const& error) {
         if (!error) {

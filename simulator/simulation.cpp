@@ -2,6 +2,7 @@
 
 #include "simulator/car/vehiclelibrary.h"
 #include "simulator/faultypeer.h"
+#include "simulator/linerate.h"
 #include "simulator/replayscript.h"
 
 namespace obdsim {
@@ -21,9 +22,22 @@ AdapterProfile adapterProfile(std::string const& key)
     return *profile;
 }
 
-std::shared_ptr<IPeer> withFaults(std::shared_ptr<IPeer> peer, FaultPlan const& plan)
+void apply(FaultPlan const& plan, AdapterProfile& profile)
 {
-    return plan.empty() ? peer : std::make_shared<FaultyPeer>(std::move(peer), plan);
+    profile.quirks.add(plan.quirks);
+    profile.timing.command = plan.command.value_or(profile.timing.command);
+    profile.timing.wait = plan.wait ? plan.wait : profile.timing.wait;
+    profile.timing.baud = plan.baud.value_or(profile.timing.baud);
+}
+
+std::shared_ptr<IPeer> onTheWire(std::shared_ptr<Adapter> const& adapter, FaultPlan const& plan)
+{
+    std::shared_ptr<IPeer> peer = adapter;
+    if (!plan.empty()) {
+        peer = std::make_shared<FaultyPeer>(std::move(peer), plan);
+    }
+    int const baud = adapter->profile().timing.baud;
+    return baud == 0 ? peer : std::make_shared<LineRate>(std::move(peer), baud);
 }
 
 } // namespace
@@ -32,9 +46,9 @@ std::shared_ptr<IPeer> simulate(SimulationOptions const& options)
 {
     const FaultPlan plan = parseFaults(options.faults);
     AdapterProfile profile = adapterProfile(options.adapter);
-    profile.quirks.add(plan.quirks);
+    apply(plan, profile);
     auto vehicle = std::make_shared<Vehicle>(loadVehicle(options.vehicle));
-    return withFaults(std::make_shared<Adapter>(std::move(profile), std::move(vehicle)), plan);
+    return onTheWire(std::make_shared<Adapter>(std::move(profile), std::move(vehicle)), plan);
 }
 
 std::shared_ptr<IPeer> replay(std::string const& path, std::vector<std::string> const& faults)
@@ -42,8 +56,8 @@ std::shared_ptr<IPeer> replay(std::string const& path, std::vector<std::string> 
     const FaultPlan plan = parseFaults(faults);
     auto script = std::make_shared<ReplayScript>(loadDialogue(path));
     AdapterProfile profile = profileForBanner(script->banner());
-    profile.quirks.add(plan.quirks);
-    return withFaults(std::make_shared<Adapter>(std::move(profile), nullptr, std::move(script)), plan);
+    apply(plan, profile);
+    return onTheWire(std::make_shared<Adapter>(std::move(profile), nullptr, std::move(script)), plan);
 }
 
 std::vector<std::string> simulatedVehicles()

@@ -10,7 +10,7 @@ namespace velmora {
 namespace {
 
 // Shorter ones come of the line and the system. They are not lost: they add up until they make one that counts.
-constexpr obdsim::Time shortestPause{20};
+constexpr obdsim::Time shortestPause = obdsim::Ms(20);
 
 bool asks(obdsim::Exchange const& exchange, char const* command)
 {

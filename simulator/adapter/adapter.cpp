@@ -8,10 +8,14 @@ namespace obdsim {
 namespace {
 
 constexpr char carriageReturn = '\r';
-constexpr Time commandTime{4};
-constexpr Time slowPrompt{250};
+constexpr Time slowPrompt = Ms(250);
 constexpr std::size_t longestLine = 254;
-constexpr std::size_t canDataLimit = 8;
+
+/// Data bytes that a request may have (ELM327 data sheet v1.4b, page 28): seven, or eight after ATAL or with PCI byte.
+std::size_t longestRequest(Settings const& settings)
+{
+    return settings.longMessages || !settings.formatting ? 8 : 7;
+}
 
 std::string chipCommand(std::string const& line)
 {
@@ -21,9 +25,9 @@ std::string chipCommand(std::string const& line)
 } // namespace
 
 Adapter::Adapter(AdapterProfile profile, std::shared_ptr<Vehicle> vehicle, std::shared_ptr<IScript> script)
-    : m_profile(std::move(profile)), m_script(std::move(script)), m_bus(std::move(vehicle), m_profile.quirks)
+    : m_profile(std::move(profile)), m_script(std::move(script)), m_settings(factorySettings(m_profile)),
+      m_bus(std::move(vehicle), m_profile)
 {
-    m_settings.linefeeds = has(Quirk::LinefeedsOn);
     Adapter::connect();
 }
 
@@ -61,7 +65,7 @@ void Adapter::connect()
     m_state = State::Ready;
     m_firstCommand = true;
     if (has(Quirk::Greeting)) {
-        sayRaw(Time(20), "+CONNECTING<<00:00:00:00:00:00\r\n");
+        sayRaw(Ms(20), "+CONNECTING<<00:00:00:00:00:00\r\n");
     }
 }
 
@@ -87,7 +91,7 @@ void Adapter::receiveOne(char character)
         return;
     case State::Asleep:
         m_state = State::Ready;
-        answerReset({{m_profile.banner}, After::Reset, Time(100)});
+        answerReset({{m_profile.banner}, After::Reset, Ms(100)});
         return;
     case State::AwaitingRate:
         if (character == carriageReturn) {
@@ -105,7 +109,8 @@ void Adapter::receiveOne(char character)
         say(Time(0), std::string(1, character));
     }
     if (character != carriageReturn) {
-        m_line += character;
+        // One character too many marks the line as too long; the others are forgotten.
+        m_line += m_line.size() <= longestLine ? std::string(1, character) : "";
         return;
     }
     sayRaw(Time(0), std::exchange(m_heldBack, ""));
@@ -126,16 +131,20 @@ void Adapter::settle()
 void Adapter::stop()
 {
     m_output.clear();
-    say(commandTime, "STOPPED\r");
-    finish(commandTime);
+    say(m_profile.timing.command, "STOPPED\r");
+    finish(m_profile.timing.command);
     m_state = State::Deaf;
-    m_stateUntil = m_now + commandTime;
+    m_stateUntil = m_now + m_profile.timing.command;
 }
 
 void Adapter::execute(std::string const& line)
 {
     std::string command = normaliseCommand(line);
     bool const first = std::exchange(m_firstCommand, false);
+    if (first && has(Quirk::FirstSwallowed)) {
+        return;
+    }
+    m_promptLost = first && has(Quirk::FirstPromptLost);
     if (first && has(Quirk::StoppedFirst)) {
         answer(obdsim::line("STOPPED"));
         return;
@@ -170,7 +179,7 @@ void Adapter::executeCommand(std::string const& command)
         return;
     }
     if (command == "ATE0" && has(Quirk::PromptLate)) {
-        say(commandTime, reply.lines.front());
+        say(m_profile.timing.command, reply.lines.front());
         m_heldBack = "\r\r>";
         return;
     }
@@ -207,7 +216,7 @@ void Adapter::executeRequest(std::string const& request)
     bool const counted = request.size() % 2 != 0;
     auto const data = parseHex(counted ? request.substr(0, request.size() - 1) : request);
     bool const countRefused = counted && has(Quirk::NoCountDigit);
-    if (!data || data->empty() || data->size() > canDataLimit || countRefused) {
+    if (!data || data->empty() || data->size() > longestRequest(m_settings) || countRefused) {
         answer(refused());
         return;
     }
@@ -215,15 +224,15 @@ void Adapter::executeRequest(std::string const& request)
     if (counted) {
         busRequest.expected = static_cast<int>(parseHexNumber(request.substr(request.size() - 1)).value_or(1));
     }
-    const BusReply reply = m_bus.request(busRequest, m_settings, m_now);
+    const BusReply reply = m_bus.request(busRequest, m_settings, m_now + m_profile.timing.command);
     for (auto const& part : reply.texts) {
-        say(commandTime + part.delay, part.text);
+        say(m_profile.timing.command + part.delay, part.text);
     }
     m_state = State::Busy;
-    m_stateUntil = m_now + commandTime + reply.end;
+    m_stateUntil = m_now + m_profile.timing.command + reply.end;
     bool const cutShort = !m_bus.isOpen() || reply.texts.empty() || reply.texts.back().text != "OK\r";
     if (cutShort) {
-        finish(commandTime + reply.end);
+        finish(m_profile.timing.command + reply.end);
     }
 }
 
@@ -233,14 +242,14 @@ bool Adapter::playScript(std::optional<std::vector<TimedText>> const& texts)
         return false;
     }
     for (auto const& part : *texts) {
-        sayRaw(commandTime + part.delay, part.text);
+        sayRaw(m_profile.timing.command + part.delay, part.text);
     }
     return true;
 }
 
 void Adapter::answer(CommandReply const& reply)
 {
-    const Time delay = commandTime + reply.delay;
+    const Time delay = m_profile.timing.command + reply.delay;
     if (reply.after == After::Monitor) {
         m_state = State::Monitoring;
         return;
@@ -260,7 +269,7 @@ void Adapter::answer(CommandReply const& reply)
 
 void Adapter::answerReset(CommandReply const& reply)
 {
-    const Time delay = commandTime + reply.delay;
+    const Time delay = m_profile.timing.command + reply.delay;
     if (has(Quirk::QuestionBeforeBanner)) {
         say(delay, "?\r");
     }
@@ -283,9 +292,9 @@ void Adapter::answerReset(CommandReply const& reply)
 /// back to the old rate and its prompt.
 void Adapter::answerBaudRate()
 {
-    constexpr Time switching{10};
-    say(commandTime + switching, m_profile.banner + "\r");
-    const Time wait = commandTime + switching + m_settings.baudWait;
+    constexpr Time switching = Ms(10);
+    say(m_profile.timing.command + switching, m_profile.banner + "\r");
+    const Time wait = m_profile.timing.command + switching + m_settings.baudWait;
     finish(wait);
     m_state = State::AwaitingRate;
     m_stateUntil = m_now + wait;
@@ -295,8 +304,8 @@ void Adapter::confirmRate()
 {
     m_output.clear();
     m_state = State::Ready;
-    say(commandTime, "OK\r");
-    finish(commandTime);
+    say(m_profile.timing.command, "OK\r");
+    finish(m_profile.timing.command);
 }
 
 /// The end of a reply: an empty line and the prompt.
@@ -304,7 +313,7 @@ void Adapter::finish(Time delay)
 {
     const Time prompt = delay + (has(Quirk::PromptSlow) ? slowPrompt : Time(0));
     say(prompt, has(Quirk::SingleReturn) ? "" : "\r");
-    sayRaw(prompt, ">");
+    sayRaw(prompt, m_promptLost ? "" : ">");
 }
 
 void Adapter::say(Time delay, std::string const& text)
@@ -324,7 +333,7 @@ void Adapter::say(Time delay, std::string const& text)
 void Adapter::sayRaw(Time delay, std::string const& text)
 {
     constexpr std::size_t piece = 5;
-    constexpr Time gap{15};
+    constexpr Time gap = Ms(15);
     if (!has(Quirk::Pieces)) {
         m_output.push(m_now + delay, text);
         return;

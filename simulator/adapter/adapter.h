@@ -82,6 +82,7 @@ private:
     Time m_stateUntil{};
     State m_state = State::Ready;
     bool m_firstCommand = true;
+    bool m_promptLost = false; ///< the reply under way ends without its prompt
 };
 
 } // namespace obdsim

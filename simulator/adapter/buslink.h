@@ -1,48 +1,16 @@
 #pragma once
 
-#include "simulator/adapter/profile.h"
-#include "simulator/adapter/settings.h"
-#include "simulator/car/vehicle.h"
-
-#include <memory>
+#include "simulator/adapter/buswire.h"
 
 namespace obdsim {
-
-/// Text of a reply and when it is said, counted from the request. Lines end in CR.
-struct TimedText
-{
-    Time delay{};
-    std::string text;
-};
-
-/// The text of one reply, without the final CR and prompt, and its duration.
-struct BusReply
-{
-    std::vector<TimedText> texts;
-    Time end{};
-};
-
-/// A frame and when it comes, counted from the end of the request.
-struct TimedFrame
-{
-    Time time{};
-    Frame frame;
-};
-
-/// A request from the host.
-struct BusRequest
-{
-    Bytes data;
-    std::optional<int> expected; ///< number of frames to wait for
-};
 
 /// The bus side of an adapter: the chosen protocol, the search, the wake-up of the
 /// K line, and the requests.
 class BusLink
 {
 public:
-    /// `vehicle` may be null: a socket without a car. `quirks` must outlive this.
-    BusLink(std::shared_ptr<Vehicle> vehicle, Quirks const& quirks);
+    /// `vehicle` may be null: a socket without a car. `profile` must outlive this.
+    BusLink(std::shared_ptr<Vehicle> vehicle, AdapterProfile const& profile);
 
     /// ATSP and ATTP: 0 for automatic. `automatic`: search if it fails.
     void select(int number, bool automatic);
@@ -68,6 +36,7 @@ public:
     /// The protocol whose formats are in use; null before a search has found it.
     Protocol const* protocol() const;
 
+    /// `now`: when the adapter begins to work on it.
     BusReply request(BusRequest const& request, Settings const& settings, Time now);
 
     /// ATSI and ATFI: wakes the bus.
@@ -86,12 +55,11 @@ private:
     bool search(BusReply& reply);
     bool start(BusReply& reply);
     bool reaches(Protocol const& protocol) const;
-    BusReply exchange(BusRequest const& request, Settings const& settings, BusReply reply, Time now);
-    std::vector<TimedFrame> send(BusRequest const& request, Settings const& settings, Time at);
     void fail(BusReply& reply) const;
 
     std::shared_ptr<Vehicle> m_vehicle;
     Quirks const& m_quirks;
+    BusWire m_wire;
     int m_number = 0;
     bool m_automatic = true;
     int m_storedNumber = 0;

@@ -31,7 +31,7 @@ const Command commands[] = {
     {"!00", "", 10, diamex, identifier},
     {"!01", "", 10, diamex, description},
     {"!10", "", 10, diamex, voltage},
-    {"AL", "", 10, all, accept},
+    {"AL", "", 10, all, turn<&Settings::longMessages, true>},
     {"AMC", "", 21, elm, accept},
     {"AMT", "hh", 21, elm, accept},
     {"AR", "", 12, all, automaticReceive},
@@ -79,7 +79,7 @@ const Command commands[] = {
     {"MR", "hh", 10, all, monitor},
     {"MT", "hh", 10, all, monitor},
     {"N", "", 10, diamex, protocolNumber},
-    {"NL", "", 10, all, accept},
+    {"NL", "", 10, all, turn<&Settings::longMessages, false>},
     {"P", "h", 10, diamex, diamexProtocol},
     {"PA", "h", 10, diamex, diamexTryProtocol},
     {"PB", "hhhh", 14, all, accept},
@@ -172,6 +172,15 @@ std::optional<CommandCall> findCommand(AdapterProfile const& profile, std::strin
         return findCommand(profile, text.substr(0, text.size() - 1));
     }
     return call;
+}
+
+Settings factorySettings(AdapterProfile const& profile)
+{
+    constexpr int stnTicks = 0x19; // 102 ms; family reference manual of the STN11xx and STN21xx, page 17
+    Settings settings;
+    settings.linefeeds = profile.quirks.has(Quirk::LinefeedsOn);
+    settings.defaultTicks = profile.family == AdapterFamily::Stn ? stnTicks : settings.defaultTicks;
+    return settings;
 }
 
 CommandReply ok()

@@ -54,6 +54,9 @@ struct CommandCall
     std::string argument;
 };
 
+/// The settings after power-up.
+Settings factorySettings(AdapterProfile const& profile);
+
 /// Finds the AT command in `text` (normalised, without "AT") for an adapter.
 std::optional<CommandCall> findCommand(AdapterProfile const& profile, std::string const& text);
 

@@ -37,7 +37,9 @@ std::string FrameWriter::canLines(Frame const& frame) const
     if (!headersShown()) {
         return formatting ? formattedCan(frame) : text(frame.data) + "\r";
     }
-    const Bytes data = formatting ? withoutPadding(frame.data) : frame.data;
+    // A genuine ELM327 prints every byte that it has received, the padding too (data sheet v2.1, page 41).
+    bool const cut = formatting && m_quirks.has(Quirk::PaddingCut);
+    const Bytes data = cut ? withoutPadding(frame.data) : frame.data;
     return header(frame) + text(data) + "\r";
 }
 

@@ -7,8 +7,8 @@ namespace obdsim::handler {
 
 namespace {
 
-constexpr Time resetTime{800};
-constexpr Time baudWaitStep{5};
+constexpr Time resetTime = Ms(800);
+constexpr Time baudWaitStep = Ms(5);
 
 // ATPPS: the programmable parameters of a v1.5 as delivered, number:value F(actory)/N.
 constexpr char const* parameterLines[] = {
@@ -32,8 +32,7 @@ CommandReply accept(CommandContext& /*context*/, std::string const& /*argument*/
 
 CommandReply reset(CommandContext& context, std::string const& /*argument*/)
 {
-    context.settings = Settings{};
-    context.settings.linefeeds = context.profile.quirks.has(Quirk::LinefeedsOn);
+    context.settings = factorySettings(context.profile);
     context.bus.restore();
     return {{context.profile.banner}, After::Reset, resetTime};
 }
@@ -41,8 +40,7 @@ CommandReply reset(CommandContext& context, std::string const& /*argument*/)
 CommandReply defaults(CommandContext& context, std::string const& /*argument*/)
 {
     bool const echo = context.settings.echo;
-    context.settings = Settings{};
-    context.settings.linefeeds = context.profile.quirks.has(Quirk::LinefeedsOn);
+    context.settings = factorySettings(context.profile);
     context.settings.echo = echo || !context.profile.quirks.has(Quirk::EchoKeptOff);
     context.bus.restore();
     return ok();

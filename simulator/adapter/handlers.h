@@ -51,4 +51,11 @@ CommandReply onOff(CommandContext& context, std::string const& argument)
     return ok();
 }
 
+template <bool Settings::*member, bool value>
+CommandReply turn(CommandContext& context, std::string const& /*argument*/)
+{
+    context.settings.*member = value;
+    return ok();
+}
+
 } // namespace obdsim::handler

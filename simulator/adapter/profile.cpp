@@ -11,24 +11,24 @@ constexpr char const* elmDescription = "OBDII to RS232 Interpreter";
 
 // clang-format off
 const AdapterProfile profiles[] = {
-    {"elm327-v1.5", AdapterFamily::Elm, "ELM327 v1.5", elmDescription, "", 14, "", {}},
+    {"elm327-v1.5", AdapterFamily::Elm, "ELM327 v1.5", elmDescription, "", 14, "", {Quirk::PaddingCut}},
     {"elm327-v1.2", AdapterFamily::Elm, "ELM327 v1.2", elmDescription, "", 12, "", {}},
     {"elm327-v1.3a", AdapterFamily::Elm, "ELM327 v1.3a", elmDescription, "", 13, "", {}},
     {"elm327-v1.4", AdapterFamily::Elm, "ELM327 v1.4", elmDescription, "", 14, "", {}},
-    {"elm327-v2.1", AdapterFamily::Elm, "ELM327 v2.1", elmDescription, "", 14, "", {}},
+    {"elm327-v2.1", AdapterFamily::Elm, "ELM327 v2.1", elmDescription, "", 14, "", {Quirk::PaddingCut}},
     {"elm327-v2.2", AdapterFamily::Elm, "ELM327 v2.2", elmDescription, "", 22, "", {}},
     {"elm327-v2.3", AdapterFamily::Elm, "ELM327 v2.3", elmDescription, "", 23, "", {}},
     {"stn2120", AdapterFamily::Stn, "ELM327 v2.3", elmDescription, "", 23, "STN2120 v5.8.1", {}},
     {"obdlink", AdapterFamily::Stn, "ELM327 v1.3a", elmDescription, "", 23, "STN1110 v4.2.0", {}},
     {"clone-v1.5-fake", AdapterFamily::Elm, "ELM327 v1.5", elmDescription, "", 14, "",
-        {Quirk::OkToAll, Quirk::JunkBeforeBanner}},
+        {Quirk::OkToAll, Quirk::JunkBeforeBanner, Quirk::PaddingCut}},
     {"clone-v2.1-poor", AdapterFamily::Elm, "ELM327 v2.1", elmDescription, "", 12, "",
-        {Quirk::FirstLettersOnly, Quirk::HeadersStuck, Quirk::NoCountDigit}},
-    {"obdkey", AdapterFamily::ObdKey, "OBDKey 1.30", "OBDKey Bluetooth", "KB-0130", 13, "", {}},
-    {"diamex", AdapterFamily::Diamex, "DIAMEX DXM v1.2", "DIAMEX DXM Module", "DX-20071", 13, "", {}},
-    {"kiwi", AdapterFamily::Kiwi, "PLXKiwi v1.4", "PLX Kiwi WiFi", "PLX-4711", 13, "", {}},
-    {"obdpros", AdapterFamily::ObdPros, "OBDPros v3.1", "OBDPros Scantool", "OP-3100", 12, "", {}},
-    {"unknown", AdapterFamily::Other, "CarWave Adapter 7", "CarWave Diagnostics", "CW-0007", 13, "", {}},
+        {Quirk::FirstLettersOnly, Quirk::HeadersStuck, Quirk::NoCountDigit, Quirk::PaddingCut, Quirk::RequestCut}},
+    {"obdkey", AdapterFamily::ObdKey, "OBDKey 1.30", "OBDKey Bluetooth", "KB-0130", 13, "", {Quirk::PaddingCut}},
+    {"diamex", AdapterFamily::Diamex, "DIAMEX DXM v1.2", "DIAMEX DXM Module", "DX-20071", 13, "", {Quirk::PaddingCut}},
+    {"kiwi", AdapterFamily::Kiwi, "PLXKiwi v1.4", "PLX Kiwi WiFi", "PLX-4711", 13, "", {Quirk::PaddingCut}},
+    {"obdpros", AdapterFamily::ObdPros, "OBDPros v3.1", "OBDPros Scantool", "OP-3100", 12, "", {Quirk::PaddingCut}},
+    {"unknown", AdapterFamily::Other, "CarWave Adapter 7", "CarWave Diagnostics", "CW-0007", 13, "", {Quirk::PaddingCut}},
     {"silent", AdapterFamily::Silent, "", "", "", 0, "", {}},
 };
 // clang-format on

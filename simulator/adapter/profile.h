@@ -1,6 +1,7 @@
 #pragma once
 
 #include "simulator/adapter/quirk.h"
+#include "simulator/peer.h"
 
 namespace obdsim {
 
@@ -16,6 +17,14 @@ enum class AdapterFamily : unsigned int
     Silent = 0x80 ///< nothing ever comes back
 };
 
+/// What an adapter takes of its own time.
+struct AdapterTiming
+{
+    Time command = Ms(4);     ///< from the CR of a line to the work on it
+    std::optional<Time> wait; ///< it listens that long behind each reply, whatever ATST and ATAT say
+    int baud = 0;             ///< line rate; 0: characters take no time
+};
+
 /// An adapter model.
 struct AdapterProfile
 {
@@ -27,6 +36,7 @@ struct AdapterProfile
     int level = 14;          ///< knows the ELM327 commands up to version level / 10
     std::string chip;        ///< answer to STI
     Quirks quirks;
+    AdapterTiming timing = {};
 };
 
 /// The profile of that key; null if there is none.

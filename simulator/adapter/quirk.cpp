@@ -34,13 +34,19 @@ constexpr std::string_view names[] = {
     "tight-description",
     "first-no-data",
     "frames-twice",
+    "padding-cut",
+    "count-messages",
+    "count-ignored",
+    "request-cut",
+    "first-swallowed",
+    "first-prompt-lost",
 };
 static_assert(std::size(names) == quirkCount);
-static_assert(static_cast<std::size_t>(Quirk::FramesTwice) + 1 == quirkCount);
+static_assert(static_cast<std::size_t>(Quirk::FirstPromptLost) + 1 == quirkCount);
 
-std::uint32_t bit(Quirk quirk)
+std::uint64_t bit(Quirk quirk)
 {
-    return 1U << static_cast<unsigned int>(quirk);
+    return std::uint64_t{1} << static_cast<unsigned int>(quirk);
 }
 
 } // namespace

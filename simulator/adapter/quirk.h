@@ -24,7 +24,7 @@ enum class Quirk : int
     HeadersStuck,         ///< ATH0 is accepted, headers still shown
     EchoStuck,            ///< ATE0 is accepted, the echo stays on
     EchoKeptOff,          ///< ATD leaves the echo off
-    PaddingShown,         ///< filling bytes of single frames are printed
+    PaddingShown,         ///< filling bytes of single frames are printed without headers, too
     FormattingStuck,      ///< ATCAF0 is accepted without effect
     OkToAll,              ///< any AT command is answered OK
     FirstLettersOnly,     ///< what follows a known command is ignored
@@ -36,10 +36,16 @@ enum class Quirk : int
     InitWithoutDots,      ///< BUS INIT: without its dots
     TightDescription,     ///< "AUTO,ISO ...", no blank behind the comma
     FirstNoData,          ///< the first request on a protocol gives NO DATA
-    FramesTwice           ///< each frame is printed twice
+    FramesTwice,          ///< each frame is printed twice
+    PaddingCut,           ///< single frames are cut to their PCI length with headers on, too
+    CountMessages,        ///< the expected-count digit counts whole messages
+    CountIgnored,         ///< the expected-count digit is taken and means nothing
+    RequestCut,           ///< only the first two bytes of a request go out
+    FirstSwallowed,       ///< the first command of a connection gets no reply at all
+    FirstPromptLost       ///< the first reply of a connection has no prompt
 };
 
-constexpr std::size_t quirkCount = 26;
+constexpr std::size_t quirkCount = 32;
 
 /// A set of quirks.
 class Quirks
@@ -53,7 +59,7 @@ public:
     bool has(Quirk quirk) const;
 
 private:
-    std::uint32_t m_bits = 0;
+    std::uint64_t m_bits = 0;
 };
 
 /// The quirk of a name such as "prompt-late".

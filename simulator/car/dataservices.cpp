@@ -6,7 +6,6 @@ namespace obdsim {
 
 namespace {
 
-constexpr std::size_t pidsPerRequest = 6; // SAE J1979, on CAN only
 constexpr std::uint8_t freezeFrameCode = 0x02;
 
 std::set<std::uint8_t> currentIds(Module const& module)
@@ -69,8 +68,12 @@ std::optional<Bytes> missingFrameItem(std::uint8_t number, std::uint8_t pid)
 
 Answer currentData(ServiceCall const& call)
 {
+    auto const count = static_cast<std::size_t>(call.module.data().mostPids);
+    if (call.request.size() - 1 > count && call.module.data().morePids != MorePids::First) {
+        bool const refuses = call.module.data().morePids == MorePids::Refuse;
+        return Answer{refuses ? refusal::subfunctionNotSupported : std::uint8_t{0}, {}};
+    }
     Bytes message = {call.positiveService()};
-    const std::size_t count = call.onCan() ? pidsPerRequest : 1;
     for (std::size_t i = 1; i <= count && i < call.request.size(); ++i) {
         const std::uint8_t pid = call.request[i];
         if (auto const data = currentItem(call, pid)) {

@@ -70,7 +70,7 @@ DriveModel::DriveModel(EngineData const& engine) : m_engine(engine) {}
 DriveState DriveModel::at(Time time) const
 {
     DriveState state;
-    state.seconds = static_cast<double>(time.count()) / 1000.0;
+    state.seconds = std::chrono::duration<double>(time).count();
     state.ambientCelsius = m_engine.ambientCelsius;
     state.barometricKpa = 100;
     addMotion(state);

@@ -80,14 +80,25 @@ struct VehicleInfo
 struct Pending
 {
     int times = 1;
-    Time delay{100}; ///< before each further message
+    Time delay = Ms(100); ///< before each further message
+};
+
+/// What a module makes of a request of service 01 for more PIDs than it takes.
+enum class MorePids : int
+{
+    Silence, ///< SAE J1979 has no rule for it on the buses without CAN
+    Refuse,  ///< 7F 01 12
+    First    ///< answers as many as it takes
 };
 
 /// All that a vehicle file says of one control module.
 struct ModuleData
 {
     std::uint32_t id = 0; ///< CAN identifier of its replies, or its address
-    Time latency{15};
+    Time latency = Ms(15);
+    std::optional<Time> frameGap; ///< between the frames of a long message on CAN; else as usual on that bus
+    int mostPids = 6;             ///< in one request of service 01
+    MorePids morePids = MorePids::First;
     bool refuses = false; ///< answers requests it does not know with 7F
     bool lamp = false;
     bool clearsWhileRunning = true;

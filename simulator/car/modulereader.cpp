@@ -67,7 +67,7 @@ FreezeFrame readFrame(TableReader& table)
     FreezeFrame frame;
     frame.number = static_cast<std::uint8_t>(table.integer("number", 0, 0xFF, 0));
     frame.code = readCode(table, "code", table.text("code"));
-    frame.takenAt = Time(static_cast<std::int64_t>(table.number("taken_at", 0) * 1000));
+    frame.takenAt = Ms(static_cast<std::int64_t>(table.number("taken_at", 0) * 1000));
     frame.pids = table.bytes("pids");
     table.table("values", [&](TableReader& values) { frame.values = readByteRows(values); });
     return frame;
@@ -192,7 +192,7 @@ void readRecordedOf(ModuleData& module, TableReader& table)
     table.table("delays", [&](TableReader& delays) {
         delays.tableEntries([&](const Bytes& request, TableReader& delay) {
             module.delays[request] = {delay.integer("times", 1, 100, 1),
-                                      Time(delay.integer("milliseconds", 0, longestDelayMs, 100))};
+                                      Ms(delay.integer("milliseconds", 0, longestDelayMs, 100))};
         });
     });
 }
@@ -208,6 +208,34 @@ std::uint32_t readId(TableReader& table, Protocol const& protocol)
     return *id;
 }
 
+MorePids readMorePids(TableReader& table, bool onCan)
+{
+    const std::string text = table.text("more_pids", onCan ? "first" : "silence");
+    if (text == "silence") {
+        return MorePids::Silence;
+    }
+    if (text == "refuse") {
+        return MorePids::Refuse;
+    }
+    if (text != "first") {
+        table.fail("more_pids", "\"more_pids\" must be \"silence\", \"refuse\" or \"first\"");
+    }
+    return MorePids::First;
+}
+
+/// How the module answers: when, and what it makes of several PIDs in one request.
+void readMannersOf(ModuleData& module, TableReader& table, bool onCan)
+{
+    constexpr int pidsOnCan = 6; // SAE J1979; one on the other buses
+    module.latency = Ms(table.integer("latency", 0, longestDelayMs, 15));
+    if (table.has("frame_gap")) {
+        module.frameGap = Ms(table.integer("frame_gap", 0, longestDelayMs));
+    }
+    module.refuses = table.flag("refuses", false);
+    module.mostPids = table.integer("most_pids", 1, pidsOnCan, onCan ? pidsOnCan : 1);
+    module.morePids = readMorePids(table, onCan);
+}
+
 } // namespace
 
 ModuleData readModule(TableReader& table, VehicleData const& vehicle)
@@ -215,8 +243,7 @@ ModuleData readModule(TableReader& table, VehicleData const& vehicle)
     Protocol const& protocol = *findProtocol(vehicle.protocol);
     ModuleData module;
     module.id = readId(table, protocol);
-    module.latency = Time(table.integer("latency", 0, longestDelayMs, static_cast<int>(module.latency.count())));
-    module.refuses = table.flag("refuses", false);
+    readMannersOf(module, table, isCan(protocol));
     module.live = readLive(table);
     table.table("fixed", [&](TableReader& fixed) { module.fixed = readByteRows(fixed); });
     table.table("monitors",

@@ -43,7 +43,7 @@ void tell(std::vector<ModuleMessage>& messages, Module& module, Bytes const& req
         messages.push_back({data.id, delay, {negativeResponse, request[0], answer.refusal}});
     }
     for (auto const& payload : answer.messages) {
-        messages.push_back({data.id, delay, payload});
+        messages.push_back({data.id, delay, payload, data.frameGap});
     }
 }
 

@@ -10,6 +10,7 @@ struct ModuleMessage
     std::uint32_t source = 0;
     Time delay{}; ///< from the end of the request
     Bytes payload;
+    std::optional<Time> frameGap = {}; ///< of the module, where it has one of its own
 };
 
 /// A car: its control modules on one bus.

@@ -25,6 +25,15 @@ EngineData readEngine(TableReader& table)
     return engine;
 }
 
+/// ISO 15765-4 wants frames of eight bytes, so a car that sends shorter ones has to be asked for.
+Padding readPadding(TableReader& table)
+{
+    if (table.text("padding", "00") == "none") {
+        return std::nullopt;
+    }
+    return table.has("padding") ? table.byte("padding") : std::uint8_t{0};
+}
+
 VehicleData readVehicle(TableReader& table)
 {
     VehicleData vehicle;
@@ -33,9 +42,7 @@ VehicleData readVehicle(TableReader& table)
     if (table.has("volts")) {
         vehicle.volts = table.number("volts", 0);
     }
-    if (table.has("padding")) {
-        vehicle.padding = table.byte("padding");
-    }
+    vehicle.padding = readPadding(table);
     table.table("engine", [&](TableReader& engine) { vehicle.engine = readEngine(engine); });
     table.tables("module", [&](TableReader& module) { vehicle.modules.push_back(readModule(module, vehicle)); });
     if (vehicle.modules.empty()) {

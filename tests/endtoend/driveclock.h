@@ -24,7 +24,10 @@ public:
     DriveClock(DriveClock const&) = delete;
     DriveClock& operator=(DriveClock const&) = delete;
 
-    unsigned int millis() override { return m_begin + static_cast<unsigned int>(m_car->now().count()); }
+    unsigned int millis() override
+    {
+        return m_begin + static_cast<unsigned int>(std::chrono::duration_cast<obdsim::Ms>(m_car->now()).count());
+    }
     void sleep(unsigned int ms) override
     {
         static constexpr unsigned int pollMs = 10;
@@ -35,7 +38,7 @@ public:
         if (support::DispatchLoop* const loop = m_followed) {
             loop->awaitCaughtUp();
         }
-        m_car->pass(obdsim::Time(ms));
+        m_car->pass(obdsim::Ms(ms));
     }
 
     // From now on no pause passes before the loop has dispatched what was asked of it, so that a busy machine, on which

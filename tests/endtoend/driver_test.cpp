@@ -179,7 +179,7 @@ TEST(DriverOnSimulator, noFaultMakesItHangOrCrash)
                 }
             }
             bench.device->close();
-            EXPECT_LT(bench.connection->peer().now(), obdsim::Time(600000)) << fault << " " << vehicle << " " << up;
+            EXPECT_LT(bench.connection->peer().now(), obdsim::Ms(600000)) << fault << " " << vehicle << " " << up;
         }
     }
 }

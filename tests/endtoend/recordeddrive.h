@@ -24,10 +24,10 @@ public:
     explicit KnownDrive(obdsim::EngineData const& engine) : m_model(engine) {}
 
     template <class Value>
-    Range range(obdsim::Time from, obdsim::Time to, Value value)
+    Range range(obdsim::Ms from, obdsim::Ms to, Value value)
     {
         Range range{value(at(from)), value(at(from))};
-        for (obdsim::Time time = from; time <= to; ++time) {
+        for (obdsim::Ms time = from; time <= to; ++time) {
             double const number = value(at(time));
             range = {std::min(range.low, number), std::max(range.high, number)};
         }
@@ -35,7 +35,7 @@ public:
     }
 
 private:
-    obdsim::DriveState const& at(obdsim::Time time)
+    obdsim::DriveState const& at(obdsim::Ms time)
     {
         auto found = m_states.find(time.count());
         if (found == m_states.end()) {

@@ -16,8 +16,8 @@
 struct RequestWindow
 {
     std::string command; // the first one
-    obdsim::Time sent{};
-    obdsim::Time received{};
+    obdsim::Ms sent{};
+    obdsim::Ms received{};
 };
 
 // Notes the windows of the updates in the order in which they reach the application. An update is what the worker says
@@ -43,13 +43,13 @@ public:
         std::lock_guard const lock(m_mutex);
         if (m_current.command.empty()) {
             m_current.command.assign(data.begin(), data.end());
-            m_current.sent = m_car->peer().now();
+            m_current.sent = std::chrono::duration_cast<obdsim::Ms>(m_car->peer().now());
         }
     }
     void onDataReceived(std::vector<unsigned char> const& /*data*/) override
     {
         std::lock_guard const lock(m_mutex);
-        m_current.received = m_car->peer().now();
+        m_current.received = std::chrono::duration_cast<obdsim::Ms>(m_car->peer().now());
     }
     void onDispatchRequested() override
     {

@@ -41,7 +41,7 @@ public:
             text += m_peer->advanceTo(*next);
             m_lastWait = *next - start;
         }
-        m_peer->advanceTo(m_peer->now() + obdsim::Time(1));
+        m_peer->advanceTo(m_peer->now() + obdsim::Ms(1));
         return text;
     }
 

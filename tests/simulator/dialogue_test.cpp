@@ -11,6 +11,7 @@ namespace {
 using obdsim::Dialogue;
 using obdsim::DialogueError;
 using obdsim::DialogueHeaders;
+using obdsim::Ms;
 using obdsim::parseDialogue;
 using obdsim::Time;
 
@@ -35,7 +36,7 @@ TEST(Dialogue, isReadWithEscapesAndPauses)
     EXPECT_EQ(dialogue.exchanges[1].sent, "");
     ASSERT_EQ(dialogue.exchanges[1].chunks.size(), 2U);
     EXPECT_EQ(dialogue.exchanges[1].chunks[0].bytes, "SEARCHING...\rOK\r");
-    EXPECT_EQ(dialogue.exchanges[1].chunks[1].pause, Time(800));
+    EXPECT_EQ(dialogue.exchanges[1].chunks[1].pause, Ms(800));
     EXPECT_EQ(dialogue.exchanges[1].chunks[1].bytes, "86 \r\r>");
 }
 
@@ -88,7 +89,7 @@ TEST(Dialogue, isWrittenInTheFormThatIsRead)
     dialogue.headers = DialogueHeaders::Late;
     dialogue.raw = true;
     dialogue.exchanges = {{"ATI", {{Time(0), "ELM327 v1.5\r\r>"}}},
-                          {"", {{Time(0), "A \\\t"}, {Time(12), std::string(" \0\xFF\n>", 5)}}}};
+                          {"", {{Time(0), "A \\\t"}, {Ms(12), std::string(" \0\xFF\n>", 5)}}}};
     const std::string text = obdsim::formatDialogue(dialogue, {"how it came"});
     EXPECT_EQ(text, "# how it came\nvehicle: car\nadapter: ELM327 v1.5\nprotocol: 6\nheaders: late\nraw: yes\n\n"
                     "-> ATI\n<- ELM327 v1.5\\r\\r>\n->\n<- A \\\\\\t\n.. 12\n<- \\x20\\x00\\xFF\\n>\n");

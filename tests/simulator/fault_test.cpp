@@ -7,6 +7,7 @@ namespace {
 
 using obdsim::FaultError;
 using obdsim::FaultKind;
+using obdsim::Ms;
 using obdsim::parseFaults;
 using obdsim::Time;
 
@@ -25,8 +26,8 @@ TEST(Fault, textsAreRead)
     EXPECT_EQ(plan.faults[0].probability, 0.25);
     EXPECT_EQ(plan.faults[2].kind, FaultKind::Cut);
     EXPECT_EQ(plan.faults[2].position, 120U);
-    EXPECT_EQ(plan.faults[3].duration, Time(500));
-    EXPECT_EQ(plan.faults[4].duration, Time(30));
+    EXPECT_EQ(plan.faults[3].duration, Ms(500));
+    EXPECT_EQ(plan.faults[4].duration, Ms(30));
     EXPECT_EQ(plan.faults[6].word, "BUS BUSY");
     EXPECT_EQ(plan.faults[6].position, 3U);
     EXPECT_EQ(plan.faults[7].probability, 0.5);
@@ -39,10 +40,10 @@ TEST(Fault, textsAreRead)
 TEST(Fault, wrongTextIsToldWithTheFormsThereAre)
 {
     for (char const* text :
-         {"",           "garbage", "garbage=", "garbage=2", "garbage=-1", "garbage=x",      "garbage@5",
-          "cut=3",      "cut@0",   "cut@x",    "cut@5:3",   "stall@5",    "stall=5",        "stall@5:x",
-          "slow=x",     "slow@5",  "loss=3",   "error@3",   "error:@3",   "error:BUS BUSY", "error:X@",
-          "quirk:none", "seed=x",  "fire=1",   "prompt"}) {
+         {"",       "garbage", "garbage=", "garbage=2",      "garbage=-1", "garbage=x",  "garbage@5", "cut=3",
+          "cut@0",  "cut@x",   "cut@5:3",  "stall@5",        "stall=5",    "stall@5:x",  "slow=x",    "slow@5",
+          "loss=3", "error@3", "error:@3", "error:BUS BUSY", "error:X@",   "quirk:none", "seed=x",    "baud=9",
+          "baud",   "wait=x",  "command=", "fire=1",         "prompt"}) {
         try {
             parseFaults({text});
             ADD_FAILURE() << text;
@@ -87,8 +88,10 @@ TEST(FaultyPeer, outputStallsBeforeAByte)
     host.ask("ATE0");
     host.peer().receive("ATI\r");
     const Time start = host.peer().now();
-    EXPECT_EQ(host.peer().advanceTo(start + Time(600)), "ELM");
-    EXPECT_EQ(host.peer().advanceTo(start + Time(704)), "327 v1.5\r\r>");
+    EXPECT_EQ(host.peer().advanceTo(start + Ms(600)), "ELM");
+    EXPECT_EQ(host.peer().advanceTo(start + Ms(704)), "327 v1.5\r\r>");
+    host.ask("ATI");
+    EXPECT_EQ(host.lastWait(), Ms(4)) << "one pause";
 }
 
 TEST(FaultyPeer, slowAdapterAnswersLater)
@@ -96,7 +99,7 @@ TEST(FaultyPeer, slowAdapterAnswersLater)
     auto host = faulty({"slow=300"});
     host.ask("ATE0");
     host.ask("ATI");
-    EXPECT_EQ(host.lastWait(), Time(304));
+    EXPECT_EQ(host.lastWait(), Ms(304));
 }
 
 TEST(FaultyPeer, errorWordTakesThePlaceOfAReply)

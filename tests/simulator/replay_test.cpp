@@ -5,6 +5,7 @@
 
 namespace {
 
+using obdsim::Ms;
 using obdsim::Time;
 
 Conversation replaying(std::string const& header, std::string const& turns)
@@ -95,8 +96,8 @@ TEST(Replay, pausesAreKept)
     host.ask("ATE0");
     host.peer().receive("0100\r");
     const Time start = host.peer().now();
-    EXPECT_EQ(host.peer().advanceTo(start + Time(799)), "SEARCHING...\r");
-    EXPECT_EQ(host.peer().advanceTo(start + Time(804)), "86F1124100983B2013D0\r\r>");
+    EXPECT_EQ(host.peer().advanceTo(start + Ms(799)), "SEARCHING...\r");
+    EXPECT_EQ(host.peer().advanceTo(start + Ms(804)), "86F1124100983B2013D0\r\r>");
 }
 
 TEST(Replay, repeatedReplyHasNoSearchNotice)

@@ -31,7 +31,7 @@ public:
         if (m_broken) {
             return false;
         }
-        const obdsim::Time deadline = m_peer->now() + obdsim::Time(std::max(0, timeoutMs));
+        const obdsim::Time deadline = m_peer->now() + obdsim::Ms(std::max(0, timeoutMs));
         pull(m_peer->now());
         while (m_pending.find(m_delimiter) == std::string::npos) {
             auto const next = m_peer->nextOutput();

@@ -4,13 +4,14 @@
 
 namespace {
 
+using obdsim::Ms;
 using obdsim::Time;
 
 TEST(Adapter, resetGivesEmptyLinesAndTheBanner)
 {
     auto host = simulated("petrol-can11");
     EXPECT_EQ(host.ask("ATZ"), "ATZ\r\r\rELM327 v1.5\r\r>");
-    EXPECT_GE(host.lastWait(), Time(500));
+    EXPECT_GE(host.lastWait(), Ms(500));
     EXPECT_EQ(host.ask({"ATE0", "ATZ"}), "\r\rELM327 v1.5\r\r>");
 }
 
@@ -140,7 +141,7 @@ TEST(Adapter, characterStopsARequest)
     auto host = simulated("petrol-can11");
     host.ask("ATE0");
     host.peer().receive("0100\r");
-    host.pass(Time(20));
+    host.pass(Ms(20));
     EXPECT_EQ(host.ask("ATI"), "STOPPED\r\r>") << "what comes with the character is lost";
     EXPECT_EQ(host.ask("ATI"), "ELM327 v1.5\r\r>");
 }
@@ -168,8 +169,8 @@ TEST(Adapter, rateChangeWaitsForAReturn)
     auto host = simulated("petrol-can11");
     host.ask({"ATE0", "ATBRTFF"});
     host.peer().receive("ATBRD23\r");
-    host.pass(Time(4));
-    EXPECT_EQ(host.peer().advanceTo(host.peer().now() + Time(20)), "ELM327 v1.5\r");
+    host.pass(Ms(4));
+    EXPECT_EQ(host.peer().advanceTo(host.peer().now() + Ms(20)), "ELM327 v1.5\r");
     EXPECT_EQ(host.ask(""), "OK\r\r>");
     EXPECT_EQ(host.ask("ATI"), "ELM327 v1.5\r\r>");
 }
@@ -179,7 +180,7 @@ TEST(Adapter, rateChangeWithoutReturnEndsWithThePrompt)
     auto host = simulated("petrol-can11");
     host.ask("ATE0");
     EXPECT_EQ(host.ask("ATBRD23"), "OK\rELM327 v1.5\r\r>");
-    EXPECT_EQ(host.lastWait(), Time(4 + 10 + 75));
+    EXPECT_EQ(host.lastWait(), Ms(4 + 10 + 75));
     EXPECT_EQ(host.ask("ATI"), "ELM327 v1.5\r\r>");
 }
 

@@ -4,6 +4,7 @@
 
 namespace {
 
+using obdsim::Ms;
 using obdsim::Time;
 
 constexpr char const* twoModules = R"(
@@ -38,9 +39,9 @@ TEST(BusRequest, headersAndBlanksAreShownAsChosen)
     auto host = ready(twoModules, {"ATSP6"});
     EXPECT_EQ(host.ask("0100"), "41 00 BE 3F A8 13 \r41 00 98 18 00 11 \r\r>");
     EXPECT_EQ(host.ask({"ATS0", "0100"}), "4100BE3FA813\r410098180011\r\r>");
-    EXPECT_EQ(host.ask({"ATH1", "0100"}), "7E8064100BE3FA813\r7E906410098180011\r\r>");
-    EXPECT_EQ(host.ask({"ATS1", "0100"}), "7E8 06 41 00 BE 3F A8 13 \r7E9 06 41 00 98 18 00 11 \r\r>");
-    EXPECT_EQ(host.ask({"ATD1", "010D"}), "7E8 8 03 41 0D 37 \r\r>");
+    EXPECT_EQ(host.ask({"ATH1", "0100"}), "7E8064100BE3FA81300\r7E90641009818001100\r\r>");
+    EXPECT_EQ(host.ask({"ATS1", "0100"}), "7E8 06 41 00 BE 3F A8 13 00 \r7E9 06 41 00 98 18 00 11 00 \r\r>");
+    EXPECT_EQ(host.ask({"ATD1", "010D"}), "7E8 8 03 41 0D 37 00 00 00 00 \r\r>");
 }
 
 TEST(BusRequest, longMessageHasLengthAndLineNumbersWithoutHeaders)
@@ -87,9 +88,12 @@ TEST(BusRequest, silenceLastsAsLongAsTheTimeOut)
 {
     auto host = ready(twoModules, {"ATS0", "ATSP6", "ATST64"});
     EXPECT_EQ(host.ask("015C"), "NO DATA\r\r>");
-    EXPECT_EQ(host.lastWait(), Time(404));
+    const Time before = std::chrono::microseconds(4222); // the adapter's own time, and a frame of 111 bits
+    EXPECT_EQ(host.lastWait(), before + 0x64 * std::chrono::microseconds(4096));
     host.ask({"ATST19", "015C"});
-    EXPECT_EQ(host.lastWait(), Time(104));
+    EXPECT_EQ(host.lastWait(), before + 0x19 * std::chrono::microseconds(4096));
+    host.ask({"ATST00", "015C"});
+    EXPECT_EQ(host.lastWait(), before + 0x32 * std::chrono::microseconds(4096)) << "00 is the default";
 }
 
 TEST(BusRequest, moduleSlowerThanTheTimeOutIsNotHeard)
@@ -104,7 +108,10 @@ raw = { "010D" = "41 0D 37" }
 )";
     auto host = ready(slow, {"ATS0", "ATSP6", "ATST32"});
     EXPECT_EQ(host.ask("010D"), "NO DATA\r\r>");
+    host.pass(Ms(200));
     EXPECT_EQ(host.ask({"ATSTFF", "010D"}), "410D37\r\r>");
+    EXPECT_EQ(host.ask({"ATST32", "010D"}), "NO DATA\r\r>");
+    EXPECT_EQ(host.ask({"ATSTFF", "010D"}), "410D37\r410D37\r\r>") << "a late reply answers the next request";
 }
 
 constexpr char const* busy = R"(
@@ -122,8 +129,8 @@ raw = { "0904" = "49 04 00" }
 TEST(BusRequest, pendingAnswerKeepsTheAdapterWaiting)
 {
     auto host = ready(busy, {"ATS0", "ATH1", "ATSP6"});
-    EXPECT_EQ(host.ask("0904"), "7E8037F0978\r7E8037F0978\r7E803490400\r\r>");
-    EXPECT_GE(host.lastWait(), Time(370));
+    EXPECT_EQ(host.ask("0904"), "7E8037F097800000000\r7E8037F097800000000\r7E80349040000000000\r\r>");
+    EXPECT_GE(host.lastWait(), Ms(370));
 }
 
 TEST(BusRequest, pendingAnswerIsAwaitedBehindThatOfAnotherModule)
@@ -135,7 +142,8 @@ latency = 40
 raw = { "0904" = "49 04 01" }
 )";
     auto host = ready(busy + other, {"ATS0", "ATH1", "ATSP6"});
-    EXPECT_EQ(host.ask("0904"), "7E8037F0978\r7E903490401\r7E8037F0978\r7E803490400\r\r>");
+    EXPECT_EQ(host.ask("0904"), "7E8037F097800000000\r7E90349040100000000\r"
+                                "7E8037F097800000000\r7E80349040000000000\r\r>");
 }
 
 TEST(BusRequest, filtersLetOneModuleThrough)
@@ -210,7 +218,7 @@ TEST(ProtocolSearch, findsEachOfTheNine)
             const std::string reply = host.ask({"ATE0", automatic, "ATH1", "0100"});
             EXPECT_EQ(reply.substr(0, 13), "SEARCHING...\r") << row.vehicle;
             EXPECT_EQ(reply.substr(13, std::string(row.reply).size()), row.reply) << row.vehicle;
-            EXPECT_LT(host.lastWait(), Time(10000)) << row.vehicle;
+            EXPECT_LT(host.lastWait(), Ms(10000)) << row.vehicle;
             EXPECT_EQ(host.ask("ATDPN"), "A" + std::to_string(row.number) + "\r\r>");
             EXPECT_EQ(host.ask("ATDP"), std::string("AUTO, ") + row.description + "\r\r>");
             EXPECT_EQ(host.ask("0100").substr(0, std::string(row.reply).size()), row.reply) << "no second search";

@@ -6,6 +6,7 @@
 
 namespace {
 
+using obdsim::Ms;
 using obdsim::Quirk;
 using obdsim::Time;
 
@@ -47,8 +48,20 @@ TEST(Quirk, slowPromptComesBehindItsReply)
 {
     auto host = clone(Quirk::PromptSlow);
     host.peer().receive("ATI\r");
-    EXPECT_EQ(host.peer().advanceTo(Time(100)), "ATI\rELM327 v1.5\r");
-    EXPECT_EQ(host.peer().advanceTo(Time(300)), "\r>");
+    EXPECT_EQ(host.peer().advanceTo(Ms(100)), "ATI\rELM327 v1.5\r");
+    EXPECT_EQ(host.peer().advanceTo(Ms(300)), "\r>");
+}
+
+TEST(Quirk, firstCommandOfAConnectionIsLostOrItsPrompt)
+{
+    auto deaf = clone(Quirk::FirstSwallowed);
+    EXPECT_EQ(deaf.ask("ATI"), "ATI\r");
+    EXPECT_EQ(deaf.ask("ATI"), "ATI\rELM327 v1.5\r\r>");
+    auto mute = clone(Quirk::FirstPromptLost);
+    EXPECT_EQ(mute.ask("ATI"), "ATI\rELM327 v1.5\r\r");
+    EXPECT_EQ(mute.ask("ATI"), "ATI\rELM327 v1.5\r\r>");
+    mute.peer().connect();
+    EXPECT_EQ(mute.ask("ATI"), "ATI\rELM327 v1.5\r\r");
 }
 
 TEST(Quirk, lineEndsAndPromptsOfClones)
@@ -138,7 +151,7 @@ id = "11"
 )";
     auto split = withVehicle(kLine, "elm327-v1.5", {Quirk::BusInitSplit, Quirk::InitWithoutDots});
     EXPECT_EQ(split.ask({"ATE0", "ATH1", "ATSP3", "0100"}), "BUS INIT: OK\r");
-    split.pass(Time(1000));
+    split.pass(Ms(1000));
     EXPECT_EQ(split.ask("0100"), "48 6B 11 41 00 BE 1F B8 10 AA \r\r>");
 }
 

@@ -8,11 +8,12 @@ using obdsim::Bytes;
 using obdsim::DriveModel;
 using obdsim::DriveState;
 using obdsim::EngineData;
+using obdsim::Ms;
 using obdsim::Time;
 
 Time seconds(int count)
 {
-    return Time(count * 1000);
+    return Ms(count * 1000);
 }
 
 TEST(DriveModel, goesThroughIdleAccelerationCruiseAndBraking)
@@ -41,7 +42,7 @@ TEST(DriveModel, speedNeverJumpsAndTheWayGrowsWithIt)
     const DriveModel drive{EngineData{}};
     DriveState before = drive.at(Time(0));
     for (int ms = 500; ms <= 260000; ms += 500) {
-        const DriveState state = drive.at(Time(ms));
+        const DriveState state = drive.at(Ms(ms));
         EXPECT_LT(std::abs(state.speedKmh - before.speedKmh), 5) << ms;
         EXPECT_GE(state.kilometres, before.kilometres) << ms;
         EXPECT_LE(state.kilometres - before.kilometres, 0.02) << ms;

@@ -7,6 +7,7 @@
 namespace {
 
 using obdsim::Bytes;
+using obdsim::Ms;
 using obdsim::Time;
 using obdsim::Vehicle;
 
@@ -154,7 +155,8 @@ TEST(Service01, takesSeveralPidsOnCanAndLeavesOutTheUnknown)
     auto car = canCar();
     EXPECT_EQ(ask(car, "01 1C 5C 05 0D"), Lines{"41 1C 06 05 7B 0D 00"});
     auto old = kwpCar();
-    EXPECT_EQ(ask(old, "01 1C 05"), Lines{"41 1C 06"});
+    EXPECT_EQ(ask(old, "01 1C"), Lines{"41 1C 06"});
+    EXPECT_EQ(ask(old, "01 1C 05"), Lines{}) << "there is no rule for several PIDs before CAN";
 }
 
 TEST(Service01, monitorWordCountsCodesAndMarksWhatIsOpen)
@@ -205,7 +207,7 @@ TEST(Service04, forgetsAllButThePermanentCodes)
 {
     auto car = canCar();
     ask(car, "01 31");
-    EXPECT_EQ(ask(car, "04", Time(60000)), Lines{"44"});
+    EXPECT_EQ(ask(car, "04", Ms(60000)), Lines{"44"});
     EXPECT_EQ(ask(car, "03"), Lines{"43 00"});
     EXPECT_EQ(ask(car, "07"), Lines{"47 00"});
     EXPECT_EQ(ask(car, "0A"), Lines{"4A 01 01 00"});

@@ -1,0 +1,206 @@
+// The waits of an adapter, the times of its buses and its line, and how it counts replies: by the ELM327 data sheets.
+#include "tests/simulator/conversation.h"
+
+#include <gtest/gtest.h>
+
+namespace {
+
+using obdsim::Ms;
+using obdsim::Time;
+
+constexpr char const* fastAndSlow = R"(
+name = "Modules of 4 and 58 ms"
+protocol = 6
+[[module]]
+id = "7E8"
+latency = 4
+frame_gap = 0
+raw = { "0100" = "41 00 98 18 00 11", "010D" = "41 0D 37", "0902" = "49 02 01 31 4E 34 41 4C 33 41 50 37 44" }
+[[module]]
+id = "7E9"
+latency = 58
+raw = { "0100" = "41 00 98 18 00 11" }
+)";
+
+Conversation quiet(std::string const& toml, std::string const& adapter = "elm327-v2.3", obdsim::Quirks quirks = {})
+{
+    auto host = withVehicle(toml, adapter, quirks);
+    host.ask({"ATE0", "ATS0", "ATH1", "ATSP6"});
+    return host;
+}
+
+double waitAfter(Conversation& host, std::string const& request)
+{
+    host.ask(request);
+    return std::chrono::duration<double, std::milli>(host.lastWait()).count();
+}
+
+TEST(ReplyTimer, waitsHalfAsLongAgainAsTheSlowestReply)
+{
+    auto host = quiet(fastAndSlow);
+    double const slowest = 58 + 0.222;
+    EXPECT_NEAR(waitAfter(host, "0100"), 4.2 + 58 + 0.3 + 204.8, 1) << "nothing is learnt yet";
+    EXPECT_NEAR(waitAfter(host, "0100"), 4.2 + 58 + 0.3 + 1.5 * slowest, 1) << "replies at 4 and 58 ms: 90 ms";
+    EXPECT_NEAR(waitAfter(host, "010D"), 4.2 + 4 + 0.3 + 1.5 * slowest, 1) << "learnt";
+    host.ask("ATAT2");
+    EXPECT_NEAR(waitAfter(host, "0100"), 4.2 + 58 + 0.3 + 1.2 * slowest, 1);
+    host.ask("ATAT0");
+    EXPECT_NEAR(waitAfter(host, "010D"), 4.2 + 4 + 0.3 + 204.8, 1) << "all of ATST";
+    host.ask({"ATAT1", "ATST10"});
+    EXPECT_NEAR(waitAfter(host, "0100"), 4.2 + 58 + 0.3 + 16 * 4.096, 1) << "never above ATST";
+}
+
+TEST(ReplyTimer, firstReplyHasAllTheTime)
+{
+    auto host = quiet(fastAndSlow);
+    host.ask({"ATSH7E0", "010D"});
+    EXPECT_NEAR(waitAfter(host, "010D"), 4.2 + 4.2 + 1.5 * 4.2, 1);
+    EXPECT_EQ(host.ask({"ATSH7E1", "0100"}), "7E90641009818001100\r\r>");
+}
+
+TEST(ReplyTimer, stnWaitsHalfAsLongByItself)
+{
+    auto host = quiet(fastAndSlow, "stn2120");
+    EXPECT_NEAR(waitAfter(host, "015C"), 4.2 + 25 * 4.096, 0.1);
+}
+
+TEST(ReplyTimer, pendingAnswerIsAwaitedByTheNewerChips)
+{
+    constexpr char const* slow = R"(
+name = "Slow"
+protocol = 6
+[[module]]
+id = "7E8"
+latency = 10
+raw = { "0904" = "49 04 00" }
+delays = { "0904" = { times = 1, milliseconds = 2000 } }
+)";
+    EXPECT_EQ(quiet(slow).ask("0904"), "7E8037F097800000000\r7E80349040000000000\r\r>");
+    auto old = quiet(slow, "elm327-v1.4");
+    EXPECT_EQ(old.ask("0904"), "7E8037F097800000000\r\r>");
+    old.pass(Ms(1700));
+    EXPECT_EQ(old.ask("015C1"), "7E80349040000000000\r\r>") << "what came too late is the next reply";
+}
+
+TEST(CountDigit, countsFramesOfAllModules)
+{
+    auto host = quiet(fastAndSlow);
+    host.ask("0100");
+    EXPECT_EQ(host.ask("01001"), "7E80641009818001100\r\r>");
+    EXPECT_LT(host.lastWait(), Ms(10));
+    host.pass(Ms(60));
+    EXPECT_EQ(host.ask("01002"), "7E80641009818001100\r7E90641009818001100\r\r>");
+    EXPECT_NEAR(waitAfter(host, "01002"), 62.7, 0.5);
+    EXPECT_GT(waitAfter(host, "01003"), 100) << "one more than come: the whole wait";
+    EXPECT_GT(waitAfter(host, "01000"), 100) << "the digit 0 means nothing";
+}
+
+TEST(CountDigit, cutMessageGoesOnInTheNextReply)
+{
+    auto host = quiet(fastAndSlow);
+    EXPECT_EQ(host.ask("09021"), "7E8100D490201314E34\r\r>");
+    EXPECT_EQ(host.ask("010D1"), "7E803410D3700000000\r\r>") << "its rest had passed before the next request";
+    constexpr char const* slowFrames = R"(
+name = "Slow frames"
+protocol = 6
+[[module]]
+id = "7E8"
+latency = 4
+frame_gap = 20
+raw = { "010D" = "41 0D 37", "0902" = "49 02 01 31 4E 34 41 4C 33 41 50 37 44" }
+)";
+    auto slow = quiet(slowFrames);
+    EXPECT_EQ(slow.ask({"ATAT0", "09021"}), "7E8100D490201314E34\r\r>");
+    EXPECT_EQ(slow.ask("010D2"), "7E803410D3700000000\r7E821414C3341503744\r\r>");
+}
+
+TEST(CountDigit, clonesCountMessagesRefuseOrIgnoreIt)
+{
+    auto messages = quiet(fastAndSlow, "elm327-v2.3", {obdsim::Quirk::CountMessages});
+    EXPECT_EQ(messages.ask("09021"), "7E8100D490201314E34\r7E821414C3341503744\r\r>");
+    EXPECT_LT(messages.lastWait(), Ms(15));
+    auto ignoring = quiet(fastAndSlow, "elm327-v2.3", {obdsim::Quirk::CountIgnored});
+    EXPECT_EQ(ignoring.ask("01001"), "7E80641009818001100\r7E90641009818001100\r\r>");
+    auto refusing = quiet(fastAndSlow, "clone-v2.1-poor");
+    EXPECT_EQ(refusing.ask("01001"), "?\r\r>");
+}
+
+TEST(SeveralPids, modulesTakeThemRefuseOrAnswerTheFirst)
+{
+    const std::string module = R"(
+name = "Choosy"
+protocol = 6
+[[module]]
+id = "7E8"
+most_pids = 2
+fixed = { "1C" = "06", "13" = "03", "51" = "01" }
+)";
+    EXPECT_EQ(quiet(module).ask("011C13511"), "7E805411C0613030000\r\r>") << "as many as it takes";
+    EXPECT_EQ(quiet(module + "more_pids = \"refuse\"\n").ask("011C1351"), "7E8037F011200000000\r\r>");
+    EXPECT_EQ(quiet(module + "more_pids = \"silence\"\n").ask("011C1351"), "NO DATA\r\r>");
+    EXPECT_EQ(quiet(module + "more_pids = \"refuse\"\n").ask("011C13"), "7E805411C0613030000\r\r>");
+    auto cut = quiet(module, "elm327-v2.3", {obdsim::Quirk::RequestCut});
+    EXPECT_EQ(cut.ask("011C1351"), "7E803411C0600000000\r\r>") << "two bytes went out";
+}
+
+TEST(SeveralPids, requestOfEightBytesNeedsLongMessages)
+{
+    auto host = quiet(fastAndSlow);
+    EXPECT_EQ(host.ask("0101020304050607"), "?\r\r>");
+    EXPECT_EQ(host.ask({"ATAL", "0101020304050607"}), "NO DATA\r\r>");
+    EXPECT_EQ(host.ask({"ATNL", "0101020304050607"}), "?\r\r>");
+}
+
+TEST(PaddingCut, cloneCutsSingleFramesWithHeadersOn)
+{
+    auto host = quiet(fastAndSlow, "elm327-v1.5");
+    EXPECT_EQ(host.ask("010D"), "7E803410D37\r\r>");
+    EXPECT_EQ(host.ask("0902"), "7E8100D490201314E34\r7E821414C3341503744\r\r>");
+}
+
+/// Requests in a row, as fast as the prompts come; how many in a second.
+double requestsPerSecond(Conversation& host, std::string const& request)
+{
+    constexpr int count = 50;
+    const Time start = host.peer().now();
+    for (int i = 0; i < count; ++i) {
+        host.ask(request);
+    }
+    return count / std::chrono::duration<double>(host.peer().now() - start).count();
+}
+
+struct RateCase
+{
+    char const* vehicle;
+    std::vector<std::string> faults;
+    std::string request;
+    double least;
+    double most;
+};
+
+TEST(Rates, areThoseOfBusModuleAndLine)
+{
+    const RateCase cases[] = {
+        // P3 stands before each request, P4 between its bytes: SAE J1979 on a K line cannot be faster.
+        {"petrol-kwp-fast", {}, "010C1", 7, 8.4},
+        {"petrol-iso9141", {}, "010C1", 6, 8.4},
+        {"petrol-vpw", {}, "010C1", 20, 80},
+        // A module of 10 ms at 38400 and 115200 baud, with count digit: 17.8 and 12.9 ms.
+        {"bench-can11", {"command=0", "baud=38400"}, "010C1", 50, 57},
+        {"bench-can11", {"command=0", "baud=115200"}, "010C1", 68, 78},
+        {"bench-can11", {"command=0"}, "010C1", 85, 96},
+        {"bench-can11", {"command=0", "baud=38400", "wait=50"}, "010C", 13, 16},
+        {"bench-can11", {"command=0", "baud=38400", "wait=400"}, "010C", 2.3, 2.5},
+        {"bench-can11", {"command=0", "baud=38400"}, "010C0D0504110F3", 28, 32},
+        {"bench-can11", {"command=0", "baud=115200"}, "010C0D0504110F3", 50, 58},
+    };
+    for (auto const& row : cases) {
+        auto host = simulated(row.vehicle, "elm327-v2.3", row.faults);
+        host.ask({"ATE0", "ATS0", "ATH1", "ATSP0", "0100"});
+        double const rate = requestsPerSecond(host, row.request);
+        EXPECT_GE(rate, row.least) << row.vehicle << " " << row.request << testing::PrintToString(row.faults);
+        EXPECT_LE(rate, row.most) << row.vehicle << " " << row.request << testing::PrintToString(row.faults);
+    }
+}
+
+} // namespace
