@@ -1,10 +1,10 @@
 #include "simulator/serverloop.h"
+#include "simulator/unsenttext.h"
 
 #include <asio/ip/tcp.hpp>
 #include <asio/write.hpp>
 
 #include <array>
-#include <deque>
 
 namespace obdsim {
 
@@ -81,8 +81,9 @@ private:
 
     void send(std::string bytes)
     {
-        m_unsent.push_back(std::move(bytes));
-        if (m_unsent.size() == 1) {
+        bool const idle = m_unsent.empty();
+        m_unsent.push(std::move(bytes));
+        if (idle && !m_unsent.empty()) {
             write();
         }
     }
@@ -94,7 +95,7 @@ private:
                               if (error || m_unsent.empty()) {
                                   return; // the pending read sees the end, too
                               }
-                              m_unsent.pop_front();
+                              m_unsent.pop();
                               if (!m_unsent.empty()) {
                                   write();
                               }
@@ -115,7 +116,7 @@ private:
     tcp::socket m_socket;
     std::string m_address;
     std::array<char, 512> m_buffer{};
-    std::deque<std::string> m_unsent;
+    UnsentText m_unsent;
 };
 
 } // namespace

@@ -1,5 +1,6 @@
 #include "simulator/server.h"
 #include "simulator/simulation.h"
+#include "simulator/unsenttext.h"
 
 #include <asio/connect.hpp>
 #include <asio/ip/tcp.hpp>
@@ -152,6 +153,22 @@ TEST(TcpServer, lostLinkClosesTheConnectionAndTheNextOneIsServed)
     }
     Line next(connectTo(server->address()));
     EXPECT_EQ(next.ask("ATE0"), "OK\r\r>");
+}
+
+TEST(UnsentText, holdsWhatFitsAndTakesMoreWhenItIsRead)
+{
+    obdsim::UnsentText text;
+    for (int i = 0; i < 100; ++i) {
+        text.push(std::string(1000, 'A'));
+    }
+    EXPECT_EQ(text.size(), 65000U);
+    text.pop();
+    text.push("B");
+    EXPECT_EQ(text.size(), 64001U);
+    text.clear();
+    EXPECT_TRUE(text.empty());
+    text.push("C");
+    EXPECT_EQ(text.front(), "C");
 }
 
 TEST(TcpServer, portInUseIsTold)
