@@ -3,6 +3,7 @@
 #include "libvelmora/output/csvoutput.h"
 #include "libvelmora/output/influxoutput.h"
 #include "libvelmora/output/ndjsonoutput.h"
+#include "libvelmora/output/prometheusoutput.h"
 #include "libvelmora/output/sqliteoutput.h"
 
 #include <velmora/error.h>
@@ -14,11 +15,11 @@ namespace {
 struct Maker
 {
     char const* kind;
-    std::unique_ptr<IOutput> (*make)(OutputAddress const&);
+    std::unique_ptr<IOutput> (*make)(OutputAddress const&, OutputContext const&);
 };
 
 template <typename Output>
-std::unique_ptr<IOutput> makeOf(OutputAddress const& address)
+std::unique_ptr<IOutput> makeOf(OutputAddress const& address, OutputContext const& /*context*/)
 {
     return std::make_unique<Output>(address);
 }
@@ -27,16 +28,23 @@ std::vector<Maker> const& makers()
 {
     static std::vector<Maker> const list = {
 #ifdef VELMORA_OUTPUT_CSV
-        {"csv", makeOf<CsvOutput>},       {"csv-long", makeOf<CsvLongOutput>},
+        {"csv", makeOf<CsvOutput>},
+        {"csv-long", makeOf<CsvLongOutput>},
 #endif
 #ifdef VELMORA_OUTPUT_NDJSON
         {"ndjson", makeOf<NdjsonOutput>},
 #endif
 #ifdef VELMORA_OUTPUT_INFLUX
-        {"influx", makeInfluxOutput},
+        {"influx", [](OutputAddress const& address, OutputContext const&) { return makeInfluxOutput(address); }},
 #endif
 #ifdef VELMORA_OUTPUT_SQLITE
         {"sqlite", makeOf<SqliteOutput>},
+#endif
+#ifdef VELMORA_OUTPUT_PROMETHEUS
+        {"prometheus",
+         [](OutputAddress const& address, OutputContext const& context) -> std::unique_ptr<IOutput> {
+             return std::make_unique<PrometheusOutput>(address, context.health);
+         }},
 #endif
     };
     return list;
@@ -53,11 +61,11 @@ std::vector<std::string> builtInOutputs()
     return kinds;
 }
 
-std::unique_ptr<IOutput> makeOutput(OutputAddress const& address)
+std::unique_ptr<IOutput> makeOutput(OutputAddress const& address, OutputContext const& context)
 {
     for (Maker const& each : makers()) {
         if (address.kind == each.kind) {
-            return each.make(address);
+            return each.make(address, context);
         }
     }
     throw Error(ErrorKind::WrongUse, "This build has no output of kind " + address.kind,

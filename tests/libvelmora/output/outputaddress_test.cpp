@@ -17,7 +17,7 @@ using velmora::parseSize;
 std::string outputComplaint(std::string const& text)
 {
     try {
-        velmora::makeOutput(parseOutputAddress(text));
+        velmora::makeOutput(parseOutputAddress(text), {});
     } catch (velmora::Error const& error) {
         EXPECT_EQ(error.kind(), velmora::ErrorKind::WrongUse);
         return error.what();

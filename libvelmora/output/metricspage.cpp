@@ -1,0 +1,102 @@
+#include "libvelmora/output/metricspage.h"
+
+#include "libvelmora/output/metricfamily.h"
+#include "libvelmora/output/valuetext.h"
+
+#include <velmora/version.h>
+
+#include <fmt/format.h>
+
+namespace velmora {
+
+namespace {
+
+constexpr std::chrono::seconds staleAfter{60};
+
+std::string familyHead(std::string const& name, std::string const& type, std::string const& help)
+{
+    return fmt::format("# HELP {0} {2}\n# TYPE {0} {1}\n", name, type, help);
+}
+
+std::string single(std::string const& name, std::string const& type, std::string const& help, std::uint64_t value)
+{
+    return familyHead(name, type, help) + fmt::format("{} {}\n", name, value);
+}
+
+// One family over all outputs.
+template <typename Member>
+std::string overOutputs(Health const& health, std::string const& name, std::string const& type, std::string const& help,
+                        Member member)
+{
+    std::string text = health.outputs.empty() ? "" : familyHead(name, type, help);
+    for (auto const& [output, counts] : health.outputs) {
+        text += fmt::format("{}{{output=\"{}\"}} {}\n", name, escapedLabel(output),
+                            static_cast<std::uint64_t>(counts.*member));
+    }
+    return text;
+}
+
+std::string healthText(Health const& health)
+{
+    std::string text = familyHead("velmora_build_info", "gauge", "The version of the program.") +
+                       fmt::format("velmora_build_info{{version=\"{}\"}} 1\n", versionText);
+    text += familyHead("velmora_state_info", "gauge", "What the watch does now.") +
+            fmt::format("velmora_state_info{{state=\"{}\"}} 1\n", escapedLabel(health.state));
+    text += single("velmora_link_up", "gauge", "Whether adapter and vehicle answer.", health.linkUp ? 1 : 0);
+    text += single("velmora_requests_total", "counter", "Requests to control modules.", health.requests);
+    text += single("velmora_errors_total", "counter", "Requests that nobody answered.", health.errors);
+    text += single("velmora_link_losses_total", "counter", "How often the link broke.", health.linkLosses);
+    text += single("velmora_wake_requests_total", "counter", "Requests to a parked car.", health.wakeRequests);
+    text += overOutputs(health, "velmora_output_queue_records", "gauge", "Records that wait.", &OutputCounts::queued);
+    text += overOutputs(health, "velmora_output_written_total", "counter", "Records written.", &OutputCounts::written);
+    text += overOutputs(health, "velmora_output_dropped_total", "counter",
+                        "Records dropped because the output was slow.", &OutputCounts::dropped);
+    text += overOutputs(health, "velmora_output_failures_total", "counter", "Failed attempts to write.",
+                        &OutputCounts::failures);
+    text += overOutputs(health, "velmora_output_failing", "gauge", "Whether the last attempt failed.",
+                        &OutputCounts::failing);
+    return text;
+}
+
+} // namespace
+
+void MetricsPage::take(Reading const& reading)
+{
+    MetricFamily const family = metricFamily(reading.unit);
+    Series const series(reading.vehicle, reading.module, reading.sensor);
+    std::optional<double> const number = numberOf(reading);
+    if (!number) {
+        auto const found = m_families.find(family.name);
+        if (found != m_families.end()) {
+            found->second.samples.erase(series); // an old number would be a wrong one
+        }
+        return;
+    }
+    Family& place = m_families[family.name];
+    place.help = family.help;
+    place.samples[series] = {*number * family.factor + family.offset, reading.time};
+}
+
+std::string MetricsPage::render(WallTime now, Health const& health) const
+{
+    std::string text = healthText(health);
+    std::string ages;
+    for (auto const& [name, family] : m_families) {
+        std::string lines;
+        for (auto const& [series, sample] : family.samples) {
+            auto const& [vehicle, module, sensor] = series;
+            auto const age = std::chrono::duration<double>(now - sample.time).count();
+            if (now - sample.time > staleAfter) {
+                continue;
+            }
+            std::string const labels = fmt::format("{{vehicle=\"{}\",module=\"{}\",sensor=\"{}\"}}",
+                                                   escapedLabel(vehicle), moduleText(module), escapedLabel(sensor));
+            lines += name + labels + " " + numberText(sample.value) + "\n";
+            ages += "velmora_reading_age_seconds" + labels + " " + numberText(std::max(age, 0.0)) + "\n";
+        }
+        text += lines.empty() ? "" : familyHead(name, "gauge", family.help) + lines;
+    }
+    return ages.empty() ? text : text + familyHead("velmora_reading_age_seconds", "gauge", "Age of a reading.") + ages;
+}
+
+} // namespace velmora
