@@ -4,7 +4,6 @@
 // adapter, which may have more to say, and 30 ms behind a request of a service. over_ms: all the rest.
 
 #include "libvelmora/read/vehiclereader.h"
-#include "program/terminal/interrupt.h"
 
 #include <obd/iconnectionlogger.h>
 #include <obd/iconnectionmanager.h>
@@ -44,11 +43,9 @@ private:
 
 void scan(benchmark::State& state)
 {
-    Interrupt const interrupt;
-    GlobalOptions options;
+    SessionOptions options;
     options.port = "sim:petrol-can11?instant";
     options.settingsFile = "/nonexistent";
-    options.quiet = true;
     for ([[maybe_unused]] auto const once : state) {
         Clock::time_point const start = Clock::now();
         Pauses pauses;

@@ -16,7 +16,7 @@
 #include <system_error>
 #include <utility>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -171,4 +171,4 @@ ExitCode CommandLine::runAction()
     }
 }
 
-} // namespace velmora
+} // namespace velmora::cli

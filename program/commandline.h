@@ -7,7 +7,7 @@
 
 #include <functional>
 
-namespace velmora {
+namespace velmora::cli {
 
 // The command line: global options, and the commands, each of which says what to run.
 class CommandLine
@@ -34,4 +34,4 @@ private:
     Action m_action;
 };
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -2,7 +2,7 @@
 
 #include <velmora/error.h>
 
-namespace velmora {
+namespace velmora::cli {
 
 // What the program tells its caller; documented in the README. An error's kind is its exit code.
 enum class ExitCode : int
@@ -19,4 +19,4 @@ inline ExitCode exitCode(Error const& error)
     return static_cast<ExitCode>(error.kind());
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -4,7 +4,7 @@
 
 #include <string_view>
 
-namespace velmora {
+namespace velmora::cli {
 
 std::optional<obd::VehicleProtocol> parseProtocol(std::string const& text)
 {
@@ -26,4 +26,4 @@ std::optional<unsigned int> parseEcuId(std::string const& text)
     return parseHex(text, 0x1FFFFFFF);
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -6,7 +6,7 @@
 #include <optional>
 #include <string>
 
-namespace velmora {
+namespace velmora::cli {
 
 enum class ColorMode
 {
@@ -40,4 +40,4 @@ std::optional<obd::VehicleProtocol> parseProtocol(std::string const& text);
 // A control module id in hexadecimal, with or without 0x. Nothing for any other text.
 std::optional<unsigned int> parseEcuId(std::string const& text);
 
-} // namespace velmora
+} // namespace velmora::cli

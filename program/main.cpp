@@ -4,8 +4,8 @@
 
 int main(int argc, char** argv)
 {
-    velmora::Interrupt const interrupt;
-    velmora::CommandLine commandLine;
-    velmora::addCommands(commandLine);
+    velmora::cli::Interrupt const interrupt;
+    velmora::cli::CommandLine commandLine;
+    velmora::cli::addCommands(commandLine);
     return static_cast<int>(commandLine.run(argc, argv));
 }

@@ -4,13 +4,10 @@
 #include "libvelmora/read/diagnosticreaders.h"
 #include "libvelmora/read/freezereader.h"
 #include "libvelmora/text/text.h"
-#include "program/terminal/output.h"
 
 #include <obd/iecu.h>
 
 #include <fmt/format.h>
-
-#include <cstdio>
 
 namespace velmora {
 
@@ -80,9 +77,7 @@ VehicleReport readVehicle(Session& session)
     report.protocol = readProtocol(session);
     CodeReader reader(session);
     for (auto const& ecu : session.selectedModules()) {
-        if (!session.options().quiet) {
-            tell(fmt::format("Reading {:X} {} ...\n", ecu->id(), readable(ecu->name())));
-        }
+        session.tellProgress(fmt::format("Reading {:X} {} ...\n", ecu->id(), readable(ecu->name())));
         report.modules.push_back(readModule(session, *ecu, reader));
     }
     session.check();

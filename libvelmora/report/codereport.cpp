@@ -1,22 +1,14 @@
 #include "libvelmora/report/codereport.h"
 
-#include "program/view/layout.h"
-
 #include <algorithm>
 
 namespace velmora {
 
 namespace {
 
-struct KindNames
+char const* kindKey(CodeKind kind)
 {
-    char const* title;
-    char const* key;
-};
-
-KindNames const& names(CodeKind kind)
-{
-    static constexpr KindNames all[] = {{"Confirmed", "confirmed"}, {"Pending", "pending"}, {"Permanent", "permanent"}};
+    static constexpr char const* all[] = {"confirmed", "pending", "permanent"};
     return all[static_cast<int>(kind)];
 }
 
@@ -26,41 +18,7 @@ char const* answerKey(CodeList::Answer answer)
     return all[static_cast<int>(answer)];
 }
 
-std::string summary(CodeList const& list)
-{
-    switch (list.answer) {
-    case CodeList::Answer::Refused:
-        return "refused: " + list.reason;
-    case CodeList::Answer::Silent:
-        return "no answer";
-    case CodeList::Answer::Unreadable:
-        return "the reply can't be read";
-    case CodeList::Answer::Read:
-        break;
-    }
-    if (list.codes.empty()) {
-        return "none stored";
-    }
-    return counted(list.codes.size(), "code");
-}
-
-Mark mark(CodeList const& list)
-{
-    if (list.answer != CodeList::Answer::Read) {
-        return Mark::Faint;
-    }
-    if (list.codes.empty()) {
-        return Mark::Good;
-    }
-    return list.kind == CodeKind::Pending ? Mark::Warning : Mark::Bad;
-}
-
 } // namespace
-
-std::string lampText(std::optional<bool> const& lamp, Style const& style)
-{
-    return !lamp ? "-" : *lamp ? style.paint(Mark::Bad, "on") : style.paint(Mark::Good, "off");
-}
 
 bool hasFindings(CodeReport const& report)
 {
@@ -82,26 +40,14 @@ bool canBeChecked(CodeReport const& report)
            });
 }
 
-std::string toText(CodeReport const& report, Style const& style)
-{
-    std::string text = labelledLine("Lamp", lampText(report.lamp, style));
-    for (CodeList const& list : report.lists) {
-        text += labelledLine(names(list.kind).title, style.paint(mark(list), summary(list)));
-        for (TroubleCode const& code : list.codes) {
-            text += toText(code, "    ");
-        }
-    }
-    return text;
-}
-
 Json toJsonValue(CodeReport const& report)
 {
     Json document = {{"lamp", valueOrNull(report.lamp)}};
     for (CodeList const& list : report.lists) {
         bool const read = list.answer == CodeList::Answer::Read;
-        document[names(list.kind).key] = {{"answer", answerKey(list.answer)},
-                                          {"reason", textOrNull(list.reason)},
-                                          {"codes", read ? toJsonValue(list.codes) : Json(nullptr)}};
+        document[kindKey(list.kind)] = {{"answer", answerKey(list.answer)},
+                                        {"reason", textOrNull(list.reason)},
+                                        {"codes", read ? toJsonValue(list.codes) : Json(nullptr)}};
     }
     return document;
 }

@@ -41,9 +41,6 @@ struct CodeReport
 
 using ModuleCodes = ModuleTopic<CodeReport>;
 
-// "on", "off" or "-".
-std::string lampText(std::optional<bool> const& lamp, Style const& style);
-
 // Whether the lamp is on, or a code is confirmed or permanent. A pending code is no finding yet.
 bool hasFindings(CodeReport const& report);
 
@@ -52,9 +49,6 @@ bool hasAnswer(CodeReport const& report);
 
 // Whether the module told lamp or confirmed codes, without which no findings mean nothing.
 bool canBeChecked(CodeReport const& report);
-
-// Indented lines under the heading of a control module.
-std::string toText(CodeReport const& report, Style const& style);
 
 // "lamp", and for each list its codes, or null and a word for why there are none.
 Json toJsonValue(CodeReport const& report);

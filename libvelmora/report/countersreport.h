@@ -20,7 +20,6 @@ struct CountersReport
     std::vector<Counter> counters; // those that are not 0
 };
 
-std::string toText(CountersReport const& report, Style const& style);
 Json toJsonValue(CountersReport const& report);
 
 } // namespace velmora

@@ -21,7 +21,7 @@ char const* kindWord(CodeKind kind)
 void addLamp(std::vector<Finding>& list, ModuleReport const& module)
 {
     if (module.codes.lamp.value_or(false)) {
-        list.push_back({Mark::Bad, nameOf(module), "lamp", "the malfunction indicator is on"});
+        list.push_back({Severity::Bad, nameOf(module), "lamp", "the malfunction indicator is on"});
     }
 }
 
@@ -43,8 +43,8 @@ void addCodes(std::vector<Finding>& list, ModuleReport const& module)
                 known->what += std::string(", ") + kindWord(codes.kind);
                 continue;
             }
-            Mark const mark = codes.kind == CodeKind::Pending ? Mark::Warning : Mark::Bad;
-            list.push_back({mark, nameOf(module), kindWord(codes.kind), text});
+            Severity const severity = codes.kind == CodeKind::Pending ? Severity::Warning : Severity::Bad;
+            list.push_back({severity, nameOf(module), kindWord(codes.kind), text});
         }
     }
 }
@@ -54,7 +54,7 @@ void addFailed(std::vector<Finding>& list, ModuleReport const& module, std::stri
 {
     for (LimitTest const& test : tests) {
         if (test.verdict == LimitTest::Verdict::Failed) {
-            list.push_back({Mark::Bad, nameOf(module), "failed test", what + ": " + test.description});
+            list.push_back({Severity::Bad, nameOf(module), "failed test", what + ": " + test.description});
         }
     }
 }
@@ -73,7 +73,7 @@ void addReadiness(std::vector<Finding>& list, ModuleReport const& module)
 {
     for (ReadinessMonitor const& monitor : module.readiness.monitors) {
         if (monitor.sinceCleared == ReadinessStatus::NotComplete) {
-            list.push_back({Mark::Warning, nameOf(module), "not complete", monitor.name});
+            list.push_back({Severity::Warning, nameOf(module), "not complete", monitor.name});
         }
     }
 }
@@ -82,7 +82,7 @@ void addReadiness(std::vector<Finding>& list, ModuleReport const& module)
 void addUntold(std::vector<Finding>& list, ModuleReport const& module)
 {
     if (!canBeChecked(module.codes)) {
-        list.push_back({Mark::Warning, nameOf(module), "not told", "lamp and confirmed codes"});
+        list.push_back({Severity::Warning, nameOf(module), "not told", "lamp and confirmed codes"});
     }
 }
 
@@ -97,19 +97,6 @@ std::vector<Finding> findings(VehicleReport const& report)
         }
     }
     return list;
-}
-
-std::string toText(std::vector<Finding> const& findings, Style const& style)
-{
-    std::string const heading = "Findings\n";
-    if (findings.empty()) {
-        return heading + "  " + style.paint(Mark::Good, "none in what the vehicle told") + "\n";
-    }
-    std::vector<std::vector<Cell>> rows;
-    for (Finding const& finding : findings) {
-        rows.push_back({{finding.module}, {finding.what, finding.mark}, {finding.text}});
-    }
-    return heading + drawColumns(rows, "  ", style);
 }
 
 } // namespace velmora

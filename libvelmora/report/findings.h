@@ -7,10 +7,16 @@
 
 namespace velmora {
 
+enum class Severity : int
+{
+    Warning, // not known to be right yet
+    Bad,
+};
+
 // Something that is wrong, or not known to be right yet.
 struct Finding
 {
-    Mark mark;
+    Severity severity;
     std::string module; // "7E8 ECM"
     std::string what;   // such as "confirmed, permanent"
     std::string text;
@@ -18,8 +24,5 @@ struct Finding
 
 // All of a vehicle: lamps first, then codes, failed tests and what has not been tested.
 std::vector<Finding> findings(VehicleReport const& report);
-
-// The findings under a heading, or that there are none.
-std::string toText(std::vector<Finding> const& findings, Style const& style);
 
 } // namespace velmora

@@ -36,9 +36,6 @@ inline bool hasAnswer(FreezeReport const& report)
     return report.answered;
 }
 
-// Indented lines under the heading of a control module.
-std::string toText(FreezeReport const& report, Style const& style);
-
 // "frame", "answered" and "freeze", which is null for a frame that holds nothing.
 Json toJsonValue(FreezeReport const& report);
 

@@ -44,7 +44,6 @@ struct InfoReport
 std::vector<InfoReport::Calibration> pairCalibrations(std::vector<std::string> const& ids,
                                                       std::vector<std::string> const& verifications);
 
-std::string toText(InfoReport const& report, Style const& style);
 Json toJsonValue(InfoReport const& report);
 
 } // namespace velmora

@@ -6,32 +6,16 @@
 
 namespace velmora {
 
-namespace {
-
-struct VerdictWord
+char const* verdictWord(LimitTest::Verdict verdict)
 {
-    char const* text; // empty for none
-    Mark mark;
-};
-
-VerdictWord const& word(LimitTest::Verdict verdict)
-{
-    static constexpr VerdictWord words[] = {
-        {"failed", Mark::Bad}, {"passed", Mark::Good}, {"no result", Mark::Faint}, {"", Mark::None}};
+    static constexpr char const* words[] = {"failed", "passed", "no result", ""};
     return words[static_cast<int>(verdict)];
 }
 
-std::string idText(int id)
+std::string testId(int id)
 {
     return fmt::format("{:02X}", id);
 }
-
-Cell number(std::string const& text)
-{
-    return {text.empty() ? "-" : text, Mark::None, true};
-}
-
-} // namespace
 
 std::vector<LimitTest> failedFirst(std::vector<LimitTest> tests)
 {
@@ -40,35 +24,11 @@ std::vector<LimitTest> failedFirst(std::vector<LimitTest> tests)
     return tests;
 }
 
-// Descriptions may be longer than a line is wide, so they stand last.
-std::vector<Cell> limitTestHeads()
-{
-    return {{"  Result"},
-            {"Test"},
-            {"Value", Mark::None, true},
-            {"Minimum", Mark::None, true},
-            {"Maximum", Mark::None, true},
-            {"Unit"},
-            {"Description"}};
-}
-
-std::vector<Cell> limitTestRow(LimitTest const& test)
-{
-    VerdictWord const& verdict = word(test.verdict);
-    return {{std::string("  ") + (*verdict.text == '\0' ? "-" : verdict.text), verdict.mark},
-            {idText(test.id)},
-            number(test.value),
-            number(test.minimum),
-            number(test.maximum),
-            {test.unit},
-            {test.description}};
-}
-
 Json toJsonValue(LimitTest const& test)
 {
-    return {{"id", idText(test.id)},
+    return {{"id", testId(test.id)},
             {"description", textOrNull(test.description)},
-            {"result", textOrNull(word(test.verdict).text)},
+            {"result", textOrNull(verdictWord(test.verdict))},
             {"value", textOrNull(test.value)},
             {"minimum", textOrNull(test.minimum)},
             {"maximum", textOrNull(test.maximum)},

@@ -1,7 +1,6 @@
 #pragma once
 
 #include "libvelmora/report/json.h"
-#include "program/view/layout.h"
 
 #include <string>
 #include <vector>
@@ -28,12 +27,14 @@ struct LimitTest
     Verdict verdict;
 };
 
+// "failed", "passed" or "no result"; empty for a constant.
+char const* verdictWord(LimitTest::Verdict verdict);
+
+// "0A"
+std::string testId(int id);
+
 // The tests in the order of their verdicts, the failed first, else as they were.
 std::vector<LimitTest> failedFirst(std::vector<LimitTest> tests);
-
-// Rows for drawColumns: the heads of the columns, and a test below them.
-std::vector<Cell> limitTestHeads();
-std::vector<Cell> limitTestRow(LimitTest const& test);
 
 Json toJsonValue(LimitTest const& test);
 Json toJsonValue(std::vector<LimitTest> const& tests);

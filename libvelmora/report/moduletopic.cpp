@@ -8,9 +8,4 @@ char const* answerWord(TopicAnswer answer)
     return words[static_cast<int>(answer)];
 }
 
-std::string moduleHeading(unsigned int id, std::string const& name)
-{
-    return fmt::format("Control module {:X}{}{}", id, name.empty() ? "" : ": ", name);
-}
-
 } // namespace velmora

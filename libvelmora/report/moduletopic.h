@@ -1,7 +1,6 @@
 #pragma once
 
 #include "libvelmora/report/json.h"
-#include "program/view/style.h"
 
 #include <fmt/format.h>
 
@@ -24,8 +23,8 @@ enum class TopicAnswer
 // "read", "not supported", "no answer" or "unreadable".
 char const* answerWord(TopicAnswer answer);
 
-// What one control module told of one topic. For each Report there are toText(Report, Style), indented lines without a
-// heading; toJsonValue(Report), an object; and hasAnswer(Report), whether it holds anything.
+// What one control module told of one topic. For each Report there are toJsonValue(Report), an object, and
+// hasAnswer(Report), whether it holds anything.
 template <typename Report>
 struct ModuleTopic
 {
@@ -46,20 +45,6 @@ template <HasTopicAnswer Report>
 bool hasAnswer(Report const& report)
 {
     return report.answer == TopicAnswer::Read;
-}
-
-// "Control module 7E8: ECM"
-std::string moduleHeading(unsigned int id, std::string const& name);
-
-template <typename Report>
-std::string toText(std::vector<ModuleTopic<Report>> const& modules, Style const& style)
-{
-    std::string text;
-    for (ModuleTopic<Report> const& module : modules) {
-        text +=
-            (text.empty() ? "" : "\n") + moduleHeading(module.id, module.name) + "\n" + toText(module.report, style);
-    }
-    return text;
 }
 
 // A list of modules: "id", "name", and what the topic's own object holds.

@@ -22,8 +22,9 @@ struct MonitorsReport
     std::vector<OnBoardMonitor> monitors;
 };
 
-// A summary, then the tests by monitor; monitors with failed tests first, and in each the failed tests first.
-std::string toText(MonitorsReport const& report, Style const& style);
+// Monitors with failed tests first, and in each the failed tests first; else as they were.
+std::vector<OnBoardMonitor> failedFirst(std::vector<OnBoardMonitor> monitors);
+
 Json toJsonValue(MonitorsReport const& report);
 
 } // namespace velmora

@@ -28,8 +28,6 @@ struct OxygenReport
 // "Bank 1 sensor 2"
 std::string locationName(obd::OxygenSensorLocation location);
 
-// The sensors with their places, and below each its tests, the failed first.
-std::string toText(OxygenReport const& report, Style const& style);
 // "tests" is null on CAN.
 Json toJsonValue(OxygenReport const& report);
 

@@ -33,8 +33,12 @@ std::size_t countNotComplete(ReadinessReport const& report);
 // Whether the module has monitors and all have run; nothing if it has none or told nothing.
 std::optional<bool> isReady(ReadinessReport const& report);
 
-// A verdict, then the monitors: what is not complete first, what the vehicle does not have last.
-std::string toText(ReadinessReport const& report, Style const& style);
+// "complete", "not complete", "disabled this cycle" or "not available".
+char const* statusWord(ReadinessStatus status);
+
+// What is not complete first, what the vehicle does not have last; else as they were.
+std::vector<ReadinessMonitor> notCompleteFirst(std::vector<ReadinessMonitor> monitors);
+
 Json toJsonValue(ReadinessReport const& report);
 
 } // namespace velmora

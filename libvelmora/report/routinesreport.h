@@ -39,10 +39,11 @@ struct RoutineRun
 // "01"
 std::string routineId(int id);
 
-std::string toText(RoutinesReport const& report, Style const& style);
+// "accepted", "refused" or "no answer".
+char const* resultWord(RoutineRun::Result result);
+
 Json toJsonValue(RoutinesReport const& report);
 
-std::string toText(RoutineRun const& run, Style const& style);
 Json toJsonValue(RoutineRun const& run);
 
 } // namespace velmora

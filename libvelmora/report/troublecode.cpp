@@ -2,8 +2,6 @@
 
 #include "libvelmora/report/json.h"
 
-#include <fmt/format.h>
-
 #include <algorithm>
 
 namespace velmora {
@@ -23,16 +21,6 @@ std::vector<TroubleCode> groupByCode(std::vector<std::shared_ptr<obd::DtcDataMod
         }
     }
     return codes;
-}
-
-std::string toText(TroubleCode const& code, std::string const& indent)
-{
-    std::string text;
-    for (TroubleCode::Meaning const& meaning : code.meanings) {
-        text +=
-            fmt::format("{}{:<5}  {:<13}  {}\n", indent, text.empty() ? code.code : "", meaning.maker, meaning.text);
-    }
-    return text;
 }
 
 Json toJsonValue(TroubleCode const& code)

@@ -29,9 +29,6 @@ struct TroubleCode
 // Brings the meanings of each code together, each once, with the codes in the order of their first appearance.
 std::vector<TroubleCode> groupByCode(std::vector<std::shared_ptr<obd::DtcDataModel>> const& models);
 
-// One line a meaning: code, maker and text in columns, behind the indent.
-std::string toText(TroubleCode const& code, std::string const& indent = {});
-
 nlohmann::ordered_json toJsonValue(TroubleCode const& code);
 nlohmann::ordered_json toJsonValue(std::vector<TroubleCode> const& codes);
 

@@ -50,10 +50,6 @@ struct VehicleReport
     std::vector<ModuleReport> modules; // in rising order of id
 };
 
-// Headings and aligned columns, for people: adapter and protocol, what is wrong with the whole vehicle, then all that
-// each module told.
-std::string toText(VehicleReport const& report, Style const& style);
-
 // The document that docs/json.md describes.
 std::string toJson(VehicleReport const& report);
 

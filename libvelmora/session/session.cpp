@@ -5,10 +5,7 @@
 #include "libvelmora/record/traffictrace.h"
 #include "libvelmora/session/settingsstore.h"
 #include "libvelmora/text/text.h"
-#include "program/terminal/interrupt.h"
-#include "program/terminal/output.h"
 
-#include <obd/databridge.h>
 #include <obd/iconnectionmanager.h>
 #include <obd/iconnectionoptions.h>
 #include <obd/idevice.h>
@@ -21,6 +18,7 @@
 
 #include <atomic>
 #include <thread>
+#include <utility>
 
 namespace velmora {
 
@@ -38,11 +36,12 @@ std::string portKey()
 
 } // namespace
 
-Session::Session(GlobalOptions const& options)
-    : m_options(options), m_deadline([this] { m_bridge->invalidate(); }),
-      m_settings(std::make_shared<SettingsStore>(
-          options.settingsFile.empty() ? SettingsStore::defaultFile() : std::filesystem::path(options.settingsFile))),
-      m_library(options.logFile)
+Session::Session(SessionOptions options)
+    : m_options(std::move(options)), m_deadline([this] { m_link->cut(); }),
+      m_settings(std::make_shared<SettingsStore>(m_options.settingsFile.empty()
+                                                     ? SettingsStore::defaultFile()
+                                                     : std::filesystem::path(m_options.settingsFile))),
+      m_library(m_options.logFile)
 {
     m_obd = obd::ObdVelmoraBuilder::createObdVelmora(0, 0, 0, m_settings);
     if (m_options.units) {
@@ -106,65 +105,91 @@ obd::VehicleProtocol Session::protocol() const
 void Session::connect()
 {
     PortAddress const address = portAddress();
-    m_bridge = std::make_shared<obd::DataBridge>();
-    std::unique_ptr<IPort> port = openPort(address);
-    if (m_recorder != nullptr) {
-        port = std::make_unique<RecordedPort>(std::move(port), *m_recorder);
-    }
-    m_pump = std::make_unique<BridgePump>(std::move(port), m_bridge);
-    if (!m_options.quiet) {
-        tell(fmt::format("Connecting to {} ...\n", toString(address)));
-    }
+    openLink(address);
+    tellProgress(fmt::format("Connecting to {} ...\n", toString(address)));
     if (!openOnThread()) {
         failOpening(address);
     }
-    if (m_options.verbose) {
+    if (m_options.onDetail) {
         tellConnected();
     }
     selectEcu();
 }
 
-void Session::tellConnected() const
+void Session::openLink(PortAddress const& address)
 {
-    std::shared_ptr<obd::IAdapter> const found = adapter();
-    tell(fmt::format("Connected: {} {}, {}\n", readable(found->device()), readable(found->description()),
-                     readable(found->getProtocolDescription())));
-    for (std::shared_ptr<obd::IEcu> const& ecu : m_obd->getEcuManager()->getEcus()) {
-        tell(fmt::format("Control module {:X}: {} ({})\n", ecu->id(), readable(ecu->name()),
-                         readable(ecu->description())));
+    std::unique_ptr<IPort> port = openPort(address);
+    if (m_recorder != nullptr) {
+        port = std::make_unique<RecordedPort>(std::move(port), *m_recorder);
+    }
+    m_link = std::make_unique<Link>(std::move(port));
+}
+
+void Session::tellProgress(std::string const& lines) const
+{
+    if (m_options.onProgress) {
+        m_options.onProgress(lines);
     }
 }
 
-// The opening may take minutes; meanwhile this thread dispatches and listens for Ctrl-C.
+void Session::tellConnected() const
+{
+    std::shared_ptr<obd::IAdapter> const found = adapter();
+    m_options.onDetail(fmt::format("Connected: {} {}, {}\n", readable(found->device()), readable(found->description()),
+                                   readable(found->getProtocolDescription())));
+    for (std::shared_ptr<obd::IEcu> const& ecu : m_obd->getEcuManager()->getEcus()) {
+        m_options.onDetail(fmt::format("Control module {:X}: {} ({})\n", ecu->id(), readable(ecu->name()),
+                                       readable(ecu->description())));
+    }
+}
+
+// The opening may take minutes; meanwhile this thread dispatches.
 bool Session::openOnThread()
 {
+    enter(Phase::Opening);
     std::atomic<bool> done{false};
     bool opened = false;
     std::thread opener([&] {
-        opened = m_obd->getConnectionManager()->openConnection(m_bridge, protocol(), m_options.reset);
+        opened = m_obd->getConnectionManager()->openConnection(m_link->connection(), protocol(), m_options.reset);
         done = true;
-        m_loop.wake();
-    });
-    Interrupt::instance().setHandler([this] {
-        m_bridge->invalidate();
         m_loop.wake();
     });
     m_loop.runUntil([&done] { return done.load(); });
     opener.join();
-    Interrupt::instance().setHandler([this] {
-        m_loop.wake();
-        m_deadline.start();
-    });
+    enter(Phase::Open);
     return opened;
+}
+
+void Session::enter(Phase phase)
+{
+    {
+        std::lock_guard const lock(m_phaseMutex);
+        m_phase = phase;
+    }
+    if (m_interrupted) {
+        interrupt();
+    }
+}
+
+void Session::interrupt()
+{
+    std::lock_guard const lock(m_phaseMutex);
+    m_interrupted = true;
+    if (m_phase == Phase::Opening) {
+        m_link->cut();
+    } else if (m_phase == Phase::Open) {
+        m_deadline.start();
+    }
+    m_loop.wake();
 }
 
 void Session::failOpening(PortAddress const& address)
 {
     std::string const port = toString(address);
-    if (Interrupt::instance().raised()) {
+    if (m_interrupted) {
         failInterrupted();
     }
-    if (m_pump->lost()) {
+    if (m_link->lost()) {
         throw Error(ErrorKind::LinkLost, "The link to the adapter on " + port + " broke while connecting",
                     {"is the adapter still plugged in and in reach?"});
     }
@@ -201,26 +226,25 @@ void Session::selectEcu()
 
 void Session::check() const
 {
-    if (Interrupt::instance().raised()) {
+    if (m_interrupted) {
         failInterrupted();
     }
-    if (m_pump != nullptr && m_pump->lost()) {
+    if (m_link != nullptr && m_link->lost()) {
         throw Error(ErrorKind::LinkLost, "The link to the adapter broke", {"is it still plugged in and in reach?"});
     }
 }
 
 void Session::close()
 {
-    Interrupt::instance().setHandler(nullptr);
-    if (m_bridge == nullptr) {
+    enter(Phase::Closed);
+    if (m_link == nullptr) {
         return;
     }
     m_deadline.start();
     m_obd->getConnectionManager()->closeConnection();
-    m_bridge->invalidate();
+    m_link->cut();
     m_deadline.stop();
-    m_pump.reset();
-    m_bridge.reset();
+    m_link.reset();
 }
 
 } // namespace velmora

@@ -1,18 +1,20 @@
 #pragma once
 
-#include "libvelmora/port/bridgepump.h"
 #include "libvelmora/port/portaddress.h"
 #include "libvelmora/session/deadline.h"
 #include "libvelmora/session/dispatchloop.h"
 #include "libvelmora/session/libraryuse.h"
-#include "program/globaloptions.h"
+#include "libvelmora/session/link.h"
+#include "libvelmora/session/sessionoptions.h"
 
 #include <obd/iadapter.h>
 #include <obd/iecumanager.h>
 #include <obd/iobdproxy.h>
 #include <obd/iobdvelmora.h>
 
+#include <atomic>
 #include <memory>
+#include <mutex>
 #include <optional>
 #include <string>
 #include <vector>
@@ -23,12 +25,12 @@ class DialogueRecorder;
 class SettingsStore;
 class TrafficTrace;
 
-// The library in use by one command: settings, log and top-level object from the start, a connection after connect. The
-// main thread's.
+// The library in use: settings, log and top-level object from the start, a connection after connect. For one thread,
+// the one that dispatches.
 class Session
 {
 public:
-    explicit Session(GlobalOptions const& options);
+    explicit Session(SessionOptions options);
     // Closes what is open. Services must be gone.
     ~Session();
     Session(Session const&) = delete;
@@ -51,13 +53,28 @@ public:
     // The port's address, for messages and reports.
     std::string port() const { return toString(portAddress()); }
     DispatchLoop& loop() { return m_loop; }
-    GlobalOptions const& options() const { return m_options; }
+    SessionOptions const& options() const { return m_options; }
+    // Tells whoever wants to know what the session is at: lines with their line feeds.
+    void tellProgress(std::string const& lines) const;
 
-    // Throws Error if the link has broken or the user has interrupted meanwhile.
+    // Throws Error if the link has broken or the session was interrupted meanwhile.
     void check() const;
 
+    // Ends what the session is at, for good: the opening at once, else what is asked soon. Any thread.
+    void interrupt();
+    bool interrupted() const { return m_interrupted; }
+
 private:
+    enum class Phase
+    {
+        Closed,
+        Opening,
+        Open,
+    };
+
     PortAddress portAddress() const;
+    void openLink(PortAddress const& address);
+    void enter(Phase phase);
     obd::VehicleProtocol protocol() const;
     bool openOnThread();
     [[noreturn]] void failOpening(PortAddress const& address);
@@ -65,15 +82,17 @@ private:
     void selectEcu();
     void close();
 
-    GlobalOptions const m_options;
+    SessionOptions const m_options;
     // Ends the waiting for a silent adapter soon after a close or an interruption began.
     Deadline m_deadline;
     std::shared_ptr<SettingsStore> m_settings;
     LibraryUse const m_library;
     DispatchLoop m_loop;
     std::shared_ptr<obd::IObdVelmora> m_obd;
-    std::shared_ptr<obd::DataBridge> m_bridge;
-    std::unique_ptr<BridgePump> m_pump;
+    std::unique_ptr<Link> m_link;
+    std::atomic<bool> m_interrupted{false};
+    std::mutex m_phaseMutex;
+    Phase m_phase = Phase::Closed; // protected by m_phaseMutex
     DialogueRecorder* m_recorder = nullptr;
     std::unique_ptr<TrafficTrace> m_trace;
 };

@@ -1,7 +1,7 @@
 #include "libvelmora/read/servicereplies.h"
 #include "libvelmora/report/json.h"
-#include "libvelmora/session/session.h"
 #include "program/command/commands.h"
+#include "program/command/commandsession.h"
 #include "program/command/confirm.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
@@ -12,7 +12,7 @@
 
 #include <set>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -118,7 +118,7 @@ ExitCode judge(std::vector<ModuleOutcome> const& outcomes)
 ExitCode clear(GlobalOptions const& options)
 {
     checkOptions(options);
-    Session session(options);
+    CommandSession session(options);
     session.connect();
     if (!confirmed(session, clearWarning, "Clear now?")) {
         tell("Nothing was cleared.\n");
@@ -144,4 +144,4 @@ void addClearCommand(CommandLine& commandLine)
                            clear);
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -1,11 +1,12 @@
 #include "libvelmora/read/codereader.h"
 #include "program/command/commands.h"
+#include "program/command/commandsession.h"
 #include "program/command/modulecommand.h"
 #include "program/commandline.h"
 
 #include <algorithm>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -52,7 +53,7 @@ Error withoutAnswer(std::vector<ModuleCodes> const& modules)
 
 ExitCode codes(CodesOptions const& chosen, GlobalOptions const& options)
 {
-    Session session(options);
+    CommandSession session(options);
     session.connect();
     CodeReader reader(session);
     auto const modules = readModules(
@@ -75,4 +76,4 @@ void addCodesCommand(CommandLine& commandLine)
     command->add_flag("--permanent", chosen->permanent, "Codes that only the vehicle itself erases");
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -1,6 +1,6 @@
 #include "program/command/commands.h"
 
-namespace velmora {
+namespace velmora::cli {
 
 void addCommands(CommandLine& commandLine)
 {
@@ -26,4 +26,4 @@ void addCommands(CommandLine& commandLine)
     addPortsCommand(commandLine);
 }
 
-} // namespace velmora
+} // namespace velmora::cli

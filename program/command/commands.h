@@ -1,6 +1,6 @@
 #pragma once
 
-namespace velmora {
+namespace velmora::cli {
 
 class CommandLine;
 
@@ -29,4 +29,4 @@ void addSettingsCommand(CommandLine& commandLine);
 void addSimulateCommand(CommandLine& commandLine);
 void addVinCommand(CommandLine& commandLine);
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -9,7 +9,7 @@
 
 #include <unistd.h>
 
-namespace velmora {
+namespace velmora::cli {
 
 void requireConsent(GlobalOptions const& options, std::string const& action, std::string const& yes)
 {
@@ -19,7 +19,7 @@ void requireConsent(GlobalOptions const& options, std::string const& action, std
     }
 }
 
-bool confirmed(Session const& session, std::string const& warning, std::string const& question)
+bool confirmed(CommandSession const& session, std::string const& warning, std::string const& question)
 {
     if (session.options().yes) {
         return true;
@@ -29,4 +29,4 @@ bool confirmed(Session const& session, std::string const& warning, std::string c
     return LineReader(session).read(answer) && (answer == "y" || answer == "Y" || answer == "yes");
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -1,18 +1,18 @@
 #pragma once
 
-#include "libvelmora/session/session.h"
+#include "program/command/commandsession.h"
 
 #include <string>
 
 // How a command asks before it acts on the vehicle.
 
-namespace velmora {
+namespace velmora::cli {
 
 // Throws Error if the user must be asked and standard input is no terminal. action as in "Clearing", yes as in
 // "clears without asking".
 void requireConsent(GlobalOptions const& options, std::string const& action, std::string const& yes);
 
 // Asks, unless the options say yes already. The question is on standard error, behind the warning.
-bool confirmed(Session const& session, std::string const& warning, std::string const& question);
+bool confirmed(CommandSession const& session, std::string const& warning, std::string const& question);
 
-} // namespace velmora
+} // namespace velmora::cli

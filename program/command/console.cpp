@@ -1,5 +1,5 @@
-#include "libvelmora/session/session.h"
 #include "program/command/commands.h"
+#include "program/command/commandsession.h"
 #include "program/commandline.h"
 #include "program/terminal/linereader.h"
 #include "program/terminal/output.h"
@@ -11,7 +11,7 @@
 #include <optional>
 #include <unistd.h>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -35,7 +35,7 @@ void answer(Session& session, std::string const& command)
 class CommandSource
 {
 public:
-    explicit CommandSource(Session const& session)
+    explicit CommandSource(CommandSession const& session)
         : m_lines(session), m_asking(::isatty(STDIN_FILENO) != 0 && !session.options().quiet)
     {
         if (m_asking && PromptReader::isUsable()) {
@@ -63,7 +63,7 @@ private:
 
 ExitCode console(GlobalOptions const& options)
 {
-    Session session(options);
+    CommandSession session(options);
     session.connect();
     CommandSource commands(session);
     std::string command;
@@ -85,4 +85,4 @@ void addConsoleCommand(CommandLine& commandLine)
         console);
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -3,7 +3,7 @@
 #include "program/command/modulecommand.h"
 #include "program/commandline.h"
 
-namespace velmora {
+namespace velmora::cli {
 
 void addCountersCommand(CommandLine& commandLine)
 {
@@ -15,4 +15,4 @@ void addCountersCommand(CommandLine& commandLine)
     });
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -6,6 +6,7 @@
 #include "program/command/commands.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
+#include "program/view/reporttext.h"
 
 #include <obd/troublecodecatalogue.h>
 #include <velmora/error.h>
@@ -15,7 +16,7 @@
 #include <algorithm>
 #include <memory>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -136,4 +137,4 @@ void addDtcCommand(CommandLine& commandLine)
     command->add_flag("--dump", options->dump, "Print maker, code and text of all rows, with tabs between");
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -3,7 +3,7 @@
 #include "program/command/modulecommand.h"
 #include "program/commandline.h"
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -29,4 +29,4 @@ void addFreezeCommand(CommandLine& commandLine)
     command->add_option("FRAME", *frame, "Number of the frame (0)")->check(CLI::Range(0, 255));
 }
 
-} // namespace velmora
+} // namespace velmora::cli

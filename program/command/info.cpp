@@ -1,15 +1,16 @@
 #include "libvelmora/read/diagnosticreaders.h"
 #include "program/command/commands.h"
+#include "program/command/commandsession.h"
 #include "program/command/modulecommand.h"
 #include "program/commandline.h"
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
 ExitCode info(GlobalOptions const& options)
 {
-    Session session(options);
+    CommandSession session(options);
     session.connect();
     print(readModules(session, readInfo), options);
     return ExitCode::Done;
@@ -22,4 +23,4 @@ void addInfoCommand(CommandLine& commandLine)
     commandLine.addCommand("info", "Show what the control modules tell of themselves and the vehicle", info);
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -1,15 +1,16 @@
 #include "program/command/commands.h"
+#include "program/command/commandsession.h"
 #include "program/command/liverun.h"
 #include "program/commandline.h"
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
 ExitCode live(GlobalOptions const& global, LiveOptions const& options)
 {
     std::unique_ptr<LiveCsv> const csv = options.csv.empty() ? nullptr : std::make_unique<LiveCsv>(options.csv);
-    Session session(global);
+    CommandSession session(global);
     session.connect();
     LiveRun run(session, options, csv.get());
     run.run();
@@ -36,4 +37,4 @@ void addLiveCommand(CommandLine& commandLine)
         ->check(CLI::Range(0.001, 1e9));
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -11,7 +11,7 @@
 #include <algorithm>
 #include <cstdio>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -25,7 +25,7 @@ constexpr seconds longSilence{15};
 
 } // namespace
 
-LiveRun::LiveRun(Session& session, LiveOptions const& options, LiveCsv* csv)
+LiveRun::LiveRun(CommandSession& session, LiveOptions const& options, LiveCsv* csv)
     : m_session(session), m_options(options), m_csv(csv), m_service(obd::SensorServiceBuilder::createSensorService()),
       m_tap(*m_session.obd().getConnectionManager(), m_session.loop())
 {
@@ -200,4 +200,4 @@ void LiveRun::watchSilence(LiveTime now)
     m_silenceTold = true;
 }
 
-} // namespace velmora
+} // namespace velmora::cli

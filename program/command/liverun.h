@@ -2,7 +2,7 @@
 
 #include "libvelmora/read/sensorchoice.h"
 #include "libvelmora/session/cyclemeter.h"
-#include "libvelmora/session/session.h"
+#include "program/command/commandsession.h"
 #include "program/exitcode.h"
 #include "program/terminal/terminal.h"
 #include "program/view/livecsv.h"
@@ -17,7 +17,7 @@
 #include <string>
 #include <vector>
 
-namespace velmora {
+namespace velmora::cli {
 
 struct LiveOptions
 {
@@ -33,7 +33,7 @@ class LiveRun : public tervex::Observer<obd::ISensorServiceObserver>
 {
 public:
     // csv may be null. session must be connected and outlive the run.
-    LiveRun(Session& session, LiveOptions const& options, LiveCsv* csv);
+    LiveRun(CommandSession& session, LiveOptions const& options, LiveCsv* csv);
     ~LiveRun() override;
     LiveRun(LiveRun const&) = delete;
     LiveRun& operator=(LiveRun const&) = delete;
@@ -69,7 +69,7 @@ private:
     std::string status() const;
     FrameStyle style() const;
 
-    Session& m_session;
+    CommandSession& m_session;
     LiveOptions const m_options;
     LiveCsv* const m_csv;
     std::shared_ptr<obd::ISensorService> m_service;
@@ -90,4 +90,4 @@ private:
     std::string m_note; // in the status line, until the next key
 };
 
-} // namespace velmora
+} // namespace velmora::cli

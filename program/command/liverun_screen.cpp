@@ -8,7 +8,7 @@
 
 #include <algorithm>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -166,4 +166,4 @@ std::string LiveRun::status() const
     return m_silenceTold ? "No answer from the vehicle  " + keys : keys;
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -1,6 +1,6 @@
 #include "libvelmora/read/sensorchoice.h"
-#include "libvelmora/session/session.h"
 #include "program/command/commands.h"
+#include "program/command/commandsession.h"
 #include "program/commandline.h"
 #include "program/terminal/interrupt.h"
 #include "program/terminal/lineprinter.h"
@@ -12,7 +12,7 @@
 
 #include <chrono>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -70,7 +70,7 @@ SensorIds chosenSensors(std::vector<std::string> const& names, obd::ISensorServi
 
 ExitCode log(LogOptions const& chosen, GlobalOptions const& options)
 {
-    Session session(options);
+    CommandSession session(options);
     TrafficLog traffic(options.json);
     session.connect();
     auto const sensors = obd::SensorServiceBuilder::createSensorService();
@@ -109,4 +109,4 @@ void addLogCommand(CommandLine& commandLine)
         ->check(CLI::Range(0.001, 1e9));
 }
 
-} // namespace velmora
+} // namespace velmora::cli

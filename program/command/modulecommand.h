@@ -1,10 +1,11 @@
 #pragma once
 
 #include "libvelmora/report/moduletopic.h"
-#include "libvelmora/session/session.h"
 #include "libvelmora/text/text.h"
+#include "program/command/commandsession.h"
 #include "program/exitcode.h"
 #include "program/terminal/output.h"
+#include "program/view/reporttext.h"
 
 #include <obd/iecu.h>
 #include <velmora/error.h>
@@ -16,7 +17,7 @@
 
 // The common shape of the commands that show one topic of every control module.
 
-namespace velmora {
+namespace velmora::cli {
 
 // read: a Report of a Session and one of its modules, which it selects as the current one.
 template <typename Read>
@@ -62,7 +63,7 @@ void requireAnswer(std::vector<ModuleTopic<Report>> const& modules, Error const&
 template <typename Read>
 ExitCode showTopic(GlobalOptions const& options, Read const& read, Error const& notOffered)
 {
-    Session session(options);
+    CommandSession session(options);
     session.connect();
     auto const modules = readModules(session, read);
     print(modules, options);
@@ -70,4 +71,4 @@ ExitCode showTopic(GlobalOptions const& options, Read const& read, Error const& 
     return ExitCode::Done;
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -3,7 +3,7 @@
 #include "program/command/modulecommand.h"
 #include "program/commandline.h"
 
-namespace velmora {
+namespace velmora::cli {
 
 void addOxygenCommand(CommandLine& commandLine)
 {
@@ -16,4 +16,4 @@ void addOxygenCommand(CommandLine& commandLine)
                            });
 }
 
-} // namespace velmora
+} // namespace velmora::cli

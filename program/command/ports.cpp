@@ -6,7 +6,7 @@
 
 #include <fmt/format.h>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -37,4 +37,4 @@ void addPortsCommand(CommandLine& commandLine)
     commandLine.addCommand("ports", "List serial ports that look like adapters", listPorts);
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -3,7 +3,7 @@
 #include "program/command/modulecommand.h"
 #include "program/commandline.h"
 
-namespace velmora {
+namespace velmora::cli {
 
 void addReadinessCommand(CommandLine& commandLine)
 {
@@ -16,4 +16,4 @@ void addReadinessCommand(CommandLine& commandLine)
                            });
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -3,8 +3,10 @@
 #include "libvelmora/record/dialoguerecorder.h"
 #include "libvelmora/record/vinmask.h"
 #include "program/command/commands.h"
+#include "program/command/commandsession.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
+#include "program/view/reporttext.h"
 
 #include <obd/isensorservice.h>
 #include <velmora/error.h>
@@ -13,7 +15,7 @@
 
 #include <algorithm>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -45,7 +47,8 @@ void readSensors(Session& session)
     }
 }
 
-void save(DialogueRecorder const& recorder, Session const& session, RecordOptions const& chosen, DialogueFile& file)
+void save(DialogueRecorder const& recorder, CommandSession const& session, RecordOptions const& chosen,
+          DialogueFile& file)
 {
     obdsim::Dialogue dialogue = recorder.dialogue();
     if (dialogue.exchanges.empty()) {
@@ -67,7 +70,7 @@ ExitCode record(RecordOptions const& chosen, GlobalOptions const& options)
 {
     DialogueFile file(chosen.file);
     DialogueRecorder recorder;
-    Session session(options);
+    CommandSession session(options);
     session.record(recorder);
     VehicleReport report;
     try {
@@ -98,4 +101,4 @@ void addRecordCommand(CommandLine& commandLine)
                       "Keep the whole vehicle identification number; otherwise its last six characters become 0");
 }
 
-} // namespace velmora
+} // namespace velmora::cli

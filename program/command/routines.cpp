@@ -1,6 +1,7 @@
 #include "libvelmora/read/routinereader.h"
 #include "libvelmora/text/text.h"
 #include "program/command/commands.h"
+#include "program/command/commandsession.h"
 #include "program/command/confirm.h"
 #include "program/command/modulecommand.h"
 #include "program/commandline.h"
@@ -9,7 +10,7 @@
 
 #include <algorithm>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -83,7 +84,7 @@ ExitCode run(std::string const& text, GlobalOptions const& options)
 {
     unsigned char const id = parseRoutineId(text);
     requireConsent(options, "Running a routine", "runs it without asking");
-    Session session(options);
+    CommandSession session(options);
     session.connect();
     Candidate const candidate = find(session, id);
     if (!confirmed(session, routineWarning(candidate), "Run now?")) {
@@ -106,4 +107,4 @@ void addRoutinesCommand(CommandLine& commandLine)
     command->add_option("--run", *id, "Number of the routine, hexadecimal")->type_name("ID");
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -1,8 +1,9 @@
 #include "libvelmora/read/vehiclereader.h"
-#include "libvelmora/session/session.h"
 #include "program/command/commands.h"
+#include "program/command/commandsession.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
+#include "program/view/reporttext.h"
 
 #include <velmora/error.h>
 
@@ -10,7 +11,7 @@
 
 #include <algorithm>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -34,7 +35,7 @@ ExitCode check(VehicleReport const& report)
 
 ExitCode scan(bool checking, GlobalOptions const& options)
 {
-    Session session(options);
+    CommandSession session(options);
     session.connect();
     VehicleReport const report = readVehicle(session);
     fmt::print("{}", options.json ? toJson(report) : toText(report, outputStyle(options)));
@@ -53,4 +54,4 @@ void addScanCommand(CommandLine& commandLine)
                       "Exit with code 10 if the lamp is on or a code is confirmed or permanent; a pending one is none");
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -1,8 +1,8 @@
 #include "libvelmora/report/json.h"
 #include "libvelmora/report/unitlabel.h"
-#include "libvelmora/session/session.h"
 #include "libvelmora/text/text.h"
 #include "program/command/commands.h"
+#include "program/command/commandsession.h"
 #include "program/commandline.h"
 
 #include <obd/iecu.h>
@@ -10,7 +10,7 @@
 
 #include <fmt/format.h>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -133,7 +133,7 @@ Json toJson(obd::IEcu const& ecu, bool all)
 
 ExitCode sensors(GlobalOptions const& options, bool all)
 {
-    Session session(options);
+    CommandSession session(options);
     session.connect();
     Json modules = Json::array();
     for (std::shared_ptr<obd::IEcu> const& ecu : session.selectedModules()) {
@@ -161,4 +161,4 @@ void addSensorsCommand(CommandLine& commandLine)
     command->add_flag("--all", chosen->all, "Also what the vehicle does not offer");
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -10,7 +10,7 @@
 
 #include <fmt/format.h>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -102,4 +102,4 @@ void addSettingsCommand(CommandLine& commandLine)
         ->type_name("");
 }
 
-} // namespace velmora
+} // namespace velmora::cli

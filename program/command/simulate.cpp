@@ -14,7 +14,7 @@
 #include <memory>
 #include <variant>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -110,4 +110,4 @@ void addSimulateCommand(CommandLine& commandLine)
     command->add_flag("--list", options->list, "List vehicles and adapters");
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -8,7 +8,7 @@
 
 #include <chrono>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -38,4 +38,4 @@ void addVinCommand(CommandLine& commandLine)
         ->required();
 }
 
-} // namespace velmora
+} // namespace velmora::cli

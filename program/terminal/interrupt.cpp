@@ -7,7 +7,7 @@
 #include <unistd.h>
 #include <utility>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -88,4 +88,4 @@ void Interrupt::setHandler(std::function<void()> handler)
     }
 }
 
-} // namespace velmora
+} // namespace velmora::cli

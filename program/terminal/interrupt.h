@@ -5,7 +5,7 @@
 #include <mutex>
 #include <thread>
 
-namespace velmora {
+namespace velmora::cli {
 
 // Ctrl-C and the wish to terminate. Made in main before any other thread: from then on the signals reach this object
 // only. The first one asks the running command to end; the second ends the program at once.
@@ -43,4 +43,4 @@ private:
     std::thread m_thread;
 };
 
-} // namespace velmora
+} // namespace velmora::cli

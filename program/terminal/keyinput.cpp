@@ -3,7 +3,7 @@
 #include <poll.h>
 #include <unistd.h>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -105,4 +105,4 @@ std::optional<Key> KeyInput::read(std::chrono::milliseconds limit)
     return takeKey(m_bytes);
 }
 
-} // namespace velmora
+} // namespace velmora::cli

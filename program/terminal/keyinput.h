@@ -5,7 +5,7 @@
 #include <string>
 #include <termios.h>
 
-namespace velmora {
+namespace velmora::cli {
 
 enum class Key : int
 {
@@ -51,4 +51,4 @@ private:
     std::string m_bytes;
 };
 
-} // namespace velmora
+} // namespace velmora::cli

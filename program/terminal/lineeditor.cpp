@@ -2,7 +2,7 @@
 
 #include <utility>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -121,4 +121,4 @@ std::string LineEditor::take()
     return std::exchange(m_text, {});
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -6,7 +6,7 @@
 #include <string>
 #include <vector>
 
-namespace velmora {
+namespace velmora::cli {
 
 // A line while it is typed, with the lines before it behind the arrow keys. Knows no screen.
 class LineEditor
@@ -40,4 +40,4 @@ private:
     std::string m_draft;     // the new line, while an old one is shown
 };
 
-} // namespace velmora
+} // namespace velmora::cli

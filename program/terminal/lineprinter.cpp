@@ -4,7 +4,7 @@
 
 #include <utility>
 
-namespace velmora {
+namespace velmora::cli {
 
 LinePrinter::LinePrinter() : m_thread([this] { run(); }) {}
 
@@ -74,4 +74,4 @@ void LinePrinter::run()
     }
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -7,7 +7,7 @@
 #include <string>
 #include <thread>
 
-namespace velmora {
+namespace velmora::cli {
 
 // Prints to standard output on a thread of its own, so that a slow reader holds up nobody who hands in lines.
 class LinePrinter
@@ -44,4 +44,4 @@ private:
     std::thread m_thread;
 };
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -6,7 +6,7 @@
 #include <unistd.h>
 #include <utility>
 
-namespace velmora {
+namespace velmora::cli {
 
 bool LineReader::read(std::string& line)
 {
@@ -39,4 +39,4 @@ bool LineReader::fill()
     return count > 0;
 }
 
-} // namespace velmora
+} // namespace velmora::cli

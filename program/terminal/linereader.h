@@ -3,8 +3,10 @@
 #include <string>
 
 namespace velmora {
-
 class Session;
+}
+
+namespace velmora::cli {
 
 // Lines of standard input, without losing Ctrl-C while waiting for one.
 class LineReader
@@ -22,4 +24,4 @@ private:
     std::string m_buffer;
 };
 
-} // namespace velmora
+} // namespace velmora::cli

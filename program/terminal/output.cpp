@@ -5,7 +5,7 @@
 #include <cstring>
 #include <system_error>
 
-namespace velmora {
+namespace velmora::cli {
 
 bool writeOutput(std::string const& text)
 {
@@ -35,4 +35,4 @@ Error outputFailure(int error)
             {"is the disk full that it goes to?"}};
 }
 
-} // namespace velmora
+} // namespace velmora::cli

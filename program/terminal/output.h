@@ -6,7 +6,7 @@
 
 // Standard output: what is printed there is buffered, so that it may fail late.
 
-namespace velmora {
+namespace velmora::cli {
 
 // Writes at once. False if the reader has gone, who has read enough then. Throws Error if the text can't be written.
 bool writeOutput(std::string const& text);
@@ -20,4 +20,4 @@ void tell(std::string const& text);
 // What to tell of an error number of standard output.
 Error outputFailure(int error);
 
-} // namespace velmora
+} // namespace velmora::cli

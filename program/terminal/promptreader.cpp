@@ -12,7 +12,7 @@
 #include <cstring>
 #include <unistd.h>
 
-namespace velmora {
+namespace velmora::cli {
 
 bool PromptReader::isUsable()
 {
@@ -70,4 +70,4 @@ void PromptReader::draw() const
     tell(fmt::format("\r> {}\033[K{}", m_editor.text(), behind > 0 ? fmt::format("\033[{}D", behind) : ""));
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -6,8 +6,10 @@
 #include <string>
 
 namespace velmora {
-
 class Session;
+}
+
+namespace velmora::cli {
 
 // Lines that a user types at a prompt on standard error, with the lines before them behind the arrow keys. However the
 // program ends short of being killed, the terminal is as before.
@@ -34,4 +36,4 @@ private:
     LineEditor m_editor;
 };
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -7,7 +7,7 @@
 #include <sys/ioctl.h>
 #include <unistd.h>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -83,4 +83,4 @@ std::optional<Key> Terminal::readKey()
     return m_keys.read(std::chrono::milliseconds(0));
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -6,7 +6,7 @@
 #include <optional>
 #include <string>
 
-namespace velmora {
+namespace velmora::cli {
 
 // The screen of a terminal for as long as the object lives: keys come singly and are not shown, frames replace each
 // other on a page of their own. However the program ends short of being killed, the terminal is as before. Ctrl-C goes
@@ -41,4 +41,4 @@ private:
     bool m_inside = false;
 };
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -7,7 +7,7 @@
 #include <algorithm>
 #include <sstream>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -85,4 +85,4 @@ std::string counted(std::size_t count, std::string const& noun)
     return fmt::format("{} {}{}", count, noun, count == 1 ? "" : "s");
 }
 
-} // namespace velmora
+} // namespace velmora::cli

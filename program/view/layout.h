@@ -5,7 +5,7 @@
 #include <string>
 #include <vector>
 
-namespace velmora {
+namespace velmora::cli {
 
 // One line under the heading of a control module: label and value in columns. A value that was not told is "-".
 std::string labelledLine(std::string const& label, std::string const& value);
@@ -26,4 +26,4 @@ std::string wrapped(std::string const& text, std::size_t width, std::string cons
 // "1 code", "2 codes", "0 codes".
 std::string counted(std::size_t count, std::string const& noun);
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -10,7 +10,7 @@
 #include <fcntl.h>
 #include <unistd.h>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -122,4 +122,4 @@ void LiveCsv::sync(LiveTime now)
     }
 }
 
-} // namespace velmora
+} // namespace velmora::cli

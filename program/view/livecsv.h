@@ -6,7 +6,7 @@
 #include <memory>
 #include <string>
 
-namespace velmora {
+namespace velmora::cli {
 
 // The header row: the time, then one column a sensor with its unit.
 std::string toCsvHeader(std::vector<LiveRow> const& rows);
@@ -55,4 +55,4 @@ private:
     LiveTime m_syncTime;
 };
 
-} // namespace velmora
+} // namespace velmora::cli

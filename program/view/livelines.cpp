@@ -8,7 +8,7 @@
 
 #include <ctime>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -60,4 +60,4 @@ std::string toJsonLine(LiveRow const& row, std::string const& time)
     return line.dump(-1, ' ', false, Json::error_handler_t::replace) + "\n";
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -4,7 +4,7 @@
 
 #include <string>
 
-namespace velmora {
+namespace velmora::cli {
 
 // A point in time as "2024-03-07T09:05:02.123Z".
 std::string isoTime(std::chrono::system_clock::time_point time);
@@ -15,4 +15,4 @@ std::string toLine(LiveRow const& row);
 // One line of JSON with its line feed.
 std::string toJsonLine(LiveRow const& row, std::string const& time);
 
-} // namespace velmora
+} // namespace velmora::cli

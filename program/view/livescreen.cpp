@@ -7,7 +7,7 @@
 #include <algorithm>
 #include <cmath>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -182,4 +182,4 @@ std::string SensorPicker::draw(FrameStyle const& style) const
            "\n";
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -8,7 +8,7 @@
 #include <string>
 #include <vector>
 
-namespace velmora {
+namespace velmora::cli {
 
 // The size of a frame, and how it may look.
 struct FrameStyle
@@ -49,4 +49,4 @@ private:
     std::size_t m_cursor = 0;
 };
 
-} // namespace velmora
+} // namespace velmora::cli

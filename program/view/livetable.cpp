@@ -8,7 +8,7 @@
 #include <charconv>
 #include <cmath>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -153,4 +153,4 @@ std::string orDash(std::string const& text)
     return text.empty() ? "-" : text;
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -10,7 +10,7 @@
 #include <string>
 #include <vector>
 
-namespace velmora {
+namespace velmora::cli {
 
 using LiveTime = std::chrono::steady_clock::time_point;
 
@@ -82,4 +82,4 @@ std::string nameWithUnit(LiveRow const& row);
 // The text, or "-" where there is none.
 std::string orDash(std::string const& text);
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -4,7 +4,7 @@
 
 #include <cstdlib>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -40,4 +40,4 @@ Style outputStyle(GlobalOptions const& options)
     return Style(wantsColor(options.color, noColor != nullptr && *noColor != '\0', Terminal::isUsable()));
 }
 
-} // namespace velmora
+} // namespace velmora::cli

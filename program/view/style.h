@@ -4,7 +4,7 @@
 
 #include <string>
 
-namespace velmora {
+namespace velmora::cli {
 
 // What a text means to its reader, for its colour.
 enum class Mark
@@ -38,4 +38,4 @@ bool wantsColor(std::optional<ColorMode> mode, bool noColor, bool terminal);
 // The style of standard output.
 Style outputStyle(GlobalOptions const& options);
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -3,7 +3,7 @@
 #include <fmt/format.h>
 #include <nlohmann/json.hpp>
 
-namespace velmora {
+namespace velmora::cli {
 
 std::string toLine(obd::MessageDataModel const& entry)
 {
@@ -20,4 +20,4 @@ std::string toJsonLine(obd::MessageDataModel const& entry)
     return line.dump(-1, ' ', false, nlohmann::ordered_json::error_handler_t::replace) + "\n";
 }
 
-} // namespace velmora
+} // namespace velmora::cli

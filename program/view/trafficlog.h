@@ -4,7 +4,7 @@
 
 #include <string>
 
-namespace velmora {
+namespace velmora::cli {
 
 // One entry of the traffic log as one line: its time of day, ">>" towards the adapter or "<<" from it, the text.
 std::string toLine(obd::MessageDataModel const& entry);
@@ -12,4 +12,4 @@ std::string toLine(obd::MessageDataModel const& entry);
 // The same as one line of JSON.
 std::string toJsonLine(obd::MessageDataModel const& entry);
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -1,10 +1,9 @@
-#include "libvelmora/report/findings.h"
-#include "libvelmora/report/vehiclereport.h"
 #include "program/view/layout.h"
+#include "program/view/reporttext.h"
 
 #include <fmt/format.h>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -61,6 +60,11 @@ std::string moduleText(ModuleReport const& module, Style const& style)
 
 } // namespace
 
+std::string moduleHeading(unsigned int id, std::string const& name)
+{
+    return fmt::format("Control module {:X}{}{}", id, name.empty() ? "" : ": ", name);
+}
+
 std::string toText(VehicleReport const& report, Style const& style)
 {
     std::string text =
@@ -71,4 +75,4 @@ std::string toText(VehicleReport const& report, Style const& style)
     return text;
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -5,7 +5,7 @@
 
 #include <fmt/format.h>
 
-namespace velmora {
+namespace velmora::cli {
 
 namespace {
 
@@ -57,4 +57,4 @@ std::string toText(VinFacts const& facts, Style const& style)
            labelledLine("Trouble codes", codesText(facts));
 }
 
-} // namespace velmora
+} // namespace velmora::cli

@@ -5,9 +5,9 @@
 
 #include <string>
 
-namespace velmora {
+namespace velmora::cli {
 
 // What a vehicle identification number says, a line each.
 std::string toText(VinFacts const& facts, Style const& style);
 
-} // namespace velmora
+} // namespace velmora::cli

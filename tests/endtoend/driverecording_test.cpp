@@ -30,7 +30,7 @@ namespace {
 
 using obdsim::DriveState;
 using obdsim::Time;
-using velmora::LiveTime;
+using velmora::cli::LiveTime;
 
 constexpr Time recordingStep = std::chrono::seconds(10);
 
@@ -52,7 +52,7 @@ public:
     {
         m_table.select(service.getDescriptors());
         m_latest.resize(m_table.rows().size());
-        m_csv.begin(m_table, LiveTime(), velmora::LiveCsv::WallTime());
+        m_csv.begin(m_table, LiveTime(), velmora::cli::LiveCsv::WallTime());
     }
 
     void onSensorUpdated(bool /*success*/, std::shared_ptr<obd::ParameterDescriptor> const& descriptor,
@@ -87,8 +87,8 @@ private:
     }
 
     RequestWindows& m_windows;
-    velmora::LiveTable m_table;
-    velmora::LiveCsv m_csv;
+    velmora::cli::LiveTable m_table;
+    velmora::cli::LiveCsv m_csv;
     RowWindows m_latest;
 };
 

@@ -5,8 +5,8 @@
 namespace {
 
 using obd::VehicleProtocol;
-using velmora::parseEcuId;
-using velmora::parseProtocol;
+using velmora::cli::parseEcuId;
+using velmora::cli::parseProtocol;
 
 TEST(GlobalOptions, ProtocolsAreNumbersAsAdaptersPrintThem)
 {

@@ -66,7 +66,7 @@ includes common libobd libvelmora program simulator $([[ -d examples ]] && echo 
             wrong(path " has no floor")
         } else if (floorOf(path) > floorOf(file)) {
             wrong("floor " floorOf(path) " seen from floor " floorOf(file))
-        } else if (floorOf(path) == floorOf(file) && (path file) !~ /\/include\// && file ~ /^libobd/) {
+        } else if (floorOf(path) == floorOf(file) && (path file) !~ /\/include\// && file ~ /^lib(obd|velmora)\//) {
             noteRooms(roomOf(file), roomOf(path))
         }
     }
@@ -97,7 +97,7 @@ includes common libobd libvelmora program simulator $([[ -d examples ]] && echo 
         checkUser()
         if (file ~ /^libvelmora\/include\// && target ~ /^(libvelmora|common|simulator)\//) {
             wrong("is private to the companion")
-        } else if (target ~ /^common\// && target !~ /^common\/(clock|cthread|logrecord|loglevel)[.]h$/) {
+        } else if (target ~ /^common\// && target !~ /^common\/clock[.]h$/) {
             wrong("is private to the library")
         }
     }

@@ -4,8 +4,8 @@
 
 namespace {
 
-using velmora::Key;
-using velmora::LineEditor;
+using velmora::cli::Key;
+using velmora::cli::LineEditor;
 using State = LineEditor::State;
 
 void type(LineEditor& editor, std::string const& text)

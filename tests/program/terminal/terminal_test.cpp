@@ -4,8 +4,8 @@
 
 namespace {
 
-using velmora::Key;
-using velmora::takeKey;
+using velmora::cli::Key;
+using velmora::cli::takeKey;
 
 std::vector<int> keys(std::string bytes)
 {

@@ -5,6 +5,7 @@
 namespace {
 
 using namespace velmora;
+using namespace velmora::cli;
 
 TEST(Layout, LabelsStandInAColumn)
 {

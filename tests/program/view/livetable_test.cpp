@@ -9,9 +9,9 @@ using std::chrono::milliseconds;
 using std::chrono::seconds;
 using support::liveParameter;
 using support::liveValue;
-using velmora::LiveRow;
-using velmora::LiveTable;
-using velmora::LiveTime;
+using velmora::cli::LiveRow;
+using velmora::cli::LiveTable;
+using velmora::cli::LiveTime;
 
 class Live : public testing::Test
 {

@@ -18,6 +18,7 @@
 namespace {
 
 using namespace velmora;
+using namespace velmora::cli;
 using std::chrono::milliseconds;
 using std::chrono::seconds;
 using support::liveParameter;

@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 using namespace velmora;
+using namespace velmora::cli;
 
 TEST(TrafficLog, showsTimeDirectionAndText)
 {

@@ -1,11 +1,13 @@
 #include "libvelmora/read/diagnosticreaders.h"
 #include "libvelmora/report/countersreport.h"
+#include "program/view/reporttext.h"
 
 #include <gtest/gtest.h>
 
 namespace {
 
 using namespace velmora;
+using namespace velmora::cli;
 
 TEST(CountersReportView, ListsCountersInColumns)
 {

@@ -1,10 +1,12 @@
 #include "libvelmora/report/findings.h"
+#include "program/view/reporttext.h"
 
 #include <gtest/gtest.h>
 
 namespace {
 
 using namespace velmora;
+using namespace velmora::cli;
 
 TroubleCode const slow{"P0133", "Powertrain", {{"Generic", "Slow"}, {"Ford", "Slower"}}};
 TroubleCode const lean{"P0171", "Powertrain", {{"Generic", "Lean"}}};
@@ -91,9 +93,9 @@ TEST(Findings, AreMarkedByWeight)
     report.modules[0].codes = {true, {list(CodeKind::Confirmed, {slow}), list(CodeKind::Pending, {lean})}};
     std::vector<Finding> const found = findings(report);
     ASSERT_EQ(found.size(), 3U);
-    EXPECT_EQ(found[0].mark, Mark::Bad);
-    EXPECT_EQ(found[1].mark, Mark::Bad);
-    EXPECT_EQ(found[2].mark, Mark::Warning) << "a pending code is none yet";
+    EXPECT_EQ(found[0].severity, Severity::Bad);
+    EXPECT_EQ(found[1].severity, Severity::Bad);
+    EXPECT_EQ(found[2].severity, Severity::Warning) << "a pending code is none yet";
 }
 
 } // namespace

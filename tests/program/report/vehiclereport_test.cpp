@@ -1,10 +1,12 @@
 #include "libvelmora/report/vehiclereport.h"
+#include "program/view/reporttext.h"
 
 #include <gtest/gtest.h>
 
 namespace {
 
 using namespace velmora;
+using namespace velmora::cli;
 
 VehicleReport vehicle()
 {

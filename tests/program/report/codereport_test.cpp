@@ -1,4 +1,5 @@
 #include "libvelmora/report/codereport.h"
+#include "program/view/reporttext.h"
 
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
@@ -6,6 +7,7 @@
 namespace {
 
 using namespace velmora;
+using namespace velmora::cli;
 using Answer = CodeList::Answer;
 
 CodeList listWithCode(CodeKind kind)

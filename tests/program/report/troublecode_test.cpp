@@ -1,4 +1,5 @@
 #include "libvelmora/report/troublecode.h"
+#include "program/view/reporttext.h"
 
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
@@ -6,6 +7,7 @@
 namespace {
 
 using namespace velmora;
+using namespace velmora::cli;
 
 std::shared_ptr<obd::DtcDataModel> model(std::string const& code, std::string const& text, std::string const& maker)
 {

@@ -1,10 +1,12 @@
 #include "libvelmora/report/monitorsreport.h"
+#include "program/view/reporttext.h"
 
 #include <gtest/gtest.h>
 
 namespace {
 
 using namespace velmora;
+using namespace velmora::cli;
 using Verdict = LimitTest::Verdict;
 
 MonitorsReport const report{TopicAnswer::Read,

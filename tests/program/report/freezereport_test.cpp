@@ -1,4 +1,5 @@
 #include "libvelmora/report/freezereport.h"
+#include "program/view/reporttext.h"
 
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
@@ -6,6 +7,7 @@
 namespace {
 
 using namespace velmora;
+using namespace velmora::cli;
 
 std::vector<ModuleTopic<FreezeReport>> const modules = {
     {0x7E8,

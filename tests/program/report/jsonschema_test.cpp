@@ -18,6 +18,7 @@
 namespace {
 
 using namespace velmora;
+using namespace velmora::cli;
 using support::expectValid;
 using support::schemaErrors;
 

@@ -1,0 +1,31 @@
+#pragma once
+
+#include <obd/unitsystem.h>
+#include <obd/vehicleprotocol.h>
+
+#include <functional>
+#include <optional>
+#include <string>
+
+namespace velmora {
+
+// What a session is to use; the settings file fills what stays empty.
+struct SessionOptions
+{
+    std::string port;
+    std::optional<unsigned int> baud;
+    std::optional<obd::VehicleProtocol> protocol;
+    std::optional<obd::UnitSystem> units;
+    std::optional<unsigned int> ecu; // control module id
+    bool reset = false;              // restore and reset the adapter before use
+    std::string logFile;
+    std::string traceFile;
+    std::string settingsFile;
+
+    // Told what the session is at, each time as lines with their line feeds; null for nobody. On the thread that
+    // calls the session.
+    std::function<void(std::string const&)> onProgress;
+    std::function<void(std::string const&)> onDetail; // what was found on the way
+};
+
+} // namespace velmora

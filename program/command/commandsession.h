@@ -1,0 +1,23 @@
+#pragma once
+
+#include "libvelmora/session/session.h"
+#include "program/globaloptions.h"
+
+namespace velmora::cli {
+
+// The session of one command: tells its progress on standard error as far as the options want it, and Ctrl-C ends it.
+class CommandSession : public Session
+{
+public:
+    explicit CommandSession(GlobalOptions const& options);
+    ~CommandSession();
+    CommandSession(CommandSession const&) = delete;
+    CommandSession& operator=(CommandSession const&) = delete;
+
+    GlobalOptions const& options() const { return m_options; }
+
+private:
+    GlobalOptions const m_options;
+};
+
+} // namespace velmora::cli

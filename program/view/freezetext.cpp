@@ -1,0 +1,29 @@
+#include "program/view/layout.h"
+#include "program/view/reporttext.h"
+
+namespace velmora::cli {
+
+namespace {
+
+std::string frameText(FreezeFrame const& frame, Style const& style)
+{
+    std::vector<std::vector<Cell>> rows;
+    for (FreezeFrame::Reading const& reading : frame.readings) {
+        std::string const unit = reading.value && !reading.unit.empty() ? " " + reading.unit : "";
+        rows.push_back({{reading.name}, {reading.value.value_or("-") + unit}});
+    }
+    return toText(frame.code, "    ") + drawColumns(rows, "    ", style);
+}
+
+} // namespace
+
+std::string toText(FreezeReport const& report, Style const& style)
+{
+    std::string const number = std::to_string(report.number);
+    if (report.frame) {
+        return labelledLine("Freeze frame", number) + frameText(*report.frame, style);
+    }
+    return labelledLine("Freeze frame", number + (report.answered ? ": none stored" : ": no answer"));
+}
+
+} // namespace velmora::cli

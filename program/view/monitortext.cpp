@@ -1,0 +1,134 @@
+#include "program/view/layout.h"
+#include "program/view/reporttext.h"
+
+#include <fmt/format.h>
+
+#include <algorithm>
+
+namespace velmora::cli {
+
+namespace {
+
+using Verdict = LimitTest::Verdict;
+
+Mark mark(LimitTest::Verdict verdict)
+{
+    static constexpr Mark marks[] = {Mark::Bad, Mark::Good, Mark::Faint, Mark::None};
+    return marks[static_cast<int>(verdict)];
+}
+
+Cell number(std::string const& text)
+{
+    return {text.empty() ? "-" : text, Mark::None, true};
+}
+
+// Descriptions may be longer than a line is wide, so they stand last.
+std::vector<Cell> limitTestHeads()
+{
+    return {{"  Result"},
+            {"Test"},
+            {"Value", Mark::None, true},
+            {"Minimum", Mark::None, true},
+            {"Maximum", Mark::None, true},
+            {"Unit"},
+            {"Description"}};
+}
+
+std::vector<Cell> limitTestRow(LimitTest const& test)
+{
+    char const* const verdict = verdictWord(test.verdict);
+    return {{std::string("  ") + (*verdict == '\0' ? "-" : verdict), mark(test.verdict)},
+            {testId(test.id)},
+            number(test.value),
+            number(test.minimum),
+            number(test.maximum),
+            {test.unit},
+            {test.description}};
+}
+
+std::size_t count(MonitorsReport const& report, Verdict verdict)
+{
+    std::size_t sum = 0;
+    for (OnBoardMonitor const& monitor : report.monitors) {
+        sum += static_cast<std::size_t>(
+            std::count_if(monitor.tests.begin(), monitor.tests.end(),
+                          [verdict](LimitTest const& test) { return test.verdict == verdict; }));
+    }
+    return sum;
+}
+
+std::string summary(MonitorsReport const& report, Style const& style)
+{
+    if (report.answer != TopicAnswer::Read) {
+        return style.paint(Mark::Faint, answerWord(report.answer));
+    }
+    std::size_t const failed = count(report, Verdict::Failed);
+    std::size_t const without = count(report, Verdict::NoResult);
+    std::string text = failed > 0 ? style.paint(Mark::Bad, fmt::format("{} failed", failed)) + ", " : "";
+    text += fmt::format("{} passed", count(report, Verdict::Passed));
+    return text + (without > 0 ? fmt::format(", {} without result", without) : "");
+}
+
+std::string monitorText(OxygenReport const& report, Style const& style)
+{
+    if (report.answer != TopicAnswer::Read) {
+        return style.paint(Mark::Faint, answerWord(report.answer));
+    }
+    if (!report.complete) {
+        return {};
+    }
+    return *report.complete ? style.paint(Mark::Good, "complete")
+                            : style.paint(Mark::Warning, "not complete, so results don't count yet");
+}
+
+std::string sensorList(OxygenReport const& report)
+{
+    std::string list;
+    for (OxygenSensor const& sensor : report.sensors) {
+        list += (list.empty() ? "" : ", ") + locationName(sensor.location);
+    }
+    return list;
+}
+
+std::string drawTests(std::vector<OxygenSensor> const& sensors, Style const& style)
+{
+    std::vector<std::vector<Cell>> rows = {limitTestHeads()};
+    for (OxygenSensor const& sensor : sensors) {
+        rows.push_back({{locationName(sensor.location) + (sensor.tests.empty() ? ": no tests" : "")}});
+        for (LimitTest const& test : failedFirst(sensor.tests)) {
+            rows.push_back(limitTestRow(test));
+        }
+    }
+    return drawColumns(rows, "    ", style);
+}
+
+} // namespace
+
+std::string toText(MonitorsReport const& report, Style const& style)
+{
+    std::string text = labelledLine("Monitor tests", summary(report, style));
+    if (report.monitors.empty()) {
+        return text;
+    }
+    std::vector<std::vector<Cell>> rows = {limitTestHeads()};
+    for (OnBoardMonitor const& monitor : failedFirst(report.monitors)) {
+        rows.push_back({{fmt::format("{:02X} {}", monitor.id, monitor.description)}});
+        for (LimitTest const& test : monitor.tests) {
+            rows.push_back(limitTestRow(test));
+        }
+    }
+    return text + drawColumns(rows, "    ", style);
+}
+
+std::string toText(OxygenReport const& report, Style const& style)
+{
+    std::string text = labelledLine("Oxygen monitor", monitorText(report, style));
+    if (report.answer != TopicAnswer::Read) {
+        return text;
+    }
+    text += labelledLine("O2 sensors", sensorList(report));
+    return text + (report.onCan ? labelledLine("O2 tests", "among those of the monitors (velmora monitors)")
+                                : drawTests(report.sensors, style));
+}
+
+} // namespace velmora::cli

@@ -1,0 +1,58 @@
+#include "program/view/layout.h"
+#include "program/view/reporttext.h"
+
+namespace velmora::cli {
+
+namespace {
+
+Mark mark(ReadinessStatus status)
+{
+    static constexpr Mark marks[] = {Mark::Good, Mark::Warning, Mark::None, Mark::Faint};
+    return marks[status];
+}
+
+std::string verdict(ReadinessReport const& report, Style const& style)
+{
+    if (report.answer != TopicAnswer::Read) {
+        return style.paint(Mark::Faint, answerWord(report.answer));
+    }
+    std::optional<bool> const ready = isReady(report);
+    if (!ready) {
+        return "no monitors in this module";
+    }
+    return *ready ? style.paint(Mark::Good, "ready")
+                  : style.paint(Mark::Warning, counted(countNotComplete(report), "monitor") + " not complete");
+}
+
+Cell cell(std::optional<ReadinessStatus> const& status)
+{
+    return status ? Cell{statusWord(*status), mark(*status)} : Cell{"-"};
+}
+
+std::string drawMonitors(std::vector<ReadinessMonitor> const& monitors, Style const& style)
+{
+    std::vector<std::vector<Cell>> rows = {{{"Monitor"}, {"Since cleared"}, {"This driving cycle"}}};
+    std::string missing;
+    for (ReadinessMonitor const& monitor : monitors) {
+        if (monitor.sinceCleared == ReadinessStatus::NotAvailable) {
+            missing += (missing.empty() ? "Not available: " : ", ") + monitor.name;
+        } else {
+            rows.push_back({{monitor.name}, cell(monitor.sinceCleared), cell(monitor.thisCycle)});
+        }
+    }
+    return drawColumns(rows, "    ", style) + wrapped(missing, 76, "    ");
+}
+
+} // namespace
+
+std::string toText(ReadinessReport const& report, Style const& style)
+{
+    std::string text = report.lamp ? labelledLine("Lamp", lampText(report.lamp, style)) : std::string();
+    text += labelledLine("Readiness", verdict(report, style));
+    if (!isReady(report)) {
+        return text;
+    }
+    return text + drawMonitors(notCompleteFirst(report.monitors), style);
+}
+
+} // namespace velmora::cli
