@@ -5,6 +5,7 @@
 
 #include <algorithm>
 #include <array>
+#include <cctype>
 #include <fstream>
 #include <iterator>
 #include <map>
@@ -156,6 +157,43 @@ TEST(DtcTable, EachTextIsStoredOnce)
     }
 }
 
+// Letters and digits alone, in small letters, with a blank for what stands between words.
+std::string bareWords(std::string_view text)
+{
+    std::string words;
+    for (char const c : text) {
+        if (std::isalnum(static_cast<unsigned char>(c)) != 0) {
+            words += static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
+        } else if (!words.empty() && words.back() != ' ') {
+            words += ' ';
+        }
+    }
+    return words;
+}
+
+TEST(DtcTable, NoTwoTextsDifferOnlyInCaseOrPunctuation)
+{
+    // A slash stands for "or": the second is another condition than that of the code list. The first is as given.
+    std::set<std::string_view> const apart = {"Lost Communication with TCM",
+                                              "EVAP System Leak Detection Pump Control Circuit/Open"};
+    std::map<std::string, std::string_view> firsts;
+    for (DtcRow const& row : DtcTable()) {
+        if (apart.count(row.text) == 0) {
+            EXPECT_EQ(firsts.emplace(bareWords(row.text), row.text).first->second, row.text) << row.code;
+        }
+    }
+}
+
+TEST(DtcTable, ConditionsThatAreAlikeAreKeptApart)
+{
+    EXPECT_EQ(textsOf("GM", "P1133"), std::vector<std::string>{"O2 Sensor Insufficient Switching"});
+    EXPECT_EQ(textsOf("GM", "P1134"), std::vector<std::string>{"O2 Sensor Transition Time Ratio"});
+    EXPECT_EQ(textsOf("Isuzu", "P1640"), (std::vector<std::string>{"ODM 1 Circuit High - Except 1998 Rodeo",
+                                                                   "ODM Output A Circuit - 1998 Rodeo"}));
+    EXPECT_EQ(textsOf("Mazda", "P1602"), (std::vector<std::string>{"PCM Communication Line to TCM Error",
+                                                                   "Immobilizer System Communication Error with PCM"}));
+}
+
 TEST(DtcTable, GenericSamplesWordForWord)
 {
     const std::pair<char const*, char const*> samples[] = {
@@ -183,7 +221,7 @@ TEST(DtcTable, MakersSamplesWordForWord)
         {"Jaguar", "P1000", "OBD Systems Readiness Test Not Complete"},
         {"Jeep", "P1000", "Cooling System Heat Valve Control Circuit"},
         {"Land Rover", "P1000", "Engine Control Module Memory Erased"},
-        {"Land Rover", "P15O9", "Idle Speed Control Short Circuit Fault"},
+        {"Land Rover", "P15O9", "Idle Speed Control Circuit Shorted"},
         {"Volvo", "P1770", "CMP Sensor Intake/Exhaust Signal Error"},
     };
     for (auto const& [maker, code, text] : samples) {
