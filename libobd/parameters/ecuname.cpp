@@ -106,7 +106,7 @@ bool EcuName::fromCanSystem(unsigned int ecuId, std::vector<unsigned char> const
 
 bool EcuName::fromSaeSystem(unsigned int ecuId, std::vector<unsigned char> const& data)
 {
-    SaeLines const lines(data, guessChecksumLength(data, linesPerName));
+    SaeLines const lines(data, guessChecksumLength(data));
     if (lines.count() < linesPerName) {
         return refuseLength(data);
     }

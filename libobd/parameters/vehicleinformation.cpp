@@ -12,13 +12,12 @@ bool VehicleInformation::fromBytes(std::shared_ptr<IEcu> const& ecu, std::vector
     return isCan(ecu->protocol()) ? fromCanSystem(ecu->id(), data) : fromSaeSystem(ecu->id(), data);
 }
 
-std::size_t VehicleInformation::guessChecksumLength(std::vector<unsigned char> const& data,
-                                                    std::size_t linesPerItem) const
+std::size_t VehicleInformation::guessChecksumLength(std::vector<unsigned char> const& data) const
 {
-    std::size_t const plainSize = linesPerItem * SaeLines::lineLength;
-    std::size_t const checkedSize = linesPerItem * (SaeLines::lineLength + 1);
-    // Seven items with checksums are as long as eight without: there the beginnings of the lines decide.
-    bool const plain = data.size() % plainSize == 0 && (data.size() % checkedSize != 0 || verifySaeSignatures(data, 0));
+    bool const mayBePlain = data.size() % SaeLines::lineLength == 0;
+    bool const mayBeChecked = data.size() % (SaeLines::lineLength + 1) == 0;
+    // Seven lines with checksums are as long as eight without: there the beginnings of the lines decide.
+    bool const plain = mayBePlain && (!mayBeChecked || verifySaeSignatures(data, 0));
     TERVEX_LOG(Debug) << (plain ? "No checksum in use" : "Checksum in use");
     return plain ? 0 : 1;
 }

@@ -16,9 +16,9 @@ protected:
 
     bool fromBytes(std::shared_ptr<IEcu> const& ecu, std::vector<unsigned char> const& data) override;
 
-    // Bytes of checksum behind each line of a legacy reply whose items take `linesPerItem` lines each, judged by its
-    // size: 0 or 1. A reply that has neither size is taken to have checksums.
-    std::size_t guessChecksumLength(std::vector<unsigned char> const& data, std::size_t linesPerItem) const;
+    // Bytes of checksum behind each line of a legacy reply, judged by its size: 0 or 1. Lines may have been lost. A
+    // reply that has the size of no lines at all is taken to have checksums.
+    std::size_t guessChecksumLength(std::vector<unsigned char> const& data) const;
 
 private:
     virtual bool fromCanSystem(unsigned int ecuId, std::vector<unsigned char> const& data) = 0;

@@ -139,6 +139,46 @@ TEST(CalibrationIds, ASequenceNumberOfAnotherItemIsRefused)
     EXPECT_TRUE(log.contains("ERROR Invalid data received; too large sequence number (4294967295)"));
 }
 
+// Every way to lose one line of two or three items, on buses with and without checksums behind the lines.
+TEST(CalibrationIds, ItemsThatCameWholeAreReadWhenALineWasLost)
+{
+    for (int const items : {2, 3}) {
+        for (std::size_t const step : {7U, 8U}) {
+            for (int lost = 0; lost < items * 4; ++lost) {
+                Bytes data = step == 7 ? lines(items) : withChecksums(lines(items));
+                auto const at = data.begin() + lost * static_cast<std::ptrdiff_t>(step);
+                data.erase(at, at + static_cast<std::ptrdiff_t>(step));
+                Texts expected{"CAL1", "CAL2"};
+                if (items == 3) {
+                    expected.emplace_back("CAL3");
+                }
+                auto const broken = static_cast<std::size_t>(lost / 4);
+                expected[broken] = ""; // keeps the place of the others
+                if (broken + 1 == expected.size()) {
+                    expected.pop_back();
+                }
+                CalibrationIds parameter;
+                EXPECT_TRUE(parameter.setResponseData(isoEcu, data)) << items << ' ' << step << ' ' << lost;
+                EXPECT_EQ(parameter.calibrationIds(isoEcu), expected) << items << ' ' << step << ' ' << lost;
+            }
+        }
+    }
+}
+
+TEST(CalibrationIds, WithoutAnyWholeItemAReplyThatLostALineIsRefused)
+{
+    support::LogCapture log;
+    CalibrationIds parameter;
+    Bytes data = lines(2);
+    data.erase(data.begin() + 5 * 7, data.begin() + 6 * 7);
+    data[2] = 0;
+    EXPECT_FALSE(parameter.setResponseData(vpwEcu, data)) << "a sequence number of 0 belongs nowhere";
+    EXPECT_TRUE(log.contains("ERROR Invalid number of data bytes: 49"));
+    EXPECT_TRUE(parameter.calibrationIds(vpwEcu).empty());
+    data[2] = 2;
+    EXPECT_FALSE(parameter.setResponseData(vpwEcu, data)) << "nor does one that came twice stand for another";
+}
+
 TEST(CalibrationIds, TooFewLinesAreRefused)
 {
     support::LogCapture log;
