@@ -1,3 +1,4 @@
+#include <common/logrecord.h>
 #include <common/tracestream.h>
 #include <obd/databridge.h>
 #include <obd/iconnectionlogger.h>
@@ -11,6 +12,15 @@ namespace {
 
 // Lets a writer loop look up regularly, since nothing wakes it when the channel dies.
 constexpr std::chrono::milliseconds outgoingWait{100};
+
+// More than hours of replies that nobody fetched.
+constexpr std::size_t mostUnread = 16U * 1024 * 1024;
+
+// What a queued message costs in memory, about: an empty one isn't free.
+std::size_t cost(std::vector<unsigned char> const& message)
+{
+    return message.size() + 4 * sizeof(message);
+}
 
 } // namespace
 
@@ -38,22 +48,41 @@ bool DataBridge::get(Bytes& out)
 
 void DataBridge::set(Bytes const& bytes)
 {
-    m_assembly.insert(m_assembly.end(), bytes.begin(), bytes.end());
-    // From the very start each time: the delimiter may have changed since the kept bytes came.
-    auto messageStart = m_assembly.begin();
-    for (auto at = messageStart; at != m_assembly.end(); ++at) {
-        if (*at == static_cast<unsigned char>(m_delimiter.load())) {
-            queueMessage(Bytes(messageStart, at));
-            messageStart = at + 1;
+    if (!hasRoomFor(bytes.size())) {
+        if (invalidate()) {
+            TERVEX_LOG(Error) << "Too many unread bytes from the adapter: invalidate the channel";
         }
+        return;
+    }
+    auto const delimiter = static_cast<unsigned char>(m_delimiter.load());
+    std::size_t const unscanned = firstUnscanned(delimiter);
+    m_assembly.insert(m_assembly.end(), bytes.begin(), bytes.end());
+    auto messageStart = m_assembly.begin();
+    auto at = messageStart + static_cast<std::ptrdiff_t>(unscanned);
+    while ((at = std::find(at, m_assembly.end(), delimiter)) != m_assembly.end()) {
+        queueMessage(Bytes(messageStart, at));
+        messageStart = ++at;
     }
     m_assembly.erase(m_assembly.begin(), messageStart);
+}
+
+bool DataBridge::hasRoomFor(std::size_t bytes)
+{
+    std::lock_guard const lock(m_incomingMutex);
+    return m_incomingSize + m_assembly.size() + bytes <= mostUnread;
+}
+
+// The kept bytes hold no delimiter, unless it was another when they came.
+std::size_t DataBridge::firstUnscanned(unsigned char delimiter)
+{
+    return std::exchange(m_scannedFor, delimiter) == delimiter ? m_assembly.size() : 0;
 }
 
 void DataBridge::queueMessage(Bytes message)
 {
     {
         std::lock_guard const lock(m_incomingMutex);
+        m_incomingSize += cost(message);
         m_incoming.push_back(std::move(message));
     }
     m_incomingCondition.notify_one();
@@ -76,6 +105,7 @@ bool DataBridge::receive(Bytes& out, int timeoutMs)
     if (m_incoming.empty()) {
         return false;
     }
+    m_incomingSize -= cost(m_incoming.front());
     out = std::move(m_incoming.front());
     m_incoming.pop_front();
     for (IConnectionLogger* logger : m_loggers) {

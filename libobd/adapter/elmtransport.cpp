@@ -14,12 +14,25 @@ namespace {
 // The longest wait at a stretch: nothing wakes a waiter when the connection dies.
 constexpr unsigned int waitSliceMs = 250;
 
-void discardStaleReplies(IDataConnection& connection)
+// An adapter says something about once a command. One that never stops is none, or has lost its line rate.
+constexpr int mostStaleReplies = 1000;
+
+// False if the connection died meanwhile, or if there is no end to them.
+bool discardStaleReplies(IDataConnection& connection)
 {
     std::vector<unsigned char> stale;
-    while (connection.receive(stale, 0)) {
+    for (int discarded = 0; connection.receive(stale, 0); ++discarded) {
+        if (discarded == mostStaleReplies) {
+            TERVEX_LOG(Error) << "No end of unasked replies -> skip";
+            return false;
+        }
         tervex::TraceStream << "Payload data discarded: " << std::string(stale.begin(), stale.end());
+        if (!connection.isValid()) {
+            TERVEX_LOG(Error) << "Invalid connection -> skip";
+            return false;
+        }
     }
+    return true;
 }
 
 // False if the time ran out or the connection died first.
@@ -48,7 +61,9 @@ TransportStatus elmTransportSend(std::shared_ptr<IDataConnection>& connection,
         TERVEX_LOG(Error) << "Invalid connection -> skip";
         return TransportStatus::Timeout;
     }
-    discardStaleReplies(*connection);
+    if (!discardStaleReplies(*connection)) {
+        return TransportStatus::Timeout;
+    }
     std::vector<unsigned char> line = payload;
     line.push_back(static_cast<unsigned char>(elmLineEnd));
     connection->send(line);

@@ -15,12 +15,13 @@ inline constexpr char elmLineEnd = '\r';
 enum class TransportStatus : int
 {
     Ok = 0,
-    Timeout = 1, // nothing usable came in time; on sending: the connection is dead
+    Timeout = 1, // nothing usable came in time; on sending: the connection is dead, or as good as that
     Failure = 2, // the connection is dead, or a read that was given no time found nothing
 };
 
 // Sends one line: the payload and a CR. Drops first whatever the adapter has said since the last exchange, so that no
-// reply is taken for the answer to the wrong command. Its only failure is Timeout, for a dead connection.
+// reply is taken for the answer to the wrong command. Its only failure is Timeout, for a dead connection and for one
+// that brings more unasked replies than an adapter can have given; nothing is sent then.
 TransportStatus elmTransportSend(std::shared_ptr<IDataConnection>& connection,
                                  std::vector<unsigned char> const& payload);
 

@@ -6,6 +6,7 @@
 
 #include <atomic>
 #include <condition_variable>
+#include <cstddef>
 #include <deque>
 #include <mutex>
 #include <vector>
@@ -14,7 +15,8 @@ namespace obd {
 
 /// The byte channel between the application's port and the library: the application keeps the IDataBridge view for its
 /// reader and writer loops and hands the IDataConnection view to the library. One bridge serves one connection; an
-/// invalidated one stays so, and only isValid tells: all else goes on working.
+/// invalidated one stays so, and only isValid tells: all else goes on working. More than 16 MB of unread bytes, such as
+/// a flood of prompts, invalidate it: what then comes is dropped.
 ///
 /// Threads: send, receive, get, addLogger and removeLogger from any, set from one only.
 class OBD_EXPORT DataBridge : public IDataBridge, public IDataConnection
@@ -41,6 +43,8 @@ public:
 private:
     using Bytes = std::vector<unsigned char>;
 
+    bool hasRoomFor(std::size_t bytes);
+    std::size_t firstUnscanned(unsigned char delimiter);
     void queueMessage(Bytes message);
 
     std::atomic<char> m_delimiter{0};
@@ -53,7 +57,10 @@ private:
 
     /// What set was given after the last delimiter. Belongs to the thread that calls set.
     Bytes m_assembly;
+    /// The delimiter for which all of m_assembly was looked through. Belongs to that thread, too.
+    unsigned char m_scannedFor = 0;
     std::deque<Bytes> m_incoming;
+    std::size_t m_incomingSize = 0; ///< in memory, about; protected by m_incomingMutex
     std::mutex m_incomingMutex;
     std::condition_variable m_incomingCondition;
 

@@ -1,4 +1,5 @@
 #include "tests/support/bytes.h"
+#include "tests/support/logcapture.h"
 
 #include <obd/databridge.h>
 #include <obd/iconnectionlogger.h>
@@ -356,6 +357,45 @@ TEST_F(DataBridge, BothSidesKeepEveryByteInOrderUnderLoad)
         ASSERT_EQ(text(out), std::to_string(i));
     }
     port.join();
+}
+
+// As an adapter at the wrong line rate, or none at all, may send without an end.
+TEST_F(DataBridge, AFloodEndsTheChannelAndTakesNoMoreMemory)
+{
+    for (std::string const& piece : {std::string(4096, '>'), std::string(4096, 'x')}) {
+        support::LogCapture log;
+        obd::DataBridge bridge;
+        bridge.setDelimiter('>');
+        for (int i = 0; bridge.isValid(); ++i) {
+            ASSERT_LT(i, 4200) << "16 MB in pieces of 4 KB";
+            bridge.set(bytes(piece));
+        }
+        bridge.set(bytes(piece));
+        EXPECT_THAT(log.lines(), ElementsAre("ERROR Too many unread bytes from the adapter: invalidate the channel"));
+    }
+}
+
+// Looking through the kept bytes anew for each piece would take minutes.
+TEST_F(DataBridge, ALongReplyMayComeByteByByte)
+{
+    for (int i = 0; i < 300000; ++i) {
+        m_bridge.set({'x'});
+    }
+    m_bridge.set({'>'});
+    EXPECT_EQ(received(), std::vector<std::string>{std::string(300000, 'x')});
+}
+
+TEST_F(DataBridge, WhatWasReadMakesRoom)
+{
+    Bytes const longReply(1024 * 1024, 'x');
+    for (int i = 0; i < 40; ++i) {
+        m_bridge.set(longReply);
+        m_bridge.set(bytes(">"));
+        Bytes out;
+        ASSERT_TRUE(m_bridge.receive(out, 0));
+        ASSERT_EQ(out, longReply);
+    }
+    EXPECT_TRUE(m_bridge.isValid());
 }
 
 } // namespace

@@ -201,4 +201,49 @@ TEST_F(ElmTransport, ScriptedDialoguesTellTheTimeSpentWaiting)
                 ElementsAre(support::Dialogue{"", 50}, support::Dialogue{"ATI", 240}, support::Dialogue{"ATRV", 300}));
 }
 
+// Brings a prompt whenever it is asked, and dies after some.
+class Flood : public obd::IDataConnection
+{
+public:
+    explicit Flood(int life) : m_left(life) {}
+    void setDelimiter(char /*delimiter*/) override {}
+    bool isValid() const override { return m_left > 0; }
+    bool receive(std::vector<unsigned char>& out, int /*timeoutMs*/) override
+    {
+        out.clear();
+        --m_left;
+        ++received;
+        return true;
+    }
+    void send(std::vector<unsigned char> const& /*bytes*/) override { ++sent; }
+    void addLogger(obd::IConnectionLogger* /*logger*/) override {}
+    void removeLogger(obd::IConnectionLogger* /*logger*/) override {}
+
+    int received = 0;
+    int sent = 0;
+
+private:
+    int m_left;
+};
+
+TEST_F(ElmTransport, AFloodOfPromptsIsNotDrainedForEver)
+{
+    auto const flood = std::make_shared<Flood>(1000000);
+    m_connection = flood;
+    EXPECT_EQ(send("ATI"), TransportStatus::Timeout);
+    EXPECT_EQ(flood->sent, 0);
+    EXPECT_EQ(flood->received, 1001);
+    EXPECT_THAT(m_log.lines(), ElementsAre("ERROR No end of unasked replies -> skip"));
+}
+
+TEST_F(ElmTransport, TheDrainEndsWithItsConnection)
+{
+    auto const flood = std::make_shared<Flood>(10);
+    m_connection = flood;
+    EXPECT_EQ(send("ATI"), TransportStatus::Timeout);
+    EXPECT_EQ(flood->sent, 0);
+    EXPECT_EQ(flood->received, 10);
+    EXPECT_THAT(m_log.lines(), ElementsAre("ERROR Invalid connection -> skip"));
+}
+
 } // namespace
