@@ -101,8 +101,7 @@ bool ConnectionManager::open(std::shared_ptr<IDataConnection> const& connection,
 
 bool ConnectionManager::isBusy()
 {
-    std::lock_guard const lock(m_stateMutex);
-    return m_connection != nullptr;
+    return openChannel() != nullptr;
 }
 
 void ConnectionManager::closeConnection()
@@ -117,7 +116,7 @@ void ConnectionManager::closeConnection()
     m_proxy->setDevice(nullptr);
     storeDevice(nullptr);
     storeConnection(nullptr);
-    forgetCurrent();
+    forgetAttempted();
     Dispatcher::getInstance().cancel();
     TERVEX_LOG(Info) << "closeConnection exit";
 }
@@ -143,7 +142,7 @@ void ConnectionManager::storeConnection(std::shared_ptr<IDataConnection> connect
 void ConnectionManager::attachLoggers(std::shared_ptr<IDataConnection> const& connection)
 {
     std::lock_guard const lock(m_loggerMutex);
-    m_current = connection;
+    m_attempted = connection;
     if (!rememberTapped(connection)) {
         // It bears the loggers of an earlier attempt: each of them is to hear its traffic once.
         for (IConnectionLogger* logger : m_loggers) {
@@ -167,19 +166,30 @@ bool ConnectionManager::rememberTapped(std::shared_ptr<IDataConnection> const& c
     return true;
 }
 
-void ConnectionManager::forgetCurrent()
+void ConnectionManager::forgetAttempted()
 {
     std::lock_guard const lock(m_loggerMutex);
-    m_current.reset();
+    m_attempted.reset();
 }
 
 void ConnectionManager::addLogger(IConnectionLogger* logger)
 {
     std::lock_guard const lock(m_loggerMutex);
-    if (std::shared_ptr<IDataConnection> const connection = m_current.lock()) {
-        connection->addLogger(logger);
+    std::shared_ptr<IDataConnection> const attempted = m_attempted.lock();
+    if (attempted != nullptr) {
+        attempted->addLogger(logger);
+    }
+    std::shared_ptr<IDataConnection> const open = openChannel();
+    if (open != nullptr && open != attempted) { // it stands beside an attempt, or one that failed
+        open->addLogger(logger);
     }
     m_loggers.push_back(logger);
+}
+
+std::shared_ptr<IDataConnection> ConnectionManager::openChannel()
+{
+    std::lock_guard const lock(m_stateMutex);
+    return m_connection;
 }
 
 // From every channel that the application still holds: one that was closed or replaced bears its loggers on.

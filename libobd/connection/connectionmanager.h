@@ -32,7 +32,8 @@ private:
     bool open(std::shared_ptr<IDataConnection> const& connection, VehicleProtocol protocol, bool restoreAdapter);
     void attachLoggers(std::shared_ptr<IDataConnection> const& connection);
     bool rememberTapped(std::shared_ptr<IDataConnection> const& connection);
-    void forgetCurrent();
+    void forgetAttempted();
+    std::shared_ptr<IDataConnection> openChannel();
     void notifyPhase(int phase);
     void storeDevice(std::shared_ptr<IDevice> device);
     void storeConnection(std::shared_ptr<IDataConnection> connection);
@@ -52,7 +53,7 @@ private:
     // Held while a logger goes on or off a channel, so that none is lost or left behind during an opening.
     std::mutex m_loggerMutex;
     std::vector<IConnectionLogger*> m_loggers;            // not owned; protected by m_loggerMutex
-    std::weak_ptr<IDataConnection> m_current;             // under attempt or open; protected by m_loggerMutex
+    std::weak_ptr<IDataConnection> m_attempted;           // of the latest opening; protected by m_loggerMutex
     std::vector<std::weak_ptr<IDataConnection>> m_tapped; // all that may bear loggers; protected by m_loggerMutex
 };
 

@@ -463,6 +463,30 @@ TEST_F(ConnectionManager, ARemovedLoggerLeavesChannelsThatWereClosedOrReplaced)
     EXPECT_THAT(m_tap.sent, IsEmpty());
 }
 
+TEST_F(ConnectionManager, ALoggerAddedBesideOrAfterAFailedSecondOpeningHearsBothChannels)
+{
+    auto const open = workingChannel();
+    auto const failing = newChannel();
+    open->whenever("X");
+    failing->whenever("X");
+    ASSERT_TRUE(this->open(open));
+    m_phases.onPhase = [this](int) { m_manager.addLogger(&m_tap); };
+    EXPECT_FALSE(failAtVehicle(failing));
+    Tap second;
+    m_manager.addLogger(&second);
+    m_tap.sent.clear();
+    open->send({'X', '\r'});
+    EXPECT_THAT(m_tap.sent, ElementsAre("X\r"));
+    EXPECT_THAT(second.sent, ElementsAre("X\r")) << "it still stands";
+    failing->send({'X', '\r'});
+    EXPECT_THAT(second.sent, ElementsAre("X\r", "X\r"));
+    m_manager.removeLogger(&m_tap);
+    m_manager.removeLogger(&second);
+    open->send({'X', '\r'});
+    EXPECT_EQ(second.sent.size(), 2U);
+    EXPECT_EQ(m_tap.sent.size(), 2U);
+}
+
 TEST_F(ConnectionManager, ALoggerAddedAfterTheCloseIsNotOnTheOldChannel)
 {
     auto const channel = workingChannel();
