@@ -24,10 +24,11 @@ private:
     std::chrono::steady_clock::time_point const m_start = std::chrono::steady_clock::now();
 };
 
+// Never destroyed: at the process's end threads may still wait and log.
 SystemClock& systemClock()
 {
-    static SystemClock instance;
-    return instance;
+    static auto* const instance = new SystemClock;
+    return *instance;
 }
 
 std::atomic<IClock*> replacedClock{nullptr};

@@ -4,15 +4,20 @@
 #include <common/logrecord.h>
 #include <obd/library.h>
 
+#include <atomic>
+
 namespace obd {
 namespace {
 
-// Lives until the library is unloaded, so that its file takes every line until then.
+// Never destroyed, as the dispatcher is not: at the process's end its worker may still run, and log.
 tervex::DebugLogger& processLogger()
 {
-    static tervex::DebugLogger logger;
-    return logger;
+    static auto* const logger = new tervex::DebugLogger;
+    return *logger;
 }
+
+// Whether the catalogue was filled here, so that a second opening does not fill it again.
+std::atomic<bool> catalogueFilled{false};
 
 } // namespace
 
@@ -20,12 +25,15 @@ bool LIBOBDOpen(std::string const& logPath)
 {
     processLogger().open(logPath);
     TERVEX_LOG(Info) << "Lib OBD init";
-    DtcReader::init();
+    if (!catalogueFilled.exchange(true)) {
+        DtcReader::init();
+    }
     return true;
 }
 
 void LIBOBDClose()
 {
+    catalogueFilled = false;
     DtcReader::clean();
     TERVEX_LOG(Info) << "Lib OBD cleanup done";
     tervex::LogSink = nullptr;

@@ -58,4 +58,38 @@ TEST(Library, TroubleCodeTextsAreThereFromOpenToClose)
     EXPECT_EQ(meaning(), "ISO/SAE Reserved");
 }
 
+TEST(Library, OpenedTwiceItHasEachTextOnce)
+{
+    auto const meanings = [] { return obd::DtcReader().getTroubleCodes("P0420").size(); };
+    obd::LIBOBDOpen("");
+    obd::LIBOBDOpen("");
+    EXPECT_EQ(meanings(), 1U);
+    obd::LIBOBDClose();
+    obd::LIBOBDOpen("");
+    EXPECT_EQ(meanings(), 1U);
+    obd::LIBOBDClose();
+    EXPECT_EQ(obd::DtcReader().getTroubleCodes("P0420").front()->description, "ISO/SAE Reserved");
+}
+
+tervex::ITraceLogger* sinkOfAWorker = nullptr;
+
+// What was registered first runs last at an exit, behind the end of all that was made meanwhile.
+[[noreturn]] void exitWhileAWorkerLogs()
+{
+    std::atexit([] {
+        sinkOfAWorker->log("", 0, static_cast<int>(tervex::LogLevel::Info), "the last word");
+        ::_exit(content(logPath()).ends_with("the last word\n") ? 0 : 1);
+    });
+    obd::LIBOBDOpen(logPath());
+    sinkOfAWorker = tervex::LogSink; // as a record has it that is about to end
+    std::exit(2);
+}
+
+TEST(LibraryDeathTest, TheLogTakesLinesUntilTheProcessHasEnded)
+{
+    GTEST_FLAG_SET(death_test_style, "threadsafe");
+    EXPECT_EXIT(exitWhileAWorkerLogs(), testing::ExitedWithCode(0), "");
+    std::filesystem::remove(logPath());
+}
+
 } // namespace
