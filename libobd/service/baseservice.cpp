@@ -8,34 +8,63 @@
 #include <obd/iobdvelmora.h>
 #include <obd/ivelmorasettings.h>
 
+#include <utility>
+
 namespace obd {
 
-BaseService::BaseService(IObdVelmora const* obd, unsigned int priority)
+namespace {
+
+// Reads a state into its copy, anew if an event brought a newer one meanwhile.
+template <typename Read>
+void settle(std::atomic<unsigned int> const& events, Read read)
+{
+    unsigned int before = 0;
+    do {
+        before = events;
+        read();
+    } while (events != before);
+}
+
+} // namespace
+
+BaseService::BaseService(IObdVelmora const* obd, unsigned int priority, Following following)
     : m_obd(obd), m_priority(priority), m_openedCallback(std::make_shared<Callback>()),
       m_closedCallback(std::make_shared<Callback>()), m_spareCallback(std::make_shared<Callback>())
 {
-    try {
-        attachToAll();
-        readState();
-    } catch (...) { // such as the application's settings store throws
-        detachFromAll();
-        throw;
+    if (following == Following::AtOnce) {
+        follow();
     }
 }
 
 BaseService::~BaseService()
 {
-    detachFromAll();
+    unfollow();
 }
 
-void BaseService::attachToAll()
+void BaseService::startFollowing()
 {
-    m_obd->getConnectionNotifier()->attach(m_priority, this);
-    m_obd->getEcuManager()->attach(this);
-    m_obd->getSettings()->attach(this);
+    follow();
 }
 
-void BaseService::detachFromAll()
+void BaseService::stopFollowing()
+{
+    unfollow();
+}
+
+void BaseService::follow()
+{
+    try {
+        m_obd->getConnectionNotifier()->attach(m_priority, this);
+        m_obd->getEcuManager()->attach(this);
+        m_obd->getSettings()->attach(this);
+        readState();
+    } catch (...) { // such as the application's settings store throws
+        unfollow();
+        throw;
+    }
+}
+
+void BaseService::unfollow()
 {
     m_obd->getSettings()->detach(this);
     m_obd->getEcuManager()->detach(this);
@@ -44,13 +73,20 @@ void BaseService::detachFromAll()
 
 void BaseService::readState()
 {
-    m_unitSystem = m_obd->getSettings()->unitSystem();
+    settle(m_unitEvents, [this] { m_unitSystem = m_obd->getSettings()->unitSystem(); });
     std::shared_ptr<IConnectionManager> const manager = m_obd->getConnectionManager();
-    m_connected = manager != nullptr && manager->getProxy()->isConnected();
+    settle(m_connectionEvents, [&] { m_connected = manager != nullptr && manager->getProxy()->isConnected(); });
     if (m_connected) {
-        std::lock_guard const lock(m_ecuMutex);
-        m_ecu = m_obd->getEcuManager()->getCurrentEcu();
+        readEcu();
     }
+}
+
+// Under the lock from the reading on, lest the later of two readers leave an older module.
+void BaseService::readEcu()
+{
+    std::shared_ptr<IEcu> before; // dies after the lock is given up
+    std::lock_guard const lock(m_ecuMutex);
+    before = std::exchange(m_ecu, m_obd->getEcuManager()->getCurrentEcu());
 }
 
 std::shared_ptr<IEcu> BaseService::ecu() const
@@ -61,12 +97,14 @@ std::shared_ptr<IEcu> BaseService::ecu() const
 
 void BaseService::onConnectionOpened()
 {
+    ++m_connectionEvents;
     m_connected = true;
     m_openedCallback->post([this] { onServiceConnected(); });
 }
 
 void BaseService::onConnectionClosed()
 {
+    ++m_connectionEvents;
     m_connected = false;
     m_closedCallback->post([this] { onServiceDisconnected(); });
 }
@@ -76,11 +114,7 @@ void BaseService::onEvent(EcuManagerEvent const& event)
     if (event != EcuManagerEvent::CurrentEcuChanged) {
         return;
     }
-    std::shared_ptr<IEcu> current = m_obd->getEcuManager()->getCurrentEcu();
-    {
-        std::lock_guard const lock(m_ecuMutex);
-        m_ecu.swap(current);
-    }
+    readEcu();
     if (m_connected) {
         onEcuChanged();
     }
@@ -91,6 +125,7 @@ void BaseService::onEvent(VelmoraSettingsEvent const& event)
     if (event != VelmoraSettingsEvent::UnitSystemChanged) {
         return;
     }
+    ++m_unitEvents;
     UnitSystem const system = m_obd->getSettings()->unitSystem();
     if (m_unitSystem.exchange(system) != system) {
         onUnitSystemChanged();

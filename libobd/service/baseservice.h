@@ -15,8 +15,9 @@ namespace obd {
 class Callback;
 class IObdVelmora;
 
-// The common base of all services: follows connection, current control module and unit system. Build and drop services
-// on the thread that dispatches, never during an opening or closing, and never inside an event.
+// The common base of all services: follows connection, current control module and unit system. A service that is made
+// by itself follows from within its constructor to within its destructor: make and drop it while no other thread opens,
+// closes, selects a module or changes settings. The builders make a BuiltService, which has no such rule.
 class BaseService : public tervex::IEventListener<EcuManagerEvent>,
                     public IConnectionNotifierListener,
                     public tervex::IEventListener<VelmoraSettingsEvent>
@@ -24,8 +25,15 @@ class BaseService : public tervex::IEventListener<EcuManagerEvent>,
 public:
     static constexpr unsigned int servicePriority = 1;
 
+    enum class Following
+    {
+        AtOnce,
+        Later, // with startFollowing, once the whole object stands
+    };
+
     // obd must outlive the service. On a live connection the service starts complete, without an event.
-    explicit BaseService(IObdVelmora const* obd, unsigned int priority = servicePriority);
+    explicit BaseService(IObdVelmora const* obd, unsigned int priority = servicePriority,
+                         Following following = Following::AtOnce);
     ~BaseService() override;
     BaseService(BaseService const&) = delete;
     BaseService& operator=(BaseService const&) = delete;
@@ -37,6 +45,11 @@ public:
     void onEvent(VelmoraSettingsEvent const& event) override;
 
 protected:
+    // Attach to all that is followed, and learn its state; and the reverse, which waits for events that are being told
+    // on other threads and may come more than once. A service that follows more overrides both.
+    virtual void startFollowing();
+    virtual void stopFollowing();
+
     // Hooks; empty here. The first two run on the application's thread, inside Dispatcher::dispatch.
     virtual void onServiceConnected() {}
     virtual void onServiceDisconnected() {}
@@ -53,9 +66,10 @@ protected:
     UnitSystem unitSystem() const { return m_unitSystem; }
 
 private:
-    void attachToAll();
-    void detachFromAll();
+    void follow();
+    void unfollow();
     void readState();
+    void readEcu();
 
     IObdVelmora const* const m_obd;
     unsigned int const m_priority;
@@ -63,6 +77,8 @@ private:
     std::shared_ptr<IEcu> m_ecu;   // protected by m_ecuMutex
     std::atomic<UnitSystem> m_unitSystem{UnitSystem::Metric};
     std::atomic<bool> m_connected{false};
+    std::atomic<unsigned int> m_unitEvents{0};
+    std::atomic<unsigned int> m_connectionEvents{0};
     std::shared_ptr<Callback> m_openedCallback;
     std::shared_ptr<Callback> m_closedCallback;
     std::shared_ptr<Callback> m_spareCallback; // held and never posted

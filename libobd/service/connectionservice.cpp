@@ -1,6 +1,6 @@
 #include "libobd/service/connectionservice.h"
 
-#include "libobd/service/velmorainstance.h"
+#include "libobd/service/builtservice.h"
 
 #include <obd/iconnectionmanager.h>
 #include <obd/idevice.h>
@@ -18,7 +18,9 @@ constexpr unsigned int lastPriority = 2;
 
 } // namespace
 
-ConnectionService::ConnectionService(IObdVelmora const* obd) : BaseService(obd, lastPriority) {}
+ConnectionService::ConnectionService(IObdVelmora const* obd, Following following)
+    : BaseService(obd, lastPriority, following)
+{}
 
 std::string ConnectionService::standardDescription() const
 {
@@ -58,7 +60,7 @@ std::shared_ptr<IConnectionService> ConnectionServiceBuilder::createConnectionSe
     std::lock_guard const lock(mutex);
     std::shared_ptr<IConnectionService> service = latest.lock();
     if (service == nullptr) {
-        service = std::make_shared<ConnectionService>(VelmoraInstance::get());
+        service = buildService<ConnectionService>();
         latest = service;
     }
     return service;

@@ -13,7 +13,7 @@ class ConnectionService : public IConnectionService,
                           public tervex::Notifier<IConnectionServiceObserver>
 {
 public:
-    explicit ConnectionService(IObdVelmora const* obd);
+    explicit ConnectionService(IObdVelmora const* obd, Following following = Following::AtOnce);
 
     bool isConnected() const override { return BaseService::isConnected(); }
     std::string standardDescription() const override;

@@ -5,7 +5,7 @@
 #include "libobd/parameters/oxygensensortestresult.h"
 #include "libobd/parameters/performancetracking.h"
 #include "libobd/powertrain/readinessmonitors.h"
-#include "libobd/service/velmorainstance.h"
+#include "libobd/service/builtservice.h"
 
 #include <common/tracestream.h>
 #include <obd/iecu.h>
@@ -81,7 +81,9 @@ void appendCounters(IEcu const& ecu, unsigned char infoType, PerformanceCounters
 
 } // namespace
 
-DiagnosticsService::DiagnosticsService(IObdVelmora const* obd) : BaseService(obd) {}
+DiagnosticsService::DiagnosticsService(IObdVelmora const* obd, Following following)
+    : BaseService(obd, servicePriority, following)
+{}
 
 ReadinessMonitors DiagnosticsService::fetchReadinessMonitors()
 {
@@ -185,7 +187,7 @@ bool DiagnosticsService::isOxygenSensorTestComplete()
 
 std::shared_ptr<IDiagnosticsService> DiagnosticsServiceBuilder::create()
 {
-    return std::make_shared<DiagnosticsService>(VelmoraInstance::get());
+    return buildService<DiagnosticsService>();
 }
 
 } // namespace obd

@@ -10,7 +10,7 @@ namespace obd {
 class DiagnosticsService : public BaseService, public IDiagnosticsService
 {
 public:
-    explicit DiagnosticsService(IObdVelmora const* obd);
+    explicit DiagnosticsService(IObdVelmora const* obd, Following following = Following::AtOnce);
 
     std::vector<std::shared_ptr<ReadinessMonitorDataModel>> fetchReadinessMonitors() override;
     std::vector<std::shared_ptr<ReadinessMonitorDataModel>> fetchReadinessMonitorsThisCycle() override;

@@ -4,8 +4,8 @@
 #include "libobd/parameters/calibrationids.h"
 #include "libobd/parameters/calibrationverificationnumbers.h"
 #include "libobd/parameters/identificationnumber.h"
+#include "libobd/service/builtservice.h"
 #include "libobd/service/parametercatalogue.h"
-#include "libobd/service/velmorainstance.h"
 
 #include <obd/iecu.h>
 
@@ -25,7 +25,7 @@ enum InfoType : unsigned char
 
 } // namespace
 
-EcuService::EcuService(IObdVelmora const* obd) : BaseService(obd) {}
+EcuService::EcuService(IObdVelmora const* obd, Following following) : BaseService(obd, servicePriority, following) {}
 
 bool EcuService::isSupported(ObdMode mode, unsigned char id) const
 {
@@ -135,7 +135,7 @@ std::string EcuService::fetchErotan()
 
 std::shared_ptr<IEcuService> EcuServiceBuilder::createEcuService()
 {
-    return std::make_shared<EcuService>(VelmoraInstance::get());
+    return buildService<EcuService>();
 }
 
 } // namespace obd

@@ -11,7 +11,7 @@ namespace obd {
 class EcuService : public BaseService, public IEcuService
 {
 public:
-    explicit EcuService(IObdVelmora const* obd);
+    explicit EcuService(IObdVelmora const* obd, Following following = Following::AtOnce);
 
     std::vector<std::shared_ptr<ParameterDataModel>> supportedParameters() override;
     bool isParameterSupported(std::shared_ptr<ParameterDataModel> const& parameter) override;

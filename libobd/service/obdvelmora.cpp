@@ -7,6 +7,7 @@
 #include "libobd/connection/velmorasettings.h"
 #include "libobd/service/velmorainstance.h"
 
+#include <common/logrecord.h>
 #include <obd/obdvelmorabuilder.h>
 
 namespace obd {
@@ -65,6 +66,10 @@ std::shared_ptr<IObdVelmora> ObdVelmoraBuilder::createObdVelmora(unsigned int ho
                                                                  unsigned int hostValue3,
                                                                  std::shared_ptr<ISettings> const& settings)
 {
+    if (settings == nullptr) {
+        TERVEX_LOG(Fatal) << "No settings to build a top-level object on";
+        return nullptr;
+    }
     return std::make_shared<ObdVelmora>(hostValue1, hostValue2, hostValue3, settings);
 }
 

@@ -2,7 +2,7 @@
 
 #include "libobd/dispatch/fetcher.h"
 #include "libobd/parameters/testroutine.h"
-#include "libobd/service/velmorainstance.h"
+#include "libobd/service/builtservice.h"
 
 #include <obd/iecu.h>
 #include <obd/nack.h>
@@ -63,7 +63,9 @@ TestRoutine::Result run(std::shared_ptr<TestRoutine> const& routine, IEcu const&
 
 } // namespace
 
-RoutineService::RoutineService(IObdVelmora const* obd) : BaseService(obd) {}
+RoutineService::RoutineService(IObdVelmora const* obd, Following following)
+    : BaseService(obd, servicePriority, following)
+{}
 
 std::vector<std::shared_ptr<TestRoutineDataModel>> RoutineService::getRoutines()
 {
@@ -105,7 +107,7 @@ std::shared_ptr<TestRoutineDataModel> RoutineService::runRoutine(unsigned char i
 
 std::shared_ptr<IRoutineService> RoutineServiceBuilder::createRoutineService()
 {
-    return std::make_shared<RoutineService>(VelmoraInstance::get());
+    return buildService<RoutineService>();
 }
 
 } // namespace obd

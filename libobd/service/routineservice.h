@@ -9,7 +9,7 @@ namespace obd {
 class RoutineService : public BaseService, public IRoutineService
 {
 public:
-    explicit RoutineService(IObdVelmora const* obd);
+    explicit RoutineService(IObdVelmora const* obd, Following following = Following::AtOnce);
 
     std::vector<std::shared_ptr<TestRoutineDataModel>> getRoutines() override;
     std::shared_ptr<TestRoutineDataModel> runRoutine(unsigned char id) override;

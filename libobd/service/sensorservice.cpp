@@ -1,9 +1,9 @@
 #include "libobd/service/sensorservice.h"
 
 #include "libobd/dispatch/fetcher.h"
+#include "libobd/service/builtservice.h"
 #include "libobd/service/parametercatalogue.h"
 #include "libobd/service/sensormodels.h"
-#include "libobd/service/velmorainstance.h"
 
 #include <common/logrecord.h>
 #include <obd/iecu.h>
@@ -20,17 +20,39 @@
 
 namespace obd {
 
-SensorService::SensorService(IObdVelmora const* obd) : BaseService(obd), m_settings(obd->getSettings())
+SensorService::SensorService(IObdVelmora const* obd, Following following)
+    : BaseService(obd, servicePriority, following), m_settings(obd->getSettings())
 {
-    if (BaseService::isConnected()) {
-        rebuild();
+    if (following == Following::AtOnce) {
+        followVehicle();
     }
 }
 
 SensorService::~SensorService()
 {
+    m_settings->detach(&m_vehicleListener);
     std::lock_guard const lock(m_mutex);
     m_set.cancelAll();
+}
+
+void SensorService::startFollowing()
+{
+    BaseService::startFollowing();
+    followVehicle();
+}
+
+void SensorService::stopFollowing()
+{
+    m_settings->detach(&m_vehicleListener);
+    BaseService::stopFollowing();
+}
+
+void SensorService::followVehicle()
+{
+    m_settings->attach(&m_vehicleListener);
+    if (BaseService::isConnected()) {
+        rebuild();
+    }
 }
 
 std::vector<std::shared_ptr<ParameterDescriptor>> SensorService::getDescriptors()
@@ -147,16 +169,6 @@ void SensorService::onUnitSystemChanged()
     notify(&ISensorServiceObserver::onInvalidated);
 }
 
-SensorService::VehicleListener::VehicleListener(SensorService& service) : m_service(service)
-{
-    m_service.m_settings->attach(this);
-}
-
-SensorService::VehicleListener::~VehicleListener()
-{
-    m_service.m_settings->detach(this);
-}
-
 void SensorService::VehicleListener::onEvent(VelmoraSettingsEvent const& event)
 {
     if (event != VelmoraSettingsEvent::UnitSystemChanged && event != VelmoraSettingsEvent::LanguageChanged) {
@@ -189,8 +201,12 @@ void SensorService::onQueryFinished(bool success, std::weak_ptr<ParameterQuery> 
     if (query == nullptr) {
         return;
     }
+    std::weak_ptr<bool> const alive = m_alive;
     if (success) {
         publish(*query, parameter);
+    }
+    if (alive.expired()) {
+        return; // an observer let go of the service
     }
     // An observer, or another thread, may have put a new set in place of the query's.
     if (!m_singleShot && find(parameter->pid()) == query) {
@@ -244,7 +260,7 @@ void SensorService::rebuild()
 
 std::shared_ptr<ISensorService> SensorServiceBuilder::createSensorService()
 {
-    return std::make_shared<SensorService>(VelmoraInstance::get());
+    return buildService<SensorService>();
 }
 
 } // namespace obd

@@ -17,7 +17,7 @@ namespace obd {
 class SensorService : public ISensorService, public BaseService, public tervex::Notifier<ISensorServiceObserver>
 {
 public:
-    explicit SensorService(IObdVelmora const* obd);
+    explicit SensorService(IObdVelmora const* obd, Following following = Following::AtOnce);
     ~SensorService() override;
 
     bool isConnected() const override { return BaseService::isConnected(); }
@@ -30,6 +30,10 @@ public:
     std::vector<std::shared_ptr<SensorDataModel>> fetchSensors(ParameterIdentifier::Id id) override;
     bool isSupported(ParameterIdentifier::Id id) override;
 
+protected:
+    void startFollowing() override;
+    void stopFollowing() override;
+
 private:
     using ParameterQuery = SensorSet::ParameterQuery;
 
@@ -37,15 +41,14 @@ private:
     class VehicleListener : public tervex::IEventListener<VelmoraSettingsEvent>
     {
     public:
-        explicit VehicleListener(SensorService& service);
-        ~VehicleListener() override;
-        VehicleListener(VehicleListener const&) = delete;
-        VehicleListener& operator=(VehicleListener const&) = delete;
+        explicit VehicleListener(SensorService& service) : m_service(service) {}
         void onEvent(VelmoraSettingsEvent const& event) override;
 
     private:
         SensorService& m_service;
     };
+
+    void followVehicle();
 
     void onServiceConnected() override;
     void onServiceDisconnected() override;
@@ -65,9 +68,10 @@ private:
 
     IVelmoraSettings* const m_settings;
     std::atomic<bool> m_singleShot{false};
-    mutable std::mutex m_mutex;               // never held over observers, the settings or a fetch
-    SensorSet m_set;                          // protected by m_mutex
-    VehicleListener m_vehicleListener{*this}; // attached while all the rest is there
+    mutable std::mutex m_mutex; // never held over observers, the settings or a fetch
+    SensorSet m_set;            // protected by m_mutex
+    VehicleListener m_vehicleListener{*this};
+    std::shared_ptr<bool> const m_alive = std::make_shared<bool>(true); // tells a call whether an observer ended this
 };
 
 } // namespace obd

@@ -7,8 +7,8 @@
 #include "libobd/powertrain/monitorstatus.h"
 #include "libobd/powertrain/numericparameters.h"
 #include "libobd/powertrain/sensorpids.h"
+#include "libobd/service/builtservice.h"
 #include "libobd/service/sensormodels.h"
-#include "libobd/service/velmorainstance.h"
 
 #include <common/logrecord.h>
 #include <common/tracestream.h>
@@ -47,7 +47,9 @@ std::shared_ptr<PowertrainParameter> makeCurrent()
 
 } // namespace
 
-TroubleCodeService::TroubleCodeService(IObdVelmora const* obd) : BaseService(obd) {}
+TroubleCodeService::TroubleCodeService(IObdVelmora const* obd, Following following)
+    : BaseService(obd, servicePriority, following)
+{}
 
 template <typename Codes>
 std::vector<std::shared_ptr<DtcDataModel>> TroubleCodeService::fetchCodes() const
@@ -225,7 +227,7 @@ bool TroubleCodeService::resetCodes() const
 
 std::shared_ptr<ITroubleCodeService> TroubleCodeServiceBuilder::createTroubleCodeService()
 {
-    return std::make_shared<TroubleCodeService>(VelmoraInstance::get());
+    return buildService<TroubleCodeService>();
 }
 
 } // namespace obd

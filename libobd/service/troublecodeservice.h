@@ -14,7 +14,7 @@ class SensorValue;
 class TroubleCodeService : public BaseService, public ITroubleCodeService
 {
 public:
-    explicit TroubleCodeService(IObdVelmora const* obd);
+    explicit TroubleCodeService(IObdVelmora const* obd, Following following = Following::AtOnce);
 
     std::vector<std::shared_ptr<DtcDataModel>> fetchConfirmedCodes() override;
     std::vector<std::shared_ptr<DtcDataModel>> fetchPendingCodes() override;

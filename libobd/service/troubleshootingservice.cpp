@@ -2,12 +2,14 @@
 
 #include "libobd/dispatch/fetcher.h"
 #include "libobd/message/messageentry.h"
+#include "libobd/service/builtservice.h"
 #include "libobd/service/consolequery.h"
-#include "libobd/service/velmorainstance.h"
 
 #include <common/logrecord.h>
 #include <obd/iconnectionmanager.h>
 #include <obd/iobdvelmora.h>
+
+#include <utility>
 
 namespace obd {
 
@@ -25,15 +27,44 @@ std::shared_ptr<IConnectionManager> findManager(IObdVelmora const& obd)
 
 } // namespace
 
-TroubleshootingService::TroubleshootingService(IObdVelmora const* obd) : BaseService(obd)
+TroubleshootingService::TroubleshootingService(IObdVelmora const* obd, Following following)
+    : BaseService(obd, servicePriority, following)
 {
-    if (auto const manager = findManager(*obd)) {
-        manager->addLogger(this);
+    if (following == Following::AtOnce) {
+        tap();
     }
 }
 
 TroubleshootingService::~TroubleshootingService()
 {
+    untap();
+}
+
+void TroubleshootingService::startFollowing()
+{
+    BaseService::startFollowing();
+    tap();
+}
+
+void TroubleshootingService::stopFollowing()
+{
+    untap();
+    BaseService::stopFollowing();
+}
+
+void TroubleshootingService::tap()
+{
+    m_tapping = true;
+    if (auto const manager = findManager(*obd())) {
+        manager->addLogger(this);
+    }
+}
+
+void TroubleshootingService::untap()
+{
+    if (!std::exchange(m_tapping, false)) {
+        return;
+    }
     if (auto const manager = findManager(*obd())) {
         manager->removeLogger(this);
     }
@@ -69,7 +100,7 @@ void TroubleshootingService::addEntry(std::vector<unsigned char> const& data, in
 
 std::shared_ptr<ITroubleshootingService> TroubleshootingServiceBuilder::createTroubleshootingService()
 {
-    return std::make_shared<TroubleshootingService>(VelmoraInstance::get());
+    return buildService<TroubleshootingService>();
 }
 
 } // namespace obd

@@ -11,13 +11,13 @@
 namespace obd {
 
 // A tap on every data connection, through the connection manager, for as long as it lives.
-class TroubleshootingService final : public BaseService,
-                                     public ITroubleshootingService,
-                                     public IConnectionLogger,
-                                     public tervex::Notifier<ITroubleshootingServiceObserver>
+class TroubleshootingService : public BaseService,
+                               public ITroubleshootingService,
+                               public IConnectionLogger,
+                               public tervex::Notifier<ITroubleshootingServiceObserver>
 {
 public:
-    explicit TroubleshootingService(IObdVelmora const* obd);
+    explicit TroubleshootingService(IObdVelmora const* obd, Following following = Following::AtOnce);
     ~TroubleshootingService() override;
 
     std::string query(std::string const& request, int timeout) override;
@@ -28,9 +28,16 @@ public:
     void onDataSent(std::vector<unsigned char> const& data) override;
     void onDataReceived(std::vector<unsigned char> const& data) override;
 
+protected:
+    void startFollowing() override;
+    void stopFollowing() override;
+
 private:
+    void tap();
+    void untap();
     void addEntry(std::vector<unsigned char> const& data, int direction);
 
+    bool m_tapping = false;             // the owner's thread alone
     std::atomic<bool> m_logging{false}; // read by whichever thread sends or receives
 };
 

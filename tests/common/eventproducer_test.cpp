@@ -6,6 +6,7 @@
 
 #include <atomic>
 #include <functional>
+#include <memory>
 #include <stdexcept>
 #include <thread>
 #include <vector>
@@ -132,6 +133,75 @@ TEST(EventProducer, ImplementsACarriersInterfaceByDominance)
     face.attach(&listener);
     carrier.change();
     EXPECT_EQ(listener.heard, std::vector<int>{7});
+}
+
+TEST(EventProducer, AListenerThatAttachesAnotherInsideAnEventDoesNotHearItThere)
+{
+    Producer producer;
+    Listener first;
+    Listener late;
+    first.inside = [&] {
+        producer.attach(&late);
+        first.inside = [] {};
+    };
+    producer.attach(&first);
+    producer.fire(1);
+    EXPECT_TRUE(late.heard.empty());
+    producer.fire(2);
+    EXPECT_EQ(late.heard, std::vector<int>{2});
+}
+
+TEST(EventProducer, AListenerMayDetachItselfAndOthersInsideAnEvent)
+{
+    Producer producer;
+    auto first = std::make_unique<Listener>();
+    Listener second;
+    Listener third;
+    first->inside = [&] {
+        producer.detach(&second);
+        producer.detach(first.get());
+        std::unique_ptr<Listener> const gone = std::move(first); // even its own end
+    };
+    producer.attach(first.get());
+    producer.attach(&second);
+    producer.attach(&third);
+    producer.fire(1);
+    producer.fire(2);
+    EXPECT_TRUE(second.heard.empty());
+    EXPECT_EQ(third.heard, (std::vector<int>{1, 2}));
+}
+
+TEST(EventProducer, AListenerMayFireAgainInsideAnEvent)
+{
+    Producer producer;
+    Listener listener;
+    listener.inside = [&] {
+        if (listener.heard.size() < 3) {
+            producer.fire(static_cast<int>(listener.heard.size()));
+        }
+    };
+    producer.attach(&listener);
+    producer.fire(0);
+    EXPECT_EQ(listener.heard, (std::vector<int>{0, 1, 2}));
+}
+
+TEST(EventProducer, NobodyIsInsideAListenerThatWasDetached)
+{
+    Producer producer;
+    std::atomic<bool> done{false};
+    std::thread firing([&] {
+        while (!done) {
+            producer.fire(1);
+        }
+    });
+    for (int i = 0; i < 500; ++i) {
+        auto listener = std::make_unique<Listener>(); // whose end a sanitizer sees
+        producer.attach(listener.get());
+        std::this_thread::yield();
+        producer.detach(listener.get());
+    }
+    done = true;
+    firing.join();
 }
 
 TEST(EventProducer, FiresFromSeveralThreadsWhileOthersAttachAndDetach)

@@ -139,6 +139,19 @@ TEST(Notifier, ObserverThatAttachesDuringTheWalkIsCalledInIt)
     EXPECT_EQ(late.calls.size(), 1U);
 }
 
+TEST(Notifier, AnObserverThatEndsTheNotifierIsTheLastToBeCalled)
+{
+    auto source = std::make_unique<Source>();
+    Face first;
+    Face second;
+    first.inside = [&] { source.reset(); };
+    source->attach(&first);
+    source->attach(&second);
+    source->notify(&IListenerFace::none);
+    EXPECT_EQ(first.calls.size(), 1U);
+    EXPECT_TRUE(second.calls.empty());
+}
+
 TEST(Notifier, ExceptionOfAnObserverReachesTheDispatchingCode)
 {
     Source source;

@@ -25,7 +25,8 @@ public:
     /// Identifies the adapter, finds the vehicle and reads what its control modules support. Blocks for seconds to
     /// minutes; invalidate() on the bridge makes it fail within 250 ms. restoreAdapter restores and resets the adapter
     /// first. After a failure call closeConnection, which takes the adapter down, and bring a fresh bridge for the next
-    /// attempt. An open connection is replaced without being closed.
+    /// attempt. An open connection is replaced without being closed. Services may be built and dropped meanwhile, on
+    /// the thread that dispatches: see IObdVelmora.
     virtual bool openConnection(std::shared_ptr<IDataConnection> const& connection, VehicleProtocol protocol,
                                 bool restoreAdapter) = 0;
 
@@ -33,7 +34,9 @@ public:
     virtual bool isBusy() = 0;
 
     /// Sends the adapter to sleep, tells the services and drops all queued work. Waits for an opening and for the
-    /// request under way. Not from the dispatcher's worker.
+    /// request under way. Not from the dispatcher's worker. Services may be built and dropped meanwhile, on the thread
+    /// that dispatches, but observers that another thread attaches or detaches meanwhile race with the calls they get
+    /// from here: see IObdVelmora.
     virtual void closeConnection() = 0;
 
     /// The adapter: from DeviceReady on, also where no vehicle was found, until the close. May be null.

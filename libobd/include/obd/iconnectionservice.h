@@ -27,7 +27,8 @@ public:
 namespace ConnectionServiceBuilder {
 
 /// The one connection service of the process while somebody holds it; a new one after the last holder let go. It
-/// belongs to the top-level object that was the latest when it was made.
+/// belongs to the top-level object that was the latest when it was made, which must outlive it; null before the first
+/// one. Call from any thread; let go of the last reference on the thread that dispatches: see IObdVelmora.
 OBD_EXPORT std::shared_ptr<IConnectionService> createConnectionService();
 
 } // namespace ConnectionServiceBuilder

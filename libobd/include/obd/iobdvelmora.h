@@ -13,6 +13,12 @@ class IVelmoraSettings;
 /// Start here: the top-level object, which owns the connection and all that hangs on it. Pointers that it hands out are
 /// borrowed and live as long as it does. It must outlive every service that was built while it was the latest one;
 /// destroying it closes the connection.
+///
+/// Services: build and drop them on the thread that calls Dispatcher::dispatch, at any time, also inside the calls that
+/// their observers get there and while another thread opens or closes the connection, selects a module or changes
+/// settings. Calls that reach observers on such another thread, onActiveEcuChanged and onInvalidated, are waited for by
+/// the dropping: they must not wait for the dispatching thread. A service may be built inside them, too. The observers'
+/// lists have no lock: attach and detach while no other thread closes, selects or changes settings.
 class IObdVelmora
 {
 public:

@@ -26,7 +26,8 @@ public:
 
 namespace RoutineServiceBuilder {
 
-/// A new service on the top-level object that was built last; it must die before that object.
+/// A new service on the top-level object that was built last, which must outlive it; null before the first one. Build
+/// and drop it on the thread that dispatches: see IObdVelmora.
 OBD_EXPORT std::shared_ptr<IRoutineService> createRoutineService();
 
 } // namespace RoutineServiceBuilder

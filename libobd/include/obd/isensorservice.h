@@ -54,7 +54,8 @@ public:
 
 namespace SensorServiceBuilder {
 
-/// A new service at every call, on the latest top-level object, which must outlive it.
+/// A new service on the top-level object that was built last, which must outlive it; null before the first one. Build
+/// and drop it on the thread that dispatches: see IObdVelmora.
 OBD_EXPORT std::shared_ptr<ISensorService> createSensorService();
 
 } // namespace SensorServiceBuilder

@@ -18,7 +18,8 @@ public:
     /// The parameters or their units have changed: all that the application holds on sensors is out of date, and the
     /// statistics start anew. After a change of the units running updates go on; after all other changes they have
     /// ended. On the thread that changes the setting, that selects another control module, or that closes the
-    /// connection; in the last case while the closing holds its locks, so do no more here than note it.
+    /// connection; in the last case while the closing holds its locks: services may be built and dropped here, but
+    /// nothing be opened, closed or waited for.
     virtual void onInvalidated() {}
 
     /// A reading has come; success is always true, since a request that failed is only tried again. values holds one

@@ -57,7 +57,8 @@ public:
 
 namespace TroubleCodeServiceBuilder {
 
-/// A new service on the top-level object that was built last; it must die before that object.
+/// A new service on the top-level object that was built last, which must outlive it; null before the first one. Build
+/// and drop it on the thread that dispatches: see IObdVelmora.
 OBD_EXPORT std::shared_ptr<ITroubleCodeService> createTroubleCodeService();
 
 } // namespace TroubleCodeServiceBuilder

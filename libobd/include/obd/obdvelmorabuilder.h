@@ -12,7 +12,8 @@ class ISettings;
 namespace ObdVelmoraBuilder {
 
 /// A new top-level object on the application's settings. The three values are handed back by getHostValue1 to 3 and not
-/// looked at. Services built later belong to the object built last. One thread at a time.
+/// looked at. Services built later belong to the object built last. One thread at a time. Null, with a log line and
+/// without replacing the object built last, if settings is.
 OBD_EXPORT std::shared_ptr<IObdVelmora> createObdVelmora(unsigned int hostValue1, unsigned int hostValue2,
                                                          unsigned int hostValue3,
                                                          std::shared_ptr<ISettings> const& settings);

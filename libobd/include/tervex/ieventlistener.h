@@ -2,8 +2,8 @@
 
 namespace tervex {
 
-/// Hears the events of one kind from an IEventProducer. Called on the thread that fires, while the producer's list is
-/// locked: an implementation must not attach to or detach from the same producer inside onEvent, nor fire it again.
+/// Hears the events of one kind from an IEventProducer. Called on the thread that fires. Inside onEvent listeners may
+/// be attached and detached, the one that is called too; one that was attached there hears the next event first.
 template <typename E>
 class IEventListener
 {

@@ -16,6 +16,7 @@ public:
     virtual void attach(Observer<T>* observer) = 0;
 
     /// Removes every entry of the observer. One that detaches itself inside a call makes this walk skip its successor.
+    /// An observer that ends the notifier itself inside a call is the last to be called.
     virtual void detach(Observer<T>* observer) = 0;
 };
 

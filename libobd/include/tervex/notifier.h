@@ -4,6 +4,7 @@
 #include <tervex/inotifier.h>
 
 #include <cstddef>
+#include <memory>
 #include <utility>
 #include <vector>
 
@@ -14,11 +15,15 @@ template <typename T>
 class Notifier : public virtual INotifier<T>
 {
 public:
-    void attach(Observer<T>* observer) override { m_observers.push_back(observer); }
-    void detach(Observer<T>* observer) override { std::erase(m_observers, observer); }
+    Notifier(Notifier const&) = delete;
+    Notifier& operator=(Notifier const&) = delete;
+
+    void attach(Observer<T>* observer) override { m_observers->push_back(observer); }
+    void detach(Observer<T>* observer) override { std::erase(*m_observers, observer); }
 
 protected:
     Notifier() = default;
+    ~Notifier() override { m_observers->clear(); }
 
     /// Calls a member function of T on every observer: notify(&T::onSomething, arguments...). Arguments are passed on
     /// as the function declares them, references as references.
@@ -29,16 +34,18 @@ protected:
     }
 
 private:
-    /// The list may change during the walk, so its size is read afresh at each step. An observer's exception passes to
-    /// the caller.
+    /// The list may change during the walk, so its size is read afresh at each step. It may even be emptied by the end
+    /// of the notifier, of which nothing else is touched. An observer's exception passes to the caller.
     void dispatch(AbstractEvent<T> const& event)
     {
-        for (std::size_t i = 0; i < m_observers.size(); ++i) {
-            event(m_observers[i]);
+        std::shared_ptr<std::vector<Observer<T>*>> const observers = m_observers;
+        for (std::size_t i = 0; i < observers->size(); ++i) {
+            event((*observers)[i]);
         }
     }
 
-    std::vector<Observer<T>*> m_observers; ///< not owned
+    /// Not owned. The list outlives its notifier for as long as a walk is under way.
+    std::shared_ptr<std::vector<Observer<T>*>> m_observers = std::make_shared<std::vector<Observer<T>*>>();
 };
 
 } // namespace tervex

@@ -85,6 +85,14 @@ TEST_F(ObdVelmora, HandsBackTheHostsValues)
     EXPECT_EQ(obd->getHostValue3(), 0U);
 }
 
+TEST_F(ObdVelmora, WithoutSettingsThereIsNoneAndTheLatestStays)
+{
+    auto const obd = create();
+    EXPECT_EQ(createObdVelmora(1, 2, 3, nullptr), nullptr);
+    EXPECT_THAT(m_log.lines(), ElementsAre("FATAL No settings to build a top-level object on"));
+    EXPECT_EQ(obd::VelmoraInstance::get(), obd.get());
+}
+
 TEST_F(ObdVelmora, HandsOutItsPartsAlwaysTheSame)
 {
     auto const obd = create();
