@@ -9,7 +9,8 @@ namespace {
 
 ExitCode live(GlobalOptions const& global, LiveOptions const& options)
 {
-    std::unique_ptr<LiveCsv> const csv = options.csv.empty() ? nullptr : std::make_unique<LiveCsv>(options.csv);
+    std::unique_ptr<LiveCsv> const csv =
+        options.csv.empty() ? nullptr : std::make_unique<LiveCsv>(options.csv, options.force);
     CommandSession session(global);
     session.connect();
     LiveRun run(session, options, csv.get());
@@ -27,8 +28,12 @@ void addLiveCommand(CommandLine& commandLine)
     command->add_option("SENSOR", options->sensors,
                         "PIDs (0C, 0x0C), names (RPM, COOLANT_TEMP), words of a title, or all;\n"
                         "without: speed, engine speed, coolant, load and throttle");
-    command->add_option("--csv", options->csv, "Record there, one column a sensor; - is standard output")
+    command
+        ->add_option("--csv", options->csv,
+                     "Record there, one column a sensor; - is standard output.\n"
+                     "A file that has these columns already is added to")
         ->type_name("FILE");
+    command->add_flag("--force", options->force, "Let --csv replace a file that has other columns");
     command->add_option("-n,--count", options->count, "Stop after N readings of every sensor")
         ->type_name("N")
         ->check(CLI::Range(1UL, 1000000000UL));

@@ -23,6 +23,7 @@ struct LiveOptions
 {
     std::vector<std::string> sensors;
     std::string csv;
+    bool force = false;      // csv may replace a file
     unsigned long count = 0; // readings of every sensor; 0: no end
     double duration = 0.0;   // seconds; 0: no end
 };

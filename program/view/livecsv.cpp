@@ -8,6 +8,8 @@
 #include <cerrno>
 #include <cstring>
 #include <fcntl.h>
+#include <fstream>
+#include <sys/stat.h>
 #include <unistd.h>
 
 namespace velmora::cli {
@@ -30,9 +32,13 @@ std::string quoted(std::string const& text)
 
 std::FILE* openFile(std::string const& file)
 {
-    // Not truncated yet: a connection that fails must not cost an old recording.
+    // Not truncated yet: a connection that fails must not cost an old recording. A pipe that nobody reads is an error
+    // here, for the opening would wait for a reader without end.
     int const descriptor =
-        file == "-" ? ::dup(STDOUT_FILENO) : ::open(file.c_str(), O_WRONLY | O_CREAT | O_CLOEXEC, 0644);
+        file == "-" ? ::dup(STDOUT_FILENO) : ::open(file.c_str(), O_WRONLY | O_CREAT | O_CLOEXEC | O_NONBLOCK, 0644);
+    if (descriptor >= 0 && file != "-") {
+        ::fcntl(descriptor, F_SETFL, ::fcntl(descriptor, F_GETFL) & ~O_NONBLOCK);
+    }
     std::FILE* const stream = descriptor >= 0 ? ::fdopen(descriptor, "w") : nullptr;
     if (stream == nullptr) {
         throw Error(ErrorKind::Failed, "Could not open " + file + " for writing: " + std::strerror(errno),
@@ -66,17 +72,51 @@ void LiveCsv::Close::operator()(std::FILE* file) const
     std::fclose(file);
 }
 
-LiveCsv::LiveCsv(std::string const& file) : m_file(file), m_stream(openFile(file)) {}
+LiveCsv::LiveCsv(std::string const& file, bool replaced) : m_file(file), m_replaced(replaced), m_stream(openFile(file))
+{}
+
+// Whether the file stands with these columns, so that rows may follow.
+bool LiveCsv::joins(std::string const& header) const
+{
+    struct stat info
+    {};
+    if (toStandardOutput() || ::fstat(::fileno(m_stream.get()), &info) != 0 || !S_ISREG(info.st_mode) ||
+        info.st_size == 0) {
+        return false;
+    }
+    std::string begin(header.size(), '\0');
+    std::ifstream(m_file).read(begin.data(), static_cast<std::streamsize>(begin.size()));
+    if (begin == header) {
+        return true;
+    }
+    throw Error(ErrorKind::WrongUse, "The file " + m_file + " stands already, and has not these columns",
+                {"--force replaces it", "record to another name, or choose the sensors and units that it has"});
+}
 
 void LiveCsv::begin(LiveTable const& table, LiveTime now, WallTime start)
 {
     m_begin = now;
     m_start = start;
     m_rowTime = now;
-    if (::ftruncate(::fileno(m_stream.get()), 0) != 0) {
-        errno = 0; // a pipe or a device has nothing to cut off
+    std::string const header = toCsvHeader(table.rows());
+    if (m_replaced && !toStandardOutput()) {
+        [[maybe_unused]] int const cut = ::ftruncate(::fileno(m_stream.get()), 0); // a pipe has nothing to cut off
+    } else if (joins(header)) {
+        goOn();
+        return;
     }
-    write(toCsvHeader(table.rows()));
+    write(header);
+}
+
+// Behind the last row, which may have been torn.
+void LiveCsv::goOn()
+{
+    std::ifstream in(m_file);
+    in.seekg(-1, std::ios::end);
+    std::fseek(m_stream.get(), 0, SEEK_END);
+    if (in.get() != '\n') {
+        write("\n");
+    }
 }
 
 bool LiveCsv::update(LiveTable const& table, LiveTime now)

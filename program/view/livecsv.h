@@ -20,13 +20,15 @@ class LiveCsv
 public:
     using WallTime = std::chrono::system_clock::time_point;
 
-    // "-" is standard output. An old file is kept until begin. Throws Error if the file can't be opened.
-    explicit LiveCsv(std::string const& file);
+    // "-" is standard output, which goes on from where it is. A file that stands already is left alone until begin;
+    // replaced tells what happens to it then. Throws Error if the file can't be opened.
+    explicit LiveCsv(std::string const& file, bool replaced = false);
 
     bool toStandardOutput() const { return m_file == "-"; }
     std::string const& file() const { return m_file; }
 
-    // Replaces what the file held by the header. start is the time of day at now: the rows count on from it, for a
+    // Writes the header. A file that holds the same header already is added to; one that holds anything else is
+    // replaced, or Error is thrown. start is the time of day at now: the rows count on from it, for a
     // clock that is set in the middle of a drive would tear the recording.
     void begin(LiveTable const& table, LiveTime now, WallTime start);
     // Writes a row when a round of all sensors has ended, or a second after the last row if there is anything new.
@@ -41,11 +43,14 @@ private:
         void operator()(std::FILE* file) const;
     };
 
+    bool joins(std::string const& header) const;
+    void goOn();
     bool writeRow(LiveTable const& table, LiveTime now);
     bool write(std::string const& text);
     void sync(LiveTime now);
 
     std::string m_file;
+    bool m_replaced;
     std::unique_ptr<std::FILE, Close> m_stream;
     unsigned long m_rounds = 0;   // at the last row
     unsigned long m_readings = 0; // at the last row

@@ -10,9 +10,11 @@
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
 
+#include <fcntl.h>
 #include <filesystem>
 #include <fstream>
 #include <sstream>
+#include <sys/stat.h>
 #include <unistd.h>
 
 namespace {
@@ -176,13 +178,52 @@ TEST_F(LiveCsvFile, KeepsAnOldFileUntilItBegins)
     std::ofstream(file) << "x,old\n";
     LiveCsv csv(file.string());
     EXPECT_THAT(content(), ElementsAre("old"));
-    csv.begin(table, now, start);
+    EXPECT_THROW(csv.begin(table, now, start), Error) << "unasked it replaces nothing";
+    EXPECT_THAT(content(), ElementsAre("old"));
+    LiveCsv replacing(file.string(), true);
+    EXPECT_THAT(content(), ElementsAre("old"));
+    replacing.begin(table, now, start);
     EXPECT_THAT(content(), ElementsAre("A (%),B (%)"));
+}
+
+TEST_F(LiveCsvFile, GoesOnWhereTheColumnsAreTheSame)
+{
+    for (char const* old : {"time,A (%),B (%)\nT,1,2\n", "time,A (%),B (%)\nT,1,2"}) {
+        std::ofstream(file) << old;
+        LiveCsv csv(file.string());
+        csv.begin(table, now, start);
+        reading(0x0C, "7");
+        csv.finish(table, now);
+        EXPECT_THAT(content(), ElementsAre("A (%),B (%)", "1,2", "7,-"));
+    }
+    std::ofstream(file) << "time,A (%),B (%),C\n";
+    EXPECT_THROW(LiveCsv(file.string()).begin(table, now, start), Error);
+    std::ofstream(file) << "";
+    LiveCsv empty(file.string());
+    empty.begin(table, now, start);
+    EXPECT_THAT(content(), ElementsAre("A (%),B (%)"));
+}
+
+// As with `live --csv - >> day.csv`.
+TEST_F(LiveCsvFile, StandardOutputKeepsWhatStandsBeforeIt)
+{
+    std::ofstream(file) << "x,old\n";
+    int const before = ::dup(STDOUT_FILENO);
+    int const target = ::open(file.c_str(), O_WRONLY | O_APPEND);
+    ::dup2(target, STDOUT_FILENO);
+    LiveCsv csv("-", true);
+    csv.begin(table, now, start);
+    ::dup2(before, STDOUT_FILENO);
+    ::close(before);
+    ::close(target);
+    EXPECT_THAT(content(), ElementsAre("old", "A (%),B (%)"));
 }
 
 TEST_F(LiveCsvFile, TellsOfAFileThatCannotBeOpenedOrWritten)
 {
     EXPECT_THROW(LiveCsv("/nowhere/at/all.csv"), Error);
+    ASSERT_EQ(::mkfifo(file.c_str(), 0600), 0);
+    EXPECT_THROW(LiveCsv(file.string()), Error) << "a pipe that nobody reads is not waited for";
     if (std::filesystem::exists("/dev/full")) {
         LiveCsv full("/dev/full");
         EXPECT_THROW(full.begin(table, now, start), Error);
