@@ -11,7 +11,8 @@ namespace {
 
 FreezeFrame::Reading toReading(obd::SensorDataModel const& sensor)
 {
-    return {sensor.name, sensor.value ? std::optional(sensor.value->value) : std::nullopt, unitLabel(sensor.unit)};
+    return {sensor.name, sensor.value ? std::optional(sensor.value->value) : std::nullopt,
+            unitLabel(sensor.uid, sensor.unit)};
 }
 
 // The library gives the generic meaning only; the catalogue knows the makers' as well.

@@ -24,6 +24,7 @@ bool confirmed(CommandSession const& session, std::string const& warning, std::s
     if (session.options().yes) {
         return true;
     }
+    dropTypedAhead();
     tell(fmt::format("{}{} [y/N] ", warning, question));
     std::string answer;
     return LineReader(session).read(answer) && (answer == "y" || answer == "Y" || answer == "yes");

@@ -26,7 +26,9 @@ void addFreezeCommand(CommandLine& commandLine)
     CLI::App* const command =
         commandLine.addCommand("freeze", "Show what the vehicle froze when a code was set",
                                [frame](GlobalOptions const& options) { return freeze(*frame, options); });
-    command->add_option("FRAME", *frame, "Number of the frame (0)")->check(CLI::Range(0, 255));
+    command->add_option("FRAME", *frame, "Number of the frame, 0 to 255 (0)")
+        ->type_name("N")
+        ->check(CLI::Range(0, 255));
 }
 
 } // namespace velmora::cli

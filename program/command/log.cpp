@@ -11,6 +11,8 @@
 #include <tervex/observer.h>
 
 #include <chrono>
+#include <mutex>
+#include <optional>
 
 namespace velmora::cli {
 
@@ -23,7 +25,7 @@ constexpr std::chrono::milliseconds lookInterval{50};
 struct LogOptions
 {
     std::vector<std::string> sensors;
-    std::size_t count = 0; // entries; 0: no end
+    std::size_t count = 0; // entries after the connection stands; 0: no end
     double duration = 0.0; // seconds after the connection stands; 0: no end
 };
 
@@ -41,7 +43,17 @@ public:
     TrafficLog(TrafficLog const&) = delete;
     TrafficLog& operator=(TrafficLog const&) = delete;
 
-    bool printed(std::size_t entries) const { return m_printer.lines() >= entries; }
+    // Prints this many entries more, and none after.
+    void limit(std::size_t entries)
+    {
+        std::lock_guard const lock(m_mutex);
+        m_left = entries;
+    }
+    bool done() const
+    {
+        std::lock_guard const lock(m_mutex);
+        return m_left == std::size_t{0};
+    }
     bool readerGone() const { return m_printer.readerGone(); }
 
     // Ends with what was logged so far. Throws Error if it can't be printed.
@@ -54,11 +66,20 @@ public:
 private:
     void onLogEntryAdded(std::shared_ptr<obd::MessageDataModel> const& entry) override
     {
+        std::lock_guard const lock(m_mutex);
+        if (m_left == std::size_t{0}) {
+            return;
+        }
         m_printer.print(m_json ? toJsonLine(*entry) : toLine(*entry));
+        if (m_left) {
+            --*m_left;
+        }
     }
 
     bool const m_json;
     LinePrinter m_printer;
+    mutable std::mutex m_mutex;
+    std::optional<std::size_t> m_left; // protected by m_mutex; nothing for no limit
     // Its end waits for an entry that is under way on another thread, which detaching would not.
     std::shared_ptr<obd::ITroubleshootingService> m_service;
 };
@@ -74,13 +95,15 @@ ExitCode log(LogOptions const& chosen, GlobalOptions const& options)
     TrafficLog traffic(options.json);
     session.connect();
     auto const sensors = obd::SensorServiceBuilder::createSensorService();
+    if (chosen.count > 0) {
+        traffic.limit(chosen.count);
+    }
     sensors->startUpdates(chosenSensors(chosen.sensors, *sensors));
     Clock::time_point const start = Clock::now();
     auto const done = [&] {
-        bool const counted = chosen.count > 0 && traffic.printed(chosen.count);
         bool const expired =
             chosen.duration > 0.0 && Clock::now() - start >= std::chrono::duration<double>(chosen.duration);
-        return counted || expired || traffic.readerGone();
+        return traffic.done() || expired || traffic.readerGone();
     };
     while (!done()) {
         Clock::time_point const limit = Clock::now() + lookInterval;
@@ -101,7 +124,7 @@ void addLogCommand(CommandLine& commandLine)
                                [chosen](GlobalOptions const& options) { return log(*chosen, options); });
     command->add_option("SENSOR", chosen->sensors,
                         "What to ask for meanwhile, named as for live; without, only the connection is kept up");
-    command->add_option("-n,--count", chosen->count, "Stop after N entries")
+    command->add_option("-n,--count", chosen->count, "Stop N entries after the connection stands")
         ->type_name("N")
         ->check(CLI::Range(1UL, 1000000000UL));
     command->add_option("--duration", chosen->duration, "Stop S seconds after the connection stands")

@@ -74,8 +74,8 @@ void printOffer(Offer const& offer, bool all)
 {
     std::string lead = fmt::format("{:02X}", static_cast<int>(offer.parameter->id));
     for (auto const& sensor : offer.parameter->sensors) {
-        std::string const line =
-            fmt::format("  {:<2}  {:<58}  {:<8}  {}", lead, sensor->name, unitLabel(sensor->unit), range(*sensor));
+        std::string const line = fmt::format("  {:<2}  {:<58}  {:<8}  {}", lead, sensor->name,
+                                             unitLabel(sensor->uid, sensor->unit), range(*sensor));
         if (all) {
             fmt::print("{:<92}{}\n", line, offer.offered ? "offered" : "-");
         } else {
@@ -101,7 +101,7 @@ void printText(obd::IEcu const& ecu, bool all)
 
 Json sensorJson(obd::SensorDataModel const& sensor)
 {
-    Json json = {{"uid", sensor.uid}, {"name", sensor.name}, {"unit", textOrNull(unitLabel(sensor.unit))}};
+    Json json = {{"uid", sensor.uid}, {"name", sensor.name}, {"unit", textOrNull(unitLabel(sensor.uid, sensor.unit))}};
     json["minimum"] = sensor.numeric != nullptr ? Json(sensor.numeric->minimum) : Json(nullptr);
     json["maximum"] = sensor.numeric != nullptr ? Json(sensor.numeric->maximum) : Json(nullptr);
     return json;

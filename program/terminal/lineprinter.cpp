@@ -35,14 +35,7 @@ void LinePrinter::print(std::string const& line)
 {
     std::lock_guard const lock(m_mutex);
     m_text += line;
-    ++m_lines;
     m_wake.notify_one();
-}
-
-std::size_t LinePrinter::lines() const
-{
-    std::lock_guard const lock(m_mutex);
-    return m_lines;
 }
 
 bool LinePrinter::readerGone() const

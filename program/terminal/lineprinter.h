@@ -1,7 +1,6 @@
 #pragma once
 
 #include <condition_variable>
-#include <cstddef>
 #include <exception>
 #include <mutex>
 #include <string>
@@ -25,8 +24,6 @@ public:
     // Prints what was handed in; nothing more may be. Throws Error if the output can't be written.
     void finish();
 
-    // How many lines were handed in. Any thread.
-    std::size_t lines() const;
     // Whether nobody reads any more. Throws Error if the output can't be written. Any thread.
     bool readerGone() const;
 
@@ -37,7 +34,6 @@ private:
     mutable std::mutex m_mutex;
     std::condition_variable m_wake;
     std::string m_text; // protected by m_mutex, as what follows
-    std::size_t m_lines = 0;
     bool m_readerGone = false;
     std::exception_ptr m_failure;
     bool m_stop = false;

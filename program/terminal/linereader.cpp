@@ -3,6 +3,7 @@
 #include "libvelmora/session/session.h"
 
 #include <poll.h>
+#include <termios.h>
 #include <unistd.h>
 #include <utility>
 
@@ -37,6 +38,11 @@ bool LineReader::fill()
         m_buffer.append(bytes, static_cast<std::size_t>(count));
     }
     return count > 0;
+}
+
+void dropTypedAhead()
+{
+    ::tcflush(STDIN_FILENO, TCIFLUSH);
 }
 
 } // namespace velmora::cli

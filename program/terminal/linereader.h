@@ -24,4 +24,7 @@ private:
     std::string m_buffer;
 };
 
+// Forgets what was typed so far. Before a question: nobody answers one that was not to be seen yet.
+void dropTypedAhead();
+
 } // namespace velmora::cli

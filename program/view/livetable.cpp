@@ -21,8 +21,9 @@ LiveRow makeRow(obd::ParameterDescriptor const& parameter, obd::SensorDescriptor
     LiveRow row{};
     row.uid = sensor.uid();
     row.name = alone ? parameter.description() : parameter.description() + ": " + sensor.description();
-    row.unit = unitLabel(sensor.unit());
-    row.numeric = sensor.isNumeric();
+    row.unit = unitLabel(sensor.uid(), sensor.unit());
+    // What has a unit is a number, though the library gives some, such as distances, as plain digits.
+    row.numeric = sensor.isNumeric() || !row.unit.empty();
     return row;
 }
 

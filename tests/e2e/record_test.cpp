@@ -95,3 +95,13 @@ TEST(Log, ShowsTheTrafficFromTheFirstCommandOn)
     EXPECT_GE(std::count(outcome.out.begin(), outcome.out.end(), '\n'), 40);
     EXPECT_NE(outcome.out.find("\"data\":\"010C"), std::string::npos) << "the sensor is asked for";
 }
+
+TEST(Log, CountsFromWhereTheConnectionStands)
+{
+    Outcome const outcome = runVelmora({"-q", "-p", "sim:petrol-can11?instant", "log", "RPM", "-n", "4"});
+    EXPECT_EQ(outcome.exitCode, 0) << outcome.err;
+    std::size_t const asked = outcome.out.find(" 010C");
+    ASSERT_NE(asked, std::string::npos) << "the sensor is asked for";
+    auto const lineBegin = outcome.out.begin() + static_cast<std::ptrdiff_t>(outcome.out.rfind('\n', asked) + 1);
+    EXPECT_EQ(std::count(lineBegin, outcome.out.end(), '\n'), 4) << outcome.out;
+}

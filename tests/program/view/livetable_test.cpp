@@ -44,6 +44,19 @@ TEST_F(Live, HasARowForEachSensor)
     EXPECT_EQ(nameWithUnit(table.rows()[3]), "Fuel system");
 }
 
+TEST_F(Live, GivesDigitsWithAUnitAndAnglesTheirSign)
+{
+    table.select({liveParameter(0x1F, "Run time", {""}, false, UnitSecond),
+                  liveParameter(0x0E, "Timing advance", {""}, true, UnitNone),
+                  liveParameter(0x5D, "Injection timing", {""}, true, UnitNone),
+                  liveParameter(0x44, "Ratio", {""}, true, UnitNone)});
+    EXPECT_TRUE(table.rows()[0].numeric);
+    EXPECT_EQ(table.rows()[0].unit, "s");
+    EXPECT_EQ(table.rows()[1].unit, "°");
+    EXPECT_EQ(table.rows()[2].unit, "°");
+    EXPECT_EQ(table.rows()[3].unit, "");
+}
+
 TEST_F(Live, KeepsTheReadingAndItsStatistics)
 {
     table.update(0x0C, {std::make_shared<obd::SensorValueDataModel>(120, "800", "700", "900", "850")}, now);
