@@ -150,6 +150,9 @@ ExitCode CommandLine::run(int argc, char const* const* argv)
         tell(fmt::format("velmora: {}\n  - velmora --help tells the options and commands\n",
                          unknown.empty() ? error.what() : "\"" + unknown.front() + "\" is no command or option"));
         return ExitCode::WrongUse;
+    } catch (Error const& wrong) {
+        report(wrong);
+        return exitCode(wrong);
     }
     return runAction();
 }

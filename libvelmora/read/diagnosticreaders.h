@@ -24,5 +24,7 @@ CountersReport readCounters(Session& session, obd::IEcu const& ecu);
 // What a reply of service 09 means that gave no counters. The older buses' check bytes hide which are 0.
 TopicAnswer judgeWithoutCounters(std::vector<unsigned char> const& reply, obd::ObdProtocol protocol);
 InfoReport readInfo(Session& session, obd::IEcu const& ecu);
+// The vehicle identification number; empty if the module does not tell it.
+std::string readVin(Session& session, obd::IEcu const& ecu);
 
 } // namespace velmora

@@ -67,6 +67,13 @@ private:
 
 } // namespace
 
+std::string readVin(Session& session, obd::IEcu const& ecu)
+{
+    using Service = obd::IEcuService;
+    session.select(ecu);
+    return InfoFetch(session)(&Service::hasVehicleIdentificationNumber, &Service::fetchVehicleIdentificationNumber);
+}
+
 InfoReport readInfo(Session& session, obd::IEcu const& ecu)
 {
     using Service = obd::IEcuService;

@@ -68,9 +68,22 @@ ModuleReport readModule(Session& session, obd::IEcu const& ecu, CodeReader& read
             readCounters(session, ecu)};
 }
 
+void giveMeanings(VehicleReport& report, std::string const& named)
+{
+    std::vector<std::string> vins;
+    for (ModuleReport const& module : report.modules) {
+        vins.push_back(module.info.vin);
+    }
+    MakerChoice const maker = chooseMaker(named, vins);
+    for (ModuleReport& module : report.modules) {
+        applyMaker(module.codes, maker);
+        applyMaker(module.freeze, maker);
+    }
+}
+
 } // namespace
 
-VehicleReport readVehicle(Session& session)
+VehicleReport readVehicle(Session& session, std::string const& maker)
 {
     VehicleReport report;
     report.adapter = readAdapter(session);
@@ -81,6 +94,7 @@ VehicleReport readVehicle(Session& session)
         report.modules.push_back(readModule(session, *ecu, reader));
     }
     session.check();
+    giveMeanings(report, maker);
     return report;
 }
 

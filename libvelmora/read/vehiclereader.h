@@ -7,6 +7,7 @@ namespace velmora {
 
 // Asks adapter and control modules for all that a report holds, one module after another; each becomes the library's
 // current one. Takes seconds. session must be connected. Throws Error if the link breaks or the user interrupts.
-VehicleReport readVehicle(Session& session);
+// maker: the one whose meanings the codes are given, or empty for that of the vehicle identification number.
+VehicleReport readVehicle(Session& session, std::string const& maker = {});
 
 } // namespace velmora

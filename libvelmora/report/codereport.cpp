@@ -18,7 +18,34 @@ char const* answerKey(CodeList::Answer answer)
     return all[static_cast<int>(answer)];
 }
 
+Json toJson(MakerChoice const& choice)
+{
+    static constexpr char const* words[] = {"", "option", "VIN", "guess"};
+    if (choice.by == MakerChoice::By::Nothing) {
+        return nullptr;
+    }
+    return {{"name", choice.maker}, {"by", words[static_cast<int>(choice.by)]}};
+}
+
 } // namespace
+
+bool hasMakersCodes(CodeReport const& report)
+{
+    return std::any_of(report.lists.begin(), report.lists.end(), [](CodeList const& list) {
+        return std::any_of(list.codes.begin(), list.codes.end(),
+                           [](TroubleCode const& code) { return isMakersCode(code.code); });
+    });
+}
+
+void applyMaker(CodeReport& report, MakerChoice const& maker)
+{
+    report.maker = maker;
+    for (CodeList& list : report.lists) {
+        for (TroubleCode& code : list.codes) {
+            code.maker = maker.holding();
+        }
+    }
+}
 
 bool hasFindings(CodeReport const& report)
 {
@@ -42,7 +69,7 @@ bool canBeChecked(CodeReport const& report)
 
 Json toJsonValue(CodeReport const& report)
 {
-    Json document = {{"lamp", valueOrNull(report.lamp)}};
+    Json document = {{"lamp", valueOrNull(report.lamp)}, {"maker", toJson(report.maker)}};
     for (CodeList const& list : report.lists) {
         bool const read = list.answer == CodeList::Answer::Read;
         document[kindKey(list.kind)] = {{"answer", answerKey(list.answer)},

@@ -2,6 +2,7 @@
 
 #include "libvelmora/report/moduletopic.h"
 #include "libvelmora/report/troublecode.h"
+#include "libvelmora/vehicle/makerchoice.h"
 
 #include <optional>
 #include <string>
@@ -37,7 +38,14 @@ struct CodeReport
 {
     std::optional<bool> lamp; // whether the malfunction indicator is on
     std::vector<CodeList> lists;
+    MakerChoice maker = {}; // whose meanings the codes are given
 };
+
+// Whether any of the codes means something else with each maker.
+bool hasMakersCodes(CodeReport const& report);
+
+// Gives the codes the meanings of that maker.
+void applyMaker(CodeReport& report, MakerChoice const& maker);
 
 using ModuleCodes = ModuleTopic<CodeReport>;
 

@@ -25,9 +25,9 @@ void addLamp(std::vector<Finding>& list, ModuleReport const& module)
     }
 }
 
-std::string meaningOf(TroubleCode const& code)
+std::string described(TroubleCode const& code)
 {
-    return code.meanings.empty() ? code.code : code.code + " " + code.meanings.front().text;
+    return code.code + " " + meaningText(code);
 }
 
 // A code may be confirmed and permanent at once: it is told once, with all its kinds.
@@ -36,7 +36,7 @@ void addCodes(std::vector<Finding>& list, ModuleReport const& module)
     std::size_t const first = list.size();
     for (CodeList const& codes : module.codes.lists) {
         for (TroubleCode const& code : codes.codes) {
-            std::string const text = meaningOf(code);
+            std::string const text = described(code);
             auto const known = std::find_if(list.begin() + static_cast<std::ptrdiff_t>(first), list.end(),
                                             [&text](Finding const& finding) { return finding.text == text; });
             if (known != list.end()) {

@@ -16,6 +16,13 @@ Json toJsonValue(FreezeFrame const& frame)
 
 } // namespace
 
+void applyMaker(FreezeReport& report, MakerChoice const& maker)
+{
+    if (report.frame) {
+        report.frame->code.maker = maker.holding();
+    }
+}
+
 Json toJsonValue(FreezeReport const& report)
 {
     return {{"frame", report.number},

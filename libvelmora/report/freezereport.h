@@ -2,6 +2,7 @@
 
 #include "libvelmora/report/moduletopic.h"
 #include "libvelmora/report/troublecode.h"
+#include "libvelmora/vehicle/makerchoice.h"
 
 #include <optional>
 #include <string>
@@ -30,6 +31,9 @@ struct FreezeReport
     bool answered; // whether the module told what its frame holds
     std::optional<FreezeFrame> frame;
 };
+
+// Gives the code that set the frame the meaning of that maker.
+void applyMaker(FreezeReport& report, MakerChoice const& maker);
 
 inline bool hasAnswer(FreezeReport const& report)
 {

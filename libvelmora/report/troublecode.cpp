@@ -2,9 +2,62 @@
 
 #include "libvelmora/report/json.h"
 
+#include <fmt/format.h>
+
 #include <algorithm>
 
 namespace velmora {
+
+namespace {
+
+TroubleCode::Meaning const* findMeaning(TroubleCode const& code, std::string const& maker)
+{
+    auto const found = std::find_if(code.meanings.begin(), code.meanings.end(),
+                                    [&maker](TroubleCode::Meaning const& meaning) { return meaning.maker == maker; });
+    return found != code.meanings.end() ? &*found : nullptr;
+}
+
+Json toJson(TroubleCode::Meaning const& meaning)
+{
+    return {{"maker", meaning.maker}, {"text", meaning.text}};
+}
+
+} // namespace
+
+bool isMakersCode(std::string const& code)
+{
+    if (code.size() < 3) {
+        return false;
+    }
+    if (code[0] == 'P') {
+        return code[1] == '1' || (code[1] == '3' && code[2] < '4');
+    }
+    return code[1] == '1' || code[1] == '2';
+}
+
+TroubleCode::Meaning const* meaningOf(TroubleCode const& code)
+{
+    // "Unknown" is the catalogue's word for a maker's code that it does not have.
+    std::string const generic = "Generic";
+    bool const makerFirst = isMakersCode(code.code);
+    for (std::string const& maker :
+         {makerFirst ? code.maker : generic, makerFirst ? generic : code.maker, std::string("Unknown")}) {
+        if (TroubleCode::Meaning const* const meaning = findMeaning(code, maker)) {
+            return meaning;
+        }
+    }
+    return nullptr;
+}
+
+std::string meaningText(TroubleCode const& code)
+{
+    if (TroubleCode::Meaning const* const meaning = meaningOf(code)) {
+        return meaning->text;
+    }
+    std::size_t const count = code.meanings.size();
+    return fmt::format("maker-specific, {} meaning{}{}", count, count == 1 ? "" : "s",
+                       code.maker.empty() ? "" : " of other makers");
+}
 
 std::vector<TroubleCode> groupByCode(std::vector<std::shared_ptr<obd::DtcDataModel>> const& models)
 {
@@ -13,7 +66,7 @@ std::vector<TroubleCode> groupByCode(std::vector<std::shared_ptr<obd::DtcDataMod
         auto found = std::find_if(codes.begin(), codes.end(),
                                   [&model](TroubleCode const& code) { return code.code == model->code; });
         if (found == codes.end()) {
-            found = codes.insert(codes.end(), {model->code, model->system, {}});
+            found = codes.insert(codes.end(), {model->code, model->system, {}, {}});
         }
         TroubleCode::Meaning const meaning{model->manufacturer, model->description};
         if (std::find(found->meanings.begin(), found->meanings.end(), meaning) == found->meanings.end()) {
@@ -27,9 +80,13 @@ Json toJsonValue(TroubleCode const& code)
 {
     Json meanings = Json::array();
     for (TroubleCode::Meaning const& meaning : code.meanings) {
-        meanings.push_back({{"maker", meaning.maker}, {"text", meaning.text}});
+        meanings.push_back(toJson(meaning));
     }
-    return {{"code", code.code}, {"system", code.system}, {"meanings", meanings}};
+    TroubleCode::Meaning const* const holds = meaningOf(code);
+    return {{"code", code.code},
+            {"system", code.system},
+            {"meaning", holds != nullptr ? toJson(*holds) : Json(nullptr)},
+            {"meanings", meanings}};
 }
 
 Json toJsonValue(std::vector<TroubleCode> const& codes)

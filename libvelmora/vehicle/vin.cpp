@@ -157,13 +157,4 @@ VinFacts decodeVin(std::string const& vin, int thisYear)
     return facts;
 }
 
-std::string codeListOf(std::string const& vin)
-{
-    if (!isVin(vin)) {
-        return {};
-    }
-    WmiRow const* const row = findWmi(std::string_view(vin).substr(0, 3));
-    return row != nullptr && row->basis == WmiRow::Basis::Fact ? std::string(row->codes) : std::string();
-}
-
 } // namespace velmora

@@ -52,8 +52,4 @@ std::string parseVin(std::string const& text);
 // vin must be one. thisYear: no model year lies more than a year behind it.
 VinFacts decodeVin(std::string const& vin, int thisYear);
 
-// The list of the trouble code catalogue that the control modules of this vehicle are known to follow; empty if none is
-// known, or the text is no vehicle identification number.
-std::string codeListOf(std::string const& vin);
-
 } // namespace velmora

@@ -1,6 +1,8 @@
 #include "libvelmora/read/codereader.h"
+#include "libvelmora/read/makerreader.h"
 #include "program/command/commands.h"
 #include "program/command/commandsession.h"
+#include "program/command/makeoption.h"
 #include "program/command/modulecommand.h"
 #include "program/commandline.h"
 
@@ -15,6 +17,7 @@ struct CodesOptions
     bool confirmed = false;
     bool pending = false;
     bool permanent = false;
+    std::string maker;
 };
 
 std::vector<CodeKind> chosenKinds(CodesOptions const& options)
@@ -51,13 +54,25 @@ Error withoutAnswer(std::vector<ModuleCodes> const& modules)
             {"is the ignition on?", "pending codes are not told by all vehicles, permanent ones only by newer"}};
 }
 
+// The vehicle identification number is asked for only where it matters.
+void giveMeanings(Session& session, std::vector<ModuleCodes>& modules, std::string const& named)
+{
+    bool const needed = std::any_of(modules.begin(), modules.end(),
+                                    [](ModuleCodes const& module) { return hasMakersCodes(module.report); });
+    MakerChoice const maker = needed ? readMaker(session, named) : chooseMaker(named, {});
+    for (ModuleCodes& module : modules) {
+        applyMaker(module.report, maker);
+    }
+}
+
 ExitCode codes(CodesOptions const& chosen, GlobalOptions const& options)
 {
     CommandSession session(options);
     session.connect();
     CodeReader reader(session);
-    auto const modules = readModules(
+    auto modules = readModules(
         session, [&](Session& /*session*/, obd::IEcu const& ecu) { return reader.read(ecu, chosenKinds(chosen)); });
+    giveMeanings(session, modules, chosen.maker);
     print(modules, options);
     requireAnswer(modules, withoutAnswer(modules));
     return ExitCode::Done;
@@ -74,6 +89,7 @@ void addCodesCommand(CommandLine& commandLine)
     command->add_flag("--confirmed", chosen->confirmed, "The stored codes");
     command->add_flag("--pending", chosen->pending, "Codes of this or the last driving cycle");
     command->add_flag("--permanent", chosen->permanent, "Codes that only the vehicle itself erases");
+    addMakeOption(*command, chosen->maker);
 }
 
 } // namespace velmora::cli

@@ -52,6 +52,7 @@ ExitCode explain(DtcOptions const& options, std::string const& maker, bool json)
         for (TroubleCode& code : groupByCode(models)) {
             if (!maker.empty()) {
                 keepMaker(code.meanings, maker);
+                code.maker = maker;
             }
             found.push_back(std::move(code));
         }
@@ -60,7 +61,7 @@ ExitCode explain(DtcOptions const& options, std::string const& maker, bool json)
         fmt::print("{}", printed(toJsonValue(found)));
     } else {
         for (TroubleCode const& code : found) {
-            fmt::print("{}", toText(code));
+            fmt::print("{}", toText(code, {}, true));
         }
     }
     if (!wrong.empty()) {
@@ -96,7 +97,7 @@ ExitCode listRows(DtcOptions const& options, std::string const& maker, bool json
         }
     } else {
         for (auto const& row : rows) {
-            fmt::print("{}", toText({row->code, row->system, {{row->manufacturer, row->description}}}));
+            fmt::print("{}", toText({row->code, row->system, {{row->manufacturer, row->description}}, {}}, {}, true));
         }
     }
     if (rows.empty()) {

@@ -1,6 +1,7 @@
 #include "libvelmora/read/vehiclereader.h"
 #include "program/command/commands.h"
 #include "program/command/commandsession.h"
+#include "program/command/makeoption.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
 #include "program/view/reporttext.h"
@@ -33,25 +34,32 @@ ExitCode check(VehicleReport const& report)
     return ExitCode::Done;
 }
 
-ExitCode scan(bool checking, GlobalOptions const& options)
+struct ScanOptions
+{
+    bool checking = false;
+    std::string maker;
+};
+
+ExitCode scan(ScanOptions const& chosen, GlobalOptions const& options)
 {
     CommandSession session(options);
     session.connect();
-    VehicleReport const report = readVehicle(session);
+    VehicleReport const report = readVehicle(session, chosen.maker);
     fmt::print("{}", options.json ? toJson(report) : toText(report, outputStyle(options)));
-    return checking ? check(report) : ExitCode::Done;
+    return chosen.checking ? check(report) : ExitCode::Done;
 }
 
 } // namespace
 
 void addScanCommand(CommandLine& commandLine)
 {
-    auto const checking = std::make_shared<bool>(false);
+    auto const chosen = std::make_shared<ScanOptions>();
     CLI::App* const command =
         commandLine.addCommand("scan", "Report on the adapter and all control modules",
-                               [checking](GlobalOptions const& options) { return scan(*checking, options); });
-    command->add_flag("--check", *checking,
+                               [chosen](GlobalOptions const& options) { return scan(*chosen, options); });
+    command->add_flag("--check", chosen->checking,
                       "Exit with code 10 if the lamp is on or a code is confirmed or permanent; a pending one is none");
+    addMakeOption(*command, chosen->maker);
 }
 
 } // namespace velmora::cli

@@ -42,6 +42,21 @@ Mark mark(CodeList const& list)
     return list.kind == CodeKind::Pending ? Mark::Warning : Mark::Bad;
 }
 
+std::string makerText(MakerChoice const& choice)
+{
+    switch (choice.by) {
+    case MakerChoice::By::Option:
+        return choice.maker + "'s";
+    case MakerChoice::By::Vin:
+        return choice.maker + "'s, by the VIN";
+    case MakerChoice::By::Guess:
+        return fmt::format("not told; perhaps {0}'s: --make \"{0}\"", choice.maker);
+    case MakerChoice::By::Nothing:
+        break;
+    }
+    return "not told; --make MAKER names the maker, -v lists all";
+}
+
 } // namespace
 
 std::string lampText(std::optional<bool> const& lamp, Style const& style)
@@ -49,12 +64,18 @@ std::string lampText(std::optional<bool> const& lamp, Style const& style)
     return !lamp ? "-" : *lamp ? style.paint(Mark::Bad, "on") : style.paint(Mark::Good, "off");
 }
 
-std::string toText(TroubleCode const& code, std::string const& indent)
+std::string toText(TroubleCode const& code, std::string const& indent, bool all)
 {
+    auto const line = [&](std::string const& lead, std::string const& maker, std::string const& text) {
+        return fmt::format("{}{:<5}  {:<13}  {}\n", indent, lead, maker, text);
+    };
+    if (!all) {
+        TroubleCode::Meaning const* const holds = meaningOf(code);
+        return line(code.code, holds != nullptr ? holds->maker : "-", meaningText(code));
+    }
     std::string text;
     for (TroubleCode::Meaning const& meaning : code.meanings) {
-        text +=
-            fmt::format("{}{:<5}  {:<13}  {}\n", indent, text.empty() ? code.code : "", meaning.maker, meaning.text);
+        text += line(text.empty() ? code.code : "", meaning.maker, meaning.text);
     }
     return text;
 }
@@ -65,10 +86,10 @@ std::string toText(CodeReport const& report, Style const& style)
     for (CodeList const& list : report.lists) {
         text += labelledLine(title(list.kind), style.paint(mark(list), summary(list)));
         for (TroubleCode const& code : list.codes) {
-            text += toText(code, "    ");
+            text += toText(code, "    ", style.isDetailed());
         }
     }
-    return text;
+    return text + (hasMakersCodes(report) ? labelledLine("Meanings", makerText(report.maker)) : "");
 }
 
 } // namespace velmora::cli

@@ -12,7 +12,7 @@ std::string frameText(FreezeFrame const& frame, Style const& style)
         std::string const unit = reading.value && !reading.unit.empty() ? " " + reading.unit : "";
         rows.push_back({{reading.name}, {reading.value.value_or("-") + unit}});
     }
-    return toText(frame.code, "    ") + drawColumns(rows, "    ", style);
+    return toText(frame.code, "    ", style.isDetailed()) + drawColumns(rows, "    ", style);
 }
 
 } // namespace

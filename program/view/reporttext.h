@@ -20,8 +20,8 @@ std::string moduleHeading(unsigned int id, std::string const& name);
 // "on", "off" or "-".
 std::string lampText(std::optional<bool> const& lamp, Style const& style);
 
-// One line a meaning: code, maker and text in columns, behind the indent.
-std::string toText(TroubleCode const& code, std::string const& indent = {});
+// Code, maker and text in columns behind the indent: the meaning that holds, or a line for each that there is.
+std::string toText(TroubleCode const& code, std::string const& indent, bool all);
 
 std::string toText(CodeReport const& report, Style const& style);
 std::string toText(CountersReport const& report, Style const& style);

@@ -37,7 +37,8 @@ bool wantsColor(std::optional<ColorMode> mode, bool noColor, bool terminal)
 Style outputStyle(GlobalOptions const& options)
 {
     char const* const noColor = std::getenv("NO_COLOR");
-    return Style(wantsColor(options.color, noColor != nullptr && *noColor != '\0', Terminal::isUsable()));
+    return Style(wantsColor(options.color, noColor != nullptr && *noColor != '\0', Terminal::isUsable()),
+                 options.verbose);
 }
 
 } // namespace velmora::cli

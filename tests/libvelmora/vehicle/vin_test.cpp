@@ -1,4 +1,5 @@
 #include "libvelmora/report/vinreport.h"
+#include "libvelmora/vehicle/makerchoice.h"
 #include "libvelmora/vehicle/vin.h"
 
 #include <velmora/error.h>
@@ -85,12 +86,15 @@ TEST(Vin, NamesRegionCountryAndMaker)
 
 TEST(Vin, ChoosesAListOfCodesOnlyWhereItIsTheMakersOwn)
 {
-    EXPECT_EQ(codeListOf("WVWZZZ1JZXW000001"), "Volkswagen");
-    EXPECT_EQ(codeListOf("1G3ZZZ1JZXW000001"), "GM") << "the catalogue's Oldsmobile list is Ford's";
-    EXPECT_EQ(codeListOf("WVXZZZ1JZXW000001"), "") << "a guess by the first two characters";
-    EXPECT_EQ(codeListOf("UU1ZZZ1JZXW000001"), "") << "the catalogue has no list of this maker";
-    EXPECT_EQ(codeListOf("WVW"), "");
-    EXPECT_EQ(codeListOf(std::string(17, '\xFF')), "");
+    auto const holding = [](std::vector<std::string> const& vins) { return chooseMaker("", vins).holding(); };
+    EXPECT_EQ(holding({"WVWZZZ1JZXW000001"}), "Volkswagen");
+    EXPECT_EQ(holding({"", "WVW", std::string(17, '\xFF'), "1G3ZZZ1JZXW000001"}), "GM")
+        << "the catalogue's Oldsmobile list is Ford's";
+    EXPECT_EQ(holding({"WVXZZZ1JZXW000001"}), "") << "a guess by the first two characters";
+    EXPECT_EQ(chooseMaker("", {"WVXZZZ1JZXW000001"}).maker, "Volkswagen") << "which is offered";
+    EXPECT_EQ(chooseMaker("", {"UU1ZZZ1JZXW000001"}).by, MakerChoice::By::Nothing) << "without a list";
+    EXPECT_EQ(chooseMaker("", {}).by, MakerChoice::By::Nothing);
+    EXPECT_EQ(chooseMaker("Ford", {"WVWZZZ1JZXW000001"}).holding(), "Ford") << "the user knows better";
 }
 
 TEST(Vin, IsReadAsTypedAndRefusedWithAReason)

@@ -98,4 +98,33 @@ TEST(CodeReportView, JsonHasNullForAListThatWasNotTold)
     EXPECT_EQ(json["permanent"]["reason"], "busy (21)");
 }
 
+TEST(CodeReportView, GivesMakersCodesTheMeaningOfTheMakerAlone)
+{
+    CodeReport report{true,
+                      {{CodeKind::Confirmed,
+                        Answer::Read,
+                        {},
+                        {{"P1131", "Powertrain", {{"Acura", "One"}, {"Volkswagen", "Two"}}, {}}}}},
+                      {}};
+    auto const text = [&report](MakerChoice::By by, std::string const& maker) {
+        applyMaker(report, {by, maker});
+        return toText(report, Style());
+    };
+    std::string const head = "  Lamp           on\n  Confirmed      1 code\n";
+    std::string const unknown = head + "    P1131  -              maker-specific, 2 meanings\n";
+    EXPECT_EQ(text(MakerChoice::By::Nothing, ""),
+              unknown + "  Meanings       not told; --make MAKER names the maker, -v lists all\n");
+    EXPECT_EQ(text(MakerChoice::By::Guess, "Volkswagen"),
+              unknown + "  Meanings       not told; perhaps Volkswagen's: --make \"Volkswagen\"\n");
+    std::string const known = head + "    P1131  Volkswagen     Two\n";
+    EXPECT_EQ(text(MakerChoice::By::Option, "Volkswagen"), known + "  Meanings       Volkswagen's\n");
+    EXPECT_EQ(text(MakerChoice::By::Vin, "Volkswagen"), known + "  Meanings       Volkswagen's, by the VIN\n");
+    EXPECT_NE(toText(report, Style(false, true)).find("P1131  Acura          One\n"), std::string::npos)
+        << "in detail all are shown";
+    auto const json = toJsonValue(report);
+    EXPECT_EQ(json["maker"].dump(), R"({"name":"Volkswagen","by":"VIN"})");
+    EXPECT_EQ(json["confirmed"]["codes"][0]["meaning"]["text"], "Two");
+    EXPECT_FALSE(hasMakersCodes({true, {listWithCode(CodeKind::Pending)}, {}}));
+}
+
 } // namespace

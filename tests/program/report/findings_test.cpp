@@ -98,4 +98,15 @@ TEST(Findings, AreMarkedByWeight)
     EXPECT_EQ(found[2].severity, Severity::Warning) << "a pending code is none yet";
 }
 
+TEST(Findings, TellNoMakersMeaningAsAFact)
+{
+    VehicleReport report;
+    report.modules = {module(0x10, "ECM")};
+    report.modules[0].codes.lists = {
+        list(CodeKind::Confirmed, {{"P1105", "Powertrain", {{"Acura", "A"}, {"Ford", "F"}}, {}}})};
+    EXPECT_EQ(findings(report).at(0).text, "P1105 maker-specific, 2 meanings");
+    applyMaker(report.modules[0].codes, {MakerChoice::By::Vin, "Ford"});
+    EXPECT_EQ(findings(report).at(0).text, "P1105 F");
+}
+
 } // namespace
