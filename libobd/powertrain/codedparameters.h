@@ -110,11 +110,29 @@ public:
     ObdStandard standard(IEcu const& ecu) const { return static_cast<ObdStandard>(value(ecu, UnitSystem::Metric)); }
 };
 
+template <>
+struct ParameterClass<codedRows, 0x1C>
+{
+    using Type = SaeStandard;
+};
+
 using AuxiliaryInputStatus = CodedParameter<0x1E>;
 using FuelTypeParameter = CodedParameter<0x51>;
 using EmissionStandard = CodedParameter<0x5F>;
 using AuxiliaryIo = CodedParameter<0x65>;
 using NOxControlAreaStatus = CodedParameter<0x7D, ControlAreaStatus>;
 using PmControlAreaStatus = CodedParameter<0x7E, ControlAreaStatus>;
+
+template <>
+struct ParameterClass<codedRows, 0x7D>
+{
+    using Type = NOxControlAreaStatus;
+};
+
+template <>
+struct ParameterClass<codedRows, 0x7E>
+{
+    using Type = PmControlAreaStatus;
+};
 
 } // namespace obd

@@ -53,6 +53,12 @@ static_assert(pidsRise(fuelTrimRows), "PIDs must rise, none twice");
 template <int id>
 using FuelTrimParameter = RowParameter<FuelTrim, fuelTrimRows, id>;
 
+template <int id>
+struct ParameterClass<fuelTrimRows, id>
+{
+    using Type = FuelTrimParameter<id>;
+};
+
 using ShortTermFuelTrimBank1 = FuelTrimParameter<0x06>;
 using LongTermFuelTrimBank1 = FuelTrimParameter<0x07>;
 using ShortTermFuelTrimBank2 = FuelTrimParameter<0x08>;

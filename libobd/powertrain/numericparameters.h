@@ -82,6 +82,12 @@ public:
     unsigned int engineRpm(IEcu const& ecu) const { return static_cast<unsigned int>(value(ecu, UnitSystem::Metric)); }
 };
 
+template <>
+struct ParameterClass<numericRows, 0x0C>
+{
+    using Type = EngineRpm;
+};
+
 using VehicleSpeed = NumericParameter<0x0D>;
 using TimingAdvance = NumericParameter<0x0E>;
 using IntakeAirTemperature = NumericParameter<0x0F>;

@@ -4,6 +4,8 @@
 #include "libobd/powertrain/quantities.h"
 #include "libobd/powertrain/tableparameter.h"
 
+#include <type_traits>
+
 namespace obd {
 
 // An oxygen sensor. The PIDs of each kind, eight in a row, count the sensors; the place of a numbered sensor depends on
@@ -74,6 +76,15 @@ static_assert(allHoldTheirFields(oxygenSensorRows));
 
 template <typename Base, int id>
 using OxygenSensorParameter = RowParameter<Base, oxygenSensorRows, id>;
+
+template <int id>
+struct ParameterClass<oxygenSensorRows, id>
+{
+    static constexpr int firstWideVoltage = 0x24;
+    static constexpr int firstWideCurrent = 0x34;
+    using Wide = std::conditional_t<(id < firstWideCurrent), OxygenSensorErv, OxygenSensorErc>;
+    using Type = OxygenSensorParameter<std::conditional_t<(id < firstWideVoltage), OxygenSensor, Wide>, id>;
+};
 
 using OxygenSensor1Bank1 = OxygenSensorParameter<OxygenSensor, 0x14>;
 using OxygenSensor2Bank1 = OxygenSensorParameter<OxygenSensor, 0x15>;

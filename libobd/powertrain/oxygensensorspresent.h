@@ -34,6 +34,12 @@ inline constexpr ParameterRow oxygenSensorsPresentRows[] = {
 static_assert(pidsRise(oxygenSensorsPresentRows), "PIDs must rise, none twice");
 static_assert(allHoldTheirFields(oxygenSensorsPresentRows));
 
+template <int id>
+struct ParameterClass<oxygenSensorsPresentRows, id>
+{
+    using Type = RowParameter<OxygenSensorsPresent, oxygenSensorsPresentRows, id>;
+};
+
 using OxygenSensorsPresent13 = RowParameter<OxygenSensorsPresent, oxygenSensorsPresentRows, 0x13>;
 using OxygenSensorsPresent1d = RowParameter<OxygenSensorsPresent, oxygenSensorsPresentRows, 0x1D>;
 

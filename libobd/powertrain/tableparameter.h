@@ -60,4 +60,12 @@ public:
     RowParameter(ObdMode mode, unsigned char frame) : Base(rows[rowIndex(rows, id)], mode, frame) {}
 };
 
+// The class of a PID's row, which is made of the row alone. A table whose rows need more, or a row with a class of its
+// own, specialises it beside that class.
+template <auto const& rows, int id>
+struct ParameterClass
+{
+    using Type = RowParameter<TableParameter, rows, id>;
+};
+
 } // namespace obd

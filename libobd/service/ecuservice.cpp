@@ -133,6 +133,13 @@ std::string EcuService::fetchErotan()
     return fetchItem(&Erotan::erotan);
 }
 
+std::vector<std::shared_ptr<ParameterDataModel>> EcuService::furtherParameters()
+{
+    std::shared_ptr<IEcu> const module = ecu();
+    return module != nullptr ? describeFurtherParameters(module, unitSystem())
+                             : std::vector<std::shared_ptr<ParameterDataModel>>();
+}
+
 std::shared_ptr<IEcuService> EcuServiceBuilder::createEcuService()
 {
     return buildService<EcuService>();

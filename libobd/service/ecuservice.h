@@ -29,6 +29,7 @@ public:
     std::string fetchEngineSerialNumber() override;
     bool hasErotan() override;
     std::string fetchErotan() override;
+    std::vector<std::shared_ptr<ParameterDataModel>> furtherParameters() override;
 
 private:
     bool isSupported(ObdMode mode, unsigned char id) const;

@@ -3,6 +3,7 @@
 #include "libobd/powertrain/batteryvoltage.h"
 #include "libobd/powertrain/boostpressure.h"
 #include "libobd/powertrain/consumptionchoice.h"
+#include "libobd/powertrain/parametertables.h"
 #include "libobd/powertrain/sensorpids.h"
 #include "libobd/powertrain/torque.h"
 #include "libobd/service/sensormodels.h"
@@ -18,7 +19,7 @@ namespace {
 
 using Parameters = std::vector<std::shared_ptr<PowertrainParameter>>;
 
-constexpr int lastPid = 0x7F;
+constexpr int lastListedPid = 0x7F;
 constexpr unsigned int anyWeight = 1500;           // kg; no description depends on it
 constexpr ConsumptionSettings anyVehicle{0, 0, 0}; // nor on these
 
@@ -34,7 +35,7 @@ std::shared_ptr<PowertrainParameter> makeParameter(int pid)
 Parameters makeAllParameters(IEcu const& ecu)
 {
     Parameters all;
-    for (int pid = 0; pid <= lastPid; ++pid) {
+    for (int pid = 0; pid <= lastListedPid; ++pid) {
         all.push_back(makeParameter(pid));
     }
     all.push_back(createConsumption(ecu, ecu.ignitionType(), anyVehicle));
@@ -49,6 +50,18 @@ Parameters makeAllParameters(IEcu const& ecu)
 std::string displayName(std::string const& parameter, SensorDescriptor const& sensor, bool alone)
 {
     return alone ? parameter : parameter + ": " + sensor.description();
+}
+
+std::vector<std::shared_ptr<ParameterDataModel>> describeAll(Parameters const& parameters,
+                                                             std::shared_ptr<IEcu> const& ecu, UnitSystem system)
+{
+    std::vector<std::shared_ptr<ParameterDataModel>> models;
+    for (std::shared_ptr<PowertrainParameter> const& parameter : parameters) {
+        if (parameter != nullptr) {
+            models.push_back(describeParameter(parameter, ecu, system));
+        }
+    }
+    return models;
 }
 
 } // namespace
@@ -69,13 +82,19 @@ std::shared_ptr<ParameterDataModel> describeParameter(std::shared_ptr<Powertrain
 std::vector<std::shared_ptr<ParameterDataModel>> describeAllParameters(std::shared_ptr<IEcu> const& ecu,
                                                                        UnitSystem system)
 {
-    std::vector<std::shared_ptr<ParameterDataModel>> models;
-    for (std::shared_ptr<PowertrainParameter> const& parameter : makeAllParameters(*ecu)) {
-        if (parameter != nullptr) {
-            models.push_back(describeParameter(parameter, ecu, system));
+    return describeAll(makeAllParameters(*ecu), ecu, system);
+}
+
+std::vector<std::shared_ptr<ParameterDataModel>> describeFurtherParameters(std::shared_ptr<IEcu> const& ecu,
+                                                                           UnitSystem system)
+{
+    Parameters further;
+    for (int const pid : parameterPids()) {
+        if (pid > lastListedPid) {
+            further.push_back(makeParameter(pid));
         }
     }
-    return models;
+    return describeAll(further, ecu, system);
 }
 
 } // namespace obd

@@ -55,7 +55,10 @@ std::vector<Offer> offers(bool all)
 {
     std::vector<Offer> list;
     auto const service = obd::EcuServiceBuilder::createEcuService();
-    for (auto const& parameter : service->supportedParameters()) {
+    auto parameters = service->supportedParameters();
+    auto const further = service->furtherParameters();
+    parameters.insert(parameters.end(), further.begin(), further.end());
+    for (auto const& parameter : parameters) {
         bool const offered = service->isParameterSupported(parameter);
         if (offered || all) {
             list.push_back({parameter, offered});

@@ -19,8 +19,9 @@ class IEcuService
 public:
     virtual ~IEcuService() = default;
 
-    /// All that the library can show, whether the module supports it or not, in the names, units and ranges of the
-    /// module and the unit system of the settings; without readings.
+    /// All that the library can show of PIDs up to 0x7F, and what it works out, whether the module supports it or not,
+    /// in the names, units and ranges of the module and the unit system of the settings; without readings. PIDs above:
+    /// see furtherParameters.
     virtual std::vector<std::shared_ptr<ParameterDataModel>> supportedParameters() = 0;
     /// Whether the module reports the parameter. The library's own parameters are no PIDs, so it is no judge of them.
     virtual bool isParameterSupported(std::shared_ptr<ParameterDataModel> const& parameter) = 0;
@@ -43,6 +44,9 @@ public:
     /// The exhaust regulation or type approval number.
     virtual bool hasErotan() = 0;
     virtual std::string fetchErotan() = 0;
+
+    /// As supportedParameters, of PIDs above 0x7F.
+    virtual std::vector<std::shared_ptr<ParameterDataModel>> furtherParameters() = 0;
 };
 
 namespace EcuServiceBuilder {
