@@ -22,6 +22,7 @@ void addCommands(CommandLine& commandLine)
     addLogCommand(commandLine);
     addRecordCommand(commandLine);
     addSettingsCommand(commandLine);
+    addSignalsCommand(commandLine);
     addSimulateCommand(commandLine);
     addPortsCommand(commandLine);
 }

@@ -26,6 +26,7 @@ void addRoutinesCommand(CommandLine& commandLine);
 void addScanCommand(CommandLine& commandLine);
 void addSensorsCommand(CommandLine& commandLine);
 void addSettingsCommand(CommandLine& commandLine);
+void addSignalsCommand(CommandLine& commandLine);
 void addSimulateCommand(CommandLine& commandLine);
 void addVinCommand(CommandLine& commandLine);
 

@@ -1,0 +1,126 @@
+#include "libvelmora/report/json.h"
+#include "libvelmora/signal/signalfile.h"
+#include "libvelmora/signal/signalhex.h"
+#include "libvelmora/signal/signalimport.h"
+#include "program/command/commands.h"
+#include "program/commandline.h"
+#include "program/terminal/output.h"
+#include "program/view/layout.h"
+
+#include <velmora/error.h>
+
+#include <CLI/App.hpp>
+#include <fmt/format.h>
+
+#include <memory>
+
+namespace velmora::cli {
+
+namespace {
+
+struct SignalOptions
+{
+    CLI::App* import = nullptr;
+    CLI::App* check = nullptr;
+    CLI::App* list = nullptr;
+    std::string source;
+    std::vector<std::string> files;
+};
+
+void tellAll(std::vector<SignalMistake> const& mistakes, std::string const& path)
+{
+    for (SignalMistake const& each : mistakes) {
+        tell(toText(each, path) + "\n");
+    }
+}
+
+ExitCode importFile(SignalOptions const& options, bool json)
+{
+    SignalImport const import = importSignalFile(options.source);
+    tellAll(import.notes, options.source);
+    tellAll(import.refused, options.source);
+    tell(fmt::format("{} taken, {} left out\n", counted(import.file.signals.size(), "signal"), import.refused.size()));
+    if (json) {
+        fmt::print("{}", printed(toJsonValue(import.file)));
+    } else {
+        fmt::print("{}", toToml(import.file));
+    }
+    if (import.file.signals.empty()) {
+        throw Error(ErrorKind::Failed, "Nothing of " + options.source + " could be taken");
+    }
+    return ExitCode::Done;
+}
+
+ExitCode checkFiles(SignalOptions const& options)
+{
+    bool sound = true;
+    for (std::string const& path : options.files) {
+        SignalFileReading const reading = checkSignalFile(path);
+        tellAll(reading.mistakes, path);
+        sound = sound && reading.mistakes.empty();
+        if (reading.mistakes.empty()) {
+            fmt::print("{}: {}\n", path, counted(reading.file.signals.size(), "signal"));
+        }
+    }
+    return sound ? ExitCode::Done : ExitCode::WrongUse;
+}
+
+std::vector<Cell> row(Signal const& signal)
+{
+    std::string const how = signal.enabled ? signal.reason : "off: " + signal.reason;
+    return {{signal.id},
+            {signal.name},
+            {signal.header.empty() ? "-" : signal.header},
+            {signal.request.empty() ? "-" : hexText(signal.request)},
+            {signal.unit},
+            {how}};
+}
+
+ExitCode listFiles(SignalOptions const& options, GlobalOptions const& global)
+{
+    Json document = Json::array();
+    for (std::string const& path : options.files) {
+        SignalFile const file = loadSignalFile(path);
+        if (global.json) {
+            document.push_back(toJsonValue(file));
+            continue;
+        }
+        std::vector<std::vector<Cell>> rows;
+        for (Signal const& signal : file.signals) {
+            rows.push_back(row(signal));
+        }
+        fmt::print("{}\n{}", path, drawColumns(rows, "  ", outputStyle(global)));
+    }
+    if (global.json) {
+        fmt::print("{}", printed(document));
+    }
+    return ExitCode::Done;
+}
+
+ExitCode runSignals(SignalOptions const& options, GlobalOptions const& global)
+{
+    if (options.import->parsed()) {
+        return importFile(options, global.json);
+    }
+    return options.check->parsed() ? checkFiles(options) : listFiles(options, global);
+}
+
+} // namespace
+
+void addSignalsCommand(CommandLine& commandLine)
+{
+    auto const options = std::make_shared<SignalOptions>();
+    CLI::App* const command =
+        commandLine.addCommand("signals", "Signals of your own: read, check and import their files",
+                               [options](GlobalOptions const& global) { return runSignals(*options, global); });
+    command->require_subcommand(1);
+    options->import = command->add_subcommand("import", "Write the signals of another tool's file as a signal file");
+    options->import->add_option("FILE", options->source, "CSV of phone apps, or JSON of OBDb, WiCAN or ABRP")
+        ->required();
+    options->check = command->add_subcommand("check", "Tell all mistakes of signal files");
+    options->check->add_option("FILE", options->files, "Signal files")->required();
+    options->list = command->add_subcommand("list", "List the signals of signal files");
+    options->list->add_option("FILE", options->files, "Signal files")->required();
+}
+
+} // namespace velmora::cli
