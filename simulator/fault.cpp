@@ -115,35 +115,6 @@ Fault parseByValue(std::string const& text, FaultForm const& form, Fault fault, 
     return fault;
 }
 
-Fault parseFault(std::string const& text)
-{
-    auto const mark = text.find_first_of("=@:");
-    const std::string name = text.substr(0, mark);
-    auto const form =
-        std::find_if(std::begin(forms), std::end(forms), [&](FaultForm const& f) { return f.name == name; });
-    if (form == std::end(forms) || mark == std::string::npos) {
-        fail(text, usage);
-    }
-    Fault fault;
-    fault.kind = form->kind;
-    std::string rest = text.substr(mark);
-    if (form->kind == FaultKind::Error) {
-        auto const end = rest.find_last_of("=@");
-        if (rest[0] != ':' || end == std::string::npos || end < 2) {
-            fail(text, usage);
-        }
-        fault.word = rest.substr(1, end - 1);
-        rest = rest.substr(end);
-    }
-    if (rest[0] == '@') {
-        return parseAtPlace(text, *form, fault, rest.substr(1));
-    }
-    if (rest[0] == '=') {
-        return parseByValue(text, *form, fault, rest.substr(1));
-    }
-    fail(text, usage);
-}
-
 Quirk parseQuirk(std::string const& text, std::string const& name)
 {
     auto const quirk = findQuirk(name);
@@ -179,6 +150,35 @@ int parseBaud(std::string const& text, std::string const& value)
 }
 
 } // namespace
+
+Fault parseFault(std::string const& text)
+{
+    auto const mark = text.find_first_of("=@:");
+    const std::string name = text.substr(0, mark);
+    auto const form =
+        std::find_if(std::begin(forms), std::end(forms), [&](FaultForm const& f) { return f.name == name; });
+    if (form == std::end(forms) || mark == std::string::npos) {
+        fail(text, usage);
+    }
+    Fault fault;
+    fault.kind = form->kind;
+    std::string rest = text.substr(mark);
+    if (form->kind == FaultKind::Error) {
+        auto const end = rest.find_last_of("=@");
+        if (rest[0] != ':' || end == std::string::npos || end < 2) {
+            fail(text, usage);
+        }
+        fault.word = rest.substr(1, end - 1);
+        rest = rest.substr(end);
+    }
+    if (rest[0] == '@') {
+        return parseAtPlace(text, *form, fault, rest.substr(1));
+    }
+    if (rest[0] == '=') {
+        return parseByValue(text, *form, fault, rest.substr(1));
+    }
+    fail(text, usage);
+}
 
 FaultPlan parseFaults(std::vector<std::string> const& texts)
 {

@@ -54,4 +54,7 @@ struct FaultPlan
 /// "quirk:prompt-late", "seed=7". Throws FaultError for any other.
 FaultPlan parseFaults(std::vector<std::string> const& texts);
 
+/// Reads one text that is a fault: none of quirks, times and seed.
+Fault parseFault(std::string const& text);
+
 } // namespace obdsim

@@ -15,8 +15,30 @@ FaultyPeer::FaultyPeer(std::shared_ptr<IPeer> inner, FaultPlan plan)
     : m_inner(std::move(inner)), m_plan(std::move(plan)), m_random(m_plan.seed)
 {}
 
+/// Without faults nothing is counted, and the places of the first one count from zero.
+void FaultyPeer::add(Fault fault)
+{
+    bool const byCommand = fault.kind == FaultKind::Prompt || fault.kind == FaultKind::Error;
+    fault.position += fault.position == 0 ? 0 : byCommand ? m_command : m_byte;
+    m_plan.faults.push_back(std::move(fault));
+}
+
+void FaultyPeer::clear()
+{
+    m_plan.faults.clear();
+}
+
+void FaultyPeer::breakLink()
+{
+    m_linkUp = false;
+}
+
 void FaultyPeer::receive(std::string_view bytes)
 {
+    if (m_plan.faults.empty() && m_linkUp) {
+        m_inner->receive(bytes);
+        return;
+    }
     for (char const byte : bytes) {
         if (!m_linkUp) {
             return;
@@ -57,6 +79,9 @@ std::optional<Time> FaultyPeer::nextOutput() const
 
 std::string FaultyPeer::advanceTo(Time time)
 {
+    if (m_plan.faults.empty() && m_linkUp && !m_output.next()) {
+        return m_inner->advanceTo(time);
+    }
     pull(time);
     m_inner->advanceTo(time);
     return m_output.take(now());

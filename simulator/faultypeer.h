@@ -22,6 +22,15 @@ public:
     void connect() override;
     bool linkIsUp() const override;
 
+    /// One more fault, whose place counts from here on.
+    void add(Fault fault);
+
+    /// All faults end; a broken link stays broken.
+    void clear();
+
+    /// The link breaks now, until the next connection.
+    void breakLink();
+
 private:
     void startCommand();
     void pull(Time time);

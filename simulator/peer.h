@@ -27,6 +27,9 @@ public:
     /// When the next output is due; nothing if none is under way.
     virtual std::optional<Time> nextOutput() const = 0;
 
+    /// When something happens to the peer by itself, though it may put nothing out: a line of a scenario.
+    virtual std::optional<Time> nextWake() const { return nextOutput(); }
+
     /// Moves the clock to `time` and returns all that was put out up to then,
     /// in order. A time in the past leaves the clock where it is.
     virtual std::string advanceTo(Time time) = 0;

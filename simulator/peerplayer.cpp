@@ -26,11 +26,21 @@ void PeerPlayer::connect(Output output, LinkLost linkLost)
 
 void PeerPlayer::receive(std::string_view bytes)
 {
+    catchUp();
+    m_peer->receive(bytes);
+    arm();
+}
+
+void PeerPlayer::catchUp()
+{
     const std::string before = m_peer->advanceTo(virtualNow());
     if (m_output && !before.empty()) {
         m_output(before);
     }
-    m_peer->receive(bytes);
+}
+
+void PeerPlayer::goOn()
+{
     arm();
 }
 
@@ -53,7 +63,7 @@ void PeerPlayer::arm()
     if (!m_output) {
         return;
     }
-    auto const next = m_peer->nextOutput();
+    auto const next = m_peer->nextWake();
     if (!next && m_peer->linkIsUp()) {
         m_timer.cancel();
         return;

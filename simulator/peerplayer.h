@@ -27,6 +27,12 @@ public:
 
     void receive(std::string_view bytes);
 
+    /// Moves the peer's clock to now and hands out what it has said.
+    void catchUp();
+
+    /// The peer was changed from outside: what it does next may come sooner.
+    void goOn();
+
     /// The client has gone.
     void disconnect();
 

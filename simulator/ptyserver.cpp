@@ -32,10 +32,11 @@ void makeRaw(int descriptor)
     }
 }
 
-class PtyServer : public ServerLoop
+class PtyEndpoint : public Endpoint
 {
 public:
-    PtyServer(std::shared_ptr<IPeer> peer, double speed) : ServerLoop(std::move(peer), speed), m_master(context())
+    PtyEndpoint(asio::io_context& context, std::shared_ptr<IPeer> peer, double speed)
+        : Endpoint(context, std::move(peer), speed), m_master(context)
     {
         int const master = posix_openpt(O_RDWR | O_NOCTTY | O_NONBLOCK | O_CLOEXEC);
         if (master < 0) {
@@ -55,15 +56,12 @@ public:
         makeRaw(m_slave);
     }
 
-    ~PtyServer() override
-    {
-        stop();
-        closeSlave();
-    }
+    ~PtyEndpoint() override { closeSlave(); }
+    PtyEndpoint(PtyEndpoint const&) = delete;
+    PtyEndpoint& operator=(PtyEndpoint const&) = delete;
 
     std::string address() const override { return m_path; }
 
-protected:
     void begin() override
     {
         player().connect([this](std::string const& bytes) { send(bytes); }, [this] { hangUp(); });
@@ -113,9 +111,18 @@ private:
 
 } // namespace
 
+std::unique_ptr<IServer> servePseudoTerminals(Peers const& peers, double speed)
+{
+    auto server = std::make_unique<ServerLoop>();
+    for (auto const& peer : peers) {
+        server->add(std::make_unique<PtyEndpoint>(server->context(), peer, speed));
+    }
+    return server;
+}
+
 std::unique_ptr<IServer> servePseudoTerminal(std::shared_ptr<IPeer> peer, double speed)
 {
-    return std::make_unique<PtyServer>(std::move(peer), speed);
+    return servePseudoTerminals(Peers{std::move(peer)}, speed);
 }
 
 } // namespace obdsim

@@ -4,7 +4,10 @@
 #include "simulator/peer.h"
 
 #include <cstdint>
+#include <functional>
 #include <memory>
+#include <string>
+#include <vector>
 
 namespace obdsim {
 
@@ -24,8 +27,11 @@ class IServer
 public:
     virtual ~IServer() = default;
 
-    /// What clients connect to: "127.0.0.1:35000", or the path of a device.
+    /// What clients connect to: "127.0.0.1:35000", or the path of a device. Of a fleet the first.
     virtual std::string address() const = 0;
+
+    /// One for each peer.
+    virtual std::vector<std::string> addresses() const = 0;
 
     /// Serves on the calling thread until stop().
     virtual void run() = 0;
@@ -34,7 +40,19 @@ public:
     virtual void start() = 0;
 
     virtual void stop() = 0;
+
+    /// Does `action` on the server's thread as soon as it can, with the clock of every peer moved to now. What changes
+    /// a peer from outside goes this way. Before the server runs it waits for it.
+    virtual void perform(std::function<void()> action) = 0;
 };
+
+using Peers = std::vector<std::shared_ptr<IPeer>>;
+
+/// Listens on one TCP port for each peer, from `port` on; port 0 takes free ones. Throws ServerError.
+std::unique_ptr<IServer> serveTcp(Peers const& peers, std::string const& host, std::uint16_t port, double speed = 1);
+
+/// One pseudo-terminal for each peer. Throws ServerError.
+std::unique_ptr<IServer> servePseudoTerminals(Peers const& peers, double speed = 1);
 
 /// Listens on a TCP port; port 0 takes a free one. `speed` makes the simulated
 /// time run faster. Throws ServerError.

@@ -1,12 +1,38 @@
 #include "simulator/serverloop.h"
 
+#include <asio/post.hpp>
+
 namespace obdsim {
 
-ServerLoop::ServerLoop(std::shared_ptr<IPeer> peer, double speed) : m_player(m_context, std::move(peer), speed) {}
+ServerLoop::~ServerLoop()
+{
+    ServerLoop::stop();
+}
+
+void ServerLoop::add(std::unique_ptr<Endpoint> endpoint)
+{
+    m_endpoints.push_back(std::move(endpoint));
+}
+
+std::string ServerLoop::address() const
+{
+    return m_endpoints.front()->address();
+}
+
+std::vector<std::string> ServerLoop::addresses() const
+{
+    std::vector<std::string> all;
+    for (auto const& endpoint : m_endpoints) {
+        all.push_back(endpoint->address());
+    }
+    return all;
+}
 
 void ServerLoop::run()
 {
-    begin();
+    for (auto const& endpoint : m_endpoints) {
+        endpoint->begin();
+    }
     m_context.run();
 }
 
@@ -25,14 +51,25 @@ void ServerLoop::stop()
     }
 }
 
+void ServerLoop::perform(std::function<void()> action)
+{
+    asio::post(m_context, [this, action = std::move(action)] { atOnce(action); });
+}
+
+void ServerLoop::atOnce(std::function<void()> const& action)
+{
+    for (auto const& endpoint : m_endpoints) {
+        endpoint->player().catchUp();
+    }
+    action();
+    for (auto const& endpoint : m_endpoints) {
+        endpoint->player().goOn();
+    }
+}
+
 asio::io_context& ServerLoop::context()
 {
     return m_context;
-}
-
-PeerPlayer& ServerLoop::player()
-{
-    return m_player;
 }
 
 } // namespace obdsim

@@ -4,6 +4,7 @@
 #include "simulator/faultypeer.h"
 #include "simulator/linerate.h"
 #include "simulator/replayscript.h"
+#include "simulator/simulatedcar.h"
 
 namespace obdsim {
 
@@ -40,15 +41,45 @@ std::shared_ptr<IPeer> onTheWire(std::shared_ptr<Adapter> const& adapter, FaultP
     return baud == 0 ? peer : std::make_shared<LineRate>(std::move(peer), baud);
 }
 
+/// What only a car can judge of a scenario is judged before it begins.
+void rehearse(SimulatedCar& car, std::vector<ScenarioLine> const& scenario)
+{
+    for (auto const& line : scenario) {
+        try {
+            car.advanceTo(line.time);
+            car.control(line.command);
+        } catch (ControlError const& error) {
+            throw ControlError(line.place + ": " + error.what());
+        }
+    }
+}
+
 } // namespace
 
-std::shared_ptr<IPeer> simulate(SimulationOptions const& options)
+std::vector<std::shared_ptr<SimulatedCar>> simulateFleet(SimulationOptions const& options, std::size_t count)
 {
     const FaultPlan plan = parseFaults(options.faults);
     AdapterProfile profile = adapterProfile(options.adapter);
     apply(plan, profile);
-    auto vehicle = std::make_shared<Vehicle>(loadVehicle(options.vehicle));
-    return onTheWire(std::make_shared<Adapter>(std::move(profile), std::move(vehicle)), plan);
+    const VehicleData vehicle = loadVehicle(options.vehicle);
+    auto const scenario = options.scenario.empty() ? std::vector<ScenarioLine>() : loadScenario(options.scenario);
+    SimulatedCar trial(vehicle, profile, plan);
+    rehearse(trial, scenario);
+    std::vector<std::shared_ptr<SimulatedCar>> cars;
+    for (std::size_t i = 0; i < count; ++i) {
+        cars.push_back(std::make_shared<SimulatedCar>(vehicle, profile, plan, scenario));
+    }
+    return cars;
+}
+
+std::shared_ptr<SimulatedCar> simulateCar(SimulationOptions const& options)
+{
+    return simulateFleet(options, 1).front();
+}
+
+std::shared_ptr<IPeer> simulate(SimulationOptions const& options)
+{
+    return simulateCar(options);
 }
 
 std::shared_ptr<IPeer> replay(std::string const& path, std::vector<std::string> const& faults)
@@ -68,6 +99,27 @@ std::vector<std::string> simulatedVehicles()
 std::vector<std::string> simulatedAdapters()
 {
     return profileKeys();
+}
+
+std::vector<std::string> faultForms()
+{
+    std::vector<std::string> forms = {
+        "garbage=P",     "nul=P",      "prompt=P",  "prompt@COMMAND", "cut@BYTE",
+        "stall@BYTE:MS", "slow=MS",    "loss@BYTE", "error:WORDS=P",  "error:WORDS@COMMAND",
+        "echo",          "command=MS", "wait=MS",   "baud=RATE",      "seed=N"};
+    for (auto const& quirk : quirkNames()) {
+        forms.push_back("quirk:" + quirk);
+    }
+    return forms;
+}
+
+std::vector<std::string> controlForms()
+{
+    std::vector<std::string> forms;
+    for (auto const& each : Control::forms()) {
+        forms.push_back(std::string(each.form) + ": " + each.help);
+    }
+    return forms;
 }
 
 } // namespace obdsim

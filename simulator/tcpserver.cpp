@@ -14,20 +14,18 @@ using asio::ip::tcp;
 
 /// Accepts a client when the one before has gone; the others wait in the queue of
 /// the system, as before a real adapter that speaks to one host at a time.
-class TcpServer : public ServerLoop
+class TcpEndpoint : public Endpoint
 {
 public:
-    TcpServer(std::shared_ptr<IPeer> peer, std::string const& host, std::uint16_t port, double speed)
-        : ServerLoop(std::move(peer), speed), m_acceptor(context()), m_socket(context())
+    TcpEndpoint(asio::io_context& context, std::shared_ptr<IPeer> peer, std::string const& host, std::uint16_t port,
+                double speed)
+        : Endpoint(context, std::move(peer), speed), m_context(context), m_acceptor(context), m_socket(context)
     {
         listen(host, port);
     }
 
-    ~TcpServer() override { stop(); }
-
     std::string address() const override { return m_address; }
 
-protected:
     void begin() override { accept(); }
 
 private:
@@ -40,7 +38,7 @@ private:
     void listen(std::string const& host, std::uint16_t port)
     {
         try {
-            auto const endpoints = tcp::resolver(context()).resolve(host, std::to_string(port));
+            auto const endpoints = tcp::resolver(m_context).resolve(host, std::to_string(port));
             const tcp::endpoint endpoint = *endpoints.begin();
             m_acceptor.open(endpoint.protocol());
             m_acceptor.set_option(tcp::acceptor::reuse_address(true));
@@ -112,6 +110,7 @@ private:
         m_unsent.clear();
     }
 
+    asio::io_context& m_context;
     tcp::acceptor m_acceptor;
     tcp::socket m_socket;
     std::string m_address;
@@ -121,10 +120,25 @@ private:
 
 } // namespace
 
+std::unique_ptr<IServer> serveTcp(Peers const& peers, std::string const& host, std::uint16_t port, double speed)
+{
+    constexpr std::size_t lastPort = 0xFFFF;
+    if (port != 0 && port + peers.size() - 1 > lastPort) {
+        throw ServerError("there are no " + std::to_string(peers.size()) + " ports from " + std::to_string(port) +
+                          " on");
+    }
+    auto server = std::make_unique<ServerLoop>();
+    for (std::size_t i = 0; i < peers.size(); ++i) {
+        auto const own = static_cast<std::uint16_t>(port == 0 ? 0 : port + i);
+        server->add(std::make_unique<TcpEndpoint>(server->context(), peers[i], host, own, speed));
+    }
+    return server;
+}
+
 std::unique_ptr<IServer> serveTcp(std::shared_ptr<IPeer> peer, std::string const& host, std::uint16_t port,
                                   double speed)
 {
-    return std::make_unique<TcpServer>(std::move(peer), host, port, speed);
+    return serveTcp(Peers{std::move(peer)}, host, port, speed);
 }
 
 } // namespace obdsim

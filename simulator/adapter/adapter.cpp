@@ -79,6 +79,11 @@ AdapterProfile const& Adapter::profile() const
     return m_profile;
 }
 
+RequestLog const& Adapter::requests() const
+{
+    return m_requests;
+}
+
 void Adapter::receiveOne(char character)
 {
     settle();
@@ -157,6 +162,7 @@ void Adapter::execute(std::string const& line)
         return;
     }
     m_last = command;
+    m_requests.add(m_now, command);
     if (command.compare(0, 2, "AT") == 0) {
         executeCommand(command);
     } else if (chipCommand(command) == "ST" || chipCommand(command) == "VT") {

@@ -2,6 +2,7 @@
 
 #include "simulator/adapter/command.h"
 #include "simulator/outputqueue.h"
+#include "simulator/requestlog.h"
 
 namespace obdsim {
 
@@ -41,6 +42,9 @@ public:
 
     AdapterProfile const& profile() const;
 
+    /// What was asked so far.
+    RequestLog const& requests() const;
+
 private:
     enum class State : int
     {
@@ -75,6 +79,7 @@ private:
     Settings m_settings;
     BusLink m_bus;
     OutputQueue m_output;
+    RequestLog m_requests;
     std::string m_line;
     std::string m_last;
     std::string m_heldBack; ///< end of a reply that waits for the next command

@@ -81,6 +81,11 @@ bool BusLink::isOpen() const
     return m_open;
 }
 
+bool BusLink::ignition() const
+{
+    return !m_vehicle || m_vehicle->ignition();
+}
+
 double BusLink::volts(Time now) const
 {
     return m_vehicle ? m_vehicle->volts(now) : unpoweredVolts;
@@ -90,6 +95,12 @@ BusReply BusLink::request(BusRequest const& request, Settings const& settings, T
 {
     BusReply reply;
     if (!m_open && !establish(reply)) {
+        return reply;
+    }
+    if (isCan(*protocol()) && !m_vehicle->isAwake()) {
+        // The car has gone to sleep: nobody acknowledges a frame.
+        reply.end += protocol()->probe;
+        reply.texts.push_back({reply.end, "CAN ERROR\r"});
         return reply;
     }
     bool const first = !m_asked;
@@ -167,7 +178,7 @@ BusReply BusLink::wake(BusInit init)
 
 bool BusLink::reaches(Protocol const& candidate) const
 {
-    return m_vehicle && &m_vehicle->protocol() == &candidate;
+    return m_vehicle && m_vehicle->isAwake() && &m_vehicle->protocol() == &candidate;
 }
 
 /// What comes of a request on a bus that the car does not have: a CAN controller
@@ -177,7 +188,7 @@ void BusLink::fail(BusReply& reply) const
 {
     Protocol const* chosen = protocol();
     bool const canOrOther = chosen == nullptr || isCan(*chosen);
-    bool const sameRate = chosen != nullptr && m_vehicle && isCan(m_vehicle->protocol()) &&
+    bool const sameRate = chosen != nullptr && m_vehicle && m_vehicle->isAwake() && isCan(m_vehicle->protocol()) &&
                           m_vehicle->protocol().kilobaud == chosen->kilobaud;
     reply.end += chosen == nullptr ? Ms(100) : chosen->probe;
     reply.texts.push_back({reply.end, canOrOther && !sameRate ? "CAN ERROR\r" : "NO DATA\r"});

@@ -50,6 +50,9 @@ public:
 
     double volts(Time now) const;
 
+    /// What the ignition pin tells; on without a car.
+    bool ignition() const;
+
 private:
     bool establish(BusReply& reply);
     bool search(BusReply& reply);

@@ -79,9 +79,9 @@ CommandReply voltage(CommandContext& context, std::string const& /*argument*/)
     return line(std::to_string(tenths / 10) + "." + std::to_string(tenths % 10) + "V");
 }
 
-CommandReply ignition(CommandContext& /*context*/, std::string const& /*argument*/)
+CommandReply ignition(CommandContext& context, std::string const& /*argument*/)
 {
-    return line("ON");
+    return line(context.bus.ignition() ? "ON" : "OFF");
 }
 
 CommandReply parameters(CommandContext& /*context*/, std::string const& /*argument*/)

@@ -51,7 +51,7 @@ std::optional<Bytes> frameItem(Module const& module, FreezeFrame const& frame, s
         return value->second;
     }
     bool const kept = std::find(frame.pids.begin(), frame.pids.end(), pid) != frame.pids.end();
-    return kept ? module.currentData(pid, frame.takenAt) : std::nullopt;
+    return kept ? module.keptData(pid, frame.takenAt) : std::nullopt;
 }
 
 /// A module without a frame still tells that there is no code behind it (0000 in SAE J1979), and, of the one frame that

@@ -21,7 +21,8 @@ struct EngineData
 /// A moment of the drive, in the units of the standard's PIDs.
 struct DriveState
 {
-    double seconds = 0; ///< since the engine was started
+    double seconds = 0;      ///< since the engine was started
+    double totalSeconds = 0; ///< of running engine since the simulation began
     double speedKmh = 0;
     double rpm = 0;
     double loadPercent = 0;

@@ -2,6 +2,8 @@
 
 #include "simulator/car/services.h"
 
+#include <algorithm>
+
 namespace obdsim {
 
 namespace {
@@ -18,10 +20,10 @@ void setAllIncomplete(MonitorBits& bits)
 
 } // namespace
 
-Module::Module(ModuleData data, EngineData const& engine, DataLayout layout)
-    : m_data(std::move(data)), m_drive(engine), m_layout(layout)
+Module::Module(ModuleData data, bool compression, Drive const& drive, DataLayout layout)
+    : m_data(std::move(data)), m_drive(drive), m_layout(layout)
 {
-    if (engine.compression && m_data.monitors) {
+    if (compression && m_data.monitors) {
         m_data.monitors->sinceCleared.continuous |= compressionBit;
         m_data.monitors->thisCycle.continuous |= compressionBit;
     }
@@ -62,25 +64,70 @@ DataLayout Module::layout() const
 
 std::optional<Bytes> Module::currentData(std::uint8_t pid, Time now) const
 {
+    if (auto const changed = m_values.find(pid); changed != m_values.end()) {
+        return changed->second;
+    }
+    return data(pid, m_drive.at(now));
+}
+
+std::optional<Bytes> Module::keptData(std::uint8_t pid, Time then) const
+{
+    return data(pid, m_drive.planned(then));
+}
+
+std::optional<Bytes> Module::data(std::uint8_t pid, DriveState const& drive) const
+{
     if (m_data.monitors && (pid == monitorsSinceCleared || pid == monitorsThisCycle)) {
         return monitorWord(pid == monitorsThisCycle);
     }
     if (auto const fixed = m_data.fixed.find(pid); fixed != m_data.fixed.end()) {
         return fixed->second;
     }
-    for (auto const live : m_data.live) {
-        if (live == pid) {
-            const DriveState drive = m_drive.at(now);
-            return livePid(pid, drive, sinceCleared(drive));
-        }
+    bool const live = std::find(m_data.live.begin(), m_data.live.end(), pid) != m_data.live.end();
+    return live ? livePid(pid, drive, sinceCleared(drive)) : std::nullopt;
+}
+
+void Module::addCode(CodeKind kind, std::uint16_t code)
+{
+    bool& has = kind == CodeKind::Stored    ? m_data.hasStored
+                : kind == CodeKind::Pending ? m_data.hasPending
+                                            : m_data.hasPermanent;
+    auto& codes = kind == CodeKind::Stored    ? m_data.stored
+                  : kind == CodeKind::Pending ? m_data.pending
+                                              : m_data.permanent;
+    has = true;
+    if (std::find(codes.begin(), codes.end(), code) == codes.end()) {
+        codes.push_back(code);
     }
-    return std::nullopt;
+    m_data.lamp = m_data.lamp || kind == CodeKind::Stored;
+}
+
+void Module::setValue(std::uint8_t pid, std::optional<Bytes> const& data)
+{
+    if (data) {
+        m_values[pid] = *data;
+    } else {
+        m_values.erase(pid);
+    }
+}
+
+void Module::setSilent(bool silent)
+{
+    m_silent = silent;
+}
+
+bool Module::isSilent() const
+{
+    return m_silent;
 }
 
 std::vector<std::uint8_t> Module::currentPids() const
 {
     std::vector<std::uint8_t> pids = m_data.live;
     for (auto const& [pid, data] : m_data.fixed) {
+        pids.push_back(pid);
+    }
+    for (auto const& [pid, data] : m_values) {
         pids.push_back(pid);
     }
     if (m_data.monitors) {
@@ -112,7 +159,7 @@ void Module::clear(Time now)
         m_data.monitors->sinceCleared.continuousIncomplete &= static_cast<std::uint8_t>(~compressionBit);
         m_data.monitors->thisCycle.continuousIncomplete &= static_cast<std::uint8_t>(~compressionBit);
     }
-    m_clearedAt = now;
+    m_cleared = m_drive.at(now);
 }
 
 Bytes Module::monitorWord(bool thisCycle) const
@@ -128,15 +175,14 @@ Bytes Module::monitorWord(bool thisCycle) const
 SinceCleared Module::sinceCleared(DriveState const& drive) const
 {
     SinceCleared result;
-    result.seconds = drive.seconds;
+    result.seconds = drive.totalSeconds;
     result.kilometres = drive.kilometres + m_data.kilometresSinceCleared;
     result.warmUps = m_data.warmUps;
-    if (m_clearedAt) {
-        const DriveState then = m_drive.at(*m_clearedAt);
-        result = {drive.seconds - then.seconds, drive.kilometres - then.kilometres, 0, 0, 0};
+    if (m_cleared) {
+        result = {drive.totalSeconds - m_cleared->totalSeconds, drive.kilometres - m_cleared->kilometres, 0, 0, 0};
     }
     if (m_data.lamp) {
-        result.lampSeconds = drive.seconds;
+        result.lampSeconds = drive.totalSeconds;
         result.lampKilometres = drive.kilometres;
     }
     return result;

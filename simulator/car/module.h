@@ -1,5 +1,6 @@
 #pragma once
 
+#include "simulator/car/drive.h"
 #include "simulator/car/livepids.h"
 #include "simulator/car/moduledata.h"
 
@@ -22,12 +23,21 @@ struct Answer
     bool isSilent() const { return messages.empty() && refusal == 0; }
 };
 
+/// The services with trouble codes.
+enum class CodeKind : int
+{
+    Stored,
+    Pending,
+    Permanent
+};
+
 /// A control module at work: its data from the vehicle file, and what the
-/// clearing of codes has changed since.
+/// clearing of codes and hands have changed since.
 class Module
 {
 public:
-    Module(ModuleData data, EngineData const& engine, DataLayout layout);
+    /// `drive` must outlive this.
+    Module(ModuleData data, bool compression, Drive const& drive, DataLayout layout);
 
     /// The answer to `request` (service byte first) at `now`.
     Answer answer(Bytes const& request, Time now);
@@ -41,6 +51,18 @@ public:
     /// The PIDs of mode 01 for which currentData() has something.
     std::vector<std::uint8_t> currentPids() const;
 
+    /// The same of a moment that the module has kept: what was changed by hand is not in it.
+    std::optional<Bytes> keptData(std::uint8_t pid, Time then) const;
+
+    /// Adds a trouble code, with the lamp for a stored one.
+    void addCode(CodeKind kind, std::uint16_t code);
+
+    /// Gives a PID of mode 01 these bytes; nothing gives it back to the drive.
+    void setValue(std::uint8_t pid, std::optional<Bytes> const& data);
+
+    void setSilent(bool silent);
+    bool isSilent() const;
+
     /// True while the engine turns.
     bool engineRuns(Time now) const;
 
@@ -52,12 +74,15 @@ public:
 private:
     Answer fromServices(Bytes const& request, Time now);
     Bytes monitorWord(bool thisCycle) const;
+    std::optional<Bytes> data(std::uint8_t pid, DriveState const& drive) const;
     SinceCleared sinceCleared(DriveState const& drive) const;
 
     ModuleData m_data;
-    DriveModel m_drive;
+    Drive const& m_drive;
     DataLayout m_layout;
-    std::optional<Time> m_clearedAt;
+    std::optional<DriveState> m_cleared; ///< the moment of it
+    std::map<std::uint8_t, Bytes> m_values;
+    bool m_silent = false;
 };
 
 } // namespace obdsim

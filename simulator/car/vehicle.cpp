@@ -55,7 +55,7 @@ Vehicle::Vehicle(VehicleData const& data)
 {
     const DataLayout layout = isCan(m_protocol) ? DataLayout::Can : DataLayout::Numbered;
     for (auto const& module : data.modules) {
-        m_modules.emplace_back(module, data.engine, layout);
+        m_modules.emplace_back(module, data.engine.compression, m_drive, layout);
     }
 }
 
@@ -76,17 +76,56 @@ Padding Vehicle::padding() const
 
 double Vehicle::volts(Time now) const
 {
-    return m_volts.value_or(m_drive.at(now).volts);
+    constexpr double batteryVolts = 12.4;
+    double const usual = m_ignition ? m_volts.value_or(m_drive.at(now).volts) : batteryVolts;
+    return m_chosenVolts.value_or(usual);
+}
+
+bool Vehicle::isAwake() const
+{
+    return m_ignition && !m_modules.empty();
+}
+
+bool Vehicle::ignition() const
+{
+    return m_ignition;
+}
+
+void Vehicle::setIgnition(bool on)
+{
+    m_ignition = on;
+}
+
+void Vehicle::setVolts(std::optional<double> volts)
+{
+    m_chosenVolts = volts;
+}
+
+Drive& Vehicle::drive()
+{
+    return m_drive;
+}
+
+std::deque<Module>& Vehicle::modules()
+{
+    return m_modules;
+}
+
+Module* Vehicle::findModule(std::uint32_t id)
+{
+    auto const found =
+        std::find_if(m_modules.begin(), m_modules.end(), [id](Module const& each) { return each.data().id == id; });
+    return found == m_modules.end() ? nullptr : &*found;
 }
 
 std::vector<ModuleMessage> Vehicle::request(Target const& target, Bytes const& payload, Time now)
 {
     std::vector<ModuleMessage> messages;
-    if (payload.empty()) {
+    if (payload.empty() || !isAwake()) {
         return messages;
     }
     for (auto& module : m_modules) {
-        if (target.everyone || target.module == module.data().id) {
+        if (!module.isSilent() && (target.everyone || target.module == module.data().id)) {
             tell(messages, module, payload, now);
         }
     }

@@ -2,6 +2,8 @@
 
 #include "simulator/car/module.h"
 
+#include <deque>
+
 namespace obdsim {
 
 /// One message of one module, before the bus cuts it into frames.
@@ -18,6 +20,8 @@ class Vehicle
 {
 public:
     explicit Vehicle(VehicleData const& data);
+    Vehicle(Vehicle const&) = delete;
+    Vehicle& operator=(Vehicle const&) = delete;
 
     std::string const& name() const;
     Protocol const& protocol() const;
@@ -25,6 +29,21 @@ public:
 
     /// Voltage at the diagnostic socket.
     double volts(Time now) const;
+
+    /// Anything on the bus: the ignition is on and there is a module.
+    bool isAwake() const;
+
+    bool ignition() const;
+    void setIgnition(bool on);
+
+    /// A voltage of one's own at the socket; nothing gives it back.
+    void setVolts(std::optional<double> volts);
+
+    Drive& drive();
+    std::deque<Module>& modules();
+
+    /// Null if there is none of that id.
+    Module* findModule(std::uint32_t id);
 
     /// What the modules say to a request, in the order of time.
     std::vector<ModuleMessage> request(Target const& target, Bytes const& payload, Time now);
@@ -34,8 +53,10 @@ private:
     Protocol const& m_protocol;
     Padding m_padding;
     std::optional<double> m_volts;
-    DriveModel m_drive;
-    std::vector<Module> m_modules;
+    std::optional<double> m_chosenVolts;
+    Drive m_drive;
+    std::deque<Module> m_modules;
+    bool m_ignition = true;
 };
 
 } // namespace obdsim

@@ -45,9 +45,6 @@ VehicleData readVehicle(TableReader& table)
     vehicle.padding = readPadding(table);
     table.table("engine", [&](TableReader& engine) { vehicle.engine = readEngine(engine); });
     table.tables("module", [&](TableReader& module) { vehicle.modules.push_back(readModule(module, vehicle)); });
-    if (vehicle.modules.empty()) {
-        table.fail("module", "a vehicle needs a [[module]]");
-    }
     return vehicle;
 }
 

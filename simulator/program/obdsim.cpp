@@ -1,0 +1,101 @@
+#include "simulator/adapter/quirk.h"
+#include "simulator/serve/session.h"
+#include "simulator/server.h"
+#include "simulator/simulation.h"
+
+#include <CLI/CLI.hpp>
+#include <asio/io_context.hpp>
+#include <asio/signal_set.hpp>
+
+#include <cstdio>
+#include <thread>
+
+namespace {
+
+constexpr int wrongUse = 2;
+constexpr int failed = 1;
+
+void printNames(char const* title, std::vector<std::string> const& names)
+{
+    std::printf("%s:\n", title);
+    for (auto const& name : names) {
+        std::printf("  %s\n", name.c_str());
+    }
+}
+
+void printAll()
+{
+    printNames("Vehicles", obdsim::simulatedVehicles());
+    printNames("Adapters", obdsim::simulatedAdapters());
+    printNames("Faults", obdsim::faultForms());
+    printNames("Control lines", obdsim::controlForms());
+}
+
+void serve(obdsim::SessionOptions const& options)
+{
+    obdsim::Session session(options);
+    for (auto const& address : session.addresses()) {
+        std::printf("%s\n", address.c_str());
+    }
+    if (options.control) {
+        std::printf("control %s\n", session.controlAddress().c_str());
+    }
+    std::fflush(stdout);
+    asio::io_context context;
+    asio::signal_set signals(context, SIGINT, SIGTERM);
+    signals.async_wait([&session](asio::error_code const& error, int /*signal*/) {
+        if (!error) {
+            session.stop();
+        }
+    });
+    std::thread waiting([&context] { context.run(); });
+    try {
+        session.run();
+    } catch (...) {
+        context.stop();
+        waiting.join();
+        throw;
+    }
+    context.stop();
+    waiting.join();
+}
+
+} // namespace
+
+int main(int argc, char** argv)
+{
+    CLI::App app("Plays an ELM327 adapter with a car behind it", "obdsim");
+    obdsim::SessionOptions options;
+    bool list = false;
+    app.add_option("--listen", options.listen, "tcp://HOST:PORT (port 0: any free one) or pty")->capture_default_str();
+    app.add_option("--vehicle", options.simulation.vehicle, "A built-in vehicle, or a vehicle file")
+        ->capture_default_str();
+    app.add_option("--replay", options.replay, "Serve a recorded dialogue instead of a vehicle");
+    app.add_option("--adapter", options.simulation.adapter, "A built-in adapter")->capture_default_str();
+    app.add_option("--fault", options.simulation.faults, "Something that goes wrong, such as cut@120; may be repeated");
+    app.add_option("--scenario", options.simulation.scenario, "Control lines with their times");
+    app.add_option("--write-scenario", options.written, "Write what control lines have changed as a scenario");
+    app.add_option("--control", options.control, "Take control lines on this port of 127.0.0.1 (0: any free one)")
+        ->check(CLI::Range(0, 65535));
+    app.add_option("--fleet", options.fleet, "Serve so many cars, each at an address of its own")
+        ->capture_default_str();
+    app.add_option("--trace", options.trace, "Write all that passes to this file");
+    app.add_flag("--list", list, "List vehicles, adapters, faults and control lines");
+    try {
+        app.parse(argc, argv);
+        if (list) {
+            printAll();
+        } else {
+            serve(options);
+        }
+        return 0;
+    } catch (CLI::ParseError const& error) {
+        return app.exit(error) == 0 ? 0 : wrongUse;
+    } catch (obdsim::ServerError const& error) {
+        std::fprintf(stderr, "obdsim: %s\n", error.what());
+        return failed;
+    } catch (obdsim::SimulatorError const& error) {
+        std::fprintf(stderr, "obdsim: %s\n", error.what());
+        return wrongUse;
+    }
+}
