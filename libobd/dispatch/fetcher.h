@@ -4,6 +4,7 @@
 
 #include <common/logrecord.h>
 #include <obd/dispatcher.h>
+#include <obd/iquery.h>
 
 #include <chrono>
 #include <future>
@@ -11,16 +12,28 @@
 
 namespace obd {
 
+// How the run of a query ended for the caller that waits for it.
+enum class FetchEnd : int
+{
+    Succeeded,
+    Failed,  // it ran, and nobody delivered
+    Late,    // no end in time: the query may still be in the worker's hands
+    Dropped, // without a connection it was not even queued
+};
+
+// What the end of a fetch means for one control module, with a log line if it delivered nothing to a fetch that
+// succeeded.
+Verdict judgeFetch(FetchEnd end, IQuery const& query, IEcu const& ecu);
+
 // How long a fetch waits: the query's own time-out and a margin for the queue. A time-out beyond what a signed integer
 // holds is a negative one and counts as none.
 std::chrono::milliseconds fetchLimit(unsigned int timeoutMs);
 
-// Runs a query on the worker and waits for it: true if it succeeded, and its values can be read. False, with a log
-// line, if there is no connection, if the query failed, or if its time-out and 50 ms more have passed, in which the
-// time in the queue counts. After a false the query may still be in the worker's hands: drop it, don't use it again.
-// Any thread but the worker.
+// Runs a query on the worker and waits for it. Anything but a success, after which its values can be read, is told in
+// the log: no connection, a query that failed, or that its time-out and 50 ms more have passed, in which the time in
+// the queue counts. Any thread but the worker.
 template <class T>
-bool fetch(std::shared_ptr<T> const& query)
+FetchEnd runFetch(std::shared_ptr<T> const& query)
 {
     auto const promise = std::make_shared<std::promise<bool>>();
     std::future<bool> answer = promise->get_future();
@@ -28,18 +41,33 @@ bool fetch(std::shared_ptr<T> const& query)
         std::make_shared<FetchTask<T>>(query, promise); // held here until the end: the queue keeps nothing
     std::chrono::milliseconds const limit = fetchLimit(query->timeout());
     if (!Dispatcher::getInstance().update(task)) {
-        return false;
+        return FetchEnd::Dropped;
     }
     if (answer.wait_for(limit) != std::future_status::ready) {
         TERVEX_LOG(Error) << "Future not ready";
         task->cancel();
-        return false;
+        return FetchEnd::Late;
     }
     if (!answer.get()) {
         TERVEX_LOG(Error) << "Fetch done with failure";
-        return false;
+        return FetchEnd::Failed;
     }
-    return true;
+    return FetchEnd::Succeeded;
+}
+
+// True after a success. After a false the query may still be in the worker's hands: drop it, don't use it again.
+template <class T>
+bool fetch(std::shared_ptr<T> const& query)
+{
+    return runFetch(query) == FetchEnd::Succeeded;
+}
+
+// The same, judged for one control module: Answered if that module delivered, whatever the others did. The query may be
+// read in that case only.
+template <class T>
+Verdict fetchFrom(std::shared_ptr<T> const& query, IEcu const& ecu)
+{
+    return judgeFetch(runFetch(query), *query, ecu);
 }
 
 } // namespace obd

@@ -6,6 +6,7 @@
 #include <memory>
 #include <mutex>
 #include <string>
+#include <utility>
 #include <vector>
 
 namespace obd {
@@ -52,6 +53,7 @@ public:
     unsigned int intakeManifoldAbsolutePressureMax() const override;
     double airFlowRateMax() const override;
     IgnitionType ignitionType() const override;
+    Verdict detection(ObdMode mode, unsigned char frame) const override;
 
 private:
     // A set begins with the identifier 0, which starts the chain of range requests. In the order of arrival.
@@ -74,6 +76,8 @@ private:
     void logSupportedPids(ObdMode mode, unsigned char frame) const;
 
     bool detectConfiguration(ObdMode mode, unsigned char frame);
+    // Of the replies to the ranges, the first that is missing counts.
+    void setDetection(ObdMode mode, unsigned char frame, Verdict const& verdict);
 
     // The facts, in the order of init. False if the module was asked in vain, and of the standard also if it reports
     // none; the defaults stand then.
@@ -110,6 +114,7 @@ private:
     std::shared_ptr<OidSet> m_mode01Oids;
     std::map<unsigned char, std::shared_ptr<OidSet>> m_mode02Oids; // by freeze frame
     std::map<OxygenSensorLocation, std::shared_ptr<OidSet>> m_mode05Tids;
+    std::map<std::pair<ObdMode, unsigned char>, Verdict> m_detections; // by service and freeze frame
     std::shared_ptr<OidSet> m_mode06Oids;
     std::shared_ptr<OidSet> m_mode08Oids;
     std::shared_ptr<OidSet> m_mode09Oids;

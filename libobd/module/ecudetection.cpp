@@ -11,6 +11,11 @@
 #include <functional>
 
 namespace obd {
+namespace {
+
+constexpr unsigned char firstFrame = 0; // of the services that have no frames
+
+} // namespace
 
 bool Ecu::init(unsigned int index)
 {
@@ -61,13 +66,19 @@ std::unique_ptr<SupportedOids> Ecu::getOidParameter(ObdMode mode, unsigned char 
 bool Ecu::detectConfiguration(ObdMode mode, unsigned char frame)
 {
     bool result = false;
+    {
+        std::lock_guard const lock(m_mutex);
+        m_detections.erase({mode, frame});
+    }
     for (unsigned int base = 0; base <= lastRange && hasOid(mode, static_cast<unsigned char>(base), frame);
          base += rangeSize) {
         std::unique_ptr<SupportedOids> const query = getOidParameter(mode, static_cast<unsigned char>(base), frame);
         if (query == nullptr) {
             continue;
         }
-        if (query->update(m_proxy) != IQuery::UpdateStatus::UpdateOk) {
+        bool const updated = query->update(m_proxy) == IQuery::UpdateStatus::UpdateOk;
+        setDetection(mode, frame, query->verdict(*this));
+        if (!updated) {
             TERVEX_LOG(Fatal) << "Failed to get supported 0" << static_cast<int>(mode) << " IDs 0x"
                               << lowerHex(base + 1) << " - 0x" << lowerHex(base + rangeSize) << " for ECU 0x"
                               << lowerHex(m_id) << " frame 0x" << lowerHex(frame);
@@ -82,6 +93,22 @@ bool Ecu::detectConfiguration(ObdMode mode, unsigned char frame)
     }
     logSupportedPids(mode, frame);
     return result;
+}
+
+void Ecu::setDetection(ObdMode mode, unsigned char frame, Verdict const& verdict)
+{
+    std::lock_guard const lock(m_mutex);
+    Verdict& detection = m_detections[{mode, frame}];
+    if (detection.kind == OutcomeKind::Answered) {
+        detection = verdict;
+    }
+}
+
+Verdict Ecu::detection(ObdMode mode, unsigned char frame) const
+{
+    std::lock_guard const lock(m_mutex);
+    auto const found = m_detections.find({mode, mode == ObdMode::FreezeFrame ? frame : firstFrame});
+    return found != m_detections.end() ? found->second : Verdict{OutcomeKind::NotOffered};
 }
 
 bool Ecu::detectFreezeFrameConfiguration(unsigned char frame)

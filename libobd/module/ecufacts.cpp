@@ -255,12 +255,14 @@ void Ecu::detectEcuName(unsigned int index)
     std::string name = "ECU#" + std::to_string(index + 1);
     std::string description = "Control Module 0x" + upperHex(m_id);
     EcuName query;
-    if (hasOid(ObdMode::VehicleInformation, ecuNameInfoType, 0) && succeeds(query, m_proxy)) {
-        name = query.ecuAcronym(*this);
-        description = query.fullDescription(*this);
-        if (description.empty()) {
-            description = query.description(*this);
-        }
+    bool const told = hasOid(ObdMode::VehicleInformation, ecuNameInfoType, 0) && succeeds(query, m_proxy) &&
+                      query.delivered(*this); // the reply may be another module's
+    if (told) {
+        std::string const acronym = query.ecuAcronym(*this);
+        name = acronym.empty() ? name : acronym;
+        std::string const full = query.fullDescription(*this);
+        std::string const text = full.empty() ? query.description(*this) : full;
+        description = text.empty() ? description : text;
     }
     std::lock_guard const lock(m_mutex);
     m_name = name;

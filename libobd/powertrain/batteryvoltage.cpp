@@ -15,16 +15,23 @@ BatteryVoltage::BatteryVoltage() : DerivedParameter(batteryVoltageRow) {}
 IQuery::UpdateStatus BatteryVoltage::update(std::shared_ptr<IObdProxy> const& proxy)
 {
     float const volts = proxy->batteryVoltage();
+    m_outcome = OutcomeKind::Answered;
     if (volts > 0.0F) {
         m_voltage = static_cast<double>(volts);
         return UpdateStatus::UpdateOk;
     }
+    m_outcome = proxy->isConnected() ? OutcomeKind::ModuleSilent : OutcomeKind::NotConnected;
     return UpdateStatus::UpdateFailed;
 }
 
 void BatteryVoltage::clear()
 {
     m_voltage = 0.0;
+}
+
+Verdict BatteryVoltage::verdict(IEcu const& /*ecu*/) const
+{
+    return {m_outcome};
 }
 
 double BatteryVoltage::voltage() const

@@ -15,6 +15,7 @@ public:
     // Fails, keeping the old value, if the adapter tells none.
     UpdateStatus update(std::shared_ptr<IObdProxy> const& proxy) override;
     void clear() override;
+    Verdict verdict(IEcu const& ecu) const override; // the same for every module
 
     double voltage() const; // V; 0.0 while unknown
 
@@ -22,6 +23,7 @@ private:
     double value(IEcu const& ecu, UnitSystem system) const override;
 
     std::atomic<double> m_voltage{0.0};
+    std::atomic<OutcomeKind> m_outcome{OutcomeKind::ModuleSilent};
 };
 
 } // namespace obd

@@ -52,6 +52,7 @@ IQuery::UpdateStatus BoostPressure::update(std::shared_ptr<IObdProxy> const& pro
         })) {
         m_barometricPressureTime = tervex::currentMillis();
     }
+    judge(ecus, {&m_manifoldPressure}); // the other is not read each time, and has a default
     return status(success);
 }
 

@@ -68,6 +68,28 @@ bool DerivedParameter::poll(TableParameter& input, std::shared_ptr<IObdProxy> co
     return true;
 }
 
+void DerivedParameter::judge(Ecus const& ecus, Inputs const& inputs)
+{
+    judge(ecus, [&inputs](IEcu const&) { return inputs; });
+}
+
+void DerivedParameter::judge(Ecus const& ecus, std::function<Inputs(IEcu const&)> const& inputsOf)
+{
+    m_verdicts.clear();
+    for (std::shared_ptr<IEcu> const& ecu : ecus) {
+        Inputs const inputs = inputsOf(*ecu);
+        auto const missing = std::find_if(inputs.begin(), inputs.end(),
+                                          [&ecu](PowertrainParameter const* input) { return !input->delivered(*ecu); });
+        m_verdicts[ecu->id()] = missing != inputs.end() ? (*missing)->verdict(*ecu) : Verdict{};
+    }
+}
+
+Verdict DerivedParameter::verdict(IEcu const& ecu) const
+{
+    auto const found = m_verdicts.find(ecu.id());
+    return found != m_verdicts.end() ? found->second : Verdict{OutcomeKind::NotOffered};
+}
+
 void DerivedParameter::getRequestData(std::vector<unsigned char>& data) const
 {
     data.clear();

@@ -6,6 +6,7 @@
 #include <obd/powertrainparameter.h>
 
 #include <functional>
+#include <map>
 
 namespace obd {
 
@@ -38,6 +39,9 @@ public:
     std::string description(IEcu const& ecu) override;
     std::vector<std::shared_ptr<SensorInfo const>> sensorInfo(IEcu const& ecu) override;
     std::vector<std::shared_ptr<SensorValue>> values(IEcu const& ecu, UnitSystem system) override;
+    // Answered for the modules whose own inputs came in the last update. What is worked out may still rest on an older
+    // reading of a module for which it is not.
+    Verdict verdict(IEcu const& ecu) const override;
 
 protected:
     using Ecus = std::vector<std::shared_ptr<IEcu>>;
@@ -51,6 +55,13 @@ protected:
     static bool poll(TableParameter& input, std::shared_ptr<IObdProxy> const& proxy, Ecus const& ecus,
                      Feed const& feed);
 
+    using Inputs = std::vector<PowertrainParameter const*>;
+
+    // At the end of an update: what each of the modules delivered of the inputs that it needs, which inputsOf tells.
+    // The first that did not come counts.
+    void judge(Ecus const& ecus, std::function<Inputs(IEcu const&)> const& inputsOf);
+    void judge(Ecus const& ecus, Inputs const& inputs);
+
     static UpdateStatus status(bool success) { return success ? UpdateStatus::UpdateOk : UpdateStatus::UpdateFailed; }
 
     void getRequestData(std::vector<unsigned char>& data) const override;
@@ -63,6 +74,7 @@ private:
 
     DerivedRow const& m_row;
     std::shared_ptr<SensorInfo const> m_info;
+    std::map<unsigned int, Verdict> m_verdicts; // by module id
 };
 
 // Whether the module reports all of these PIDs.

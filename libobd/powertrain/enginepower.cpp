@@ -46,9 +46,12 @@ EnginePower::EnginePower(unsigned int weight)
 
 IQuery::UpdateStatus EnginePower::update(std::shared_ptr<IObdProxy> const& proxy)
 {
-    return status(poll(m_speed, proxy, proxy->ecus(), [this](IEcu const& ecu, Sample const& sample) {
+    Ecus const ecus = proxy->ecus();
+    bool const success = poll(m_speed, proxy, ecus, [this](IEcu const& ecu, Sample const& sample) {
         s_history.change(ecu, [this, &sample](EnginePowerData& data) { data.addSpeed(sample, m_weight); });
-    }));
+    });
+    judge(ecus, {&m_speed});
+    return status(success);
 }
 
 void EnginePower::clear()

@@ -50,7 +50,21 @@ IQuery::UpdateStatus FuelConsumption::update(std::shared_ptr<IObdProxy> const& p
         success |= poll(*each.parameter, proxy, ecus,
                         [this, &each](IEcu const& ecu, Sample const& sample) { feed(ecu, each.input, sample); });
     }
+    judge(ecus, [this](IEcu const& ecu) { return neededBy(ecu); });
     return status(success);
+}
+
+// A module without lambda is taken to burn the ideal mixture.
+DerivedParameter::Inputs FuelConsumption::neededBy(IEcu const& ecu) const
+{
+    Inputs needed;
+    for (Input const& each : m_inputs) {
+        unsigned char const pid = ParameterIdentifier(each.parameter->pid()).toOid();
+        if (each.input != ConsumptionInput::Lambda || ecu.isSupported(ObdMode::CurrentData, pid, 0)) {
+            needed.push_back(each.parameter.get());
+        }
+    }
+    return needed;
 }
 
 double FuelConsumption::consumption(IEcu const& ecu, UnitSystem system) const

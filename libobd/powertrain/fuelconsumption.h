@@ -51,6 +51,7 @@ private:
 
     double value(IEcu const& ecu, UnitSystem system) const override { return consumption(ecu, system); }
     double convert(double litres, UnitSystem system) const;
+    Inputs neededBy(IEcu const& ecu) const;
 
     std::vector<Input> m_inputs;
     double m_correctionFactor{1.0};

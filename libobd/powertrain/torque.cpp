@@ -30,6 +30,7 @@ IQuery::UpdateStatus Torque::update(std::shared_ptr<IObdProxy> const& proxy)
         s_history.change(ecu, [&sample](TorqueData& data) { data.addRpm(sample); });
     });
     bool const power = updatePower(proxy);
+    judge(proxy->ecus(), {&m_rpm, &m_power});
     return status(rpm && power);
 }
 

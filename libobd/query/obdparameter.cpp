@@ -10,7 +10,8 @@ namespace obd {
 namespace {
 
 constexpr unsigned char negativeReply = 0x7F;
-constexpr int cutNack = 0x79;            // a negative reply too short to hold its code
+constexpr int cutNack = 0x79; // a negative reply too short to hold its code
+constexpr std::size_t nackCodePosition = 2;
 constexpr std::size_t saeLineLength = 7; // data bytes of one ISO 9141-2 or J1850 line
 
 std::string dump(std::vector<unsigned char> const& request, ResponseMap const& responses)
@@ -22,16 +23,43 @@ std::string dump(std::vector<unsigned char> const& request, ResponseMap const& r
     return text;
 }
 
+bool isNegative(std::vector<unsigned char> const& data)
+{
+    return !data.empty() && data.front() == negativeReply;
+}
+
+int nackCode(std::vector<unsigned char> const& data)
+{
+    return data.size() > nackCodePosition ? data[nackCodePosition] : cutNack;
+}
+
+// What an exchange means for a module of which it brought nothing.
+OutcomeKind withoutReply(IDevice::Status status, IObdProxy& proxy)
+{
+    switch (status) {
+    case IDevice::Status::Ok:
+    case IDevice::Status::NoResponse:
+        return OutcomeKind::ModuleSilent;
+    case IDevice::Status::Unparsed: // so it also is without a link
+        return proxy.isConnected() ? OutcomeKind::Unreadable : OutcomeKind::NotConnected;
+    default:
+        return OutcomeKind::NotConnected;
+    }
+}
+
 } // namespace
 
 IQuery::UpdateStatus ObdParameter::update(std::shared_ptr<IObdProxy> const& proxy)
 {
     m_nack = 0;
+    m_verdicts.clear();
+    m_others = OutcomeKind::Unreadable; // of what throws on the way
     std::vector<unsigned char> request;
     ResponseMap responses;
     try {
         getRequestData(request);
         IDevice::Status const status = proxy->execute(request, responses, timeout());
+        m_others = withoutReply(status, *proxy);
         if (status == IDevice::Status::NoResponse) {
             return UpdateStatus::UpdateNoData;
         }
@@ -52,13 +80,31 @@ IQuery::UpdateStatus ObdParameter::distribute(std::shared_ptr<IObdProxy> const& 
         std::shared_ptr<IEcu> const ecu = proxy->ecu(id);
         if (ecu == nullptr) {
             TERVEX_LOG(Error) << "No such ECU: " << id;
-        } else if (setResponseData(ecu, data)) {
+        } else if (Verdict const verdict = judge(ecu, data); verdict.kind == OutcomeKind::Answered) {
             result = UpdateStatus::UpdateOk;
         } else {
             TERVEX_LOG(Error) << "Invalid data received for 0x" << lowerHex(id);
         }
     }
     return result;
+}
+
+Verdict ObdParameter::judge(std::shared_ptr<IEcu> const& ecu, std::vector<unsigned char> const& data)
+{
+    Verdict& verdict = m_verdicts[ecu->id()];
+    verdict = {OutcomeKind::Unreadable}; // also if the reading throws
+    if (setResponseData(ecu, data)) {
+        verdict = {OutcomeKind::Answered};
+    } else if (isNegative(data)) {
+        verdict = {OutcomeKind::Refused, nackCode(data)};
+    }
+    return verdict;
+}
+
+Verdict ObdParameter::verdict(IEcu const& ecu) const
+{
+    auto const found = m_verdicts.find(ecu.id());
+    return found != m_verdicts.end() ? found->second : Verdict{m_others};
 }
 
 unsigned int ObdParameter::timeout() const
@@ -75,7 +121,7 @@ void ObdParameter::requestData(std::vector<unsigned char>& data) const
 
 bool ObdParameter::setResponseData(std::shared_ptr<IEcu> const& ecu, std::vector<unsigned char> const& data)
 {
-    if (!data.empty() && data.front() == negativeReply) {
+    if (isNegative(data)) {
         setNack(ecu, data);
         return false;
     }
@@ -94,7 +140,7 @@ int ObdParameter::nack() const
 void ObdParameter::setNack(std::shared_ptr<IEcu> const& ecu, std::vector<unsigned char> const& data)
 {
     TERVEX_LOG(Error) << "ECU with ID " << ecu->id() << " received NACK: " << hexDump(data);
-    m_nack = data.size() > 2 ? data[2] : cutNack;
+    m_nack = nackCode(data);
 }
 
 int ObdParameter::findSaeChecksumLength(std::vector<unsigned char> const& data) const

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "libobd/service/baseservice.h"
+#include "libobd/service/ask.h"
 
 #include <obd/idiagnosticsservice.h>
 
@@ -10,6 +10,8 @@ namespace obd {
 class DiagnosticsService : public BaseService, public IDiagnosticsService
 {
 public:
+    using ReadinessMonitors = std::vector<std::shared_ptr<ReadinessMonitorDataModel>>;
+
     explicit DiagnosticsService(IObdVelmora const* obd, Following following = Following::AtOnce);
 
     std::vector<std::shared_ptr<ReadinessMonitorDataModel>> fetchReadinessMonitors() override;
@@ -20,6 +22,20 @@ public:
     std::vector<std::shared_ptr<OxygenSensorMonitorDataModel>>
     fetchOxygenSensorTests(OxygenSensorLocation location) override;
     bool isOxygenSensorTestComplete() override;
+    Outcome<ReadinessMonitors> askReadinessMonitors() override;
+    Outcome<ReadinessMonitors> askReadinessMonitorsThisCycle() override;
+    Outcome<std::vector<std::shared_ptr<DiagnosticMonitorDataModel>>> askMonitorTests() override;
+    Outcome<std::vector<std::shared_ptr<PerformanceCounterDataModel>>> askPerformanceCounters() override;
+    Outcome<std::vector<std::shared_ptr<OxygenSensorMonitorDataModel>>>
+    askOxygenSensorTests(OxygenSensorLocation location) override;
+    Outcome<bool> askOxygenSensorTestComplete() override;
+
+private:
+    // The fetch operations ask whatever the module says it supports, the others do not: they say what it needs.
+    using Need = std::optional<Needed>;
+
+    Outcome<ReadinessMonitors> askSinceCleared(Need const& needed) const;
+    Outcome<bool> askOxygenSensorMonitor(Need const& needed) const;
 };
 
 } // namespace obd

@@ -1,6 +1,5 @@
 #include "libobd/service/ecuservice.h"
 
-#include "libobd/dispatch/fetcher.h"
 #include "libobd/parameters/calibrationids.h"
 #include "libobd/parameters/calibrationverificationnumbers.h"
 #include "libobd/parameters/identificationnumber.h"
@@ -40,14 +39,16 @@ std::string EcuService::text(std::string (IEcu::*tell)() const) const
 }
 
 template <typename Item, typename Value>
-Value EcuService::fetchItem(Value (Item::*read)(std::shared_ptr<IEcu> const& ecu) const) const
+Outcome<Value> EcuService::askItem(Value (Item::*read)(std::shared_ptr<IEcu> const& ecu) const,
+                                   std::optional<unsigned char> infoType) const
 {
     std::shared_ptr<IEcu> const module = connectedEcu();
     auto const item = std::make_shared<Item>();
-    if (module == nullptr || !fetch(item)) {
-        return {};
+    std::optional<Needed> needed;
+    if (infoType) {
+        needed = Needed{ObdMode::VehicleInformation, *infoType};
     }
-    return ((*item).*read)(module);
+    return ask(*this, module, needed, item, [&] { return ((*item).*read)(module); });
 }
 
 std::vector<std::shared_ptr<ParameterDataModel>> EcuService::supportedParameters()
@@ -90,7 +91,7 @@ bool EcuService::hasVehicleIdentificationNumber()
 
 std::string EcuService::fetchVehicleIdentificationNumber()
 {
-    return fetchItem(&VehicleIdentificationNumber::vehicleIdentificationNumber);
+    return askItem(&VehicleIdentificationNumber::vehicleIdentificationNumber).value;
 }
 
 bool EcuService::hasCalibrationIds()
@@ -100,7 +101,7 @@ bool EcuService::hasCalibrationIds()
 
 std::vector<std::string> EcuService::fetchCalibrationIds()
 {
-    return fetchItem(&CalibrationIds::calibrationIds);
+    return askItem(&CalibrationIds::calibrationIds).value;
 }
 
 bool EcuService::hasVerificationNumbers()
@@ -110,7 +111,7 @@ bool EcuService::hasVerificationNumbers()
 
 std::vector<std::string> EcuService::fetchVerificationNumbers()
 {
-    return fetchItem(&CalibrationVerificationNumbers::verificationNumbers);
+    return askItem(&CalibrationVerificationNumbers::verificationNumbers).value;
 }
 
 bool EcuService::hasEngineSerialNumber()
@@ -120,7 +121,7 @@ bool EcuService::hasEngineSerialNumber()
 
 std::string EcuService::fetchEngineSerialNumber()
 {
-    return fetchItem(&EngineSerialNumber::engineSerialNumber);
+    return askItem(&EngineSerialNumber::engineSerialNumber).value;
 }
 
 bool EcuService::hasErotan()
@@ -130,7 +131,32 @@ bool EcuService::hasErotan()
 
 std::string EcuService::fetchErotan()
 {
-    return fetchItem(&Erotan::erotan);
+    return askItem(&Erotan::erotan).value;
+}
+
+Outcome<std::string> EcuService::askVehicleIdentificationNumber()
+{
+    return askItem(&VehicleIdentificationNumber::vehicleIdentificationNumber, InfoVehicleIdentificationNumber);
+}
+
+Outcome<std::vector<std::string>> EcuService::askCalibrationIds()
+{
+    return askItem(&CalibrationIds::calibrationIds, InfoCalibrationIds);
+}
+
+Outcome<std::vector<std::string>> EcuService::askVerificationNumbers()
+{
+    return askItem(&CalibrationVerificationNumbers::verificationNumbers, InfoVerificationNumbers);
+}
+
+Outcome<std::string> EcuService::askEngineSerialNumber()
+{
+    return askItem(&EngineSerialNumber::engineSerialNumber, InfoEngineSerialNumber);
+}
+
+Outcome<std::string> EcuService::askErotan()
+{
+    return askItem(&Erotan::erotan, InfoErotan);
 }
 
 std::vector<std::shared_ptr<ParameterDataModel>> EcuService::furtherParameters()

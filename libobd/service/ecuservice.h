@@ -1,6 +1,6 @@
 #pragma once
 
-#include "libobd/service/baseservice.h"
+#include "libobd/service/ask.h"
 
 #include <obd/iecuservice.h>
 #include <obd/obdmode.h>
@@ -30,14 +30,20 @@ public:
     bool hasErotan() override;
     std::string fetchErotan() override;
     std::vector<std::shared_ptr<ParameterDataModel>> furtherParameters() override;
+    Outcome<std::string> askVehicleIdentificationNumber() override;
+    Outcome<std::vector<std::string>> askCalibrationIds() override;
+    Outcome<std::vector<std::string>> askVerificationNumbers() override;
+    Outcome<std::string> askEngineSerialNumber() override;
+    Outcome<std::string> askErotan() override;
 
 private:
     bool isSupported(ObdMode mode, unsigned char id) const;
     // A text that the module tells without being asked; empty without one.
     std::string text(std::string (IEcu::*tell)() const) const;
-    // Reads one item of service 09; read is the accessor of its value.
+    // Reads one item of service 09; read is the accessor of its value. With an info type only what the module offers.
     template <typename Item, typename Value>
-    Value fetchItem(Value (Item::*read)(std::shared_ptr<IEcu> const& ecu) const) const;
+    Outcome<Value> askItem(Value (Item::*read)(std::shared_ptr<IEcu> const& ecu) const,
+                           std::optional<unsigned char> infoType = std::nullopt) const;
 };
 
 } // namespace obd

@@ -1,7 +1,7 @@
 #include "libobd/service/routineservice.h"
 
-#include "libobd/dispatch/fetcher.h"
 #include "libobd/parameters/testroutine.h"
+#include "libobd/powertrain/sensorpids.h"
 #include "libobd/service/builtservice.h"
 
 #include <obd/iecu.h>
@@ -52,13 +52,25 @@ std::shared_ptr<TestRoutineDataModel> makeModel(unsigned char id)
     return model;
 }
 
-TestRoutine::Result run(std::shared_ptr<TestRoutine> const& routine, IEcu const& ecu)
+// How a run ended. A legacy bus refuses in a positive reply, which carries no code.
+Verdict judgeRun(Verdict const& verdict, TestRoutine const& routine, IEcu const& ecu)
 {
-    if (fetch(routine)) {
-        return routine->result(ecu);
+    if (verdict.kind != OutcomeKind::Answered) {
+        return verdict;
     }
-    // On CAN a refusal is a negative reply, and thus a failure.
-    return routine->nack() != NackAcknowledged ? TestRoutine::Refused : TestRoutine::NoAnswer;
+    return {routine.result(ecu) == TestRoutine::Accepted ? OutcomeKind::Answered : OutcomeKind::Refused};
+}
+
+std::shared_ptr<TestRoutineDataModel> makeModel(unsigned char id, Verdict const& verdict)
+{
+    auto model = makeModel(id);
+    if (verdict.kind == OutcomeKind::Answered) {
+        model->status = TestRoutineDataModel::Accepted;
+    } else if (verdict.kind == OutcomeKind::Refused) {
+        model->status = TestRoutineDataModel::Refused;
+        model->message = NackToString(static_cast<Nack>(verdict.code)); // without a code the text of code 0
+    }
+    return model;
 }
 
 } // namespace
@@ -67,21 +79,47 @@ RoutineService::RoutineService(IObdVelmora const* obd, Following following)
     : BaseService(obd, servicePriority, following)
 {}
 
-std::vector<std::shared_ptr<TestRoutineDataModel>> RoutineService::getRoutines()
+Outcome<std::vector<std::shared_ptr<TestRoutineDataModel>>> RoutineService::askRoutines()
 {
     std::shared_ptr<IEcu> const module = connectedEcu();
     if (module == nullptr) {
-        return {};
+        return Verdict{OutcomeKind::NotConnected};
     }
+    bool hasAny = false;
     std::vector<std::shared_ptr<TestRoutineDataModel>> routines;
     for (unsigned char const id : module->supportedIds(ObdMode::SystemControl, 0)) {
+        hasAny |= !isSupportMask(id);
         if (findText(id) != nullptr) {
             routines.push_back(makeModel(id));
         }
     }
-    return routines;
+    if (hasAny) {
+        return told(std::move(routines));
+    }
+    Verdict const detection = judged(*this, module->detection(ObdMode::SystemControl, 0));
+    return detection.kind != OutcomeKind::Answered ? detection : Verdict{OutcomeKind::NotOffered};
 }
 
+std::vector<std::shared_ptr<TestRoutineDataModel>> RoutineService::getRoutines()
+{
+    return askRoutines().value;
+}
+
+Outcome<std::shared_ptr<TestRoutineDataModel>> RoutineService::askRoutine(unsigned char id)
+{
+    std::shared_ptr<IEcu> const module = connectedEcu();
+    if (module == nullptr) {
+        return Verdict{OutcomeKind::NotConnected};
+    }
+    if (lacks(*module, Needed{ObdMode::SystemControl, id})) {
+        return Verdict{OutcomeKind::NotOffered};
+    }
+    auto const routine = std::make_shared<TestRoutine>(id, module->protocol());
+    Verdict const run = judgeRun(fetchFrom(routine, *module), *routine, *module);
+    return {judged(*this, run), makeModel(id, run)};
+}
+
+// Asks also for what the module does not report.
 std::shared_ptr<TestRoutineDataModel> RoutineService::runRoutine(unsigned char id)
 {
     std::shared_ptr<IEcu> const module = connectedEcu();
@@ -89,20 +127,12 @@ std::shared_ptr<TestRoutineDataModel> RoutineService::runRoutine(unsigned char i
         return nullptr;
     }
     auto const routine = std::make_shared<TestRoutine>(id, module->protocol());
-    auto model = makeModel(id);
-    switch (run(routine, *module)) {
-    case TestRoutine::Accepted:
-        model->status = TestRoutineDataModel::Accepted;
-        break;
-    case TestRoutine::Refused:
-        model->status = TestRoutineDataModel::Refused;
-        // The older buses refuse in a positive reply, which carries no code: the text then is that of code 0.
-        model->message = NackToString(static_cast<Nack>(routine->nack()));
-        break;
-    default:
-        break;
+    Verdict run = judgeRun(fetchFrom(routine, *module), *routine, *module);
+    // Where this module did not accept, the refusal of another is taken for its own.
+    if (run.kind != OutcomeKind::Answered && routine->nack() != NackAcknowledged) {
+        run = {OutcomeKind::Refused, routine->nack()};
     }
-    return model;
+    return makeModel(id, run);
 }
 
 std::shared_ptr<IRoutineService> RoutineServiceBuilder::createRoutineService()

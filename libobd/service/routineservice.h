@@ -1,6 +1,6 @@
 #pragma once
 
-#include "libobd/service/baseservice.h"
+#include "libobd/service/ask.h"
 
 #include <obd/iroutineservice.h>
 
@@ -13,6 +13,8 @@ public:
 
     std::vector<std::shared_ptr<TestRoutineDataModel>> getRoutines() override;
     std::shared_ptr<TestRoutineDataModel> runRoutine(unsigned char id) override;
+    Outcome<std::vector<std::shared_ptr<TestRoutineDataModel>>> askRoutines() override;
+    Outcome<std::shared_ptr<TestRoutineDataModel>> askRoutine(unsigned char id) override;
 };
 
 } // namespace obd

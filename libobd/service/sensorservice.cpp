@@ -1,6 +1,5 @@
 #include "libobd/service/sensorservice.h"
 
-#include "libobd/dispatch/fetcher.h"
 #include "libobd/service/builtservice.h"
 #include "libobd/service/parametercatalogue.h"
 #include "libobd/service/sensormodels.h"
@@ -19,6 +18,14 @@
 #include <utility>
 
 namespace obd {
+namespace {
+
+bool isDerived(ParameterIdentifier::Id id)
+{
+    return !ParameterFactory::dataLength(id);
+}
+
+} // namespace
 
 SensorService::SensorService(IObdVelmora const* obd, Following following)
     : BaseService(obd, servicePriority, following), m_settings(obd->getSettings())
@@ -114,12 +121,36 @@ std::shared_ptr<ParameterDataModel> SensorService::getParameter(ParameterIdentif
 
 std::vector<std::shared_ptr<SensorDataModel>> SensorService::fetchSensors(ParameterIdentifier::Id id)
 {
+    return askSensors(id, false).value;
+}
+
+Outcome<std::vector<std::shared_ptr<SensorDataModel>>> SensorService::askSensors(ParameterIdentifier::Id id)
+{
+    return askSensors(id, true);
+}
+
+Outcome<std::vector<std::shared_ptr<SensorDataModel>>> SensorService::askSensors(ParameterIdentifier::Id id,
+                                                                                 bool onlyOffered)
+{
     std::shared_ptr<IEcu> const current = ecu();
-    std::shared_ptr<PowertrainParameter> const parameter =
-        current != nullptr ? ParameterFactory().createParameter(*current, *m_settings, id) : nullptr;
-    if (parameter == nullptr || !fetch(parameter)) {
-        return {};
+    if (current == nullptr) {
+        return Verdict{OutcomeKind::NotConnected};
     }
+    std::shared_ptr<PowertrainParameter> const parameter =
+        ParameterFactory().createParameter(*current, *m_settings, id);
+    if (parameter == nullptr) {
+        return Verdict{OutcomeKind::NotOffered};
+    }
+    std::optional<Needed> needed;
+    if (onlyOffered && !isDerived(id)) {
+        needed = Needed{ObdMode::CurrentData, ParameterIdentifier(id).toOid()};
+    }
+    return ask(*this, current, needed, parameter, [&] { return readSensors(parameter, current); });
+}
+
+std::vector<std::shared_ptr<SensorDataModel>>
+SensorService::readSensors(std::shared_ptr<PowertrainParameter> const& parameter, std::shared_ptr<IEcu> const& current)
+{
     UnitSystem const system = unitSystem();
     std::shared_ptr<ParameterDataModel> const description = describeParameter(parameter, current, system);
     auto const values = parameter->values(*current, system);
@@ -220,7 +251,8 @@ void SensorService::publish(ParameterQuery const& query, std::shared_ptr<Powertr
     SensorSet::Models models;
     {
         std::lock_guard const lock(m_mutex);
-        if (m_set.query(parameter->pid()).get() != &query) {
+        // The worker is told of a success also where other modules alone delivered.
+        if (m_set.query(parameter->pid()).get() != &query || !parameter->delivered(*m_set.ecu())) {
             return;
         }
         // Units and statistics belong together, so both are settled under the lock.

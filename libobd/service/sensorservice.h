@@ -1,6 +1,6 @@
 #pragma once
 
-#include "libobd/service/baseservice.h"
+#include "libobd/service/ask.h"
 #include "libobd/service/sensorset.h"
 
 #include <obd/isensorservice.h>
@@ -29,6 +29,7 @@ public:
     std::shared_ptr<ParameterDataModel> getParameter(ParameterIdentifier::Id id) override;
     std::vector<std::shared_ptr<SensorDataModel>> fetchSensors(ParameterIdentifier::Id id) override;
     bool isSupported(ParameterIdentifier::Id id) override;
+    Outcome<std::vector<std::shared_ptr<SensorDataModel>>> askSensors(ParameterIdentifier::Id id) override;
 
 protected:
     void startFollowing() override;
@@ -58,6 +59,9 @@ private:
 
     virtual void onQueryFinished(bool success, std::weak_ptr<ParameterQuery> const& finished,
                                  std::shared_ptr<PowertrainParameter> const& parameter);
+    Outcome<std::vector<std::shared_ptr<SensorDataModel>>> askSensors(ParameterIdentifier::Id id, bool onlyOffered);
+    std::vector<std::shared_ptr<SensorDataModel>> readSensors(std::shared_ptr<PowertrainParameter> const& parameter,
+                                                              std::shared_ptr<IEcu> const& current);
     void publish(ParameterQuery const& query, std::shared_ptr<PowertrainParameter> const& parameter);
     void update(std::shared_ptr<ParameterQuery> const& query);
 

@@ -54,6 +54,9 @@ public:
         return set(m_tests[location], tids);
     }
 
+    // How asking for a service's set went, of all freeze frames alike; answered unless told otherwise.
+    FakeEcu& setDetection(obd::ObdMode mode, obd::Verdict const& verdict) { return set(m_detections[mode], verdict); }
+
     // How often the bus would have been asked for a frame.
     int frameDetections() const { return m_frameDetections; }
 
@@ -102,6 +105,11 @@ public:
     unsigned int intakeManifoldAbsolutePressureMax() const override { return m_manifoldPressureMax; }
     double airFlowRateMax() const override { return m_airFlowRateMax; }
     obd::IgnitionType ignitionType() const override { return m_ignitionType; }
+    obd::Verdict detection(obd::ObdMode mode, unsigned char /*frame*/) const override
+    {
+        auto const found = m_detections.find(mode);
+        return found != m_detections.end() ? found->second : obd::Verdict{};
+    }
 
 private:
     using Ids = std::vector<unsigned char>;
@@ -141,6 +149,7 @@ private:
     std::map<unsigned char, Ids> m_frames;
     std::map<unsigned char, Ids> m_detected;
     std::map<obd::OxygenSensorLocation, Ids> m_tests;
+    std::map<obd::ObdMode, obd::Verdict> m_detections;
     int m_frameDetections{0};
 };
 

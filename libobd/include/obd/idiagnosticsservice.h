@@ -2,6 +2,7 @@
 
 #include <obd/diagnosticmonitordatamodel.h>
 #include <obd/export.h>
+#include <obd/outcome.h>
 #include <obd/oxygensensorlocation.h>
 #include <obd/oxygensensormonitordatamodel.h>
 #include <obd/performancecounterdatamodel.h>
@@ -40,6 +41,17 @@ public:
     fetchOxygenSensorTests(OxygenSensorLocation location) = 0;
     /// Whether the oxygen sensor monitor has run since the codes were cleared: before, its results mean nothing.
     virtual bool isOxygenSensorTestComplete() = 0;
+
+    /// The same operations, each with how it went. What the module says it does not offer is not asked for.
+    /// NothingStored of the readiness: not one of the monitors is there, so neither is that of the oxygen sensors; of
+    /// the counters: all are 0. Tests and counters may be told in part, see Outcome::missing.
+    virtual Outcome<std::vector<std::shared_ptr<ReadinessMonitorDataModel>>> askReadinessMonitors() = 0;
+    virtual Outcome<std::vector<std::shared_ptr<ReadinessMonitorDataModel>>> askReadinessMonitorsThisCycle() = 0;
+    virtual Outcome<std::vector<std::shared_ptr<DiagnosticMonitorDataModel>>> askMonitorTests() = 0;
+    virtual Outcome<std::vector<std::shared_ptr<PerformanceCounterDataModel>>> askPerformanceCounters() = 0;
+    virtual Outcome<std::vector<std::shared_ptr<OxygenSensorMonitorDataModel>>>
+    askOxygenSensorTests(OxygenSensorLocation location) = 0;
+    virtual Outcome<bool> askOxygenSensorTestComplete() = 0;
 };
 
 namespace DiagnosticsServiceBuilder {

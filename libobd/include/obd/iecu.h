@@ -3,6 +3,7 @@
 #include <obd/ignitiontype.h>
 #include <obd/obdmode.h>
 #include <obd/obdprotocol.h>
+#include <obd/outcome.h>
 #include <obd/oxygensensorlocation.h>
 
 #include <string>
@@ -56,6 +57,11 @@ public:
     virtual double airFlowRateMax() const = 0;                          ///< g/s
 
     virtual IgnitionType ignitionType() const = 0;
+
+    /// How asking the module for its supported set of a service went: only where it was answered is what is missing in
+    /// the set also missing in the module. ModuleSilent or worse also if the reply of a later range is what is missing;
+    /// NotOffered for what was never asked. frame counts in service 2 only.
+    virtual Verdict detection(ObdMode /*mode*/, unsigned char /*frame*/) const { return {}; }
 };
 
 } // namespace obd

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <obd/export.h>
+#include <obd/outcome.h>
 #include <obd/parameterdatamodel.h>
 
 #include <memory>
@@ -47,6 +48,13 @@ public:
 
     /// As supportedParameters, of PIDs above 0x7F.
     virtual std::vector<std::shared_ptr<ParameterDataModel>> furtherParameters() = 0;
+
+    /// The fetch operations, each with how it went. What the module says it does not offer is not asked for.
+    virtual Outcome<std::string> askVehicleIdentificationNumber() = 0;
+    virtual Outcome<std::vector<std::string>> askCalibrationIds() = 0;
+    virtual Outcome<std::vector<std::string>> askVerificationNumbers() = 0;
+    virtual Outcome<std::string> askEngineSerialNumber() = 0;
+    virtual Outcome<std::string> askErotan() = 0;
 };
 
 namespace EcuServiceBuilder {

@@ -1,9 +1,12 @@
 #pragma once
 
+#include <obd/outcome.h>
+
 #include <memory>
 
 namespace obd {
 
+class IEcu;
 class IObdProxy;
 
 /// Anything that asks the vehicle something.
@@ -32,6 +35,13 @@ public:
     /// Whether a reading builds on those before it. Whoever repeats such a query leaves out the clear() between its
     /// runs.
     virtual bool keepsHistory() const { return false; }
+
+    /// How the last update went for one module. UpdateOk means that at least one delivered: this tells which. A query
+    /// that keeps its modules apart overrides it. Not while an update runs.
+    virtual Verdict verdict(IEcu const& /*ecu*/) const { return {}; }
+
+    /// Whether the module delivered usable data in the last update.
+    bool delivered(IEcu const& ecu) const { return verdict(ecu).kind == OutcomeKind::Answered; }
 };
 
 } // namespace obd

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <obd/export.h>
+#include <obd/outcome.h>
 #include <obd/testroutinedatamodel.h>
 
 #include <memory>
@@ -22,6 +23,13 @@ public:
     /// engine may start to burn off a filter. Asks nothing back. Blocks; call from any thread but the dispatcher's
     /// worker. Null without a connection or a control module only.
     virtual std::shared_ptr<TestRoutineDataModel> runRoutine(unsigned char id) = 0;
+
+    /// The routines, with how asking for them went when the connection was opened. NothingStored: the library knows
+    /// none of those that the module has.
+    virtual Outcome<std::vector<std::shared_ptr<TestRoutineDataModel>>> askRoutines() = 0;
+    /// Runs a routine that the module says it has, and tells how it went: Answered is accepted, Refused is a refusal of
+    /// this module. The value is that of runRoutine, null for one that was not asked for.
+    virtual Outcome<std::shared_ptr<TestRoutineDataModel>> askRoutine(unsigned char id) = 0;
 };
 
 namespace RoutineServiceBuilder {

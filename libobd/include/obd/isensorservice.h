@@ -2,6 +2,7 @@
 
 #include <obd/export.h>
 #include <obd/isensorserviceobserver.h>
+#include <obd/outcome.h>
 #include <obd/parameteridentifier.h>
 #include <tervex/inotifier.h>
 
@@ -31,7 +32,8 @@ public:
     /// Requests the parameters over and over, in turn, as fast as the bus and a floor of 30 ms a request allow, until
     /// reset or a change that invalidates. Identifiers that the module does not offer are passed over; parameters that
     /// are running already go on. A request that fails is tried again at its next turn, without a word to the
-    /// observers; on a dead link that means as fast as it fails, so reset or close then.
+    /// observers, and so is one that this module did not answer; on a dead link that means as fast as it fails, so
+    /// reset or close then.
     virtual void startUpdates(std::vector<ParameterIdentifier::Id> const& ids) = 0;
 
     /// Ends all updates and forgets the statistics. To select fewer parameters: reset, then startUpdates.
@@ -44,12 +46,17 @@ public:
     /// parameter.
     virtual std::shared_ptr<ParameterDataModel> getParameter(ParameterIdentifier::Id id) = 0;
 
-    /// Reads a parameter once and waits for it, for its time-out at the most. Empty if that fails. A sensor that the
+    /// Reads a parameter once and waits for it, for its time-out at the most. Empty if that fails, or if other modules
+    /// alone answered. A sensor that the
     /// reply did not tell of comes without a value. Any thread but the dispatcher's worker.
     virtual std::vector<std::shared_ptr<SensorDataModel>> fetchSensors(ParameterIdentifier::Id id) = 0;
 
     /// Whether the current module reports the PID.
     virtual bool isSupported(ParameterIdentifier::Id id) = 0;
+
+    /// fetchSensors, with how it went. What the module says it does not offer is not asked for. NothingStored: no
+    /// sensor has a value. What is worked out is Answered if all that it needs came from this module.
+    virtual Outcome<std::vector<std::shared_ptr<SensorDataModel>>> askSensors(ParameterIdentifier::Id id) = 0;
 };
 
 namespace SensorServiceBuilder {

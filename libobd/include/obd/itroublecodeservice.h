@@ -2,6 +2,7 @@
 
 #include <obd/dtcdatamodel.h>
 #include <obd/export.h>
+#include <obd/outcome.h>
 #include <obd/parameterdatamodel.h>
 #include <obd/parameteridentifier.h>
 #include <obd/sensordatamodel.h>
@@ -53,6 +54,23 @@ public:
     /// Clears the codes of all control modules, and with them freeze frames, readiness and test results. Asks nothing
     /// back. True if the current control module has done so.
     virtual bool resetCodes() const = 0;
+
+    /// The same operations, each with how it went. What the module says it does not offer is not asked for. The lamp
+    /// and the clearing are told or not: there is no "nothing stored" of them. NothingStored of a freeze frame's code
+    /// and of its PIDs is a frame that is not there.
+    virtual Outcome<std::vector<std::shared_ptr<DtcDataModel>>> askConfirmedCodes() = 0;
+    virtual Outcome<std::vector<std::shared_ptr<DtcDataModel>>> askPendingCodes() = 0;
+    virtual Outcome<std::vector<std::shared_ptr<DtcDataModel>>> askPermanentCodes() = 0;
+    virtual Outcome<std::shared_ptr<MilStatus>> askMilStatus() = 0;
+    virtual Outcome<std::shared_ptr<SensorDataModel>> askDistance(bool sinceMil) = 0;
+    virtual Outcome<std::shared_ptr<SensorDataModel>> askRuntime(bool sinceMil) = 0;
+    virtual Outcome<std::shared_ptr<DtcDataModel>> askFreezeFrameTroubleCode(unsigned char frame) = 0;
+    virtual Outcome<std::vector<ParameterIdentifier::Id>> askFreezeFramePids(unsigned char frame) = 0;
+    virtual Outcome<std::vector<std::shared_ptr<SensorDataModel>>>
+    askFreezeFrameSensors(unsigned char frame, ParameterIdentifier::Id id) = 0;
+    virtual Outcome<std::shared_ptr<ParameterDataModel>> askFreezeFrameParameter(unsigned char frame,
+                                                                                 ParameterIdentifier::Id id) = 0;
+    virtual Outcome<bool> askResetCodes() const = 0;
 };
 
 namespace TroubleCodeServiceBuilder {

@@ -51,6 +51,7 @@
 #include <obd/obdparameter.h>
 #include <obd/obdprotocol.h>
 #include <obd/obdvelmorabuilder.h>
+#include <obd/outcome.h>
 #include <obd/oxygensensorlocation.h>
 #include <obd/oxygensensormonitordatamodel.h>
 #include <obd/parameterdatamodel.h>

@@ -6,6 +6,7 @@
 #include <obd/responsemap.h>
 
 #include <atomic>
+#include <map>
 #include <memory>
 #include <vector>
 
@@ -20,6 +21,7 @@ public:
     UpdateStatus update(std::shared_ptr<IObdProxy> const& proxy) override;
     unsigned int timeout() const override; ///< 1500 ms
     void clear() override;
+    Verdict verdict(IEcu const& ecu) const override;
 
     /// The request bytes, service first.
     virtual void requestData(std::vector<unsigned char>& data) const;
@@ -54,8 +56,11 @@ protected:
 
 private:
     UpdateStatus distribute(std::shared_ptr<IObdProxy> const& proxy, ResponseMap const& responses);
+    Verdict judge(std::shared_ptr<IEcu> const& ecu, std::vector<unsigned char> const& data);
 
     std::atomic<int> m_nack{0};
+    std::map<unsigned int, Verdict> m_verdicts;      ///< of the modules that said something in the last update
+    OutcomeKind m_others{OutcomeKind::ModuleSilent}; ///< of all others
 };
 
 } // namespace obd

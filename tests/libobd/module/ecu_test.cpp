@@ -202,6 +202,51 @@ TEST_F(EcuDetection, ModuleWithoutANameIsNumberedAndNamedByItsId)
     EXPECT_EQ(m_proxy->ecu(0x7EA)->description(), "Control Module 0x7EA");
 }
 
+TEST_F(EcuDetection, ModuleWhoseNameReplyIsMissingKeepsTheFallback)
+{
+    Bytes const offersName{0x49, 0x00, 0x00, 0x40, 0x00, 0x00};
+    for (unsigned int const id : {engine, 0x7E9U}) {
+        m_device->answer({0x01, 0x00}, id, {0x41, 0x00, 0x80, 0x00, 0x00, 0x00});
+        m_device->answer({0x09, 0x00}, id, offersName);
+    }
+    Bytes reply{0x49, 0x0A, 0x01, 'T', 'C', 'M', 0, '-', 'T', 'r', 'a', 'n', 's'};
+    reply.resize(23);
+    m_device->answer({0x09, 0x0A}, 0x7E9, reply);
+    ASSERT_TRUE(m_proxy->initialize());
+    EXPECT_EQ(m_proxy->firstEcu()->name(), "ECU#1");
+    EXPECT_EQ(m_proxy->firstEcu()->description(), "Control Module 0x7E8");
+    EXPECT_EQ(m_proxy->ecu(0x7E9)->name(), "TCM");
+    m_device->answer({0x09, 0x0A}, 0x7E9, [] {
+        Bytes blank{0x49, 0x0A, 0x01};
+        blank.resize(23);
+        return blank;
+    }());
+    ASSERT_TRUE(m_proxy->initialize());
+    EXPECT_EQ(m_proxy->ecu(0x7E9)->name(), "ECU#2") << "a blank name is none";
+    EXPECT_EQ(m_proxy->ecu(0x7E9)->description(), "Control Module 0x7E9");
+}
+
+TEST_F(EcuDetection, TellsWhichSetsTheModuleItselfToldWholly)
+{
+    using obd::OutcomeKind;
+    m_device->answer({0x01, 0x00}, 0x7E9, {0x41, 0x00, 0x80, 0x00, 0x00, 0x01});
+    m_device->answer({0x01, 0x20}, engine, {0x41, 0x20, 0x80, 0x00, 0x00, 0x00});
+    m_device->answer({0x06, 0x00}, engine, {0x7F, 0x06, 0x11});
+    m_device->answer({0x09, 0x00}, engine, {0x49, 0x00, 0x00});
+    ASSERT_TRUE(m_proxy->initialize());
+    auto const first = m_proxy->firstEcu();
+    EXPECT_EQ(first->detection(ObdMode::CurrentData, 0), obd::Verdict{});
+    EXPECT_EQ(first->detection(ObdMode::MonitorTests, 7), (obd::Verdict{OutcomeKind::Refused, 0x11}));
+    EXPECT_EQ(first->detection(ObdMode::SystemControl, 0), obd::Verdict{OutcomeKind::ModuleSilent});
+    EXPECT_EQ(first->detection(ObdMode::VehicleInformation, 0), obd::Verdict{OutcomeKind::Unreadable});
+    EXPECT_EQ(first->detection(ObdMode::FreezeFrame, 0), obd::Verdict{OutcomeKind::NotOffered}) << "never asked";
+    EXPECT_EQ(m_proxy->ecu(0x7E9)->detection(ObdMode::CurrentData, 0), obd::Verdict{OutcomeKind::ModuleSilent})
+        << "of the second range";
+    first->detectFreezeFrameConfiguration(0);
+    EXPECT_EQ(first->detection(ObdMode::FreezeFrame, 0), obd::Verdict{OutcomeKind::ModuleSilent});
+    EXPECT_EQ(first->detection(ObdMode::FreezeFrame, 1), obd::Verdict{OutcomeKind::NotOffered});
+}
+
 TEST_F(FreezeFrameDetection, SecondCallAsksNothing)
 {
     auto const ecu = connected();

@@ -51,6 +51,30 @@ TEST_F(GasConsumption, NeedsAirFlowAndSpeed)
     EXPECT_FALSE(obd::GasConsumption::isValid(*ecu));
 }
 
+TEST_F(GasConsumption, IsDeliveredOnlyIfTheModulesOwnInputsCame)
+{
+    using obd::OutcomeKind;
+    support({0x10, 0x0D, 0x44}); // with the lambda that is commanded
+    auto const other = std::make_shared<support::FakeEcu>(0x7E9U);
+    other->setSupported(derived::ObdMode::CurrentData, {0x10, 0x0D});
+    proxy->addEcu(other);
+    obd::GasConsumption parameter(*ecu);
+    answer("01 44", "41 44 80 00");
+    parameter.update(proxy);
+    EXPECT_TRUE(parameter.delivered(*ecu));
+    EXPECT_EQ(parameter.verdict(*other).kind, OutcomeKind::ModuleSilent);
+    answer("01 44", "7F 01 22");
+    parameter.update(proxy);
+    EXPECT_EQ(parameter.verdict(*ecu), (obd::Verdict{OutcomeKind::Refused, 0x22}));
+    answer("01 44", "41 44 80 00");
+    proxy->answer("01 10", {{0x7E9, "41 10 03 E8"}});
+    EXPECT_EQ(parameter.update(proxy), Status::UpdateOk);
+    EXPECT_EQ(parameter.verdict(*ecu).kind, OutcomeKind::ModuleSilent) << "the air that came is another module's";
+    other->setSupported(derived::ObdMode::CurrentData, {0x0D});
+    parameter.update(proxy);
+    EXPECT_EQ(parameter.verdict(*other).kind, OutcomeKind::NotOffered) << "the model does not suit it";
+}
+
 TEST_F(GasConsumptionMap, NeedsPressureEngineSpeedTemperatureAndSpeed)
 {
     std::vector<unsigned char> const needed{0x0F, 0x0D, 0x0C, 0x0B};

@@ -134,6 +134,37 @@ TEST_F(Parameter, OneGoodModuleIsEnoughAndEachIsOffered)
               (std::vector<std::string>{"ERROR Signature mismatch", "ERROR Invalid data received for 0x7e8"}));
 }
 
+TEST_F(Parameter, TellsOfEachModuleHowTheLastUpdateWent)
+{
+    auto const verdict = [this](unsigned int id) { return m_probe.verdict(*m_proxy->ecu(id)); };
+    reply(0x7E8, {0x41, 0x0C, 1});
+    reply(0x7E9, {0x7F, 0x01, 0x22});
+    m_probe.update(m_proxy);
+    EXPECT_TRUE(m_probe.delivered(*m_proxy->ecu(0x7E8)));
+    EXPECT_EQ(verdict(0x7E9), (Verdict{OutcomeKind::Refused, 0x22}));
+    EXPECT_EQ(verdict(0x18), Verdict{OutcomeKind::ModuleSilent});
+
+    reply(0x7E9, {0x41, 0x0D, 1});
+    m_probe.update(m_proxy);
+    EXPECT_EQ(verdict(0x7E9), Verdict{OutcomeKind::Unreadable});
+
+    std::pair<IDevice::Status, OutcomeKind> const cases[] = {
+        {IDevice::Status::NoResponse, OutcomeKind::ModuleSilent},
+        {IDevice::Status::Unparsed, OutcomeKind::Unreadable},
+        {IDevice::Status::NotSent, OutcomeKind::NotConnected},
+        {IDevice::Status::NotEnabled, OutcomeKind::NotConnected},
+    };
+    for (auto const& [deviceStatus, kind] : cases) {
+        status(deviceStatus);
+        m_probe.update(m_proxy);
+        EXPECT_EQ(verdict(0x7E8), Verdict{kind}) << "nothing of the update before counts";
+    }
+    m_device->enabled = false;
+    status(IDevice::Status::Unparsed);
+    m_probe.update(m_proxy);
+    EXPECT_EQ(verdict(0x7E8), Verdict{OutcomeKind::NotConnected});
+}
+
 TEST_F(Parameter, NegativeReplySetsTheCodeAndFails)
 {
     reply(0x7E8, {0x7F, 0x01, 0x12});
