@@ -2,7 +2,6 @@
 
 #include "libobd/bytes/hexformat.h"
 #include "libobd/powertrain/consumptionchoice.h"
-#include "libobd/powertrain/sensorpids.h"
 
 #include <common/logrecord.h>
 #include <obd/iconnectionnotifier.h>
@@ -12,6 +11,7 @@
 #include <obd/parameterdescriptor.h>
 #include <obd/parameterfactory.h>
 #include <obd/powertrainparameter.h>
+#include <obd/sensorpids.h>
 
 #include <algorithm>
 #include <utility>

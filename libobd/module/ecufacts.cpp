@@ -1,7 +1,6 @@
 // What an Ecu finds out of its control module beside the supported sets: what scales and selects everything else.
 
 #include "libobd/bytes/hexformat.h"
-#include "libobd/message/protocolfamily.h"
 #include "libobd/module/ecu.h"
 #include "libobd/parameters/ecuname.h"
 #include "libobd/parameters/supportedoids.h"
@@ -16,6 +15,7 @@
 
 #include <common/logrecord.h>
 #include <common/tracestream.h>
+#include <obd/protocolfamily.h>
 #include <obd/sensorvalue.h>
 
 #include <algorithm>

@@ -2,11 +2,11 @@
 #include "libobd/powertrain/boostpressure.h"
 #include "libobd/powertrain/monitorstatus.h"
 #include "libobd/powertrain/parametertables.h"
-#include "libobd/powertrain/sensorpids.h"
 #include "libobd/powertrain/torque.h"
 
 #include <common/logrecord.h>
 #include <obd/parameterfactory.h>
+#include <obd/sensorpids.h>
 
 namespace obd {
 namespace {

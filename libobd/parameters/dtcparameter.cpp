@@ -1,12 +1,12 @@
 #include "libobd/parameters/dtcparameter.h"
 
 #include "libobd/catalogue/dtcreader.h"
-#include "libobd/message/protocolfamily.h"
 #include "libobd/parameters/bytetext.h"
 #include "libobd/parameters/dtctostring.h"
 #include "libobd/parameters/replychecks.h"
 
 #include <common/logrecord.h>
+#include <obd/protocolfamily.h>
 
 namespace obd {
 namespace {

@@ -1,7 +1,8 @@
 #include "libobd/parameters/fixedrequestparameter.h"
 
-#include "libobd/message/protocolfamily.h"
 #include "libobd/parameters/replychecks.h"
+
+#include <obd/protocolfamily.h>
 
 #include <utility>
 

@@ -1,6 +1,5 @@
 #include "libobd/parameters/monitortestresult.h"
 
-#include "libobd/message/protocolfamily.h"
 #include "libobd/parameters/bytetext.h"
 #include "libobd/parameters/monitortestitemparser.h"
 #include "libobd/parameters/monitortesttexts.h"
@@ -8,6 +7,7 @@
 #include "libobd/parameters/saelines.h"
 
 #include <common/logrecord.h>
+#include <obd/protocolfamily.h>
 
 #include <utility>
 

@@ -13,12 +13,6 @@ constexpr std::size_t valueOffset = 3; // behind service, test and sensor
 constexpr std::size_t constantLength = valueOffset + 1;
 constexpr std::size_t limitedLength = valueOffset + 3;
 
-// The tests 01 to 04 are thresholds that the module works with; nothing limits them.
-bool isConstant(unsigned char tid)
-{
-    return tid >= 0x01 && tid <= 0x04;
-}
-
 } // namespace
 
 OxygenSensorTestResult::OxygenSensorTestResult(unsigned char tid, OxygenSensorLocation location)
@@ -42,7 +36,7 @@ bool OxygenSensorTestResult::fromBytes(std::shared_ptr<IEcu> const& ecu, std::ve
         TERVEX_LOG(Fatal) << "Invalid number of data bytes: " << data.size();
         return false;
     }
-    if (isConstant(m_tid)) {
+    if (isConstantTest(m_tid)) {
         store(ecu->id(), data[valueOffset], 0x00, 0xFF);
         return true;
     }

@@ -1,9 +1,9 @@
 #include "libobd/parameters/supportedoids.h"
 
 #include "libobd/bytes/bytereader.h"
-#include "libobd/message/protocolfamily.h"
 
 #include <common/logrecord.h>
+#include <obd/protocolfamily.h>
 
 #include <utility>
 

@@ -1,9 +1,9 @@
 #include "libobd/parameters/vehicleinformation.h"
 
-#include "libobd/message/protocolfamily.h"
 #include "libobd/parameters/saelines.h"
 
 #include <common/logrecord.h>
+#include <obd/protocolfamily.h>
 
 namespace obd {
 

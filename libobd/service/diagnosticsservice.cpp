@@ -4,11 +4,11 @@
 #include "libobd/parameters/oxygensensortestresult.h"
 #include "libobd/parameters/performancetracking.h"
 #include "libobd/powertrain/readinessmonitors.h"
-#include "libobd/powertrain/sensorpids.h"
 #include "libobd/service/builtservice.h"
 
 #include <common/tracestream.h>
 #include <obd/iecu.h>
+#include <obd/sensorpids.h>
 
 namespace obd {
 

@@ -4,7 +4,6 @@
 #include "libobd/powertrain/boostpressure.h"
 #include "libobd/powertrain/consumptionchoice.h"
 #include "libobd/powertrain/parametertables.h"
-#include "libobd/powertrain/sensorpids.h"
 #include "libobd/powertrain/torque.h"
 #include "libobd/service/sensormodels.h"
 
@@ -12,6 +11,7 @@
 #include <obd/parameterdescriptor.h>
 #include <obd/parameterfactory.h>
 #include <obd/powertrainparameter.h>
+#include <obd/sensorpids.h>
 
 namespace obd {
 

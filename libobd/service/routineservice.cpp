@@ -1,11 +1,11 @@
 #include "libobd/service/routineservice.h"
 
 #include "libobd/parameters/testroutine.h"
-#include "libobd/powertrain/sensorpids.h"
 #include "libobd/service/builtservice.h"
 
 #include <obd/iecu.h>
 #include <obd/nack.h>
+#include <obd/sensorpids.h>
 
 #include <algorithm>
 #include <iterator>

@@ -1,7 +1,6 @@
 #include "libobd/service/sensorset.h"
 
 #include "libobd/powertrain/boostpressure.h"
-#include "libobd/powertrain/sensorpids.h"
 #include "libobd/service/sensormodels.h"
 
 #include <obd/iecu.h>
@@ -9,6 +8,7 @@
 #include <obd/parameterfactory.h>
 #include <obd/powertrainparameter.h>
 #include <obd/sensorinfo.h>
+#include <obd/sensorpids.h>
 #include <obd/sensorvalue.h>
 #include <obd/sensorvaluedatamodel.h>
 

@@ -4,12 +4,12 @@
 #include "libobd/parameters/troublecodelists.h"
 #include "libobd/powertrain/monitorstatus.h"
 #include "libobd/powertrain/numericparameters.h"
-#include "libobd/powertrain/sensorpids.h"
 #include "libobd/service/builtservice.h"
 #include "libobd/service/sensormodels.h"
 
 #include <common/tracestream.h>
 #include <obd/parameterdescriptor.h>
+#include <obd/sensorpids.h>
 
 namespace obd {
 

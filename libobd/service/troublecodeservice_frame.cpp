@@ -1,7 +1,6 @@
 // What a freeze frame holds.
 
 #include "libobd/powertrain/freezeframetroublecode.h"
-#include "libobd/powertrain/sensorpids.h"
 #include "libobd/service/sensormodels.h"
 #include "libobd/service/troublecodeservice.h"
 
@@ -9,6 +8,7 @@
 #include <common/tracestream.h>
 #include <obd/parameterdescriptor.h>
 #include <obd/parameterfactory.h>
+#include <obd/sensorpids.h>
 
 namespace obd {
 namespace {

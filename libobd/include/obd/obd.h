@@ -60,11 +60,13 @@
 #include <obd/parameteridentifier.h>
 #include <obd/performancecounterdatamodel.h>
 #include <obd/powertrainparameter.h>
+#include <obd/protocolfamily.h>
 #include <obd/readinessmonitordatamodel.h>
 #include <obd/responsemap.h>
 #include <obd/sensordatamodel.h>
 #include <obd/sensordescriptor.h>
 #include <obd/sensorinfo.h>
+#include <obd/sensorpids.h>
 #include <obd/sensorvalue.h>
 #include <obd/sensorvaluedatamodel.h>
 #include <obd/serialdescriptor.h>

@@ -19,4 +19,11 @@ struct OxygenSensorMonitorDataModel
     MeasurementUnit unit{UnitNone};
 };
 
+/// The tests 01 to 04 of service 05 are thresholds that the module works with, not results: they have no limits (SAE
+/// J1979).
+constexpr bool isConstantTest(int tid)
+{
+    return tid >= 0x01 && tid <= 0x04;
+}
+
 } // namespace obd

@@ -1,7 +1,6 @@
 // Trouble codes out of what real cars and bench simulators sent.
 
 #include "libobd/bytes/hexformat.h"
-#include "libobd/message/protocolfamily.h"
 #include "libobd/parameters/cleartroublecodes.h"
 #include "libobd/parameters/troublecodelists.h"
 #include "libobd/powertrain/freezeframetroublecode.h"
@@ -11,6 +10,8 @@
 #include "tests/support/hexbytes.h"
 #include "tests/support/payloadfile.h"
 #include "tests/support/tablefile.h"
+
+#include <obd/protocolfamily.h>
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>

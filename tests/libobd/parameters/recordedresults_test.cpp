@@ -2,7 +2,6 @@
 // the parser, to what a user reads.
 
 #include "libobd/bytes/hexformat.h"
-#include "libobd/message/protocolfamily.h"
 #include "libobd/parameters/calibrationids.h"
 #include "libobd/parameters/calibrationverificationnumbers.h"
 #include "libobd/parameters/ecuname.h"
@@ -13,6 +12,8 @@
 #include "tests/support/fakeecu.h"
 #include "tests/support/recordedreply.h"
 #include "tests/support/tablefile.h"
+
+#include <obd/protocolfamily.h>
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
