@@ -90,8 +90,65 @@ CommandReply canMask(CommandContext& context, std::string const& argument)
 /// Filter and mask in one; without an address back to hearing all.
 CommandReply canAddress(CommandContext& context, std::string const& argument)
 {
-    context.settings.canFilter = parseHexNumber(argument);
+    context.settings.canFilter.reset();
     context.settings.canMask.reset();
+    if (argument.empty()) {
+        return ok();
+    }
+    std::string filter = argument;
+    std::string mask = argument;
+    for (std::size_t i = 0; i < argument.size(); ++i) {
+        bool const any = argument[i] == 'X';
+        filter[i] = any ? '0' : argument[i];
+        mask[i] = any ? '0' : 'F';
+    }
+    context.settings.canFilter = parseHexNumber(filter);
+    context.settings.canMask = parseHexNumber(mask);
+    return ok();
+}
+
+CommandReply extendedAddress(CommandContext& context, std::string const& argument)
+{
+    context.settings.extendedAddress.reset();
+    if (auto const address = parseHex(argument); address && !address->empty()) {
+        context.settings.extendedAddress = (*address)[0];
+    }
+    return ok();
+}
+
+CommandReply testerAddress(CommandContext& context, std::string const& argument)
+{
+    context.settings.testerAddress = static_cast<std::uint8_t>(parseHexNumber(argument).value_or(0));
+    return ok();
+}
+
+CommandReply flowHeader(CommandContext& context, std::string const& argument)
+{
+    context.settings.flowHeader = parseHexNumber(argument);
+    return ok();
+}
+
+/// One to five bytes (ELM327 data sheet v2.1, "FC SD").
+CommandReply flowData(CommandContext& context, std::string const& argument)
+{
+    constexpr std::size_t most = 5;
+    auto const data = parseHex(argument);
+    if (!data || data->empty() || data->size() > most) {
+        return refused();
+    }
+    context.settings.flowData = *data;
+    return ok();
+}
+
+/// A mode of one's own needs what it is to send first.
+CommandReply flowMode(CommandContext& context, std::string const& argument)
+{
+    int const mode = argument[0] - '0';
+    bool const lacks = (mode == 1 && !context.settings.flowHeader) || (mode != 0 && context.settings.flowData.empty());
+    if (lacks) {
+        return refused();
+    }
+    context.settings.flowMode = mode;
     return ok();
 }
 

@@ -10,14 +10,21 @@ namespace obdsim {
 
 namespace {
 
-bool isFirstFrame(Frame const& frame)
+/// The PCI byte of a CAN frame, behind the address byte where there is one.
+std::uint8_t pciOf(Frame const& frame, bool extended)
 {
-    return !frame.data.empty() && frame.data[0] >> 4 == 0x1;
+    const std::size_t at = extended ? 1 : 0;
+    return frame.data.size() > at ? frame.data[at] : std::uint8_t{0};
 }
 
-bool isConsecutiveFrame(Frame const& frame)
+bool isFirstFrame(Frame const& frame, bool extended)
 {
-    return !frame.data.empty() && frame.data[0] >> 4 == 0x2;
+    return pciOf(frame, extended) >> 4 == 0x1;
+}
+
+bool isConsecutiveFrame(Frame const& frame, bool extended)
+{
+    return pciOf(frame, extended) >> 4 == 0x2;
 }
 
 std::size_t serialBytes(Frame const& frame)
@@ -37,10 +44,11 @@ std::vector<TimedFrame> schedule(Vehicle const& vehicle, std::vector<ModuleMessa
         const std::uint32_t lane = isCan(protocol) ? message.source : 0;
         const Time gap = message.frameGap.value_or(protocol.frameGap);
         Time time = std::max(at + message.delay, freeAt[lane]);
-        for (auto& frame : frameReply(protocol, message.source, everyone, message.payload, vehicle.padding())) {
+        for (auto& frame :
+             frameReply(protocol, message.source, everyone, message.payload, vehicle.padding(), message.tester)) {
             // Behind a first frame the module awaits the adapter's flow control, and takes its time to heed it.
             const Time flowControl = canFrameTime(protocol, 8) + 2 * gap;
-            bool const waits = isCan(protocol) && isFirstFrame(frame);
+            bool const waits = isCan(protocol) && isFirstFrame(frame, message.tester.has_value());
             time += isCan(protocol) ? canFrameTime(protocol, frame.data.size())
                                     : receivingTime(protocol, serialBytes(frame));
             frames.push_back({time, std::move(frame)});
@@ -51,16 +59,64 @@ std::vector<TimedFrame> schedule(Vehicle const& vehicle, std::vector<ModuleMessa
     return frames;
 }
 
-/// The filters of the host. Without flow control a module sends no frame behind
-/// the first one of a message.
+/// The filters of the host. Without any an ELM327 takes the replies of OBD modules only: 7E8 to 7EF, 18DAF1xx. With an
+/// extended address it drops frames whose first byte is not the tester's (ATTA).
 bool passes(Protocol const& protocol, Settings const& settings, Frame const& frame)
 {
     if (!isCan(protocol)) {
         return !settings.receiveAddress || *settings.receiveAddress == frame.source;
     }
-    const std::uint32_t mask = settings.canMask.value_or(settings.canFilter ? 0x1FFFFFFF : 0);
-    bool const wanted = (frame.source & mask) == (settings.canFilter.value_or(0) & mask);
-    return wanted && (settings.flowControl || !isConsecutiveFrame(frame));
+    bool const ours = !settings.extendedAddress || (!frame.data.empty() && frame.data[0] == settings.testerAddress);
+    if (!settings.canFilter && !settings.canMask) {
+        bool const short11 = protocol.family == BusFamily::Can11;
+        return ours && (short11 ? (frame.source & 0x7F8) == 0x7E8 : (frame.source & 0x1FFFFF00) == 0x18DAF100);
+    }
+    const std::uint32_t mask = settings.canMask.value_or(0x1FFFFFFF);
+    return ours && (frame.source & mask) == (settings.canFilter.value_or(0) & mask);
+}
+
+/// The identifier to which an adapter sends flow control by itself. For replies that are no OBD module's it takes that
+/// of the reply, which no module heeds.
+std::uint32_t automaticFlowHeader(Protocol const& protocol, std::uint32_t reply)
+{
+    if (protocol.family == BusFamily::Can11) {
+        return (reply & 0x7F8) == 0x7E8 ? reply - 8 : reply;
+    }
+    bool const obd = (reply & 0x1FFFFF00) == 0x18DAF100;
+    return obd ? 0x18DA00F1 | (reply & 0xFF) << 8 : reply;
+}
+
+std::uint32_t requestIdentifier(Protocol const& protocol, ModuleData const& module)
+{
+    const std::uint32_t usual = protocol.family == BusFamily::Can11
+                                    ? module.id - 8
+                                    : (module.id & 0xFFFF0000U) | (module.id & 0xFF) << 8 | (module.id >> 8 & 0xFF);
+    return module.request.value_or(usual);
+}
+
+/// How many consecutive frames a module sends upon the flow control of the adapter for its first frame: it heeds only
+/// what comes to its own identifier and address. An adapter answers a first frame once, so a block size ends the
+/// message.
+int allowedFrames(Protocol const& protocol, Settings const& settings, ModuleData const& module)
+{
+    constexpr int all = 0xFFF;
+    if (!settings.flowControl) {
+        return 0;
+    }
+    std::uint32_t header = settings.flowMode == 2 ? module.id : automaticFlowHeader(protocol, module.id);
+    Bytes data = {0x30, 0x00, 0x00};
+    if (settings.flowMode != 0) {
+        header = settings.flowMode == 1 ? settings.flowHeader.value_or(0) : header;
+        data = settings.flowData;
+    }
+    if (module.address) {
+        bool const addressed = !data.empty() && data[0] == *module.address;
+        data = addressed ? Bytes(data.begin() + 1, data.end()) : Bytes();
+    }
+    if (header != requestIdentifier(protocol, module) || data.empty() || data[0] != 0x30) {
+        return 0;
+    }
+    return data.size() < 2 || data[1] == 0 ? all : data[1];
 }
 
 /// The bytes of the header in the length that the bus has.
@@ -79,9 +135,9 @@ Bytes headerOf(Protocol const& protocol, Settings const& settings)
     return header;
 }
 
-bool isPending(Protocol const& protocol, Frame const& frame)
+bool isPending(Protocol const& protocol, Frame const& frame, bool extended)
 {
-    const std::size_t first = isCan(protocol) ? 1 : 0;
+    const std::size_t first = (isCan(protocol) ? 1U : 0U) + (extended ? 1U : 0U);
     return frame.data.size() > first + 2 && frame.data[first] == 0x7F && frame.data[first + 2] == 0x78;
 }
 
@@ -100,6 +156,7 @@ BusWire::BusWire(std::shared_ptr<Vehicle> vehicle, AdapterProfile const& profile
 void BusWire::forget()
 {
     m_frames.clear();
+    m_allowed.clear();
     m_timer.forget();
 }
 
@@ -135,7 +192,10 @@ Time BusWire::send(BusRequest const& request, Settings const& settings, Time at)
     }
     bool const wrapped = settings.formatting || m_profile.quirks.has(Quirk::FormattingStuck) || !isCan(bus);
     auto const data = wrapped ? std::optional<Bytes>(asked) : unwrapSingleFrame(asked);
-    auto const target = targetOf(bus, headerOf(bus, settings));
+    auto target = targetOf(bus, headerOf(bus, settings));
+    if (target && isCan(bus)) {
+        target->address = settings.extendedAddress;
+    }
     if (data && target) {
         auto frames = schedule(*m_vehicle, m_vehicle->request(*target, *data, sent), target->everyone, sent);
         m_frames.insert(m_frames.end(), std::make_move_iterator(frames.begin()), std::make_move_iterator(frames.end()));
@@ -160,17 +220,18 @@ void BusWire::listen(BusRequest const& request, Settings const& settings, BusRep
     auto next = m_frames.begin();
     for (; next != m_frames.end() && next->time <= deadline && !counter.isEnough(); ++next) {
         m_busyUntil = next->time;
-        if (!passes(bus, settings, next->frame)) {
+        Frame const& frame = next->frame;
+        if (!passes(bus, settings, frame) || !isSent(frame, settings)) {
             continue;
         }
         reply.texts.push_back({next->time - now, writer.lines(next->frame)});
         Time& before = heard.try_emplace(next->frame.source, sent).first->second;
         bool const keptWaiting = promised.erase(next->frame.source) != 0;
-        if (!keptWaiting && !isConsecutiveFrame(next->frame)) {
+        if (!keptWaiting && !isConsecutiveFrame(frame, settings.extendedAddress.has_value())) {
             slowest = std::max(slowest, next->time - before);
         }
         before = next->time;
-        if (isPending(bus, next->frame)) {
+        if (isPending(bus, frame, settings.extendedAddress.has_value())) {
             promised[next->frame.source] = next->time + pendingWait(settings);
         }
         deadline = next->time + m_timer.wait(settings);
@@ -188,6 +249,22 @@ void BusWire::listen(BusRequest const& request, Settings const& settings, BusRep
     if (!anything) {
         reply.texts.push_back({reply.end, "NO DATA\r"});
     }
+}
+
+/// A consecutive frame comes only upon flow control that its module heeds.
+bool BusWire::isSent(Frame const& frame, Settings const& settings)
+{
+    Protocol const& bus = m_vehicle->protocol();
+    Module const* module = isCan(bus) ? m_vehicle->findModule(frame.source) : nullptr;
+    if (module == nullptr) {
+        return true;
+    }
+    bool const extended = module->data().address.has_value();
+    int& allowed = m_allowed[frame.source];
+    if (isFirstFrame(frame, extended)) {
+        allowed = allowedFrames(bus, settings, module->data());
+    }
+    return !isConsecutiveFrame(frame, extended) || allowed-- > 0;
 }
 
 /// The wait behind 7F xx 78: the chips of v2.1 and later know what it means and wait 5 s, but on ISO 9141-2 (data sheet

@@ -52,13 +52,15 @@ private:
     Time free(Time at) const;
     Time send(BusRequest const& request, Settings const& settings, Time at);
     void listen(BusRequest const& request, Settings const& settings, BusReply& reply, Time now, Time sent);
+    bool isSent(Frame const& frame, Settings const& settings);
     Time pendingWait(Settings const& settings) const;
 
     std::shared_ptr<Vehicle> m_vehicle;
     AdapterProfile const& m_profile;
     ReplyTimer m_timer;
-    std::vector<TimedFrame> m_frames; ///< under way, in the order of time; a late one answers the next request
-    Time m_busyUntil{};               ///< the last byte on the wire
+    std::vector<TimedFrame> m_frames;       ///< under way, in the order of time; a late one answers the next request
+    std::map<std::uint32_t, int> m_allowed; ///< consecutive frames that flow control has left, by module
+    Time m_busyUntil{};                     ///< the last byte on the wire
 };
 
 } // namespace obdsim

@@ -41,12 +41,12 @@ const Command commands[] = {
     {"BRD", "hh", 12, hasBaudRate, baudRate},
     {"BRT", "hh", 12, hasBaudRate, baudWait},
     {"CAF", "f", 10, all, onOff<&Settings::formatting>},
-    {"CEA", "|hh", 14, all, accept},
+    {"CEA", "|hh", 14, all, extendedAddress},
     {"CF", "hhh|hhhhhhhh", 10, all, canFilter},
     {"CFC", "f", 10, all, onOff<&Settings::flowControl>},
     {"CM", "hhh|hhhhhhhh", 10, all, canMask},
     {"CP", "hh", 10, all, priority},
-    {"CRA", "|hhh|hhhhhhhh", 13, all, canAddress},
+    {"CRA", "|xxx|xxxxxxxx", 13, all, canAddress},
     {"CS", "", 10, all, canStatus},
     {"CSM", "f", 14, all, accept},
     {"CV", "hhhh", 10, all, accept},
@@ -56,9 +56,9 @@ const Command commands[] = {
     {"DP", "", 10, all, describeProtocol},
     {"DPN", "", 10, notDiamex, protocolNumber},
     {"E", "f", 10, all, onOff<&Settings::echo>},
-    {"FCSD", "*", 11, all, accept},
-    {"FCSH", "hhh|hhhhhhhh", 11, all, accept},
-    {"FCSM", "t", 11, all, accept},
+    {"FCSD", "*", 11, all, flowData},
+    {"FCSH", "hhh|hhhhhhhh", 11, all, flowHeader},
+    {"FCSM", "t", 11, all, flowMode},
     {"FE", "", 13, all, accept},
     {"FI", "", 14, all, fastInit},
     {"H", "f", 10, all, onOff<&Settings::headers>},
@@ -99,7 +99,7 @@ const Command commands[] = {
     {"SS", "", 14, all, accept},
     {"ST", "h|hh", 10, all, timeout},
     {"SW", "h|hh", 10, all, accept},
-    {"TA", "hh", 14, all, accept},
+    {"TA", "hh", 14, all, testerAddress},
     {"TP", "h|Ah", 10, elm, tryProtocol},
     {"V", "f", 13, all, accept},
     {"WM", "*", 10, all, accept},
@@ -113,6 +113,8 @@ bool fits(char token, char character)
     switch (token) {
     case 'h':
         return isHexDigit(character);
+    case 'x':
+        return isHexDigit(character) || character == 'X';
     case 'f':
         return character == '0' || character == '1';
     case 't':

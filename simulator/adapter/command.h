@@ -36,7 +36,7 @@ using CommandHandler = CommandReply (*)(CommandContext& context, std::string con
 /// One AT command.
 ///
 /// `shape` tells what may follow the name, alternatives divided by "|": h stands
-/// for a hexadecimal digit, f for 0 or 1, t for 0 to 2, * for any hexadecimal
+/// for a hexadecimal digit, x for one or X, f for 0 or 1, t for 0 to 2, * for any hexadecimal
 /// digits, any other character for itself.
 struct Command
 {

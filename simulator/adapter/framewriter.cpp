@@ -44,8 +44,12 @@ std::string FrameWriter::canLines(Frame const& frame) const
 }
 
 /// Headers off: the PCI bytes become a length line and line numbers.
-std::string FrameWriter::formattedCan(Frame const& frame) const
+std::string FrameWriter::formattedCan(Frame const& whole) const
 {
+    Frame frame = whole;
+    if (m_settings.extendedAddress) {
+        frame.data = from(frame.data, 1);
+    }
     if (kind(frame) == singleFrame) {
         return text(from(withoutPadding(frame.data), 1)) + "\r";
     }

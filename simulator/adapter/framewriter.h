@@ -18,7 +18,7 @@ public:
 
 private:
     std::string canLines(Frame const& frame) const;
-    std::string formattedCan(Frame const& frame) const;
+    std::string formattedCan(Frame const& whole) const;
     std::string serialLine(Frame const& frame) const;
     std::string header(Frame const& frame) const;
     std::string text(Bytes const& bytes) const;

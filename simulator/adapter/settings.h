@@ -24,8 +24,13 @@ struct Settings
     std::uint8_t priority = 0x18; ///< ATCP, first byte of 29-bit headers of three bytes
     std::optional<std::uint32_t> canFilter;
     std::optional<std::uint32_t> canMask;
-    std::optional<std::uint8_t> receiveAddress; ///< ATSR, the buses without CAN
-    Time baudWait = Ms(75);                     ///< ATBRT
+    std::optional<std::uint8_t> extendedAddress; ///< ATCEA
+    std::uint8_t testerAddress = 0xF1;           ///< ATTA
+    int flowMode = 0;                            ///< ATFCSM
+    std::optional<std::uint32_t> flowHeader;     ///< ATFCSH
+    Bytes flowData;                              ///< ATFCSD
+    std::optional<std::uint8_t> receiveAddress;  ///< ATSR, the buses without CAN
+    Time baudWait = Ms(75);                      ///< ATBRT
 
     /// In steps of 4.096 ms (ELM327 data sheet v2.1, page 69, programmable parameter 03).
     Time timeout() const { return std::chrono::microseconds(4096) * (timeoutTicks == 0 ? defaultTicks : timeoutTicks); }

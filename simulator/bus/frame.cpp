@@ -41,8 +41,14 @@ Bytes slice(Bytes const& bytes, std::size_t from, std::size_t count)
     return {bytes.begin() + static_cast<std::ptrdiff_t>(from), bytes.begin() + static_cast<std::ptrdiff_t>(end)};
 }
 
-Frame canFrame(Protocol const& protocol, std::uint32_t source, Bytes pci, Bytes const& part, Padding padding)
+using Tester = std::optional<std::uint8_t>;
+
+Frame canFrame(Protocol const& protocol, std::uint32_t source, Tester first, Bytes pci, Bytes const& part,
+               Padding padding)
 {
+    if (first) {
+        pci.insert(pci.begin(), *first);
+    }
     pci.insert(pci.end(), part.begin(), part.end());
     if (padding) {
         pci.resize(canDataSize, *padding);
@@ -50,20 +56,23 @@ Frame canFrame(Protocol const& protocol, std::uint32_t source, Bytes pci, Bytes 
     return {source, bigEndian(source, protocol.family == BusFamily::Can11 ? 2 : 4), std::move(pci), std::nullopt};
 }
 
-std::vector<Frame> canReply(Protocol const& protocol, std::uint32_t source, Bytes const& payload, Padding padding)
+std::vector<Frame> canReply(Protocol const& protocol, std::uint32_t source, Bytes const& payload, Padding padding,
+                            Tester own)
 {
-    if (payload.size() <= nextFramePayload) {
+    const std::size_t address = own ? 1 : 0;
+    if (payload.size() + address <= nextFramePayload) {
         auto const length = static_cast<std::uint8_t>(payload.size());
-        return {canFrame(protocol, source, {length}, payload, padding)};
+        return {canFrame(protocol, source, own, {length}, payload, padding)};
     }
     const Bytes lengthPci = {static_cast<std::uint8_t>(0x10 | payload.size() >> 8),
                              static_cast<std::uint8_t>(payload.size() & 0xFF)};
-    std::vector<Frame> frames = {
-        canFrame(protocol, source, lengthPci, slice(payload, 0, firstFramePayload), std::nullopt)};
+    const std::size_t first = firstFramePayload - address;
+    const std::size_t next = nextFramePayload - address;
+    std::vector<Frame> frames = {canFrame(protocol, source, own, lengthPci, slice(payload, 0, first), std::nullopt)};
     std::uint8_t sequence = 1;
-    for (std::size_t at = firstFramePayload; at < payload.size(); at += nextFramePayload) {
+    for (std::size_t at = first; at < payload.size(); at += next) {
         auto const pci = static_cast<std::uint8_t>(0x20 | (sequence++ & 0x0F));
-        frames.push_back(canFrame(protocol, source, {pci}, slice(payload, at, nextFramePayload), padding));
+        frames.push_back(canFrame(protocol, source, own, {pci}, slice(payload, at, next), padding));
     }
     return frames;
 }
@@ -109,9 +118,9 @@ Frame serialReply(Protocol const& protocol, std::uint32_t source, bool everyone,
 std::optional<Target> target11(std::uint32_t id)
 {
     if (id == functional11) {
-        return Target{true, 0};
+        return Target{true, 0, id};
     }
-    return Target{false, id + replyOffset11};
+    return Target{false, id + replyOffset11, id};
 }
 
 std::optional<Target> target29(std::uint32_t id)
@@ -119,12 +128,11 @@ std::optional<Target> target29(std::uint32_t id)
     // ISO 15765-4: functional 18 DB tt ss, physical 18 DA tt ss; the reply swaps them.
     const std::uint32_t kind = id >> 16 & 0xFF;
     if (kind == 0xDB) {
-        return Target{true, 0};
+        return Target{true, 0, id};
     }
-    if (kind == 0xDA) {
-        return Target{false, (id & 0xFFFF0000U) | (id & 0xFF) << 8 | (id >> 8 & 0xFF)};
-    }
-    return std::nullopt;
+    // Other identifiers reach a module that listens to them.
+    const std::uint32_t reply = (id & 0xFFFF0000U) | (id & 0xFF) << 8 | (id >> 8 & 0xFF);
+    return Target{false, kind == 0xDA ? reply : 0, id};
 }
 
 std::optional<Target> targetOnWire(Protocol const& protocol, Bytes const& header)
@@ -170,10 +178,10 @@ std::optional<Target> targetOf(Protocol const& protocol, Bytes const& header)
 }
 
 std::vector<Frame> frameReply(Protocol const& protocol, std::uint32_t source, bool everyone, Bytes const& payload,
-                              Padding padding)
+                              Padding padding, Tester own)
 {
     if (isCan(protocol)) {
-        return canReply(protocol, source, payload, padding);
+        return canReply(protocol, source, payload, padding, own);
     }
     return {serialReply(protocol, source, everyone, payload)};
 }

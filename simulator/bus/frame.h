@@ -19,8 +19,10 @@ struct Frame
 /// Whom a request is for.
 struct Target
 {
-    bool everyone = false;    ///< functional addressing
-    std::uint32_t module = 0; ///< otherwise: the id under which that module answers
+    bool everyone = false;                    ///< functional addressing
+    std::uint32_t module = 0;                 ///< otherwise: the id under which that module answers
+    std::uint32_t identifier = 0;             ///< on CAN: of the request
+    std::optional<std::uint8_t> address = {}; ///< extended address of the request
 };
 
 /// Value of the bytes that fill a CAN frame up to eight; none: short frames.
@@ -35,8 +37,9 @@ std::optional<Target> targetOf(Protocol const& protocol, Bytes const& header);
 
 /// The frames in which a module sends `payload`.
 /// `everyone`: the request had been to all modules. `padding` matters on CAN only.
+/// `tester`: first byte of each frame of a module with an extended address.
 std::vector<Frame> frameReply(Protocol const& protocol, std::uint32_t source, bool everyone, Bytes const& payload,
-                              Padding padding);
+                              Padding padding, std::optional<std::uint8_t> tester = std::nullopt);
 
 /// The service bytes of a request's CAN data field (ISO 15765-2 single frame);
 /// nothing if it is no single frame.

@@ -32,6 +32,11 @@ constexpr HeldRow heldRows[] = {
     {"fuel-rate", &DriveState::fuelLitresPerHour},
     {"fuel-level", &DriveState::fuelLevelPercent},
     {"odometer", &DriveState::odometerKm},
+    {"gearbox", &DriveState::gearboxCelsius},
+    {"battery", &DriveState::batteryPercent},
+    {"battery-volts", &DriveState::batteryVolts},
+    {"battery-amps", &DriveState::batteryAmps},
+    {"battery-temperature", &DriveState::batteryCelsius},
 };
 
 /// A standing engine: nothing turns, nothing flows, the battery is alone.
@@ -110,6 +115,16 @@ bool Drive::hold(std::string const& name, std::optional<double> value)
         m_held.erase(name);
     }
     return known;
+}
+
+std::optional<double> Drive::value(DriveState const& state, std::string const& name)
+{
+    for (auto const& row : heldRows) {
+        if (row.name == name) {
+            return state.*row.member;
+        }
+    }
+    return std::nullopt;
 }
 
 std::vector<std::string> Drive::names()

@@ -29,6 +29,9 @@ public:
     /// Keeps a value whatever the drive does; false if there is none of that name. Nothing lets it go.
     bool hold(std::string const& name, std::optional<double> value);
 
+    /// A value of a moment by the name that hold() has for it; nothing for any other name.
+    static std::optional<double> value(DriveState const& state, std::string const& name);
+
     /// The names of hold().
     static std::vector<std::string> names();
 

@@ -77,7 +77,19 @@ DriveState DriveModel::at(Time time) const
     addAir(state);
     addTemperatures(state);
     addMixture(state);
+    addBattery(state);
     return state;
+}
+
+void DriveModel::addBattery(DriveState& state) const
+{
+    double const t = std::fmod(state.seconds, cycle);
+    bool const braking = t > brakeAt && t < standAt;
+    state.gearboxCelsius = warmUp(m_engine.ambientCelsius + 4, 82, state.seconds, 260);
+    state.batteryPercent = std::max(5.0, 78 - state.kilometres * 0.22);
+    state.batteryAmps = braking ? -state.speedKmh * 0.9 : 4 + state.loadPercent * state.speedKmh * 0.02;
+    state.batteryVolts = 330 + state.batteryPercent * 0.6 - state.batteryAmps * 0.08;
+    state.batteryCelsius = warmUp(m_engine.ambientCelsius, m_engine.ambientCelsius + 9, state.seconds, 900);
 }
 
 void DriveModel::addMotion(DriveState& state) const

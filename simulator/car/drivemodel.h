@@ -51,6 +51,11 @@ struct DriveState
     double barometricKpa = 0;
     double kilometres = 0; ///< driven since the start
     double odometerKm = 0;
+    double gearboxCelsius = 0;
+    double batteryPercent = 0; ///< of the driving battery of an electric car; likewise the next three
+    double batteryVolts = 0;
+    double batteryAmps = 0; ///< negative: it is charged
+    double batteryCelsius = 0;
     bool closedLoop = true;
 };
 
@@ -68,6 +73,7 @@ private:
     void addAir(DriveState& state) const;
     void addTemperatures(DriveState& state) const;
     void addMixture(DriveState& state) const;
+    void addBattery(DriveState& state) const;
 
     EngineData m_engine;
 };

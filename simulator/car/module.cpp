@@ -31,6 +31,9 @@ Module::Module(ModuleData data, bool compression, Drive const& drive, DataLayout
 
 Answer Module::answer(Bytes const& request, Time now)
 {
+    if (auto const refused = m_data.refusals.find(request); refused != m_data.refusals.end()) {
+        return {refused->second, {}};
+    }
     if (auto const recorded = m_data.raw.find(request); recorded != m_data.raw.end()) {
         return {0, recorded->second};
     }
@@ -68,6 +71,11 @@ std::optional<Bytes> Module::currentData(std::uint8_t pid, Time now) const
         return changed->second;
     }
     return data(pid, m_drive.at(now));
+}
+
+DriveState Module::drive(Time now) const
+{
+    return m_drive.at(now);
 }
 
 std::optional<Bytes> Module::keptData(std::uint8_t pid, Time then) const
@@ -146,6 +154,7 @@ void Module::clear(Time now)
 {
     m_data.stored.clear();
     m_data.pending.clear();
+    m_data.udsCodes.clear();
     for (auto& frame : m_data.frames) {
         frame.code = 0;
     }

@@ -54,6 +54,8 @@ public:
     /// The same of a moment that the module has kept: what was changed by hand is not in it.
     std::optional<Bytes> keptData(std::uint8_t pid, Time then) const;
 
+    DriveState drive(Time now) const;
+
     /// Adds a trouble code, with the lamp for a stored one.
     void addCode(CodeKind kind, std::uint16_t code);
 

@@ -79,7 +79,7 @@ struct VehicleInfo
 /// A request whose answer is announced by 7F xx 78 first.
 struct Pending
 {
-    int times = 1;
+    int times = 1;        ///< 0: it is only late
     Time delay = Ms(100); ///< before each further message
 };
 
@@ -91,10 +91,39 @@ enum class MorePids : int
     First    ///< answers as many as it takes
 };
 
+/// A value of the drive within the data of a signal: value * scale + offset, high byte first.
+struct SignalField
+{
+    std::size_t at = 0; ///< first byte of it
+    std::size_t bytes = 1;
+    std::string value; ///< a name of Drive::value()
+    double scale = 1;
+    double offset = 0;
+};
+
+/// Data that a module tells beyond OBD by one request, such as 22 1E1C.
+struct SignalData
+{
+    Bytes data; ///< behind the echo of the request
+    std::vector<SignalField> fields;
+};
+
+/// A trouble code of service 19 (ISO 14229-1): two bytes as in service 03, the failure type, the status.
+struct UdsCode
+{
+    std::uint16_t code = 0;
+    std::uint8_t failureType = 0;
+    std::uint8_t status = 0;
+};
+
 /// All that a vehicle file says of one control module.
 struct ModuleData
 {
-    std::uint32_t id = 0; ///< CAN identifier of its replies, or its address
+    std::uint32_t id = 0;                 ///< CAN identifier of its replies, or its address
+    std::optional<std::uint32_t> request; ///< CAN identifier that it listens to; else the usual one of id
+    std::optional<std::uint8_t> address;  ///< extended address: first byte of the frames to it
+    std::uint8_t tester = 0xF1;           ///< with an extended address: first byte of its own frames
+    bool functional = true;               ///< answers requests to all modules
     Time latency = Ms(15);
     std::optional<Time> frameGap; ///< between the frames of a long message on CAN; else as usual on that bus
     int mostPids = 6;             ///< in one request of service 01
@@ -120,6 +149,10 @@ struct ModuleData
     VehicleInfo info;
     std::map<Bytes, std::vector<Bytes>> raw; ///< recorded messages by request
     std::map<Bytes, Pending> delays;
+    std::map<Bytes, std::uint8_t> refusals; ///< response codes by request
+    std::map<Bytes, SignalData> signals;    ///< by request: service 22 with identifier, 21 or 1A with local identifier
+    bool uds = false;                       ///< answers services 3E and 19
+    std::vector<UdsCode> udsCodes;
 };
 
 /// A whole vehicle file.

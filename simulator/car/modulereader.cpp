@@ -1,5 +1,6 @@
 #include "simulator/car/modulereader.h"
 
+#include "simulator/car/drive.h"
 #include "simulator/car/livepids.h"
 #include "simulator/car/monitornames.h"
 
@@ -191,21 +192,88 @@ void readRecordedOf(ModuleData& module, TableReader& table)
     });
     table.table("delays", [&](TableReader& delays) {
         delays.tableEntries([&](const Bytes& request, TableReader& delay) {
-            module.delays[request] = {delay.integer("times", 1, 100, 1),
+            module.delays[request] = {delay.integer("times", 0, 100, 1),
                                       Ms(delay.integer("milliseconds", 0, longestDelayMs, 100))};
         });
     });
 }
 
-std::uint32_t readId(TableReader& table, Protocol const& protocol)
+SignalField readField(TableReader& table, std::size_t size)
 {
-    const std::string text = table.text("id");
+    constexpr int mostBytes = 4;
+    SignalField field;
+    field.bytes = static_cast<std::size_t>(table.integer("bytes", 1, mostBytes, 1));
+    field.at = static_cast<std::size_t>(table.integer("at", 0, 0xFFF));
+    field.value = table.text("value");
+    field.scale = table.number("scale", 1);
+    field.offset = table.number("offset", 0);
+    if (field.at + field.bytes > size) {
+        table.fail("at", "the field ends behind the data");
+    }
+    if (!Drive::value(DriveState{}, field.value)) {
+        table.fail("value", "the drive has no \"" + field.value + "\"");
+    }
+    return field;
+}
+
+void readSignal(ModuleData& module, TableReader& table)
+{
+    const Bytes request = table.bytes("request");
+    bool const local = request.size() == 2 && (request[0] == 0x21 || request[0] == 0x1A);
+    bool const identifier = request.size() == 3 && request[0] == 0x22;
+    if (!local && !identifier) {
+        table.fail("request", "a signal is asked by 22 and two bytes, or by 21 or 1A and one");
+    }
+    SignalData signal;
+    signal.data = table.has("text") ? Bytes() : table.bytes("data");
+    for (char const each : table.text("text", "")) {
+        signal.data.push_back(static_cast<std::uint8_t>(each));
+    }
+    table.tables("fields", [&](TableReader& field) { signal.fields.push_back(readField(field, signal.data.size())); });
+    module.signals[request] = std::move(signal);
+}
+
+/// What a module tells beyond OBD.
+void readUdsOf(ModuleData& module, TableReader& table)
+{
+    module.uds = table.flag("uds", false);
+    table.tables("signals", [&](TableReader& signal) { readSignal(module, signal); });
+    table.tables("uds_codes", [&](TableReader& code) {
+        const std::uint16_t number = readCode(code, "code", code.text("code"));
+        const std::uint8_t type = code.byte("type");
+        module.udsCodes.push_back({number, type, code.byte("status")});
+    });
+    table.table("refusals", [&](TableReader& refusals) {
+        refusals.entries([&](Bytes const& request, std::vector<Bytes> const& codes) {
+            if (codes.size() != 1 || codes[0].size() != 1) {
+                refusals.fail(hexText(request), "a refusal is one response code");
+            }
+            module.refusals[request] = codes[0][0];
+        });
+    });
+}
+
+std::uint32_t readId(TableReader& table, Protocol const& protocol, std::string const& key)
+{
+    const std::string text = table.text(key);
     auto const id = parseHexNumber(text);
     const std::size_t digits = protocol.family == BusFamily::Can11 ? 3 : protocol.family == BusFamily::Can29 ? 8 : 2;
     if (!id || text.size() != digits) {
-        table.fail("id", "\"id\" must have " + std::to_string(digits) + " hexadecimal digits on this bus");
+        table.fail(key, "\"" + key + "\" must have " + std::to_string(digits) + " hexadecimal digits on this bus");
     }
     return *id;
+}
+
+void readAddressOf(ModuleData& module, TableReader& table, Protocol const& protocol)
+{
+    if (isCan(protocol) && table.has("request")) {
+        module.request = readId(table, protocol, "request");
+    }
+    if (isCan(protocol) && table.has("address")) {
+        module.address = table.byte("address");
+        module.tester = table.has("tester") ? table.byte("tester") : module.tester;
+    }
+    module.functional = table.flag("functional", true);
 }
 
 MorePids readMorePids(TableReader& table, bool onCan)
@@ -242,7 +310,8 @@ ModuleData readModule(TableReader& table, VehicleData const& vehicle)
 {
     Protocol const& protocol = *findProtocol(vehicle.protocol);
     ModuleData module;
-    module.id = readId(table, protocol);
+    module.id = readId(table, protocol, "id");
+    readAddressOf(module, table, protocol);
     readMannersOf(module, table, isCan(protocol));
     module.live = readLive(table);
     table.table("fixed", [&](TableReader& fixed) { module.fixed = readByteRows(fixed); });
@@ -252,6 +321,7 @@ ModuleData readModule(TableReader& table, VehicleData const& vehicle)
     readCodesOf(module, table);
     readTestsOf(module, table, isCan(protocol));
     readRecordedOf(module, table);
+    readUdsOf(module, table);
     return module;
 }
 

@@ -9,6 +9,13 @@ namespace {
 
 constexpr std::size_t range = 0x20;
 
+template <std::uint8_t service>
+bool hasSignals(ModuleData const& data)
+{
+    auto const first = data.signals.lower_bound(Bytes{service});
+    return first != data.signals.end() && first->first[0] == service;
+}
+
 const Service services[] = {
     {0x01, currentData, [](ModuleData const& d) { return !d.live.empty() || !d.fixed.empty() || d.monitors; }},
     {0x02, freezeFrame, [](ModuleData const& d) { return d.hasStored; }},
@@ -20,6 +27,11 @@ const Service services[] = {
     {0x08, runRoutine, [](ModuleData const& d) { return !d.routines.empty(); }},
     {0x09, vehicleInformation, hasVehicleInformation},
     {0x0A, permanentCodes, [](ModuleData const& d) { return d.hasPermanent; }},
+    {0x19, udsCodes, [](ModuleData const& d) { return d.uds; }},
+    {0x1A, localData, hasSignals<0x1A>},
+    {0x21, localData, hasSignals<0x21>},
+    {0x22, identifiedData, [](ModuleData const& d) { return d.uds || hasSignals<0x22>(d); }},
+    {0x3E, testerPresent, [](ModuleData const& d) { return d.uds; }},
 };
 
 } // namespace

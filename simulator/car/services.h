@@ -11,6 +11,7 @@ namespace refusal {
 constexpr std::uint8_t serviceNotSupported = 0x11;
 constexpr std::uint8_t subfunctionNotSupported = 0x12;
 constexpr std::uint8_t conditionsNotCorrect = 0x22;
+constexpr std::uint8_t outOfRange = 0x31;
 constexpr std::uint8_t pending = 0x78;
 } // namespace refusal
 
@@ -74,5 +75,11 @@ Answer runRoutine(ServiceCall const& call);
 Answer vehicleInformation(ServiceCall const& call);
 Answer permanentCodes(ServiceCall const& call);
 bool hasVehicleInformation(ModuleData const& data);
+
+// Beyond OBD: ISO 14229-1 and ISO 14230-3.
+Answer identifiedData(ServiceCall const& call);
+Answer localData(ServiceCall const& call);
+Answer testerPresent(ServiceCall const& call);
+Answer udsCodes(ServiceCall const& call);
 
 } // namespace obdsim

@@ -26,24 +26,45 @@ Pending pendingOf(ModuleData const& data, Bytes const& request)
     return found == data.delays.end() ? Pending{0, Time(0)} : found->second;
 }
 
-void tell(std::vector<ModuleMessage>& messages, Module& module, Bytes const& request, Time now)
+bool hears(ModuleData const& module, Target const& target)
 {
-    const Answer answer = module.answer(request, now);
+    bool const own = module.request ? *module.request == target.identifier : target.module == module.id;
+    return (target.everyone ? module.functional : own) && module.address == target.address;
+}
+
+/// ISO 14229-1: of what it does not know a module says nothing if all were asked.
+bool isHushed(Bytes const& request, std::uint8_t code)
+{
+    constexpr std::uint8_t firstService = 0x10;
+    return request[0] >= firstService && (code == refusal::serviceNotSupported ||
+                                          code == refusal::subfunctionNotSupported || code == refusal::outOfRange);
+}
+
+void tell(std::vector<ModuleMessage>& messages, Module& module, bool everyone, Bytes const& request, Time now)
+{
+    Answer answer = module.answer(request, now);
+    if (everyone && isHushed(request, answer.refusal)) {
+        answer.refusal = 0;
+    }
     if (answer.isSilent()) {
         return;
     }
     ModuleData const& data = module.data();
     const Pending pending = pendingOf(data, request);
-    Time delay = data.latency;
+    Time delay = data.latency + (pending.times == 0 ? pending.delay : Time(0));
+    auto const say = [&](Bytes payload) {
+        auto const tester = data.address ? std::optional(data.tester) : std::nullopt;
+        messages.push_back({data.id, delay, std::move(payload), data.frameGap, tester});
+    };
     for (int i = 0; i < pending.times; ++i) {
-        messages.push_back({data.id, delay, {negativeResponse, request[0], refusal::pending}});
+        say({negativeResponse, request[0], refusal::pending});
         delay += pending.delay;
     }
     if (answer.refusal != 0) {
-        messages.push_back({data.id, delay, {negativeResponse, request[0], answer.refusal}});
+        say({negativeResponse, request[0], answer.refusal});
     }
     for (auto const& payload : answer.messages) {
-        messages.push_back({data.id, delay, payload, data.frameGap});
+        say(payload);
     }
 }
 
@@ -125,8 +146,8 @@ std::vector<ModuleMessage> Vehicle::request(Target const& target, Bytes const& p
         return messages;
     }
     for (auto& module : m_modules) {
-        if (!module.isSilent() && (target.everyone || target.module == module.data().id)) {
-            tell(messages, module, payload, now);
+        if (!module.isSilent() && hears(module.data(), target)) {
+            tell(messages, module, target.everyone && isCan(m_protocol), payload, now);
         }
     }
     std::stable_sort(messages.begin(), messages.end(),

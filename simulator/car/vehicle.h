@@ -12,7 +12,8 @@ struct ModuleMessage
     std::uint32_t source = 0;
     Time delay{}; ///< from the end of the request
     Bytes payload;
-    std::optional<Time> frameGap = {}; ///< of the module, where it has one of its own
+    std::optional<Time> frameGap = {};       ///< of the module, where it has one of its own
+    std::optional<std::uint8_t> tester = {}; ///< first byte of its frames, with an extended address
 };
 
 /// A car: its control modules on one bus.

@@ -142,7 +142,10 @@ TEST(Frame, requestHeaderTellsWhomItIsFor)
         EXPECT_EQ(target->everyone, row.everyone) << row.header;
         EXPECT_EQ(target->module, row.module) << row.header;
     }
-    EXPECT_FALSE(obdsim::targetOf(*findProtocol(7), bytes("10 02 40 40")));
+    auto const own = obdsim::targetOf(*findProtocol(7), bytes("10 02 40 40"));
+    ASSERT_TRUE(own) << "a module may listen to it";
+    EXPECT_EQ(own->identifier, 0x10024040U);
+    EXPECT_EQ(own->module, 0U);
     EXPECT_FALSE(obdsim::targetOf(*findProtocol(6), bytes("18 DB 33 F1")));
 }
 
