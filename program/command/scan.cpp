@@ -1,4 +1,5 @@
 #include "libvelmora/read/vehiclereader.h"
+#include "libvelmora/report/reportfile.h"
 #include "program/command/commands.h"
 #include "program/command/commandsession.h"
 #include "program/command/makeoption.h"
@@ -7,10 +8,13 @@
 #include "program/view/reporttext.h"
 
 #include <velmora/error.h>
+#include <velmora/version.h>
 
+#include <fmt/chrono.h>
 #include <fmt/format.h>
 
 #include <algorithm>
+#include <ctime>
 
 namespace velmora::cli {
 
@@ -38,13 +42,37 @@ struct ScanOptions
 {
     bool checking = false;
     std::string maker;
+    std::vector<std::string> reports;
+    bool maskVin = false;
+    bool force = false;
 };
+
+ReportFacts factsOf(ScanOptions const& chosen, std::string const& port)
+{
+    std::time_t const now = std::time(nullptr);
+    std::tm local{};
+    localtime_r(&now, &local);
+    return {fmt::format("{:%Y-%m-%d %H:%M}", local), port, versionText, chosen.maskVin, local.tm_year + 1900};
+}
+
+// What can be told before minutes are spent with the vehicle.
+void checkReports(ScanOptions const& chosen)
+{
+    for (std::string const& path : chosen.reports) {
+        checkReportPath(path, chosen.force);
+    }
+}
 
 ExitCode scan(ScanOptions const& chosen, GlobalOptions const& options)
 {
+    checkReports(chosen);
     CommandSession session(options);
     session.connect();
-    VehicleReport const report = readVehicle(session, chosen.maker);
+    ReportFacts const facts = factsOf(chosen, session.port());
+    VehicleReport const report = withShownVins(readVehicle(session, chosen.maker), facts);
+    for (std::string const& path : chosen.reports) {
+        writeReport(path, report, facts, toText(report, Style(false)), chosen.force);
+    }
     fmt::print("{}", options.json ? toJson(report) : toText(report, outputStyle(options)));
     return chosen.checking ? check(report) : ExitCode::Done;
 }
@@ -60,6 +88,10 @@ void addScanCommand(CommandLine& commandLine)
     command->add_flag("--check", chosen->checking,
                       "Exit with code 10 if the lamp is on or a code is confirmed or permanent; a pending one is none");
     addMakeOption(*command, chosen->maker);
+    command->add_option("--report", chosen->reports, "Write the report there as well: .html, .md, .json or .txt")
+        ->type_name("FILE");
+    command->add_flag("--mask-vin", chosen->maskVin, "Show the last six characters of the VIN as zeros");
+    command->add_flag("--force", chosen->force, "Let --report replace a file");
 }
 
 } // namespace velmora::cli
