@@ -2,7 +2,7 @@
 // keeps: decodeText into one piece, decodeFrames into one piece for each frame, as the parser must hand it out. Items
 // are characters of the reply, so the rates of replies of different length compare: linear cost shows as the same rate.
 
-#include "libobd/bytes/hextext.h"
+#include "libobd/bytes/bytes.h"
 #include "libobd/message/messageparser.h"
 
 #include <benchmark/benchmark.h>

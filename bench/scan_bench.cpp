@@ -5,8 +5,8 @@
 
 #include "libvelmora/read/vehiclereader.h"
 
-#include <obd/iconnectionlogger.h>
 #include <obd/iconnectionmanager.h>
+#include <obd/idataconnection.h>
 
 #include <benchmark/benchmark.h>
 

@@ -3,13 +3,12 @@
 //   - ids fit the bus's header, and the payloads hold no more bytes than the text has pairs;
 //   - the same text gives the same result again, and in lower case too;
 //   - entries that are there before stay, and an unknown protocol touches nothing;
-//   - on the older buses a single character at the end makes no difference;
+//   - on the legacy buses a single character at the end makes no difference;
 //   - a whole frame in front of the text adds its payload and changes nothing else;
 //   - on CAN the plain reading, which decodes everything that is left for every frame, gives the same.
 
 #include "libobd/adapter/elmtransport.h"
-#include "libobd/bytes/bytefilter.h"
-#include "libobd/bytes/hextext.h"
+#include "libobd/bytes/bytes.h"
 #include "libobd/message/messageparser.h"
 #include "tests/support/plaincanparser.h"
 

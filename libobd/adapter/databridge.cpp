@@ -1,7 +1,7 @@
 #include <common/logrecord.h>
 #include <common/tracestream.h>
 #include <obd/databridge.h>
-#include <obd/iconnectionlogger.h>
+#include <obd/idataconnection.h>
 
 #include <algorithm>
 #include <chrono>

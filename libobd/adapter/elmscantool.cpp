@@ -2,8 +2,7 @@
 
 #include "libobd/adapter/elmtext.h"
 #include "libobd/adapter/elmtransport.h"
-#include "libobd/bytes/hexformat.h"
-#include "libobd/bytes/hextext.h"
+#include "libobd/bytes/bytes.h"
 #include "libobd/message/messageparser.h"
 
 #include <common/logrecord.h>

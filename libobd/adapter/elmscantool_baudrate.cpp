@@ -1,6 +1,6 @@
 #include "libobd/adapter/elmscantool.h"
 #include "libobd/adapter/elmtransport.h"
-#include "libobd/bytes/hexformat.h"
+#include "libobd/bytes/bytes.h"
 
 #include <common/logrecord.h>
 

@@ -1,7 +1,7 @@
 #include "libobd/adapter/elmscantool.h"
 #include "libobd/adapter/elmtext.h"
 #include "libobd/adapter/elmtransport.h"
-#include "libobd/bytes/hexformat.h"
+#include "libobd/bytes/bytes.h"
 
 #include <common/tracestream.h>
 

@@ -1,6 +1,6 @@
 #include "libobd/adapter/elmtransport.h"
 
-#include "libobd/bytes/bytefilter.h"
+#include "libobd/bytes/bytes.h"
 
 #include <common/logrecord.h>
 #include <common/tracestream.h>

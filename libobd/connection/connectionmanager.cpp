@@ -6,7 +6,7 @@
 #include <common/clock.h>
 #include <common/logrecord.h>
 #include <obd/dispatcher.h>
-#include <obd/iconnectionphaselistener.h>
+#include <obd/iconnectionmanager.h>
 #include <obd/idataconnection.h>
 
 #include <algorithm>

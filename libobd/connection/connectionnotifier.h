@@ -1,7 +1,7 @@
 #pragma once
 
+#include <obd/iconnectionmanager.h>
 #include <obd/iconnectionnotifier.h>
-#include <obd/iconnectionphaselistener.h>
 
 #include <array>
 #include <atomic>

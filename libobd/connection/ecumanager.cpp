@@ -1,6 +1,6 @@
 #include "libobd/connection/ecumanager.h"
 
-#include "libobd/bytes/hexformat.h"
+#include "libobd/bytes/bytes.h"
 #include "libobd/powertrain/consumptionchoice.h"
 
 #include <common/logrecord.h>

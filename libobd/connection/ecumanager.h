@@ -1,10 +1,10 @@
 #pragma once
 
 #include <common/eventproducer.h>
-#include <obd/iconnectionnotifierlistener.h>
+#include <obd/iconnectionnotifier.h>
 #include <obd/iecumanager.h>
+#include <obd/ivelmorasettings.h>
 #include <obd/unitsystem.h>
-#include <obd/velmorasettingsevent.h>
 
 #include <memory>
 #include <mutex>

@@ -1,6 +1,6 @@
 #pragma once
 
-#include <obd/bluetoothdescriptor.h>
+#include <obd/connectiondescriptors.h>
 #include <obd/isettings.h>
 
 #include <memory>

@@ -1,7 +1,6 @@
 #pragma once
 
 #include "libobd/dispatch/dispatchertask.h"
-#include "libobd/dispatch/dispatchertaskobserver.h"
 
 #include <obd/dispatcher.h>
 

@@ -1,6 +1,5 @@
 #include "libobd/dispatch/dispatchertask.h"
 
-#include "libobd/dispatch/dispatchertaskobserver.h"
 #include "libobd/dispatch/idispatchable.h"
 
 #include <common/clock.h>

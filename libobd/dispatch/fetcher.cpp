@@ -1,6 +1,6 @@
 #include "libobd/dispatch/fetcher.h"
 
-#include "libobd/bytes/hexformat.h"
+#include "libobd/bytes/bytes.h"
 
 #include <obd/iecu.h>
 

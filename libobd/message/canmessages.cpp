@@ -1,6 +1,6 @@
 #include "libobd/message/canmessages.h"
 
-#include "libobd/bytes/hextext.h"
+#include "libobd/bytes/bytes.h"
 #include "libobd/message/canmodules.h"
 
 #include <common/logrecord.h>

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "libobd/bytes/checkedbytes.h"
+#include "libobd/bytes/bytes.h"
 
 #include <obd/obdprotocol.h>
 #include <obd/responsemap.h>

@@ -1,6 +1,6 @@
 #include "libobd/message/legacymessages.h"
 
-#include "libobd/bytes/hextext.h"
+#include "libobd/bytes/bytes.h"
 
 #include <common/logrecord.h>
 #include <common/tracestream.h>

@@ -1,6 +1,6 @@
 #include "libobd/message/messageentry.h"
 
-#include "libobd/bytes/bytefilter.h"
+#include "libobd/bytes/bytes.h"
 
 #include <common/clock.h>
 #include <common/localtime.h>

@@ -1,4 +1,4 @@
-#include "libobd/bytes/hexformat.h"
+#include "libobd/bytes/bytes.h"
 
 #include <obd/nack.h>
 

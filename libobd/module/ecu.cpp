@@ -1,6 +1,6 @@
 #include "libobd/module/ecu.h"
 
-#include "libobd/bytes/hexformat.h"
+#include "libobd/bytes/bytes.h"
 #include "libobd/powertrain/testequipmentconfiguration.h"
 
 #include <common/logrecord.h>

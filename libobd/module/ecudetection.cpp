@@ -1,6 +1,6 @@
 // How an Ecu learns what its control module can do.
 
-#include "libobd/bytes/hexformat.h"
+#include "libobd/bytes/bytes.h"
 #include "libobd/module/ecu.h"
 #include "libobd/parameters/supportedoids.h"
 
@@ -13,7 +13,7 @@
 namespace obd {
 namespace {
 
-constexpr unsigned char firstFrame = 0; // of the services that have no frames
+constexpr unsigned char noFrame = 0; // of the services that have no frames
 
 } // namespace
 
@@ -107,7 +107,7 @@ void Ecu::setDetection(ObdMode mode, unsigned char frame, Verdict const& verdict
 Verdict Ecu::detection(ObdMode mode, unsigned char frame) const
 {
     std::lock_guard const lock(m_mutex);
-    auto const found = m_detections.find({mode, mode == ObdMode::FreezeFrame ? frame : firstFrame});
+    auto const found = m_detections.find({mode, mode == ObdMode::FreezeFrame ? frame : noFrame});
     return found != m_detections.end() ? found->second : Verdict{OutcomeKind::NotOffered};
 }
 

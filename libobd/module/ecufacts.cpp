@@ -1,6 +1,6 @@
 // What an Ecu finds out of its control module beside the supported sets: what scales and selects everything else.
 
-#include "libobd/bytes/hexformat.h"
+#include "libobd/bytes/bytes.h"
 #include "libobd/module/ecu.h"
 #include "libobd/parameters/ecuname.h"
 #include "libobd/parameters/supportedoids.h"

@@ -1,6 +1,6 @@
 #include "libobd/module/obdproxy.h"
 
-#include "libobd/bytes/hexformat.h"
+#include "libobd/bytes/bytes.h"
 #include "libobd/module/ecu.h"
 #include "libobd/parameters/supportedoids.h"
 

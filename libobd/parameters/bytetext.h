@@ -1,7 +1,8 @@
 #pragma once
 
+#include "libobd/bytes/bytes.h"
+
 #include <string>
-#include <vector>
 
 namespace obd {
 
@@ -9,15 +10,12 @@ namespace obd {
 // is taken as it stands and may hold any byte.
 
 // Without the zero bytes at both ends.
-std::string trimmedText(std::vector<unsigned char> const& bytes);
+std::string trimmedText(ByteView bytes);
 
 // Without any zero byte.
-std::string compactText(std::vector<unsigned char> const& bytes);
+std::string compactText(ByteView bytes);
 
 // Each byte as two upper-case hexadecimal digits.
-std::string hexText(std::vector<unsigned char> const& bytes);
-
-// `count` bytes from `offset` on, which must be there.
-std::vector<unsigned char> slice(std::vector<unsigned char> const& bytes, std::size_t offset, std::size_t count);
+std::string hexText(ByteView bytes);
 
 } // namespace obd

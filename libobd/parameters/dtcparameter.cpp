@@ -1,14 +1,24 @@
 #include "libobd/parameters/dtcparameter.h"
 
+#include "libobd/bytes/bytes.h"
 #include "libobd/catalogue/dtcreader.h"
-#include "libobd/parameters/bytetext.h"
-#include "libobd/parameters/dtctostring.h"
 #include "libobd/parameters/replychecks.h"
 
 #include <common/logrecord.h>
 #include <obd/protocolfamily.h>
 
 namespace obd {
+
+std::string dtcToString(std::vector<unsigned char> const& bytes)
+{
+    unsigned int const code = readUint16(bytes, 0);
+    if ((code & 0x0FFFU) == 0) {
+        return {};
+    }
+    // The top two bits choose the system; the first digit, 0 to 3, has the two below them.
+    return "PCBU"[code >> 14U] + upperHex(code & 0x3FFFU, 4);
+}
+
 namespace {
 
 constexpr std::size_t codeLength = 2;
@@ -69,10 +79,10 @@ bool DtcParameter::fromSaeSystem(unsigned int ecuId, std::vector<unsigned char> 
     return true;
 }
 
-void DtcParameter::parseCodes(unsigned int ecuId, std::vector<unsigned char> const& codes)
+void DtcParameter::parseCodes(unsigned int ecuId, ByteView codes)
 {
     for (std::size_t place = 0; place + codeLength <= codes.size(); place += codeLength) {
-        std::string const code = dtcToString(slice(codes, place, codeLength));
+        std::string const code = dtcToString(toVector(slice(codes, place, codeLength)));
         if (!code.empty()) {
             auto const meanings = DtcReader().getTroubleCodes(code);
             auto& list = m_codes[ecuId];

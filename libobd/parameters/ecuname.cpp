@@ -121,9 +121,9 @@ bool EcuName::fromSaeSystem(unsigned int ecuId, std::vector<unsigned char> const
     return true;
 }
 
-void EcuName::store(unsigned int ecuId, std::vector<unsigned char> const& field)
+void EcuName::store(unsigned int ecuId, ByteView field)
 {
-    if (field.at(acronymLength) != '-') {
+    if (byteAt(field, acronymLength) != '-') {
         TERVEX_LOG(Error) << "No delimeter found!";
     }
     m_names[ecuId] = {compactText(slice(field, 0, acronymLength)),

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "libobd/bytes/bytes.h"
 #include "libobd/parameters/vehicleinformation.h"
 
 #include <map>
@@ -32,7 +33,7 @@ private:
 
     bool fromCanSystem(unsigned int ecuId, std::vector<unsigned char> const& data) override;
     bool fromSaeSystem(unsigned int ecuId, std::vector<unsigned char> const& data) override;
-    void store(unsigned int ecuId, std::vector<unsigned char> const& field);
+    void store(unsigned int ecuId, ByteView field);
 
     std::map<unsigned int, Name> m_names; // by module id
 };

@@ -19,7 +19,7 @@ protected:
     void getRequestData(std::vector<unsigned char>& data) const override;
     void getSignature(std::vector<unsigned char>& signature) const override;
 
-    // The lines of a reply from a bus before CAN; it must outlive them. Nothing, with a log line, for what is no such
+    // The lines of a reply from a legacy bus; it must outlive them. Nothing, with a log line, for what is no such
     // reply to this request.
     std::optional<SaeLines> saeLines(std::vector<unsigned char> const& data) const;
 
@@ -28,7 +28,7 @@ private:
     std::vector<unsigned char> m_tail;
 };
 
-// The bytes by which requests of service 08 are filled up where their length is fixed: on the buses before CAN.
+// The bytes by which requests of service 08 are filled up where their length is fixed: on the legacy buses.
 std::vector<unsigned char> requestFillers(ObdProtocol protocol);
 
 } // namespace obd

@@ -13,8 +13,8 @@ namespace obd {
 class IdentificationNumberParser
 {
 public:
-    // signature: what a reply on CAN, and each line of one on the older buses, begins with. length: bytes of a whole
-    // reply on CAN, and of the data of all lines together on the older buses.
+    // signature: what a reply on CAN, and each line of one on the legacy buses, begins with. length: bytes of a whole
+    // reply on CAN, and of the data of all lines together on the legacy buses.
     IdentificationNumberParser(std::vector<unsigned char> signature, std::size_t length);
 
     // False, with a log line and the module's number left alone, for a reply that can't be used.

@@ -1,7 +1,7 @@
 #include "libobd/parameters/monitortestresult.h"
 
 #include "libobd/parameters/bytetext.h"
-#include "libobd/parameters/monitortestitemparser.h"
+#include "libobd/parameters/monitortestitem.h"
 #include "libobd/parameters/monitortesttexts.h"
 #include "libobd/parameters/replychecks.h"
 #include "libobd/parameters/saelines.h"
@@ -65,7 +65,7 @@ bool MonitorTestResult::parseFromCanBus(unsigned int ecuId, std::vector<unsigned
                               << static_cast<unsigned int>(m_id);
             usable = false;
         } else {
-            addItem(*monitor, MonitorTestItemParserCan(slice(data, record + 1, canRecordLength - 1)));
+            addItem(*monitor, MonitorTestItemParserCan(toVector(slice(data, record + 1, canRecordLength - 1))));
         }
     }
     m_monitors[ecuId].push_back(monitor); // with what came before a foreign record

@@ -1,18 +1,18 @@
 #pragma once
 
 #include "libobd/parameters/fixedrequestparameter.h"
-#include "libobd/parameters/obdmonitortestitem.h"
+#include "libobd/parameters/monitortestitem.h"
 
 #include <map>
 
 namespace obd {
 
-// Test results of service 06: of one on-board monitor on CAN, of one test on the older buses, where each record of the
+// Test results of service 06: of one on-board monitor on CAN, of one test on the legacy buses, where each record of the
 // reply is a monitor of its own. A further reply of the same module is appended.
 class MonitorTestResult : public FixedRequestParameter
 {
 public:
-    // id: monitor identifier (MID) on CAN, test identifier (TID) on the older buses.
+    // id: monitor identifier (MID) on CAN, test identifier (TID) on the legacy buses.
     explicit MonitorTestResult(unsigned char id);
 
     void clear() override;

@@ -1,6 +1,6 @@
 #include "libobd/parameters/monitortesttexts.h"
 
-#include "libobd/bytes/hexformat.h"
+#include "libobd/bytes/bytes.h"
 
 namespace obd {
 namespace {

@@ -2,14 +2,14 @@
 
 #include "libobd/parameters/fixedrequestparameter.h"
 
+#include <obd/diagnosticdatamodels.h>
 #include <obd/oxygensensorlocation.h>
-#include <obd/oxygensensormonitordatamodel.h>
 
 #include <map>
 
 namespace obd {
 
-// One monitoring test of one oxygen sensor (service 05), which only the buses before CAN have.
+// One monitoring test of one oxygen sensor (service 05), which only the legacy buses have.
 class OxygenSensorTestResult : public FixedRequestParameter
 {
 public:

@@ -1,6 +1,6 @@
 #include "libobd/parameters/performancetracking.h"
 
-#include "libobd/bytes/bytereader.h"
+#include "libobd/bytes/bytes.h"
 #include "libobd/parameters/replychecks.h"
 #include "libobd/parameters/saelines.h"
 

@@ -1,6 +1,6 @@
 #include "libobd/parameters/saelines.h"
 
-#include "libobd/bytes/bytereader.h"
+#include "libobd/bytes/bytes.h"
 
 #include <common/logrecord.h>
 

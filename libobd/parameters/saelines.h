@@ -5,7 +5,7 @@
 
 namespace obd {
 
-// A multi-line reply of service 06 or 09 on the buses before CAN: lines of service, identifier, sequence number and 4
+// A multi-line reply of service 06 or 09 on the legacy buses: lines of service, identifier, sequence number and 4
 // data bytes, and on ISO 9141-2 and J1850 a checksum, which the parser leaves there. Holds a reference: the reply must
 // outlive it. Positions past the end of the reply throw std::out_of_range.
 class SaeLines

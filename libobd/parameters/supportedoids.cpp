@@ -1,6 +1,6 @@
 #include "libobd/parameters/supportedoids.h"
 
-#include "libobd/bytes/bytereader.h"
+#include "libobd/bytes/bytes.h"
 
 #include <common/logrecord.h>
 #include <obd/protocolfamily.h>

@@ -7,7 +7,7 @@ namespace obd {
 // Of a CAN reply of service 09: service, info type, number of items.
 inline constexpr std::size_t infoHeaderLength = 3;
 
-// An item of service 09 (SAE J1979), kept by control module. On CAN a reply comes assembled, on the older buses as
+// An item of service 09 (SAE J1979), kept by control module. On CAN a reply comes assembled, on the legacy buses as
 // numbered lines; see SaeLines.
 class VehicleInformation : public FixedRequestParameter
 {

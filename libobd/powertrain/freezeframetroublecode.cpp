@@ -1,7 +1,7 @@
 #include "libobd/powertrain/freezeframetroublecode.h"
 
 #include "libobd/catalogue/dtcreader.h"
-#include "libobd/parameters/dtctostring.h"
+#include "libobd/parameters/dtcparameter.h"
 #include "libobd/parameters/replychecks.h"
 
 #include <obd/sensorvalue.h>

@@ -1,6 +1,6 @@
 #include "libobd/powertrain/monitorstatus.h"
 
-#include "libobd/bytes/bytereader.h"
+#include "libobd/bytes/bytes.h"
 
 #include <obd/sensorinfo.h>
 #include <obd/sensorvalue.h>

@@ -2,7 +2,7 @@
 
 #include "libobd/powertrain/monitorstatus.h"
 
-#include <obd/readinessmonitordatamodel.h>
+#include <obd/diagnosticdatamodels.h>
 
 #include <string>
 #include <vector>

@@ -1,5 +1,4 @@
-#include "libobd/bytes/bytereader.h"
-#include "libobd/bytes/hexformat.h"
+#include "libobd/bytes/bytes.h"
 
 #include <common/logrecord.h>
 #include <common/tracestream.h>

@@ -3,11 +3,10 @@
 #include "libobd/dispatch/fetcher.h"
 #include "libobd/service/baseservice.h"
 
+#include <obd/diagnosticdatamodels.h>
 #include <obd/iecu.h>
 #include <obd/outcome.h>
-#include <obd/parameterdatamodel.h>
-#include <obd/readinessmonitordatamodel.h>
-#include <obd/sensordatamodel.h>
+#include <obd/sensordatamodels.h>
 
 #include <memory>
 #include <optional>

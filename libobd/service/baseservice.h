@@ -1,9 +1,9 @@
 #pragma once
 
-#include <obd/iconnectionnotifierlistener.h>
+#include <obd/iconnectionnotifier.h>
 #include <obd/iecumanager.h>
+#include <obd/ivelmorasettings.h>
 #include <obd/unitsystem.h>
-#include <obd/velmorasettingsevent.h>
 #include <tervex/ieventlistener.h>
 
 #include <atomic>

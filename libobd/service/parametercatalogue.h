@@ -1,6 +1,6 @@
 #pragma once
 
-#include <obd/parameterdatamodel.h>
+#include <obd/sensordatamodels.h>
 #include <obd/unitsystem.h>
 
 #include <memory>

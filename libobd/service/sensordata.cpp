@@ -1,7 +1,7 @@
 #include "libobd/service/sensordata.h"
 
+#include <obd/sensordatamodels.h>
 #include <obd/sensorvalue.h>
-#include <obd/sensorvaluedatamodel.h>
 
 #include <algorithm>
 

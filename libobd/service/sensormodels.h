@@ -1,7 +1,7 @@
 #pragma once
 
-#include <obd/sensordatamodel.h>
-#include <obd/sensordescriptor.h>
+#include <obd/parameterdescriptor.h>
+#include <obd/sensordatamodels.h>
 #include <obd/sensorvalue.h>
 
 #include <memory>

@@ -8,11 +8,10 @@
 #include <obd/iecu.h>
 #include <obd/iobdvelmora.h>
 #include <obd/ivelmorasettings.h>
-#include <obd/parameterdatamodel.h>
 #include <obd/parameterdescriptor.h>
 #include <obd/parameterfactory.h>
 #include <obd/powertrainparameter.h>
-#include <obd/sensordatamodel.h>
+#include <obd/sensordatamodels.h>
 #include <obd/sensorvalue.h>
 
 #include <utility>

@@ -7,10 +7,10 @@
 #include <obd/parameterdescriptor.h>
 #include <obd/parameterfactory.h>
 #include <obd/powertrainparameter.h>
+#include <obd/sensordatamodels.h>
 #include <obd/sensorinfo.h>
 #include <obd/sensorpids.h>
 #include <obd/sensorvalue.h>
-#include <obd/sensorvaluedatamodel.h>
 
 #include <utility>
 

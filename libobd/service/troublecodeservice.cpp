@@ -1,7 +1,7 @@
 #include "libobd/service/troublecodeservice.h"
 
 #include "libobd/parameters/cleartroublecodes.h"
-#include "libobd/parameters/troublecodelists.h"
+#include "libobd/parameters/dtcparameter.h"
 #include "libobd/powertrain/monitorstatus.h"
 #include "libobd/powertrain/numericparameters.h"
 #include "libobd/service/builtservice.h"

@@ -2,7 +2,7 @@
 
 #include "libobd/service/baseservice.h"
 
-#include <obd/iconnectionlogger.h>
+#include <obd/idataconnection.h>
 #include <obd/itroubleshootingservice.h>
 #include <tervex/notifier.h>
 

@@ -1,10 +1,27 @@
 #pragma once
 
-#include "libobd/value/iunitscaling.h"
-
+#include <obd/measurementunit.h>
 #include <obd/typedvalueformater.h>
 
+#include <string>
+
 namespace obd {
+
+// How a raw 16 bit number of a test result becomes a value, and how a value is shown. Immutable.
+class IUnitScaling
+{
+public:
+    virtual ~IUnitScaling() = default;
+
+    // raw: 0 to 65535.
+    virtual double value(unsigned int raw) const = 0;
+
+    // The value as a user sees it, without its unit.
+    virtual std::string toString(double value) const = 0;
+
+    // The unit of the text.
+    virtual MeasurementUnit unit() const = 0;
+};
 
 // A factor and a fixed count of decimals. A conversion to another unit works on the text only, so that values and their
 // limits are compared as the module sent them.
@@ -40,6 +57,24 @@ public:
 
 private:
     float m_offset;
+};
+
+// A state: any number but 0 is "true".
+class BoolScaling : public IUnitScaling
+{
+public:
+    double value(unsigned int raw) const override { return raw; }
+    std::string toString(double value) const override { return value != 0.0 ? "true" : "false"; }
+    MeasurementUnit unit() const override { return UnitNone; }
+};
+
+// A number of which nothing is known: shown as it came.
+class DummyScaling : public IUnitScaling
+{
+public:
+    double value(unsigned int raw) const override { return raw; }
+    std::string toString(double value) const override { return std::to_string(static_cast<unsigned int>(value)); }
+    MeasurementUnit unit() const override { return UnitNone; }
 };
 
 } // namespace obd

@@ -1,4 +1,4 @@
-#include <obd/sensordescriptor.h>
+#include <obd/parameterdescriptor.h>
 
 #include <utility>
 

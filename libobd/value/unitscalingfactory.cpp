@@ -1,6 +1,6 @@
 #include "libobd/value/unitscalingfactory.h"
 
-#include "libobd/value/rawscalings.h"
+#include "libobd/value/linearscaling.h"
 #include "libobd/value/unitscalingtables.h"
 
 #include <common/logrecord.h>

@@ -21,7 +21,7 @@ std::span<ScalingRow const> metricScalings();
 // Only the identifiers whose unit differs.
 std::span<ScalingRow const> imperialScalings();
 
-// The scaling of a range of test identifiers on the buses before CAN.
+// The scaling of a range of test identifiers on the legacy buses.
 struct TestScalingRow
 {
     unsigned char first;

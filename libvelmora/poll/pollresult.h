@@ -1,7 +1,7 @@
 #pragma once
 
 #include <obd/parameteridentifier.h>
-#include <obd/sensorvaluedatamodel.h>
+#include <obd/sensordatamodels.h>
 #include <velmora/reading.h>
 
 #include <memory>

@@ -1,7 +1,7 @@
 #pragma once
 
+#include <obd/sensordatamodels.h>
 #include <obd/sensorvalue.h>
-#include <obd/sensorvaluedatamodel.h>
 
 namespace velmora {
 

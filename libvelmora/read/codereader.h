@@ -31,7 +31,7 @@ private:
 };
 
 // Whether a positive reply to a service that lists codes has a shape that can be decoded; what a list without codes
-// leaves open. On CAN the number of codes stands behind the service byte; older buses send lines of seven bytes, some
+// leaves open. On CAN the number of codes stands behind the service byte; legacy buses send lines of seven bytes, some
 // with a checksum.
 bool isCodeListReply(std::vector<unsigned char> const& bytes, obd::ObdProtocol protocol);
 

@@ -21,7 +21,7 @@ ReadinessReport readReadiness(Session& session, obd::IEcu const& ecu);
 MonitorsReport readMonitors(Session& session, obd::IEcu const& ecu);
 OxygenReport readOxygen(Session& session, obd::IEcu const& ecu);
 CountersReport readCounters(Session& session, obd::IEcu const& ecu);
-// What a reply of service 09 means that gave no counters. The older buses' check bytes hide which are 0.
+// What a reply of service 09 means that gave no counters. The legacy buses' check bytes hide which are 0.
 TopicAnswer judgeWithoutCounters(std::vector<unsigned char> const& reply, obd::ObdProtocol protocol);
 InfoReport readInfo(Session& session, obd::IEcu const& ecu);
 // The vehicle identification number; empty if the module does not tell it.

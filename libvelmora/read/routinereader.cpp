@@ -9,7 +9,7 @@ namespace velmora {
 
 namespace {
 
-// The buses before CAN refuse without a code; the library then gives the text of code 0, which is no reason.
+// The legacy buses refuse without a code; the library then gives the text of code 0, which is no reason.
 std::string reason(std::string text)
 {
     if (text.empty() || text == obd::NackToString(obd::NackAcknowledged)) {

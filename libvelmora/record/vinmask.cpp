@@ -124,7 +124,7 @@ Masked maskCan(std::vector<Line>& lines, std::size_t headerDigits)
     return masked;
 }
 
-// The older buses: five messages of four characters each, of which the first is filled with three zeros, and a check
+// The legacy buses: five messages of four characters each, of which the first is filled with three zeros, and a check
 // byte behind each.
 Masked maskLegacy(std::vector<Line>& lines, bool j1850)
 {

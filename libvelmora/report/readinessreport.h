@@ -2,7 +2,7 @@
 
 #include "libvelmora/report/moduletopic.h"
 
-#include <obd/readinessmonitordatamodel.h>
+#include <obd/diagnosticdatamodels.h>
 
 #include <optional>
 #include <string>

@@ -2,8 +2,8 @@
 
 #include "libvelmora/session/dispatchloop.h"
 
-#include <obd/iconnectionlogger.h>
 #include <obd/iconnectionmanager.h>
+#include <obd/idataconnection.h>
 
 #include <chrono>
 #include <mutex>

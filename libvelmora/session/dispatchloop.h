@@ -1,6 +1,6 @@
 #pragma once
 
-#include <obd/idispatchrunner.h>
+#include <obd/dispatcher.h>
 #include <tervex/observer.h>
 
 #include <chrono>

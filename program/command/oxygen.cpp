@@ -7,7 +7,7 @@ namespace velmora::cli {
 
 void addOxygenCommand(CommandLine& commandLine)
 {
-    commandLine.addCommand("oxygen", "Show the oxygen sensors, and their tests on buses before CAN",
+    commandLine.addCommand("oxygen", "Show the oxygen sensors, and their tests on legacy buses, those before CAN",
                            [](GlobalOptions const& options) {
                                return showTopic(options, readOxygen,
                                                 {ErrorKind::NotSupported,

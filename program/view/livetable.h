@@ -1,7 +1,7 @@
 #pragma once
 
 #include <obd/parameterdescriptor.h>
-#include <obd/sensorvaluedatamodel.h>
+#include <obd/sensordatamodels.h>
 
 #include <chrono>
 #include <deque>

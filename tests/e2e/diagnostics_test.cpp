@@ -1,4 +1,4 @@
-// The diagnostic results as a user reads them, of simulated cars on CAN and on an older bus.
+// The diagnostic results as a user reads them, of simulated cars on CAN and on a legacy bus.
 
 #include "tests/e2e/childprocess.h"
 #include "tests/support/jsonschema.h"

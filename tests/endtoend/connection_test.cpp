@@ -12,12 +12,10 @@
 #include "tests/support/workerclock.h"
 
 #include <obd/databridge.h>
-#include <obd/iconnectionlogger.h>
 #include <obd/iconnectionmanager.h>
 #include <obd/iconnectionnotifier.h>
-#include <obd/iconnectionnotifierlistener.h>
-#include <obd/iconnectionphaselistener.h>
 #include <obd/iconnectionservice.h>
+#include <obd/idataconnection.h>
 #include <obd/iecumanager.h>
 #include <obd/iobdproxy.h>
 #include <obd/iobdvelmora.h>

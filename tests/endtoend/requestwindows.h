@@ -3,8 +3,7 @@
 #include "tests/support/peerconnection.h"
 
 #include <obd/dispatcher.h>
-#include <obd/iconnectionlogger.h>
-#include <obd/idispatchrunner.h>
+#include <obd/idataconnection.h>
 #include <tervex/observer.h>
 
 #include <deque>

@@ -2,7 +2,6 @@
 
 #include "simulator/peer.h"
 
-#include <obd/iconnectionlogger.h>
 #include <obd/idataconnection.h>
 
 #include <algorithm>

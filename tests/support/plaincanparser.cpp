@@ -1,6 +1,6 @@
 #include "tests/support/plaincanparser.h"
 
-#include "libobd/bytes/hextext.h"
+#include "libobd/bytes/bytes.h"
 
 #include <algorithm>
 #include <cstddef>

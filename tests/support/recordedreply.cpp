@@ -2,8 +2,7 @@
 
 #include "libobd/adapter/elmtransport.h"
 #include "libobd/adapter/proxyerror.h"
-#include "libobd/bytes/bytefilter.h"
-#include "libobd/bytes/hexformat.h"
+#include "libobd/bytes/bytes.h"
 #include "libobd/message/messageparser.h"
 
 #include <obd/connectionprotocol.h>

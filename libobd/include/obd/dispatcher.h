@@ -1,7 +1,6 @@
 #pragma once
 
 #include <obd/export.h>
-#include <obd/idispatchrunner.h>
 #include <tervex/notifier.h>
 
 #include <memory>
@@ -12,6 +11,18 @@ namespace obd {
 class DispatchQueue;
 class IDispatchable;
 class IObdProxy;
+
+/// What an application attaches to the Dispatcher, to be told that there is work for its main thread.
+class IDispatchRunner
+{
+public:
+    virtual ~IDispatchRunner() = default;
+
+    /// Arrange one call of Dispatcher::dispatch() on the main thread, soon: one for each call of this, not one for
+    /// several. Called on any thread, the library's worker too. Return quickly, and don't call back into the library:
+    /// calling dispatch() from here deadlocks or runs observers on the wrong thread.
+    virtual void onDispatchRequested() = 0;
+};
 
 /// The one place where bus work runs. Adapter and vehicle can do one thing at a time, so a single worker thread takes
 /// all work in the order of its arrival; what the application may see of it comes back through dispatch(), which the

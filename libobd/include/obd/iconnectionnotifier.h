@@ -2,7 +2,16 @@
 
 namespace obd {
 
-class IConnectionNotifierListener;
+/// Hears a connection's opening and closing on the thread that opens or closes it, while the lists are locked: return
+/// at once, and don't attach, detach or build services.
+class IConnectionNotifierListener
+{
+public:
+    virtual ~IConnectionNotifierListener() = default;
+
+    virtual void onConnectionOpened() = 0;
+    virtual void onConnectionClosed() = 0;
+};
 
 /// Tells opening and closing in the order of three priorities: 0 the control modules, 1 the services, 2 the connection
 /// service. Other priorities are ignored. Listeners are not owned.

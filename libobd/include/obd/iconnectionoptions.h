@@ -1,15 +1,22 @@
 #pragma once
 
-#include <obd/bluetoothdescriptor.h>
-#include <obd/connectionoptionsevent.h>
-#include <obd/serialdescriptor.h>
-#include <obd/tcpdescriptor.h>
+#include <obd/connectiondescriptors.h>
 #include <obd/vehicleprotocol.h>
 #include <tervex/ieventproducer.h>
 
 #include <vector>
 
 namespace obd {
+
+/// Which connection option was set. Fired also when the value is the same as before.
+enum class ConnectionOptionsEvent : int
+{
+    BusChanged = 1,
+    ProtocolChanged = 2,
+    BluetoothDescriptorChanged = 3,
+    SerialDescriptorChanged = 4,
+    TcpDescriptorChanged = 5,
+};
 
 /// How the application reaches its adapter. The library stores these for the application and acts on none of them. A
 /// copy in memory: setters change the copy and fire their event, save alone writes it. No lock: one thread at a time.

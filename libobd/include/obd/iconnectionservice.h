@@ -1,7 +1,6 @@
 #pragma once
 
 #include <obd/export.h>
-#include <obd/iconnectionserviceobserver.h>
 #include <tervex/inotifier.h>
 
 #include <memory>
@@ -11,6 +10,19 @@ namespace obd {
 
 class IAdapter;
 class IConnectionOptions;
+
+class IConnectionServiceObserver
+{
+public:
+    virtual ~IConnectionServiceObserver() = default;
+
+    /// On the application's thread, inside Dispatcher::dispatch.
+    virtual void onConnectionOpened() = 0;
+    /// On the thread that selected another control module or closes the connection.
+    virtual void onActiveEcuChanged() = 0;
+    /// On the application's thread, inside Dispatcher::dispatch.
+    virtual void onConnectionClosed() = 0;
+};
 
 /// The state of the connection for the application. Opens and closes nothing itself: that is IConnectionManager's.
 class IConnectionService : public virtual tervex::INotifier<IConnectionServiceObserver>

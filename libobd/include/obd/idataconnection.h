@@ -4,7 +4,18 @@
 
 namespace obd {
 
-class IConnectionLogger;
+/// A tap on the byte channel. Called on the sending or receiving thread with a lock of the channel held: return quickly
+/// and don't call back into the channel.
+class IConnectionLogger
+{
+public:
+    virtual ~IConnectionLogger() = default;
+
+    /// What was sent, its terminator included.
+    virtual void onDataSent(std::vector<unsigned char> const& data) = 0;
+    /// One message received, its delimiter removed.
+    virtual void onDataReceived(std::vector<unsigned char> const& data) = 0;
+};
 
 /// The library's view of the byte channel to the adapter. DataBridge implements it; an application may bring its own.
 /// Towards the adapter it is a byte stream, from the adapter a queue of messages, each ended by the delimiter byte.

@@ -1,12 +1,9 @@
 #pragma once
 
-#include <obd/diagnosticmonitordatamodel.h>
+#include <obd/diagnosticdatamodels.h>
 #include <obd/export.h>
 #include <obd/outcome.h>
 #include <obd/oxygensensorlocation.h>
-#include <obd/oxygensensormonitordatamodel.h>
-#include <obd/performancecounterdatamodel.h>
-#include <obd/readinessmonitordatamodel.h>
 
 #include <memory>
 #include <vector>
@@ -36,7 +33,7 @@ public:
 
     /// The oxygen sensors that the module reports, as known since the connection was opened.
     virtual std::vector<OxygenSensorLocation> oxygenSensorLocations() = 0;
-    /// The results of service 05, which the buses before CAN have. Asks once for each test.
+    /// The results of service 05, which the legacy buses have. Asks once for each test.
     virtual std::vector<std::shared_ptr<OxygenSensorMonitorDataModel>>
     fetchOxygenSensorTests(OxygenSensorLocation location) = 0;
     /// Whether the oxygen sensor monitor has run since the codes were cleared: before, its results mean nothing.

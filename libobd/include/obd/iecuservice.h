@@ -2,7 +2,7 @@
 
 #include <obd/export.h>
 #include <obd/outcome.h>
-#include <obd/parameterdatamodel.h>
+#include <obd/sensordatamodels.h>
 
 #include <memory>
 #include <string>

@@ -3,9 +3,8 @@
 #include <obd/dtcdatamodel.h>
 #include <obd/export.h>
 #include <obd/outcome.h>
-#include <obd/parameterdatamodel.h>
 #include <obd/parameteridentifier.h>
-#include <obd/sensordatamodel.h>
+#include <obd/sensordatamodels.h>
 
 #include <memory>
 #include <vector>

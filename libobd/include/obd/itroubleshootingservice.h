@@ -1,13 +1,25 @@
 #pragma once
 
 #include <obd/export.h>
-#include <obd/itroubleshootingserviceobserver.h>
+#include <obd/messagedatamodel.h>
 #include <tervex/inotifier.h>
 
 #include <memory>
 #include <string>
 
 namespace obd {
+
+/// Hears of the traffic with the adapter while logging is on.
+class ITroubleshootingServiceObserver
+{
+public:
+    virtual ~ITroubleshootingServiceObserver() = default;
+
+    /// Unlike all other observers, this one is called on the thread that sends or receives, mostly the dispatcher's
+    /// worker, in the middle of an exchange. Post what is wanted to a thread of your own and return; don't call
+    /// anything that blocks or that asks the vehicle.
+    virtual void onLogEntryAdded(std::shared_ptr<MessageDataModel> const& /*entry*/) {}
+};
 
 /// The raw view on the adapter: a console and a log of the traffic. Attach observers while logging is off. An entry may
 /// still be under way on another thread when stopLogging returns, so detach without a connection only, or let go of the

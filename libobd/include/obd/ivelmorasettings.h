@@ -2,12 +2,24 @@
 
 #include <obd/ignitiontype.h>
 #include <obd/unitsystem.h>
-#include <obd/velmorasettingsevent.h>
 #include <tervex/ieventproducer.h>
 
 namespace obd {
 
 class IConnectionOptions;
+
+/// Which setting was set. Fired also when the value is the same as before.
+enum class VelmoraSettingsEvent : int
+{
+    UnitSystemChanged = 0,
+    LanguageChanged = 1,
+    FuelCorrectionFactorChanged = 2,
+    VolumetricEfficiencyChanged = 3,
+    EngineDisplacementChanged = 4,
+    FuelTypeOverrideChanged = 5,
+    IgnitionTypeChanged = 6,
+    VehicleWeightChanged = 7,
+};
 
 /// The settings of display and vehicle. Every getter asks the application's store anew, so a change made there directly
 /// is seen at the next read, without an event. A stored value out of range reads as the default. A setter writes at

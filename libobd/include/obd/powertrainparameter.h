@@ -39,7 +39,7 @@ protected:
     void getSignature(std::vector<unsigned char>& signature) const override;
     bool fromBytes(std::shared_ptr<IEcu> const& ecu, std::vector<unsigned char> const& data) override;
 
-    /// Reads the bytes behind service, PID and frame. On the older buses a checksum may trail the data: read from the
+    /// Reads the bytes behind service, PID and frame. On the legacy buses a checksum may trail the data: read from the
     /// start only. False leaves the module's stored value alone.
     virtual bool fromPayload(std::shared_ptr<IEcu> const& ecu, std::vector<unsigned char> const& payload) = 0;
 

@@ -10,7 +10,7 @@ inline bool isCan(ObdProtocol protocol)
     return protocol == ObdProtocolCan11 || protocol == ObdProtocolCan29;
 }
 
-/// Whether it is a bus before CAN, whose frames hold at most 7 data bytes.
+/// Whether it is a legacy bus, whose frames hold at most 7 data bytes.
 inline bool isLegacy(ObdProtocol protocol)
 {
     return protocol == ObdProtocolIso9141 || protocol == ObdProtocolIso14230 || protocol == ObdProtocolJ1850;

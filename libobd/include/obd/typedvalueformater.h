@@ -6,6 +6,15 @@
 
 namespace obd {
 
+/// How a number becomes text.
+class IValueFormater
+{
+public:
+    virtual ~IValueFormater() = default;
+
+    virtual std::string toString(double value) const = 0;
+};
+
 /// Writes numbers with a fixed count of decimals. A plain value: it stands inside every numeric sensor value, so it
 /// does without the virtual table of IValueFormater.
 class OBD_EXPORT TypedValueFormater

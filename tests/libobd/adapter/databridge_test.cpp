@@ -2,7 +2,7 @@
 #include "tests/support/logcapture.h"
 
 #include <obd/databridge.h>
-#include <obd/iconnectionlogger.h>
+#include <obd/idataconnection.h>
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>

@@ -1,4 +1,4 @@
-#include "libobd/bytes/checkedbytes.h"
+#include "libobd/bytes/bytes.h"
 #include "tests/support/hexbytes.h"
 
 #include <gtest/gtest.h>

@@ -1,4 +1,4 @@
-#include "libobd/bytes/hextext.h"
+#include "libobd/bytes/bytes.h"
 #include "tests/support/hexbytes.h"
 
 #include <gtest/gtest.h>

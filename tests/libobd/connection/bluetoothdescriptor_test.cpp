@@ -1,4 +1,4 @@
-#include <obd/bluetoothdescriptor.h>
+#include <obd/connectiondescriptors.h>
 
 #include <gtest/gtest.h>
 

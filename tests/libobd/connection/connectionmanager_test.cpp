@@ -4,8 +4,8 @@
 #include "tests/support/logcapture.h"
 
 #include <obd/dispatcher.h>
-#include <obd/iconnectionlogger.h>
-#include <obd/iconnectionphaselistener.h>
+#include <obd/iconnectionmanager.h>
+#include <obd/idataconnection.h>
 #include <obd/iobdproxy.h>
 
 #include <gmock/gmock.h>

@@ -1,6 +1,6 @@
 #include "libobd/connection/connectionnotifier.h"
 
-#include <obd/iconnectionnotifierlistener.h>
+#include <obd/iconnectionnotifier.h>
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>

@@ -53,7 +53,7 @@ std::vector<Row> rowsNamed(std::string const& name)
     return rows;
 }
 
-// Reads each row as its bus delivers it: lines on the older buses with and without checksums.
+// Reads each row as its bus delivers it: lines on the legacy buses with and without checksums.
 template <typename Parameter, typename Read>
 void expectRows(std::string const& name, std::size_t count, Read read)
 {

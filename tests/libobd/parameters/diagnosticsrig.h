@@ -39,7 +39,7 @@ inline Bytes requestOf(obd::ObdParameter const& parameter)
     return request;
 }
 
-// The reply of a bus before CAN with a byte of checksum behind each 7 byte line, as ISO 9141-2 and J1850 deliver it.
+// The reply of a legacy bus with a byte of checksum behind each 7 byte line, as ISO 9141-2 and J1850 deliver it.
 inline Bytes withChecksums(Bytes const& lines)
 {
     Bytes data;

@@ -1,4 +1,4 @@
-#include "libobd/parameters/dtctostring.h"
+#include "libobd/parameters/dtcparameter.h"
 
 #include <gtest/gtest.h>
 

@@ -1,6 +1,4 @@
-#include "libobd/parameters/canmonitortestitem.h"
 #include "libobd/parameters/monitortestitem.h"
-#include "libobd/parameters/monitortestitemparser.h"
 #include "libobd/value/unitscalingfactory.h"
 #include "tests/support/hexbytes.h"
 #include "tests/support/logcapture.h"

@@ -3,7 +3,7 @@
 #include "tests/support/logcapture.h"
 #include "tests/support/tablefile.h"
 
-#include <obd/performancecounterdatamodel.h>
+#include <obd/diagnosticdatamodels.h>
 
 #include <gtest/gtest.h>
 
@@ -63,7 +63,7 @@ TEST(PerformanceTracking, ReadsTheCountersOfCanInOrder)
     EXPECT_EQ(parameter.counterValue(*canEcu, Spark::ParticulateFilterEncounteredBank2), 1027U);
 }
 
-// The same counters as the lines of an older bus.
+// The same counters as the lines of a legacy bus.
 Bytes legacyReply(unsigned char infoType, int count, int first)
 {
     Bytes const words = canReply(infoType, count, first);

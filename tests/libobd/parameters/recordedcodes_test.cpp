@@ -1,8 +1,8 @@
 // Trouble codes out of what real cars and bench simulators sent.
 
-#include "libobd/bytes/hexformat.h"
+#include "libobd/bytes/bytes.h"
 #include "libobd/parameters/cleartroublecodes.h"
-#include "libobd/parameters/troublecodelists.h"
+#include "libobd/parameters/dtcparameter.h"
 #include "libobd/powertrain/freezeframetroublecode.h"
 #include "tests/support/dialoguefolder.h"
 #include "tests/support/dtcrows.h"
@@ -51,7 +51,7 @@ Bytes joined(Messages const& messages)
     return all;
 }
 
-// Lines of one module make one reply on the buses before CAN; on CAN each message is one.
+// Lines of one module make one reply on the legacy buses; on CAN each message is one.
 bool offerAll(obd::ObdParameter& parameter, std::shared_ptr<obd::IEcu> const& ecu, Messages const& messages)
 {
     if (!isCan(ecu->protocol())) {

@@ -1,7 +1,7 @@
 // Test results and vehicle information out of what real cars and bench simulators sent: from the printed reply, through
 // the parser, to what a user reads.
 
-#include "libobd/bytes/hexformat.h"
+#include "libobd/bytes/bytes.h"
 #include "libobd/parameters/calibrationids.h"
 #include "libobd/parameters/calibrationverificationnumbers.h"
 #include "libobd/parameters/ecuname.h"
@@ -128,7 +128,7 @@ obd::ResponseMap payloadsOf(obd::ObdProtocol family, support::Question const& qu
                                question.headers ? question.reply : support::withHeaders(family, question.reply));
 }
 
-// The lines of one dialogue in the form of recordedresults.txt. Without headers a reply of the older buses does not
+// The lines of one dialogue in the form of recordedresults.txt. Without headers a reply of the legacy buses does not
 // tell whose it is, nor its protocol bytes.
 void tell(Texts& lines, std::string const& name, support::RecordedDialogue const& dialogue)
 {

@@ -91,7 +91,7 @@ struct RangeCase
 {
     std::shared_ptr<SupportedOids> query;
     Bytes request;
-    Bytes lead; // of the reply, up to the mask, on an older bus
+    Bytes lead; // of the reply, up to the mask, on a legacy bus
     Bytes canLead;
     unsigned int timeout;
 };

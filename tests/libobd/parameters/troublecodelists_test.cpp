@@ -1,4 +1,4 @@
-#include "libobd/parameters/troublecodelists.h"
+#include "libobd/parameters/dtcparameter.h"
 #include "tests/libobd/parameters/diagnosticsrig.h"
 
 #include <gtest/gtest.h>

@@ -103,7 +103,7 @@ TEST_F(DecodeTable, FreezeFramesReadTheSame)
     }
 }
 
-// A checksum may trail the data on the older buses.
+// A checksum may trail the data on the legacy buses.
 TEST_F(DecodeTable, BytesBehindTheDataChangeNothing)
 {
     for (DecodeRow const& row : allRows()) {

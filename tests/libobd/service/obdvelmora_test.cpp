@@ -8,8 +8,6 @@
 
 #include <obd/iconnectionmanager.h>
 #include <obd/iconnectionnotifier.h>
-#include <obd/iconnectionnotifierlistener.h>
-#include <obd/iconnectionphaselistener.h>
 #include <obd/iconnectionservice.h>
 #include <obd/iecumanager.h>
 #include <obd/iobdproxy.h>

@@ -1,6 +1,6 @@
 #include "tests/libobd/service/sensorservicefixture.h"
 
-#include <obd/parameterdatamodel.h>
+#include <obd/sensordatamodels.h>
 
 namespace {
 

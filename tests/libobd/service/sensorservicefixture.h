@@ -6,7 +6,7 @@
 #include <obd/isensorservice.h>
 #include <obd/ivelmorasettings.h>
 #include <obd/parameterdescriptor.h>
-#include <obd/sensorvaluedatamodel.h>
+#include <obd/sensordatamodels.h>
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>

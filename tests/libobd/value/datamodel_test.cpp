@@ -1,4 +1,4 @@
-#include <obd/parameterdatamodel.h>
+#include <obd/sensordatamodels.h>
 
 #include <gtest/gtest.h>
 

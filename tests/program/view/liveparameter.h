@@ -4,9 +4,9 @@
 
 #include <obd/parameterdescriptor.h>
 #include <obd/powertrainparameter.h>
+#include <obd/sensordatamodels.h>
 #include <obd/sensorinfo.h>
 #include <obd/sensorvalue.h>
-#include <obd/sensorvaluedatamodel.h>
 
 namespace support {
 

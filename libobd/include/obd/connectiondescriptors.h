@@ -6,6 +6,23 @@
 
 namespace obd {
 
+/// How to reach an adapter over Bluetooth.
+class BluetoothDescriptor
+{
+public:
+    /// White space at both ends of the name is stripped. port is the RFCOMM channel.
+    OBD_EXPORT BluetoothDescriptor(std::string const& name, std::string const& address, int port);
+
+    std::string const& name() const { return m_name; }
+    std::string const& address() const { return m_address; }
+    int port() const { return m_port; }
+
+private:
+    std::string m_name;
+    std::string m_address;
+    int m_port;
+};
+
 /// How to reach an adapter over a serial port.
 class SerialDescriptor
 {
@@ -31,6 +48,20 @@ private:
     int m_baudrate;
     int m_initialBaudrate;
     std::string m_description;
+};
+
+/// How to reach an adapter over TCP.
+class TcpDescriptor
+{
+public:
+    OBD_EXPORT TcpDescriptor(std::string const& address, int port);
+
+    std::string const& address() const { return m_address; }
+    int port() const { return m_port; }
+
+private:
+    std::string m_address;
+    int m_port;
 };
 
 } // namespace obd
