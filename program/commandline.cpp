@@ -121,6 +121,8 @@ void CommandLine::addGlobalOptions()
         ->envname("VELMORA_SETTINGS");
     m_app.add_flag("--reset", m_options.reset, "Restore and reset the adapter before use");
     m_app.add_flag("-y,--yes", m_options.yes, "Don't ask before clearing codes or running a routine");
+    m_app.add_flag("--sleep", m_options.sleep, "Send the adapter to sleep at the end, which the next visit pays for");
+    m_app.add_flag("--forget", m_options.forget, "Forget what earlier visits have learnt of adapters and vehicles");
     m_app.add_flag("-q,--quiet", m_options.quiet, "No progress on standard error");
     m_app.add_flag("-v,--verbose", m_options.verbose, "More progress on standard error");
     addParsed(m_app, "--color", m_options.color, parseColor, "auto, always or never",

@@ -28,6 +28,8 @@ struct GlobalOptions
     std::string traceFile;
     std::string settingsFile;
     bool reset = false;
+    bool sleep = false;  // send the adapter to sleep at the end
+    bool forget = false; // drop what earlier visits have learnt
     bool yes = false;
     bool quiet = false;
     bool verbose = false;

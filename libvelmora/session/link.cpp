@@ -1,13 +1,12 @@
 #include "libvelmora/session/link.h"
 
-#include <obd/databridge.h>
-
 #include <utility>
 
 namespace velmora {
 
-Link::Link(std::unique_ptr<IPort> port)
-    : m_bridge(std::make_shared<obd::DataBridge>()), m_pump(std::move(port), m_bridge)
+Link::Link(std::unique_ptr<IPort> port, ChannelOptions options, std::shared_ptr<LearntStore> learnt)
+    : m_wire(std::make_shared<PortWire>(std::move(port))),
+      m_channel(std::make_shared<FastChannel>(m_wire, std::move(options), std::move(learnt)))
 {}
 
 Link::~Link()
@@ -15,14 +14,14 @@ Link::~Link()
     cut();
 }
 
-std::shared_ptr<obd::IDataConnection> Link::connection() const
-{
-    return m_bridge;
-}
-
 void Link::cut()
 {
-    m_bridge->invalidate();
+    m_wire->giveUp();
+}
+
+bool Link::lost() const
+{
+    return m_wire->lost() || m_channel->adapterFails();
 }
 
 } // namespace velmora

@@ -1,15 +1,10 @@
 #pragma once
 
-#include "libvelmora/port/bridgepump.h"
+#include "libvelmora/channel/fastchannel.h"
+#include "libvelmora/channel/portwire.h"
 #include "libvelmora/port/iport.h"
 
-#include <obd/idataconnection.h>
-
 #include <memory>
-
-namespace obd {
-class DataBridge;
-}
 
 namespace velmora {
 
@@ -17,21 +12,23 @@ namespace velmora {
 class Link
 {
 public:
-    explicit Link(std::unique_ptr<IPort> port);
+    Link(std::unique_ptr<IPort> port, ChannelOptions options, std::shared_ptr<LearntStore> learnt);
     ~Link();
     Link(Link const&) = delete;
     Link& operator=(Link const&) = delete;
 
     // What the library opens.
-    std::shared_ptr<obd::IDataConnection> connection() const;
+    std::shared_ptr<obd::IDataConnection> connection() const { return m_channel; }
+    // What it is told beside the bytes, and what it tells.
+    IChannelControl& control() const { return *m_channel; }
     // Ends all waiting on the link for good. Any thread.
     void cut();
-    // Whether the port was lost, rather than the link being cut here.
-    bool lost() const { return m_pump.lost(); }
+    // Whether the port was lost, or the adapter can't be kept at work, rather than the link being cut here.
+    bool lost() const;
 
 private:
-    std::shared_ptr<obd::DataBridge> m_bridge;
-    BridgePump m_pump;
+    std::shared_ptr<PortWire> m_wire;
+    std::shared_ptr<FastChannel> m_channel;
 };
 
 } // namespace velmora

@@ -19,6 +19,7 @@
 #include <atomic>
 #include <thread>
 #include <utility>
+#include <variant>
 
 namespace velmora {
 
@@ -110,6 +111,7 @@ void Session::connect()
     if (!openOnThread()) {
         failOpening(address);
     }
+    channel().onConnected();
     if (m_options.onDetail) {
         tellConnected();
     }
@@ -122,7 +124,19 @@ void Session::openLink(PortAddress const& address)
     if (m_recorder != nullptr) {
         port = std::make_unique<RecordedPort>(std::move(port), *m_recorder);
     }
-    m_link = std::make_unique<Link>(std::move(port));
+    auto learnt = std::make_shared<LearntStore>(LearntStore::besides(m_settings->file()));
+    if (m_options.forget) {
+        learnt->forget();
+    }
+    ChannelOptions options{.port = toString(address), .sleepAtEnd = m_options.sleep};
+    bool const inProcess =
+        std::holds_alternative<SimulatorAddress>(address) || std::holds_alternative<ReplayAddress>(address);
+    // A recording holds what every reader of it would ask, which is no matter of haste.
+    bool const recorded = m_recorder != nullptr || std::holds_alternative<ReplayAddress>(address);
+    options.counting = !recorded;
+    options.shortWait = !recorded;
+    // What is simulated in this process is no adapter that somebody comes back to.
+    m_link = std::make_unique<Link>(std::move(port), std::move(options), inProcess ? nullptr : std::move(learnt));
 }
 
 void Session::tellProgress(std::string const& lines) const
@@ -140,6 +154,20 @@ void Session::tellConnected() const
     for (std::shared_ptr<obd::IEcu> const& ecu : m_obd->getEcuManager()->getEcus()) {
         m_options.onDetail(fmt::format("Control module {:X}: {} ({})\n", ecu->id(), readable(ecu->name()),
                                        readable(ecu->description())));
+    }
+}
+
+void Session::tellHabits() const
+{
+    ChannelStatistics const statistics = channel().statistics();
+    for (std::size_t i = 0; i < habitCount; ++i) {
+        if (statistics.habits[i] != 0) {
+            m_options.onDetail(
+                fmt::format("The adapter's habits: {}, {}x\n", habitName(static_cast<Habit>(i)), statistics.habits[i]));
+        }
+    }
+    if (statistics.waitMs) {
+        m_options.onDetail(fmt::format("The adapter's wait for replies was shortened to {} ms\n", *statistics.waitMs));
     }
 }
 
@@ -244,6 +272,9 @@ void Session::close()
     m_obd->getConnectionManager()->closeConnection();
     m_link->cut();
     m_deadline.stop();
+    if (m_options.onDetail) {
+        tellHabits();
+    }
     m_link.reset();
 }
 

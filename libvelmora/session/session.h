@@ -52,6 +52,8 @@ public:
     std::shared_ptr<obd::IAdapter> adapter() const;
     // The port's address, for messages and reports.
     std::string port() const { return toString(portAddress()); }
+    // What the channel to the adapter is told, and tells. After connect only.
+    IChannelControl& channel() const { return m_link->control(); }
     DispatchLoop& loop() { return m_loop; }
     SessionOptions const& options() const { return m_options; }
     // Tells whoever wants to know what the session is at: lines with their line feeds.
@@ -79,6 +81,7 @@ private:
     bool openOnThread();
     [[noreturn]] void failOpening(PortAddress const& address);
     void tellConnected() const;
+    void tellHabits() const;
     void selectEcu();
     void close();
 

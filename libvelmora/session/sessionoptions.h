@@ -18,6 +18,8 @@ struct SessionOptions
     std::optional<obd::UnitSystem> units;
     std::optional<unsigned int> ecu; // control module id
     bool reset = false;              // restore and reset the adapter before use
+    bool sleep = false;              // send the adapter to sleep at the end, which costs the next visit time
+    bool forget = false;             // drop what earlier visits have learnt of adapters and vehicles
     std::string logFile;
     std::string traceFile;
     std::string settingsFile;

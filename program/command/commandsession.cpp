@@ -16,6 +16,8 @@ SessionOptions sessionOptions(GlobalOptions const& options)
     result.units = options.units;
     result.ecu = options.ecu;
     result.reset = options.reset;
+    result.sleep = options.sleep;
+    result.forget = options.forget;
     result.logFile = options.logFile;
     result.traceFile = options.traceFile;
     result.settingsFile = options.settingsFile;

@@ -1,0 +1,178 @@
+#include "libvelmora/channel/busline.h"
+
+#include "libvelmora/channel/elmcommand.h"
+
+#include <algorithm>
+
+namespace velmora {
+
+namespace {
+
+using FrameBytes = std::vector<std::uint8_t>;
+
+constexpr std::size_t canFrameBytes = 8;
+constexpr std::size_t legacyHeaderBytes = 3;
+
+FrameBytes decodedDigits(std::string_view digits)
+{
+    FrameBytes bytes;
+    for (std::size_t i = 0; i + 1 < digits.size(); i += 2) {
+        int const high = hexDigitValue(digits[i]);
+        int const low = hexDigitValue(digits[i + 1]);
+        if (high < 0 || low < 0) {
+            return {};
+        }
+        bytes.push_back(static_cast<std::uint8_t>(high << 4 | low));
+    }
+    return bytes;
+}
+
+unsigned int numberOf(std::string_view digits)
+{
+    unsigned int number = 0;
+    for (char const digit : digits) {
+        number = number << 4U | static_cast<unsigned int>(hexDigitValue(digit));
+    }
+    return number;
+}
+
+std::optional<BusLine> readSingle(BusLine line)
+{
+    std::size_t const length = line.bytes[0];
+    if (length == 0 || line.bytes.size() < length + 1) {
+        return std::nullopt;
+    }
+    line.payload.assign(line.bytes.begin() + 1, line.bytes.begin() + 1 + static_cast<std::ptrdiff_t>(length));
+    return line;
+}
+
+std::optional<BusLine> readFirst(BusLine line)
+{
+    std::size_t const length = (line.bytes[0] & 0x0FU) << 8U | line.bytes.at(1);
+    if (line.bytes.size() != canFrameBytes || length < canFrameBytes - 1) {
+        return std::nullopt;
+    }
+    line.kind = BusLine::Kind::First;
+    line.payload.assign(line.bytes.begin() + 2, line.bytes.end());
+    return line;
+}
+
+std::optional<BusLine> parseCanLine(BusKind bus, std::string_view digits)
+{
+    std::size_t const headerDigits = bus == BusKind::Can11 ? 3 : 8;
+    if (digits.size() < headerDigits + 4 || (digits.size() - headerDigits) % 2 != 0) {
+        return std::nullopt;
+    }
+    BusLine line;
+    line.header = std::string(digits.substr(0, headerDigits));
+    line.module = numberOf(line.header) & 0x1FFFFFFFU;
+    line.bytes = decodedDigits(digits.substr(headerDigits));
+    if (line.bytes.empty() || line.bytes.size() > canFrameBytes) {
+        return std::nullopt;
+    }
+    switch (line.bytes[0] >> 4U) {
+    case 0:
+        return readSingle(std::move(line));
+    case 1:
+        return readFirst(std::move(line));
+    case 2:
+        line.kind = BusLine::Kind::Consecutive;
+        line.payload.assign(line.bytes.begin() + 1, line.bytes.end());
+        return line;
+    default:
+        return std::nullopt;
+    }
+}
+
+// The format byte of ISO 14230 holds the length in its low bits. Some adapters print no check byte.
+std::optional<std::size_t> kwpDataLength(FrameBytes const& bytes)
+{
+    std::size_t const length = bytes[0] & 0x3FU;
+    std::size_t const rest = bytes.size() - legacyHeaderBytes;
+    return length != 0 && (rest == length || rest == length + 1) ? std::optional(length) : std::nullopt;
+}
+
+std::optional<BusLine> parseLegacyLine(BusKind bus, std::string_view digits)
+{
+    FrameBytes const bytes = decodedDigits(digits);
+    if (digits.size() % 2 != 0 || bytes.size() < legacyHeaderBytes + 2) {
+        return std::nullopt;
+    }
+    std::size_t dataLength = bytes.size() - legacyHeaderBytes - 1;
+    if (bus == BusKind::Kwp) {
+        std::optional<std::size_t> const told = kwpDataLength(bytes);
+        if (!told) {
+            return std::nullopt;
+        }
+        dataLength = *told;
+    }
+    BusLine line;
+    line.header = std::string(digits.substr(0, 2 * legacyHeaderBytes));
+    line.module = bytes[2];
+    line.bytes.assign(bytes.begin() + legacyHeaderBytes, bytes.end());
+    line.payload.assign(line.bytes.begin(), line.bytes.begin() + static_cast<std::ptrdiff_t>(dataLength));
+    return line;
+}
+
+// SAE J1850: polynomial x^8 + x^4 + x^3 + x^2 + 1, all bits set at the start, inverted in the end.
+std::uint8_t j1850CheckByte(FrameBytes const& bytes)
+{
+    unsigned int check = 0xFF;
+    for (std::uint8_t const byte : bytes) {
+        check ^= byte;
+        for (int bit = 0; bit < 8; ++bit) {
+            check = (check & 0x80U) != 0 ? (check << 1U ^ 0x1DU) & 0xFFU : check << 1U;
+        }
+    }
+    return static_cast<std::uint8_t>(~check);
+}
+
+} // namespace
+
+BusKind busKindOf(int protocol)
+{
+    constexpr BusKind kinds[] = {BusKind::Unknown, BusKind::J1850, BusKind::J1850, BusKind::Iso9141, BusKind::Kwp,
+                                 BusKind::Kwp,     BusKind::Can11, BusKind::Can29, BusKind::Can11,   BusKind::Can29};
+    return protocol >= 1 && protocol <= 9 ? kinds[protocol] : BusKind::Unknown;
+}
+
+bool isCanBus(BusKind bus)
+{
+    return bus == BusKind::Can11 || bus == BusKind::Can29;
+}
+
+std::optional<BusLine> parseBusLine(BusKind bus, std::string_view digits)
+{
+    if (bus == BusKind::Unknown) {
+        return std::nullopt;
+    }
+    return isCanBus(bus) ? parseCanLine(bus, digits) : parseLegacyLine(bus, digits);
+}
+
+bool hasRightCheckByte(BusKind bus, std::string_view digits)
+{
+    FrameBytes bytes = decodedDigits(digits);
+    if (digits.size() % 2 != 0 || bytes.size() < 2) {
+        return false;
+    }
+    std::uint8_t const told = bytes.back();
+    bytes.pop_back();
+    unsigned int sum = 0;
+    for (std::uint8_t const byte : bytes) {
+        sum += byte;
+    }
+    return told == (bus == BusKind::J1850 ? j1850CheckByte(bytes) : static_cast<std::uint8_t>(sum));
+}
+
+std::string frameDigits(std::vector<std::uint8_t> const& bytes)
+{
+    constexpr char digits[] = "0123456789ABCDEF";
+    std::string text;
+    for (std::uint8_t const byte : bytes) {
+        text += digits[byte >> 4U];
+        text += digits[byte & 0x0FU];
+    }
+    return text;
+}
+
+} // namespace velmora

@@ -1,0 +1,91 @@
+#include "libvelmora/channel/canmessagelist.h"
+
+#include <algorithm>
+
+namespace velmora {
+
+namespace {
+
+constexpr std::size_t firstFrameBytes = 6;
+constexpr std::size_t consecutiveBytes = 7;
+constexpr std::size_t wholeFrameBytes = 8;
+constexpr unsigned int sequenceNumbers = 16;
+
+} // namespace
+
+bool ModuleMessages::add(BusLine const& line, std::string const& digits, std::size_t place)
+{
+    if (line.kind == BusLine::Kind::Consecutive) {
+        return addConsecutive(line, digits, place);
+    }
+    ModuleMessage message;
+    message.module = line.module;
+    message.payload = line.payload;
+    message.places = {place};
+    message.length = line.payload.size();
+    message.lines = {digits};
+    if (line.kind == BusLine::Kind::First) {
+        ModuleMessage const* const before = open(line.module);
+        if (before != nullptr && before->lines.size() == 1 && before->lines.front() == digits) {
+            note(Habit::RepeatedFrame);
+            return false;
+        }
+        message.length = (line.bytes[0] & 0x0FU) << 8U | line.bytes[1];
+    } else if (isCanBus(m_bus) && line.bytes.size() > line.payload.size() + 1) {
+        note(Habit::Padding);
+        message.lines = {line.header + frameDigits({line.bytes[0]}) + frameDigits(line.payload)};
+    }
+    m_messages.push_back(std::move(message));
+    return true;
+}
+
+ModuleMessage* ModuleMessages::open(unsigned int module)
+{
+    auto const found = std::find_if(m_messages.rbegin(), m_messages.rend(),
+                                    [module](ModuleMessage const& message) { return message.module == module; });
+    return found != m_messages.rend() && found->segmented() ? &*found : nullptr;
+}
+
+bool ModuleMessages::addConsecutive(BusLine const& line, std::string const& digits, std::size_t place)
+{
+    ModuleMessage* const message = open(line.module);
+    if (message == nullptr) {
+        ++m_orphans[line.module];
+        note(Habit::OrphanFrame);
+        return false;
+    }
+    if (message->lines.size() > 1 && message->lines.back() == digits) {
+        note(Habit::RepeatedFrame);
+        return false;
+    }
+    if (message->payload.size() >= message->length) {
+        note(Habit::OrphanFrame);
+        return false;
+    }
+    std::size_t const number = message->lines.size();
+    if ((line.bytes[0] & 0x0FU) != number % sequenceNumbers) {
+        message->inOrder = false;
+    }
+    std::size_t const missing = message->length - firstFrameBytes - consecutiveBytes * (number - 1);
+    std::size_t const needed = std::min(missing, consecutiveBytes);
+    if (line.payload.size() < needed) {
+        note(Habit::BrokenLine);
+        return false;
+    }
+    std::string text = digits;
+    if (line.bytes.size() < wholeFrameBytes) {
+        note(Habit::ShortLastFrame);
+        text += std::string(2 * (wholeFrameBytes - line.bytes.size()), '0');
+    }
+    message->payload.insert(message->payload.end(), line.payload.begin(),
+                            line.payload.begin() + static_cast<std::ptrdiff_t>(needed));
+    bool const twice = std::any_of(message->lines.begin() + 1, message->lines.end(), [&](std::string const& other) {
+        return number < sequenceNumbers && other.substr(line.header.size(), 2) == text.substr(line.header.size(), 2);
+    });
+    message->broken = message->broken || twice;
+    message->lines.push_back(text);
+    message->places.push_back(place);
+    return true;
+}
+
+} // namespace velmora

@@ -1,0 +1,176 @@
+#pragma once
+
+#include "libvelmora/channel/adapterstate.h"
+#include "libvelmora/channel/bringupmemory.h"
+#include "libvelmora/channel/countlearner.h"
+#include "libvelmora/channel/ichannelcontrol.h"
+#include "libvelmora/channel/learntstore.h"
+#include "libvelmora/channel/replyhealer.h"
+#include "libvelmora/channel/wire.h"
+
+#include <obd/idataconnection.h>
+
+#include <atomic>
+#include <deque>
+#include <map>
+#include <memory>
+#include <mutex>
+#include <set>
+#include <string>
+#include <thread>
+
+namespace velmora {
+
+struct ChannelOptions
+{
+    std::string port;        // where the adapter is, for what is kept of it
+    bool sleepAtEnd = false; // the core's wish to send the adapter to sleep is passed on
+    bool counting = true;    // requests may get an expected count
+    bool shortWait = true;   // the adapter's wait for more replies may be shortened
+};
+
+// The channel between the core's driver, which is slow and careful, and an adapter, which may be odd: fast and
+// forgiving. It knows what it has asked, so it waits for nothing that can't come, and takes out of replies what makes
+// them unreadable; a byte of data it never changes.
+//
+//   idle -> send -> pending -> the prompt -> idle
+//                    |  a reply with something missing, a reset: asked again in place
+//                    |  the host has given up: the next send waits for the late prompt, or wakes the adapter
+//
+// All work is done on the threads that send and receive. The members stand in several files: fastchannel.cpp (the
+// interface), fastchannel_exchange.cpp (one exchange), fastchannel_recovery.cpp (prompts lost, adapters reset),
+// fastchannel_haste.cpp (counts, waits, memory, addresses).
+class FastChannel : public obd::IDataConnection, public IChannelControl
+{
+public:
+    // The store may be null.
+    FastChannel(std::shared_ptr<IWire> wire, ChannelOptions options, std::shared_ptr<LearntStore> store = nullptr);
+    ~FastChannel() override;
+    FastChannel(FastChannel const&) = delete;
+    FastChannel& operator=(FastChannel const&) = delete;
+
+    void setDelimiter(char delimiter) override { m_delimiter = delimiter; }
+    bool isValid() const override { return m_wire->isUp() && !m_lost; }
+    bool receive(std::vector<unsigned char>& out, int timeoutMs) override;
+    void send(std::vector<unsigned char> const& bytes) override;
+    void addLogger(obd::IConnectionLogger* logger) override;
+    void removeLogger(obd::IConnectionLogger* logger) override;
+
+    void addressModule(std::optional<unsigned int> module) override;
+    void onConnected() override;
+    ChannelStatistics statistics() const override;
+
+    // Ends whatever waits, soon. Any thread.
+    void invalidate() { m_wire->giveUp(); }
+    // Whether the adapter reset itself so often that the link is taken for lost.
+    bool adapterFails() const { return m_lost; }
+
+private:
+    struct Pending
+    {
+        ElmCommand command;
+        std::string sent; // the last text for it that was written
+        std::string key;  // of what is learnt: the request, and the module that it is addressed to
+        WireTime sentAt{0};
+        WireTime heardAt{0}; // the last byte
+        WireTime dataAt{0};  // the last digit of a reply
+        std::optional<unsigned int> address;
+        std::optional<unsigned int> count;
+        bool heard = false;
+        bool askedAgain = false;
+        bool woken = false;
+        bool verifying = false; // asked once more with the full wait
+        bool setUpAgain = false;
+    };
+
+    // One exchange.
+    void begin(std::string const& text);
+    void write(std::string const& text);
+    void writePending(std::string const& text);
+    void drain();
+    void hear(std::string const& bytes);
+    void takeReplies();
+    std::optional<std::string> cutReply();
+    void finish(std::string const& raw);
+    bool shouldAskAgain(HealedReply const& reply) const;
+    void observe(HealedReply const& reply);
+    void deliver(std::string const& text);
+    void endExchange();
+    ReplyContext context() const;
+    std::optional<std::string> ask(std::string const& text, WireTime limit);
+    std::optional<std::string> awaitReply(WireTime until);
+    bool confirms(std::string const& text, WireTime limit);
+
+    // Prompts lost, adapters reset.
+    WireTime remedyTime() const;
+    void remedy();
+    void settle();
+    bool wake(std::string& before);
+    bool isIdentity(std::string const& reply) const;
+    bool tellsLostSettings(HealedReply const& reply);
+    bool setUpAgain(HealedReply const& reply);
+
+    // Counts, waits, memory, addresses.
+    std::optional<unsigned int> countFor(Pending const& pending) const;
+    bool takeCounted(HealedReply const& reply, WireTime took);
+    bool triesProtocol(std::string const& text);
+    bool fallsBackToSearch(HealedReply const& reply);
+    bool needsFullWait(HealedReply const& reply) const;
+    void adaptWait(HealedReply const& reply);
+    void setWait(unsigned int steps);
+    void giveWaitBack();
+    void setAddress(Pending& pending);
+    void restoreAddress();
+    void learnVehicle(HealedReply const& reply);
+    std::string adapterKey() const;
+    void keepLearnt();
+
+    void note(Habit habit) { ++m_habits[static_cast<std::size_t>(habit)]; }
+    void publish();
+    void tellSent(std::string const& bytes);
+    void tellReceived(std::string const& bytes);
+
+    std::shared_ptr<IWire> const m_wire;
+    ChannelOptions const m_options;
+    std::shared_ptr<LearntStore> const m_store;
+    std::atomic<char> m_delimiter{'>'};
+    std::atomic<bool> m_lost{false};
+    std::atomic<bool> m_sleepAnswered{false};
+    std::atomic<bool> m_connected{false};
+
+    // An exchange holds it; so does each look at what belongs to one.
+    std::timed_mutex m_exchange;
+    std::string m_buffer;
+    std::deque<std::string> m_ready;
+    std::optional<Pending> m_pending;
+    AdapterState m_state;
+    HabitCounts m_habits{};
+    ReplyHealer m_healer{m_habits};
+    CountLearner m_learner;
+    BringUpMemory m_memory;
+    ChannelStatistics m_working;
+    bool m_echoChecked = false;
+    bool m_echoStuck = false;
+    bool m_silent = false;
+    bool m_busSpoke = false; // a request has brought data
+    bool m_begun = false;    // something was sent
+    bool m_starting = false; // a reset was the last command
+    int m_protocolsChosen = 0;
+    std::optional<WireTime> m_resetAt; // the last reset of the adapter
+    int m_triedProtocol = 0;           // sent in the place of a search; 0 for none
+    bool m_protocolTried = false;
+    unsigned int m_waitSteps = 0;  // of 4.096 ms, where the channel has shortened the wait
+    unsigned int m_waitBefore = 0; // what a wait that was given back had been
+    WireTime m_slowest{0};
+    std::set<std::string> m_verified; // requests whose silent modules were given the full wait once
+    std::string m_vin;
+
+    std::mutex m_loggerMutex; // held while a logger is called, so that none is called once it is removed
+    std::vector<obd::IConnectionLogger*> m_loggers;
+
+    mutable std::mutex m_sharedMutex; // a leaf; protects what follows
+    std::map<std::thread::id, unsigned int> m_addresses;
+    ChannelStatistics m_statistics;
+};
+
+} // namespace velmora

@@ -1,0 +1,234 @@
+// What saves time: expected counts, a shorter wait, what this and earlier visits have told.
+
+#include "libvelmora/channel/fastchannel.h"
+
+#include <algorithm>
+#include <cmath>
+#include <utility>
+
+namespace velmora {
+
+namespace {
+
+constexpr WireTime ownCommandLimit{700};
+constexpr double adapterStepMs = 4.096;
+constexpr unsigned int shortestWaitSteps = 25; // 102.4 ms: what STN adapters have by default
+constexpr WireTime worthShortening{150};       // adapters that adapt their wait need no other
+constexpr int j1850Pwm = 1;
+
+unsigned int stepsOf(std::string const& setting)
+{
+    unsigned int steps = 0;
+    for (char const digit : setting.substr(std::min<std::size_t>(4, setting.size()))) {
+        steps = steps * 16 + static_cast<unsigned int>(std::max(hexDigitValue(digit), 0));
+    }
+    return steps;
+}
+
+std::string waitCommand(unsigned int steps)
+{
+    return "ATST" + frameDigits({static_cast<std::uint8_t>(std::min(steps, 0xFFU))});
+}
+
+struct ModuleAddress
+{
+    std::string set;
+    std::string restore;
+};
+
+// By ISO 15765-4 the engine's 7E8 listens to 7E0, 18DAF110 to 18DA10F1.
+std::optional<ModuleAddress> addressOf(BusKind bus, unsigned int module)
+{
+    if (bus == BusKind::Can11 && module >= 0x7E8 && module <= 0x7EF) {
+        return ModuleAddress{"ATSH7E" + std::to_string(module - 0x7E8), "ATSH7DF"};
+    }
+    if (bus == BusKind::Can29 && (module & 0xFFFFFF00U) == 0x18DAF100U) {
+        return ModuleAddress{"ATSHDA" + frameDigits({static_cast<std::uint8_t>(module & 0xFFU)}) + "F1", "ATSHDB33F1"};
+    }
+    return std::nullopt;
+}
+
+// The characters behind 49 02 and the count of items, or nothing.
+std::string vinOf(std::vector<std::uint8_t> const& message)
+{
+    constexpr std::size_t vinBytes = 17;
+    if (message.size() != 3 + vinBytes) {
+        return {};
+    }
+    std::string const vin(message.begin() + 3, message.end());
+    bool const plain =
+        std::all_of(vin.begin(), vin.end(), [](char c) { return (c >= '0' && c <= '9') || (c >= 'A' && c <= 'Z'); });
+    return plain ? vin : std::string();
+}
+
+} // namespace
+
+// Never on SAE J1850 PWM: a reply that the adapter does not take there is sent again and again.
+std::optional<unsigned int> FastChannel::countFor(Pending const& pending) const
+{
+    bool const allowed = m_state.shownBus() != BusKind::Unknown && m_state.protocol() != j1850Pwm && m_connected &&
+                         pending.command.hasFixedShape();
+    return allowed ? m_learner.countFor(pending.key, m_wire->now()) : std::nullopt;
+}
+
+// False if the request is to be asked plainly.
+bool FastChannel::takeCounted(HealedReply const& reply, WireTime took)
+{
+    if (reply.whole() && m_learner.accept(m_pending->key, reply.frames, took)) {
+        ++m_working.counted;
+        return true;
+    }
+    note(Habit::UnfinishedCount);
+    m_pending->count.reset();
+    if (reply.refused) {
+        m_learner.switchOff();
+    } else {
+        m_learner.fail(m_pending->key);
+    }
+    return false;
+}
+
+std::string FastChannel::adapterKey() const
+{
+    return m_options.port + " " + m_state.identity();
+}
+
+// Where the core lets the adapter search, the bus that was found last time is tried first.
+bool FastChannel::triesProtocol(std::string const& text)
+{
+    if (compactText(text) != "ATTP0" || m_protocolTried || m_store == nullptr || m_state.identity().empty()) {
+        return false;
+    }
+    m_protocolTried = true;
+    m_triedProtocol = m_store->protocol(adapterKey());
+    return m_triedProtocol != 0;
+}
+
+// It was another vehicle: the search takes place after all, within the time of the core's first request.
+bool FastChannel::fallsBackToSearch(HealedReply const& reply)
+{
+    if (m_triedProtocol == 0 || !m_pending->command.isRequest()) {
+        return false;
+    }
+    m_triedProtocol = 0;
+    if (reply.data && reply.error.empty()) {
+        return false;
+    }
+    ++m_protocolsChosen;
+    if (!confirms("ATTP0", ownCommandLimit)) {
+        return false;
+    }
+    m_state.setProtocol(0);
+    m_protocolsChosen = 1;
+    writePending(m_pending->command.text());
+    return true;
+}
+
+// A module that was discovered has said nothing while the wait was shorter than the core has set it: the first time
+// that this request shows that, it gets the full wait.
+bool FastChannel::needsFullWait(HealedReply const& reply) const
+{
+    if (m_waitSteps == 0 || !m_pending->command.onlyReads() || m_verified.contains(m_pending->key)) {
+        return false;
+    }
+    if (m_pending->address) {
+        return !reply.spoke.contains(*m_pending->address);
+    }
+    std::set<unsigned int> const& modules = m_memory.modules();
+    return !std::includes(reply.spoke.begin(), reply.spoke.end(), modules.begin(), modules.end());
+}
+
+// Not under what an adapter has by default, not under twice the slowest reply, never on a K line, where a wait that is
+// too short makes the adapter talk over a module that still answers.
+void FastChannel::adaptWait(HealedReply const& reply)
+{
+    if (!reply.answered || reply.notices || m_pending->woken) {
+        return; // the time of a search, of a bus start or of a lost prompt is no module's
+    }
+    m_slowest = std::max(m_slowest, m_pending->dataAt - m_pending->sentAt);
+    bool const waitsLong = m_waitSteps != 0 || m_wire->now() - m_pending->dataAt > worthShortening;
+    unsigned int const full = stepsOf(m_state.setting("ATST"));
+    bool const kLine = m_state.shownBus() == BusKind::Iso9141 || m_state.shownBus() == BusKind::Kwp;
+    if (!m_options.shortWait || !waitsLong || kLine || full == 0 || m_pending->verifying) {
+        return;
+    }
+    auto const twice =
+        static_cast<unsigned int>(std::ceil(2.0 * static_cast<double>(m_slowest.count()) / adapterStepMs));
+    unsigned int const steps = std::max(twice, shortestWaitSteps);
+    if (steps >= full) {
+        giveWaitBack();
+    } else if (m_waitSteps == 0 || steps > m_waitSteps) {
+        setWait(steps);
+    }
+}
+
+void FastChannel::setWait(unsigned int steps)
+{
+    m_waitBefore = 0;
+    m_waitSteps = confirms(waitCommand(steps), ownCommandLimit) ? steps : 0;
+}
+
+void FastChannel::giveWaitBack()
+{
+    if (m_waitSteps != 0 && confirms(m_state.setting("ATST"), ownCommandLimit)) {
+        m_waitBefore = std::exchange(m_waitSteps, 0);
+    }
+}
+
+void FastChannel::setAddress(Pending& pending)
+{
+    unsigned int module = 0;
+    {
+        std::lock_guard const lock(m_sharedMutex);
+        auto const found = m_addresses.find(std::this_thread::get_id());
+        module = found != m_addresses.end() ? found->second : 0;
+    }
+    std::optional<ModuleAddress> const address = addressOf(m_state.shownBus(), module);
+    if (address && confirms(address->set, ownCommandLimit)) {
+        pending.address = module;
+        pending.key += " " + address->set;
+    }
+}
+
+// An address that stayed would leave the other modules unasked: without a confirmation the link is given up.
+void FastChannel::restoreAddress()
+{
+    std::string const own = m_state.setting("ATSH");
+    std::string const restore = !own.empty() ? own : m_state.shownBus() == BusKind::Can11 ? "ATSH7DF" : "ATSHDB33F1";
+    std::string ignored;
+    if (!confirms(restore, ownCommandLimit) && !(wake(ignored) && confirms(restore, ownCommandLimit))) {
+        m_lost = true;
+    }
+}
+
+void FastChannel::learnVehicle(HealedReply const& reply)
+{
+    if (m_store == nullptr || m_pending->command.text() != "0902") {
+        return;
+    }
+    for (auto const& [module, message] : reply.messages) {
+        std::string const vin = vinOf(message);
+        if (vin.empty() || !m_vin.empty()) {
+            continue;
+        }
+        m_vin = vin;
+        for (auto const& [request, frames] : m_store->counts(vin)) {
+            m_learner.recall(request, frames);
+        }
+    }
+}
+
+void FastChannel::keepLearnt()
+{
+    if (m_store == nullptr || !m_connected || m_state.identity().empty()) {
+        return;
+    }
+    m_store->setProtocol(adapterKey(), m_state.protocol());
+    m_store->setCanCount(adapterKey(), m_learner.works() || !m_learner.isOff());
+    if (!m_vin.empty()) {
+        m_store->setCounts(m_vin, m_learner.learnt());
+    }
+    m_store->save();
+}
+
+} // namespace velmora

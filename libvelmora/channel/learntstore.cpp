@@ -1,0 +1,159 @@
+#include "libvelmora/channel/learntstore.h"
+
+#include <toml++/toml.h>
+
+#include <fstream>
+#include <system_error>
+#include <utility>
+
+namespace velmora {
+
+namespace {
+
+// The file holds some hundred requests of some vehicles; a larger one is not ours.
+constexpr std::uintmax_t largestFile = 1U << 20U;
+
+// "2024:2 2025:1", modules in decimal: keys of a table would sort and quote otherwise.
+std::string frameText(FrameSet const& frames)
+{
+    std::string text;
+    for (auto const& [module, count] : frames) {
+        text += (text.empty() ? "" : " ") + std::to_string(module) + ":" + std::to_string(count);
+    }
+    return text;
+}
+
+// Nothing for a text that is none of ours.
+FrameSet readFrameText(std::string const& text)
+{
+    FrameSet frames;
+    std::istringstream in(text);
+    unsigned int module = 0;
+    unsigned int count = 0;
+    char colon = 0;
+    while (in >> module >> colon >> count) {
+        frames[module] = count;
+    }
+    return in.eof() ? frames : FrameSet();
+}
+
+} // namespace
+
+LearntStore::LearntStore(std::filesystem::path file) : m_file(std::move(file))
+{
+    load();
+}
+
+void LearntStore::load()
+{
+    std::error_code error;
+    if (!std::filesystem::is_regular_file(m_file, error) || std::filesystem::file_size(m_file, error) > largestFile) {
+        return;
+    }
+    try {
+        toml::table const root = toml::parse_file(m_file.string());
+        for (auto const& [name, node] : root["adapter"].is_table() ? *root["adapter"].as_table() : toml::table()) {
+            toml::node_view<toml::node const> const entry(node);
+            auto const protocol = entry["protocol"].value_or<std::int64_t>(0);
+            m_adapters[std::string(name.str())] = {protocol >= 1 && protocol <= 9 ? static_cast<int>(protocol) : 0,
+                                                   entry["counts"].value_or(true)};
+        }
+        for (auto const& [vin, node] : root["vehicle"].is_table() ? *root["vehicle"].as_table() : toml::table()) {
+            for (auto const& [request, frames] : node.is_table() ? *node.as_table() : toml::table()) {
+                FrameSet const set = readFrameText(frames.value_or<std::string>(""));
+                if (!set.empty()) {
+                    m_vehicles[std::string(vin.str())][std::string(request.str())] = set;
+                }
+            }
+        }
+    } catch (toml::parse_error const&) {
+        m_adapters.clear();
+        m_vehicles.clear();
+    }
+}
+
+int LearntStore::protocol(std::string const& adapter) const
+{
+    std::lock_guard const lock(m_mutex);
+    auto const found = m_adapters.find(adapter);
+    return found != m_adapters.end() ? found->second.protocol : 0;
+}
+
+void LearntStore::setProtocol(std::string const& adapter, int protocol)
+{
+    std::lock_guard const lock(m_mutex);
+    m_adapters[adapter].protocol = protocol;
+}
+
+bool LearntStore::canCount(std::string const& adapter) const
+{
+    std::lock_guard const lock(m_mutex);
+    auto const found = m_adapters.find(adapter);
+    return found == m_adapters.end() || found->second.canCount;
+}
+
+void LearntStore::setCanCount(std::string const& adapter, bool can)
+{
+    std::lock_guard const lock(m_mutex);
+    m_adapters[adapter].canCount = can;
+}
+
+std::map<std::string, FrameSet> LearntStore::counts(std::string const& vin) const
+{
+    std::lock_guard const lock(m_mutex);
+    auto const found = m_vehicles.find(vin);
+    return found != m_vehicles.end() ? found->second : std::map<std::string, FrameSet>();
+}
+
+void LearntStore::setCounts(std::string const& vin, std::map<std::string, FrameSet> const& counts)
+{
+    std::lock_guard const lock(m_mutex);
+    m_vehicles[vin] = counts;
+}
+
+void LearntStore::save() const
+{
+    std::lock_guard const lock(m_mutex);
+    if (m_file.empty()) {
+        return;
+    }
+    toml::table adapters;
+    for (auto const& [name, adapter] : m_adapters) {
+        adapters.insert(name, toml::table{{"protocol", adapter.protocol}, {"counts", adapter.canCount}});
+    }
+    toml::table vehicles;
+    for (auto const& [vin, counts] : m_vehicles) {
+        toml::table requests;
+        for (auto const& [request, frames] : counts) {
+            requests.insert(request, frameText(frames));
+        }
+        vehicles.insert(vin, std::move(requests));
+    }
+    std::error_code ignored;
+    std::filesystem::create_directories(m_file.parent_path(), ignored);
+    std::filesystem::path const temporary = m_file.string() + ".new";
+    std::ofstream out(temporary);
+    out << toml::table{{"adapter", std::move(adapters)}, {"vehicle", std::move(vehicles)}} << "\n";
+    out.close();
+    if (out) {
+        std::filesystem::rename(temporary, m_file, ignored);
+    } else {
+        std::filesystem::remove(temporary, ignored);
+    }
+}
+
+void LearntStore::forget()
+{
+    std::lock_guard const lock(m_mutex);
+    m_adapters.clear();
+    m_vehicles.clear();
+    std::error_code ignored;
+    std::filesystem::remove(m_file, ignored);
+}
+
+std::filesystem::path LearntStore::besides(std::filesystem::path const& settings)
+{
+    return settings.parent_path() / "learnt.toml";
+}
+
+} // namespace velmora

@@ -1,0 +1,73 @@
+#include "libvelmora/channel/portwire.h"
+
+#include <utility>
+
+namespace velmora {
+
+namespace {
+
+// Beyond this nobody reads any more what an adapter says unasked.
+constexpr std::size_t mostUnread = 1U << 20U;
+
+} // namespace
+
+PortWire::PortWire(std::unique_ptr<IPort> port) : m_port(std::move(port))
+{
+    m_port->start(
+        [this](std::string_view bytes) {
+            std::lock_guard const lock(m_mutex);
+            m_incoming += bytes;
+            m_up = m_up && m_incoming.size() <= mostUnread;
+            m_wake.notify_one();
+        },
+        [this] {
+            std::lock_guard const lock(m_mutex);
+            m_lost = m_up;
+            m_up = false;
+            m_wake.notify_one();
+        });
+}
+
+PortWire::~PortWire()
+{
+    m_port->close();
+}
+
+void PortWire::write(std::string_view bytes)
+{
+    m_port->write(bytes);
+}
+
+std::string PortWire::read(WireTime until)
+{
+    std::unique_lock lock(m_mutex);
+    std::chrono::steady_clock::time_point const limit{until};
+    m_wake.wait_until(lock, limit, [this] { return !m_incoming.empty() || !m_up; });
+    return std::exchange(m_incoming, {});
+}
+
+WireTime PortWire::now() const
+{
+    return std::chrono::duration_cast<WireTime>(std::chrono::steady_clock::now().time_since_epoch());
+}
+
+bool PortWire::isUp() const
+{
+    std::lock_guard const lock(m_mutex);
+    return m_up;
+}
+
+void PortWire::giveUp()
+{
+    std::lock_guard const lock(m_mutex);
+    m_up = false;
+    m_wake.notify_one();
+}
+
+bool PortWire::lost() const
+{
+    std::lock_guard const lock(m_mutex);
+    return m_lost;
+}
+
+} // namespace velmora

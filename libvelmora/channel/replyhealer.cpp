@@ -1,0 +1,244 @@
+#include "libvelmora/channel/replyhealer.h"
+
+#include "libvelmora/channel/canmessagelist.h"
+
+#include <algorithm>
+#include <utility>
+
+namespace velmora {
+
+namespace {
+
+constexpr std::uint8_t refusalService = 0x7F;
+constexpr std::uint8_t responsePending = 0x78;
+
+enum class Answer : int
+{
+    Right,
+    Refusal,
+    Pending,
+    Foreign
+};
+
+// Behind the service of a reply stands which item it is of, for the services that have items.
+bool isOfRequest(std::vector<std::uint8_t> const& request, std::vector<std::uint8_t> const& payload)
+{
+    if (payload.empty() || payload[0] != request[0] + 0x40) {
+        return false;
+    }
+    bool const hasItem = request.size() > 1 && request[0] != 0x03 && request[0] != 0x07 && request[0] != 0x0A;
+    return !hasItem ||
+           (payload.size() > 1 && std::find(request.begin() + 1, request.end(), payload[1]) != request.end());
+}
+
+Answer judgeAnswer(std::vector<std::uint8_t> const& request, std::vector<std::uint8_t> const& payload)
+{
+    if (isOfRequest(request, payload)) {
+        return Answer::Right;
+    }
+    if (payload.size() > 1 && payload[0] == refusalService && payload[1] == request[0]) {
+        // On SAE J1850 the request's own bytes stand between the service and the code.
+        return payload.size() > 2 && payload.back() == responsePending ? Answer::Pending : Answer::Refusal;
+    }
+    return Answer::Foreign;
+}
+
+} // namespace
+
+std::string HealedReply::text() const
+{
+    std::string text;
+    for (std::string const& line : lines) {
+        text += line + "\r";
+    }
+    return text;
+}
+
+std::size_t HealedReply::frameCount() const
+{
+    std::size_t count = 0;
+    for (auto const& [module, moduleFrames] : frames) {
+        count += moduleFrames;
+    }
+    return count;
+}
+
+HealedReply ReplyHealer::heal(std::string_view raw, ReplyContext const& context)
+{
+    std::vector<ReplyLine> lines = splitReply(raw, m_counts);
+    bool const silent = lines.empty();
+    bool const echoed = context.echoOff && !lines.empty() && compactText(lines.front().text) == context.sent;
+    if (echoed) {
+        note(Habit::Echo);
+        lines.erase(lines.begin());
+    }
+    HealedReply reply = context.command.isRequest() ? healRequest(lines, context) : healText(lines);
+    reply.silent = silent;
+    reply.echoed = echoed;
+    reply.reset = std::any_of(lines.begin(), lines.end(), [](ReplyLine const& line) { return tellsReset(line.text); });
+    return reply;
+}
+
+HealedReply ReplyHealer::healText(std::vector<ReplyLine> const& lines) const
+{
+    HealedReply reply;
+    for (ReplyLine const& line : lines) {
+        ClassifiedLine const classified = classifyLine(line.text);
+        if (classified.kind == LineKind::Error && reply.error.empty()) {
+            reply.error = classified.text;
+        }
+        reply.refused = reply.refused || classified.kind == LineKind::Refused;
+        reply.lines.push_back(line.text);
+    }
+    return reply;
+}
+
+HealedReply ReplyHealer::healRequest(std::vector<ReplyLine> const& lines, ReplyContext const& context)
+{
+    HealedReply reply;
+    std::vector<Entry> entries;
+    for (ReplyLine const& line : lines) {
+        entries.push_back({line.text, classifyLine(line.text), line.stray, true});
+    }
+    for (Entry const& entry : entries) {
+        reply.notices = reply.notices || entry.line.hadNotice;
+        reply.refused = reply.refused || entry.line.kind == LineKind::Refused;
+        reply.irregular = reply.irregular || entry.line.kind == LineKind::Text;
+        if (entry.line.kind == LineKind::Error && reply.error.empty()) {
+            reply.error = entry.line.text;
+        }
+    }
+    if (context.bus != BusKind::Unknown) {
+        readFrames(entries, context, reply);
+    }
+    dropBehindData(entries, reply);
+    for (Entry const& entry : entries) {
+        if (entry.keep) {
+            reply.lines.push_back(entry.text());
+            reply.data = reply.data || entry.line.kind == LineKind::Data;
+        }
+    }
+    return reply;
+}
+
+// What came without a loss in a line with strays: no frame is longer than eight bytes, and a check byte tells.
+bool ReplyHealer::isTrusted(Entry const& entry, BusKind bus)
+{
+    constexpr int enoughToTell = 3;
+    if (isCanBus(bus)) {
+        std::size_t const whole = (bus == BusKind::Can11 ? 3U : 8U) + 16U;
+        return !entry.stray || entry.line.text.size() == whole;
+    }
+    bool const right = hasRightCheckByte(bus, entry.line.text);
+    bool const showsThem = m_rightCheckBytes >= enoughToTell;
+    if (!showsThem) {
+        m_rightCheckBytes = right ? m_rightCheckBytes + 1 : 0;
+    }
+    return right || (!entry.stray && !showsThem);
+}
+
+void ReplyHealer::readFrames(std::vector<Entry>& entries, ReplyContext const& context, HealedReply& reply)
+{
+    // Some adapters end each byte with a CR. Such lines are joined by who reads them.
+    constexpr std::size_t longestPiece = 3;
+    bool const inPieces = std::none_of(entries.begin(), entries.end(), [](Entry const& entry) {
+        return entry.line.kind == LineKind::Data && entry.line.text.size() > longestPiece;
+    });
+    if (inPieces) {
+        reply.irregular = true;
+        return;
+    }
+    ModuleMessages messages(context.bus, m_counts);
+    for (std::size_t place = 0; place < entries.size(); ++place) {
+        Entry& entry = entries[place];
+        bool const cut = place + 1 < entries.size() && entries[place + 1].line.kind == LineKind::Error &&
+                         entries[place + 1].line.text == "BUFFERFULL";
+        if (entry.line.kind == LineKind::Flagged) {
+            note(Habit::FlaggedLine);
+            entry.keep = false;
+        } else if (entry.line.kind == LineKind::Data) {
+            auto const frame = parseBusLine(context.bus, entry.line.text);
+            if (cut || !frame || !isTrusted(entry, context.bus)) {
+                note(Habit::BrokenLine);
+                entry.keep = false;
+            } else {
+                reply.spoke.insert(frame->module);
+                entry.keep = messages.add(*frame, entry.line.text, place);
+            }
+        }
+        reply.dropped = reply.dropped || !entry.keep;
+    }
+    judge(messages, entries, context.command, reply);
+}
+
+void ReplyHealer::judge(ModuleMessages& messages, std::vector<Entry>& entries, ElmCommand const& command,
+                        HealedReply& reply)
+{
+    std::vector<ModuleMessage>& all = messages.all();
+    auto const drop = [&entries, this](ModuleMessage const& message, Habit habit) {
+        note(habit);
+        for (std::size_t const place : message.places) {
+            entries[place].keep = false;
+        }
+    };
+    auto const owed = std::exchange(m_owed, {});
+    for (std::size_t i = 0; i < all.size(); ++i) {
+        ModuleMessage const& message = all[i];
+        auto const owing = owed.find(message.module);
+        // Its frames may be those of the message before: nothing but their numbers tells them apart.
+        bool const doubtful = message.segmented() && message.complete() && owing != owed.end() &&
+                              messages.orphans(message.module) < owing->second;
+        if (message.missingFrames() != 0) {
+            m_owed[message.module] = message.missingFrames();
+        }
+        Answer const answer = judgeAnswer(command.bytes(), message.payload);
+        auto const answeredBy = [&](ModuleMessage const& other) {
+            return other.module == message.module && other.complete() &&
+                   judgeAnswer(command.bytes(), other.payload) == Answer::Right;
+        };
+        auto const behind = all.begin() + static_cast<std::ptrdiff_t>(i) + 1;
+        for (std::size_t line = 0; line < message.lines.size(); ++line) {
+            entries[message.places[line]].line.text = message.lines[line];
+        }
+        if (message.broken || doubtful) {
+            drop(message, Habit::BrokenLine);
+            reply.dropped = true;
+            reply.doubtful = reply.doubtful || doubtful;
+        } else if (answer == Answer::Right && message.complete()) {
+            reply.answered = true;
+            reply.irregular = reply.irregular || !message.inOrder;
+            reply.frames[message.module] += static_cast<unsigned int>(message.lines.size());
+            reply.messages[message.module] = message.payload;
+        } else if (answer == Answer::Pending && std::any_of(behind, all.end(), answeredBy)) {
+            drop(message, Habit::PendingReply);
+            reply.irregular = true;
+        } else if (answer == Answer::Pending) {
+            reply.pending = true;
+        } else if (answer == Answer::Foreign && std::any_of(all.begin(), all.end(), answeredBy)) {
+            drop(message, Habit::ForeignReply);
+            reply.irregular = true;
+        } else {
+            reply.irregular = true; // a refusal, half a message, or somebody else's answer alone
+        }
+    }
+}
+
+void ReplyHealer::dropBehindData(std::vector<Entry>& entries, HealedReply& reply)
+{
+    bool const data = std::any_of(entries.begin(), entries.end(),
+                                  [](Entry const& entry) { return entry.keep && entry.line.kind == LineKind::Data; });
+    for (Entry& entry : entries) {
+        if (data && entry.line.hadNotice) {
+            note(Habit::Notice);
+        }
+        bool const trouble = entry.line.kind == LineKind::Error || entry.line.kind == LineKind::Refused;
+        if (data && (entry.line.kind == LineKind::Notice || entry.line.kind == LineKind::Text)) {
+            entry.keep = false;
+        } else if (reply.answered && trouble) {
+            note(Habit::TrailingError);
+            entry.keep = false;
+        }
+    }
+}
+
+} // namespace velmora

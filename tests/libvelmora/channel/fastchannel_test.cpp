@@ -1,0 +1,225 @@
+#include "libvelmora/channel/fastchannel.h"
+#include "tests/libvelmora/channel/channelrig.h"
+
+#include <obd/iconnectionlogger.h>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+namespace velmora {
+
+namespace {
+
+using test::ChannelRig;
+using testing::ElementsAre;
+using testing::HasSubstr;
+using testing::IsEmpty;
+using testing::Optional;
+using ScriptedReply = support::ScriptedWire::Reply;
+
+std::string const engineSpeed = "7E804410C1AF8";
+
+TEST(FastChannel, AReceiveThatCanBringNothingEndsAfterAShortGrace)
+{
+    ChannelRig rig;
+    EXPECT_THAT(rig.ask("ATE0"), Optional(std::string("OK")));
+    WireTime const before = rig.wire->now();
+    std::vector<unsigned char> bytes;
+    EXPECT_FALSE(rig.channel.receive(bytes, 200));
+    EXPECT_LE(rig.wire->now() - before, WireTime(5));
+    rig.wire->say("more\r>", WireTime(3)); // a second piece
+    EXPECT_TRUE(rig.channel.receive(bytes, 200));
+}
+
+TEST(FastChannel, WaitsForAReplyAsLongAsItIsTold)
+{
+    ChannelRig rig;
+    rig.wire->on("ATDP", ScriptedReply{{"AUTO\r\r>", WireTime(520)}});
+    EXPECT_THAT(rig.ask("ATDP", 1000), Optional(std::string("AUTO")));
+    EXPECT_EQ(rig.met(Habit::LostPrompt), 0U);
+}
+
+TEST(FastChannel, ALatePromptIsWaitedOutAndItsReplyIsNobodyElses)
+{
+    ChannelRig rig;
+    rig.connect();
+    rig.wire->on("010C", ScriptedReply{{engineSpeed + "\r\r>", WireTime(2600)}});
+    rig.wire->on("ATRV", "12.6V");
+    EXPECT_EQ(rig.ask("010C"), std::nullopt);
+    EXPECT_THAT(rig.ask("ATRV"), Optional(std::string("12.6V")));
+    EXPECT_EQ(rig.met(Habit::LatePrompt), 1U);
+    EXPECT_EQ(rig.met(Habit::LostPrompt), 0U);
+}
+
+TEST(FastChannel, ALinkThatEndsEndsTheWaitForALatePrompt)
+{
+    ChannelRig rig;
+    rig.connect();
+    rig.wire->on("010C", ScriptedReply{});
+    EXPECT_EQ(rig.ask("010C"), std::nullopt);
+    rig.channel.invalidate();
+    WireTime const before = rig.wire->now();
+    EXPECT_EQ(rig.ask("ATRV"), std::nullopt);
+    EXPECT_EQ(rig.wire->now(), before);
+    EXPECT_FALSE(rig.channel.isValid());
+}
+
+TEST(FastChannel, APromptThatNeverCameCostsNoReply)
+{
+    ChannelRig rig;
+    rig.connect();
+    rig.wire->on("010C", ScriptedReply{{engineSpeed + "\r\r"}});
+    EXPECT_THAT(rig.ask("010C"), Optional(engineSpeed));
+    EXPECT_EQ(rig.met(Habit::LostPrompt), 1U);
+    EXPECT_THAT(rig.wire->takeCommands(), ElementsAre("010C", "ATI"));
+}
+
+TEST(FastChannel, AnAdapterThatSwallowsACommandIsWokenByItsIdentityAndNeverByABareReturn)
+{
+    ChannelRig rig;
+    rig.wire->on("ATI", ScriptedReply{}).on("ATI", "ELM327 v1.5");
+    EXPECT_THAT(rig.ask("ATI"), Optional(std::string("ELM327 v1.5"))) << "the first of all";
+    rig.wire->on("ATL0", ScriptedReply{}).on("ATL0", "OK");
+    EXPECT_THAT(rig.ask("ATL0", 750), Optional(std::string("OK")));
+    rig.wire->on("04", ScriptedReply{});
+    EXPECT_EQ(rig.ask("04"), std::nullopt);
+    EXPECT_THAT(rig.ask("ATI"), Optional(std::string("ELM327 v1.5")));
+    EXPECT_THAT(rig.wire->takeCommands(), ElementsAre("ATI", "ATI", "ATL0", "ATI", "ATL0", "04", "ATI", "ATI"))
+        << "a command that clears is never sent again";
+}
+
+TEST(FastChannel, HabitsThatDefeatedTheBringUpDoNotAnyMore)
+{
+    ChannelRig busy;
+    busy.wire->on("ATI", "STOPPED").on("ATI", "ELM327 v1.5");
+    busy.wire->on("0100", "NO DATA").on("0100", "SEARCHING...\r4100BE3EA813");
+    EXPECT_THAT(busy.ask("ATI"), Optional(std::string("ELM327 v1.5")));
+    busy.ask("ATTP0");
+    EXPECT_THAT(busy.ask("0100"), Optional(HasSubstr("4100BE3EA813")));
+    EXPECT_EQ(busy.met(Habit::AskedAgain), 2U);
+
+    ChannelRig echoing;
+    echoing.wire->on("ATL0", "ATL0\rOK").on("010C", "010C\r" + engineSpeed);
+    echoing.connect();
+    EXPECT_THAT(echoing.ask("010C"), Optional(engineSpeed));
+    EXPECT_EQ(echoing.met(Habit::SettingsLost), 0U);
+
+    ChannelRig heldBack; // its prompt would come with the next command
+    heldBack.wire->on("ATI", "ELM327 v1.5").on("ATE0", ScriptedReply{{"ATE0\rOK\r"}});
+    heldBack.ask("ATI");
+    EXPECT_THAT(heldBack.ask("ATE0", 500), Optional(HasSubstr("OK")));
+}
+
+TEST(FastChannel, APromptWithoutAReplyIsNotTakenForOne)
+{
+    ChannelRig rig;
+    rig.wire->on("ATL0", ScriptedReply{{">"}, {"OK\r\r>", WireTime(20)}});
+    EXPECT_THAT(rig.ask("ATL0"), Optional(std::string("OK")));
+}
+
+TEST(FastChannel, AnAdapterThatResetItselfIsSetUpAgainOnce)
+{
+    for (char const* word : {"LV RESET", "ERR94", "ELM327 v1.5"}) {
+        ChannelRig rig;
+        rig.connect();
+        rig.wire->on("010C", word).on("010C", engineSpeed).on("010C", word);
+        EXPECT_THAT(rig.ask("010C", 5000), Optional(engineSpeed)) << word;
+        EXPECT_THAT(rig.wire->takeCommands(),
+                    ElementsAre("010C", "ATE0", "ATL0", "ATS0", "ATST64", "ATTP6", "ATH1", "010C"));
+        EXPECT_EQ(rig.ask("010C", 5000), std::nullopt);
+        EXPECT_FALSE(rig.channel.isValid()) << "twice in a minute is a lost link";
+        EXPECT_TRUE(rig.channel.adapterFails());
+    }
+}
+
+TEST(FastChannel, AResetWithoutAWordShowsInTheEcho)
+{
+    ChannelRig rig;
+    rig.connect();
+    rig.wire->on("010C", "010C\r41 0C 1A F8").on("010C", engineSpeed);
+    EXPECT_THAT(rig.ask("010C", 5000), Optional(engineSpeed));
+    EXPECT_EQ(rig.met(Habit::SettingsLost), 1U);
+}
+
+TEST(FastChannel, ARequestThatChangesTheVehicleIsNeverSentTwice)
+{
+    for (char const* reply : {"STOPPED", "ELM327 v1.5", "7E804440", "04\r44"}) {
+        ChannelRig rig;
+        rig.connect();
+        rig.wire->on("04", reply);
+        rig.ask("04");
+        rig.ask("ATRV");
+        auto const commands = rig.wire->takeCommands();
+        EXPECT_EQ(std::count(commands.begin(), commands.end(), "04"), 1) << reply;
+    }
+}
+
+TEST(FastChannel, TheFarewellIsAnsweredHereUnlessTheAdapterIsToSleep)
+{
+    ChannelRig rig;
+    rig.connect();
+    EXPECT_THAT(rig.ask("ATLP", 10), Optional(std::string("OK")));
+    EXPECT_THAT(rig.wire->takeCommands(), IsEmpty());
+    ChannelRig sleepy(nullptr, {.port = {}, .sleepAtEnd = true});
+    sleepy.connect();
+    sleepy.ask("ATLP", 10);
+    EXPECT_THAT(sleepy.wire->takeCommands(), ElementsAre("ATLP"));
+}
+
+TEST(FastChannel, LoggersSeeWhatReallyPassed)
+{
+    struct Tap : obd::IConnectionLogger
+    {
+        void onDataSent(std::vector<unsigned char> const& data) override { sent.append(data.begin(), data.end()); }
+        void onDataReceived(std::vector<unsigned char> const& data) override
+        {
+            received.append(data.begin(), data.end());
+        }
+        std::string sent;
+        std::string received;
+    };
+    ChannelRig rig;
+    rig.connect();
+    Tap tap;
+    rig.channel.addLogger(&tap);
+    rig.wire->on("010C", "SEARCHING...\r7E804410C1AF8CCCCCC");
+    EXPECT_THAT(rig.ask("010C"), Optional(engineSpeed));
+    EXPECT_EQ(tap.sent, "010C\r");
+    EXPECT_EQ(tap.received, "SEARCHING...\r7E804410C1AF8CCCCCC\r\r");
+    rig.channel.removeLogger(&tap);
+    rig.ask("010C");
+    EXPECT_EQ(tap.sent, "010C\r");
+}
+
+TEST(FastChannel, AModuleIsAddressedInsideTheExchangeOnly)
+{
+    ChannelRig rig;
+    rig.connect();
+    rig.wire->on("010C", engineSpeed).on("010D", ScriptedReply{});
+    {
+        AddressedModule const engine(rig.channel, 0x7E8);
+        rig.ask("010C");
+        EXPECT_THAT(rig.wire->takeCommands(), ElementsAre("ATSH7E0", "010C", "ATSH7DF"));
+        rig.ask("010D");
+    }
+    rig.ask("010C");
+    EXPECT_THAT(rig.wire->takeCommands(), ElementsAre("ATSH7E0", "010D", "ATI", "ATSH7DF", "010C"))
+        << "after a lost reply, too";
+    rig.wire->on("ATSH7DF", "?");
+    {
+        AddressedModule const engine(rig.channel, 0x7E8);
+        rig.ask("010C");
+    }
+    EXPECT_FALSE(rig.channel.isValid()) << "an address that stays would hide the other modules";
+}
+
+TEST(FastChannel, EachHabitHasAName)
+{
+    for (std::size_t i = 0; i < habitCount; ++i) {
+        EXPECT_FALSE(habitName(static_cast<Habit>(i)).empty());
+    }
+}
+
+} // namespace
+
+} // namespace velmora

@@ -1,0 +1,224 @@
+// An adapter that lies: it cuts replies at another count than it was told, brings a reply with the next request,
+// forgets every fiftieth prompt and loses characters. No value may ever stand under the wrong sensor.
+
+#include "libvelmora/channel/fastchannel.h"
+#include "tests/libvelmora/channel/channelrig.h"
+
+#include <obd/obdprotocol.h>
+
+#include <gtest/gtest.h>
+
+#include <map>
+#include <random>
+
+namespace velmora {
+
+namespace {
+
+// Which sensor a value is of shows in the value: each byte of it is the PID and the module, mixed.
+std::uint8_t markOf(unsigned int module, unsigned int pid)
+{
+    return static_cast<std::uint8_t>((pid * 7 + (module & 0x0FU) * 31) & 0xFFU);
+}
+
+constexpr unsigned int askedPids[] = {0x0B, 0x0C, 0x0D, 0x05, 0x11, 0x4F, 0x64, 0x7F};
+
+std::size_t dataBytes(unsigned int pid)
+{
+    return pid == 0x0C ? 2U : pid == 0x4F ? 4U : pid == 0x64 ? 9U : pid == 0x7F ? 13U : 1U; // two take more frames
+}
+
+class LyingWire : public IWire
+{
+public:
+    explicit LyingWire(unsigned int seed) : m_random(seed) {}
+
+    void write(std::string_view bytes) override
+    {
+        for (char const character : bytes) {
+            if (character == '\r') {
+                answer(std::exchange(m_line, {}));
+            } else {
+                m_line += character;
+            }
+        }
+    }
+    std::string read(WireTime until) override
+    {
+        auto const next = m_output.begin();
+        if (next == m_output.end() || next->first > until) {
+            m_now = std::max(m_now, until);
+            return {};
+        }
+        m_now = std::max(m_now, next->first);
+        std::string bytes = next->second;
+        m_output.erase(next);
+        return bytes;
+    }
+    WireTime now() const override { return m_now; }
+    bool isUp() const override { return true; }
+    void giveUp() override {}
+
+    int faults = 0;
+
+private:
+    bool happens(unsigned int oneIn)
+    {
+        bool const does = m_random() % oneIn == 0;
+        faults += does ? 1 : 0;
+        return does;
+    }
+
+    static std::vector<std::string> framesOf(unsigned int module, unsigned int pid)
+    {
+        std::vector<std::uint8_t> payload{0x41, static_cast<std::uint8_t>(pid)};
+        payload.insert(payload.end(), dataBytes(pid), markOf(module, pid));
+        std::string const id = module == 0x7E8 ? "7E8" : "7E9";
+        if (payload.size() <= 7) {
+            return {id + frameDigits({static_cast<std::uint8_t>(payload.size())}) + frameDigits(payload)};
+        }
+        std::vector<std::string> frames{id + "10" + frameDigits({static_cast<std::uint8_t>(payload.size())}) +
+                                        frameDigits({payload.begin(), payload.begin() + 6})};
+        payload.resize(6 + (payload.size() - 6 + 6) / 7 * 7, 0xAA); // filled up
+        for (std::size_t at = 6; at < payload.size(); at += 7) {
+            auto const begin = payload.begin() + static_cast<std::ptrdiff_t>(at);
+            frames.push_back(id + "2" + std::to_string(frames.size()) + frameDigits({begin, begin + 7}));
+        }
+        return frames;
+    }
+
+    void answer(std::string const& command)
+    {
+        if (command.starts_with("AT")) {
+            std::string const text = command == "ATI" ? "ELM327 v1.5" : command == "ATDPN" ? "A6" : "OK";
+            m_output.emplace(m_now + WireTime(4), text + "\r\r>");
+            return;
+        }
+        std::size_t const told = command.size() % 2 != 0 ? static_cast<std::size_t>(command.back() - '0') : 0;
+        unsigned int const pid = static_cast<unsigned int>(std::stoul(command.substr(2, 2), nullptr, 16));
+        std::vector<std::string> lines;
+        for (unsigned int const module : {0x7E8U, 0x7E9U}) {
+            for (std::string const& frame : framesOf(module, pid)) {
+                lines.push_back(frame);
+            }
+        }
+        std::vector<std::string> late = std::exchange(m_held, {});
+        if (told != 0 && happens(20)) {
+            lines.resize(
+                std::min<std::size_t>(lines.size(), m_random() % 4)); // a count of its own; the rest comes late
+        } else if (told != 0) {
+            lines.resize(std::min(lines.size(), told));
+        }
+        if (happens(25)) {
+            m_held.assign(lines.begin() + static_cast<std::ptrdiff_t>(m_random() % (lines.size() + 1)), lines.end());
+            lines.resize(lines.size() - m_held.size());
+        }
+        lines.insert(happens(3) ? lines.end() : lines.begin(), late.begin(), late.end());
+        say(lines, told);
+    }
+
+    void say(std::vector<std::string>& lines, std::size_t told)
+    {
+        std::string text;
+        for (std::string& line : lines) {
+            if (happens(60)) {
+                line.erase(m_random() % line.size(), 1); // a character is lost on the way
+            }
+            text += line + "\r";
+        }
+        text += lines.empty() ? "NO DATA\r" : "";
+        if (happens(100)) {
+            m_held.push_back(text + "\r>"); // all of it, its prompt too, with the next request
+            std::string const all = std::exchange(m_held.back(), {});
+            m_held.clear();
+            m_output.emplace(m_now + WireTime(1700 + m_random() % 2000), all);
+            return;
+        }
+        m_output.emplace(m_now + WireTime(15), text);
+        if (!happens(50)) {
+            m_output.emplace(m_now + WireTime(told != 0 ? 16 : 80), "\r>");
+        }
+    }
+
+    std::mt19937 m_random;
+    std::multimap<WireTime, std::string> m_output;
+    std::vector<std::string> m_held;
+    std::string m_line;
+    WireTime m_now{1000};
+};
+
+// Reads the frames of one module as a strict reader does; its values only, each under the PID that its message names.
+std::map<unsigned int, std::vector<std::uint8_t>> valuesOf(std::string const& text, unsigned int asked)
+{
+    std::map<unsigned int, std::vector<std::uint8_t>> values;
+    std::map<unsigned int, std::vector<std::uint8_t>> open;
+    std::size_t at = 0;
+    auto const byte = [&text](std::size_t i) {
+        return static_cast<std::uint8_t>(std::stoul(text.substr(i, 2), nullptr, 16));
+    };
+    while (at + 5 <= text.size()) {
+        unsigned int const module = static_cast<unsigned int>(std::stoul(text.substr(at, 3), nullptr, 16));
+        std::size_t const type = byte(at + 3) >> 4U;
+        std::size_t const count = type == 0 ? byte(at + 3) : type == 1 ? 7U : 7U;
+        std::vector<std::uint8_t> data;
+        for (std::size_t i = 0; i < count && at + 5 + 2 * i + 2 <= text.size(); ++i) {
+            data.push_back(byte(at + 5 + 2 * i));
+        }
+        at += 5 + 2 * count;
+        if (type == 0) {
+            values[module] = data;
+        } else if (type == 1) {
+            values.erase(module);
+            open[module].assign(data.begin() + 1, data.end());
+        } else {
+            open[module].insert(open[module].end(), data.begin(), data.end());
+            values[module] = open[module];
+        }
+    }
+    std::erase_if(values, [asked](auto const& entry) {
+        return entry.second.size() < 2 + dataBytes(asked) || entry.second[0] != 0x41 || entry.second[1] != asked;
+    });
+    return values;
+}
+
+TEST(LyingAdapter, NoValueEverStandsUnderTheWrongSensorInAHundredThousandFaults)
+{
+    constexpr int faultsInAll = 100000;
+    constexpr int faultsEach = 2500; // then a new adapter, since this one's counting is off by then
+    int faults = 0;
+    long answered = 0;
+    long values = 0;
+    unsigned int counted = 0;
+    for (unsigned int seed = 1; faults < faultsInAll; ++seed) {
+        auto const wire = std::make_shared<LyingWire>(seed);
+        FastChannel channel(wire, {});
+        for (char const* command : {"ATI", "ATE0", "ATST64", "ATTP0", "ATDPN", "ATH1"}) {
+            test::speak(channel, command, 700);
+        }
+        channel.onConnected();
+        std::mt19937 random(seed);
+        while (wire->faults < faultsEach) {
+            unsigned int const pid = askedPids[random() % std::size(askedPids)];
+            auto const reply = test::speak(channel, "01" + frameDigits({static_cast<std::uint8_t>(pid)}), 1500);
+            answered += reply ? 1 : 0;
+            if (!reply || reply->find_first_not_of("0123456789ABCDEF") != std::string::npos) {
+                continue;
+            }
+            for (auto const& [module, data] : valuesOf(*reply, pid)) {
+                ++values;
+                for (std::size_t i = 2; i < 2 + dataBytes(pid); ++i) {
+                    ASSERT_EQ(data[i], markOf(module, pid)) << "seed " << seed << ": " << *reply;
+                }
+            }
+        }
+        faults += wire->faults;
+        counted += channel.statistics().counted;
+    }
+    EXPECT_GT(answered, 100000);
+    EXPECT_GT(values, answered) << "two modules answer most of the time";
+    EXPECT_GT(counted, 100U) << "the counting was on trial, too";
+}
+
+} // namespace
+
+} // namespace velmora
