@@ -1,6 +1,6 @@
 #include "libvelmora/channel/fastchannel.h"
 
-#include <obd/iconnectionlogger.h>
+#include <obd/idataconnection.h>
 
 #include <algorithm>
 #include <utility>

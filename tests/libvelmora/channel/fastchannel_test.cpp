@@ -1,7 +1,7 @@
 #include "libvelmora/channel/fastchannel.h"
 #include "tests/libvelmora/channel/channelrig.h"
 
-#include <obd/iconnectionlogger.h>
+#include <obd/idataconnection.h>
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
