@@ -1,6 +1,7 @@
 #include "libvelmora/session/session.h"
 
 #include "libvelmora/port/openport.h"
+#include "libvelmora/port/portsearch.h"
 #include "libvelmora/port/recordedport.h"
 #include "libvelmora/record/traffictrace.h"
 #include "libvelmora/session/settingsstore.h"
@@ -28,6 +29,12 @@ namespace {
 std::string portKey()
 {
     return "velmora/port";
+}
+
+// Where an adapter was found last, by looking for it.
+std::string foundPortKey()
+{
+    return "velmora/foundport";
 }
 
 [[noreturn]] void failInterrupted()
@@ -86,16 +93,52 @@ void Session::select(obd::IEcu const& ecu) const
     m_obd->getEcuManager()->setCurrentEcu(ecu.id());
 }
 
-PortAddress Session::portAddress() const
+std::filesystem::path const& Session::settingsFile() const
 {
-    std::string text = m_options.port;
-    if (text.empty() && !m_settings->getString(portKey(), text)) {
-        throw Error(
-            ErrorKind::WrongUse, "No port is named",
-            {"name it with --port, in VELMORA_PORT, or as port under [velmora] in " + m_settings->file().string(),
-             "`velmora ports` lists serial ports; sim:petrol-can11 is a simulated car"});
+    return m_settings->file();
+}
+
+PortAddress Session::findPort()
+{
+    if (!m_address) {
+        std::string text = m_options.port;
+        bool const named = !text.empty() || m_settings->getString(portKey(), text);
+        m_address =
+            named && text != "auto" ? parsePortAddress(text, m_options.baud.value_or(defaultBaud)) : searchPort();
     }
-    return parsePortAddress(text, m_options.baud.value_or(defaultBaud));
+    return *m_address;
+}
+
+// The winner is remembered apart from a port that the user names.
+PortAddress Session::searchPort()
+{
+    PortSearch search;
+    search.ports = listSerialPorts();
+    search.baud = m_options.baud;
+    search.tell = [this](std::string const& line) { tellProgress(line); };
+    search.stop = [this] { return m_interrupted.load(); };
+    if (std::string last; m_settings->getString(foundPortKey(), last)) {
+        PortAddress const address = parsePortAddress(last);
+        if (auto const* const serial = std::get_if<SerialAddress>(&address)) {
+            search.last = *serial;
+        }
+    }
+    SerialAddress const found = findAdapter(search);
+    if (found != search.last) {
+        rememberPort(found);
+    }
+    return found;
+}
+
+// A help for the next time, which must not stand in the way of this one.
+void Session::rememberPort(SerialAddress const& address)
+{
+    try {
+        m_settings->setString(foundPortKey(), toAddressText(address));
+        m_settings->sync();
+    } catch (Error const& error) {
+        tellProgress(std::string("The port is not remembered: ") + error.what() + "\n");
+    }
 }
 
 obd::VehicleProtocol Session::protocol() const
@@ -105,7 +148,7 @@ obd::VehicleProtocol Session::protocol() const
 
 void Session::connect()
 {
-    PortAddress const address = portAddress();
+    PortAddress const address = findPort();
     openLink(address);
     tellProgress(fmt::format("Connecting to {} ...\n", toString(address)));
     if (!openOnThread()) {

@@ -13,6 +13,7 @@
 #include <obd/iobdvelmora.h>
 
 #include <atomic>
+#include <filesystem>
 #include <memory>
 #include <mutex>
 #include <optional>
@@ -39,9 +40,16 @@ public:
     // Takes down all that passes the port from connect on. The recorder must outlive the session.
     void record(DialogueRecorder& recorder) { m_recorder = &recorder; }
 
+    // The port that connect is going to open; an adapter is looked for where none is named or remembered. Throws Error
+    // if none is found.
+    PortAddress findPort();
+
     // Opens the port and brings up adapter and vehicle, and selects the control module that the options name. Throws
     // Error that tells how far it came.
     void connect();
+
+    // Closes what is open, to connect again. Services must be gone.
+    void disconnect() { close(); }
 
     obd::IObdVelmora& obd() const { return *m_obd; }
     // The control modules that the options select: one, or all.
@@ -51,7 +59,8 @@ public:
     std::shared_ptr<obd::IObdProxy> proxy() const;
     std::shared_ptr<obd::IAdapter> adapter() const;
     // The port's address, for messages and reports.
-    std::string port() const { return toString(portAddress()); }
+    std::string port() const { return m_address ? toString(*m_address) : std::string(); }
+    std::filesystem::path const& settingsFile() const;
     // What the channel to the adapter is told, and tells. After connect only.
     IChannelControl& channel() const { return m_link->control(); }
     DispatchLoop& loop() { return m_loop; }
@@ -74,7 +83,8 @@ private:
         Open,
     };
 
-    PortAddress portAddress() const;
+    PortAddress searchPort();
+    void rememberPort(SerialAddress const& address);
     void openLink(PortAddress const& address);
     void enter(Phase phase);
     obd::VehicleProtocol protocol() const;
@@ -92,6 +102,7 @@ private:
     LibraryUse const m_library;
     DispatchLoop m_loop;
     std::shared_ptr<obd::IObdVelmora> m_obd;
+    std::optional<PortAddress> m_address; // once it is known
     std::unique_ptr<Link> m_link;
     std::atomic<bool> m_interrupted{false};
     std::mutex m_phaseMutex;

@@ -1,0 +1,221 @@
+#include "libvelmora/port/portsearch.h"
+#include "simulator/server.h"
+#include "simulator/simulation.h"
+
+#include <velmora/error.h>
+
+#include <fmt/format.h>
+#include <gtest/gtest.h>
+
+#include <atomic>
+#include <cstdlib>
+#include <fcntl.h>
+#include <filesystem>
+#include <fstream>
+#include <mutex>
+#include <poll.h>
+#include <termios.h>
+#include <thread>
+#include <unistd.h>
+
+namespace {
+
+namespace fs = std::filesystem;
+using velmora::PortSearch;
+using velmora::SerialAddress;
+using velmora::SerialProbe;
+using Outcome = SerialProbe::Outcome;
+
+// A device of the test's own at the end of a pseudo-terminal: answers a line at one rate with a fixed text.
+class ScriptedDevice
+{
+public:
+    ScriptedDevice(std::string answer, speed_t speed) : m_answer(std::move(answer)), m_speed(speed)
+    {
+        m_master = ::posix_openpt(O_RDWR | O_NOCTTY | O_CLOEXEC);
+        ::grantpt(m_master);
+        ::unlockpt(m_master);
+        m_path = ::ptsname(m_master);
+        m_slave = ::open(m_path.c_str(), O_RDWR | O_NOCTTY | O_CLOEXEC);
+        m_thread = std::thread([this] { serve(); });
+    }
+    ~ScriptedDevice()
+    {
+        m_stop = true;
+        m_thread.join();
+        ::close(m_slave);
+        ::close(m_master);
+    }
+    ScriptedDevice(ScriptedDevice const&) = delete;
+    ScriptedDevice& operator=(ScriptedDevice const&) = delete;
+
+    std::string const& path() const { return m_path; }
+    std::string received() const
+    {
+        std::lock_guard const lock(m_mutex);
+        return m_received;
+    }
+    termios settings() const
+    {
+        termios settings{};
+        ::tcgetattr(m_slave, &settings);
+        return settings;
+    }
+
+private:
+    void serve()
+    {
+        while (!m_stop) {
+            pollfd state{m_master, POLLIN, 0};
+            char bytes[64];
+            if (::poll(&state, 1, 10) <= 0) {
+                continue;
+            }
+            ssize_t const count = ::read(m_master, bytes, sizeof(bytes));
+            std::lock_guard const lock(m_mutex);
+            m_received.append(bytes, count > 0 ? static_cast<std::size_t>(count) : 0);
+            termios const now = settings();
+            if (m_received.ends_with('\r') && ::cfgetospeed(&now) == m_speed) {
+                [[maybe_unused]] ssize_t const written = ::write(m_master, m_answer.data(), m_answer.size());
+            }
+        }
+    }
+
+    std::string m_answer;
+    speed_t m_speed;
+    std::string m_path;
+    int m_master = -1;
+    int m_slave = -1;
+    std::atomic<bool> m_stop{false};
+    mutable std::mutex m_mutex;
+    std::string m_received; // protected by m_mutex
+    std::thread m_thread;
+};
+
+TEST(SerialProbe, FindsTheSimulatedAdapter)
+{
+    auto const server = obdsim::servePseudoTerminal(obdsim::simulate({}));
+    server->start();
+    SerialProbe const probe = velmora::probeSerialPort(server->address(), velmora::usualRates());
+    EXPECT_EQ(probe.outcome, Outcome::Adapter);
+    EXPECT_EQ(probe.baud, 38400U);
+    EXPECT_EQ(probe.text, "ELM327 v1.5");
+}
+
+TEST(SerialProbe, FindsTheRate)
+{
+    ScriptedDevice const device("ELM327 v2.1\r\r>", B115200);
+    EXPECT_EQ(velmora::probeSerialPort(device.path(), {38400, 115200, 9600}).baud, 115200U);
+    EXPECT_EQ(device.received(), "ATI\rATI\r");
+}
+
+TEST(SerialProbe, AModemSurvivesAndItsLineIsLeftAsItWas)
+{
+    ScriptedDevice const modem("56000\r\nOK\r\n", B9600);
+    termios const before = modem.settings();
+    SerialProbe const probe = velmora::probeSerialPort(modem.path(), {38400, 9600});
+    EXPECT_EQ(probe.outcome, Outcome::OtherThing);
+    EXPECT_EQ(probe.text, "56000 OK");
+    EXPECT_EQ(modem.received(), "ATI\rATI\r") << "harmless, and never a carriage return alone";
+    termios const after = modem.settings();
+    EXPECT_EQ(before.c_cflag, after.c_cflag);
+    EXPECT_EQ(before.c_lflag, after.c_lflag);
+    EXPECT_EQ(before.c_iflag, after.c_iflag);
+    EXPECT_EQ(before.c_oflag, after.c_oflag);
+    EXPECT_EQ(::cfgetospeed(&before), ::cfgetospeed(&after));
+}
+
+std::string plainFile()
+{
+    std::string const file = testing::TempDir() + "velmora-no-port";
+    std::ofstream(file) << "text\n";
+    return file;
+}
+
+TEST(SerialProbe, WhatIsNoPortIsTold)
+{
+    EXPECT_EQ(velmora::probeSerialPort("/dev/velmora-none", {38400}).outcome, Outcome::Missing);
+    EXPECT_EQ(velmora::probeSerialPort(plainFile(), {38400}).outcome, Outcome::NoPort);
+}
+
+// A folder that stands for /run/lock, /proc and a device.
+class PortHolderTest : public testing::Test
+{
+protected:
+    PortHolderTest()
+    {
+        fs::remove_all(m_root);
+        fs::create_directories(m_root / "locks");
+        fs::create_directories(m_root / "proc/4711/fd");
+        std::ofstream(m_root / "proc/4711/comm") << "minicom\n";
+        std::ofstream(m_root / "ttyUSB0");
+    }
+    ~PortHolderTest() override { fs::remove_all(m_root); }
+
+    std::optional<std::string> holder() const
+    {
+        return velmora::findPortHolder(m_root / "ttyUSB0", {{m_root / "locks"}, m_root / "proc"});
+    }
+
+    fs::path m_root = fs::canonical(fs::temp_directory_path()) / fmt::format("velmora-holder-{}", ::getpid());
+};
+
+TEST_F(PortHolderTest, IsFoundByItsOpenFile)
+{
+    EXPECT_EQ(holder(), std::nullopt);
+    fs::create_symlink(m_root / "ttyUSB0", m_root / "proc/4711/fd/3");
+    EXPECT_EQ(holder(), "minicom (process 4711)");
+    EXPECT_EQ(
+        velmora::probeSerialPort(m_root / "ttyUSB0", {38400}, {}, {}, {{m_root / "locks"}, m_root / "proc"}).outcome,
+        Outcome::Held);
+}
+
+TEST_F(PortHolderTest, IsFoundByItsLockUnlessItHasGone)
+{
+    std::ofstream(m_root / "locks/LCK..ttyUSB0") << "      4711\n";
+    EXPECT_EQ(holder(), "minicom (process 4711)");
+    std::ofstream(m_root / "locks/LCK..ttyUSB0") << "      4712\n";
+    EXPECT_EQ(holder(), std::nullopt);
+    std::ofstream(m_root / "locks/LCK..ttyUSB0") << "rubbish\n";
+    EXPECT_EQ(holder(), std::nullopt);
+}
+
+TEST(PortSearch, TriesTheLastGoodOneFirstAndPassesOthersBy)
+{
+    ScriptedDevice const modem("OK\r\n", B38400);
+    auto const server = obdsim::servePseudoTerminal(obdsim::simulate({}));
+    server->start();
+    std::string told;
+    PortSearch search;
+    search.ports = {{"/dev/velmora-none", ""}, {modem.path(), ""}, {server->address(), ""}};
+    search.baud = 38400;
+    search.tell = [&](std::string const& line) { told += line; };
+    EXPECT_EQ(velmora::findAdapter(search), (SerialAddress{server->address(), 38400}));
+    EXPECT_EQ(told, fmt::format("Trying {} at 38400 baud ...\nTrying {} at 38400 baud ...\n", modem.path(),
+                                server->address()));
+    told.clear();
+    search.last = SerialAddress{server->address(), 38400};
+    velmora::findAdapter(search);
+    EXPECT_EQ(told, fmt::format("Trying {} at 38400 baud ...\n", server->address()));
+}
+
+TEST(PortSearch, TellsOfEachPortWhatWasFound)
+{
+    ScriptedDevice const modem("OK\r\n", B38400);
+    PortSearch search;
+    search.ports = {{plainFile(), ""}, {modem.path(), ""}};
+    search.baud = 38400;
+    try {
+        velmora::findAdapter(search);
+        FAIL();
+    } catch (velmora::Error const& error) {
+        EXPECT_EQ(error.kind(), velmora::ErrorKind::PortFailed);
+        EXPECT_EQ(error.hints()[0], plainFile() + " is no serial port");
+        EXPECT_EQ(error.hints()[1], modem.path() + " answers, but not as an adapter does (\"OK\")");
+    }
+    EXPECT_THROW(velmora::findAdapter({}), velmora::Error);
+    search.stop = [] { return true; };
+    EXPECT_THROW(velmora::findAdapter(search), velmora::Error);
+}
+
+} // namespace
