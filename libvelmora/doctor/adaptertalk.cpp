@@ -1,0 +1,80 @@
+#include "libvelmora/doctor/adaptertalk.h"
+
+#include <utility>
+
+namespace velmora {
+
+namespace {
+
+constexpr std::size_t longestReply = 65536;
+
+} // namespace
+
+AdapterTalk::AdapterTalk(std::unique_ptr<IPort> port) : m_port(std::move(port))
+{
+    m_port->start([this](std::string_view bytes) { onBytes(bytes); },
+                  [this] {
+                      std::lock_guard const lock(m_mutex);
+                      m_lost = true;
+                      m_changed.notify_all();
+                  });
+}
+
+AdapterTalk::~AdapterTalk()
+{
+    m_port->close();
+}
+
+void AdapterTalk::onBytes(std::string_view bytes)
+{
+    std::lock_guard const lock(m_mutex);
+    if (m_received.size() < longestReply) {
+        m_received += bytes;
+    }
+    m_changed.notify_all();
+}
+
+bool AdapterTalk::lost() const
+{
+    std::lock_guard const lock(m_mutex);
+    return m_lost;
+}
+
+std::optional<std::string> AdapterTalk::ask(std::string const& command, std::chrono::milliseconds limit)
+{
+    {
+        std::lock_guard const lock(m_mutex);
+        m_received.clear();
+    }
+    m_port->write(command + "\r");
+    std::unique_lock lock(m_mutex);
+    m_changed.wait_for(lock, limit, [this] { return m_lost || m_received.find('>') != std::string::npos; });
+    std::size_t const prompt = m_received.find('>');
+    if (prompt == std::string::npos) {
+        return std::nullopt;
+    }
+    return cleaned(m_received.substr(0, prompt), command);
+}
+
+std::string AdapterTalk::cleaned(std::string reply, std::string const& command)
+{
+    m_echoed = reply.starts_with(command + "\r");
+    if (m_echoed) {
+        reply.erase(0, command.size());
+    }
+    std::string text;
+    for (char const each : reply) {
+        bool const printable = each > ' ' && each <= '~';
+        if (printable) {
+            text += each;
+        } else if (!text.empty() && text.back() != ' ') {
+            text += ' ';
+        }
+    }
+    while (text.ends_with(' ')) {
+        text.pop_back();
+    }
+    return text;
+}
+
+} // namespace velmora

@@ -1,0 +1,105 @@
+#include "libvelmora/doctor/doctor.h"
+
+#include "libvelmora/doctor/adaptercheck.h"
+#include "libvelmora/doctor/portcheck.h"
+#include "libvelmora/doctor/vehiclecheck.h"
+#include "libvelmora/port/openport.h"
+#include "libvelmora/port/recordedport.h"
+#include "libvelmora/record/vinmask.h"
+
+#include <velmora/error.h>
+#include <velmora/version.h>
+
+#include <fmt/format.h>
+
+#include <fstream>
+#include <sys/utsname.h>
+
+namespace velmora {
+
+namespace {
+
+using Verdict = DoctorCheck::Verdict;
+
+std::unique_ptr<AdapterTalk> openTalk(PortAddress const& address, DialogueRecorder& recorder)
+{
+    return std::make_unique<AdapterTalk>(std::make_unique<RecordedPort>(openPort(address), recorder));
+}
+
+bool examineAdapter(PortAddress const& address, DialogueRecorder& recorder, DoctorReport& report)
+{
+    try {
+        return checkAdapter(*openTalk(address, recorder), report);
+    } catch (Error const& error) {
+        report.checks.push_back(
+            {"port", Verdict::Bad, error.what(), error.hints().empty() ? std::string() : error.hints().front()});
+        return false;
+    }
+}
+
+// What can't be read by name may hold a secret, so only harmless lines are kept.
+std::string harmlessSettings(std::filesystem::path const& file)
+{
+    std::ifstream in(file);
+    std::string text;
+    for (std::string line; std::getline(in, line);) {
+        bool secret = false;
+        for (char const* word : {"pass", "secret", "token", "key", "user", "host", "url", "://", "mac"}) {
+            secret = secret || line.find(word) != std::string::npos;
+        }
+        text += secret ? "(left out)\n" : line + "\n";
+    }
+    return text.empty() ? "(none)\n" : text;
+}
+
+std::string systemText()
+{
+    utsname system = {};
+    ::uname(&system);
+    return fmt::format("{} {} {}", system.sysname, system.release, system.machine);
+}
+
+} // namespace
+
+DoctorReport examine(Session& session, DialogueRecorder& recorder)
+{
+    DoctorReport report;
+    PortAddress const address = session.findPort();
+    report.checks = checkPort(address);
+    if (!report.isHealthy() || !examineAdapter(address, recorder, report)) {
+        return report;
+    }
+    session.check();
+    session.record(recorder);
+    try {
+        session.connect();
+    } catch (Error const& error) {
+        if (error.kind() == ErrorKind::Interrupted) {
+            throw;
+        }
+        report.checks.push_back(
+            {"bus", Verdict::Bad, error.what(), error.hints().empty() ? std::string() : error.hints().front()});
+        session.disconnect();
+        if (error.kind() == ErrorKind::VehicleSilent) {
+            checkBuses(*openTalk(address, recorder), report);
+        }
+        return report;
+    }
+    checkVehicle(session, report);
+    return report;
+}
+
+std::string makeBundle(DoctorReport const& report, Session const& session, DialogueRecorder const& recorder,
+                       bool keepVin)
+{
+    obdsim::Dialogue dialogue = recorder.dialogue();
+    dialogue.vehicle = "not told";
+    dialogue.adapter = session.adapter() != nullptr ? session.adapter()->device() : "not told";
+    if (!keepVin) {
+        maskVins(dialogue);
+    }
+    return fmt::format("Velmora {} on {}\n\n{}\nSettings\n\n{}\nDialogue\n\n{}", versionText, systemText(),
+                       toText(report), harmlessSettings(session.settingsFile()), obdsim::formatDialogue(dialogue));
+}
+
+} // namespace velmora
