@@ -96,7 +96,7 @@ void CommandLine::addGlobalOptions()
     m_app
         .add_option("-p,--port", m_options.port,
                     "Where the adapter is: /dev/ttyUSB0, serial:///dev/ttyUSB0?baud=38400,\n"
-                    "HOST:PORT, tcp://HOST:PORT, sim:VEHICLE, replay:FILE")
+                    "HOST:PORT, tcp://HOST:PORT, sim:VEHICLE, replay:FILE, auto (looks for one)")
         ->type_name("PORT")
         ->envname("VELMORA_PORT");
     m_app.add_option("-b,--baud", m_options.baud, "Line rate of a serial port (38400)")
@@ -108,8 +108,19 @@ void CommandLine::addGlobalOptions()
     addParsed(m_app, "-u,--units", m_options.units, parseUnits, "metric or imperial",
               "Unit system for this run: metric or imperial")
         ->type_name("SYSTEM");
-    addParsed(m_app, "--ecu", m_options.ecu, parseEcuId, "a control module id in hexadecimal, such as 7E8",
-              "Control module, hexadecimal (the first)")
+    m_app
+        .add_option_function<std::string>(
+            "--ecu",
+            [this](std::string const& text) {
+                m_options.allEcus = text == "all";
+                m_options.ecu = parseEcuId(text);
+                if (!m_options.ecu && !m_options.allEcus) {
+                    throw CLI::ValidationError(
+                        "\"" + text +
+                        "\" is not understood; expected a control module id in hexadecimal, such as 7E8, or all");
+                }
+            },
+            "Control module, hexadecimal, or all (live: the first; else all)")
         ->type_name("ID");
     m_app.add_flag("--json", m_options.json, "One JSON document on standard output");
     m_app.add_option("--log", m_options.logFile, "Write the library's log there")->type_name("FILE");

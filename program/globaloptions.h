@@ -23,6 +23,7 @@ struct GlobalOptions
     std::optional<obd::VehicleProtocol> protocol;
     std::optional<obd::UnitSystem> units;
     std::optional<unsigned int> ecu; // control module id
+    bool allEcus = false;            // all of them, where one is the usual
     bool json = false;
     std::string logFile;
     std::string traceFile;

@@ -80,7 +80,7 @@ Reading PolledParameter::reading(obd::SensorInfo const& info, bool alone) const
     reading.sensor = alone ? sensorKey(pid) : fmt::format("{}_{}", sensorKey(pid), info.uid() % 10 + 1);
     reading.pid = m_derived ? std::string() : fmt::format("01{:02X}", pid);
     reading.name = alone ? title : title + ": " + info.description();
-    reading.unit = unitLabel(info.unit(m_units));
+    reading.unit = unitLabel(info.uid(), info.unit(m_units));
     reading.raw = m_derived ? std::vector<unsigned char>() : m_raw;
     return reading;
 }

@@ -1,5 +1,6 @@
 #include "libvelmora/read/freezereader.h"
 
+#include "libvelmora/read/oxygencurrent.h"
 #include "libvelmora/report/unitlabel.h"
 
 #include <obd/itroublecodeservice.h>
@@ -11,7 +12,7 @@ namespace {
 
 FreezeFrame::Reading toReading(obd::SensorDataModel const& sensor)
 {
-    return {sensor.name, sensor.value ? std::optional(sensor.value->value) : std::nullopt,
+    return {sensor.name, sensor.value ? std::optional(shownText(sensor.uid, sensor.value->value)) : std::nullopt,
             unitLabel(sensor.uid, sensor.unit)};
 }
 

@@ -10,7 +10,7 @@ namespace {
 
 constexpr int firstUid = 0x34 * 10 + 1;
 constexpr int lastUid = 0x3B * 10 + 1;
-constexpr double offset = 128.0; // mA
+constexpr int offset = 128; // mA
 
 } // namespace
 
@@ -20,6 +20,11 @@ bool isOxygenCurrent(int uid)
 }
 
 double shownNumber(int uid, double number)
+{
+    return isOxygenCurrent(uid) ? number - offset : number;
+}
+
+int shownNumber(int uid, int number)
 {
     return isOxygenCurrent(uid) ? number - offset : number;
 }

@@ -11,6 +11,7 @@ bool isOxygenCurrent(int uid);
 
 // What people are shown of a number of the library: the same for every other sensor.
 double shownNumber(int uid, double number);
+int shownNumber(int uid, int number);
 
 // The same for the library's text of a number, with as many decimals.
 std::string shownText(int uid, std::string const& text);

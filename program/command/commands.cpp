@@ -16,6 +16,7 @@ void addCommands(CommandLine& commandLine)
     addCountersCommand(commandLine);
     addInfoCommand(commandLine);
     addRoutinesCommand(commandLine);
+    addDoctorCommand(commandLine);
     addDtcCommand(commandLine);
     addVinCommand(commandLine);
     addConsoleCommand(commandLine);

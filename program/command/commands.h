@@ -12,6 +12,7 @@ void addClearCommand(CommandLine& commandLine);
 void addCodesCommand(CommandLine& commandLine);
 void addConsoleCommand(CommandLine& commandLine);
 void addCountersCommand(CommandLine& commandLine);
+void addDoctorCommand(CommandLine& commandLine);
 void addDtcCommand(CommandLine& commandLine);
 void addFreezeCommand(CommandLine& commandLine);
 void addInfoCommand(CommandLine& commandLine);

@@ -1,3 +1,4 @@
+#include "libvelmora/poll/sensorwish.h"
 #include "program/command/commands.h"
 #include "program/command/commandsession.h"
 #include "program/command/liverun.h"
@@ -7,8 +8,12 @@ namespace velmora::cli {
 
 namespace {
 
-ExitCode live(GlobalOptions const& global, LiveOptions const& options)
+ExitCode live(GlobalOptions const& global, LiveOptions const& given)
 {
+    LiveOptions options = given;
+    if (!options.rate.empty()) {
+        options.hertz = parseSensorWish("x@" + options.rate).hertz;
+    }
     std::unique_ptr<LiveCsv> const csv =
         options.csv.empty() ? nullptr : std::make_unique<LiveCsv>(options.csv, options.force);
     CommandSession session(global);
@@ -27,12 +32,22 @@ void addLiveCommand(CommandLine& commandLine)
         "live", "Show live values", [options](GlobalOptions const& global) { return live(global, *options); });
     command->add_option("SENSOR", options->sensors,
                         "PIDs (0C, 0x0C), names (RPM, COOLANT_TEMP), words of a title, or all;\n"
+                        "with a rate (RPM@10hz), of a module (7E9:05);\n"
                         "without: speed, engine speed, coolant, load and throttle");
     command
         ->add_option("--csv", options->csv,
                      "Record there, one column a sensor; - is standard output.\n"
                      "A file that has these columns already is added to")
         ->type_name("FILE");
+    command
+        ->add_option("--rate", options->rate, "How often to read the sensors that have no rate of their own (RPM@10hz)")
+        ->type_name("HZ");
+    command->add_flag("--fast", options->will.fast,
+                      "As fast as the bus allows, several PIDs in one request where the modules\n"
+                      "can; without the pause that spares them");
+    command->add_option("--pids", options->will.pidsPerRequest, "PIDs in one request at most, with --fast")
+        ->type_name("N")
+        ->check(CLI::Range(1, 6));
     command->add_flag("--force", options->force, "Let --csv replace a file that has other columns");
     command->add_option("-n,--count", options->count, "Stop after N readings of every sensor")
         ->type_name("N")

@@ -1,9 +1,12 @@
 #include "program/command/liverun.h"
 
-#include "program/terminal/interrupt.h"
 #include "program/terminal/output.h"
 #include "program/view/livelines.h"
+#include "program/view/ratetext.h"
 
+#include <obd/ivelmorasettings.h>
+#include <obd/parameterdescriptor.h>
+#include <obd/parameterfactory.h>
 #include <velmora/error.h>
 
 #include <fmt/format.h>
@@ -22,43 +25,54 @@ using std::chrono::seconds;
 constexpr milliseconds step{50};
 constexpr seconds silence{3};
 constexpr seconds longSilence{15};
+constexpr seconds ratesSettle{5};
+
+// The modules that words mean which name none: those of --ecu, or the first one.
+std::vector<unsigned int> meantModules(CommandSession const& session)
+{
+    std::vector<unsigned int> ids;
+    if (session.options().ecu || session.options().allEcus) {
+        for (std::shared_ptr<obd::IEcu> const& ecu : session.selectedModules()) {
+            ids.push_back(ecu->id());
+        }
+    }
+    return ids;
+}
 
 } // namespace
 
 LiveRun::LiveRun(CommandSession& session, LiveOptions const& options, LiveCsv* csv)
-    : m_session(session), m_options(options), m_csv(csv), m_service(obd::SensorServiceBuilder::createSensorService()),
-      m_tap(*m_session.obd().getConnectionManager(), m_session.loop())
+    : m_session(session), m_options(options), m_csv(csv), m_offers(moduleOffers(session.obd(), meantModules(session))),
+      m_choices(choosePolled(options.sensors, m_offers, options.hertz))
 {
-    select(chooseSensors(m_options.sensors, offeredSensors(*m_service)));
-    m_service->attach(this);
+    select();
 }
 
-LiveRun::~LiveRun()
-{
-    m_service->detach(this);
-}
+LiveRun::~LiveRun() = default;
 
-void LiveRun::select(SensorIds const& ids)
+void LiveRun::select()
 {
-    auto const descriptors = m_service->getDescriptors();
-    LiveTable::Descriptors chosen;
-    for (obd::ParameterIdentifier::Id const id : ids) {
-        auto const found = std::find_if(descriptors.begin(), descriptors.end(),
-                                        [id](auto const& descriptor) { return descriptor->pid() == id; });
-        if (found != descriptors.end()) {
-            chosen.push_back(*found);
+    obd::IVelmoraSettings const& settings = *m_session.obd().getSettings();
+    LiveTable::Parameters chosen;
+    for (PollChoice const& choice : m_choices) {
+        auto const parameter = obd::ParameterFactory().createParameter(*choice.ecu, settings, choice.id);
+        if (parameter != nullptr) {
+            auto const descriptor =
+                std::make_shared<obd::ParameterDescriptor>(parameter, choice.ecu, settings.unitSystem());
+            chosen.emplace_back(descriptor, choice.ecu->id(), choice.hertz);
         }
     }
-    m_ids = ids;
     m_table.select(chosen);
     m_firstRow = 0;
 }
 
-void LiveRun::restart(SensorIds const& ids)
+// Afresh, with other sensors, other units or empty statistics. The poller is gone before the next one begins.
+void LiveRun::start(std::vector<PollChoice> const& choices)
 {
-    m_service->reset();
-    select(ids);
-    m_service->startUpdates(m_ids);
+    m_feed.reset();
+    m_choices = choices;
+    select();
+    m_feed = std::make_unique<LiveFeed>(m_session.obd(), m_session.loop(), m_choices, m_options.will);
 }
 
 void LiveRun::run()
@@ -72,7 +86,10 @@ void LiveRun::run()
     if (m_csv != nullptr) {
         m_csv->begin(m_table, m_start, std::chrono::system_clock::now());
     }
-    m_service->startUpdates(m_ids);
+    if (m_options.will.fast && !m_session.options().quiet && m_terminal == nullptr) {
+        tell("Asking without the pause that spares the vehicle; too much traffic has upset control modules\n");
+    }
+    m_feed = std::make_unique<LiveFeed>(m_session.obd(), m_session.loop(), m_choices, m_options.will);
     try {
         while (!isDone()) {
             runOnce();
@@ -110,9 +127,10 @@ double LiveRun::rate() const
 
 void LiveRun::tellRate() const
 {
-    fmt::print(stderr,
-               "{} readings, {:.1f} a second; {:.1f} % of the time passed between a reading and the next request\n",
-               m_table.readings(), rate(), 100.0 * m_tap.meter().lostShare());
+    fmt::print(stderr, "{} readings, {:.1f} a second\n", m_table.readings(), rate());
+    if (std::string const rates = reachedRates(m_feed->rates()); !rates.empty()) {
+        fmt::print(stderr, "Reached: {}\n", rates);
+    }
 }
 
 bool LiveRun::isDone() const
@@ -126,16 +144,14 @@ bool LiveRun::isDone() const
 void LiveRun::runOnce()
 {
     LiveTime const limit = Clock::now() + step;
-    m_session.loop().runUntil([&] { return isDone() || Interrupt::instance().raised() || Clock::now() >= limit; },
+    m_session.loop().runUntil([&] { return m_feed->hasNew() || m_session.interrupted() || Clock::now() >= limit; },
                               limit);
     m_session.check();
+    takeReadings();
     LiveTime const now = Clock::now();
-    if (m_invalidated) {
-        m_invalidated = false;
-        restart(m_ids);
-    }
     m_table.expire(now);
     watchSilence(now);
+    watchRates(now);
     if (m_csv != nullptr && !m_csv->update(m_table, now)) {
         m_readerGone = true;
     }
@@ -145,36 +161,57 @@ void LiveRun::runOnce()
     }
 }
 
-void LiveRun::onSensorUpdated(bool /*success*/, std::shared_ptr<obd::ParameterDescriptor> const& descriptor,
-                              std::vector<std::shared_ptr<obd::SensorValueDataModel>> const& values)
+void LiveRun::takeReadings()
 {
-    int const pid = descriptor->pid();
-    bool const beyond = m_options.count > 0 && m_table.rounds() + (m_table.beginsRound(pid) ? 1 : 0) >= m_options.count;
+    for (PollResult const& result : m_feed->take()) {
+        if (!isDone()) {
+            take(result);
+        }
+    }
+}
+
+void LiveRun::take(PollResult const& result)
+{
+    bool const begins = m_table.beginsRound(result.id, result.module);
     LiveTime const now = Clock::now();
     m_lastReading = now;
     m_silenceTold = false;
-    if (beyond) {
+    if (m_options.count > 0 && m_table.rounds() + (begins ? 1 : 0) >= m_options.count) {
         m_quit = true;
         return;
     }
-    m_table.update(pid, values, now);
+    m_table.update(result.id, result.values, now, result.module);
     if (m_csv != nullptr && !m_csv->update(m_table, now)) {
         m_readerGone = true;
     }
-    print(pid);
+    print(result);
 }
 
-void LiveRun::print(int pid)
+void LiveRun::print(PollResult const& result)
 {
     if (m_terminal != nullptr || (m_csv != nullptr && m_csv->toStandardOutput())) {
         return;
     }
     std::string text;
-    std::string const time = isoTime(std::chrono::system_clock::now());
-    for (LiveRow const* row : m_table.rowsOf(pid)) {
+    std::string const time =
+        isoTime(result.readings.empty() ? std::chrono::system_clock::now() : result.readings.front().time);
+    for (LiveRow const* row : m_table.rowsOf(result.id, result.module)) {
         text += m_session.options().json ? toJsonLine(*row, time) : toLine(*row);
     }
     m_readerGone = m_readerGone || !writeOutput(text);
+}
+
+// Once: what the bus can't give is shared fairly, but should not surprise.
+void LiveRun::watchRates(LiveTime now)
+{
+    if (m_ratesTold || now - m_start < ratesSettle || now - m_lastReading > silence) {
+        return;
+    }
+    m_ratesTold = true;
+    std::string const missed = missedRates(m_feed->rates());
+    if (!missed.empty() && m_terminal == nullptr && !m_session.options().quiet) {
+        tell("More is asked for than the bus can give: " + missed + "\n");
+    }
 }
 
 // Requests that fail are tried again without a word, so silence is all that tells.

@@ -1,16 +1,13 @@
 #pragma once
 
-#include "libvelmora/read/sensorchoice.h"
-#include "libvelmora/session/cyclemeter.h"
+#include "libvelmora/poll/pollchoice.h"
 #include "program/command/commandsession.h"
+#include "program/command/livefeed.h"
 #include "program/exitcode.h"
 #include "program/terminal/terminal.h"
 #include "program/view/livecsv.h"
 #include "program/view/livescreen.h"
 #include "program/view/livetable.h"
-
-#include <obd/isensorservice.h>
-#include <tervex/observer.h>
 
 #include <memory>
 #include <optional>
@@ -26,16 +23,19 @@ struct LiveOptions
     bool force = false;      // csv may replace a file
     unsigned long count = 0; // readings of every sensor; 0: no end
     double duration = 0.0;   // seconds; 0: no end
+    PollWill will;
+    std::string rate;            // as given
+    std::optional<double> hertz; // of sensors without a rate of their own
 };
 
-// Live values of one connection: takes the readings of the sensor service and hands them to the lines, the recording
-// and the screen. The main thread's.
-class LiveRun : public tervex::Observer<obd::ISensorServiceObserver>
+// Live values of one connection: takes the readings of a poller and hands them to the lines, the recording and the
+// screen. The main thread's.
+class LiveRun
 {
 public:
     // csv may be null. session must be connected and outlive the run.
     LiveRun(CommandSession& session, LiveOptions const& options, LiveCsv* csv);
-    ~LiveRun() override;
+    ~LiveRun();
     LiveRun(LiveRun const&) = delete;
     LiveRun& operator=(LiveRun const&) = delete;
 
@@ -43,24 +43,25 @@ public:
     void run();
 
 private:
-    void onInvalidated() override { m_invalidated = true; }
-    void onSensorUpdated(bool success, std::shared_ptr<obd::ParameterDescriptor> const& descriptor,
-                         std::vector<std::shared_ptr<obd::SensorValueDataModel>> const& values) override;
-
-    void select(SensorIds const& ids);
-    void restart(SensorIds const& ids);
+    void start(std::vector<PollChoice> const& choices);
+    void select();
+    void takeReadings();
+    void take(PollResult const& result);
 
     bool isDone() const;
     void runOnce();
     void finish();
     void watchSilence(LiveTime now);
-    void print(int pid);
+    void watchRates(LiveTime now);
+    void print(PollResult const& result);
     void tellRate() const;
     double rate() const;
 
     void handleKeys();
     void handleKey(Key key);
     void handlePickerKey(Key key);
+    void openPicker();
+    void pick(SensorIds const& ids);
     void switchUnits();
     void scroll(int lines);
     int page() const;
@@ -73,16 +74,16 @@ private:
     CommandSession& m_session;
     LiveOptions const m_options;
     LiveCsv* const m_csv;
-    std::shared_ptr<obd::ISensorService> m_service;
-    CycleTap m_tap;
+    std::vector<ModuleOffer> const m_offers;
+    std::vector<PollChoice> m_choices;
     LiveTable m_table;
-    SensorIds m_ids;
+    std::unique_ptr<LiveFeed> m_feed;
     LiveTime m_start;
     LiveTime m_lastReading;
     LiveTime m_lastLinkCheck;
     LiveTime m_lastDraw;
-    bool m_invalidated = false;
     bool m_silenceTold = false;
+    bool m_ratesTold = false;
     bool m_quit = false;
     bool m_readerGone = false;
     std::unique_ptr<Terminal> m_terminal; // null where lines are printed

@@ -1,4 +1,5 @@
 #include "program/command/liverun.h"
+#include "program/view/ratetext.h"
 #include "program/view/style.h"
 
 #include <obd/iecu.h>
@@ -7,6 +8,7 @@
 #include <fmt/format.h>
 
 #include <algorithm>
+#include <set>
 
 namespace velmora::cli {
 
@@ -38,17 +40,13 @@ void LiveRun::handleKey(Key key)
         m_quit = true;
         break;
     case 'r':
-        restart(m_ids);
+        start(m_choices);
         break;
     case 'u':
         switchUnits();
         break;
     case 's':
-        if (m_csv != nullptr) {
-            m_note = "The recording's columns are fixed";
-        } else {
-            m_picker = std::make_unique<SensorPicker>(offeredSensors(*m_service), m_ids);
-        }
+        openPicker();
         break;
     case static_cast<int>(Key::Up):
         scroll(-1);
@@ -89,7 +87,7 @@ void LiveRun::handlePickerKey(Key key)
         break;
     case static_cast<int>(Key::Enter):
         if (!m_picker->chosen().empty()) {
-            restart(m_picker->chosen());
+            pick(m_picker->chosen());
         }
         m_picker.reset();
         break;
@@ -102,6 +100,40 @@ void LiveRun::handlePickerKey(Key key)
     }
 }
 
+void LiveRun::openPicker()
+{
+    std::shared_ptr<obd::IEcu> const ecu = m_choices.front().ecu;
+    SensorIds ids;
+    for (PollChoice const& choice : m_choices) {
+        if (choice.ecu != ecu) {
+            m_note = "Sensors of several modules are chosen on the command line";
+            return;
+        }
+        ids.push_back(choice.id);
+    }
+    if (m_csv != nullptr) {
+        m_note = "The recording's columns are fixed";
+        return;
+    }
+    for (ModuleOffer const& offer : m_offers) {
+        if (offer.ecu == ecu) {
+            m_picker = std::make_unique<SensorPicker>(offer.sensors, ids);
+        }
+    }
+}
+
+// Those that were there keep their rate.
+void LiveRun::pick(SensorIds const& ids)
+{
+    std::vector<PollChoice> choices;
+    for (obd::ParameterIdentifier::Id const id : ids) {
+        auto const old =
+            std::find_if(m_choices.begin(), m_choices.end(), [id](PollChoice const& each) { return each.id == id; });
+        choices.push_back(old != m_choices.end() ? *old : PollChoice{m_choices.front().ecu, id, m_options.hertz});
+    }
+    start(choices);
+}
+
 void LiveRun::switchUnits()
 {
     if (m_csv != nullptr) {
@@ -111,6 +143,7 @@ void LiveRun::switchUnits()
     obd::IVelmoraSettings* const settings = m_session.obd().getSettings();
     bool const metric = settings->unitSystem() == obd::UnitSystem::Metric;
     settings->setUnitSystem(metric ? obd::UnitSystem::Imperial : obd::UnitSystem::Metric);
+    start(m_choices);
 }
 
 int LiveRun::page() const
@@ -149,11 +182,18 @@ std::string LiveRun::frame(FrameStyle const& style) const
 
 std::string LiveRun::title() const
 {
-    std::shared_ptr<obd::IEcu> const ecu = m_session.obd().getEcuManager()->getCurrentEcu();
+    std::string modules;
+    std::set<unsigned int> told;
+    for (PollChoice const& choice : m_choices) {
+        if (told.insert(choice.ecu->id()).second) {
+            modules += fmt::format("{}{:X} {}", modules.empty() ? "" : " and ", choice.ecu->id(), choice.ecu->name());
+        }
+    }
     double const elapsed = std::chrono::duration<double>(std::chrono::steady_clock::now() - m_start).count();
-    return fmt::format("{}, module {}, {:.0f} s, {:.1f} readings/s, {:.1f} % of the time lost", m_session.port(),
-                       ecu != nullptr ? fmt::format("{:X} {}", ecu->id(), ecu->name()) : "-", elapsed, rate(),
-                       100.0 * m_tap.meter().lostShare());
+    std::string const rates = reachedRates(m_feed->rates());
+    return fmt::format("{}, {} {}, {:.0f} s, {:.1f} readings/s{}{}", m_session.port(),
+                       told.size() == 1 ? "module" : "modules", modules, elapsed, rate(), rates.empty() ? "" : ", ",
+                       rates);
 }
 
 std::string LiveRun::status() const

@@ -1,3 +1,4 @@
+#include "libvelmora/read/oxygencurrent.h"
 #include "libvelmora/report/json.h"
 #include "libvelmora/report/unitlabel.h"
 #include "libvelmora/text/text.h"
@@ -69,7 +70,8 @@ std::vector<Offer> offers(bool all)
 
 std::string range(obd::SensorDataModel const& sensor)
 {
-    return sensor.numeric != nullptr ? fmt::format("{} to {}", sensor.numeric->minimum, sensor.numeric->maximum)
+    return sensor.numeric != nullptr ? fmt::format("{} to {}", shownNumber(sensor.uid, sensor.numeric->minimum),
+                                                   shownNumber(sensor.uid, sensor.numeric->maximum))
                                      : "text";
 }
 
@@ -105,8 +107,10 @@ void printText(obd::IEcu const& ecu, bool all)
 Json sensorJson(obd::SensorDataModel const& sensor)
 {
     Json json = {{"uid", sensor.uid}, {"name", sensor.name}, {"unit", textOrNull(unitLabel(sensor.uid, sensor.unit))}};
-    json["minimum"] = sensor.numeric != nullptr ? Json(sensor.numeric->minimum) : Json(nullptr);
-    json["maximum"] = sensor.numeric != nullptr ? Json(sensor.numeric->maximum) : Json(nullptr);
+    json["minimum"] =
+        sensor.numeric != nullptr ? Json(shownNumber(sensor.uid, sensor.numeric->minimum)) : Json(nullptr);
+    json["maximum"] =
+        sensor.numeric != nullptr ? Json(shownNumber(sensor.uid, sensor.numeric->maximum)) : Json(nullptr);
     return json;
 }
 

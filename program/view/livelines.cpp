@@ -48,6 +48,7 @@ std::string toJsonLine(LiveRow const& row, std::string const& time)
 {
     Json const line = {
         {"time", time},
+        {"module", fmt::format("{:X}", row.module)},
         {"pid", fmt::format("{:02X}", static_cast<int>(obd::Uid2Pid(row.uid)))},
         {"uid", row.uid},
         {"name", row.name},

@@ -16,10 +16,15 @@ constexpr std::chrono::milliseconds trendStep{250};
 constexpr std::chrono::seconds patience{2};
 constexpr int patienceRounds = 3;
 
-LiveRow makeRow(obd::ParameterDescriptor const& parameter, obd::SensorDescriptor const& sensor, bool alone)
+LiveRow makeRow(LiveParameter const& chosen, obd::SensorDescriptor const& sensor, bool alone)
 {
+    obd::ParameterDescriptor const& parameter = *chosen.descriptor;
     LiveRow row{};
     row.uid = sensor.uid();
+    row.module = chosen.module;
+    if (chosen.hertz) {
+        row.period = std::chrono::duration_cast<LiveTime::duration>(std::chrono::duration<double>(1.0 / *chosen.hertz));
+    }
     row.name = alone ? parameter.description() : parameter.description() + ": " + sensor.description();
     row.unit = unitLabel(sensor.uid(), sensor.unit());
     // What has a unit is a number, though the library gives some, such as distances, as plain digits.
@@ -63,28 +68,34 @@ void take(LiveRow& row, obd::SensorValueDataModel const& value, LiveTime now)
 
 } // namespace
 
-void LiveTable::select(Descriptors const& parameters)
+void LiveTable::select(Parameters const& parameters)
 {
     m_rows.clear();
     m_selected.clear();
     m_seen.clear();
     m_roundLength = {};
-    for (auto const& parameter : parameters) {
-        auto const sensors = parameter->sensors();
+    bool const several = std::any_of(parameters.begin(), parameters.end(), [&](LiveParameter const& each) {
+        return each.module != parameters.front().module;
+    });
+    for (LiveParameter const& parameter : parameters) {
+        auto const sensors = parameter.descriptor->sensors();
         for (auto const& sensor : sensors) {
-            m_rows.push_back(makeRow(*parameter, *sensor, sensors.size() == 1));
+            m_rows.push_back(makeRow(parameter, *sensor, sensors.size() == 1));
+            if (several) {
+                m_rows.back().name.insert(0, fmt::format("{:X} ", parameter.module));
+            }
         }
-        m_selected.insert(parameter->pid());
+        m_selected.insert({parameter.module, parameter.descriptor->pid()});
     }
 }
 
-void LiveTable::update(int pid, Values const& values, LiveTime now)
+void LiveTable::update(int pid, Values const& values, LiveTime now, unsigned int module)
 {
-    if (!m_selected.contains(pid)) {
+    if (!m_selected.contains({module, pid})) {
         return;
     }
     for (LiveRow& row : m_rows) {
-        if (obd::Uid2Pid(row.uid) != pid) {
+        if (obd::Uid2Pid(row.uid) != pid || row.module != module) {
             continue;
         }
         auto const found =
@@ -97,18 +108,18 @@ void LiveTable::update(int pid, Values const& values, LiveTime now)
     }
     ++m_readings;
     m_lastReading = now;
-    countRound(pid, now);
+    countRound({module, pid}, now);
 }
 
-void LiveTable::countRound(int pid, LiveTime now)
+void LiveTable::countRound(Key key, LiveTime now)
 {
-    if (beginsRound(pid)) {
+    if (m_seen.contains(key)) {
         endRound(now);
     }
     if (m_seen.empty() && m_roundStart == LiveTime()) {
         m_roundStart = now;
     }
-    m_seen.insert(pid);
+    m_seen.insert(key);
     if (m_seen.size() == m_selected.size()) {
         endRound(now);
     }
@@ -127,17 +138,17 @@ void LiveTable::expire(LiveTime now)
     // The first round, and one that has become longer, are measured as far as they have come.
     LiveTime::duration const round = std::max(m_roundLength, m_lastReading - m_roundStart);
     for (LiveRow& row : m_rows) {
-        if (now - row.updated > patience + patienceRounds * round) {
+        if (now - row.updated > patience + patienceRounds * std::max(round, row.period)) {
             forget(row);
         }
     }
 }
 
-std::vector<LiveRow const*> LiveTable::rowsOf(int pid) const
+std::vector<LiveRow const*> LiveTable::rowsOf(int pid, unsigned int module) const
 {
     std::vector<LiveRow const*> rows;
     for (LiveRow const& row : m_rows) {
-        if (obd::Uid2Pid(row.uid) == pid) {
+        if (obd::Uid2Pid(row.uid) == pid && row.module == module) {
             rows.push_back(&row);
         }
     }

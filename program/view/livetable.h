@@ -6,20 +6,36 @@
 #include <chrono>
 #include <deque>
 #include <memory>
+#include <optional>
 #include <set>
 #include <string>
+#include <utility>
 #include <vector>
 
 namespace velmora::cli {
 
 using LiveTime = std::chrono::steady_clock::time_point;
 
+// A parameter to be shown.
+struct LiveParameter
+{
+    LiveParameter(std::shared_ptr<obd::ParameterDescriptor> parameter, unsigned int id = 0,
+                  std::optional<double> rate = std::nullopt)
+        : descriptor(std::move(parameter)), module(id), hertz(rate)
+    {}
+
+    std::shared_ptr<obd::ParameterDescriptor> descriptor;
+    unsigned int module;         // id of the control module
+    std::optional<double> hertz; // how often it is to come
+};
+
 // One sensor with what is known of it. Texts are empty where nothing is known, for a sensor that the vehicle no longer
 // answers for too.
 struct LiveRow
 {
     int uid;
-    std::string name;
+    unsigned int module;
+    std::string name; // with the module's id in front where there are several
     std::string unit;
     bool numeric;
     std::string value;
@@ -29,6 +45,7 @@ struct LiveRow
     std::deque<double> trend; // oldest first
     LiveTime updated;
     LiveTime trendTime;
+    LiveTime::duration period; // how far apart its readings are to be; 0 for as close as can be
 };
 
 // The live values of the selected parameters, in the order of their selection.
@@ -37,38 +54,40 @@ class LiveTable
 public:
     static constexpr std::size_t trendLength = 16;
 
-    using Descriptors = std::vector<std::shared_ptr<obd::ParameterDescriptor>>;
+    using Parameters = std::vector<LiveParameter>;
     using Values = std::vector<std::shared_ptr<obd::SensorValueDataModel>>;
 
     // Starts anew, with other parameters or other units.
-    void select(Descriptors const& parameters);
+    void select(Parameters const& parameters);
 
     // Takes a reading of a parameter; a sensor that is not among the values has none any more. Of a parameter that was
     // not selected nothing is taken.
-    void update(int pid, Values const& values, LiveTime now);
+    void update(int pid, Values const& values, LiveTime now, unsigned int module = 0);
 
     // Forgets the values that are too old to be shown as current: by some rounds of all sensors, and some seconds.
     void expire(LiveTime now);
 
     std::vector<LiveRow> const& rows() const { return m_rows; }
     // The rows of one parameter.
-    std::vector<LiveRow const*> rowsOf(int pid) const;
+    std::vector<LiveRow const*> rowsOf(int pid, unsigned int module = 0) const;
 
     // How often all parameters have had their turn. One that the vehicle doesn't answer for has had it when another one
     // comes again.
     unsigned long rounds() const { return m_rounds; }
     // Whether a reading of this parameter would begin the next round.
-    bool beginsRound(int pid) const { return m_seen.contains(pid); }
+    bool beginsRound(int pid, unsigned int module = 0) const { return m_seen.contains({module, pid}); }
     // All readings so far.
     unsigned long readings() const { return m_readings; }
 
 private:
-    void countRound(int pid, LiveTime now);
+    using Key = std::pair<unsigned int, int>; // module and PID
+
+    void countRound(Key key, LiveTime now);
     void endRound(LiveTime now);
 
     std::vector<LiveRow> m_rows;
-    std::set<int> m_selected;
-    std::set<int> m_seen; // in this round
+    std::set<Key> m_selected;
+    std::set<Key> m_seen; // in this round
     unsigned long m_rounds = 0;
     unsigned long m_readings = 0;
     LiveTime m_roundStart;

@@ -59,8 +59,10 @@ TEST(LiveLines, TellNameValueAndUnit)
 TEST(LiveLines, JsonHasNumbersAndNull)
 {
     std::string const text = toJsonLine(numberRow("Engine RPM", "1726", "rpm"), "2024-03-07T09:05:02.123Z");
-    EXPECT_EQ(text, "{\"time\":\"2024-03-07T09:05:02.123Z\",\"pid\":\"0C\",\"uid\":120,\"name\":\"Engine RPM\","
-                    "\"value\":1726,\"unit\":\"rpm\",\"minimum\":1726,\"mean\":1726,\"maximum\":1726}\n");
+    EXPECT_EQ(
+        text,
+        "{\"time\":\"2024-03-07T09:05:02.123Z\",\"module\":\"0\",\"pid\":\"0C\",\"uid\":120,"
+        "\"name\":\"Engine RPM\",\"value\":1726,\"unit\":\"rpm\",\"minimum\":1726,\"mean\":1726,\"maximum\":1726}\n");
     for (char const* missing : {"", "nan", "inf", "-"}) {
         auto const json = nlohmann::json::parse(toJsonLine(numberRow("x", missing, ""), "t"));
         EXPECT_TRUE(json["value"].is_null()) << missing;

@@ -1,0 +1,30 @@
+#include "program/command/livefeed.h"
+
+#include <utility>
+
+namespace velmora::cli {
+
+LiveFeed::LiveFeed(obd::IObdVelmora const& obd, DispatchLoop& loop, std::vector<PollChoice> const& choices,
+                   PollWill const& will)
+    : m_poller(pollVehicle(obd, choices, will, [this, &loop](PollResult const& result) {
+          {
+              std::lock_guard const lock(m_mutex);
+              m_results.push_back(result);
+          }
+          loop.wake();
+      }))
+{}
+
+bool LiveFeed::hasNew() const
+{
+    std::lock_guard const lock(m_mutex);
+    return !m_results.empty();
+}
+
+std::vector<PollResult> LiveFeed::take()
+{
+    std::lock_guard const lock(m_mutex);
+    return std::exchange(m_results, {});
+}
+
+} // namespace velmora::cli

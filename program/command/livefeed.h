@@ -1,0 +1,30 @@
+#pragma once
+
+#include "libvelmora/poll/vehiclepoll.h"
+#include "libvelmora/session/dispatchloop.h"
+
+#include <memory>
+#include <mutex>
+#include <vector>
+
+namespace velmora::cli {
+
+// What a poller reads, for the main thread to take, whose loop it wakes.
+class LiveFeed
+{
+public:
+    // Polls from here on; both must outlive it.
+    LiveFeed(obd::IObdVelmora const& obd, DispatchLoop& loop, std::vector<PollChoice> const& choices,
+             PollWill const& will);
+
+    bool hasNew() const;
+    std::vector<PollResult> take();
+    std::vector<PollRate> rates() const { return m_poller->rates(); }
+
+private:
+    mutable std::mutex m_mutex;
+    std::vector<PollResult> m_results; // protected by m_mutex
+    std::unique_ptr<Poller> m_poller;  // ends before what it hands over to
+};
+
+} // namespace velmora::cli

@@ -1,0 +1,43 @@
+#include "program/view/ratetext.h"
+
+#include "libvelmora/poll/sensorwish.h"
+#include "libvelmora/read/sensornames.h"
+
+#include <fmt/format.h>
+
+#include <algorithm>
+
+namespace velmora::cli {
+
+namespace {
+
+constexpr double nearEnough = 0.9;
+
+std::string describe(std::vector<PollRate> const& rates, double below)
+{
+    bool const several = std::any_of(rates.begin(), rates.end(),
+                                     [&](PollRate const& each) { return each.module != rates.front().module; });
+    std::string text;
+    for (PollRate const& rate : rates) {
+        if (rate.asked && rate.reached < *rate.asked * below) {
+            text += fmt::format("{}{}{} {} of {} Hz", text.empty() ? "" : ", ",
+                                several ? fmt::format("{:X} ", rate.module) : "", sensorKey(rate.pid),
+                                rateText(rate.reached), rateText(*rate.asked));
+        }
+    }
+    return text;
+}
+
+} // namespace
+
+std::string reachedRates(std::vector<PollRate> const& rates)
+{
+    return describe(rates, 1e9);
+}
+
+std::string missedRates(std::vector<PollRate> const& rates)
+{
+    return describe(rates, nearEnough);
+}
+
+} // namespace velmora::cli
