@@ -1,5 +1,6 @@
 #include "program/commandline.h"
 
+#include "libvelmora/output/outputfactory.h"
 #include "program/terminal/output.h"
 #include "velmora/version.h"
 
@@ -78,12 +79,18 @@ std::optional<ColorMode> parseColor(std::string const& text)
                                 text);
 }
 
+// The version, and what was not left out of this build.
+std::string versionLines()
+{
+    return fmt::format("velmora {}\noutputs: {}", versionText, fmt::join(builtInOutputs(), ", "));
+}
+
 } // namespace
 
 CommandLine::CommandLine() : m_app("Reads live data, trouble codes and vehicle data from a car.", "velmora")
 {
     m_app.require_subcommand(1);
-    m_app.set_version_flag("-V,--version", std::string("velmora ") + versionText);
+    m_app.set_version_flag("-V,--version", versionLines());
     m_app.set_help_flag("-h,--help", "Print this help");
     m_app.set_help_all_flag("--help-all", "Print the help of all commands");
     m_app.footer(exitCodes);

@@ -27,17 +27,23 @@ void createPrivately(std::string const& file)
 
 } // namespace
 
-Database::Database(std::string const& file) : m_file(file)
+Database::Database(std::string const& file, Access access) : m_file(file)
 {
-    createPrivately(file);
-    if (::sqlite3_open_v2(file.c_str(), &m_handle, SQLITE_OPEN_READWRITE | SQLITE_OPEN_NOMUTEX, nullptr) != SQLITE_OK) {
+    bool const writes = access == Access::Write;
+    if (writes) {
+        createPrivately(file);
+    }
+    int const flags = (writes ? SQLITE_OPEN_READWRITE : SQLITE_OPEN_READONLY) | SQLITE_OPEN_NOMUTEX;
+    if (::sqlite3_open_v2(file.c_str(), &m_handle, flags, nullptr) != SQLITE_OK) {
         std::string const why = ::sqlite3_errmsg(m_handle);
         ::sqlite3_close(m_handle);
         throw Error(ErrorKind::Failed, "Could not open " + file + ": " + why);
     }
     try {
         ::sqlite3_busy_timeout(m_handle, busyMillis);
-        execute("PRAGMA journal_mode=WAL; PRAGMA synchronous=FULL; PRAGMA journal_size_limit=1048576;");
+        if (writes) {
+            execute("PRAGMA journal_mode=WAL; PRAGMA synchronous=FULL; PRAGMA journal_size_limit=1048576;");
+        }
     } catch (...) {
         ::sqlite3_close(m_handle);
         throw;

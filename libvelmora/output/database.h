@@ -13,9 +13,15 @@ namespace velmora {
 class Database
 {
 public:
+    enum class Access
+    {
+        Write,
+        ReadOnly,
+    };
+
     // Makes the file if there is none. In write-ahead mode, and each commit is on the disk when it returns: a power cut
     // costs what was not committed, no more. Throws Error.
-    explicit Database(std::string const& file);
+    explicit Database(std::string const& file, Access access = Access::Write);
     ~Database();
     Database(Database const&) = delete;
     Database& operator=(Database const&) = delete;

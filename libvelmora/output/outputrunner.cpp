@@ -45,13 +45,16 @@ void OutputRunner::flush()
     m_wake.notify_one();
 }
 
+void OutputRunner::beginStop()
+{
+    std::lock_guard const lock(m_mutex);
+    m_stopped = true;
+    m_wake.notify_one();
+}
+
 void OutputRunner::stop()
 {
-    {
-        std::lock_guard const lock(m_mutex);
-        m_stopped = true;
-        m_wake.notify_one();
-    }
+    beginStop();
     if (m_thread.joinable()) {
         m_thread.join();
     }

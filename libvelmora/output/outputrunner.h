@@ -54,7 +54,9 @@ public:
     void push(SharedRecord record);
     // Makes the thread write what is queued without waiting for the end of its interval. Any thread.
     void flush();
-    // Writes what is queued, once and without trying again, and closes. Whoever calls it waits for that.
+    // Makes the thread write what is queued, once and without trying again, and close. Doesn't wait for that.
+    void beginStop();
+    // The same, and waits.
     void stop();
 
     std::string const& name() const { return m_name; }

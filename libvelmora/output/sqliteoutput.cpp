@@ -11,9 +11,8 @@ namespace velmora {
 
 namespace {
 
-constexpr std::int64_t applicationId = 0x766C6D72; // "vlmr"
-constexpr unsigned int checkpointAfter = 60;       // calls without records, a second apart
-constexpr double largestWhole = 9e15;              // beyond it a double is no exact whole number
+constexpr unsigned int checkpointAfter = 60; // calls without records, a second apart
+constexpr double largestWhole = 9e15;        // beyond it a double is no exact whole number
 
 void prepareSchema(Database& database)
 {
@@ -22,12 +21,12 @@ void prepareSchema(Database& database)
     if (tables == 0) {
         Transaction transaction(database);
         database.execute(sqliteSchema);
-        database.execute("PRAGMA application_id=" + std::to_string(applicationId));
+        database.execute("PRAGMA application_id=" + std::to_string(sqliteApplicationId));
         database.execute("PRAGMA user_version=" + std::to_string(sqliteSchemaVersion));
         transaction.commit();
         return;
     }
-    if (database.number("PRAGMA application_id") != applicationId) {
+    if (database.number("PRAGMA application_id") != sqliteApplicationId) {
         throw Error(ErrorKind::WrongUse, database.file() + " is the database of another program",
                     {"name another file"});
     }
@@ -54,7 +53,9 @@ struct SqliteOutput::Statements
                               "VALUES (?, ?, ?, ?, ?, ?)"),
           findSensor(database, "SELECT id FROM sensor WHERE vehicle = ? AND module = ? AND key = ? AND unit = ?"),
           module(database, "INSERT OR REPLACE INTO module VALUES (?, ?, ?, ?, ?, ?)"),
-          codeCame(database, "INSERT INTO code (vehicle, module, code, kind, text, since) VALUES (?, ?, ?, ?, ?, ?)"),
+          codeCame(database, "INSERT INTO code (vehicle, module, code, kind, text, since) "
+                             "SELECT ?1, ?2, ?3, ?4, ?5, ?6 WHERE NOT EXISTS (SELECT 1 FROM code WHERE vehicle = ?1 "
+                             "AND module = ?2 AND code = ?3 AND kind = ?4 AND gone IS NULL)"),
           codeWent(database, "UPDATE code SET gone = ? WHERE vehicle = ? AND module = ? AND code = ? AND kind = ? "
                              "AND gone IS NULL"),
           event(database, "INSERT INTO event (time, vehicle, module, kind, text) VALUES (?, ?, ?, ?, ?)"),

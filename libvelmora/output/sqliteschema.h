@@ -3,6 +3,7 @@
 namespace velmora {
 
 inline constexpr int sqliteSchemaVersion = 1;
+inline constexpr int sqliteApplicationId = 0x766C6D72; // "vlmr"
 
 // Times are milliseconds since 1970, UTC. The readings lie in the order of time: that writes a small part of what the
 // order of sensors would, which counts on an SD card.

@@ -22,6 +22,8 @@ void addCommands(CommandLine& commandLine)
     addConsoleCommand(commandLine);
     addLogCommand(commandLine);
     addRecordCommand(commandLine);
+    addWatchCommand(commandLine);
+    addTripsCommand(commandLine);
     addSettingsCommand(commandLine);
     addSignalsCommand(commandLine);
     addSimulateCommand(commandLine);

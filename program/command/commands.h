@@ -29,6 +29,8 @@ void addSensorsCommand(CommandLine& commandLine);
 void addSettingsCommand(CommandLine& commandLine);
 void addSignalsCommand(CommandLine& commandLine);
 void addSimulateCommand(CommandLine& commandLine);
+void addTripsCommand(CommandLine& commandLine);
 void addVinCommand(CommandLine& commandLine);
+void addWatchCommand(CommandLine& commandLine);
 
 } // namespace velmora::cli

@@ -54,6 +54,9 @@ void Interrupt::wait()
     sigset_t const signals = endingSignals();
     int signal = 0;
     while (sigwait(&signals, &signal) == 0 && !m_stop) {
+        if (signal == SIGHUP && hangUp()) {
+            continue;
+        }
         if (m_raised.exchange(true)) {
             endAtOnce();
         }
@@ -62,6 +65,21 @@ void Interrupt::wait()
             m_handler();
         }
     }
+}
+
+bool Interrupt::hangUp()
+{
+    std::lock_guard const lock(m_mutex);
+    if (m_hangUp) {
+        m_hangUp();
+    }
+    return m_hangUp != nullptr;
+}
+
+void Interrupt::setHangUpHandler(std::function<void()> handler)
+{
+    std::lock_guard const lock(m_mutex);
+    m_hangUp = std::move(handler);
 }
 
 void Interrupt::endAtOnce()

@@ -1,0 +1,190 @@
+#include "program/command/watchrun.h"
+
+#include "libvelmora/output/outputfactory.h"
+#include "libvelmora/output/valuetext.h"
+#include "libvelmora/watch/statefolder.h"
+#include "program/terminal/output.h"
+
+#include <velmora/error.h>
+
+#include <fmt/format.h>
+
+#include <algorithm>
+#include <charconv>
+#include <random>
+
+namespace velmora::cli {
+
+namespace {
+
+WatchTime timeNow()
+{
+    return {std::chrono::steady_clock::now(), std::chrono::system_clock::now()};
+}
+
+SessionCarOptions carOptions(GlobalOptions const& options, WatchSettings const& settings, std::string const& vehicle)
+{
+    SessionCarOptions result;
+    result.session.port = options.port.empty() ? settings.port : options.port;
+    result.session.baud = options.baud;
+    result.session.protocol = options.protocol;
+    result.session.units = obd::UnitSystem::Metric;
+    result.session.ecu = options.ecu;
+    result.session.reset = options.reset;
+    result.session.logFile = options.logFile;
+    result.session.traceFile = options.traceFile;
+    result.session.settingsFile = options.settingsFile;
+    if (result.session.settingsFile.empty() && runsAsService()) {
+        result.session.settingsFile = stateFolder() / "settings.toml";
+    }
+    result.vehicle = vehicle;
+    result.sensors = settings.sensors;
+    result.fullVin = settings.fullVin;
+    result.fast = settings.fast;
+    return result;
+}
+
+std::string vehicleName(WatchSettings const& settings)
+{
+    return settings.vehicle.empty() ? keptVehicleName(stateFolder()) : settings.vehicle;
+}
+
+OutputLimits limitsOf(OutputAddress const& address)
+{
+    OutputLimits limits;
+    std::string const queue = address.option("queue", std::to_string(limits.queue));
+    auto const [end, error] = std::from_chars(queue.data(), queue.data() + queue.size(), limits.queue);
+    if (error != std::errc() || end != queue.data() + queue.size() || limits.queue == 0) {
+        throw Error(ErrorKind::WrongUse, "\"" + queue + "\" is no length of a queue", {"give a number of records"});
+    }
+    return limits;
+}
+
+WatchRules rulesOf(WatchSettings const& settings, std::string const& vehicle)
+{
+    WatchRules rules;
+    rules.vehicle = vehicle;
+    rules.battery = settings.battery;
+    rules.codesEvery = settings.codesEvery;
+    rules.seed = std::random_device()();
+    return rules;
+}
+
+} // namespace
+
+WatchRun::WatchRun(GlobalOptions const& options, WatchSettings const& settings, ServiceNotify& notify)
+    : m_options(options), m_notify(notify), m_vehicle(vehicleName(settings)),
+      m_car(carOptions(options, settings, m_vehicle))
+{
+    if (options.port.empty() && settings.port.empty()) {
+        throw Error(ErrorKind::WrongUse, "No port is named", {"name it with --port, or as port in the settings"});
+    }
+    addOutputs(settings);
+    m_engine = std::make_unique<WatchEngine>(
+        m_car, rulesOf(settings, m_vehicle), [this](Record record) { take(std::move(record)); }, timeNow());
+}
+
+void WatchRun::addOutputs(WatchSettings const& settings)
+{
+    OutputContext context;
+    context.vehicle = m_vehicle;
+    context.stateFolder = stateFolder();
+    context.tell = [this](std::string const& text) { say(text); };
+    context.health = [this] {
+        std::lock_guard const lock(m_healthMutex);
+        return m_health;
+    };
+    for (OutputAddress const& address : settings.outputs) {
+        m_outputs.push_back(std::make_unique<OutputRunner>(toString(address), makeOutput(address, context),
+                                                           context.tell, limitsOf(address)));
+    }
+    for (std::unique_ptr<OutputRunner> const& each : m_outputs) {
+        each->start();
+    }
+}
+
+WatchRun::~WatchRun()
+{
+    if (m_engine != nullptr) {
+        try {
+            m_engine->finish(timeNow());
+        } catch (std::exception const& error) {
+            say(error.what());
+        }
+    }
+    for (std::unique_ptr<OutputRunner> const& each : m_outputs) {
+        each->beginStop();
+    }
+    for (std::unique_ptr<OutputRunner> const& each : m_outputs) {
+        each->stop();
+    }
+}
+
+void WatchRun::end()
+{
+    m_end = true;
+    m_car.interrupt();
+}
+
+void WatchRun::run()
+{
+    takeHealth();
+    m_notify.tell("READY=1");
+    while (!m_end) {
+        std::chrono::milliseconds pause{0};
+        try {
+            pause = m_engine->step(timeNow());
+        } catch (Error const& error) {
+            if (error.kind() == ErrorKind::Interrupted) {
+                return;
+            }
+            throw;
+        }
+        takeHealth();
+        tellState();
+        m_notify.alive(std::chrono::steady_clock::now());
+        m_car.wait(pause);
+    }
+}
+
+void WatchRun::take(Record record)
+{
+    if (auto const* const event = std::get_if<Event>(&record)) {
+        std::string const module = event->module ? " (" + moduleText(*event->module) + ")" : "";
+        say(fmt::format("{}{}: {}", event->kind, module, event->text));
+    }
+    auto const shared = std::make_shared<Record const>(std::move(record));
+    for (std::unique_ptr<OutputRunner> const& each : m_outputs) {
+        each->push(shared);
+    }
+}
+
+void WatchRun::tellState()
+{
+    std::string const& trouble = m_engine->trouble();
+    std::string const state = m_engine->state() + (trouble.empty() ? "" : ": " + trouble);
+    if (state != m_toldState) {
+        m_toldState = state;
+        m_notify.tell("STATUS=" + state);
+        say(state);
+    }
+}
+
+void WatchRun::takeHealth()
+{
+    Health health = m_engine->health();
+    for (std::unique_ptr<OutputRunner> const& each : m_outputs) {
+        health.outputs.emplace_back(each->name(), each->counts());
+    }
+    std::lock_guard const lock(m_healthMutex);
+    m_health = std::move(health);
+}
+
+void WatchRun::say(std::string const& text) const
+{
+    if (!m_options.quiet) {
+        tell(utcTime(std::chrono::system_clock::now()) + " " + text + "\n");
+    }
+}
+
+} // namespace velmora::cli

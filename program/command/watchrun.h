@@ -1,0 +1,50 @@
+#pragma once
+
+#include "libvelmora/output/health.h"
+#include "libvelmora/watch/servicenotify.h"
+#include "libvelmora/watch/sessioncar.h"
+#include "libvelmora/watch/watchengine.h"
+#include "libvelmora/watch/watchsettings.h"
+#include "program/globaloptions.h"
+
+#include <atomic>
+#include <mutex>
+
+namespace velmora::cli {
+
+// One run of the watch with one set of settings: the car, the engine, and the outputs.
+class WatchRun
+{
+public:
+    // Opens the outputs. Throws Error for settings that make no sense.
+    WatchRun(GlobalOptions const& options, WatchSettings const& settings, ServiceNotify& notify);
+    // Ends the trip under way and flushes the outputs.
+    ~WatchRun();
+    WatchRun(WatchRun const&) = delete;
+    WatchRun& operator=(WatchRun const&) = delete;
+
+    // Until end is called. Throws Error for what trying again can't mend.
+    void run();
+    // Any thread.
+    void end();
+
+private:
+    void addOutputs(WatchSettings const& settings);
+    void take(Record record);
+    void tellState();
+    void takeHealth();
+    void say(std::string const& text) const;
+
+    GlobalOptions const m_options;
+    ServiceNotify& m_notify;
+    std::string const m_vehicle;
+    SessionCar m_car;
+    std::mutex m_healthMutex;
+    Health m_health; // protected by m_healthMutex
+    std::vector<std::unique_ptr<OutputRunner>> m_outputs;
+    std::unique_ptr<WatchEngine> m_engine;
+    std::string m_toldState;
+    std::atomic<bool> m_end{false};
+};
+
+} // namespace velmora::cli

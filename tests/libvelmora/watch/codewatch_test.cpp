@@ -1,0 +1,70 @@
+#include "libvelmora/watch/codewatch.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+namespace {
+
+using testing::ElementsAre;
+using testing::IsEmpty;
+using velmora::CodeLook;
+using velmora::CodeWatch;
+
+std::vector<std::string> news(CodeWatch& watch, CodeLook const& look)
+{
+    std::vector<std::string> result;
+    for (velmora::Record const& each : watch.take(look, {})) {
+        if (auto const* const event = std::get_if<velmora::Event>(&each)) {
+            result.push_back(event->kind);
+        } else if (auto const* const change = std::get_if<velmora::CodeChange>(&each)) {
+            result.push_back((change->present ? "+" : "-") + change->code + change->kind);
+        }
+    }
+    return result;
+}
+
+CodeLook lookAt(std::optional<bool> lamp, std::optional<std::vector<CodeLook::Code>> confirmed)
+{
+    return {0x7E8, lamp, {{"confirmed", std::move(confirmed)}}, {}};
+}
+
+TEST(CodeWatch, TellsWhatCameAndWent)
+{
+    CodeWatch watch("van");
+    EXPECT_THAT(news(watch, lookAt(false, {{{"P0301", "a"}}})), ElementsAre("+P0301confirmed"));
+    EXPECT_THAT(news(watch, lookAt(false, {{{"P0301", "a"}}})), IsEmpty());
+    EXPECT_THAT(news(watch, lookAt(true, {{{"P0301", "a"}, {"P0420", "b"}, {"P0420", "b"}}})),
+                ElementsAre("lamp_on", "+P0420confirmed", "code_new"));
+    EXPECT_THAT(news(watch, lookAt(false, {{{"P0420", "b"}}})),
+                ElementsAre("lamp_off", "-P0301confirmed", "code_gone"));
+}
+
+TEST(CodeWatch, AListThatWasNotToldChangesNothing)
+{
+    CodeWatch watch("van");
+    news(watch, lookAt(true, {{{"P0301", "a"}}}));
+    EXPECT_THAT(news(watch, lookAt({}, {})), IsEmpty());
+    EXPECT_THAT(news(watch, lookAt(true, {{{"P0301", "a"}}})), IsEmpty());
+    EXPECT_THAT(news(watch, lookAt(true, {{}})), ElementsAre("-P0301confirmed", "code_gone"));
+}
+
+TEST(CodeWatch, ALampThatIsOnAtFirstIsTold)
+{
+    CodeWatch watch("van");
+    EXPECT_THAT(news(watch, lookAt(true, {})), ElementsAre("lamp_on"));
+}
+
+TEST(CodeWatch, TellsWhenAllMonitorsHaveRunAndWhenNotAnyMore)
+{
+    CodeWatch watch("van");
+    CodeLook look{0x7E8, {}, {}, 3};
+    EXPECT_THAT(news(watch, look), IsEmpty());
+    look.notReady = 2;
+    EXPECT_THAT(news(watch, look), IsEmpty());
+    look.notReady = 0;
+    EXPECT_THAT(news(watch, look), ElementsAre("ready"));
+    look.notReady = 5;
+    EXPECT_THAT(news(watch, look), ElementsAre("not_ready"));
+}
+
+} // namespace

@@ -1,0 +1,66 @@
+#include "libvelmora/watch/voltageprobe.h"
+
+#include <velmora/error.h>
+
+#include <gtest/gtest.h>
+
+#include <map>
+
+namespace {
+
+using velmora::findVolts;
+
+// Answers at once, on the thread that writes.
+class AnsweringPort : public velmora::IPort
+{
+public:
+    explicit AnsweringPort(std::map<std::string, std::string> answers, std::vector<std::string>& written)
+        : m_answers(std::move(answers)), m_written(written)
+    {}
+
+    void start(Receiver onBytes, LossHandler onLost) override
+    {
+        m_onBytes = std::move(onBytes);
+        m_onLost = std::move(onLost);
+    }
+    void write(std::string_view bytes) override
+    {
+        m_written.emplace_back(bytes);
+        auto const found = m_answers.find(std::string(bytes));
+        found == m_answers.end() ? m_onLost() : m_onBytes(found->second);
+    }
+    void close() override {}
+
+private:
+    std::map<std::string, std::string> const m_answers;
+    std::vector<std::string>& m_written;
+    Receiver m_onBytes;
+    LossHandler m_onLost;
+};
+
+std::optional<double> probed(std::map<std::string, std::string> const& answers, std::vector<std::string>& written)
+{
+    return velmora::probeVoltage(std::make_unique<AnsweringPort>(answers, written), std::chrono::milliseconds(1));
+}
+
+TEST(VoltageProbe, AsksTheAdapterAndNobodyElse)
+{
+    std::vector<std::string> written;
+    EXPECT_EQ(probed({{"\r", "?\r\r>"}, {"ATRV\r", "ATRV\r12.6V\r\r>"}}, written), 12.6);
+    EXPECT_EQ(written, (std::vector<std::string>{"\r", "ATRV\r"}));
+    EXPECT_EQ(probed({{"\r", ">"}, {"ATRV\r", "?\r\r>"}}, written), std::nullopt);
+    EXPECT_EQ(probed({{"\r", ""}, {"ATRV\r", ""}}, written), std::nullopt); // silent
+    EXPECT_THROW(probed({{"\r", ">"}}, written), velmora::Error);
+}
+
+TEST(VoltageProbe, FindsVolts)
+{
+    EXPECT_EQ(findVolts("ATRV\r13.8V\r"), 13.8);
+    EXPECT_EQ(findVolts("12v"), 12.0);
+    EXPECT_EQ(findVolts("ELM327 v1.5\r24.9V"), 24.9);
+    for (char const* const none : {"", "V", "12.6", "0.0V", "99.9V", "?", "ELM327 v1.5", "NO DATA"}) {
+        EXPECT_FALSE(findVolts(none)) << none;
+    }
+}
+
+} // namespace
