@@ -15,6 +15,7 @@ DebugLogger::~DebugLogger()
 void DebugLogger::open(std::string const& path)
 {
     m_path = path;
+    m_failed = false;
     if (!path.empty()) {
         std::FILE* file = std::fopen(path.c_str(), "w");
         if (file != nullptr) {
@@ -28,8 +29,10 @@ void DebugLogger::open(std::string const& path)
 void DebugLogger::write(std::string const& line)
 {
     if (std::FILE* file = m_file) {
-        std::fprintf(file, "%s", line.c_str());
-        std::fflush(file);
+        bool const written = std::fputs(line.c_str(), file) >= 0;
+        if (std::fflush(file) != 0 || !written) {
+            m_failed = true;
+        }
     }
 }
 

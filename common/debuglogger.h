@@ -24,11 +24,15 @@ public:
     // opened earlier is left open: another thread may be writing to it.
     void open(std::string const& path);
 
-    // A failing write is ignored: logging never fails its caller.
+    // Whether a line could not be written since open.
+    bool failed() const { return m_failed; }
+
+    // A failing write is only noted: logging never fails its caller.
     void write(std::string const& line) override;
 
 private:
     std::atomic<std::FILE*> m_file{nullptr};
+    std::atomic<bool> m_failed{false};
     std::string m_path;
 };
 

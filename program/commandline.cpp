@@ -2,6 +2,8 @@
 
 #include "libvelmora/output/outputfactory.h"
 #include "program/terminal/output.h"
+#include "program/terminal/terminal.h"
+#include "program/view/layout.h"
 #include "velmora/version.h"
 
 #include <velmora/error.h>
@@ -15,6 +17,7 @@
 #include <exception>
 #include <map>
 #include <system_error>
+#include <unistd.h>
 #include <utility>
 
 namespace velmora::cli {
@@ -28,10 +31,11 @@ constexpr char const* exitCodes =
 
 void report(Error const& failure)
 {
-    tell(fmt::format("velmora: {}\n", failure.what()));
+    std::string text = fmt::format("velmora: {}\n", failure.what());
     for (std::string const& hint : failure.hints()) {
-        tell(fmt::format("  - {}\n", hint));
+        text += fmt::format("  - {}\n", hint);
     }
+    tell(folded(text, Terminal::columnsOf(STDERR_FILENO)));
 }
 
 // A reader of standard output that has gone, such as head, has read enough and needs no message.
@@ -39,7 +43,9 @@ ExitCode judge(std::system_error const& error)
 {
     if (std::ferror(stdout) == 0) {
         tell(fmt::format("velmora: {}\n", error.what()));
-    } else if (error.code().value() != EPIPE) {
+    } else if (error.code().value() == EPIPE) {
+        return ExitCode::Done;
+    } else {
         report(outputFailure(error.code().value()));
     }
     return ExitCode::Failed;
@@ -182,7 +188,7 @@ ExitCode CommandLine::runAction()
     try {
         ExitCode const code = m_action(m_options);
         flushOutput();
-        return code;
+        return code == ExitCode::Done && lateFailure() ? ExitCode::Failed : code;
     } catch (Error const& failure) {
         report(failure);
         return exitCode(failure);

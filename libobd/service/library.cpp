@@ -31,6 +31,11 @@ bool LIBOBDOpen(std::string const& logPath)
     return true;
 }
 
+bool LIBOBDLogFailed()
+{
+    return processLogger().failed();
+}
+
 void LIBOBDClose()
 {
     catalogueFilled = false;

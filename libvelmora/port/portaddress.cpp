@@ -120,6 +120,17 @@ struct Printer
     std::string operator()(ReplayAddress const& address) const { return "replay:" + address.file; }
 };
 
+// The name of a serial device without its path, which no host has.
+bool namesSerialDevice(std::string_view text)
+{
+    for (std::string_view const start : {"tty", "rfcomm", "cu."}) {
+        if (text.starts_with(start) && text.find(':') == std::string_view::npos) {
+            return true;
+        }
+    }
+    return false;
+}
+
 } // namespace
 
 PortAddress parsePortAddress(std::string const& text, unsigned int baud)
@@ -140,6 +151,9 @@ PortAddress parsePortAddress(std::string const& text, unsigned int baud)
     if (!takePrefix(rest, "tcp://") && !takePrefix(rest, "tcp:") && !takePrefix(rest, "socket://") &&
         rest.find("://") != std::string_view::npos) {
         reject(text, "the kind before :// is unknown");
+    }
+    if (namesSerialDevice(text)) {
+        reject(text, "a serial device is named with its path, /dev/" + text);
     }
     return parseTcp(text, rest);
 }

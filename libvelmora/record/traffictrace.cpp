@@ -1,6 +1,6 @@
 #include "libvelmora/record/traffictrace.h"
 
-#include <velmora/error.h>
+#include "libvelmora/record/checkedfile.h"
 
 #include <fmt/chrono.h>
 #include <fmt/ostream.h>
@@ -34,12 +34,10 @@ std::string escaped(std::vector<unsigned char> const& data)
 
 } // namespace
 
-TrafficTrace::TrafficTrace(std::filesystem::path const& file) : m_out(file)
+TrafficTrace::TrafficTrace(std::filesystem::path const& file)
 {
-    if (!m_out) {
-        throw Error(ErrorKind::Failed, "Could not write the trace file " + file.string(),
-                    {"does its folder exist, and may you write there?"});
-    }
+    requireWritable(file, "trace file");
+    m_out.open(file);
 }
 
 void TrafficTrace::onDataSent(std::vector<unsigned char> const& data)
@@ -60,6 +58,7 @@ void TrafficTrace::write(std::string_view arrow, std::vector<unsigned char> cons
     m_out << fmt::format("{:%H:%M:%S}.{:03d} {} {}\n", fmt::localtime(std::chrono::system_clock::to_time_t(now)), ms,
                          arrow, escaped(data));
     m_out.flush();
+    m_failed = m_failed || !m_out;
 }
 
 } // namespace velmora

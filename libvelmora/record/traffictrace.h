@@ -2,6 +2,7 @@
 
 #include <obd/idataconnection.h>
 
+#include <atomic>
 #include <filesystem>
 #include <fstream>
 #include <mutex>
@@ -16,12 +17,16 @@ public:
     // Throws Error if the file can't be written.
     explicit TrafficTrace(std::filesystem::path const& file);
 
+    // Whether something could not be written, on a full disk. Any thread.
+    bool failed() const { return m_failed; }
+
     void onDataSent(std::vector<unsigned char> const& data) override;
     void onDataReceived(std::vector<unsigned char> const& data) override;
 
 private:
     void write(std::string_view arrow, std::vector<unsigned char> const& data);
 
+    std::atomic<bool> m_failed{false};
     std::mutex m_mutex;
     std::ofstream m_out; // protected by m_mutex
 };

@@ -4,6 +4,7 @@
 #include "libvelmora/port/portsearch.h"
 #include "libvelmora/port/recordedport.h"
 #include "libvelmora/record/traffictrace.h"
+#include "libvelmora/session/openingfailure.h"
 #include "libvelmora/session/settingsstore.h"
 #include "libvelmora/text/text.h"
 
@@ -25,6 +26,8 @@
 namespace velmora {
 
 namespace {
+
+constexpr std::chrono::milliseconds phaseStep{250};
 
 std::string portKey()
 {
@@ -161,6 +164,23 @@ void Session::connect()
     selectEcu();
 }
 
+std::shared_ptr<obd::IDataConnection> Session::connectToPort()
+{
+    PortAddress const address = findPort();
+    openLink(address);
+    tellProgress(fmt::format("Connecting to {} ...\n", toString(address)));
+    enter(Phase::Open);
+    if (m_trace != nullptr) {
+        m_link->connection()->addLogger(m_trace.get());
+    }
+    return m_link->connection();
+}
+
+std::string Session::failedTrace() const
+{
+    return m_trace != nullptr && m_trace->failed() ? m_options.traceFile : std::string();
+}
+
 void Session::openLink(PortAddress const& address)
 {
     std::unique_ptr<IPort> port = openPort(address);
@@ -218,6 +238,7 @@ void Session::tellHabits() const
 bool Session::openOnThread()
 {
     enter(Phase::Opening);
+    m_link->connection()->addLogger(&m_opening);
     std::atomic<bool> done{false};
     bool opened = false;
     std::thread opener([&] {
@@ -225,10 +246,27 @@ bool Session::openOnThread()
         done = true;
         m_loop.wake();
     });
-    m_loop.runUntil([&done] { return done.load(); });
+    auto const start = std::chrono::steady_clock::now();
+    while (!m_loop.runUntil([&done] { return done.load(); }, std::chrono::steady_clock::now() + phaseStep)) {
+        tellPhase(start);
+    }
     opener.join();
+    m_link->connection()->removeLogger(&m_opening);
+    if (m_options.onPhase) {
+        m_options.onPhase({});
+    }
     enter(Phase::Open);
     return opened;
+}
+
+void Session::tellPhase(std::chrono::steady_clock::time_point start) const
+{
+    std::string const phase = m_opening.phase();
+    if (m_options.onPhase && !phase.empty()) {
+        auto const elapsed = std::chrono::steady_clock::now() - start;
+        m_options.onPhase(
+            fmt::format("{} ... {} s", phase, std::chrono::duration_cast<std::chrono::seconds>(elapsed).count()));
+    }
 }
 
 void Session::enter(Phase phase)
@@ -266,9 +304,10 @@ void Session::failOpening(PortAddress const& address)
     }
     std::shared_ptr<obd::IAdapter> const found = adapter();
     if (found == nullptr) {
-        throw Error(ErrorKind::AdapterSilent, "Nothing on " + port + " answers like an ELM327 adapter",
-                    {"is it the right port?", "a serial adapter may use another line rate: try --baud 9600 or 115200",
-                     "pull the adapter and plug it in again, or try --reset"});
+        throw openingfailure::silentAdapter(address, m_opening);
+    }
+    if (m_opening.headersMissing()) {
+        throw openingfailure::headersMissing(readable(found->device()), address);
     }
     throw Error(ErrorKind::VehicleSilent,
                 "The adapter (" + readable(found->device()) + ") on " + port + " works, but no control module answers",

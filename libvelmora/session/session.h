@@ -5,6 +5,7 @@
 #include "libvelmora/session/dispatchloop.h"
 #include "libvelmora/session/libraryuse.h"
 #include "libvelmora/session/link.h"
+#include "libvelmora/session/openingwatch.h"
 #include "libvelmora/session/sessionoptions.h"
 
 #include <obd/iadapter.h>
@@ -14,6 +15,7 @@
 
 #include <atomic>
 #include <filesystem>
+#include <chrono>
 #include <memory>
 #include <mutex>
 #include <optional>
@@ -50,6 +52,8 @@ public:
 
     // Closes what is open, to connect again. Services must be gone.
     void disconnect() { close(); }
+    // Opens the port alone, for a dialogue with whatever is there. Throws Error.
+    std::shared_ptr<obd::IDataConnection> connectToPort();
 
     obd::IObdVelmora& obd() const { return *m_obd; }
     // The control modules that the options select: one, or all.
@@ -67,6 +71,9 @@ public:
     SessionOptions const& options() const { return m_options; }
     // Tells whoever wants to know what the session is at: lines with their line feeds.
     void tellProgress(std::string const& lines) const;
+
+    // The trace file's name if it could not be written to the end, else empty.
+    std::string failedTrace() const;
 
     // Throws Error if the link has broken or the session was interrupted meanwhile.
     void check() const;
@@ -89,6 +96,7 @@ private:
     void enter(Phase phase);
     obd::VehicleProtocol protocol() const;
     bool openOnThread();
+    void tellPhase(std::chrono::steady_clock::time_point start) const;
     [[noreturn]] void failOpening(PortAddress const& address);
     void tellConnected() const;
     void tellHabits() const;
@@ -109,6 +117,7 @@ private:
     Phase m_phase = Phase::Closed; // protected by m_phaseMutex
     DialogueRecorder* m_recorder = nullptr;
     std::unique_ptr<TrafficTrace> m_trace;
+    OpeningWatch m_opening;
 };
 
 } // namespace velmora

@@ -28,6 +28,8 @@ struct SessionOptions
     // calls the session.
     std::function<void(std::string const&)> onProgress;
     std::function<void(std::string const&)> onDetail; // what was found on the way
+    // Told what the opening is at, some times a second: a short text for a line that is drawn anew; empty at its end.
+    std::function<void(std::string const&)> onPhase;
 };
 
 } // namespace velmora

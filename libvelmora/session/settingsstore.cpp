@@ -1,5 +1,6 @@
 #include "libvelmora/session/settingsstore.h"
 
+#include "libvelmora/record/checkedfile.h"
 #include "libvelmora/session/vehiclesettings.h"
 
 #include <velmora/error.h>
@@ -18,6 +19,8 @@
 namespace velmora {
 
 namespace {
+
+constexpr std::uintmax_t largestFile = 1 << 20;
 
 [[noreturn]] void failRead(std::filesystem::path const& file, std::string const& why)
 {
@@ -108,8 +111,8 @@ SettingsStore::SettingsStore(std::filesystem::path file) : m_file(std::move(file
     if (!std::filesystem::exists(m_file, error)) {
         return;
     }
-    if (std::filesystem::is_directory(m_file, error)) {
-        failRead(m_file, "it is a folder");
+    if (std::string const why = whyUnreadable(m_file, largestFile); !why.empty()) {
+        failRead(m_file, why);
     }
     try {
         visitLeaves(toml::parse_file(m_file.string()), {}, [this](std::string const& key, toml::node const& node) {

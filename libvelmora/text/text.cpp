@@ -80,6 +80,20 @@ std::optional<unsigned int> parseHex(std::string const& text, unsigned int highe
     return number;
 }
 
+std::vector<std::string> adapterLines(std::string const& text)
+{
+    std::vector<std::string> lines(1);
+    for (char const each : text) {
+        if (each == '\r' || each == '\n') {
+            lines.emplace_back();
+        } else if (each != '\0') {
+            lines.back() += each;
+        }
+    }
+    std::erase_if(lines, [](std::string const& line) { return line.find_first_not_of(' ') == std::string::npos; });
+    return lines;
+}
+
 std::vector<std::string> splitWords(std::string const& text)
 {
     constexpr char const* separators = " _-";

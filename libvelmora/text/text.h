@@ -13,6 +13,9 @@ std::string toUpper(std::string text);
 // A hexadecimal number, with or without 0x. Nothing for any other text or a number above the highest.
 std::optional<unsigned int> parseHex(std::string const& text, unsigned int highest);
 
+// What an adapter sent, line by line: without line ends, empty lines and the zero bytes that some slip in.
+std::vector<std::string> adapterLines(std::string const& text);
+
 // The parts between blanks, '_' and '-'.
 std::vector<std::string> splitWords(std::string const& text);
 

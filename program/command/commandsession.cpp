@@ -2,10 +2,19 @@
 
 #include "program/terminal/interrupt.h"
 #include "program/terminal/output.h"
+#include "program/terminal/promptreader.h"
+
+#include <obd/library.h>
 
 namespace velmora::cli {
 
 namespace {
+
+// A line that is drawn over.
+void tellPhase(std::string const& phase)
+{
+    tell("\r\033[K" + phase);
+}
 
 SessionOptions sessionOptions(GlobalOptions const& options)
 {
@@ -23,6 +32,9 @@ SessionOptions sessionOptions(GlobalOptions const& options)
     result.settingsFile = options.settingsFile;
     if (!options.quiet) {
         result.onProgress = tell;
+        if (PromptReader::canRedraw()) {
+            result.onPhase = tellPhase;
+        }
     }
     if (options.verbose) {
         result.onDetail = tell;
@@ -40,6 +52,12 @@ CommandSession::CommandSession(GlobalOptions const& options) : Session(sessionOp
 CommandSession::~CommandSession()
 {
     Interrupt::instance().setHandler(nullptr);
+    if (std::string const file = failedTrace(); !file.empty()) {
+        tellLateFailure("Could not write all of the trace file " + file + "; is the disk full?");
+    }
+    if (!m_options.logFile.empty() && obd::LIBOBDLogFailed()) {
+        tellLateFailure("Could not write all of the log file " + m_options.logFile + "; is the disk full?");
+    }
 }
 
 } // namespace velmora::cli

@@ -1,3 +1,5 @@
+#include "libvelmora/report/json.h"
+#include "libvelmora/text/text.h"
 #include "program/command/commands.h"
 #include "program/command/commandsession.h"
 #include "program/commandline.h"
@@ -5,8 +7,12 @@
 #include "program/terminal/output.h"
 #include "program/terminal/promptreader.h"
 
+#include <obd/idataconnection.h>
+#include <velmora/error.h>
+
 #include <fmt/format.h>
 
+#include <chrono>
 #include <cstdio>
 #include <optional>
 #include <unistd.h>
@@ -15,20 +21,86 @@ namespace velmora::cli {
 
 namespace {
 
-constexpr unsigned int consoleLimitMs = 5000;
+using Clock = std::chrono::steady_clock;
 
-void answer(Session& session, std::string const& command)
+constexpr std::chrono::seconds adapterLimit{5};
+constexpr std::chrono::seconds vehicleLimit{30}; // a search for the bus takes that long
+constexpr int stepMs = 100;
+
+// What the adapter sent up to its prompt, line by line, without the echo of the command.
+struct Answer
 {
-    std::string reply;
-    obd::IDevice::Status const status = session.proxy()->execute(command, reply, consoleLimitMs);
-    session.check();
-    if (status == obd::IDevice::Status::Ok) {
-        fmt::print("{}\n", reply);
+    bool complete = false; // whether the prompt came
+    std::vector<std::string> lines;
+};
+
+// The bare dialogue with whatever is at the port, without the library's: what it says is shown as it came.
+class AdapterDialogue
+{
+public:
+    explicit AdapterDialogue(CommandSession& session) : m_session(session), m_connection(session.connectToPort())
+    {
+        m_connection->setDelimiter('>');
+    }
+
+    // Throws Error if the link breaks or the user interrupts meanwhile.
+    Answer ask(std::string const& command)
+    {
+        std::vector<unsigned char> message;
+        while (m_connection->receive(message, 0)) {
+            // what came unasked belongs to nothing
+        }
+        std::string const sent = command + "\r";
+        m_connection->send({sent.begin(), sent.end()});
+        bool const ofAdapter = toUpper(command).starts_with("AT") || toUpper(command).starts_with("ST");
+        if (await(message, ofAdapter ? adapterLimit : vehicleLimit)) {
+            return {true, linesOf(message, command)};
+        }
+        // An adapter that shows traffic without end stops at any character.
+        m_connection->send({'\r'});
+        return await(message, adapterLimit) ? Answer{true, linesOf(message, command)} : Answer{};
+    }
+
+private:
+    bool await(std::vector<unsigned char>& message, Clock::duration limit) const
+    {
+        Clock::time_point const end = Clock::now() + limit;
+        while (Clock::now() < end) {
+            m_session.check();
+            if (m_connection->receive(message, stepMs)) {
+                return true;
+            }
+        }
+        return false;
+    }
+
+    static std::vector<std::string> linesOf(std::vector<unsigned char> const& message, std::string const& command)
+    {
+        std::vector<std::string> lines = adapterLines({message.begin(), message.end()});
+        if (!lines.empty() && lines.front() == command) {
+            lines.erase(lines.begin());
+        }
+        return lines;
+    }
+
+    CommandSession& m_session;
+    std::shared_ptr<obd::IDataConnection> m_connection;
+};
+
+void print(std::string const& command, Answer const& answer, bool json)
+{
+    if (json) {
+        Json const line = {{"command", command}, {"answered", answer.complete}, {"lines", answer.lines}};
+        fmt::print("{}\n", line.dump(-1, ' ', false, Json::error_handler_t::replace));
     } else {
-        // The driver takes the adapter's error words and "?" off every reply.
-        fmt::print("(no data)\n");
+        for (std::string const& line : answer.lines) {
+            fmt::print("{}\n", readable(line));
+        }
     }
     flushOutput();
+    if (!answer.complete) {
+        tell("(no answer)\n");
+    }
 }
 
 // Asks for each command if a user is there to be asked.
@@ -52,7 +124,11 @@ public:
         if (m_asking) {
             tell("> ");
         }
-        return m_lines.read(command);
+        bool const more = m_lines.read(command);
+        if (command.ends_with('\r')) {
+            command.pop_back(); // of a file with the line ends of another system
+        }
+        return more;
     }
 
 private:
@@ -64,13 +140,22 @@ private:
 ExitCode console(GlobalOptions const& options)
 {
     CommandSession session(options);
-    session.connect();
+    AdapterDialogue dialogue(session);
     CommandSource commands(session);
     std::string command;
+    bool asked = false;
+    bool answered = false;
     while (commands.read(command) && command != "exit" && command != "quit") {
         if (!command.empty()) {
-            answer(session, command);
+            Answer const answer = dialogue.ask(command);
+            print(command, answer, options.json);
+            asked = true;
+            answered = answered || answer.complete;
         }
+    }
+    if (asked && !answered) {
+        throw Error(ErrorKind::AdapterSilent, "Nothing on " + session.port() + " answered any command",
+                    {"is it the right port, and the right --baud?", "pull the adapter and plug it in again"});
     }
     return ExitCode::Done;
 }

@@ -6,6 +6,7 @@
 #include "program/command/commands.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
+#include "program/view/printtext.h"
 #include "program/view/reporttext.h"
 
 #include <obd/troublecodecatalogue.h>
@@ -61,7 +62,7 @@ ExitCode explain(DtcOptions const& options, std::string const& maker, bool json)
         fmt::print("{}", printed(toJsonValue(found)));
     } else {
         for (TroubleCode const& code : found) {
-            fmt::print("{}", toText(code, {}, true));
+            printText(toText(code, {}, true));
         }
     }
     if (!wrong.empty()) {
@@ -97,7 +98,7 @@ ExitCode listRows(DtcOptions const& options, std::string const& maker, bool json
         }
     } else {
         for (auto const& row : rows) {
-            fmt::print("{}", toText({row->code, row->system, {{row->manufacturer, row->description}}, {}}, {}, true));
+            printText(toText({row->code, row->system, {{row->manufacturer, row->description}}, {}}, {}, true));
         }
     }
     if (rows.empty()) {

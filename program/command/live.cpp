@@ -3,10 +3,29 @@
 #include "program/command/commandsession.h"
 #include "program/command/liverun.h"
 #include "program/commandline.h"
+#include "program/terminal/output.h"
+
+#include <velmora/error.h>
+
+#include <fmt/format.h>
 
 namespace velmora::cli {
 
 namespace {
+
+// Who waited for a time and saw nothing is told so; who ended it by hand saw it all.
+void judgeSilence(LiveRun const& run, LiveOptions const& options, bool quiet)
+{
+    std::vector<std::string> const silent = run.silentSensors();
+    if (options.duration > 0.0 && !run.anyValue()) {
+        flushOutput();
+        throw Error(ErrorKind::VehicleSilent, "The vehicle gave none of the chosen values",
+                    {"is the ignition on?", "`velmora sensors` lists what the vehicle offers"});
+    }
+    if (!silent.empty() && run.anyValue() && !quiet) {
+        tell(fmt::format("No value came of: {}\n", fmt::join(silent, ", ")));
+    }
+}
 
 ExitCode live(GlobalOptions const& global, LiveOptions const& given)
 {
@@ -20,6 +39,7 @@ ExitCode live(GlobalOptions const& global, LiveOptions const& given)
     session.connect();
     LiveRun run(session, options, csv.get());
     run.run();
+    judgeSilence(run, options, global.quiet);
     return ExitCode::Done;
 }
 

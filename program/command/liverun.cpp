@@ -119,6 +119,17 @@ void LiveRun::finish()
     }
 }
 
+std::vector<std::string> LiveRun::silentSensors() const
+{
+    std::vector<std::string> names;
+    for (LiveRow const& row : m_table.rows()) {
+        if (row.updated == LiveTime()) {
+            names.push_back(row.name);
+        }
+    }
+    return names;
+}
+
 double LiveRun::rate() const
 {
     double const elapsed = std::chrono::duration<double>(Clock::now() - m_start).count();

@@ -42,6 +42,10 @@ public:
     // Until the count, the duration or the user ends it. Throws Error on a lost link and on Ctrl-C.
     void run();
 
+    // The sensors that no value has come of, by their names.
+    std::vector<std::string> silentSensors() const;
+    bool anyValue() const { return m_table.readings() > 0; }
+
 private:
     void start(std::vector<PollChoice> const& choices);
     void select();

@@ -5,6 +5,7 @@
 #include "program/command/commandsession.h"
 #include "program/exitcode.h"
 #include "program/terminal/output.h"
+#include "program/view/printtext.h"
 #include "program/view/reporttext.h"
 
 #include <obd/iecu.h>
@@ -35,7 +36,11 @@ auto readModules(Session& session, Read const& read)
 template <typename Report>
 void print(std::vector<ModuleTopic<Report>> const& modules, GlobalOptions const& options)
 {
-    fmt::print("{}", options.json ? toJson(modules) : toText(modules, outputStyle(options)));
+    if (options.json) {
+        fmt::print("{}", toJson(modules));
+    } else {
+        printText(toText(modules, outputStyle(options)));
+    }
     flushOutput();
 }
 

@@ -6,6 +6,7 @@
 #include "program/command/commandsession.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
+#include "program/view/printtext.h"
 #include "program/view/reporttext.h"
 
 #include <obd/isensorservice.h>
@@ -83,7 +84,11 @@ ExitCode record(RecordOptions const& chosen, GlobalOptions const& options)
         throw;
     }
     save(recorder, session, chosen, file);
-    fmt::print("{}", options.json ? toJson(report) : toText(report, outputStyle(options)));
+    if (options.json) {
+        fmt::print("{}", toJson(report));
+    } else {
+        printText(toText(report, outputStyle(options)));
+    }
     return ExitCode::Done;
 }
 

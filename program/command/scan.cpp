@@ -5,6 +5,7 @@
 #include "program/command/makeoption.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
+#include "program/view/printtext.h"
 #include "program/view/reporttext.h"
 
 #include <velmora/error.h>
@@ -73,7 +74,11 @@ ExitCode scan(ScanOptions const& chosen, GlobalOptions const& options)
     for (std::string const& path : chosen.reports) {
         writeReport(path, report, facts, toText(report, Style(false)), chosen.force);
     }
-    fmt::print("{}", options.json ? toJson(report) : toText(report, outputStyle(options)));
+    if (options.json) {
+        fmt::print("{}", toJson(report));
+    } else {
+        printText(toText(report, outputStyle(options)));
+    }
     return chosen.checking ? check(report) : ExitCode::Done;
 }
 

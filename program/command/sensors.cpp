@@ -1,15 +1,20 @@
 #include "libvelmora/read/oxygencurrent.h"
+#include "libvelmora/read/offeredpids.h"
 #include "libvelmora/report/json.h"
 #include "libvelmora/report/unitlabel.h"
 #include "libvelmora/text/text.h"
+#include "libvelmora/vehicle/pidtitles.h"
 #include "program/command/commands.h"
 #include "program/command/commandsession.h"
 #include "program/commandline.h"
+#include "program/view/printtext.h"
 
 #include <obd/iecu.h>
 #include <obd/iecuservice.h>
 
 #include <fmt/format.h>
+
+#include <algorithm>
 
 namespace velmora::cli {
 
@@ -75,33 +80,47 @@ std::string range(obd::SensorDataModel const& sensor)
                                      : "text";
 }
 
-void printOffer(Offer const& offer, bool all)
+std::string offerText(Offer const& offer, bool all)
 {
+    std::string text;
     std::string lead = fmt::format("{:02X}", static_cast<int>(offer.parameter->id));
     for (auto const& sensor : offer.parameter->sensors) {
         std::string const line = fmt::format("  {:<2}  {:<58}  {:<8}  {}", lead, sensor->name,
                                              unitLabel(sensor->uid, sensor->unit), range(*sensor));
-        if (all) {
-            fmt::print("{:<92}{}\n", line, offer.offered ? "offered" : "-");
-        } else {
-            fmt::print("{}\n", line);
-        }
+        text += all ? fmt::format("{:<92}{}\n", line, offer.offered ? "offered" : "-") : line + "\n";
         lead.clear();
     }
+    return text;
 }
 
-void printText(obd::IEcu const& ecu, bool all)
+// What the module offers and the library does not decode.
+std::vector<unsigned char> undecoded(obd::IEcu const& ecu, OfferedPids const& offered)
 {
-    fmt::print("Control module {:X}: {} ({})\n", ecu.id(), readable(ecu.name()), readable(ecu.description()));
+    std::vector<Offer> const known = offers(true);
+    std::vector<unsigned char> pids = offered.of(ecu.id());
+    std::erase_if(pids, [&known](unsigned char pid) {
+        return std::any_of(known.begin(), known.end(),
+                           [pid](Offer const& offer) { return static_cast<int>(offer.parameter->id) == pid; });
+    });
+    return pids;
+}
+
+std::string toText(obd::IEcu const& ecu, OfferedPids const& offered, bool all)
+{
+    std::string text =
+        fmt::format("Control module {:X}: {} ({})\n", ecu.id(), readable(ecu.name()), readable(ecu.description()));
     for (Service const& service : services) {
         std::vector<std::string> const ids = identifiers(ecu, service.mode);
-        fmt::print("  {:<24} {}\n", service.title, ids.empty() ? "-" : fmt::format("{}", fmt::join(ids, " ")));
+        text += fmt::format("  {:<24} {}\n", service.title, ids.empty() ? "-" : fmt::format("{}", fmt::join(ids, " ")));
     }
-    fmt::print("\n");
+    text += "\n";
     for (Offer const& offer : offers(all)) {
-        printOffer(offer, all);
+        text += offerText(offer, all);
     }
-    fmt::print("\n");
+    for (unsigned char const pid : undecoded(ecu, offered)) {
+        text += fmt::format("  {:02X}  {} (not decoded)\n", pid, pidTitle(pid));
+    }
+    return text + "\n";
 }
 
 Json sensorJson(obd::SensorDataModel const& sensor)
@@ -114,7 +133,7 @@ Json sensorJson(obd::SensorDataModel const& sensor)
     return json;
 }
 
-Json toJson(obd::IEcu const& ecu, bool all)
+Json toJson(obd::IEcu const& ecu, OfferedPids const& offered, bool all)
 {
     Json supported;
     for (Service const& service : services) {
@@ -131,24 +150,31 @@ Json toJson(obd::IEcu const& ecu, bool all)
                               {"offered", offer.offered},
                               {"sensors", sensorList}});
     }
+    Json rest = Json::array();
+    for (unsigned char const pid : undecoded(ecu, offered)) {
+        rest.push_back({{"id", fmt::format("{:02X}", pid)}, {"name", pidTitle(pid)}});
+    }
     return {{"id", fmt::format("{:X}", ecu.id())},
             {"name", textOrNull(ecu.name())},
             {"description", textOrNull(ecu.description())},
             {"supported", supported},
-            {"parameters", parameters}};
+            {"parameters", parameters},
+            {"undecoded", rest}};
 }
 
 ExitCode sensors(GlobalOptions const& options, bool all)
 {
     CommandSession session(options);
     session.connect();
+    OfferedPids const offered(*session.proxy());
+    session.check();
     Json modules = Json::array();
     for (std::shared_ptr<obd::IEcu> const& ecu : session.selectedModules()) {
         session.select(*ecu);
         if (options.json) {
-            modules.push_back(toJson(*ecu, all));
+            modules.push_back(toJson(*ecu, offered, all));
         } else {
-            printText(*ecu, all);
+            printText(toText(*ecu, offered, all));
         }
     }
     if (options.json) {

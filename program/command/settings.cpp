@@ -5,6 +5,7 @@
 #include "program/commandline.h"
 #include "program/terminal/output.h"
 #include "program/view/layout.h"
+#include "program/view/printtext.h"
 
 #include <velmora/error.h>
 
@@ -56,8 +57,8 @@ void list(SettingsStore& store, GlobalOptions const& options)
     for (VehicleSetting const& setting : vehicleSettings()) {
         rows.push_back({{setting.name}, {withUnit(setting, shownSetting(setting, store))}, {shownRange(setting)}});
     }
-    fmt::print("{}\n{}\n", store.file().string(), drawColumns(rows, "  ", outputStyle(options)));
-    fmt::print("  velmora settings NAME explains one, velmora settings NAME VALUE sets it\n");
+    printText(fmt::format("{}\n{}\n  velmora settings NAME explains one, velmora settings NAME VALUE sets it\n",
+                          store.file().string(), drawColumns(rows, "  ", outputStyle(options))));
 }
 
 void explain(VehicleSetting const& setting, SettingsStore& store, GlobalOptions const& options)
@@ -66,10 +67,10 @@ void explain(VehicleSetting const& setting, SettingsStore& store, GlobalOptions 
         fmt::print("{}", printed(toJson(setting, store)));
         return;
     }
-    fmt::print("{}\n{}{}{}{}", setting.title, wrapped(setting.explanation, 76, "  "),
-               labelledLine("Value", withUnit(setting, shownSetting(setting, store))),
-               labelledLine("Range", withUnit(setting, shownRange(setting))),
-               labelledLine("Default", withUnit(setting, shownDefault(setting))));
+    printText(fmt::format("{}\n{}{}{}{}", setting.title, wrapped(setting.explanation, 76, "  "),
+                          labelledLine("Value", withUnit(setting, shownSetting(setting, store))),
+                          labelledLine("Range", withUnit(setting, shownRange(setting))),
+                          labelledLine("Default", withUnit(setting, shownDefault(setting)))));
 }
 
 ExitCode settings(SettingsOptions const& chosen, GlobalOptions const& options)

@@ -2,6 +2,7 @@
 #include "program/command/commands.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
+#include "program/view/printtext.h"
 #include "program/view/vintext.h"
 
 #include <fmt/format.h>
@@ -21,7 +22,11 @@ int thisYear()
 ExitCode explainVin(std::string const& text, GlobalOptions const& options)
 {
     VinFacts const facts = decodeVin(parseVin(text), thisYear());
-    fmt::print("{}", options.json ? printed(toJsonValue(facts)) : toText(facts, outputStyle(options)));
+    if (options.json) {
+        fmt::print("{}", printed(toJsonValue(facts)));
+    } else {
+        printText(toText(facts, outputStyle(options)));
+    }
     return ExitCode::Done;
 }
 

@@ -7,6 +7,12 @@
 
 namespace velmora::cli {
 
+namespace {
+
+bool failedLate = false; // the main thread's
+
+} // namespace
+
 bool writeOutput(std::string const& text)
 {
     bool const written = std::fwrite(text.data(), 1, text.size(), stdout) == text.size() && std::fflush(stdout) == 0;
@@ -26,6 +32,17 @@ void flushOutput()
 void tell(std::string const& text)
 {
     std::fputs(text.c_str(), stderr);
+}
+
+void tellLateFailure(std::string const& text)
+{
+    tell("velmora: " + text + "\n");
+    failedLate = true;
+}
+
+bool lateFailure()
+{
+    return failedLate;
 }
 
 Error outputFailure(int error)

@@ -17,6 +17,10 @@ void flushOutput();
 // Writes to standard error. Where that can't be written to there is nobody to be told.
 void tell(std::string const& text);
 
+// Tells of a file that could not be written any more while the program went on, and makes it end with exit code 1.
+void tellLateFailure(std::string const& text);
+bool lateFailure();
+
 // What to tell of an error number of standard output.
 Error outputFailure(int error);
 

@@ -14,11 +14,15 @@
 
 namespace velmora::cli {
 
-bool PromptReader::isUsable()
+bool PromptReader::canRedraw()
 {
     char const* const kind = std::getenv("TERM");
-    return ::isatty(STDIN_FILENO) != 0 && ::isatty(STDERR_FILENO) != 0 && kind != nullptr && *kind != '\0' &&
-           std::strcmp(kind, "dumb") != 0;
+    return ::isatty(STDERR_FILENO) != 0 && kind != nullptr && *kind != '\0' && std::strcmp(kind, "dumb") != 0;
+}
+
+bool PromptReader::isUsable()
+{
+    return ::isatty(STDIN_FILENO) != 0 && canRedraw();
 }
 
 PromptReader::PromptReader(Session const& session) : m_session(session)

@@ -19,6 +19,9 @@ public:
     // Whether both ends are a terminal that the cursor can be moved on.
     static bool isUsable();
 
+    // Whether standard error is such a terminal.
+    static bool canRedraw();
+
     explicit PromptReader(Session const& session);
     ~PromptReader();
     PromptReader(PromptReader const&) = delete;

@@ -35,6 +35,12 @@ bool Terminal::isUsable()
     return ::isatty(STDOUT_FILENO) != 0 && kind != nullptr && *kind != '\0' && std::strcmp(kind, "dumb") != 0;
 }
 
+std::size_t Terminal::columnsOf(int descriptor)
+{
+    winsize window{};
+    return ::isatty(descriptor) != 0 && ::ioctl(descriptor, TIOCGWINSZ, &window) == 0 ? window.ws_col : 0;
+}
+
 Terminal::Terminal()
 {
     Interrupt::instance().setLastAct([this] { leave(); });

@@ -23,6 +23,9 @@ public:
     // Whether standard output is a terminal that can be drawn on.
     static bool isUsable();
 
+    // How many columns a line has on that end of the program; 0 if it is no terminal.
+    static std::size_t columnsOf(int descriptor);
+
     Terminal();
     ~Terminal();
     Terminal(Terminal const&) = delete;

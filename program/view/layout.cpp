@@ -6,6 +6,7 @@
 
 #include <algorithm>
 #include <sstream>
+#include <string_view>
 
 namespace velmora::cli {
 
@@ -34,6 +35,69 @@ std::size_t lengthOf(std::vector<Cell> const& row)
         --length;
     }
     return length;
+}
+
+constexpr std::size_t narrowest = 20; // columns that text can be folded to
+
+// The length of a sequence that switches colours, at its start; 0 for anything else.
+std::size_t sequenceLength(std::string_view text)
+{
+    std::size_t const end = text.starts_with("\033[") ? text.find('m') : std::string_view::npos;
+    return end != std::string_view::npos ? end + 1 : 0;
+}
+
+// How many bytes of the text fill that many columns.
+std::size_t bytesOfColumns(std::string_view text, std::size_t columns)
+{
+    std::size_t at = 0;
+    while (at < text.size()) {
+        std::size_t const sequence = sequenceLength(text.substr(at));
+        bool const continues = (static_cast<unsigned char>(text[at]) & 0xC0) == 0x80;
+        if (sequence == 0 && !continues && columns-- == 0) {
+            return at;
+        }
+        at += std::max<std::size_t>(sequence, 1);
+    }
+    return at;
+}
+
+// Where the lines that follow begin: below the last column, else two behind the line's own indent.
+std::size_t hangOf(std::string_view line, std::size_t columns)
+{
+    std::size_t const indent = std::min(line.find_first_not_of(' '), line.size());
+    std::size_t const gap = line.rfind("  ");
+    if (gap != std::string_view::npos && gap >= indent) {
+        std::size_t const column = displayWidth(std::string(line.substr(0, gap + 2)));
+        if (column <= columns / 2 && line.substr(0, gap).find('\033') == std::string_view::npos) {
+            return column;
+        }
+    }
+    bool const listed = line.substr(indent).starts_with("- ");
+    return std::min(indent + (indent == 0 || listed ? 2 : 4), columns / 2);
+}
+
+std::string foldedLine(std::string_view line, std::size_t columns)
+{
+    std::string const hang(hangOf(line, columns), ' ');
+    std::string text;
+    std::size_t room = columns;
+    std::size_t fits = bytesOfColumns(line, room);
+    while (fits < line.size()) {
+        std::size_t const first = std::min(line.find_first_not_of(' '), line.size());
+        std::size_t blank = line.rfind(' ', fits);
+        if (blank == std::string_view::npos || blank <= first) {
+            blank = line.find(' ', fits); // a word that is longer stands whole
+        }
+        if (blank == std::string_view::npos) {
+            break;
+        }
+        std::size_t const end = line.find_last_not_of(' ', blank);
+        text += std::string(line.substr(0, end + 1)) + "\n" + hang;
+        line.remove_prefix(std::min(line.find_first_not_of(' ', blank), line.size()));
+        room = columns - hang.size();
+        fits = bytesOfColumns(line, room);
+    }
+    return text + std::string(line);
 }
 
 } // namespace
@@ -78,6 +142,22 @@ std::string wrapped(std::string const& text, std::size_t width, std::string cons
         line += (line.empty() ? "" : " ") + word;
     }
     return line.empty() ? lines : lines + indent + line + "\n";
+}
+
+std::string folded(std::string const& text, std::size_t columns)
+{
+    if (columns < narrowest) {
+        return text;
+    }
+    std::string result;
+    std::size_t begin = 0;
+    while (begin < text.size()) {
+        std::size_t const end = std::min(text.find('\n', begin), text.size());
+        result += foldedLine(std::string_view(text).substr(begin, end - begin), columns);
+        result += end < text.size() ? "\n" : "";
+        begin = end + 1;
+    }
+    return result;
 }
 
 std::string counted(std::size_t count, std::string const& noun)

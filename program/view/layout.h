@@ -23,6 +23,10 @@ std::string drawColumns(std::vector<std::vector<Cell>> const& rows, std::string 
 // The text in lines of at most that many characters, where words allow it, each behind the indent.
 std::string wrapped(std::string const& text, std::size_t width, std::string const& indent);
 
+// The text with each line that is wider folded between words; what follows hangs below the line's last column, if that
+// leaves room. 0 columns fold nothing. Sequences that switch colours have no width.
+std::string folded(std::string const& text, std::size_t columns);
+
 // "1 code", "2 codes", "0 codes".
 std::string counted(std::size_t count, std::string const& noun);
 

@@ -163,19 +163,28 @@ TEST(Program, ScansASimulatedCarOverAPseudoTerminal)
     EXPECT_TRUE(outcome.err.empty()) << outcome.err;
 }
 
-TEST(Program, ConsoleReadsCommandsFromAPipe)
+TEST(Program, ConsoleShowsTheLinesAsTheyCame)
 {
-    Outcome const outcome = runVelmora({"-q", "-p", "sim:petrol-can11", "console"}, "ATI\nATRV\nNONSENSE\nexit\nATI\n");
+    std::string const commands = "ATI\r\n\r\nNONSENSE\r\nATDP\r\nexit\r\nATI\r\n"; // line ends of another system
+    Outcome const outcome = runVelmora({"-q", "-p", "sim:petrol-can11?instant", "console"}, commands);
     ASSERT_EQ(outcome.exitCode, 0) << outcome.err;
-    EXPECT_TRUE(outcome.out.starts_with("ELM327 v1.5\n")) << outcome.out;
-    EXPECT_TRUE(outcome.out.ends_with("V\n(no data)\n")) << outcome.out;
+    EXPECT_EQ(outcome.out, "ELM327 v1.5\n?\nAUTO\n") << "nothing was asked of the vehicle before";
+    Outcome const json =
+        runVelmora({"-q", "--json", "-p", "sim:petrol-can11?instant", "console"}, "AT Z\nNOPE"); // no end
+    EXPECT_EQ(json.exitCode, 0) << json.err;
+    EXPECT_EQ(json.out, "{\"command\":\"AT Z\",\"answered\":true,\"lines\":[\"ELM327 v1.5\"]}\n"
+                        "{\"command\":\"NOPE\",\"answered\":true,\"lines\":[\"?\"]}\n");
 }
 
-TEST(Program, ConsoleEndsWithItsInput)
+TEST(Program, FullDiskUnderTraceAndLogIsToldOnce)
 {
-    Outcome const outcome = runVelmora({"-q", "-p", "sim:petrol-can11?instant", "console"}, "\nATI"); // no line end
-    EXPECT_EQ(outcome.exitCode, 0) << outcome.err;
-    EXPECT_EQ(outcome.out, "ELM327 v1.5\n");
+    for (char const* option : {"--trace", "--log"}) {
+        Outcome const outcome = runVelmora({"-q", "-p", "sim:petrol-can11?instant", option, "/dev/full", "info"});
+        EXPECT_EQ(outcome.exitCode, 1) << option;
+        EXPECT_TRUE(holds(outcome.out, "VIN")) << "the command does its work all the same";
+        EXPECT_EQ(std::count(outcome.err.begin(), outcome.err.end(), '\n'), 1) << outcome.err;
+        EXPECT_TRUE(holds(outcome.err, "/dev/full")) << outcome.err;
+    }
 }
 
 TEST(Program, InterruptEndsWithinASecond)

@@ -12,6 +12,9 @@ namespace obd {
 /// ended.
 OBD_EXPORT bool LIBOBDOpen(std::string const& logPath);
 
+/// Whether a line of the log could not be written since LIBOBDOpen, such as on a full disk. Any thread.
+OBD_EXPORT bool LIBOBDLogFailed();
+
 /// Releases the trouble code texts and ends the log. Call it last, after every object of the library is gone.
 OBD_EXPORT void LIBOBDClose();
 

@@ -58,3 +58,4 @@
 #include <obd/unitsystem.h>
 #include <obd/vehiclemodelyear.h>
 #include <obd/vehicleprotocol.h>
+#include <obd/version.h>

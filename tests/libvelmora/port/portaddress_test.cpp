@@ -69,4 +69,17 @@ TEST(PortAddress, PrintsItselfForMessages)
     EXPECT_EQ(toString(parsePortAddress("sim:x?instant")), "sim:x?instant");
 }
 
+TEST(PortAddress, DeviceWithoutItsPathIsNoHost)
+{
+    for (char const* name : {"ttyUSB0", "rfcomm0", "cu.usbserial"}) {
+        try {
+            parsePortAddress(name, 38400);
+            ADD_FAILURE() << name;
+        } catch (Error const& error) {
+            EXPECT_NE(std::string(error.what()).find(std::string("/dev/") + name), std::string::npos) << error.what();
+        }
+    }
+    EXPECT_EQ(toString(parsePortAddress("tty.example:35000", 38400)), "tty.example:35000") << "a port tells a host";
+}
+
 } // namespace

@@ -1,3 +1,4 @@
+#include "libvelmora/record/checkedfile.h"
 #include "libvelmora/record/traffictrace.h"
 
 #include <velmora/error.h>
@@ -5,12 +6,18 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <filesystem>
+#include <fstream>
+#include <sys/stat.h>
 #include <unistd.h>
 
 namespace {
 
 using testing::MatchesRegex;
+using velmora::Error;
+using velmora::requireWritable;
 using velmora::TrafficTrace;
+using velmora::whyUnreadable;
 
 std::vector<unsigned char> bytesOf(std::string const& text)
 {
@@ -38,6 +45,34 @@ TEST(TrafficTrace, HasALineEachWayWithItsTime)
 TEST(TrafficTrace, AFileThatCannotBeWrittenIsTold)
 {
     EXPECT_THROW(TrafficTrace("/nowhere/at/all"), velmora::Error);
+}
+
+TEST(CheckedFile, IsNotWaitedForAndNotReadWithoutEnd)
+{
+    std::filesystem::path const folder = std::filesystem::path(testing::TempDir());
+    std::filesystem::path const pipe = folder / ("velmora-pipe-" + std::to_string(::getpid()));
+    ASSERT_EQ(::mkfifo(pipe.c_str(), 0600), 0);
+    EXPECT_THROW(requireWritable(pipe, "log file"), Error) << "nobody reads it";
+    EXPECT_EQ(whyUnreadable(pipe, 100), "it is no plain file");
+    std::filesystem::remove(pipe);
+    EXPECT_EQ(whyUnreadable("/dev/zero", 100), "it is no plain file");
+    EXPECT_EQ(whyUnreadable(folder, 100), "it is no plain file");
+    EXPECT_EQ(whyUnreadable(pipe, 100), "there is no such file");
+    std::ofstream(pipe) << "12345";
+    EXPECT_EQ(whyUnreadable(pipe, 5), "");
+    EXPECT_EQ(whyUnreadable(pipe, 4), "it has 5 bytes; at most 4 are read");
+    requireWritable(pipe, "log file");
+    EXPECT_EQ(std::filesystem::file_size(pipe), 5U) << "looking at it changes nothing";
+    std::filesystem::remove(pipe);
+    EXPECT_THROW(requireWritable(folder / "no" / "such", "log file"), Error);
+}
+
+TEST(TrafficTrace, NotesThatTheDiskIsFull)
+{
+    TrafficTrace full("/dev/full");
+    EXPECT_FALSE(full.failed());
+    full.onDataSent({'A', 'T', 'I', '\r'});
+    EXPECT_TRUE(full.failed());
 }
 
 } // namespace

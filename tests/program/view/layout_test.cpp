@@ -52,4 +52,24 @@ TEST(Layout, CountsOneAndMany)
     EXPECT_EQ(counted(2, "code"), "2 codes");
 }
 
+TEST(Layout, FoldsLinesBetweenWordsBelowTheLastColumn)
+{
+    EXPECT_EQ(folded("  Adapter   one two three four five\nshort\n", 24), "  Adapter   one two\n"
+                                                                          "            three four\n"
+                                                                          "            five\n"
+                                                                          "short\n");
+    EXPECT_EQ(folded("velmora: one two three four\n  - five six seven eight", 20), "velmora: one two\n"
+                                                                                   "  three four\n"
+                                                                                   "  - five six seven\n"
+                                                                                   "    eight");
+    EXPECT_EQ(folded("  a very late column is of  no use to hang below", 30), "  a very late column is of  no\n"
+                                                                              "      use to hang below");
+    EXPECT_EQ(folded("exactly twenty wide.\n", 20), "exactly twenty wide.\n");
+    EXPECT_EQ(folded("anExtremelyLongWordStandsWhole and more", 20), "anExtremelyLongWordStandsWhole\n  and more");
+    EXPECT_EQ(folded("twenty-one are äöüß €€ ok", 22), "twenty-one are äöüß €€\n  ok") << "characters, not bytes";
+    EXPECT_EQ(folded("\033[31mred words here\033[0m ok no", 17), "\033[31mred words here\033[0m ok no");
+    EXPECT_EQ(folded("\033[31mred words are here\033[0m ok no", 22), "\033[31mred words are here\033[0m ok\n  no");
+    EXPECT_EQ(folded("as it stands, however long that may be", 0), "as it stands, however long that may be");
+}
+
 } // namespace

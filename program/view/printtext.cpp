@@ -1,0 +1,17 @@
+#include "program/view/printtext.h"
+
+#include "program/terminal/terminal.h"
+#include "program/view/layout.h"
+
+#include <fmt/format.h>
+
+#include <unistd.h>
+
+namespace velmora::cli {
+
+void printText(std::string const& text)
+{
+    fmt::print("{}", folded(text, Terminal::columnsOf(STDOUT_FILENO)));
+}
+
+} // namespace velmora::cli
