@@ -1,6 +1,6 @@
 #pragma once
 
-#include <obd/iconnectionlogger.h>
+#include <obd/idataconnection.h>
 
 #include <mutex>
 #include <string>

@@ -4,7 +4,7 @@
 #include "libvelmora/session/session.h"
 #include "libvelmora/watch/iwatchedcar.h"
 
-#include <obd/iconnectionlogger.h>
+#include <obd/idataconnection.h>
 
 #include <atomic>
 #include <mutex>
