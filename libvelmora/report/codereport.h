@@ -10,37 +10,6 @@
 
 namespace velmora {
 
-enum class CodeKind : int
-{
-    Confirmed, // stored, and as a rule the reason for the lamp
-    Pending,   // seen in this or the last driving cycle
-    Permanent, // not to be cleared by a tool
-};
-
-// What a control module tells of its codes of one kind.
-struct CodeList
-{
-    enum class Answer : int
-    {
-        Read,
-        Refused,
-        Silent,
-        Unreadable,
-    };
-
-    CodeKind kind;
-    Answer answer;
-    std::string reason; // of a refusal
-    std::vector<TroubleCode> codes;
-};
-
-struct CodeReport
-{
-    std::optional<bool> lamp; // whether the malfunction indicator is on
-    std::vector<CodeList> lists;
-    MakerChoice maker = {}; // whose meanings the codes are given
-};
-
 // Whether any of the codes means something else with each maker.
 bool hasMakersCodes(CodeReport const& report);
 

@@ -2,30 +2,12 @@
 
 #include "libvelmora/report/json.h"
 
+#include <velmora/topics.h>
+
 #include <string>
 #include <vector>
 
 namespace velmora {
-
-// A test that a control module made on itself, with its result as text. Empty limits are none.
-struct LimitTest
-{
-    enum class Verdict
-    {
-        Failed,
-        Passed,
-        NoResult, // not run since the codes were cleared
-        None,     // a constant, with no limits to judge by
-    };
-
-    int id;
-    std::string description;
-    std::string value;
-    std::string minimum;
-    std::string maximum;
-    std::string unit;
-    Verdict verdict;
-};
 
 // "failed", "passed" or "no result"; empty for a constant.
 char const* verdictWord(LimitTest::Verdict verdict);

@@ -2,6 +2,8 @@
 
 #include "libvelmora/report/json.h"
 
+#include <velmora/topics.h>
+
 #include <fmt/format.h>
 
 #include <algorithm>
@@ -11,27 +13,8 @@
 
 namespace velmora {
 
-// Whether a control module told of a topic.
-enum class TopicAnswer
-{
-    Read,
-    NotOffered, // by what the module says it supports, so that it was not asked
-    Silent,
-    Unreadable, // it answered in a form that can't be decoded
-};
-
 // "read", "not supported", "no answer" or "unreadable".
 char const* answerWord(TopicAnswer answer);
-
-// What one control module told of one topic. For each Report there are toJsonValue(Report), an object, and
-// hasAnswer(Report), whether it holds anything.
-template <typename Report>
-struct ModuleTopic
-{
-    unsigned int id;
-    std::string name;
-    Report report;
-};
 
 template <typename Report>
 concept HasTopicAnswer = requires(Report const& report)

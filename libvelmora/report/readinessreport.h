@@ -10,23 +10,6 @@
 
 namespace velmora {
 
-using ReadinessStatus = obd::ReadinessMonitorDataModel::Status;
-
-struct ReadinessMonitor
-{
-    std::string name;
-    ReadinessStatus sinceCleared;
-    std::optional<ReadinessStatus> thisCycle; // nothing if the module does not tell it
-};
-
-// Which monitors have run, as an emissions test asks for.
-struct ReadinessReport
-{
-    TopicAnswer answer = TopicAnswer::NotOffered;
-    std::optional<bool> lamp;
-    std::vector<ReadinessMonitor> monitors;
-};
-
 // How many monitors the module has that have not run since the codes were cleared.
 std::size_t countNotComplete(ReadinessReport const& report);
 

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <obd/dtcdatamodel.h>
+#include <velmora/troublecode.h>
 
 #include <nlohmann/json_fwd.hpp>
 
@@ -9,23 +10,6 @@
 #include <vector>
 
 namespace velmora {
-
-// One trouble code as people read it: all its meanings together.
-struct TroubleCode
-{
-    struct Meaning
-    {
-        std::string maker;
-        std::string text;
-
-        bool operator==(Meaning const&) const = default;
-    };
-
-    std::string code;
-    std::string system;
-    std::vector<Meaning> meanings;
-    std::string maker = {}; // whose meanings hold for the vehicle; empty for nobody known
-};
 
 // Whether the standard leaves the meaning of a code to each maker (SAE J2012).
 bool isMakersCode(std::string const& code);

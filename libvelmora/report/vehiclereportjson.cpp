@@ -29,20 +29,20 @@ Json moduleJson(ModuleReport const& module)
 
 } // namespace
 
-std::string toJson(VehicleReport const& report)
+std::string VehicleReport::toJson() const
 {
-    Json modules = Json::array();
-    for (ModuleReport const& module : report.modules) {
-        modules.push_back(moduleJson(module));
+    Json list = Json::array();
+    for (ModuleReport const& module : modules) {
+        list.push_back(moduleJson(module));
     }
     Json const document = {
         {"adapter",
-         {{"device", textOrNull(report.adapter.device)},
-          {"description", textOrNull(report.adapter.description)},
-          {"identification", textOrNull(report.adapter.identification)},
-          {"volts", voltsOrNull(report.adapter.volts)}}},
-        {"protocol", {{"number", valueOrNull(report.protocol.number)}, {"name", textOrNull(report.protocol.name)}}},
-        {"modules", modules},
+         {{"device", textOrNull(adapter.device)},
+          {"description", textOrNull(adapter.description)},
+          {"identification", textOrNull(adapter.identification)},
+          {"volts", voltsOrNull(adapter.volts)}}},
+        {"protocol", {{"number", valueOrNull(protocol.number)}, {"name", textOrNull(protocol.name)}}},
+        {"modules", list},
     };
     return printed(document);
 }

@@ -4,9 +4,8 @@
 
 namespace velmora::openingfailure {
 
-Error silentAdapter(PortAddress const& address, OpeningWatch const& seen)
+Error silentAdapter(std::string const& port, std::optional<PortAddress> const& address, OpeningWatch const& seen)
 {
-    std::string const port = toString(address);
     if (!seen.identification().empty()) {
         std::string const silentTo = seen.unanswered().empty() ? "what followed" : seen.unanswered();
         return {ErrorKind::AdapterSilent,
@@ -15,19 +14,19 @@ Error silentAdapter(PortAddress const& address, OpeningWatch const& seen)
                  "pull the adapter and plug it in again, or try --reset"}};
     }
     std::vector<std::string> hints = {"is it the right port?"};
-    if (std::holds_alternative<SerialAddress>(address)) {
+    if (address && std::holds_alternative<SerialAddress>(*address)) {
         hints.emplace_back("a serial adapter may use another line rate: try --baud 9600 or 115200");
-    } else if (std::holds_alternative<TcpAddress>(address)) {
+    } else if (address && std::holds_alternative<TcpAddress>(*address)) {
         hints.emplace_back("is another program connected to the adapter? most take one at a time");
     }
     hints.emplace_back("pull the adapter and plug it in again, or try --reset");
     return {ErrorKind::AdapterSilent, "Nothing on " + port + " answers like an ELM327 adapter", hints};
 }
 
-Error headersMissing(std::string const& adapter, PortAddress const& address)
+Error headersMissing(std::string const& adapter, std::string const& port)
 {
     return {ErrorKind::VehicleSilent,
-            "The adapter (" + adapter + ") on " + toString(address) +
+            "The adapter (" + adapter + ") on " + port +
                 " works and replies came, but they could not be read: no headers",
             {"this adapter does not do what ATH1 asks for; only another adapter helps"}};
 }

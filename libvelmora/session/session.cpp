@@ -144,6 +144,14 @@ void Session::rememberPort(SerialAddress const& address)
     }
 }
 
+std::string Session::port() const
+{
+    if (m_options.openPort) {
+        return m_options.port.empty() ? "the application's port" : m_options.port;
+    }
+    return m_address ? toString(*m_address) : std::string();
+}
+
 obd::VehicleProtocol Session::protocol() const
 {
     return m_options.protocol.value_or(m_obd->getSettings()->connectionOptions()->protocol());
@@ -151,11 +159,10 @@ obd::VehicleProtocol Session::protocol() const
 
 void Session::connect()
 {
-    PortAddress const address = findPort();
-    openLink(address);
-    tellProgress(fmt::format("Connecting to {} ...\n", toString(address)));
+    openLink();
+    tellProgress(fmt::format("Connecting to {} ...\n", port()));
     if (!openOnThread()) {
-        failOpening(address);
+        failOpening();
     }
     channel().onConnected();
     if (m_options.onDetail) {
@@ -166,9 +173,8 @@ void Session::connect()
 
 std::shared_ptr<obd::IDataConnection> Session::connectToPort()
 {
-    PortAddress const address = findPort();
-    openLink(address);
-    tellProgress(fmt::format("Connecting to {} ...\n", toString(address)));
+    openLink();
+    tellProgress(fmt::format("Connecting to {} ...\n", port()));
     enter(Phase::Open);
     if (m_trace != nullptr) {
         m_link->connection()->addLogger(m_trace.get());
@@ -181,9 +187,9 @@ std::string Session::failedTrace() const
     return m_trace != nullptr && m_trace->failed() ? m_options.traceFile : std::string();
 }
 
-void Session::openLink(PortAddress const& address)
+void Session::openLink()
 {
-    std::unique_ptr<IPort> port = openPort(address);
+    std::unique_ptr<IPort> port = m_options.openPort ? m_options.openPort() : openPort(findPort());
     if (m_recorder != nullptr) {
         port = std::make_unique<RecordedPort>(std::move(port), *m_recorder);
     }
@@ -191,11 +197,11 @@ void Session::openLink(PortAddress const& address)
     if (m_options.forget) {
         learnt->forget();
     }
-    ChannelOptions options{.port = toString(address), .sleepAtEnd = m_options.sleep};
-    bool const inProcess =
-        std::holds_alternative<SimulatorAddress>(address) || std::holds_alternative<ReplayAddress>(address);
+    ChannelOptions options{.port = this->port(), .sleepAtEnd = m_options.sleep};
+    bool const replayed = m_address && std::holds_alternative<ReplayAddress>(*m_address);
+    bool const inProcess = replayed || (m_address && std::holds_alternative<SimulatorAddress>(*m_address));
     // A recording holds what every reader of it would ask, which is no matter of haste.
-    bool const recorded = m_recorder != nullptr || std::holds_alternative<ReplayAddress>(address);
+    bool const recorded = m_recorder != nullptr || replayed;
     options.counting = !recorded;
     options.shortWait = !recorded;
     // What is simulated in this process is no adapter that somebody comes back to.
@@ -292,9 +298,9 @@ void Session::interrupt()
     m_loop.wake();
 }
 
-void Session::failOpening(PortAddress const& address)
+void Session::failOpening()
 {
-    std::string const port = toString(address);
+    std::string const port = this->port();
     if (m_interrupted) {
         failInterrupted();
     }
@@ -304,10 +310,10 @@ void Session::failOpening(PortAddress const& address)
     }
     std::shared_ptr<obd::IAdapter> const found = adapter();
     if (found == nullptr) {
-        throw openingfailure::silentAdapter(address, m_opening);
+        throw openingfailure::silentAdapter(port, m_address, m_opening);
     }
     if (m_opening.headersMissing()) {
-        throw openingfailure::headersMissing(readable(found->device()), address);
+        throw openingfailure::headersMissing(readable(found->device()), port);
     }
     throw Error(ErrorKind::VehicleSilent,
                 "The adapter (" + readable(found->device()) + ") on " + port + " works, but no control module answers",
@@ -339,7 +345,7 @@ void Session::check() const
     if (m_interrupted) {
         failInterrupted();
     }
-    if (m_link != nullptr && m_link->lost()) {
+    if (lost()) {
         throw Error(ErrorKind::LinkLost, "The link to the adapter broke", {"is it still plugged in and in reach?"});
     }
 }

@@ -63,7 +63,7 @@ public:
     std::shared_ptr<obd::IObdProxy> proxy() const;
     std::shared_ptr<obd::IAdapter> adapter() const;
     // The port's address, for messages and reports.
-    std::string port() const { return m_address ? toString(*m_address) : std::string(); }
+    std::string port() const;
     std::filesystem::path const& settingsFile() const;
     // What the channel to the adapter is told, and tells. After connect only.
     IChannelControl& channel() const { return m_link->control(); }
@@ -81,6 +81,8 @@ public:
     // Ends what the session is at, for good: the opening at once, else what is asked soon. Any thread.
     void interrupt();
     bool interrupted() const { return m_interrupted; }
+    // Whether the link has broken.
+    bool lost() const { return m_link != nullptr && m_link->lost(); }
 
 private:
     enum class Phase
@@ -92,12 +94,12 @@ private:
 
     PortAddress searchPort();
     void rememberPort(SerialAddress const& address);
-    void openLink(PortAddress const& address);
+    void openLink();
     void enter(Phase phase);
     obd::VehicleProtocol protocol() const;
     bool openOnThread();
     void tellPhase(std::chrono::steady_clock::time_point start) const;
-    [[noreturn]] void failOpening(PortAddress const& address);
+    [[noreturn]] void failOpening();
     void tellConnected() const;
     void tellHabits() const;
     void selectEcu();

@@ -2,8 +2,10 @@
 
 #include <obd/unitsystem.h>
 #include <obd/vehicleprotocol.h>
+#include <velmora/iport.h>
 
 #include <functional>
+#include <memory>
 #include <optional>
 #include <string>
 
@@ -23,6 +25,9 @@ struct SessionOptions
     std::string logFile;
     std::string traceFile;
     std::string settingsFile;
+
+    // Opens a transport in place of the port, whose text is then its name only.
+    std::function<std::unique_ptr<IPort>()> openPort;
 
     // Told what the session is at, each time as lines with their line feeds; null for nobody. On the thread that
     // calls the session.

@@ -85,7 +85,7 @@ ExitCode record(RecordOptions const& chosen, GlobalOptions const& options)
     }
     save(recorder, session, chosen, file);
     if (options.json) {
-        fmt::print("{}", toJson(report));
+        fmt::print("{}", report.toJson());
     } else {
         printText(toText(report, outputStyle(options)));
     }

@@ -75,7 +75,7 @@ ExitCode scan(ScanOptions const& chosen, GlobalOptions const& options)
         writeReport(path, report, facts, toText(report, Style(false)), chosen.force);
     }
     if (options.json) {
-        fmt::print("{}", toJson(report));
+        fmt::print("{}", report.toJson());
     } else {
         printText(toText(report, outputStyle(options)));
     }

@@ -1,5 +1,8 @@
 #pragma once
 
+#include <velmora/export.h>
+
+#include <iosfwd>
 #include <stdexcept>
 #include <string>
 #include <utility>
@@ -22,7 +25,7 @@ enum class ErrorKind : int
 };
 
 /// Tells what was tried and what happened, and what to try next.
-class Error : public std::runtime_error
+class VELMORA_EXPORT Error : public std::runtime_error
 {
 public:
     Error(ErrorKind kind, std::string const& what, std::vector<std::string> hints = {})
@@ -37,5 +40,10 @@ private:
     ErrorKind m_kind;
     std::vector<std::string> m_hints;
 };
+
+/// "vehicle silent", and so on.
+VELMORA_EXPORT std::ostream& operator<<(std::ostream& out, ErrorKind kind);
+/// What happened, and what to try on a line each behind "  - ".
+VELMORA_EXPORT std::ostream& operator<<(std::ostream& out, Error const& error);
 
 } // namespace velmora

@@ -1,6 +1,10 @@
 #pragma once
 
+#include <velmora/export.h>
+
 #include <chrono>
+#include <iosfwd>
+#include <optional>
 #include <string>
 #include <variant>
 #include <vector>
@@ -24,5 +28,12 @@ struct Reading
     int precision = 0;              ///< digits behind the point that the value is good for
     std::vector<unsigned char> raw; ///< the module's payload from the service byte on; empty for a derived value
 };
+
+/// The number of a reading, in its unit; nothing for a text or for none.
+VELMORA_EXPORT std::optional<double> number(Reading const& reading);
+/// The value as people write it, with its digits behind the point and without its unit; "-" for none.
+VELMORA_EXPORT std::string valueText(Reading const& reading);
+/// "Engine RPM: 1726 rpm"
+VELMORA_EXPORT std::ostream& operator<<(std::ostream& out, Reading const& reading);
 
 } // namespace velmora

@@ -71,7 +71,7 @@ TEST(ReportDocument, HoldsEveryTextOfTheJsonInHtmlAndMarkdown)
     std::string markdown = toMarkdown(makeDocument(report, facts));
     std::erase(markdown, '\\');
     int texts = 0;
-    forEachText(nlohmann::json::parse(toJson(report)), [&](std::string const& text) {
+    forEachText(nlohmann::json::parse(report.toJson()), [&](std::string const& text) {
         if (text == "read" || text == "Powertrain" || text == "0C" || text == "unreadable" || text.empty()) {
             return; // words of the JSON alone, and counts of what is listed
         }
@@ -126,7 +126,7 @@ TEST(ReportDocument, MasksTheVinEverywhere)
     masked.maskVin = true;
     VehicleReport const report = withShownVins(richVehicle(), masked);
     for (std::string const& text :
-         {toHtml(makeDocument(report, masked)), toMarkdown(makeDocument(report, masked)), toJson(report)}) {
+         {toHtml(makeDocument(report, masked)), toMarkdown(makeDocument(report, masked)), report.toJson()}) {
         EXPECT_EQ(text.find("042788"), std::string::npos);
         EXPECT_NE(text.find("1M8GDM9AXKP000000"), std::string::npos);
     }

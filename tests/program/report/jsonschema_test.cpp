@@ -102,14 +102,14 @@ TEST(JsonSchema, HoldsForAScan)
     ModuleReport empty{0x7E9, "", {}, {}, codeReport(), {}, {}, {}, {}, {}};
     empty.codes.lamp.reset();
     report.modules = {full, empty};
-    expectValid(toJson(report), "scan");
+    expectValid(report.toJson(), "scan");
 }
 
 TEST(JsonSchema, RefusesAScanThatMissesATopic)
 {
     VehicleReport report;
     report.modules = {{0x7E8, "", {}, {}, codeReport(), {}, {}, {}, {}, {}}};
-    Json document = Json::parse(toJson(report));
+    Json document = Json::parse(report.toJson());
     ASSERT_EQ(schemaErrors(document.dump(), "scan"), "");
     for (char const* topic : {"info", "codes", "freeze", "readiness", "monitors", "oxygen", "counters", "sensors"}) {
         Json wrong = document;

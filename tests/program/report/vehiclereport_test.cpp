@@ -74,7 +74,7 @@ Findings
 
 TEST(VehicleReportView, JsonHoldsEachTopicUnderItsName)
 {
-    Json const document = Json::parse(toJson(vehicle()));
+    Json const document = Json::parse(vehicle().toJson());
     EXPECT_EQ(document["adapter"], Json::parse(R"({"device": "ELM327 v1.5", "description": "OBDII to RS232 Interpreter",
                                                    "identification": null, "volts": 12.3})"));
     EXPECT_EQ(document["protocol"], (Json{{"number", 6}, {"name", "ISO 15765-4 (CAN 11/500)"}}));

@@ -1,0 +1,290 @@
+#include "libvelmora/car/carcore.h"
+
+#include "libvelmora/car/carsensors.h"
+
+#include <obd/ivelmorasettings.h>
+#include <obd/parameterfactory.h>
+
+#include <algorithm>
+#include <atomic>
+#include <utility>
+
+namespace velmora {
+
+namespace {
+
+constexpr std::chrono::milliseconds step{100};
+constexpr std::chrono::seconds silence{3};
+constexpr std::chrono::seconds longestPause{16};
+
+// The core has one top-level object.
+std::atomic<bool> carStands{false};
+
+void claim()
+{
+    if (carStands.exchange(true)) {
+        throw Error(ErrorKind::WrongUse, "There is a car in this process already",
+                    {"a process has one car at a time: destroy the first one, or run another process"});
+    }
+}
+
+SessionOptions sessionOptions(CarOptions const& options)
+{
+    SessionOptions result;
+    result.port = options.port;
+    result.baud = options.baud;
+    if (options.protocol) {
+        if (*options.protocol < 1 || *options.protocol > 9) {
+            throw Error(ErrorKind::WrongUse, "A protocol is a number from 1 to 9");
+        }
+        result.protocol = static_cast<obd::VehicleProtocol>(*options.protocol);
+    }
+    result.reset = options.reset;
+    result.logFile = options.logFile;
+    result.traceFile = options.traceFile;
+    result.settingsFile = options.settingsFile;
+    result.onProgress = options.onProgress;
+    result.openPort = options.openPort;
+    return result;
+}
+
+} // namespace
+
+CarCore::CarCore(CarOptions options) : m_options(std::move(options))
+{
+    claim();
+    auto const connected = std::make_shared<std::promise<void>>();
+    try {
+        m_thread = std::thread([this, connected] { run(*connected); });
+        connected->get_future().get();
+    } catch (...) {
+        if (m_thread.joinable()) {
+            m_thread.join();
+        }
+        carStands = false;
+        throw;
+    }
+}
+
+CarCore::~CarCore()
+{
+    {
+        std::lock_guard const lock(m_mutex);
+        m_stop = true;
+        m_wake.notify_one();
+        if (m_session != nullptr) {
+            m_session->interrupt();
+        }
+    }
+    m_thread.join();
+    carStands = false;
+}
+
+void CarCore::refuseCallback() const
+{
+    if (std::this_thread::get_id() == m_thread.get_id()) {
+        throw Error(ErrorKind::WrongUse, "A callback asked the car for something that it would have to wait for",
+                    {"callbacks run on the car's own thread: ask from another one"});
+    }
+}
+
+void CarCore::post(std::function<void()> work)
+{
+    std::lock_guard const lock(m_mutex);
+    m_work.push_back(std::move(work));
+    m_wake.notify_one();
+    if (m_session != nullptr) {
+        m_session->loop().wake();
+    }
+}
+
+Session& CarCore::openSession() const
+{
+    if (m_session == nullptr) {
+        throw Error(ErrorKind::LinkLost, "The link to the adapter is lost",
+                    {"a watch tries to come back by itself; reconnect() tries at once"});
+    }
+    m_session->check();
+    return *m_session;
+}
+
+void CarCore::run(std::promise<void>& connected)
+{
+    try {
+        connect();
+    } catch (...) {
+        disconnect();
+        connected.set_exception(std::current_exception());
+        return;
+    }
+    connected.set_value();
+    while (true) {
+        wait();
+        {
+            std::lock_guard const lock(m_mutex);
+            if (m_stop) {
+                break;
+            }
+        }
+        runWork();
+        dropEnded();
+        superviseLink();
+    }
+    disconnect();
+}
+
+void CarCore::connect()
+{
+    auto session = std::make_unique<Session>(sessionOptions(m_options));
+    {
+        std::lock_guard const lock(m_mutex);
+        m_session = std::move(session);
+        if (m_stop) {
+            m_session->interrupt();
+        }
+    }
+    m_session->connect();
+    m_lastReading = Clock::now();
+}
+
+void CarCore::disconnect()
+{
+    for (std::shared_ptr<WatchState> const& watch : m_watches) {
+        watch->setPoller(nullptr);
+    }
+    std::unique_ptr<Session> session;
+    {
+        std::lock_guard const lock(m_mutex);
+        session = std::move(m_session);
+    }
+}
+
+void CarCore::wait()
+{
+    auto const limit = Clock::now() + step;
+    if (m_session != nullptr) {
+        m_session->loop().runUntil(
+            [this] {
+                std::lock_guard const lock(m_mutex);
+                return m_stop || !m_work.empty();
+            },
+            limit);
+        return;
+    }
+    std::unique_lock lock(m_mutex);
+    m_wake.wait_until(lock, limit, [this] { return m_stop || !m_work.empty(); });
+}
+
+void CarCore::runWork()
+{
+    std::deque<std::function<void()>> work;
+    {
+        std::lock_guard const lock(m_mutex);
+        work.swap(m_work);
+    }
+    for (std::function<void()> const& each : work) {
+        each();
+    }
+}
+
+std::shared_ptr<WatchState> CarCore::watch(std::vector<std::string> const& sensors, Car::OnReading onReading,
+                                           Car::OnLink onLink)
+{
+    auto state = std::make_shared<WatchState>(sensors, std::move(onReading), std::move(onLink));
+    call([&](Session& /*session*/) {
+        startWatch(state);
+        m_watches.push_back(state);
+    });
+    return state;
+}
+
+void CarCore::startWatch(std::shared_ptr<WatchState> const& state)
+{
+    auto sink = [this, state](PollResult const& result) {
+        post([this, state, readings = result.readings] { deliver(state, readings); });
+    };
+    state->setPoller(std::make_unique<Poller>(m_session->proxy(), pollSources(*m_session, state->sensors()), PollPace{},
+                                              m_session->obd().getSettings()->unitSystem(), sink));
+}
+
+void CarCore::deliver(std::shared_ptr<WatchState> const& state, std::vector<Reading> const& readings)
+{
+    m_lastReading = Clock::now();
+    for (Reading const& reading : readings) {
+        state->tell(reading);
+    }
+}
+
+void CarCore::dropEnded()
+{
+    std::erase_if(m_watches, [](std::shared_ptr<WatchState> const& watch) {
+        if (watch->ended()) {
+            watch->setPoller(nullptr);
+        }
+        return watch->ended();
+    });
+}
+
+void CarCore::superviseLink()
+{
+    if (m_watches.empty()) {
+        return; // the next call finds out
+    }
+    if (m_session == nullptr) {
+        comeBack();
+    } else if (isLinkLost()) {
+        disconnect();
+        m_nextTry = Clock::now();
+        m_pause = std::chrono::seconds(1);
+        for (std::shared_ptr<WatchState> const& watch : m_watches) {
+            watch->tell(LinkState::Lost);
+        }
+    }
+}
+
+// An adapter that has gone quiet is asked whether it is there.
+bool CarCore::isLinkLost()
+{
+    if (m_session->lost()) {
+        return true;
+    }
+    if (Clock::now() - m_lastReading < silence) {
+        return false;
+    }
+    m_lastReading = Clock::now();
+    return !m_session->proxy()->isConnected();
+}
+
+void CarCore::comeBack()
+{
+    if (Clock::now() < m_nextTry) {
+        return;
+    }
+    try {
+        connect();
+        for (std::shared_ptr<WatchState> const& watch : m_watches) {
+            startWatch(watch);
+        }
+    } catch (Error const&) {
+        disconnect();
+        m_nextTry = Clock::now() + m_pause;
+        m_pause = std::min(2 * m_pause, longestPause);
+        return;
+    }
+    for (std::shared_ptr<WatchState> const& watch : m_watches) {
+        watch->tell(LinkState::Returned);
+    }
+}
+
+void CarCore::reconnect()
+{
+    onThread([this] {
+        disconnect();
+        connect();
+        for (std::shared_ptr<WatchState> const& watch : m_watches) {
+            startWatch(watch);
+        }
+    });
+}
+
+} // namespace velmora

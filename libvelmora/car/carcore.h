@@ -1,0 +1,87 @@
+#pragma once
+
+#include "libvelmora/car/watchstate.h"
+#include "libvelmora/session/session.h"
+
+#include <velmora/car.h>
+
+#include <chrono>
+#include <condition_variable>
+#include <deque>
+#include <functional>
+#include <future>
+#include <memory>
+#include <mutex>
+#include <thread>
+#include <type_traits>
+#include <vector>
+
+namespace velmora {
+
+// The thread of a car: what callers ask, what pollers read, and the link, one at a time.
+class CarCore
+{
+public:
+    // Connects. Throws Error as Car does.
+    explicit CarCore(CarOptions options);
+    ~CarCore();
+    CarCore(CarCore const&) = delete;
+    CarCore& operator=(CarCore const&) = delete;
+
+    // Runs a function of the session on the car's thread and gives what it gives or throws.
+    template <typename Function>
+    auto call(Function const& function) -> std::invoke_result_t<Function const&, Session&>
+    {
+        return onThread([&] { return function(openSession()); });
+    }
+
+    std::shared_ptr<WatchState> watch(std::vector<std::string> const& sensors, Car::OnReading onReading,
+                                      Car::OnLink onLink);
+    void reconnect();
+
+private:
+    using Clock = std::chrono::steady_clock;
+
+    // The task is shared, for its thread may still hold it when the waiting one goes on.
+    template <typename Function>
+    auto onThread(Function const& function) -> std::invoke_result_t<Function const&>
+    {
+        refuseCallback();
+        auto const task = std::make_shared<std::packaged_task<std::invoke_result_t<Function const&>()>>(function);
+        auto result = task->get_future();
+        post([task] { (*task)(); });
+        return result.get();
+    }
+
+    void refuseCallback() const;
+    void post(std::function<void()> work);
+    Session& openSession() const;
+
+    // The car's thread alone, from here on.
+    void run(std::promise<void>& connected);
+    void connect();
+    void disconnect();
+    void wait();
+    void runWork();
+    void startWatch(std::shared_ptr<WatchState> const& state);
+    void deliver(std::shared_ptr<WatchState> const& state, std::vector<Reading> const& readings);
+    void dropEnded();
+    void superviseLink();
+    bool isLinkLost();
+    void comeBack();
+
+    CarOptions const m_options;
+    std::vector<std::shared_ptr<WatchState>> m_watches;
+    Clock::time_point m_lastReading;
+    Clock::time_point m_nextTry;
+    std::chrono::seconds m_pause{0}; // before the try after the next
+
+    std::mutex m_mutex;
+    std::condition_variable m_wake;
+    std::deque<std::function<void()>> m_work; // protected by m_mutex
+    bool m_stop = false;                      // protected by m_mutex
+    std::unique_ptr<Session> m_session;       // changed under m_mutex, by the car's thread alone
+    std::thread m_thread;
+};
+
+} // namespace velmora

@@ -1,0 +1,58 @@
+#pragma once
+
+#include <velmora/export.h>
+#include <velmora/topics.h>
+
+#include <iosfwd>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace velmora {
+
+/// What the adapter says of itself. Empty texts and missing values were not told.
+struct AdapterReport
+{
+    std::string device; ///< name and version
+    std::string description;
+    std::string identification;
+    std::optional<float> volts;
+};
+
+/// The bus that the vehicle was found on.
+struct ProtocolReport
+{
+    std::optional<int> number; ///< the adapter's, 1 to 9
+    std::string name;          ///< the adapter's words
+};
+
+/// All that one control module told.
+struct ModuleReport
+{
+    unsigned int id;
+    std::string name;
+    std::vector<unsigned int> supported; ///< identifiers of service 01 that are sensors
+    InfoReport info;
+    CodeReport codes;
+    FreezeReport freeze;
+    ReadinessReport readiness;
+    MonitorsReport monitors;
+    OxygenReport oxygen;
+    CountersReport counters;
+};
+
+/// All that a vehicle told, as Car::report gives it. Plain data: copy it, keep it, hand it to any thread.
+struct VehicleReport
+{
+    AdapterReport adapter;
+    ProtocolReport protocol;
+    std::vector<ModuleReport> modules; ///< in rising order of id
+
+    /// The document that docs/json.md describes.
+    VELMORA_EXPORT std::string toJson() const;
+};
+
+/// Adapter, bus, and for each module its codes: what one looks at first. toJson tells all.
+VELMORA_EXPORT std::ostream& operator<<(std::ostream& out, VehicleReport const& report);
+
+} // namespace velmora

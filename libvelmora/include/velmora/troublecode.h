@@ -1,0 +1,95 @@
+#pragma once
+
+#include <velmora/export.h>
+
+#include <iosfwd>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace velmora {
+
+/// One trouble code as people read it: all its meanings together.
+struct TroubleCode
+{
+    struct Meaning
+    {
+        std::string maker;
+        std::string text;
+
+        bool operator==(Meaning const&) const = default;
+    };
+
+    std::string code;
+    std::string system;
+    std::vector<Meaning> meanings;
+    std::string maker = {}; ///< whose meanings hold for the vehicle; empty for nobody known
+};
+
+/// Whose meanings a vehicle's trouble codes are read with.
+struct MakerChoice
+{
+    enum class By
+    {
+        Nothing,
+        Option, ///< the user named the maker
+        Vin,    ///< the vehicle identification number tells it, and its control modules are known to follow that list
+        Guess,  ///< the number tells a related maker, which is only offered
+    };
+
+    By by = By::Nothing;
+    std::string maker; ///< as the trouble code catalogue writes it
+
+    /// The maker whose meanings hold; empty for nobody.
+    VELMORA_EXPORT std::string const& holding() const;
+};
+
+/// How firmly a trouble code is stored.
+enum class CodeKind : int
+{
+    Confirmed, ///< stored, and as a rule the reason for the lamp
+    Pending,   ///< seen in this or the last driving cycle
+    Permanent, ///< not to be cleared by a tool
+};
+
+/// A trouble code as it is stored in one control module.
+struct StoredCode
+{
+    unsigned int module; ///< id of the control module
+    CodeKind kind;
+    TroubleCode code;
+};
+
+/// What a control module tells of its codes of one kind.
+struct CodeList
+{
+    enum class Answer : int
+    {
+        Read,
+        Refused,
+        Silent,
+        Unreadable,
+    };
+
+    CodeKind kind;
+    Answer answer;
+    std::string reason; ///< of a refusal
+    std::vector<TroubleCode> codes;
+};
+
+/// Lamp and trouble codes of one control module.
+struct CodeReport
+{
+    std::optional<bool> lamp; ///< whether the malfunction indicator is on
+    std::vector<CodeList> lists;
+    MakerChoice maker = {}; ///< whose meanings the codes are given
+};
+
+/// "confirmed", "pending" or "permanent".
+VELMORA_EXPORT std::ostream& operator<<(std::ostream& out, CodeKind kind);
+/// "P0171 System Too Lean Bank 1": the code with the meaning that holds for the vehicle, or how many it may have.
+VELMORA_EXPORT std::ostream& operator<<(std::ostream& out, TroubleCode const& code);
+/// "7E8 confirmed P0171 System Too Lean Bank 1"
+VELMORA_EXPORT std::ostream& operator<<(std::ostream& out, StoredCode const& code);
+
+} // namespace velmora

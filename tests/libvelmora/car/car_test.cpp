@@ -1,0 +1,282 @@
+#include "libvelmora/port/openport.h"
+
+#include <obd/iconnectionmanager.h>
+#include <obd/iecumanager.h>
+#include <obd/iobdproxy.h>
+#include <obd/iobdvelmora.h>
+#include <velmora/car.h>
+
+#include <gtest/gtest.h>
+
+#include <atomic>
+#include <condition_variable>
+#include <mutex>
+#include <sstream>
+#include <thread>
+
+namespace {
+
+using velmora::Car;
+using velmora::CarOptions;
+using velmora::Error;
+using velmora::ErrorKind;
+using velmora::Reading;
+
+CarOptions simulated(std::string const& vehicle)
+{
+    CarOptions options;
+    options.port = "sim:" + vehicle + "?instant";
+    options.settingsFile = "/nonexistent/settings.toml";
+    return options;
+}
+
+template <typename Value>
+std::string printed(Value const& value)
+{
+    std::ostringstream text;
+    text << value;
+    return text.str();
+}
+
+// Waits for what callbacks bring; ten seconds are no measure but an end.
+class Awaited
+{
+public:
+    void add()
+    {
+        std::lock_guard const lock(m_mutex);
+        ++m_count;
+        m_wake.notify_all();
+    }
+    bool reaches(int count)
+    {
+        std::unique_lock lock(m_mutex);
+        return m_wake.wait_for(lock, std::chrono::seconds(10), [&] { return m_count >= count; });
+    }
+
+private:
+    std::mutex m_mutex;
+    std::condition_variable m_wake;
+    int m_count = 0;
+};
+
+// A simulated adapter whose link can be cut.
+class CuttablePort : public velmora::IPort
+{
+public:
+    explicit CuttablePort(std::function<void()>& cut) : m_cut(cut)
+    {
+        m_port = velmora::openPort(velmora::parsePortAddress("sim:petrol-can11?instant"));
+    }
+    ~CuttablePort() override { m_cut = nullptr; }
+    void start(Receiver onBytes, LossHandler onLost) override
+    {
+        m_cut = onLost;
+        m_port->start(std::move(onBytes), std::move(onLost));
+    }
+    void write(std::string_view bytes) override { m_port->write(bytes); }
+    void close() override { m_port->close(); }
+
+private:
+    std::function<void()>& m_cut;
+    std::unique_ptr<velmora::IPort> m_port;
+};
+
+// One connection for all that needs no other.
+class CarTest : public testing::Test
+{
+protected:
+    static void SetUpTestSuite() { shared = std::make_unique<Car>(simulated("petrol-can11")); }
+    static void TearDownTestSuite() { shared.reset(); }
+
+    Car& car = *shared;
+
+private:
+    static std::unique_ptr<Car> shared;
+};
+
+std::unique_ptr<Car> CarTest::shared;
+
+TEST_F(CarTest, GivesAllThatACarTells)
+{
+
+    auto const modules = car.modules();
+    ASSERT_EQ(modules.size(), 2U);
+    EXPECT_EQ(printed(modules[0]), "7E8 ECM");
+
+    auto const readings = car.read({"RPM", "COOLANT_TEMP", "7E9:0C"});
+    ASSERT_EQ(readings.size(), 3U);
+    EXPECT_EQ(readings[0].sensor, "RPM");
+    EXPECT_EQ(readings[0].module, 0x7E8U);
+    EXPECT_GT(velmora::number(readings[0]).value_or(0.0), 500.0);
+    EXPECT_EQ(readings[1].unit, "°C");
+    EXPECT_EQ(readings[2].module, 0x7E9U);
+    EXPECT_EQ(printed(readings[1]), "Engine Coolant Temperature: " + velmora::valueText(readings[1]) + " °C");
+
+    auto const codes = car.codes();
+    ASSERT_EQ(codes.size(), 4U);
+    EXPECT_EQ(printed(codes[1]), "7E8 confirmed P0171 System Too Lean Bank 1");
+
+    auto const freeze = car.freezeFrame();
+    ASSERT_TRUE(freeze[0].report.frame.has_value());
+    EXPECT_EQ(printed(freeze[0]).substr(0, 14), "7E8 ECM\nP0133 ");
+
+    EXPECT_EQ(car.readiness()[0].report.answer, velmora::TopicAnswer::Read);
+    EXPECT_EQ(car.info()[0].report.vin.size(), 17U);
+    EXPECT_FALSE(car.monitors()[0].report.monitors.empty());
+
+    auto const sensors = car.sensors();
+    auto const rpm = std::find_if(sensors.begin(), sensors.end(), [](auto const& each) { return each.key == "RPM"; });
+    ASSERT_NE(rpm, sensors.end());
+    EXPECT_EQ(rpm->pid, "010C");
+
+    EXPECT_NE(car.report().toJson().find("\"P0171\""), std::string::npos);
+}
+
+TEST_F(CarTest, SaysWhatIsWrongWithSensors)
+{
+    auto const kind = [this](std::string const& word) {
+        try {
+            car.read({word});
+        } catch (Error const& error) {
+            return error.kind();
+        }
+        return ErrorKind::Failed;
+    };
+    EXPECT_EQ(kind("NONSENSE"), ErrorKind::WrongUse);
+    EXPECT_EQ(kind("OIL_TEMP@never"), ErrorKind::WrongUse);
+    EXPECT_EQ(kind("7EA:RPM"), ErrorKind::NotSupported);
+}
+
+TEST_F(CarTest, IsOneInAProcess)
+{
+    try {
+        Car second(simulated("petrol-can11"));
+        FAIL() << "a second car was made";
+    } catch (Error const& error) {
+        EXPECT_EQ(error.kind(), ErrorKind::WrongUse);
+        EXPECT_EQ(printed(error).substr(0, 43), "There is a car in this process already\n  - ");
+    }
+    EXPECT_EQ(car.modules().size(), 2U) << "the first one goes on";
+}
+
+TEST_F(CarTest, LendsTheCoreForTheRest)
+{
+    std::thread::id thread;
+    car.library([&](obd::IObdVelmora& obd) {
+        thread = std::this_thread::get_id();
+        EXPECT_TRUE(obd.getConnectionManager()->getProxy()->isConnected());
+    });
+    EXPECT_NE(thread, std::this_thread::get_id());
+    EXPECT_THROW(car.library([](obd::IObdVelmora&) { throw std::runtime_error("mine"); }), std::runtime_error);
+}
+
+TEST(CarLife, AFailedOneLeavesRoomForTheNext)
+{
+    for (int i = 0; i < 2; ++i) {
+        try {
+            Car car(simulated("no-such-vehicle"));
+            FAIL() << "there is no such vehicle";
+        } catch (Error const& error) {
+            EXPECT_NE(std::string(error.what()).find("no-such-vehicle"), std::string::npos) << error;
+        }
+    }
+}
+
+TEST_F(CarTest, WatchCallsOnOneThreadOfItsOwnUntilItEnds)
+{
+    Awaited readings;
+    std::atomic<std::thread::id> thread;
+    std::atomic<bool> refused{false};
+    std::atomic<int> count{0};
+    {
+        auto const watch = car.watch({"RPM@20hz", "SPEED"}, [&](Reading const& reading) {
+            EXPECT_TRUE(reading.sensor == "RPM" || reading.sensor == "SPEED");
+            thread = std::this_thread::get_id();
+            try {
+                car.read({"RPM"});
+            } catch (Error const& error) {
+                refused = error.kind() == ErrorKind::WrongUse;
+            }
+            ++count;
+            readings.add();
+        });
+        ASSERT_TRUE(readings.reaches(4));
+        EXPECT_EQ(car.read({"COOLANT_TEMP"}).size(), 1U) << "while it goes on";
+    }
+    int const atEnd = count;
+    EXPECT_NE(thread.load(), std::this_thread::get_id());
+    EXPECT_TRUE(refused) << "a blocking call from a callback is an error";
+    car.read({"RPM", "SPEED"});
+    EXPECT_EQ(count, atEnd) << "nothing comes behind the end";
+}
+
+TEST_F(CarTest, WatchMayEndItself)
+{
+    Awaited readings;
+    velmora::Watch watch;
+    std::atomic<bool> started{false};
+    watch = car.watch({"RPM"}, [&](Reading const&) {
+        if (started) {
+            watch.end();
+            readings.add();
+        }
+    });
+    started = true;
+    EXPECT_TRUE(readings.reaches(1));
+    EXPECT_EQ(car.read({"SPEED"}).size(), 1U);
+}
+
+TEST(CarLife, WatchTellsLossAndReturn)
+{
+    std::function<void()> cut; // replaced by each connection, between which nobody reads it
+    CarOptions options = simulated("petrol-can11");
+    std::atomic<int> connections{0};
+    options.openPort = [&]() -> std::unique_ptr<velmora::IPort> {
+        ++connections;
+        return std::make_unique<CuttablePort>(cut);
+    };
+    Car car(options);
+    Awaited readings;
+    Awaited lost;
+    Awaited returned;
+    Awaited after;
+    std::atomic<bool> back{false};
+    auto const watch = car.watch(
+        {"RPM"},
+        [&](Reading const&) {
+            readings.add();
+            if (back) {
+                after.add();
+            }
+        },
+        [&](velmora::LinkState state) {
+            back = state == velmora::LinkState::Returned;
+            (back ? returned : lost).add();
+        });
+    ASSERT_TRUE(readings.reaches(2));
+    cut();
+    EXPECT_TRUE(lost.reaches(1));
+    EXPECT_TRUE(returned.reaches(1));
+    EXPECT_TRUE(after.reaches(2));
+    EXPECT_EQ(connections, 2);
+}
+
+TEST(CarLife, TellsALossAndReconnects)
+{
+    std::function<void()> cut;
+    CarOptions options = simulated("petrol-can11");
+    options.openPort = [&]() -> std::unique_ptr<velmora::IPort> { return std::make_unique<CuttablePort>(cut); };
+    Car car(options);
+    cut();
+    try {
+        car.read({"RPM"});
+        ADD_FAILURE() << "read over a dead link";
+    } catch (Error const& error) {
+        EXPECT_EQ(error.kind(), ErrorKind::LinkLost);
+    }
+    car.reconnect();
+    EXPECT_EQ(car.read({"RPM"}).size(), 1U);
+}
+
+} // namespace
