@@ -1,0 +1,52 @@
+# The package: libraries with their headers, the program, and what find_package needs.
+include(CMakePackageConfigHelpers)
+set(package_folder ${CMAKE_INSTALL_LIBDIR}/cmake/velmora)
+
+install(TARGETS obd EXPORT velmoraObdTargets)
+install(
+    DIRECTORY libobd/include/obd libobd/include/tervex
+    DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/velmora
+    FILES_MATCHING PATTERN "*.h"
+)
+install(EXPORT velmoraObdTargets NAMESPACE velmora:: DESTINATION ${package_folder})
+
+# What a static companion's users must link to as well: the compiled libraries of its parts, which an application finds
+# anew. Each is named as its package and its target.
+set(companion_packages)
+if(TARGET velmoraLibrary)
+    if(NOT BUILD_SHARED_LIBS)
+        get_target_property(parts velmoraParts INTERFACE_LINK_LIBRARIES)
+        foreach(part fmt::fmt tomlplusplus::tomlplusplus SQLite::SQLite3)
+            if(part IN_LIST parts)
+                string(REGEX REPLACE "::.*" "" package ${part})
+                string(REPLACE "SQLite" "SQLite3" package ${package})
+                list(APPEND companion_packages ${package})
+                target_link_libraries(velmoraLibrary PRIVATE $<INSTALL_INTERFACE:${part}>)
+            endif()
+        endforeach()
+    endif()
+    install(TARGETS velmoraLibrary EXPORT velmoraCompanionTargets)
+    install(
+        DIRECTORY libvelmora/include/velmora
+        DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/velmora
+        FILES_MATCHING PATTERN "*.h"
+    )
+    install(FILES ${PROJECT_BINARY_DIR}/generated/velmora/version.h DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/velmora/velmora)
+    install(EXPORT velmoraCompanionTargets NAMESPACE velmora:: DESTINATION ${package_folder})
+endif()
+if(TARGET velmora)
+    install(TARGETS velmora)
+endif()
+
+list(TRANSFORM companion_packages PREPEND "    find_dependency(" OUTPUT_VARIABLE companion_dependencies)
+list(TRANSFORM companion_dependencies APPEND ")\n")
+string(JOIN "" companion_dependencies ${companion_dependencies})
+configure_package_config_file(
+    ${PROJECT_SOURCE_DIR}/cmake/velmoraConfig.cmake.in ${PROJECT_BINARY_DIR}/velmoraConfig.cmake
+    INSTALL_DESTINATION ${package_folder}
+)
+write_basic_package_version_file(${PROJECT_BINARY_DIR}/velmoraConfigVersion.cmake COMPATIBILITY SameMinorVersion)
+install(
+    FILES ${PROJECT_BINARY_DIR}/velmoraConfig.cmake ${PROJECT_BINARY_DIR}/velmoraConfigVersion.cmake
+    DESTINATION ${package_folder}
+)
