@@ -7,7 +7,7 @@
 namespace obd {
 
 // The supply voltage as the adapter measures it. No control module has a part in it: every one reads the same.
-class OBD_EXPORT BatteryVoltage : public DerivedParameter
+class BatteryVoltage : public DerivedParameter
 {
 public:
     BatteryVoltage();

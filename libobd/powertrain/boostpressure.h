@@ -25,7 +25,7 @@ private:
 };
 
 // The intake manifold's pressure above that of the air outside.
-class OBD_EXPORT BoostPressure : public DerivedParameter
+class BoostPressure : public DerivedParameter
 {
 public:
     BoostPressure();

@@ -89,7 +89,7 @@ using CodedParameter = RowParameter<Base, codedRows, id>;
 
 // Where the engine runs against the area of loads and speeds in which it must not exceed its limits. A reply without
 // any of the states is taken, and leaves the last one.
-class OBD_EXPORT ControlAreaStatus : public TableParameter
+class ControlAreaStatus : public TableParameter
 {
 public:
     using TableParameter::TableParameter;

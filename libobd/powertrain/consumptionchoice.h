@@ -1,6 +1,5 @@
 #pragma once
 
-#include <obd/export.h>
 #include <obd/iecu.h>
 
 #include <memory>
@@ -27,10 +26,10 @@ struct ConsumptionSettings
 };
 
 // The model that suits an ignition type, which may be the user's choice, and what the module reports.
-OBD_EXPORT ConsumptionKind chooseConsumption(IEcu const& ecu, IgnitionType ignitionType);
+ConsumptionKind chooseConsumption(IEcu const& ecu, IgnitionType ignitionType);
 
 // The parameter of that model. Null if none suits.
-OBD_EXPORT std::shared_ptr<PowertrainParameter> createConsumption(IEcu const& ecu, IgnitionType ignitionType,
-                                                                  ConsumptionSettings const& settings);
+std::shared_ptr<PowertrainParameter> createConsumption(IEcu const& ecu, IgnitionType ignitionType,
+                                                       ConsumptionSettings const& settings);
 
 } // namespace obd

@@ -29,7 +29,7 @@ struct DerivedRow
 
 // A parameter with one sensor, worked out from others. Its update runs those through the proxy, one after the other, so
 // it may take several times its timeout(). It has no request of its own, and no reply reaches it.
-class OBD_EXPORT DerivedParameter : public PowertrainParameter
+class DerivedParameter : public PowertrainParameter
 {
 public:
     // row must outlive the parameter.

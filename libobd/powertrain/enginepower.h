@@ -23,7 +23,7 @@ private:
 
 // The power that moves the vehicle, estimated from its speed alone: what accelerates it, and the drag of the air. It
 // reads 0 while the vehicle doesn't accelerate.
-class OBD_EXPORT EnginePower : public DerivedParameter
+class EnginePower : public DerivedParameter
 {
 public:
     // weight: of the vehicle, in kg.

@@ -11,7 +11,7 @@ namespace obd {
 
 // The fuel consumption, worked out from the air that the engine takes in. The models differ in what they need; see
 // createConsumption for which one suits a vehicle.
-class OBD_EXPORT FuelConsumption : public DerivedParameter
+class FuelConsumption : public DerivedParameter
 {
 public:
     // Litres per 100 km, or miles per gallon; 0.0 without results, and in miles per gallon for less than a litre.
@@ -85,7 +85,7 @@ private:
 };
 
 // For gasoline engines with a mass air flow sensor.
-class OBD_EXPORT GasConsumption : public ConsumptionModel<GasConsumptionDataMaf>
+class GasConsumption : public ConsumptionModel<GasConsumptionDataMaf>
 {
 public:
     explicit GasConsumption(IEcu const& ecu);
@@ -98,7 +98,7 @@ private:
 };
 
 // For gasoline engines without one, by the pressure and temperature in the manifold.
-class OBD_EXPORT GasConsumptionMap : public ConsumptionModel<GasConsumptionDataMap>
+class GasConsumptionMap : public ConsumptionModel<GasConsumptionDataMap>
 {
 public:
     explicit GasConsumptionMap(IEcu const& ecu);
@@ -123,7 +123,7 @@ private:
 };
 
 // For diesel engines.
-class OBD_EXPORT DieselConsumption : public ConsumptionModel<DieselConsumptionData>
+class DieselConsumption : public ConsumptionModel<DieselConsumptionData>
 {
 public:
     explicit DieselConsumption(IEcu const& ecu);

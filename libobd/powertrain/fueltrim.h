@@ -8,7 +8,7 @@ namespace obd {
 
 // A fuel trim of bank 1 or 2. A vehicle with four banks sends that of bank 3 or 4 in a second byte, of which nothing in
 // the reply itself tells: whether it is in use holds for the whole library.
-class OBD_EXPORT FuelTrim : public TableParameter
+class FuelTrim : public TableParameter
 {
 public:
     using TableParameter::TableParameter;

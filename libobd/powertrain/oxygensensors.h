@@ -10,7 +10,7 @@ namespace obd {
 
 // An oxygen sensor. The PIDs of each kind, eight in a row, count the sensors; the place of a numbered sensor depends on
 // the arrangement of the vehicle's sensors, as the module tells it. The title of the row is the kind of the sensor.
-class OBD_EXPORT OxygenSensorBase : public TableParameter
+class OxygenSensorBase : public TableParameter
 {
 public:
     using TableParameter::TableParameter;

@@ -11,7 +11,7 @@
 namespace obd {
 
 // Which oxygen sensors a module has: a bit for each place of its arrangement.
-class OBD_EXPORT OxygenSensorsPresent : public TableParameter
+class OxygenSensorsPresent : public TableParameter
 {
 public:
     using TableParameter::TableParameter;

@@ -15,7 +15,7 @@ namespace obd {
 
 // A parameter that a row of a table tells. Decoding needs the row alone; classes that know better than their row
 // override single steps. Values may be read while another thread updates.
-class OBD_EXPORT TableParameter : public PowertrainParameter
+class TableParameter : public PowertrainParameter
 {
 public:
     // row must outlive the parameter.

@@ -7,7 +7,7 @@
 namespace obd {
 
 // The upper ends of ranges that a module may set for other PIDs. Publishes no sensors.
-class OBD_EXPORT TestEquipmentConfiguration : public PowertrainParameter
+class TestEquipmentConfiguration : public PowertrainParameter
 {
 public:
     using PowertrainParameter::PowertrainParameter;
@@ -17,7 +17,7 @@ public:
 };
 
 // PID 0x4F. Every maximum is the standard's default until the module tells another.
-class OBD_EXPORT TestEquipmentConfiguration1 : public TestEquipmentConfiguration
+class TestEquipmentConfiguration1 : public TestEquipmentConfiguration
 {
 public:
     using TestEquipmentConfiguration::TestEquipmentConfiguration;
@@ -49,7 +49,7 @@ private:
 };
 
 // PID 0x50.
-class OBD_EXPORT TestEquipmentConfiguration2 : public TestEquipmentConfiguration
+class TestEquipmentConfiguration2 : public TestEquipmentConfiguration
 {
 public:
     using TestEquipmentConfiguration::TestEquipmentConfiguration;

@@ -20,7 +20,7 @@ private:
 };
 
 // The torque that the estimated power takes at the engine's speed.
-class OBD_EXPORT Torque : public DerivedParameter
+class Torque : public DerivedParameter
 {
 public:
     // weight: of the vehicle, in kg.
