@@ -61,10 +61,6 @@ CommandReply closeProtocol(CommandContext& context, std::string const& /*argumen
 
 CommandReply header(CommandContext& context, std::string const& argument)
 {
-    constexpr std::size_t fourBytes = 8;
-    if (argument.size() == fourBytes && context.profile.level < 20) {
-        return refused();
-    }
     context.settings.header = headerBytes(argument);
     return ok();
 }

@@ -50,6 +50,10 @@ public:
 
     double volts(Time now) const;
 
+    /// The byte of ATSD, which outlasts a reset.
+    std::uint8_t savedByte() const { return m_savedByte; }
+    void saveByte(std::uint8_t byte) { m_savedByte = byte; }
+
     /// What the ignition pin tells; on without a car.
     bool ignition() const;
 
@@ -67,6 +71,7 @@ private:
     bool m_automatic = true;
     int m_storedNumber = 0;
     bool m_storedAutomatic = true;
+    std::uint8_t m_savedByte = 0;
     bool m_open = false;
     bool m_asked = false; ///< a request has been sent since the protocol was chosen
 };

@@ -271,7 +271,7 @@ bool BusWire::isSent(Frame const& frame, Settings const& settings)
 /// v2.1, page 45). Of older ones nothing is told: ours give it the whole of ATST.
 Time BusWire::pendingWait(Settings const& settings) const
 {
-    constexpr int knowsPending = 21;
+    constexpr int knowsPending = 210;
     constexpr Time whole = std::chrono::seconds(5);
     bool const heeds = isCan(m_vehicle->protocol()) || m_vehicle->protocol().family == BusFamily::Kwp;
     return m_profile.level >= knowsPending && heeds ? whole : settings.timeout();

@@ -42,7 +42,7 @@ struct Command
 {
     char const* name;
     char const* shape;
-    int level; ///< since this version of the ELM327, times ten
+    int level; ///< since this version of the ELM327, times a hundred; 131 is v1.3a, 142 v1.4b
     unsigned int families;
     CommandHandler handler;
 };

@@ -37,6 +37,14 @@ CommandReply reset(CommandContext& context, std::string const& /*argument*/)
     return {{context.profile.banner}, After::Reset, resetTime};
 }
 
+/// As a reset, without the self-test: 2 ms (ELM327 data sheet v2.1, page 7).
+CommandReply warmStart(CommandContext& context, std::string const& argument)
+{
+    CommandReply reply = reset(context, argument);
+    reply.delay = Ms(2);
+    return reply;
+}
+
 CommandReply defaults(CommandContext& context, std::string const& /*argument*/)
 {
     bool const echo = context.settings.echo;
@@ -77,6 +85,28 @@ CommandReply voltage(CommandContext& context, std::string const& /*argument*/)
 {
     auto const tenths = std::lround(context.bus.volts(context.now) * 10);
     return line(std::to_string(tenths / 10) + "." + std::to_string(tenths % 10) + "V");
+}
+
+/// Steps of 0.65536 s without a byte on the bus (ELM327 data sheet v2.1, "AMC"); ours always tells a quiet bus.
+CommandReply activityCount(CommandContext& /*context*/, std::string const& /*argument*/)
+{
+    return line("FF");
+}
+
+CommandReply activity(CommandContext& /*context*/, std::string const& /*argument*/)
+{
+    return line("N");
+}
+
+CommandReply savedByte(CommandContext& context, std::string const& /*argument*/)
+{
+    return line(hexByte(context.bus.savedByte()));
+}
+
+CommandReply saveByte(CommandContext& context, std::string const& argument)
+{
+    context.bus.saveByte(static_cast<std::uint8_t>(hexValue(argument)));
+    return ok();
 }
 
 CommandReply ignition(CommandContext& context, std::string const& /*argument*/)

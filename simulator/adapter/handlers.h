@@ -7,6 +7,7 @@ namespace obdsim::handler {
 
 CommandReply accept(CommandContext& context, std::string const& argument);
 CommandReply reset(CommandContext& context, std::string const& argument);
+CommandReply warmStart(CommandContext& context, std::string const& argument);
 CommandReply defaults(CommandContext& context, std::string const& argument);
 CommandReply identity(CommandContext& context, std::string const& argument);
 CommandReply description(CommandContext& context, std::string const& argument);
@@ -14,6 +15,10 @@ CommandReply identifier(CommandContext& context, std::string const& argument);
 CommandReply timeout(CommandContext& context, std::string const& argument);
 CommandReply adaptiveTiming(CommandContext& context, std::string const& argument);
 CommandReply voltage(CommandContext& context, std::string const& argument);
+CommandReply activityCount(CommandContext& context, std::string const& argument);
+CommandReply activity(CommandContext& context, std::string const& argument);
+CommandReply savedByte(CommandContext& context, std::string const& argument);
+CommandReply saveByte(CommandContext& context, std::string const& argument);
 CommandReply ignition(CommandContext& context, std::string const& argument);
 CommandReply parameters(CommandContext& context, std::string const& argument);
 CommandReply baudRate(CommandContext& context, std::string const& argument);

@@ -33,7 +33,7 @@ struct AdapterProfile
     std::string banner;      ///< answer to ATI, ATZ and ATWS
     std::string description; ///< answer to AT@1
     std::string identifier;  ///< answer to AT@2; empty: "?"
-    int level = 14;          ///< knows the ELM327 commands up to version level / 10
+    int level = 142;         ///< knows the ELM327 commands up to that version, see Command::level
     std::string chip;        ///< answer to STI
     Quirks quirks;
     AdapterTiming timing = {};

@@ -1,0 +1,80 @@
+// Commands by the version of the ELM327 that brought them, and the guide's table of them.
+#include "simulator/adapter/handlers.h"
+#include "tests/simulator/conversation.h"
+
+#include <gtest/gtest.h>
+
+#include <fstream>
+#include <sstream>
+
+namespace {
+
+struct LevelCase
+{
+    char const* command; ///< without AT
+    int level;
+};
+
+TEST(Level, commandsAreKnownFromTheirVersionOn)
+{
+    const LevelCase cases[] = {
+        {"KW1", 120},  {"IFR2", 120}, {"D0", 130},   {"CRA7E8", 130}, {"JE", 130},         {"FE", 131},
+        {"SS", 140},   {"RD", 140},   {"SD12", 140}, {"IB48", 140},   {"CSM1", 142},       {"JHF0", 142},
+        {"CRA", 142},  {"JTM1", 142}, {"AMC", 200},  {"AMT20", 200},  {"SH18DA10F1", 200}, {"CRA7XX", 200},
+        {"CTM1", 210}, {"IFR5", 220}, {"IB12", 220}, {"CER01", 220},  {"FT", 220},         {"C1", 230},
+    };
+    obdsim::AdapterProfile profile = *obdsim::findProfile("elm327-v2.3");
+    for (auto const& row : cases) {
+        profile.level = row.level;
+        EXPECT_TRUE(obdsim::findCommand(profile, row.command)) << row.command;
+        profile.level = row.level - 1;
+        EXPECT_FALSE(obdsim::findCommand(profile, row.command)) << row.command;
+    }
+}
+
+TEST(Level, savedByteAndWarmStart)
+{
+    auto host = unplugged("elm327-v2.3");
+    EXPECT_EQ(host.ask({"ATE0", "ATSD7F", "ATZ", "ATE0", "ATRD"}), "7F\r\r>");
+    host.ask("ATWS");
+    EXPECT_LT(host.lastWait(), obdsim::Ms(10));
+    EXPECT_EQ(host.ask({"ATE0", "ATAMC"}), "FF\r\r>");
+}
+
+/// "v1.3a" as a level.
+int levelOf(std::string const& version)
+{
+    int const number = (version[1] - '0') * 100 + (version[3] - '0') * 10;
+    return number + (version.size() < 5 ? 0 : version[4] == 'a' ? 1 : 2);
+}
+
+TEST(Level, guideTellsEachCommandAndItsVersion)
+{
+    std::ifstream file(VELMORA_SOURCE_DIR "/docs/simulator.md");
+    int rows = 0;
+    for (std::string line; std::getline(file, line);) {
+        std::istringstream cells(line);
+        std::string nothing;
+        std::string version;
+        std::string samples;
+        std::getline(cells, nothing, '|');
+        std::getline(cells, version, '|');
+        std::getline(cells, samples);
+        if (version.size() < 5 || version.substr(0, 2) != " v" || samples.find("`AT") == std::string::npos) {
+            continue;
+        }
+        int const level = levelOf(version.substr(1, version.size() - 2));
+        obdsim::AdapterProfile profile = *obdsim::findProfile("elm327-v2.3");
+        for (auto at = samples.find("`AT"); at != std::string::npos; at = samples.find("`AT", at + 1)) {
+            const std::string command = samples.substr(at + 3, samples.find('`', at + 1) - at - 3);
+            profile.level = level;
+            EXPECT_TRUE(obdsim::findCommand(profile, command)) << line << ": " << command;
+            profile.level = level - 1;
+            EXPECT_FALSE(level > 100 && obdsim::findCommand(profile, command)) << line << ": " << command;
+            ++rows;
+        }
+    }
+    EXPECT_GE(rows, 90) << "the table of commands";
+}
+
+} // namespace
