@@ -99,7 +99,8 @@ std::ostream& operator<<(std::ostream& out, FreezeReport const& report)
     if (report.frame) {
         return out << *report.frame;
     }
-    return out << "frame " << report.number << (report.answered ? ": none stored" : ": no answer");
+    return out << "frame " << report.number << ": "
+               << (report.answer == TopicAnswer::Read ? "none stored" : answerWord(report.answer));
 }
 
 std::ostream& operator<<(std::ostream& out, ReadinessMonitor const& monitor)

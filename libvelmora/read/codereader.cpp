@@ -1,55 +1,40 @@
 #include "libvelmora/read/codereader.h"
 
-#include <utility>
+#include "libvelmora/read/topicanswer.h"
 
 namespace velmora {
 
 namespace {
 
-constexpr unsigned int codesLimitMs = 1500;
+using Codes = obd::Outcome<std::vector<std::shared_ptr<obd::DtcDataModel>>>;
 
-struct KindRow
+Codes ask(obd::ITroubleCodeService& service, CodeKind kind)
 {
-    unsigned char service;
-    std::vector<std::shared_ptr<obd::DtcDataModel>> (obd::ITroubleCodeService::*fetch)();
-};
-
-KindRow const& row(CodeKind kind)
-{
-    static constexpr KindRow rows[] = {
-        {0x03, &obd::ITroubleCodeService::fetchConfirmedCodes},
-        {0x07, &obd::ITroubleCodeService::fetchPendingCodes},
-        {0x0A, &obd::ITroubleCodeService::fetchPermanentCodes},
+    static constexpr Codes (obd::ITroubleCodeService::*operations[])() = {
+        &obd::ITroubleCodeService::askConfirmedCodes,
+        &obd::ITroubleCodeService::askPendingCodes,
+        &obd::ITroubleCodeService::askPermanentCodes,
     };
-    return rows[static_cast<int>(kind)];
-}
-
-CodeList withoutCodes(CodeKind kind, ServiceReply const& reply, obd::ObdProtocol protocol)
-{
-    switch (reply.kind) {
-    case ServiceReply::Kind::Silent:
-        return {kind, CodeList::Answer::Silent, {}, {}};
-    case ServiceReply::Kind::Refused:
-        return {kind, CodeList::Answer::Refused, reply.reason, {}};
-    case ServiceReply::Kind::Positive:
-        if (isCodeListReply(reply.bytes, protocol)) {
-            return {kind, CodeList::Answer::Read, {}, {}};
-        }
-        break;
-    case ServiceReply::Kind::Foreign:
-        break;
-    }
-    return {kind, CodeList::Answer::Unreadable, {}, {}};
+    return (service.*operations[static_cast<int>(kind)])();
 }
 
 } // namespace
 
-bool isCodeListReply(std::vector<unsigned char> const& bytes, obd::ObdProtocol protocol)
+CodeList toCodeList(CodeKind kind, Codes const& outcome)
 {
-    if (protocol == obd::ObdProtocolCan11 || protocol == obd::ObdProtocolCan29) {
-        return bytes.size() >= 2 && bytes.size() >= 2U + 2U * bytes[1];
+    switch (toAnswer(outcome)) {
+    case TopicAnswer::Read:
+        return {kind, CodeList::Answer::Read, {}, groupByCode(outcome.value)};
+    case TopicAnswer::Refused:
+        return {kind, CodeList::Answer::Refused, refusalText(outcome.code), {}};
+    case TopicAnswer::NotOffered: // which for a list of codes a module tells by its refusal
+        return {kind, CodeList::Answer::Refused, refusalText(outcome.code), {}, false};
+    case TopicAnswer::Unreadable:
+        return {kind, CodeList::Answer::Unreadable, {}, {}};
+    case TopicAnswer::Silent:
+        break;
     }
-    return !bytes.empty() && (bytes.size() % 7 == 0 || bytes.size() % 8 == 0);
+    return {kind, CodeList::Answer::Silent, {}, {}};
 }
 
 CodeReader::CodeReader(Session& session)
@@ -60,35 +45,17 @@ CodeReport CodeReader::read(obd::IEcu const& ecu, std::vector<CodeKind> const& k
 {
     m_session.select(ecu);
     CodeReport report;
-    auto const lamp = m_service->fetchMilStatus();
+    auto const lamp = m_service->askMilStatus();
     m_session.check();
-    if (lamp != nullptr) {
-        report.lamp = *lamp == obd::ITroubleCodeService::MilStatus::On;
+    report.lampAnswer = toAnswer(lamp);
+    if (lamp.value != nullptr) {
+        report.lamp = *lamp.value == obd::ITroubleCodeService::MilStatus::On;
     }
     for (CodeKind const kind : kinds) {
-        report.lists.push_back(readList(ecu, kind));
+        report.lists.push_back(toCodeList(kind, ask(*m_service, kind)));
         m_session.check();
     }
     return report;
-}
-
-CodeList CodeReader::readList(obd::IEcu const& ecu, CodeKind kind)
-{
-    auto const models = (m_service.get()->*row(kind).fetch)();
-    if (!models.empty()) {
-        return {kind, CodeList::Answer::Read, {}, groupByCode(models)};
-    }
-    m_session.check();
-    return withoutCodes(kind, reply(ecu, kind), ecu.protocol());
-}
-
-ServiceReply CodeReader::reply(obd::IEcu const& ecu, CodeKind kind)
-{
-    auto found = m_replies.find(kind);
-    if (found == m_replies.end()) {
-        found = m_replies.emplace(kind, ServiceReplies(*m_session.proxy(), row(kind).service, codesLimitMs)).first;
-    }
-    return found->second.of(ecu.id());
 }
 
 } // namespace velmora

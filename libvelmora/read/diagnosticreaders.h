@@ -14,15 +14,11 @@
 
 namespace velmora {
 
-// Whether the module reports PID 0x01.
-bool tellsReadiness(obd::IEcu const& ecu);
 ReadinessReport readReadiness(Session& session, obd::IEcu const& ecu);
 // Asks once for each monitor, which takes seconds.
 MonitorsReport readMonitors(Session& session, obd::IEcu const& ecu);
 OxygenReport readOxygen(Session& session, obd::IEcu const& ecu);
 CountersReport readCounters(Session& session, obd::IEcu const& ecu);
-// What a reply of service 09 means that gave no counters. The legacy buses' check bytes hide which are 0.
-TopicAnswer judgeWithoutCounters(std::vector<unsigned char> const& reply, obd::ObdProtocol protocol);
 InfoReport readInfo(Session& session, obd::IEcu const& ecu);
 // The vehicle identification number; empty if the module does not tell it.
 std::string readVin(Session& session, obd::IEcu const& ecu);

@@ -1,6 +1,7 @@
 #include "libvelmora/read/freezereader.h"
 
 #include "libvelmora/read/oxygencurrent.h"
+#include "libvelmora/read/topicanswer.h"
 #include "libvelmora/report/unitlabel.h"
 
 #include <obd/itroublecodeservice.h>
@@ -22,33 +23,37 @@ TroubleCode explain(obd::DtcDataModel const& model)
     return groupByCode(obd::TroubleCodeCatalogue::getTroubleCodes(model.code)).front();
 }
 
-std::optional<FreezeFrame> readFrame(Session& session, obd::ITroubleCodeService& service, unsigned char frame)
+void addReadings(Session& session, obd::ITroubleCodeService& service, unsigned char frame,
+                 std::vector<obd::ParameterIdentifier::Id> const& pids, FreezeFrame& found)
 {
-    std::vector<obd::ParameterIdentifier::Id> const pids = service.fetchFreezeFramePids(frame);
-    auto const code = pids.empty() ? nullptr : service.fetchFreezeFrameTroubleCode(frame);
-    session.check();
-    if (code == nullptr) {
-        return std::nullopt;
-    }
-    FreezeFrame found{explain(*code), {}};
     for (obd::ParameterIdentifier::Id const pid : pids) {
-        for (auto const& sensor : service.fetchFreezeFrameSensors(frame, pid)) {
+        for (auto const& sensor : service.askFreezeFrameSensors(frame, pid).value) {
             found.readings.push_back(toReading(*sensor));
         }
         session.check();
     }
-    return found;
 }
 
 } // namespace
 
+// A frame without a code holds nothing; of one whose code was not told nobody knows.
 FreezeReport readFreeze(Session& session, obd::IEcu const& ecu, unsigned char frame)
 {
     session.select(ecu);
     auto const service = obd::TroubleCodeServiceBuilder::createTroubleCodeService();
-    FreezeReport report{frame, false, readFrame(session, *service, frame)};
-    report.answered = !ecu.supportedIds(obd::ObdMode::FreezeFrame, frame).empty();
-    return report;
+    auto const pids = service->askFreezeFramePids(frame);
+    session.check();
+    if (pids.kind != obd::OutcomeKind::Answered) {
+        return {frame, toAnswer(pids), std::nullopt};
+    }
+    auto const code = service->askFreezeFrameTroubleCode(frame);
+    session.check();
+    if (code.value == nullptr) {
+        return {frame, toAnswer(code), std::nullopt};
+    }
+    FreezeFrame found{explain(*code.value), {}};
+    addReadings(session, *service, frame, pids.value, found);
+    return {frame, TopicAnswer::Read, std::move(found)};
 }
 
 } // namespace velmora

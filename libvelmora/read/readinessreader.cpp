@@ -1,4 +1,5 @@
 #include "libvelmora/read/diagnosticreaders.h"
+#include "libvelmora/read/topicanswer.h"
 
 #include <obd/idiagnosticsservice.h>
 #include <obd/itroublecodeservice.h>
@@ -20,34 +21,26 @@ std::optional<ReadinessStatus> statusOf(Monitors const& monitors, std::string co
 
 std::optional<bool> readLamp()
 {
-    auto const lamp = obd::TroubleCodeServiceBuilder::createTroubleCodeService()->fetchMilStatus();
+    auto const lamp = obd::TroubleCodeServiceBuilder::createTroubleCodeService()->askMilStatus().value;
     return lamp != nullptr ? std::optional(*lamp == obd::ITroubleCodeService::MilStatus::On) : std::nullopt;
 }
 
 } // namespace
 
-bool tellsReadiness(obd::IEcu const& ecu)
-{
-    return ecu.isSupported(obd::ObdMode::CurrentData, 0x01, 0);
-}
-
 ReadinessReport readReadiness(Session& session, obd::IEcu const& ecu)
 {
     session.select(ecu);
-    if (!tellsReadiness(ecu)) {
-        return {};
-    }
     auto const service = obd::DiagnosticsServiceBuilder::create();
-    Monitors const sinceCleared = service->fetchReadinessMonitors();
+    auto const sinceCleared = service->askReadinessMonitors();
     session.check();
-    if (sinceCleared.empty()) {
-        return {TopicAnswer::Silent, {}, {}};
+    if (!sinceCleared.isTold()) {
+        return {toAnswer(sinceCleared), {}, {}};
     }
     ReadinessReport report{TopicAnswer::Read, readLamp(), {}};
     session.check();
-    Monitors const thisCycle = service->fetchReadinessMonitorsThisCycle();
+    Monitors const thisCycle = service->askReadinessMonitorsThisCycle().value;
     session.check();
-    for (auto const& monitor : sinceCleared) {
+    for (auto const& monitor : sinceCleared.value) {
         report.monitors.push_back({monitor->description, monitor->status, statusOf(thisCycle, monitor->description)});
     }
     return report;

@@ -1,8 +1,6 @@
 #include "libvelmora/read/servicereplies.h"
 
-#include <obd/nack.h>
-
-#include <fmt/format.h>
+#include "libvelmora/read/topicanswer.h"
 
 #include <utility>
 
@@ -11,16 +9,6 @@ namespace velmora {
 namespace {
 
 constexpr unsigned char negative = 0x7F;
-
-std::string describe(unsigned char responseCode)
-{
-    std::string text = obd::NackToString(static_cast<obd::Nack>(responseCode));
-    if (text == "Unknown") {
-        return fmt::format("response code {:02X}", responseCode);
-    }
-    text.front() = static_cast<char>(text.front() - 'A' + 'a');
-    return fmt::format("{} ({:02X})", text, responseCode);
-}
 
 } // namespace
 
@@ -45,7 +33,7 @@ ServiceReply ServiceReplies::of(unsigned int ecu) const
         return {ServiceReply::Kind::Positive, bytes, {}};
     }
     if (bytes[0] == negative && bytes.size() >= 3 && bytes[1] == m_service) {
-        return {ServiceReply::Kind::Refused, bytes, describe(bytes[2])};
+        return {ServiceReply::Kind::Refused, bytes, refusalText(bytes[2])};
     }
     return {ServiceReply::Kind::Foreign, bytes, {}};
 }

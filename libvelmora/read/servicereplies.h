@@ -24,8 +24,8 @@ struct ServiceReply
     std::string reason;               // of a refusal, such as "conditions not correct (22)"
 };
 
-// Asks a service that takes no parameters, once, of all control modules. The services of the library tell what was
-// read; this tells why nothing was. Blocks.
+// Asks a service that takes no parameters, once, of all control modules, where one request changes all of them: the
+// services of the library tell of the current module alone. Blocks.
 class ServiceReplies
 {
 public:

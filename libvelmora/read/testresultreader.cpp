@@ -1,9 +1,9 @@
 #include "libvelmora/read/diagnosticreaders.h"
+#include "libvelmora/read/topicanswer.h"
 #include "libvelmora/report/unitlabel.h"
 
 #include <obd/idiagnosticsservice.h>
-
-#include <algorithm>
+#include <obd/protocolfamily.h>
 
 namespace velmora {
 
@@ -32,27 +32,14 @@ OnBoardMonitor toMonitor(obd::DiagnosticMonitorDataModel const& model)
     return monitor;
 }
 
-// The tests 01 to 04 of service 05 are thresholds that the module works with, not results (SAE J1979).
-bool isConstant(int tid)
-{
-    return tid >= 0x01 && tid <= 0x04;
-}
-
 LimitTest toTest(obd::OxygenSensorMonitorDataModel const& model)
 {
     std::string const unit = unitLabel(model.unit);
-    if (isConstant(model.tid)) {
+    if (obd::isConstantTest(model.tid)) {
         return {model.tid, model.description, model.value, {}, {}, unit, LimitTest::Verdict::None};
     }
     LimitTest::Verdict const verdict = model.status == 0 ? LimitTest::Verdict::Passed : LimitTest::Verdict::Failed;
     return {model.tid, model.description, model.value, model.minimum, model.maximum, unit, verdict};
-}
-
-bool offersMonitorTests(obd::IEcu const& ecu)
-{
-    std::vector<unsigned char> const ids = ecu.supportedIds(obd::ObdMode::MonitorTests, 0);
-    // Those that end a range only tell of the next one.
-    return std::any_of(ids.begin(), ids.end(), [](unsigned char id) { return (id & 0x1FU) != 0; });
 }
 
 } // namespace
@@ -60,15 +47,12 @@ bool offersMonitorTests(obd::IEcu const& ecu)
 MonitorsReport readMonitors(Session& session, obd::IEcu const& ecu)
 {
     session.select(ecu);
-    if (!offersMonitorTests(ecu)) {
-        return {};
-    }
-    MonitorsReport report{TopicAnswer::Silent, {}};
-    for (auto const& monitor : obd::DiagnosticsServiceBuilder::create()->fetchMonitorTests()) {
-        report.answer = TopicAnswer::Read;
+    auto const outcome = obd::DiagnosticsServiceBuilder::create()->askMonitorTests();
+    session.check();
+    MonitorsReport report{toAnswer(outcome), {}};
+    for (auto const& monitor : outcome.value) {
         report.monitors.push_back(toMonitor(*monitor));
     }
-    session.check();
     return report;
 }
 
@@ -82,15 +66,15 @@ OxygenReport readOxygen(Session& session, obd::IEcu const& ecu)
     }
     OxygenReport report;
     report.answer = TopicAnswer::Read;
-    report.onCan = ecu.protocol() == obd::ObdProtocolCan11 || ecu.protocol() == obd::ObdProtocolCan29;
-    // Whether the monitor has run means nothing of a module that does not tell what monitors it has.
-    if (tellsReadiness(ecu) && !service->fetchReadinessMonitors().empty()) {
-        report.complete = service->isOxygenSensorTestComplete();
+    report.onCan = obd::isCan(ecu.protocol());
+    auto const complete = service->askOxygenSensorTestComplete();
+    if (complete.kind == obd::OutcomeKind::Answered) {
+        report.complete = complete.value;
     }
     for (obd::OxygenSensorLocation const location : locations) {
         session.check();
         OxygenSensor sensor{location, {}};
-        for (auto const& test : service->fetchOxygenSensorTests(location)) {
+        for (auto const& test : service->askOxygenSensorTests(location).value) {
             sensor.tests.push_back(toTest(*test));
         }
         report.sensors.push_back(std::move(sensor));

@@ -3,9 +3,11 @@
 #include "libvelmora/read/codereader.h"
 #include "libvelmora/read/diagnosticreaders.h"
 #include "libvelmora/read/freezereader.h"
+#include "libvelmora/read/topicanswer.h"
 #include "libvelmora/text/text.h"
 
 #include <obd/iecu.h>
+#include <obd/sensorpids.h>
 
 #include <fmt/format.h>
 
@@ -38,16 +40,11 @@ AdapterReport readAdapter(Session& session)
             volts > 0.0F ? std::optional(volts) : std::nullopt};
 }
 
-bool isSensor(unsigned char id)
-{
-    return (id & 0x1F) != 0 && id > 0x02;
-}
-
 std::vector<unsigned int> sensorsOf(obd::IEcu const& ecu)
 {
     std::vector<unsigned int> sensors;
     for (unsigned char const id : ecu.supportedIds(obd::ObdMode::CurrentData, 0)) {
-        if (isSensor(id)) {
+        if (obd::isSensor(id)) {
             sensors.push_back(id);
         }
     }
@@ -66,7 +63,8 @@ ModuleReport readModule(Session& session, obd::IEcu const& ecu, CodeReader& read
             readReadiness(session, ecu),
             readMonitors(session, ecu),
             readOxygen(session, ecu),
-            readCounters(session, ecu)};
+            readCounters(session, ecu),
+            toAnswer(ecu.detection(obd::ObdMode::CurrentData, 0))};
 }
 
 void giveMeanings(VehicleReport& report, std::string const& named)

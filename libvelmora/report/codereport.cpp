@@ -67,6 +67,20 @@ bool canBeChecked(CodeReport const& report)
            });
 }
 
+std::vector<std::string> untold(CodeReport const& report)
+{
+    std::vector<std::string> list;
+    if (!report.lamp && report.lampAnswer != TopicAnswer::NotOffered) {
+        list.emplace_back("lamp");
+    }
+    for (CodeList const& codes : report.lists) {
+        if (codes.kind == CodeKind::Confirmed && codes.answer != CodeList::Answer::Read && codes.offered) {
+            list.emplace_back("confirmed codes");
+        }
+    }
+    return list;
+}
+
 Json toJsonValue(CodeReport const& report)
 {
     Json document = {{"lamp", valueOrNull(report.lamp)}, {"maker", toJson(report.maker)}};

@@ -1,5 +1,7 @@
 #include "libvelmora/report/findings.h"
 
+#include <fmt/format.h>
+
 #include <algorithm>
 #include <array>
 
@@ -81,8 +83,12 @@ void addReadiness(std::vector<Finding>& list, ModuleReport const& module)
 // Silence is no sign of health.
 void addUntold(std::vector<Finding>& list, ModuleReport const& module)
 {
-    if (!canBeChecked(module.codes)) {
-        list.push_back({Severity::Warning, nameOf(module), "not told", "lamp and confirmed codes"});
+    std::vector<std::string> topics = untold(module.codes);
+    if (!toldOffers(module)) {
+        topics.push_back(fmt::format("all that it supports ({})", answerWord(module.offers)));
+    }
+    if (!topics.empty()) {
+        list.push_back({Severity::Warning, nameOf(module), "not told", fmt::format("{}", fmt::join(topics, " and "))});
     }
 }
 

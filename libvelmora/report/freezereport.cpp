@@ -26,7 +26,8 @@ void applyMaker(FreezeReport& report, MakerChoice const& maker)
 Json toJsonValue(FreezeReport const& report)
 {
     return {{"frame", report.number},
-            {"answered", report.answered},
+            {"answered", hasAnswer(report)},
+            {"answer", answerWord(report.answer)},
             {"freeze", report.frame ? toJsonValue(*report.frame) : Json(nullptr)}};
 }
 

@@ -15,10 +15,10 @@ void applyMaker(FreezeReport& report, MakerChoice const& maker);
 
 inline bool hasAnswer(FreezeReport const& report)
 {
-    return report.answered;
+    return report.answer == TopicAnswer::Read;
 }
 
-// "frame", "answered" and "freeze", which is null for a frame that holds nothing.
+// "frame", "answered", "answer" and "freeze", which is null for a frame that holds nothing.
 Json toJsonValue(FreezeReport const& report);
 
 } // namespace velmora

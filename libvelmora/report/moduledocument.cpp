@@ -108,7 +108,7 @@ DocumentSection codeSection(CodeReport const& report)
 
 std::optional<DocumentSection> freezeSection(FreezeReport const& report)
 {
-    if (!report.answered) {
+    if (!hasAnswer(report)) {
         return std::nullopt;
     }
     DocumentSection section{2, fmt::format("{} {}", texts::freezeFrame, report.number), {}};

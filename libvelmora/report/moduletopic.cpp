@@ -4,7 +4,7 @@ namespace velmora {
 
 char const* answerWord(TopicAnswer answer)
 {
-    static constexpr char const* words[] = {"read", "not supported", "no answer", "unreadable"};
+    static constexpr char const* words[] = {"read", "not supported", "no answer", "unreadable", "refused"};
     return words[static_cast<int>(answer)];
 }
 

@@ -13,7 +13,7 @@
 
 namespace velmora {
 
-// "read", "not supported", "no answer" or "unreadable".
+// "read", "not supported", "no answer", "unreadable" or "refused".
 char const* answerWord(TopicAnswer answer);
 
 template <typename Report>

@@ -21,7 +21,20 @@ namespace velmora::cli {
 
 namespace {
 
-// A car that tells none of its codes is not known to be free of them.
+// The modules that have a lamp or confirmed codes and did not tell them, as "7E8 lamp and confirmed codes".
+std::string listUntold(VehicleReport const& report)
+{
+    std::string text;
+    for (ModuleReport const& module : report.modules) {
+        std::vector<std::string> const topics = untold(module.codes);
+        if (!topics.empty()) {
+            text += fmt::format("{}{:X} {}", text.empty() ? "" : "; ", module.id, fmt::join(topics, " and "));
+        }
+    }
+    return text;
+}
+
+// A car that does not tell all of its codes is not known to be free of them.
 ExitCode check(VehicleReport const& report)
 {
     auto const anyModule = [&report](bool (*holds)(CodeReport const&)) {
@@ -30,6 +43,12 @@ ExitCode check(VehicleReport const& report)
     };
     if (anyModule(hasFindings)) {
         return ExitCode::Findings;
+    }
+    std::string const missing = listUntold(report);
+    if (!missing.empty()) {
+        flushOutput();
+        throw Error(ErrorKind::Failed, "Nothing was found, but not all was told: " + missing,
+                    {"is the ignition on?", "try again: a reply may have been lost on the bus"});
     }
     if (!anyModule(canBeChecked)) {
         flushOutput();

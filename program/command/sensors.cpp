@@ -1,5 +1,6 @@
 #include "libvelmora/read/oxygencurrent.h"
 #include "libvelmora/read/offeredpids.h"
+#include "libvelmora/read/topicanswer.h"
 #include "libvelmora/report/json.h"
 #include "libvelmora/report/unitlabel.h"
 #include "libvelmora/text/text.h"
@@ -11,6 +12,7 @@
 
 #include <obd/iecu.h>
 #include <obd/iecuservice.h>
+#include <obd/sensorpids.h>
 
 #include <fmt/format.h>
 
@@ -38,7 +40,7 @@ std::vector<std::string> identifiers(obd::IEcu const& ecu, obd::ObdMode mode)
 {
     std::vector<std::string> texts;
     for (unsigned char const id : ecu.supportedIds(mode, 0)) {
-        if ((id & 0x1F) != 0) {
+        if (!obd::isSupportMask(id)) {
             texts.push_back(fmt::format("{:02X}", id));
         }
     }
@@ -93,6 +95,15 @@ std::string offerText(Offer const& offer, bool all)
     return text;
 }
 
+// Why a set may lack what the module has; empty if it was read.
+std::string whyUnknown(obd::IEcu const& ecu, obd::ObdMode mode)
+{
+    TopicAnswer const answer = toAnswer(ecu.detection(mode, 0));
+    return answer == TopicAnswer::Silent || answer == TopicAnswer::Unreadable
+               ? fmt::format(" (not known in full: {})", answerWord(answer))
+               : std::string();
+}
+
 // What the module offers and the library does not decode.
 std::vector<unsigned char> undecoded(obd::IEcu const& ecu, OfferedPids const& offered)
 {
@@ -111,7 +122,8 @@ std::string toText(obd::IEcu const& ecu, OfferedPids const& offered, bool all)
         fmt::format("Control module {:X}: {} ({})\n", ecu.id(), readable(ecu.name()), readable(ecu.description()));
     for (Service const& service : services) {
         std::vector<std::string> const ids = identifiers(ecu, service.mode);
-        text += fmt::format("  {:<24} {}\n", service.title, ids.empty() ? "-" : fmt::format("{}", fmt::join(ids, " ")));
+        text += fmt::format("  {:<24} {}{}\n", service.title,
+                            ids.empty() ? "-" : fmt::format("{}", fmt::join(ids, " ")), whyUnknown(ecu, service.mode));
     }
     text += "\n";
     for (Offer const& offer : offers(all)) {

@@ -23,7 +23,8 @@ std::string toText(FreezeReport const& report, Style const& style)
     if (report.frame) {
         return labelledLine("Freeze frame", number) + frameText(*report.frame, style);
     }
-    return labelledLine("Freeze frame", number + (report.answered ? ": none stored" : ": no answer"));
+    return labelledLine("Freeze frame",
+                        number + ": " + (hasAnswer(report) ? "none stored" : answerWord(report.answer)));
 }
 
 } // namespace velmora::cli

@@ -39,7 +39,14 @@ struct ModuleReport
     MonitorsReport monitors;
     OxygenReport oxygen;
     CountersReport counters;
+    TopicAnswer offers = TopicAnswer::Read; ///< how asking for what it supports of service 01 went
 };
+
+/// Whether the module told all that it supports: else what is missing in its sets may only not have been read.
+inline bool toldOffers(ModuleReport const& module)
+{
+    return module.offers == TopicAnswer::Read;
+}
 
 /// All that a vehicle told, as Car::report gives it. Plain data: copy it, keep it, hand it to any thread.
 struct VehicleReport

@@ -1,7 +1,7 @@
 #pragma once
 
 #include <obd/oxygensensorlocation.h>
-#include <obd/readinessmonitordatamodel.h>
+#include <obd/diagnosticdatamodels.h>
 #include <velmora/export.h>
 #include <velmora/troublecode.h>
 
@@ -11,15 +11,6 @@
 #include <vector>
 
 namespace velmora {
-
-/// Whether a control module told of a topic.
-enum class TopicAnswer
-{
-    Read,
-    NotOffered, ///< by what the module says it supports, so that it was not asked
-    Silent,
-    Unreadable, ///< it answered in a form that can't be decoded
-};
 
 /// What one control module told of one topic.
 template <typename Report>
@@ -99,7 +90,7 @@ struct FreezeFrame
 struct FreezeReport
 {
     unsigned int number;
-    bool answered; ///< whether the module told what its frame holds
+    TopicAnswer answer; ///< whether the module told what its frame holds
     std::optional<FreezeFrame> frame;
 };
 
@@ -167,7 +158,7 @@ struct InfoReport
     Travel sinceCleared;
 };
 
-/// "read", "not supported", "no answer" or "unreadable".
+/// "read", "not supported", "no answer", "unreadable" or "refused".
 VELMORA_EXPORT std::ostream& operator<<(std::ostream& out, TopicAnswer answer);
 /// "passed: Catalyst efficiency 0.4 (0 to 1) V"
 VELMORA_EXPORT std::ostream& operator<<(std::ostream& out, LimitTest const& test);

@@ -9,6 +9,16 @@
 
 namespace velmora {
 
+/// Whether a control module told of a topic.
+enum class TopicAnswer
+{
+    Read,
+    NotOffered, ///< by what the module says it supports, so that it was not asked
+    Silent,
+    Unreadable, ///< it answered in a form that can't be decoded
+    Refused,    ///< by a negative reply
+};
+
 /// One trouble code as people read it: all its meanings together.
 struct TroubleCode
 {
@@ -75,6 +85,7 @@ struct CodeList
     Answer answer;
     std::string reason; ///< of a refusal
     std::vector<TroubleCode> codes;
+    bool offered = true; ///< false if the refusal says that the module does not have the list
 };
 
 /// Lamp and trouble codes of one control module.
@@ -82,7 +93,8 @@ struct CodeReport
 {
     std::optional<bool> lamp; ///< whether the malfunction indicator is on
     std::vector<CodeList> lists;
-    MakerChoice maker = {}; ///< whose meanings the codes are given
+    MakerChoice maker = {};                       ///< whose meanings the codes are given
+    TopicAnswer lampAnswer = TopicAnswer::Silent; ///< why there is no lamp, where there is none
 };
 
 /// "confirmed", "pending" or "permanent".

@@ -1,12 +1,13 @@
 #include "libvelmora/read/codereader.h"
 #include "libvelmora/read/servicereplies.h"
+#include "libvelmora/read/topicanswer.h"
 
 #include <gtest/gtest.h>
 
 namespace {
 
-using velmora::isCodeListReply;
 using velmora::ServiceReplies;
+using velmora::toAnswer;
 using Kind = velmora::ServiceReply::Kind;
 
 TEST(ServiceReplies, TellsWhatEachModuleSaid)
@@ -28,16 +29,42 @@ TEST(ServiceReplies, TellsWhatEachModuleSaid)
     EXPECT_EQ(replies.answering().size(), 6U);
 }
 
-TEST(ServiceReplies, CodeListHoldsAsManyCodesAsItSays)
+TEST(TopicAnswers, KeepSilenceRefusalAndUnreadableApart)
 {
-    EXPECT_TRUE(isCodeListReply({0x43, 0x00}, obd::ObdProtocolCan11));
-    EXPECT_TRUE(isCodeListReply({0x43, 0x01, 0x01, 0x33}, obd::ObdProtocolCan29));
-    EXPECT_FALSE(isCodeListReply({0x43}, obd::ObdProtocolCan11));
-    EXPECT_FALSE(isCodeListReply({0x43, 0x02, 0x01, 0x33}, obd::ObdProtocolCan11));
-    EXPECT_TRUE(isCodeListReply({0x43, 0, 0, 0, 0, 0, 0}, obd::ObdProtocolIso9141));
-    EXPECT_TRUE(isCodeListReply({0x43, 0, 0, 0, 0, 0, 0, 0x12}, obd::ObdProtocolJ1850));
-    EXPECT_FALSE(isCodeListReply({0x43, 0x00}, obd::ObdProtocolIso14230));
-    EXPECT_FALSE(isCodeListReply({}, obd::ObdProtocolIso14230));
+    using obd::OutcomeKind;
+    using velmora::TopicAnswer;
+    EXPECT_EQ(toAnswer({OutcomeKind::Answered}), TopicAnswer::Read);
+    EXPECT_EQ(toAnswer({OutcomeKind::NothingStored}), TopicAnswer::Read);
+    EXPECT_EQ(toAnswer({OutcomeKind::ModuleSilent}), TopicAnswer::Silent);
+    EXPECT_EQ(toAnswer({OutcomeKind::Refused, 0x22}), TopicAnswer::Refused);
+    EXPECT_EQ(toAnswer({OutcomeKind::Unreadable}), TopicAnswer::Unreadable);
+    EXPECT_EQ(toAnswer({OutcomeKind::NotConnected}), TopicAnswer::Silent);
+    EXPECT_EQ(toAnswer({OutcomeKind::NotOffered, 0x11}), TopicAnswer::NotOffered);
+    EXPECT_EQ(velmora::refusalText(0x22), "conditions not correct (22)");
+    EXPECT_EQ(velmora::refusalText(0xA5), "response code A5");
+    EXPECT_EQ(velmora::refusalText(0), "");
+}
+
+TEST(CodeLists, AreEmptyOnlyIfTheModuleSaysSo)
+{
+    using obd::OutcomeKind;
+    using Answer = velmora::CodeList::Answer;
+    using Codes = obd::Outcome<std::vector<std::shared_ptr<obd::DtcDataModel>>>;
+    auto const answer = [](obd::Verdict const& verdict) {
+        return toCodeList(velmora::CodeKind::Confirmed, Codes(verdict)).answer;
+    };
+    EXPECT_EQ(answer({OutcomeKind::NothingStored}), Answer::Read);
+    EXPECT_EQ(answer({OutcomeKind::ModuleSilent}), Answer::Silent);
+    EXPECT_EQ(answer({OutcomeKind::Unreadable}), Answer::Unreadable);
+    EXPECT_EQ(answer({OutcomeKind::Refused, 0x22}), Answer::Refused);
+    auto const model = std::make_shared<obd::DtcDataModel>("P0133", "Slow", "Powertrain", "Generic");
+    velmora::CodeList const list = toCodeList(velmora::CodeKind::Confirmed, Codes({OutcomeKind::Answered}, {model}));
+    ASSERT_EQ(list.codes.size(), 1U);
+    EXPECT_EQ(list.codes[0].code, "P0133");
+    velmora::CodeList const lacking = toCodeList(velmora::CodeKind::Permanent, Codes({OutcomeKind::NotOffered, 0x11}));
+    EXPECT_EQ(lacking.answer, Answer::Refused);
+    EXPECT_EQ(lacking.reason, "service not supported (11)");
+    EXPECT_FALSE(lacking.offered);
 }
 
 } // namespace

@@ -26,7 +26,8 @@ ModuleReport richModule()
                     {{CodeKind::Confirmed, CodeList::Answer::Read, {}, {code}},
                      {CodeKind::Pending, CodeList::Answer::Silent, {}, {}},
                      {CodeKind::Permanent, CodeList::Answer::Refused, "service not supported (11)", {}}}};
-    module.freeze = {0, true, FreezeFrame{code, {{"Engine RPM", "1726", "rpm"}, {"Speed", std::nullopt, "km/h"}}}};
+    module.freeze = {0, TopicAnswer::Read,
+                     FreezeFrame{code, {{"Engine RPM", "1726", "rpm"}, {"Speed", std::nullopt, "km/h"}}}};
     module.readiness = {TopicAnswer::Read, true, {{"Catalyst", ReadinessStatus::NotComplete, {}}}};
     module.monitors.answer = TopicAnswer::Read;
     module.monitors.monitors = {

@@ -1,4 +1,3 @@
-#include "libvelmora/read/diagnosticreaders.h"
 #include "libvelmora/report/countersreport.h"
 #include "program/view/reporttext.h"
 
@@ -25,23 +24,6 @@ TEST(CountersReportView, TellsZeroesFromNoAnswer)
     EXPECT_EQ(toText(CountersReport{TopicAnswer::Silent, {}}, Style()), "  Counters       no answer\n");
     EXPECT_EQ(toText(CountersReport(), Style()), "  Counters       not supported\n");
     EXPECT_EQ(toJsonValue(CountersReport()), Json::parse(R"({"answer": "not supported", "counters": []})"));
-}
-
-TEST(CountersReader, TellsZeroFromAReplyThatCannotBeDecoded)
-{
-    using Bytes = std::vector<unsigned char>;
-    EXPECT_EQ(judgeWithoutCounters({}, obd::ObdProtocolCan11), TopicAnswer::Silent);
-    EXPECT_EQ(judgeWithoutCounters({0x7F, 0x09, 0x12}, obd::ObdProtocolCan11), TopicAnswer::Silent);
-    Bytes zeros(35);
-    zeros[0] = 0x49;
-    zeros[1] = 0x08;
-    zeros[2] = 0x10;
-    EXPECT_EQ(judgeWithoutCounters(zeros, obd::ObdProtocolCan29), TopicAnswer::Read);
-    // Four counters where sixteen are due.
-    Bytes const few = {0x49, 0x08, 0x04, 0x00, 0x12, 0x00, 0x34, 0x00, 0x00, 0x00, 0x00};
-    EXPECT_EQ(judgeWithoutCounters(few, obd::ObdProtocolCan29), TopicAnswer::Unreadable);
-    EXPECT_EQ(judgeWithoutCounters({0x49, 0x08, 0x01, 0x00, 0x00, 0x00, 0x00, 0xB5}, obd::ObdProtocolIso9141),
-              TopicAnswer::Read);
 }
 
 } // namespace

@@ -12,11 +12,12 @@ using namespace velmora::cli;
 std::vector<ModuleTopic<FreezeReport>> const modules = {
     {0x7E8,
      "ECM",
-     {2, true,
+     {2, TopicAnswer::Read,
       FreezeFrame{{"P0133", "Powertrain", {{"Generic", "Slow"}}},
                   {{"Engine RPM", "2355", "rpm"}, {"Fuel", "Closed loop", ""}, {"Speed", std::nullopt, "km/h"}}}}},
-    {0x7E9, "TCM", {2, true, std::nullopt}},
-    {0x7EA, "", {2, false, std::nullopt}},
+    {0x7E9, "TCM", {2, TopicAnswer::Read, std::nullopt}},
+    {0x7EA, "", {2, TopicAnswer::Silent, std::nullopt}},
+    {0x7EB, "", {2, TopicAnswer::Unreadable, std::nullopt}},
 };
 
 TEST(FreezeReportView, ShowsCodeThenNamesValuesAndUnits)
@@ -30,7 +31,9 @@ TEST(FreezeReportView, ShowsCodeThenNamesValuesAndUnits)
                                         "\nControl module 7E9: TCM\n"
                                         "  Freeze frame   2: none stored\n"
                                         "\nControl module 7EA\n"
-                                        "  Freeze frame   2: no answer\n");
+                                        "  Freeze frame   2: no answer\n"
+                                        "\nControl module 7EB\n"
+                                        "  Freeze frame   2: unreadable\n");
 }
 
 TEST(FreezeReportView, JsonHasNullForWhatIsMissing)
@@ -47,6 +50,8 @@ TEST(FreezeReportView, JsonHasNullForWhatIsMissing)
     EXPECT_TRUE(json[1]["freeze"].is_null());
     EXPECT_EQ(json[1]["answered"], true);
     EXPECT_EQ(json[2]["answered"], false);
+    EXPECT_EQ(json[2]["answer"], "no answer");
+    EXPECT_EQ(json[3]["answer"], "unreadable");
     EXPECT_TRUE(json[2]["name"].is_null());
 }
 

@@ -60,7 +60,8 @@ TEST(JsonSchema, HoldsForTroubleCodes)
     expectValid(document(codeReport(), CodeReport{{}, {{CodeKind::Pending, CodeList::Answer::Unreadable, {}, {}}}}),
                 "codes");
     FreezeFrame const frame{code, {{"Engine RPM", "2355", "rpm"}, {"Speed", std::nullopt, ""}}};
-    expectValid(document(FreezeReport{0, true, frame}, FreezeReport{255, false, {}}), "freeze");
+    expectValid(document(FreezeReport{0, TopicAnswer::Read, frame}, FreezeReport{255, TopicAnswer::Refused, {}}),
+                "freeze");
     expectValid(printed(toJsonValue(std::vector<TroubleCode>{code})), "dtc");
 }
 
@@ -96,7 +97,8 @@ TEST(JsonSchema, HoldsForAScan)
     VehicleReport report;
     report.adapter = {"ELM327 v1.5", "", "", 12.3F};
     report.protocol = {6, "ISO 15765-4"};
-    ModuleReport full{0x7E8, "ECM", {0x0C, 0x0D}, infoReport(), codeReport(), {0, true, {}}, {}, {}, {}, {}};
+    ModuleReport full{0x7E8, "ECM", {0x0C, 0x0D}, infoReport(), codeReport(), {0, TopicAnswer::Read, {}}, {}, {},
+                      {},    {}};
     full.monitors = {TopicAnswer::Read, {{0x01, "A", limitTests()}}};
     full.counters = {TopicAnswer::Read, {{"A", 7}}};
     ModuleReport empty{0x7E9, "", {}, {}, codeReport(), {}, {}, {}, {}, {}};
