@@ -1,7 +1,5 @@
 #include "libvelmora/channel/fastchannel.h"
 
-#include <obd/idataconnection.h>
-
 #include <algorithm>
 #include <utility>
 

@@ -14,8 +14,8 @@
 #include <obd/iobdvelmora.h>
 
 #include <atomic>
-#include <filesystem>
 #include <chrono>
+#include <filesystem>
 #include <memory>
 #include <mutex>
 #include <optional>

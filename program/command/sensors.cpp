@@ -1,5 +1,5 @@
-#include "libvelmora/read/oxygencurrent.h"
 #include "libvelmora/read/offeredpids.h"
+#include "libvelmora/read/oxygencurrent.h"
 #include "libvelmora/read/topicanswer.h"
 #include "libvelmora/report/json.h"
 #include "libvelmora/report/unitlabel.h"

@@ -1,7 +1,7 @@
 #pragma once
 
-#include <obd/oxygensensorlocation.h>
 #include <obd/diagnosticdatamodels.h>
+#include <obd/oxygensensorlocation.h>
 #include <velmora/export.h>
 #include <velmora/troublecode.h>
 

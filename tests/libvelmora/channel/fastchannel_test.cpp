@@ -1,8 +1,6 @@
 #include "libvelmora/channel/fastchannel.h"
 #include "tests/libvelmora/channel/channelrig.h"
 
-#include <obd/idataconnection.h>
-
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
