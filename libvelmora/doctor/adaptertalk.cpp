@@ -6,7 +6,7 @@ namespace velmora {
 
 namespace {
 
-constexpr std::size_t longestReply = 65536;
+constexpr std::size_t longestTalk = 65536;
 
 } // namespace
 
@@ -28,7 +28,7 @@ AdapterTalk::~AdapterTalk()
 void AdapterTalk::onBytes(std::string_view bytes)
 {
     std::lock_guard const lock(m_mutex);
-    if (m_received.size() < longestReply) {
+    if (m_received.size() < longestTalk) {
         m_received += bytes;
     }
     m_changed.notify_all();

@@ -70,7 +70,7 @@ void measureLatency(Session& session, unsigned char pid, DoctorFigures& figures)
     figures.maximum = times.back();
 }
 
-std::size_t longestReply(Session& session)
+std::size_t longestWholeReply(Session& session)
 {
     std::size_t longest = 0;
     constexpr unsigned char items[] = {0x02, 0x04, 0x06, 0x0A};
@@ -161,7 +161,7 @@ void checkVehicle(Session& session, DoctorReport& report)
     }
     DoctorFigures figures;
     measureLatency(session, pids.front(), figures);
-    figures.longestReply = longestReply(session);
+    figures.longestReply = longestWholeReply(session);
     figures.countWorks = tryCount(session, pids.front(), figures);
     bool const can = ecu.protocol() == obd::ObdProtocolCan11 || ecu.protocol() == obd::ObdProtocolCan29;
     figures.pidsPerRequest = can ? tryMulti(session, ecu, pids) : 1;

@@ -6,7 +6,7 @@ namespace {
 
 using Status = obd::IDevice::Status;
 
-constexpr unsigned char currentData = 0x01;
+constexpr unsigned char liveData = 0x01;
 
 } // namespace
 
@@ -24,7 +24,7 @@ Status LentProxy::execute(std::string const& command, std::string& response, uns
 Status LentProxy::execute(std::vector<unsigned char> const& request, obd::ResponseMap& responses,
                           unsigned int timeoutMs)
 {
-    bool const isSingle = request.size() == 2 && request[0] == currentData;
+    bool const isSingle = request.size() == 2 && request[0] == liveData;
     if (isSingle) {
         m_asked.insert(request[1]);
         if (auto const lent = m_lent.find(request[1]); lent != m_lent.end()) {

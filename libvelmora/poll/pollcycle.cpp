@@ -10,7 +10,7 @@ namespace {
 constexpr unsigned char currentData = 0x01;
 constexpr unsigned char negativeReply = 0x7F;
 constexpr unsigned int replyLimitMs = 1500;
-constexpr int patience = 3;                     // failed turns in a row
+constexpr int mostFailures = 3;                 // failed turns in a row
 constexpr std::chrono::seconds silencePause{2}; // so that what stays silent does not hold up the rest
 
 std::set<unsigned int> modulesOf(std::vector<std::size_t> const& members, std::vector<PollWish> const& wishes)
@@ -70,7 +70,7 @@ void PollCycle::step()
     if (run(m_tasks[task])) {
         m_failures[task] = 0;
         m_notBefore = start + m_pace.floor;
-    } else if (++m_failures[task] >= patience) {
+    } else if (++m_failures[task] >= mostFailures) {
         m_scheduler.postpone(task, m_wire.now() + silencePause);
     }
     if (std::exchange(m_limitsChanged, false)) {

@@ -8,8 +8,8 @@ namespace velmora {
 
 namespace {
 
-constexpr unsigned char currentData = 0x01;
-constexpr unsigned char currentDataReply = 0x41;
+constexpr unsigned char liveService = 0x01;
+constexpr unsigned char liveServiceReply = 0x41;
 
 } // namespace
 
@@ -40,11 +40,11 @@ obd::IDevice::Status PollWire::execute(std::vector<unsigned char> const& request
 {
     keepGap();
     obd::IDevice::Status const status = m_proxy->execute(request, responses, timeoutMs);
-    if (status != obd::IDevice::Status::Ok || request.size() != 2 || request[0] != currentData) {
+    if (status != obd::IDevice::Status::Ok || request.size() != 2 || request[0] != liveService) {
         return status;
     }
     for (auto const& [module, payload] : responses) {
-        if (payload.size() > 2 && payload[0] == currentDataReply && payload[1] == request[1]) {
+        if (payload.size() > 2 && payload[0] == liveServiceReply && payload[1] == request[1]) {
             m_notes.note(module, request[1], now());
         }
     }

@@ -16,7 +16,7 @@ namespace velmora {
 namespace {
 
 constexpr double slowest = 0.001;
-constexpr double fastest = 1000.0;
+constexpr double highestRate = 1000.0;
 constexpr std::size_t longestId = 8; // digits of a 29 bit CAN identifier
 
 bool isHexadecimal(std::string_view text)
@@ -50,7 +50,7 @@ std::optional<double> parseRate(std::string const& text)
     double hertz = 0.0;
     auto const [end, error] = std::from_chars(number.data(), number.data() + number.size(), hertz);
     bool const whole = error == std::errc() && end == number.data() + number.size();
-    return whole && hertz >= slowest && hertz <= fastest ? std::optional(hertz) : std::nullopt;
+    return whole && hertz >= slowest && hertz <= highestRate ? std::optional(hertz) : std::nullopt;
 }
 
 std::string rateText(double hertz)

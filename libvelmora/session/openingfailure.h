@@ -1,0 +1,21 @@
+#pragma once
+
+#include "libvelmora/port/portaddress.h"
+#include "libvelmora/session/openingwatch.h"
+
+#include <velmora/error.h>
+
+#include <optional>
+#include <string>
+
+// Why a connection did not come about, with advice that fits the kind of port.
+namespace velmora::openingfailure {
+
+// The adapter did not answer as one does, by what was seen of it. address is nothing for a transport of the
+// application's own.
+Error silentAdapter(std::string const& port, std::optional<PortAddress> const& address, OpeningWatch const& seen);
+
+// Replies came, but without the headers that tell whose they are.
+Error headersMissing(std::string const& adapter, std::string const& port);
+
+} // namespace velmora::openingfailure

@@ -18,7 +18,7 @@ MakerChoice chooseMaker(std::string const& named, std::vector<std::string> const
     if (!named.empty()) {
         return {MakerChoice::By::Option, named};
     }
-    auto const vin = std::find_if(vins.begin(), vins.end(), isVin);
+    auto const vin = std::find_if(vins.begin(), vins.end(), [](std::string const& text) { return isVin(text); });
     WmiRow const* const row = vin != vins.end() ? findWmi(vin->substr(0, 3)) : nullptr;
     if (row == nullptr || row->basis == WmiRow::Basis::None) {
         return {};

@@ -225,11 +225,9 @@ std::vector<CodeLook> SessionCar::lookAtCodes()
     for (std::shared_ptr<obd::IEcu> const& ecu : m_session->selectedModules()) {
         CodeLook look =
             toLook(ecu->id(), reader.read(*ecu, {CodeKind::Confirmed, CodeKind::Pending, CodeKind::Permanent}));
-        if (tellsReadiness(*ecu)) {
-            ReadinessReport const readiness = readReadiness(*m_session, *ecu);
-            if (hasAnswer(readiness)) {
-                look.notReady = static_cast<int>(countNotComplete(readiness));
-            }
+        ReadinessReport const readiness = readReadiness(*m_session, *ecu);
+        if (hasAnswer(readiness)) {
+            look.notReady = static_cast<int>(countNotComplete(readiness));
         }
         looks.push_back(std::move(look));
     }
