@@ -21,9 +21,10 @@ need() {
 }
 
 build_packages=(g++ cmake ninja-build libasio-dev libcli11-dev nlohmann-json3-dev libfmt-dev libtomlplusplus-dev
-    libsqlite3-dev libboost-dev)
+    libsqlite3-dev libboost-dev libmosquitto-dev)
 test_packages=(libgtest-dev libgmock-dev libbenchmark-dev python3-jsonschema clang libclang-rt-14-dev clang-format
-    clang-tidy strace prometheus systemd)
+    clang-tidy strace prometheus systemd mosquitto
+    mosquitto-clients nats-server)
 
 # build PRESET [TARGET...]: configures and builds.
 build() {

@@ -2,6 +2,7 @@
 
 #include "libvelmora/output/csvoutput.h"
 #include "libvelmora/output/influxoutput.h"
+#include "libvelmora/output/mqttoutput.h"
 #include "libvelmora/output/ndjsonoutput.h"
 #include "libvelmora/output/prometheusoutput.h"
 #include "libvelmora/output/sqliteoutput.h"
@@ -24,6 +25,13 @@ std::unique_ptr<IOutput> makeOf(OutputAddress const& address, OutputContext cons
     return std::make_unique<Output>(address);
 }
 
+#ifdef VELMORA_OUTPUT_MQTT
+std::unique_ptr<IOutput> makeMqtt(OutputAddress const& address, OutputContext const& context)
+{
+    return std::make_unique<MqttOutput>(address, context);
+}
+#endif
+
 std::vector<Maker> const& makers()
 {
     static std::vector<Maker> const list = {
@@ -45,6 +53,10 @@ std::vector<Maker> const& makers()
          [](OutputAddress const& address, OutputContext const& context) -> std::unique_ptr<IOutput> {
              return std::make_unique<PrometheusOutput>(address, context.health);
          }},
+#endif
+#ifdef VELMORA_OUTPUT_MQTT
+        {"mqtt", makeMqtt},
+        {"mqtts", makeMqtt},
 #endif
     };
     return list;
