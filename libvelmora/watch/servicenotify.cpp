@@ -51,7 +51,8 @@ void ServiceNotify::tell(std::string const& state) const
     int const socket = ::socket(AF_UNIX, SOCK_DGRAM | SOCK_CLOEXEC, 0);
     if (socket >= 0) {
         auto const length = static_cast<socklen_t>(offsetof(sockaddr_un, sun_path) + m_socket.size());
-        ::sendto(socket, state.data(), state.size(), MSG_NOSIGNAL, reinterpret_cast<sockaddr const*>(&address), length);
+        ::sendto(socket, state.data(), state.size(), MSG_NOSIGNAL | MSG_DONTWAIT,
+                 reinterpret_cast<sockaddr const*>(&address), length);
         ::close(socket);
     }
 }

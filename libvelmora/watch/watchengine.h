@@ -1,7 +1,7 @@
 #pragma once
 
-#include "libvelmora/output/health.h"
 #include "libvelmora/output/backoff.h"
+#include "libvelmora/output/health.h"
 #include "libvelmora/watch/iwatchedcar.h"
 #include "libvelmora/watch/sleepjudge.h"
 #include "libvelmora/watch/tripmeter.h"

@@ -32,7 +32,7 @@ public:
         timeval const limit{60, 0};
         ::setsockopt(m_socket, SOL_SOCKET, SO_RCVTIMEO, &limit, sizeof(limit));
         ::setenv("NOTIFY_SOCKET", path.c_str(), 1);
-        ::setenv("WATCHDOG_USEC", "200000", 1);
+        ::setenv("WATCHDOG_USEC", "2000000", 1);
     }
     ~NotifySocket()
     {
