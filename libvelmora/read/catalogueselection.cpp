@@ -23,7 +23,7 @@ bool isWordCharacter(char lower)
     return (lower >= 'a' && lower <= 'z') || (lower >= '0' && lower <= '9');
 }
 
-std::vector<std::string> splitWords(std::string const& text)
+std::vector<std::string> catalogueWords(std::string const& text)
 {
     std::vector<std::string> words;
     std::string word;
@@ -41,7 +41,7 @@ std::vector<std::string> splitWords(std::string const& text)
 
 std::string joined(std::string const& name)
 {
-    return fmt::format("{}", fmt::join(splitWords(name), ""));
+    return fmt::format("{}", fmt::join(catalogueWords(name), ""));
 }
 
 std::vector<std::string> makers()
@@ -87,10 +87,10 @@ CatalogueRows selectMaker(CatalogueRows const& rows, std::string const& maker)
 
 CatalogueRows selectWords(CatalogueRows const& rows, std::vector<std::string> const& words)
 {
-    std::vector<std::string> const wanted = splitWords(fmt::format("{}", fmt::join(words, " ")));
+    std::vector<std::string> const wanted = catalogueWords(fmt::format("{}", fmt::join(words, " ")));
     CatalogueRows selected;
     std::copy_if(rows.begin(), rows.end(), std::back_inserter(selected), [&wanted](auto const& row) {
-        return holdsAll(splitWords(row->code + ' ' + row->description), wanted);
+        return holdsAll(catalogueWords(row->code + ' ' + row->description), wanted);
     });
     return selected;
 }

@@ -77,7 +77,7 @@ std::vector<Line> linesOf(std::string& reply)
     return lines;
 }
 
-bool isVin(Bytes const& bytes, std::size_t at)
+bool holdsVin(Bytes const& bytes, std::size_t at)
 {
     return bytes.size() > at + 1 && bytes[at] == 0x49 && bytes[at + 1] == 0x02;
 }
@@ -103,7 +103,7 @@ Masked maskCan(std::vector<Line>& lines, std::size_t headerDigits)
     for (Line& line : lines) {
         Bytes const bytes = line.bytes(headerDigits);
         std::string const module = line.text(headerDigits);
-        if (bytes.size() > 2 && bytes[0] >> 4 == 1 && isVin(bytes, 2)) {
+        if (bytes.size() > 2 && bytes[0] >> 4 == 1 && holdsVin(bytes, 2)) {
             lengths[module] = (bytes[0] & 0x0FU) << 8 | bytes[1];
             ++masked.headings;
         }
@@ -137,7 +137,7 @@ Masked maskLegacy(std::vector<Line>& lines, bool j1850)
     for (Line& line : lines) {
         Bytes bytes = line.bytes(0);
         std::size_t const data = headerBytes + 3;
-        if (!isVin(bytes, headerBytes) || bytes.size() < data + charactersEach) {
+        if (!holdsVin(bytes, headerBytes) || bytes.size() < data + charactersEach) {
             continue;
         }
         modules.insert(line.text(2 * headerBytes));

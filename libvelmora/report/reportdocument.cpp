@@ -14,7 +14,7 @@ namespace {
 constexpr std::size_t vinSerial = 6;
 
 // The first VIN that a module told.
-std::string vinOf(VehicleReport const& report)
+std::string firstVin(VehicleReport const& report)
 {
     for (ModuleReport const& module : report.modules) {
         if (!module.info.vin.empty()) {
@@ -27,7 +27,7 @@ std::string vinOf(VehicleReport const& report)
 DocumentSection vehicleSection(VehicleReport const& report, ReportFacts const& facts)
 {
     DocumentFacts rows;
-    std::string const vin = vinOf(report);
+    std::string const vin = firstVin(report);
     rows.rows.push_back({texts::vin, DocumentCell(shownVin(vin, facts.maskVin))});
     if (isVin(vin)) {
         rows.rows.push_back({texts::maker, DocumentCell(makerText(decodeVin(vin, facts.year)))});

@@ -75,7 +75,7 @@ std::vector<ModuleOutcome> clearCodes(Session& session)
     return outcomes;
 }
 
-void printText(std::vector<ModuleOutcome> const& outcomes)
+void printOutcomes(std::vector<ModuleOutcome> const& outcomes)
 {
     for (ModuleOutcome const& outcome : outcomes) {
         fmt::print("Control module {:X}{}{}: {}{}{}\n", outcome.id, outcome.name.empty() ? "" : " ", outcome.name,
@@ -128,7 +128,7 @@ ExitCode clear(GlobalOptions const& options)
     if (options.json) {
         printJson(outcomes);
     } else {
-        printText(outcomes);
+        printOutcomes(outcomes);
     }
     flushOutput();
     return judge(outcomes);

@@ -50,7 +50,8 @@ public:
     Recording(obd::ISensorService& service, RequestWindows& windows, std::string const& file)
         : m_windows(windows), m_csv(file)
     {
-        m_table.select(service.getDescriptors());
+        auto const descriptors = service.getDescriptors();
+        m_table.select({descriptors.begin(), descriptors.end()});
         m_latest.resize(m_table.rows().size());
         m_csv.begin(m_table, LiveTime(), velmora::cli::LiveCsv::WallTime());
     }

@@ -62,8 +62,8 @@ TEST_F(OpeningWatchTest, OnlyTheFirstIdentificationCounts)
 TEST_F(OpeningWatchTest, AdviceFitsTheKindOfPort)
 {
     auto const hints = [this](char const* port) {
-        velmora::Error const error =
-            velmora::openingfailure::silentAdapter(velmora::parsePortAddress(port, 38400), m_watch);
+        velmora::PortAddress const address = velmora::parsePortAddress(port, 38400);
+        velmora::Error const error = velmora::openingfailure::silentAdapter(toString(address), address, m_watch);
         std::string all;
         for (std::string const& hint : error.hints()) {
             all += hint + "\n";
@@ -76,8 +76,8 @@ TEST_F(OpeningWatchTest, AdviceFitsTheKindOfPort)
     send("ATI");
     receive("ELM327 v1.5\r\r");
     send("ATE0");
-    velmora::Error const error =
-        velmora::openingfailure::silentAdapter(velmora::parsePortAddress("/dev/ttyUSB0", 38400), m_watch);
+    velmora::PortAddress const address = velmora::parsePortAddress("/dev/ttyUSB0", 38400);
+    velmora::Error const error = velmora::openingfailure::silentAdapter(toString(address), address, m_watch);
     EXPECT_EQ(std::string(error.what()), "ELM327 v1.5 answered on /dev/ttyUSB0 (38400 baud), but not to ATE0 in time");
     EXPECT_EQ(error.kind(), velmora::ErrorKind::AdapterSilent);
 }
