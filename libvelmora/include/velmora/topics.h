@@ -89,8 +89,8 @@ struct FreezeFrame
 /// One frame of a control module, by number.
 struct FreezeReport
 {
-    unsigned int number;
-    TopicAnswer answer; ///< whether the module told what its frame holds
+    unsigned int number = 0;
+    TopicAnswer answer = TopicAnswer::NotOffered; ///< whether the module told what its frame holds
     std::optional<FreezeFrame> frame;
 };
 

@@ -114,6 +114,15 @@ std::vector<RequestBytes> everythingOf(obd::IObdProxy& proxy)
     return requests;
 }
 
+// The same without live values. Where an answer is announced as pending, the fast channel asks once more, so that a
+// live value is that of a later moment of the drive.
+std::vector<RequestBytes> standingThingsOf(obd::IObdProxy& proxy)
+{
+    std::vector<RequestBytes> requests = everythingOf(proxy);
+    std::erase_if(requests, [](RequestBytes const& request) { return request.front() == 0x01; });
+    return requests;
+}
+
 std::string firstDifference(Outcome const& plain, Outcome const& fast)
 {
     for (std::size_t i = 0; i < std::max(plain.size(), fast.size()); ++i) {
@@ -129,8 +138,9 @@ std::string firstDifference(Outcome const& plain, Outcome const& fast)
 TEST_F(ChannelEquality, EveryCarReadsTheSame)
 {
     for (std::string const& vehicle : obdsim::simulatedVehicles()) {
-        Outcome const plain = readPlain(obdsim::simulate({vehicle, "elm327-v1.5", {}}), everythingOf);
-        Outcome const fast = readFast(obdsim::simulate({vehicle, "elm327-v1.5", {}}), everythingOf, {});
+        auto const requests = vehicle == "slow-can11" ? standingThingsOf : everythingOf;
+        Outcome const plain = readPlain(obdsim::simulate({vehicle, "elm327-v1.5", {}}), requests);
+        Outcome const fast = readFast(obdsim::simulate({vehicle, "elm327-v1.5", {}}), requests, {});
         EXPECT_FALSE(plain.empty()) << vehicle;
         EXPECT_EQ(firstDifference(plain, fast), "") << vehicle;
     }
