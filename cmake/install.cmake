@@ -24,6 +24,10 @@ if(TARGET velmoraLibrary)
                 target_link_libraries(velmoraLibrary PRIVATE $<INSTALL_INTERFACE:${part}>)
             endif()
         endforeach()
+        # It has no package of its own; every Debian linker finds it by its name.
+        if(MOSQUITTO_LIBRARY IN_LIST parts)
+            target_link_libraries(velmoraLibrary PRIVATE $<INSTALL_INTERFACE:mosquitto>)
+        endif()
     endif()
     install(TARGETS velmoraLibrary EXPORT velmoraCompanionTargets)
     install(
