@@ -1,5 +1,6 @@
 #pragma once
 
+#include "libvelmora/car/threadanswer.h"
 #include "libvelmora/car/watchstate.h"
 #include "libvelmora/session/session.h"
 
@@ -42,15 +43,14 @@ public:
 private:
     using Clock = std::chrono::steady_clock;
 
-    // The task is shared, for its thread may still hold it when the waiting one goes on.
+    // The answer is shared, for its thread may still hold it when the waiting one goes on.
     template <typename Function>
     auto onThread(Function const& function) -> std::invoke_result_t<Function const&>
     {
         refuseCallback();
-        auto const task = std::make_shared<std::packaged_task<std::invoke_result_t<Function const&>()>>(function);
-        auto result = task->get_future();
-        post([task] { (*task)(); });
-        return result.get();
+        auto const answer = std::make_shared<ThreadAnswer<std::invoke_result_t<Function const&>>>();
+        post([answer, function] { answer->run(function); });
+        return answer->get();
     }
 
     void refuseCallback() const;

@@ -6,6 +6,7 @@
 #include "libvelmora/channel/ichannelcontrol.h"
 #include "libvelmora/channel/learntstore.h"
 #include "libvelmora/channel/replyhealer.h"
+#include "libvelmora/channel/turn.h"
 #include "libvelmora/channel/wire.h"
 
 #include <obd/idataconnection.h>
@@ -139,7 +140,7 @@ private:
     std::atomic<bool> m_connected{false};
 
     // An exchange holds it; so does each look at what belongs to one.
-    std::timed_mutex m_exchange;
+    Turn m_exchange;
     std::string m_buffer;
     std::deque<std::string> m_ready;
     std::optional<Pending> m_pending;
