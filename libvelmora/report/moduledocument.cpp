@@ -79,12 +79,9 @@ DocumentCell listCell(CodeList const& list)
 
 void addCodeRows(DocumentTable& table, char const* kind, TroubleCode const& code, DocumentMark mark)
 {
-    if (code.meanings.empty()) {
-        table.rows.push_back({{kind}, {code.code, mark}, {}, {}});
-    }
-    for (TroubleCode::Meaning const& each : code.meanings) {
-        table.rows.push_back({{kind}, {code.code, mark}, {each.maker}, {each.text}});
-    }
+    TroubleCode::Meaning const* const meaning = meaningOf(code);
+    table.rows.push_back(
+        {{kind}, {code.code, mark}, {meaning != nullptr ? meaning->maker : std::string()}, {meaningText(code)}});
 }
 
 DocumentSection codeSection(CodeReport const& report)

@@ -8,7 +8,6 @@
 #include <algorithm>
 #include <charconv>
 #include <cmath>
-#include <cstring>
 #include <limits>
 #include <optional>
 #include <vector>
@@ -19,14 +18,13 @@ namespace {
 
 constexpr int hundredths = 2; // decimals
 
-constexpr char const* unitWords[] = {"metric", "imperial", "imperial-uk"};
+constexpr char const* unitWords[] = {"metric", "imperial"};
 constexpr char const* fuelWords[] = {"reported", "override"};
 constexpr char const* ignitionWords[] = {"spark", "compression"};
 
 constexpr VehicleSetting allSettings[] = {
-    {"units", "Unit system", "", settings::unitSystem, 0, 0, 2, true, 0, unitWords,
-     "The units that values are shown in. imperial has gallons of the US, imperial-uk those of 4.546 litres. --units "
-     "chooses for one run."},
+    {"units", "Unit system", "", settings::unitSystem, 0, 0, 1, true, 0, unitWords,
+     "The units that values are shown in; imperial has gallons of the US. --units chooses for one run."},
     {"displacement",
      "Engine displacement",
      "l",
@@ -78,26 +76,8 @@ constexpr VehicleSetting allSettings[] = {
      "spark is petrol, gas or alcohol, compression is diesel. Counts with fuel set to override."},
 };
 
-bool isUnits(VehicleSetting const& setting)
-{
-    return std::strcmp(setting.key, settings::unitSystem) == 0;
-}
-
-// The unit systems of people are two keys of the store, for the library knows two of them.
-int readUnits(obd::ISettings& store)
-{
-    int system = 0;
-    int gallon = 0;
-    store.getInt(settings::unitSystem, system);
-    store.getInt(settings::gallon, gallon);
-    return system != 1 ? 0 : gallon == 1 ? 2 : 1;
-}
-
 int readStored(VehicleSetting const& setting, obd::ISettings& store)
 {
-    if (isUnits(setting)) {
-        return readUnits(store);
-    }
     int value = setting.fallback;
     store.getInt(setting.key, value);
     bool const outside = value < setting.lowest || value > setting.highest;
@@ -186,12 +166,7 @@ void setSetting(VehicleSetting const& setting, std::string const& text, obd::ISe
                     {fmt::format("expected {}{}{}{}", shownRange(setting), *setting.unit != '\0' ? " " : "",
                                  setting.unit, precision)});
     }
-    if (isUnits(setting)) {
-        store.setInt(settings::unitSystem, *stored == 0 ? 0 : 1);
-        store.setInt(settings::gallon, *stored == 2 ? 1 : 0);
-    } else {
-        store.setInt(setting.key, *stored);
-    }
+    store.setInt(setting.key, *stored);
 }
 
 bool storedHundredths(std::string const& key, double number, int& value)

@@ -34,7 +34,7 @@ VehicleSetting const& findSetting(std::string const& name);
 // "1.60", "metric". A stored value that is out of range shows as the default, as it reads.
 std::string shownSetting(VehicleSetting const& setting, obd::ISettings& store);
 std::string shownDefault(VehicleSetting const& setting);
-// "0.05 to 30.00", "metric, imperial or imperial-uk".
+// "0.05 to 30.00", "metric or imperial".
 std::string shownRange(VehicleSetting const& setting);
 
 // Sets it from what a person typed, without bringing it to the disk. Throws Error that tells the range.

@@ -5,7 +5,6 @@
 namespace velmora::settings {
 
 inline constexpr char const* unitSystem = "common/unitsystem"; ///< 0 metric, 1 imperial; default 0
-inline constexpr char const* gallon = "velmora/gallon";        ///< 0 of the US, 1 imperial; default 0
 
 inline constexpr char const* engineDisplacement = "common/enginedisplacement"; ///< hundredths of a litre, default 200
 inline constexpr char const* volumetricEfficiency = "common/volumetricefficiency"; ///< percent, 0 to 100, default 85

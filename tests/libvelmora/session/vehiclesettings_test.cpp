@@ -66,20 +66,6 @@ TEST_F(VehicleSettings, DefaultsAreTheLibrarys)
     EXPECT_EQ(m_library.ignitionType(), obd::IgnitionType::Spark);
 }
 
-TEST_F(VehicleSettings, UnitsAreTwoKeys)
-{
-    set("units", "imperial-uk");
-    EXPECT_EQ(m_library.unitSystem(), obd::UnitSystem::Imperial);
-    EXPECT_EQ(shown("units"), "imperial-uk");
-    set("units", "imperial");
-    EXPECT_EQ(shown("units"), "imperial");
-    set("units", "imperial-uk");
-    set("units", "metric");
-    EXPECT_EQ(shown("units"), "metric");
-    m_store->setInt(settings::gallon, 1);
-    EXPECT_EQ(shown("units"), "metric") << "which has no gallons";
-}
-
 TEST_F(VehicleSettings, WhatIsNoValueIsToldWithTheRange)
 {
     for (auto const& [name, text, range] :
@@ -94,7 +80,7 @@ TEST_F(VehicleSettings, WhatIsNoValueIsToldWithTheRange)
           {"efficiency", "101", "0 to 100 %"},
           {"efficiency", "-1", "0 to 100 %"},
           {"weight", "1e99", "1 to 60000 kg"},
-          {"units", "Imperial", "metric, imperial or imperial-uk"},
+          {"units", "Imperial", "metric or imperial"},
           {"ignition", "0", "spark or compression"}}) {
         try {
             set(name, text);
