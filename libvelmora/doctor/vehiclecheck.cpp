@@ -129,8 +129,8 @@ std::size_t tryMulti(Session& session, obd::IEcu const& ecu, std::vector<unsigne
 
 double measureRate(Session& session, std::vector<unsigned char> const& pids, DoctorFigures const& figures)
 {
-    std::vector<unsigned char> request{0x01};
-    request.insert(request.end(), pids.begin(), pids.begin() + static_cast<std::ptrdiff_t>(figures.pidsPerRequest));
+    std::vector<unsigned char> request(figures.pidsPerRequest + 1, 0x01);
+    std::copy_n(pids.begin(), figures.pidsPerRequest, request.begin() + 1);
     Clock::time_point const start = Clock::now();
     std::size_t values = 0;
     for (int i = 0; i < measuredRequests; ++i) {
