@@ -50,7 +50,7 @@ pid_t spawn(std::vector<std::string> const& arguments, int in, int out, int err)
             posix_spawn_file_actions_adddup2(&actions, from, to);
         }
     }
-    ::setenv("VELMORA_SETTINGS", "/nonexistent/settings.toml", 1); // not the user's own
+    ::setenv("VELMORA_SETTINGS", "/proc/nonexistent/settings.toml", 1); // not the user's, nor any
     pid_t pid = -1;
     EXPECT_EQ(::posix_spawn(&pid, VELMORA_PROGRAM, &actions, nullptr, argv.data(), environ), 0);
     posix_spawn_file_actions_destroy(&actions);

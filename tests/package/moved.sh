@@ -8,5 +8,5 @@ mapfile -t programs < <(find "$2/moved prefix" -name velmora -type f -perm -u+x)
 [[ ${#programs[@]} -eq 1 ]] || { echo "installed programs: ${programs[*]}"; exit 1; }
 env -u LD_LIBRARY_PATH ldd "${programs[0]}" | grep libobd.so | tee /dev/stderr | grep -q 'moved prefix' ||
     { echo "the program doesn't use the library of its prefix"; exit 1; }
-said=$(env -u LD_LIBRARY_PATH VELMORA_SETTINGS=/nonexistent/settings.toml "${programs[0]}" -q -p 'sim:petrol-can11?instant' info)
+said=$(env -u LD_LIBRARY_PATH VELMORA_SETTINGS=/proc/nonexistent/settings.toml "${programs[0]}" -q -p 'sim:petrol-can11?instant' info)
 [[ $said == *VIN* ]] || { echo "said: $said"; exit 1; }

@@ -2,7 +2,7 @@
 # Runs the companion's examples against simulated cars, and against nobody:
 #   runcar.sh VELMORA EXAMPLES_FOLDER
 set -euo pipefail
-export XDG_CONFIG_HOME=/nonexistent
+export XDG_CONFIG_HOME=/proc/nonexistent
 car=sim:petrol-can11?instant
 
 fail() {

@@ -26,7 +26,7 @@ CarOptions simulated(std::string const& vehicle)
 {
     CarOptions options;
     options.port = "sim:" + vehicle + "?instant";
-    options.settingsFile = "/nonexistent/settings.toml";
+    options.settingsFile = "/proc/nonexistent/settings.toml";
     return options;
 }
 
