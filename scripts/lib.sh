@@ -24,7 +24,9 @@ build_packages=(g++ cmake ninja-build libasio-dev libcli11-dev nlohmann-json3-de
     libsqlite3-dev libboost-dev libmosquitto-dev)
 test_packages=(libgtest-dev libgmock-dev libbenchmark-dev python3-jsonschema clang libclang-rt-14-dev clang-format
     clang-tidy strace prometheus systemd mosquitto
-    mosquitto-clients nats-server)
+    mosquitto-clients nats-server chromium poppler-utils default-jre-headless)
+# Some have a newer Node with an npm of its own, which Debian's package would collide with.
+command -v npm >/dev/null || test_packages+=(nodejs npm)
 
 # build PRESET [TARGET...]: configures and builds.
 build() {
