@@ -31,12 +31,23 @@ if(TARGET velmoraLibrary)
     endif()
     install(TARGETS velmoraLibrary EXPORT velmoraCompanionTargets)
     install(
-        DIRECTORY libvelmora/include/velmora
+        DIRECTORY libvelmora/include/velmora bindings/c/include/velmora
         DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/velmora
         FILES_MATCHING PATTERN "*.h"
     )
     install(FILES ${PROJECT_BINARY_DIR}/generated/velmora/version.h DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/velmora/velmora)
     install(EXPORT velmoraCompanionTargets NAMESPACE velmora:: DESTINATION ${package_folder})
+endif()
+# The simulator for the tests of programs: always static, for it has no stable face but its one header.
+if(TARGET obdsim)
+    install(TARGETS obdsim EXPORT velmoraSimTargets COMPONENT sim)
+    install(
+        DIRECTORY simulator/include/obdsim
+        DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/velmora
+        COMPONENT sim
+        FILES_MATCHING PATTERN "*.h"
+    )
+    install(EXPORT velmoraSimTargets NAMESPACE velmora:: DESTINATION ${package_folder} COMPONENT sim)
 endif()
 if(TARGET velmora)
     install(TARGETS velmora)
@@ -54,3 +65,4 @@ install(
     FILES ${PROJECT_BINARY_DIR}/velmoraConfig.cmake ${PROJECT_BINARY_DIR}/velmoraConfigVersion.cmake
     DESTINATION ${package_folder}
 )
+include(cmake/pkgconfig.cmake)

@@ -4,7 +4,16 @@
 
 #include <obd/library.h>
 
+#include <mutex>
+
 namespace velmora {
+
+namespace {
+
+std::mutex usesMutex;
+unsigned int uses = 0; // protected by usesMutex
+
+} // namespace
 
 LibraryUse::LibraryUse(std::string const& logFile)
 {
@@ -12,12 +21,19 @@ LibraryUse::LibraryUse(std::string const& logFile)
     if (!logFile.empty()) {
         requireWritable(logFile, "log file");
     }
-    obd::LIBOBDOpen(logFile);
+    std::lock_guard const lock(usesMutex);
+    if (uses == 0 || !logFile.empty()) {
+        obd::LIBOBDOpen(logFile);
+    }
+    ++uses;
 }
 
 LibraryUse::~LibraryUse()
 {
-    obd::LIBOBDClose();
+    std::lock_guard const lock(usesMutex);
+    if (--uses == 0) {
+        obd::LIBOBDClose();
+    }
 }
 
 } // namespace velmora

@@ -4,11 +4,11 @@
 
 namespace velmora {
 
-// The library, open for as long as the object lives.
+// The library, open for as long as any such object lives. Any thread.
 class LibraryUse
 {
 public:
-    // Throws Error if the log file can't be written. Empty for no log.
+    // Throws Error if the log file can't be written. Empty for no log, or for the one that another use has begun.
     explicit LibraryUse(std::string const& logFile);
     ~LibraryUse();
     LibraryUse(LibraryUse const&) = delete;

@@ -8,6 +8,7 @@ execute_process(
     OUTPUT_QUIET COMMAND_ERROR_IS_FATAL ANY
 )
 file(COPY_FILE ${ARCHIVE} ${folder}/libobd/libobd.a)
+file(COPY_FILE ${SIMULATOR} ${folder}/simulator/libobdsim.a)
 file(WRITE ${WORK}/merge.mri "create ${folder}/libvelmora/libvelmora.a\naddlib ${COMPANION}\naddlib ${SIMULATOR}\nsave\nend\n")
 execute_process(COMMAND ar -M INPUT_FILE ${WORK}/merge.mri COMMAND_ERROR_IS_FATAL ANY)
 execute_process(COMMAND ${CMAKE_COMMAND} --install ${folder} --prefix ${STAGE} OUTPUT_QUIET COMMAND_ERROR_IS_FATAL ANY)

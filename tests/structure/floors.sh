@@ -9,7 +9,7 @@ cd "$1"
 # Every include of a folder's C++ files as "file:including line".
 includes() { grep -rHE '^ *# *include' --include='*.h' --include='*.cpp' "$@" || true; }
 
-includes common libobd libvelmora program simulator $([[ -d examples ]] && echo examples) |
+includes common libobd libvelmora program simulator $([[ -d bindings ]] && echo bindings) $([[ -d examples ]] && echo examples) |
     awk -v floorFile="$floors" '
     function wrong(why) { print file ": " target ": " why; failures++ }
 
@@ -50,7 +50,7 @@ includes common libobd libvelmora program simulator $([[ -d examples ]] && echo 
         if (target ~ /^velmora\// && !(target in generated)) {
             return "libvelmora/include/" target
         }
-        return target ~ /^(common|libobd|libvelmora|program)\// ? target : ""
+        return target ~ /^(bindings|common|libobd|libvelmora|program)\// ? target : ""
     }
 
     function isStandard() { return target ~ /^[a-z_]+$/ }
@@ -164,10 +164,10 @@ includes common libobd libvelmora program simulator $([[ -d examples ]] && echo 
         target = substr($0, RSTART + 1, RLENGTH - 2)
         checked++
     }
-    file ~ /^(common|libobd|libvelmora|program)\// { checkFloor() }
+    file ~ /^(bindings|common|libobd|libvelmora|program)\// { checkFloor() }
     file ~ /^(common|libobd)\// { checkLibrary() }
     file ~ /^libvelmora\// { checkCompanion() }
-    file ~ /^program\// { checkProgram() }
+    file ~ /^(bindings|program)\// { checkProgram() }
     file ~ /^examples\// { checkExample() }
     file ~ /^simulator\// { checkSimulator() }
 

@@ -1,0 +1,21 @@
+# Files for pkg-config that find their folders from where they lie, so that the prefix can move. An absolute library
+# folder has no such way; it gets none.
+if(IS_ABSOLUTE "${CMAKE_INSTALL_LIBDIR}" OR IS_ABSOLUTE "${CMAKE_INSTALL_INCLUDEDIR}")
+    message(STATUS "No pkg-config files: CMAKE_INSTALL_LIBDIR and CMAKE_INSTALL_INCLUDEDIR are to be relative")
+    return()
+endif()
+file(RELATIVE_PATH velmora_pkgconfig_up "/prefix/${CMAKE_INSTALL_LIBDIR}/pkgconfig" /prefix)
+string(REGEX REPLACE "/$" "" velmora_pkgconfig_up "${velmora_pkgconfig_up}")
+set(velmora_pkgconfig_static)
+if(NOT BUILD_SHARED_LIBS)
+    set(velmora_pkgconfig_static " -DOBD_STATIC")
+endif()
+
+set(velmora_pkgconfig_files obd)
+if(TARGET velmoraLibrary AND BUILD_SHARED_LIBS)
+    list(APPEND velmora_pkgconfig_files velmora)
+endif()
+foreach(file ${velmora_pkgconfig_files})
+    configure_file(${PROJECT_SOURCE_DIR}/cmake/${file}.pc.in ${PROJECT_BINARY_DIR}/${file}.pc @ONLY)
+    install(FILES ${PROJECT_BINARY_DIR}/${file}.pc DESTINATION ${CMAKE_INSTALL_LIBDIR}/pkgconfig COMPONENT Development)
+endforeach()

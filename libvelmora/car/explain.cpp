@@ -1,0 +1,24 @@
+#include "libvelmora/report/troublecode.h"
+#include "libvelmora/session/libraryuse.h"
+#include "libvelmora/text/text.h"
+
+#include <obd/troublecodecatalogue.h>
+#include <velmora/catalogue.h>
+#include <velmora/error.h>
+
+#include <fmt/format.h>
+
+namespace velmora {
+
+TroubleCode explain(std::string const& code)
+{
+    LibraryUse const catalogue{std::string()};
+    std::vector<TroubleCode> const found = groupByCode(obd::TroubleCodeCatalogue::getTroubleCodes(toUpper(code)));
+    if (found.empty()) {
+        throw Error(ErrorKind::WrongUse, fmt::format("\"{}\" is no trouble code", code),
+                    {"a trouble code is P, B, C or U, a digit from 0 to 3 and three hexadecimal digits: P0420"});
+    }
+    return found.front();
+}
+
+} // namespace velmora
