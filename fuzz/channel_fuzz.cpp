@@ -44,6 +44,7 @@ public:
     WireTime now() const override { return m_now; }
     bool isUp() const override { return m_up; }
     void giveUp() override { m_up = false; }
+    bool resume() override { return false; }
 
     void endBringUp() { m_bringUp = false; }
     bool hasMore() const { return m_size > 0; }

@@ -46,10 +46,10 @@ std::optional<BusLine> readSingle(BusLine line)
     return line;
 }
 
-std::optional<BusLine> readFirst(BusLine line)
+std::optional<BusLine> readFirst(BusLine line, std::size_t frameBytes)
 {
     std::size_t const length = (line.bytes[0] & 0x0FU) << 8U | line.bytes.at(1);
-    if (line.bytes.size() != canFrameBytes || length < canFrameBytes - 1) {
+    if (line.bytes.size() != frameBytes || length < frameBytes - 1) {
         return std::nullopt;
     }
     line.kind = BusLine::Kind::First;
@@ -57,24 +57,26 @@ std::optional<BusLine> readFirst(BusLine line)
     return line;
 }
 
-std::optional<BusLine> parseCanLine(BusKind bus, std::string_view digits)
+std::optional<BusLine> parseCanLine(BusKind bus, std::string_view digits, bool extended)
 {
     std::size_t const headerDigits = bus == BusKind::Can11 ? 3 : 8;
-    if (digits.size() < headerDigits + 4 || (digits.size() - headerDigits) % 2 != 0) {
+    std::size_t const behind = headerDigits + (extended ? 2 : 0);
+    std::size_t const frameBytes = canFrameBytes - (extended ? 1 : 0);
+    if (digits.size() < behind + 4 || (digits.size() - headerDigits) % 2 != 0) {
         return std::nullopt;
     }
     BusLine line;
     line.header = std::string(digits.substr(0, headerDigits));
     line.module = numberOf(line.header) & 0x1FFFFFFFU;
-    line.bytes = decodedDigits(digits.substr(headerDigits));
-    if (line.bytes.empty() || line.bytes.size() > canFrameBytes) {
+    line.bytes = decodedDigits(digits.substr(behind));
+    if (line.bytes.empty() || line.bytes.size() > frameBytes) {
         return std::nullopt;
     }
     switch (line.bytes[0] >> 4U) {
     case 0:
         return readSingle(std::move(line));
     case 1:
-        return readFirst(std::move(line));
+        return readFirst(std::move(line), frameBytes);
     case 2:
         line.kind = BusLine::Kind::Consecutive;
         line.payload.assign(line.bytes.begin() + 1, line.bytes.end());
@@ -141,12 +143,12 @@ bool isCanBus(BusKind bus)
     return bus == BusKind::Can11 || bus == BusKind::Can29;
 }
 
-std::optional<BusLine> parseBusLine(BusKind bus, std::string_view digits)
+std::optional<BusLine> parseBusLine(BusKind bus, std::string_view digits, bool extended)
 {
     if (bus == BusKind::Unknown) {
         return std::nullopt;
     }
-    return isCanBus(bus) ? parseCanLine(bus, digits) : parseLegacyLine(bus, digits);
+    return isCanBus(bus) ? parseCanLine(bus, digits, extended) : parseLegacyLine(bus, digits);
 }
 
 bool hasRightCheckByte(BusKind bus, std::string_view digits)

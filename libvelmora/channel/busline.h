@@ -43,8 +43,8 @@ struct BusLine
 
 // Reads a line of digits, blanks removed. Nothing if it is no whole frame: half a byte, fewer bytes than the PCI or the
 // KWP length tell, a kind that no module sends. A consecutive frame may be shorter than eight bytes; whether it is
-// whole its first frame tells.
-std::optional<BusLine> parseBusLine(BusKind bus, std::string_view digits);
+// whole its first frame tells. extended: on CAN an address byte stands in front of the PCI; it is left out.
+std::optional<BusLine> parseBusLine(BusKind bus, std::string_view digits, bool extended = false);
 
 // Whether the check byte at the end of a legacy line is right.
 bool hasRightCheckByte(BusKind bus, std::string_view digits);

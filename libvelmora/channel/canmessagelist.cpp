@@ -6,9 +6,6 @@ namespace velmora {
 
 namespace {
 
-constexpr std::size_t firstFrameBytes = 6;
-constexpr std::size_t consecutiveBytes = 7;
-constexpr std::size_t wholeFrameBytes = 8;
 constexpr unsigned int sequenceNumbers = 16;
 
 } // namespace
@@ -22,7 +19,9 @@ bool ModuleMessages::add(BusLine const& line, std::string const& digits, std::si
     message.module = line.module;
     message.payload = line.payload;
     message.places = {place};
+    message.headerDigits = line.header.size();
     message.length = line.payload.size();
+    message.carried = m_carried;
     message.lines = {digits};
     if (line.kind == BusLine::Kind::First) {
         ModuleMessage const* const before = open(line.module);
@@ -66,26 +65,52 @@ bool ModuleMessages::addConsecutive(BusLine const& line, std::string const& digi
     if ((line.bytes[0] & 0x0FU) != number % sequenceNumbers) {
         message->inOrder = false;
     }
-    std::size_t const missing = message->length - firstFrameBytes - consecutiveBytes * (number - 1);
-    std::size_t const needed = std::min(missing, consecutiveBytes);
+    std::size_t const missing = message->length - (m_carried - 1) - m_carried * (number - 1);
+    std::size_t const needed = std::min(missing, m_carried);
     if (line.payload.size() < needed) {
         note(Habit::BrokenLine);
         return false;
     }
     std::string text = digits;
-    if (line.bytes.size() < wholeFrameBytes) {
+    if (line.bytes.size() < m_carried + 1) {
         note(Habit::ShortLastFrame);
-        text += std::string(2 * (wholeFrameBytes - line.bytes.size()), '0');
+        text += std::string(2 * (m_carried + 1 - line.bytes.size()), '0');
     }
     message->payload.insert(message->payload.end(), line.payload.begin(),
                             line.payload.begin() + static_cast<std::ptrdiff_t>(needed));
+    std::size_t const numberAt = line.header.size() + (m_carried < 7 ? 2 : 0); // of the frame's number
     bool const twice = std::any_of(message->lines.begin() + 1, message->lines.end(), [&](std::string const& other) {
-        return number < sequenceNumbers && other.substr(line.header.size(), 2) == text.substr(line.header.size(), 2);
+        return number < sequenceNumbers && other.substr(numberAt, 2) == text.substr(numberAt, 2);
     });
     message->broken = message->broken || twice;
     message->lines.push_back(text);
     message->places.push_back(place);
     return true;
+}
+
+std::vector<std::string> plainFrames(std::string const& header, std::vector<std::uint8_t> const& payload)
+{
+    constexpr std::size_t singleBytes = 7;
+    constexpr std::size_t firstBytes = 6;
+    auto const length = static_cast<unsigned int>(payload.size());
+    if (length <= singleBytes) {
+        return {header + frameDigits({static_cast<std::uint8_t>(length)}) + frameDigits(payload)};
+    }
+    auto const part = [&payload](std::size_t begin, std::size_t count) {
+        std::vector<std::uint8_t> bytes(count, 0);
+        std::size_t const end = std::min(begin + count, payload.size());
+        std::copy(payload.begin() + static_cast<std::ptrdiff_t>(begin),
+                  payload.begin() + static_cast<std::ptrdiff_t>(end), bytes.begin());
+        return frameDigits(bytes);
+    };
+    std::vector<std::string> frames{
+        header + frameDigits({static_cast<std::uint8_t>(0x10U | length >> 8U), static_cast<std::uint8_t>(length)}) +
+        part(0, firstBytes)};
+    for (std::size_t at = firstBytes; at < payload.size(); at += singleBytes) {
+        auto const number = static_cast<std::uint8_t>(0x20U | frames.size() % sequenceNumbers);
+        frames.push_back(header + frameDigits({number}) + part(at, singleBytes));
+    }
+    return frames;
 }
 
 } // namespace velmora

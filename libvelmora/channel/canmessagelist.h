@@ -13,16 +13,18 @@ namespace velmora {
 struct ModuleMessage
 {
     unsigned int module = 0;
-    std::size_t length = 0; // bytes that it is to have
+    std::size_t length = 0;  // bytes that it is to have
+    std::size_t carried = 7; // bytes of a consecutive frame
     std::vector<std::uint8_t> payload;
     std::vector<std::string> lines;  // as they are handed on
     std::vector<std::size_t> places; // of the lines in the reply
+    std::size_t headerDigits = 3;    // in front of each line
     bool broken = false;             // two frames claim the same place: nothing of it can be trusted
     bool inOrder = true;
 
     bool complete() const { return !broken && payload.size() >= length; }
-    std::size_t missingFrames() const { return complete() ? 0 : (length - payload.size() + 6) / 7; }
-    bool segmented() const { return length > 7; }
+    std::size_t missingFrames() const { return complete() ? 0 : (length - payload.size() + carried - 1) / carried; }
+    bool segmented() const { return length > carried; }
 };
 
 // Puts the frames of a reply together by the rules of ISO 15765-2; those of several modules may come mixed. On the
@@ -30,7 +32,10 @@ struct ModuleMessage
 class ModuleMessages
 {
 public:
-    ModuleMessages(BusKind bus, HabitCounts& counts) : m_bus(bus), m_counts(counts) {}
+    // extended: frames hold an address byte, and a byte less of the message.
+    ModuleMessages(BusKind bus, HabitCounts& counts, bool extended = false)
+        : m_bus(bus), m_counts(counts), m_carried(extended ? 6 : 7)
+    {}
 
     // False if the frame belongs to no message, or lacks bytes that it should have: it is to be dropped.
     bool add(BusLine const& line, std::string const& digits, std::size_t place);
@@ -50,8 +55,12 @@ private:
 
     BusKind m_bus;
     HabitCounts& m_counts;
+    std::size_t m_carried; // bytes of a consecutive frame
     std::vector<ModuleMessage> m_messages;
     std::map<unsigned int, std::size_t> m_orphans;
 };
+
+// The frames of a message as a module without an address byte would send it, filled up with 00.
+std::vector<std::string> plainFrames(std::string const& header, std::vector<std::uint8_t> const& payload);
 
 } // namespace velmora

@@ -54,7 +54,7 @@ ElmCommand::ElmCommand(std::string_view line) : m_text(compactText(line)), m_req
 
 bool ElmCommand::onlyReads() const
 {
-    constexpr unsigned int reading[] = {0x01, 0x02, 0x03, 0x05, 0x06, 0x07, 0x09, 0x0A};
+    constexpr unsigned int reading[] = {0x01, 0x02, 0x03, 0x05, 0x06, 0x07, 0x09, 0x0A, 0x19, 0x1A, 0x21, 0x22};
     return std::find(std::begin(reading), std::end(reading), service()) != std::end(reading);
 }
 

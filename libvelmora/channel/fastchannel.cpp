@@ -25,6 +25,7 @@ FastChannel::FastChannel(std::shared_ptr<IWire> wire, ChannelOptions options, st
 
 FastChannel::~FastChannel()
 {
+    leaveNoAddress();
     keepLearnt();
 }
 
@@ -124,16 +125,6 @@ void FastChannel::tellReceived(std::string const& bytes)
     std::lock_guard const lock(m_loggerMutex);
     for (obd::IConnectionLogger* logger : m_loggers) {
         logger->onDataReceived({bytes.begin(), bytes.end()});
-    }
-}
-
-void FastChannel::addressModule(std::optional<unsigned int> module)
-{
-    std::lock_guard const lock(m_sharedMutex);
-    if (module) {
-        m_addresses[std::this_thread::get_id()] = *module;
-    } else {
-        m_addresses.erase(std::this_thread::get_id());
     }
 }
 

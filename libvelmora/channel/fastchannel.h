@@ -40,7 +40,7 @@ struct ChannelOptions
 //
 // All work is done on the threads that send and receive. The members stand in several files: fastchannel.cpp (the
 // interface), fastchannel_exchange.cpp (one exchange), fastchannel_recovery.cpp (prompts lost, adapters reset),
-// fastchannel_haste.cpp (counts, waits, memory, addresses).
+// fastchannel_haste.cpp (counts, waits, memory), fastchannel_address.cpp (requests to one module).
 class FastChannel : public obd::IDataConnection, public IChannelControl
 {
 public:
@@ -58,6 +58,8 @@ public:
     void removeLogger(obd::IConnectionLogger* logger) override;
 
     void addressModule(std::optional<unsigned int> module) override;
+    void address(std::optional<RequestAddress> const& address) override;
+    std::string refusedAddress() const override;
     void onConnected() override;
     ChannelStatistics statistics() const override;
 
@@ -71,17 +73,27 @@ private:
     {
         ElmCommand command;
         std::string sent; // the last text for it that was written
-        std::string key;  // of what is learnt: the request, and the module that it is addressed to
+        std::string key;  // of what is learnt: the request, and the address that it goes to
         WireTime sentAt{0};
-        WireTime heardAt{0}; // the last byte
-        WireTime dataAt{0};  // the last digit of a reply
-        std::optional<unsigned int> address;
+        WireTime heardAt{0};                // the last byte
+        WireTime dataAt{0};                 // the last digit of a reply
+        std::optional<unsigned int> module; // whose reply is waited for, where only one is
         std::optional<unsigned int> count;
+        bool addressed = false; // sent to somebody rather than to all
+        bool extended = false;  // with an address byte
         bool heard = false;
         bool askedAgain = false;
         bool woken = false;
         bool verifying = false; // asked once more with the full wait
         bool setUpAgain = false;
+    };
+
+    // What a thread has told of its requests.
+    struct ThreadAddress
+    {
+        std::optional<unsigned int> module;
+        std::optional<RequestAddress> address;
+        std::string refused;
     };
 
     // One exchange.
@@ -111,17 +123,24 @@ private:
     bool tellsLostSettings(HealedReply const& reply);
     bool setUpAgain(HealedReply const& reply);
 
-    // Counts, waits, memory, addresses.
+    // Addresses.
+    ThreadAddress wantedAddress() const;
+    void noteRefusal(std::string const& refused);
+    bool setAddress(Pending& pending);
+    std::string takeOn(std::vector<AddressChange> const& changes);
+    void restoreAddress();
+    void leaveNoAddress();
+
+    // Counts, waits, memory.
     std::optional<unsigned int> countFor(Pending const& pending) const;
     bool takeCounted(HealedReply const& reply, WireTime took);
     bool triesProtocol(std::string const& text);
     bool fallsBackToSearch(HealedReply const& reply);
     bool needsFullWait(HealedReply const& reply) const;
     void adaptWait(HealedReply const& reply);
+    static std::string waitCommand(unsigned int steps);
     void setWait(unsigned int steps);
     void giveWaitBack();
-    void setAddress(Pending& pending);
-    void restoreAddress();
     void learnVehicle(HealedReply const& reply);
     std::string adapterKey() const;
     void keepLearnt();
@@ -163,14 +182,16 @@ private:
     unsigned int m_waitSteps = 0;  // of 4.096 ms, where the channel has shortened the wait
     unsigned int m_waitBefore = 0; // what a wait that was given back had been
     WireTime m_slowest{0};
-    std::set<std::string> m_verified; // requests whose silent modules were given the full wait once
+    std::vector<AddressStep> m_restore; // takes back the address that is in force
+    int m_addressFailures = 0;          // of modules' own addresses
+    std::set<std::string> m_verified;   // requests whose silent modules were given the full wait once
     std::string m_vin;
 
     std::mutex m_loggerMutex; // held while a logger is called, so that none is called once it is removed
     std::vector<obd::IConnectionLogger*> m_loggers;
 
     mutable std::mutex m_sharedMutex; // a leaf; protects what follows
-    std::map<std::thread::id, unsigned int> m_addresses;
+    std::map<std::thread::id, ThreadAddress> m_addresses;
     ChannelStatistics m_statistics;
 };
 

@@ -22,7 +22,7 @@ bool isBlank(std::string_view text)
 void FastChannel::begin(std::string const& text)
 {
     m_begun = true;
-    Pending pending{.command = ElmCommand(text), .sent = {}, .key = {}, .address = {}, .count = {}};
+    Pending pending{.command = ElmCommand(text), .sent = {}, .key = {}, .module = {}, .count = {}};
     if (m_connected && m_memory.isOn()) {
         m_memory.stop();
     }
@@ -34,7 +34,10 @@ void FastChannel::begin(std::string const& text)
     pending.key = pending.command.text();
     m_starting = pending.command.resets();
     if (pending.command.isRequest()) {
-        setAddress(pending);
+        if (!setAddress(pending)) {
+            m_ready.emplace_back("?\r");
+            return;
+        }
         pending.count = countFor(pending);
     }
     m_pending = std::move(pending);
@@ -127,7 +130,7 @@ void FastChannel::takeReplies()
 
 ReplyContext FastChannel::context() const
 {
-    return {m_pending->command, m_pending->sent, m_state.shownBus(), m_state.echoOff()};
+    return {m_pending->command, m_pending->sent, m_state.shownBus(), m_state.echoOff(), m_pending->extended};
 }
 
 // The prompt has come. Either the reply is handed on, or the request goes out once more and stays pending.
@@ -234,9 +237,7 @@ void FastChannel::endExchange()
     if (done.verifying && m_waitBefore != 0) {
         setWait(m_waitBefore);
     }
-    if (done.address) {
-        restoreAddress();
-    }
+    restoreAddress();
 }
 
 // An exchange of the channel's own, between those of the core.

@@ -25,29 +25,6 @@ unsigned int stepsOf(std::string const& setting)
     return steps;
 }
 
-std::string waitCommand(unsigned int steps)
-{
-    return "ATST" + frameDigits({static_cast<std::uint8_t>(std::min(steps, 0xFFU))});
-}
-
-struct ModuleAddress
-{
-    std::string set;
-    std::string restore;
-};
-
-// By ISO 15765-4 the engine's 7E8 listens to 7E0, 18DAF110 to 18DA10F1.
-std::optional<ModuleAddress> addressOf(BusKind bus, unsigned int module)
-{
-    if (bus == BusKind::Can11 && module >= 0x7E8 && module <= 0x7EF) {
-        return ModuleAddress{"ATSH7E" + std::to_string(module - 0x7E8), "ATSH7DF"};
-    }
-    if (bus == BusKind::Can29 && (module & 0xFFFFFF00U) == 0x18DAF100U) {
-        return ModuleAddress{"ATSHDA" + frameDigits({static_cast<std::uint8_t>(module & 0xFFU)}) + "F1", "ATSHDB33F1"};
-    }
-    return std::nullopt;
-}
-
 // The characters behind 49 02 and the count of items, or nothing.
 std::string vinOf(std::vector<std::uint8_t> const& message)
 {
@@ -131,8 +108,8 @@ bool FastChannel::needsFullWait(HealedReply const& reply) const
     if (m_waitSteps == 0 || !m_pending->command.onlyReads() || m_verified.contains(m_pending->key)) {
         return false;
     }
-    if (m_pending->address) {
-        return !reply.spoke.contains(*m_pending->address);
+    if (m_pending->addressed) {
+        return m_pending->module && !reply.spoke.contains(*m_pending->module);
     }
     std::set<unsigned int> const& modules = m_memory.modules();
     return !std::includes(reply.spoke.begin(), reply.spoke.end(), modules.begin(), modules.end());
@@ -142,8 +119,8 @@ bool FastChannel::needsFullWait(HealedReply const& reply) const
 // too short makes the adapter talk over a module that still answers.
 void FastChannel::adaptWait(HealedReply const& reply)
 {
-    if (!reply.answered || reply.notices || m_pending->woken) {
-        return; // the time of a search, of a bus start or of a lost prompt is no module's
+    if (!reply.answered || reply.notices || m_pending->woken || m_pending->addressed) {
+        return; // the time of a search, of a bus start or of a lost prompt is no module's; an address has its own wait
     }
     m_slowest = std::max(m_slowest, m_pending->dataAt - m_pending->sentAt);
     bool const waitsLong = m_waitSteps != 0 || m_wire->now() - m_pending->dataAt > worthShortening;
@@ -162,6 +139,11 @@ void FastChannel::adaptWait(HealedReply const& reply)
     }
 }
 
+std::string FastChannel::waitCommand(unsigned int steps)
+{
+    return "ATST" + frameDigits({static_cast<std::uint8_t>(std::min(steps, 0xFFU))});
+}
+
 void FastChannel::setWait(unsigned int steps)
 {
     m_waitBefore = 0;
@@ -172,32 +154,6 @@ void FastChannel::giveWaitBack()
 {
     if (m_waitSteps != 0 && confirms(m_state.setting("ATST"), ownCommandLimit)) {
         m_waitBefore = std::exchange(m_waitSteps, 0);
-    }
-}
-
-void FastChannel::setAddress(Pending& pending)
-{
-    unsigned int module = 0;
-    {
-        std::lock_guard const lock(m_sharedMutex);
-        auto const found = m_addresses.find(std::this_thread::get_id());
-        module = found != m_addresses.end() ? found->second : 0;
-    }
-    std::optional<ModuleAddress> const address = addressOf(m_state.shownBus(), module);
-    if (address && confirms(address->set, ownCommandLimit)) {
-        pending.address = module;
-        pending.key += " " + address->set;
-    }
-}
-
-// An address that stayed would leave the other modules unasked: without a confirmation the link is given up.
-void FastChannel::restoreAddress()
-{
-    std::string const own = m_state.setting("ATSH");
-    std::string const restore = !own.empty() ? own : m_state.shownBus() == BusKind::Can11 ? "ATSH7DF" : "ATSHDB33F1";
-    std::string ignored;
-    if (!confirms(restore, ownCommandLimit) && !(wake(ignored) && confirms(restore, ownCommandLimit))) {
-        m_lost = true;
     }
 }
 

@@ -21,6 +21,7 @@ constexpr WireTime requestQuiet{300};
 constexpr WireTime pendingQuiet{5300};
 constexpr WireTime latePromptLimit{5000};
 constexpr WireTime wakeLimit{700};
+constexpr WireTime stoppedLimit{200};
 constexpr WireTime settingLimit{1000};
 constexpr WireTime restartPause{1000};
 constexpr WireTime resetsTooClose{60000};
@@ -126,7 +127,7 @@ bool FastChannel::wake(std::string& before)
         ++m_working.exchanges;
         m_wire->write("ATI\r");
         tellSent("ATI\r");
-        WireTime const until = m_wire->now() + wakeLimit;
+        WireTime until = m_wire->now() + wakeLimit;
         while (std::optional<std::string> const reply = awaitReply(until)) {
             if (isIdentity(*reply)) {
                 tellReceived(before);
@@ -136,6 +137,9 @@ bool FastChannel::wake(std::string& before)
             before += refused ? "" : *reply + "\r";
             if (refused) {
                 break; // the rest of a command that was cut
+            }
+            if (compactText(*reply).ends_with("STOPPED")) {
+                until = std::min(until, m_wire->now() + stoppedLimit); // it may have swallowed all of it
             }
         }
     }
@@ -180,13 +184,18 @@ bool FastChannel::setUpAgain(HealedReply const& reply)
         confirms(command, settingLimit);
     }
     m_waitSteps = 0;
+    m_restore.clear(); // a reset has taken it back
     m_learner.clear();
     ElmCommand const& command = m_pending->command;
     if (command.isRequest() && !command.onlyReads()) {
         return false;
     }
     m_pending->count.reset();
-    m_pending->address.reset();
+    m_pending->key = command.text();
+    m_pending->addressed = false;
+    if (!setAddress(*m_pending)) {
+        return false;
+    }
     writePending(command.text());
     return true;
 }

@@ -1,8 +1,10 @@
 #pragma once
 
 #include "libvelmora/channel/habit.h"
+#include "libvelmora/channel/requestaddress.h"
 
 #include <optional>
+#include <string>
 
 namespace velmora {
 
@@ -26,10 +28,19 @@ class IChannelControl
 public:
     virtual ~IChannelControl() = default;
 
-    // Requests of the calling thread go to this module alone from now on, until it is given nothing. The address is
-    // set and restored around each of them, inside the exchange. Of the legacy buses, and for modules without a known
-    // address of their own, requests stay broadcasts.
+    // Requests of the calling thread go to this module alone from now on, until it is given nothing: it saves the time
+    // of the other modules' replies. The address is set and restored around each of them, inside the exchange. On
+    // legacy buses, for modules without a known address of their own and with adapters that refuse it, requests stay
+    // broadcasts.
     virtual void addressModule(std::optional<unsigned int> module) = 0;
+
+    // The same for any address. A request that can't be sent there is not sent at all: it gets no answer, and
+    // refusedAddress says why.
+    virtual void address(std::optional<RequestAddress> const& address) = 0;
+
+    // The command of the calling thread's last address that the adapter refused; empty if it took all of them. "bus"
+    // for an address that is none of the bus.
+    virtual std::string refusedAddress() const = 0;
 
     // The connection stands: from now on nothing is answered from memory.
     virtual void onConnected() = 0;
@@ -37,13 +48,17 @@ public:
     virtual ChannelStatistics statistics() const = 0;
 };
 
-// Addresses one module for a scope of the calling thread.
+// Addresses one module, or whatever an address means, for a scope of the calling thread.
 class AddressedModule
 {
 public:
     AddressedModule(IChannelControl& control, unsigned int module) : m_control(control)
     {
         m_control.addressModule(module);
+    }
+    AddressedModule(IChannelControl& control, RequestAddress const& address) : m_control(control)
+    {
+        m_control.address(address);
     }
     ~AddressedModule() { m_control.addressModule(std::nullopt); }
     AddressedModule(AddressedModule const&) = delete;

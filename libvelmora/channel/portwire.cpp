@@ -17,13 +17,13 @@ PortWire::PortWire(std::unique_ptr<IPort> port) : m_port(std::move(port))
         [this](std::string_view bytes) {
             std::lock_guard const lock(m_mutex);
             m_incoming += bytes;
-            m_up = m_up && m_incoming.size() <= mostUnread;
+            m_open = m_open && m_incoming.size() <= mostUnread;
             m_wake.notify_one();
         },
         [this] {
             std::lock_guard const lock(m_mutex);
-            m_lost = m_up;
-            m_up = false;
+            m_lost = m_open && !m_givenUp;
+            m_open = false;
             m_wake.notify_one();
         });
 }
@@ -42,7 +42,7 @@ std::string PortWire::read(WireTime until)
 {
     std::unique_lock lock(m_mutex);
     std::chrono::steady_clock::time_point const limit{until};
-    m_wake.wait_until(lock, limit, [this] { return !m_incoming.empty() || !m_up; });
+    m_wake.wait_until(lock, limit, [this] { return !m_incoming.empty() || !m_open || m_givenUp; });
     return std::exchange(m_incoming, {});
 }
 
@@ -54,14 +54,21 @@ WireTime PortWire::now() const
 bool PortWire::isUp() const
 {
     std::lock_guard const lock(m_mutex);
-    return m_up;
+    return m_open && !m_givenUp;
 }
 
 void PortWire::giveUp()
 {
     std::lock_guard const lock(m_mutex);
-    m_up = false;
+    m_givenUp = true;
     m_wake.notify_one();
+}
+
+bool PortWire::resume()
+{
+    std::lock_guard const lock(m_mutex);
+    m_givenUp = false;
+    return m_open;
 }
 
 bool PortWire::lost() const

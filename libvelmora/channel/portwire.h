@@ -23,6 +23,7 @@ public:
     WireTime now() const override;
     bool isUp() const override;
     void giveUp() override;
+    bool resume() override;
 
     // Whether the link broke, rather than being given up here.
     bool lost() const;
@@ -32,7 +33,8 @@ private:
     mutable std::mutex m_mutex;
     std::condition_variable m_wake;
     std::string m_incoming; // protected by m_mutex, as what follows
-    bool m_up = true;
+    bool m_open = true;
+    bool m_givenUp = false;
     bool m_lost = false;
 };
 

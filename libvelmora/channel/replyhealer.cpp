@@ -148,7 +148,7 @@ void ReplyHealer::readFrames(std::vector<Entry>& entries, ReplyContext const& co
         reply.irregular = true;
         return;
     }
-    ModuleMessages messages(context.bus, m_counts);
+    ModuleMessages messages(context.bus, m_counts, context.extended);
     for (std::size_t place = 0; place < entries.size(); ++place) {
         Entry& entry = entries[place];
         bool const cut = place + 1 < entries.size() && entries[place + 1].line.kind == LineKind::Error &&
@@ -157,7 +157,7 @@ void ReplyHealer::readFrames(std::vector<Entry>& entries, ReplyContext const& co
             note(Habit::FlaggedLine);
             entry.keep = false;
         } else if (entry.line.kind == LineKind::Data) {
-            auto const frame = parseBusLine(context.bus, entry.line.text);
+            auto const frame = parseBusLine(context.bus, entry.line.text, context.extended);
             if (cut || !frame || !isTrusted(entry, context.bus)) {
                 note(Habit::BrokenLine);
                 entry.keep = false;
@@ -168,12 +168,16 @@ void ReplyHealer::readFrames(std::vector<Entry>& entries, ReplyContext const& co
         }
         reply.dropped = reply.dropped || !entry.keep;
     }
-    judge(messages, entries, context.command, reply);
+    judge(messages, entries, context, reply);
+    if (context.extended) {
+        showPlainly(messages, entries);
+    }
 }
 
-void ReplyHealer::judge(ModuleMessages& messages, std::vector<Entry>& entries, ElmCommand const& command,
+void ReplyHealer::judge(ModuleMessages& messages, std::vector<Entry>& entries, ReplyContext const& context,
                         HealedReply& reply)
 {
+    ElmCommand const& command = context.command;
     std::vector<ModuleMessage>& all = messages.all();
     auto const drop = [&entries, this](ModuleMessage const& message, Habit habit) {
         note(habit);
@@ -219,6 +223,22 @@ void ReplyHealer::judge(ModuleMessages& messages, std::vector<Entry>& entries, E
             reply.irregular = true;
         } else {
             reply.irregular = true; // a refusal, half a message, or somebody else's answer alone
+        }
+    }
+}
+
+// Readers know nothing of address bytes: a whole message is handed on in the frames that it would have without one,
+// half a message not at all.
+void ReplyHealer::showPlainly(ModuleMessages& messages, std::vector<Entry>& entries)
+{
+    for (ModuleMessage const& message : messages.all()) {
+        std::string const header = message.lines.front().substr(0, message.headerDigits);
+        std::vector<std::string> const frames =
+            message.complete() ? plainFrames(header, message.payload) : std::vector<std::string>();
+        for (std::size_t i = 0; i < message.places.size(); ++i) {
+            Entry& entry = entries[message.places[i]];
+            entry.keep = entry.keep && i < frames.size();
+            entry.line.text = i < frames.size() ? frames[i] : entry.line.text;
         }
     }
 }

@@ -24,6 +24,7 @@ struct ReplyContext
     std::string sent;               // what was really sent, which an adapter may echo
     BusKind bus = BusKind::Unknown; // Unknown while headers are off: the lines are then texts
     bool echoOff = false;           // the adapter was told to leave the echo away
+    bool extended = false;          // CAN: frames begin with an address byte; it is taken out
 };
 
 // A reply as it is handed on, and what is known of it.
@@ -83,7 +84,8 @@ private:
     HealedReply healRequest(std::vector<ReplyLine> const& lines, ReplyContext const& context);
     void readFrames(std::vector<Entry>& entries, ReplyContext const& context, HealedReply& reply);
     bool isTrusted(Entry const& entry, BusKind bus);
-    void judge(ModuleMessages& messages, std::vector<Entry>& entries, ElmCommand const& command, HealedReply& reply);
+    void judge(ModuleMessages& messages, std::vector<Entry>& entries, ReplyContext const& context, HealedReply& reply);
+    static void showPlainly(ModuleMessages& messages, std::vector<Entry>& entries);
     void dropBehindData(std::vector<Entry>& entries, HealedReply& reply);
     void note(Habit habit) { ++m_counts[static_cast<std::size_t>(habit)]; }
 

@@ -23,6 +23,8 @@ public:
     virtual bool isUp() const = 0;
     // Gives the link up: a read that is under way ends soon. Any thread.
     virtual void giveUp() = 0;
+    // Takes that back, for last words. False if the link itself is gone.
+    virtual bool resume() = 0;
 };
 
 } // namespace velmora

@@ -42,6 +42,11 @@ public:
     velmora::WireTime now() const override { return std::chrono::ceil<velmora::WireTime>(m_peer->now()); }
     bool isUp() const override { return !m_givenUp && m_peer->linkIsUp(); }
     void giveUp() override { m_givenUp = true; }
+    bool resume() override
+    {
+        m_givenUp = false;
+        return isUp();
+    }
 
     // All that was ever sent, and forgets it.
     std::string takeSent() { return std::exchange(m_sent, {}); }

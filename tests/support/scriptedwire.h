@@ -67,6 +67,7 @@ public:
     velmora::WireTime now() const override { return m_now; }
     bool isUp() const override { return m_up; }
     void giveUp() override { m_up = false; }
+    bool resume() override { return m_up = true; }
 
     // The commands that came, in their order; forgets them.
     std::vector<std::string> takeCommands() { return std::exchange(m_commands, {}); }

@@ -189,28 +189,6 @@ TEST(FastChannel, LoggersSeeWhatReallyPassed)
     EXPECT_EQ(tap.sent, "010C\r");
 }
 
-TEST(FastChannel, AModuleIsAddressedInsideTheExchangeOnly)
-{
-    ChannelRig rig;
-    rig.connect();
-    rig.wire->on("010C", engineSpeed).on("010D", ScriptedReply{});
-    {
-        AddressedModule const engine(rig.channel, 0x7E8);
-        rig.ask("010C");
-        EXPECT_THAT(rig.wire->takeCommands(), ElementsAre("ATSH7E0", "010C", "ATSH7DF"));
-        rig.ask("010D");
-    }
-    rig.ask("010C");
-    EXPECT_THAT(rig.wire->takeCommands(), ElementsAre("ATSH7E0", "010D", "ATI", "ATSH7DF", "010C"))
-        << "after a lost reply, too";
-    rig.wire->on("ATSH7DF", "?");
-    {
-        AddressedModule const engine(rig.channel, 0x7E8);
-        rig.ask("010C");
-    }
-    EXPECT_FALSE(rig.channel.isValid()) << "an address that stays would hide the other modules";
-}
-
 TEST(FastChannel, EachHabitHasAName)
 {
     for (std::size_t i = 0; i < habitCount; ++i) {

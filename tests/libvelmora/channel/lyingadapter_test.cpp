@@ -58,6 +58,7 @@ public:
     WireTime now() const override { return m_now; }
     bool isUp() const override { return true; }
     void giveUp() override {}
+    bool resume() override { return true; }
 
     int faults = 0;
 
