@@ -2,7 +2,17 @@
 
 #include "libvelmora/output/record.h"
 
+#include <cstdint>
+#include <optional>
+
 namespace velmora {
+
+// How an output is that keeps a connection, and what it holds back itself.
+struct OutputState
+{
+    std::optional<bool> up;
+    std::optional<std::uint64_t> waiting; // records
+};
 
 // Where values go. The calls come from one thread at a time and never overlap; queue, batching, pauses after a failure
 // and counts stand around it, in OutputRunner.
@@ -21,6 +31,8 @@ public:
     virtual void write(Records records) = 0;
     // After the last write. Throws Error if something was lost.
     virtual void close() = 0;
+    // While it is open.
+    virtual OutputState state() { return {}; }
 };
 
 } // namespace velmora

@@ -23,17 +23,27 @@ std::string single(std::string const& name, std::string const& type, std::string
     return familyHead(name, type, help) + fmt::format("{} {}\n", name, value);
 }
 
-// One family over all outputs.
+// One family over all outputs that have a number for it.
+template <typename Number>
+std::string overOutputs(Health const& health, std::string const& name, std::string const& type, std::string const& help,
+                        Number number)
+{
+    std::string lines;
+    for (auto const& [output, counts] : health.outputs) {
+        if (std::optional<std::uint64_t> const value = number(counts)) {
+            lines += fmt::format("{}{{output=\"{}\"}} {}\n", name, escapedLabel(output), *value);
+        }
+    }
+    return lines.empty() ? "" : familyHead(name, type, help) + lines;
+}
+
 template <typename Member>
 std::string overOutputs(Health const& health, std::string const& name, std::string const& type, std::string const& help,
-                        Member member)
+                        Member OutputCounts::*member)
 {
-    std::string text = health.outputs.empty() ? "" : familyHead(name, type, help);
-    for (auto const& [output, counts] : health.outputs) {
-        text += fmt::format("{}{{output=\"{}\"}} {}\n", name, escapedLabel(output),
-                            static_cast<std::uint64_t>(counts.*member));
-    }
-    return text;
+    return overOutputs(health, name, type, help, [member](OutputCounts const& counts) {
+        return std::optional(static_cast<std::uint64_t>(counts.*member));
+    });
 }
 
 std::string healthText(Health const& health)
@@ -55,12 +65,16 @@ std::string healthText(Health const& health)
                         &OutputCounts::failures);
     text += overOutputs(health, "velmora_output_failing", "gauge", "Whether the last attempt failed.",
                         &OutputCounts::failing);
+    text += overOutputs(health, "velmora_output_up", "gauge", "Whether the output's connection stands.",
+                        [](OutputCounts const& counts) { return counts.state.up; });
+    text += overOutputs(health, "velmora_output_spool_records", "gauge", "Records that wait on the disk.",
+                        [](OutputCounts const& counts) { return counts.state.waiting; });
     return text;
 }
 
 } // namespace
 
-void MetricsPage::take(Reading const& reading)
+void MetricsPage::take(Reading const& reading, SteadyTime now)
 {
     MetricFamily const family = metricFamily(reading.unit);
     Series const series(reading.vehicle, reading.module, reading.sensor);
@@ -74,10 +88,10 @@ void MetricsPage::take(Reading const& reading)
     }
     Family& place = m_families[family.name];
     place.help = family.help;
-    place.samples[series] = {*number * family.factor + family.offset, reading.time};
+    place.samples[series] = {*number * family.factor + family.offset, now};
 }
 
-std::string MetricsPage::render(WallTime now, Health const& health) const
+std::string MetricsPage::render(SteadyTime now, Health const& health) const
 {
     std::string text = healthText(health);
     std::string ages;

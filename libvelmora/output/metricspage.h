@@ -3,6 +3,7 @@
 #include "libvelmora/output/health.h"
 #include "libvelmora/output/record.h"
 
+#include <chrono>
 #include <map>
 #include <string>
 #include <tuple>
@@ -13,15 +14,18 @@ namespace velmora {
 class MetricsPage
 {
 public:
-    void take(Reading const& reading);
+    using SteadyTime = std::chrono::steady_clock::time_point;
+
+    // Ages go by the steady clock: the other may be set.
+    void take(Reading const& reading, SteadyTime now);
     // The text format, version 0.0.4. Values that are older than a minute have left the page.
-    std::string render(WallTime now, Health const& health) const;
+    std::string render(SteadyTime now, Health const& health) const;
 
 private:
     struct Sample
     {
         double value = 0.0;
-        WallTime time;
+        SteadyTime time;
     };
     using Series = std::tuple<std::string, unsigned int, std::string>; // vehicle, module, sensor
 

@@ -1,91 +1,57 @@
 #include "libvelmora/output/mqttoutput.h"
 
-#include "libvelmora/output/backoff.h"
 #include "libvelmora/output/recordjson.h"
+#include "libvelmora/output/spooltext.h"
 #include "libvelmora/output/valuetext.h"
 
 #include <velmora/error.h>
 
-#include <algorithm>
-#include <mosquitto.h>
-#include <mqtt_protocol.h>
-#include <random>
+#include <cstdlib>
+#include <thread>
 
 namespace velmora {
 
 namespace {
 
-constexpr std::size_t readingsInBatch = 1000;
-constexpr std::size_t batchesUnderWay = 20;
-constexpr int keepAliveSeconds = 30;
-constexpr int oldProtocol = 0x84; // what a broker without MQTT 5 answers
-constexpr std::chrono::seconds stuckAfter{30};
-constexpr std::chrono::seconds answerLimit{15}; // a cluster that has lost a node takes 4 s and more
 constexpr std::chrono::milliseconds lastWords{500};
-constexpr int loopMillis = 100;
+constexpr std::chrono::milliseconds statePause{1000};
+constexpr char const* homeAssistantStatus = "homeassistant/status";
 
-struct Mosquitto
+SpoolSender::Time steadyNow()
 {
-    Mosquitto() { ::mosquitto_lib_init(); }
-};
+    return std::chrono::steady_clock::now();
+}
 
-// What of a record goes through the spool: an array for a reading, an object for all else.
-struct SpoolText
+Spool::Time timeOf(ClockJudge::Trust trust)
 {
-    std::string operator()(Reading const& reading) const
-    {
-        nlohmann::ordered_json const whole = toJsonValue(reading);
-        return toLine({toMillis(reading.time), whole["module"], reading.sensor, whole["value"], reading.unit});
+    return trust == ClockJudge::Trust::Sure   ? Spool::Time::Sure
+           : trust == ClockJudge::Trust::Wait ? Spool::Time::Held
+                                              : Spool::Time::Unsure;
+}
+
+Spool::Stamp stampOf(ClockLook const& look)
+{
+    return {look.bootId, look.wall - look.boot};
+}
+
+// Whether a record was stamped before the clock was set by that step: then it lies nearer to where the clock would be
+// without.
+bool isFromBefore(Record const& record, std::int64_t step, ClockLook const& look)
+{
+    std::int64_t time = look.wall;
+    if (auto const* const reading = std::get_if<Reading>(&record)) {
+        time = toMillis(reading->time);
+    } else if (auto const* const event = std::get_if<Event>(&record)) {
+        time = toMillis(event->time);
     }
-    std::string operator()(Event const& event) const { return toLine(toJsonValue(event)); }
-    std::string operator()(Trip const& trip) const
-    {
-        nlohmann::ordered_json value = {{"event", "trip_record"}};
-        value.update(toJsonValue(trip));
-        return toLine(value);
-    }
-    std::string operator()(CodeChange const& code) const
-    {
-        return toLine({{"time", utcTime(code.time)},
-                       {"event", code.present ? "code" : "code_cleared"},
-                       {"module", moduleText(code.module)},
-                       {"code", code.code},
-                       {"kind", code.kind},
-                       {"text", code.text}});
-    }
-    std::string operator()(auto const& /*record*/) const { return {}; }
-};
+    return std::llabs(time - (look.wall - step)) < std::llabs(time - look.wall);
+}
 
 } // namespace
 
-struct MqttOutput::Callbacks
-{
-    static MqttOutput& of(void* object) { return *static_cast<MqttOutput*>(object); }
-    static void connect(mosquitto* /*client*/, void* object, int reason, int /*flags*/, mosquitto_property const* /*p*/)
-    {
-        of(object).onConnect(reason);
-    }
-    static void disconnect(mosquitto* /*client*/, void* object, int reason, mosquitto_property const* /*p*/)
-    {
-        of(object).onDisconnect(reason);
-    }
-    static void publish(mosquitto* /*client*/, void* object, int message, int reason, mosquitto_property const* /*p*/)
-    {
-        of(object).onPublish(message, reason);
-    }
-    static void message(mosquitto* /*client*/, void* object, mosquitto_message const* message,
-                        mosquitto_property const* /*p*/)
-    {
-        of(object).onMessage(message->topic, std::string(static_cast<char const*>(message->payload),
-                                                         static_cast<std::size_t>(message->payloadlen)));
-    }
-};
-
 MqttOutput::MqttOutput(OutputAddress const& address, OutputContext const& context)
-    : m_settings(mqttSettings(address, context)), m_tell(context.tell)
-{
-    static Mosquitto const library;
-}
+    : m_settings(mqttSettings(address, context)), m_tell(context.tell), m_clocks(context.clocks)
+{}
 
 MqttOutput::~MqttOutput()
 {
@@ -94,64 +60,43 @@ MqttOutput::~MqttOutput()
 
 void MqttOutput::open()
 {
-    {
-        std::lock_guard const lock(m_mutex);
-        m_spool = std::make_unique<Spool>(m_settings.spool, m_settings.spoolMax);
-    }
-    std::string const id = "velmora-" + m_settings.place.vehicle + "-" + m_spool->id().substr(0, 8);
-    m_client = ::mosquitto_new(id.c_str(), true, this);
-    ::mosquitto_int_option(m_client, MOSQ_OPT_PROTOCOL_VERSION, MQTT_PROTOCOL_V5);
-    ::mosquitto_connect_v5_callback_set(m_client, Callbacks::connect);
-    ::mosquitto_disconnect_v5_callback_set(m_client, Callbacks::disconnect);
-    ::mosquitto_publish_v5_callback_set(m_client, Callbacks::publish);
-    ::mosquitto_message_v5_callback_set(m_client, Callbacks::message);
-    ::mosquitto_will_set(m_client, m_settings.place.statusTopic.c_str(), 7, "offline", 1, true);
-    if (!m_settings.user.empty()) {
-        ::mosquitto_username_pw_set(m_client, m_settings.user.c_str(), m_settings.password.c_str());
-    }
-    connectTls();
-    ::mosquitto_threaded_set(m_client, true);
-    ::mosquitto_connect_async(m_client, m_settings.host.c_str(), m_settings.port, keepAliveSeconds);
-    m_thread = std::thread([this] { run(); });
+    std::lock_guard const lock(m_mutex);
+    m_spool = std::make_unique<Spool>(m_settings.spool, m_settings.spoolMax);
+    m_sender = std::make_unique<SpoolSender>(
+        *m_spool, m_settings.place.vehicle, !m_settings.ackTopic.empty(),
+        [this](std::string const& payload) {
+            return m_link->publish(m_settings.topic + "/readings", payload, m_settings.qos, false);
+        },
+        [this](std::string const& text) { tellOnce(text); });
+    resumeHeld(m_clocks());
+    m_link = std::make_unique<BrokerLink>(
+        m_settings, "velmora-" + m_settings.place.vehicle + "-" + m_spool->id().substr(0, 8),
+        BrokerLink::Will{m_settings.place.statusTopic, "offline"}, static_cast<BrokerLink::Listener&>(*this));
+    m_link->start();
 }
 
-// libmosquitto's own thread gives up for good after some refusals, and knows no jitter.
-void MqttOutput::run()
+// What was held when the watch ended still is, if the machine has not been started anew. Else nobody knows any more
+// how wrong its clock was.
+void MqttOutput::resumeHeld(ClockLook const& look)
 {
-    Backoff backoff(std::random_device{}());
-    auto attempt = std::chrono::steady_clock::now();
-    std::unique_lock lock(m_mutex);
-    while (!m_stop) {
-        lock.unlock();
-        int const result = ::mosquitto_loop(m_client, loopMillis, 1);
-        lock.lock();
-        auto const now = std::chrono::steady_clock::now();
-        if (m_connected) {
-            backoff.reset();
-            attempt = now;
-        }
-        if (result != MOSQ_ERR_SUCCESS || now - attempt > answerLimit) {
-            m_connected = false;
-            m_wake.wait_for(lock, backoff.next(), [this] { return m_stop; });
-            attempt = std::chrono::steady_clock::now();
-            lock.unlock();
-            ::mosquitto_reconnect_async(m_client);
-            lock.lock();
-        }
-    }
-}
-
-void MqttOutput::connectTls()
-{
-    if (!m_settings.tls) {
+    m_judge = ClockJudge();
+    m_judge.look(look);
+    std::optional<Spool::Stamp> const stamp = m_spool->heldStamp();
+    if (stamp && stamp->bootId != look.bootId) {
+        m_spool->release(Spool::Time::Unsure);
         return;
     }
-    char const* const ca = m_settings.ca.empty() ? nullptr : m_settings.ca.c_str();
-    char const* const folder = m_settings.ca.empty() ? "/etc/ssl/certs" : nullptr;
-    if (::mosquitto_tls_set(m_client, ca, folder, nullptr, nullptr, nullptr) != MOSQ_ERR_SUCCESS ||
-        ::mosquitto_tls_opts_set(m_client, 1, "tlsv1.2", nullptr) != MOSQ_ERR_SUCCESS) {
-        throw Error(ErrorKind::WrongUse, "Could not use the certificates of " + m_settings.ca,
-                    {"is it a file of PEM certificates?"});
+    if (stamp) {
+        ClockLook before = look;
+        before.wall = look.boot + stamp->offset;
+        ClockJudge judge;
+        judge.look(before);
+        if (std::int64_t const step = judge.look(look); step != 0) {
+            m_spool->shiftHeld(step, stampOf(look));
+        }
+    }
+    if (m_judge.trust() != ClockJudge::Trust::Wait) {
+        m_spool->release(timeOf(m_judge.trust()));
     }
 }
 
@@ -163,152 +108,137 @@ void MqttOutput::tellOnce(std::string const& text)
     }
 }
 
-void MqttOutput::onConnect(int reason)
+void MqttOutput::onUp()
 {
     std::lock_guard const lock(m_mutex);
-    if (reason == oldProtocol) {
-        ::mosquitto_int_option(m_client, MOSQ_OPT_PROTOCOL_VERSION, MQTT_PROTOCOL_V311); // for the next attempt
-        return;
-    }
-    if (reason != 0) {
-        tellOnce(std::string("the broker refuses: ") + ::mosquitto_reason_string(reason));
-        return;
-    }
     tellOnce("connected");
-    m_connected = true;
-    m_progress = std::chrono::steady_clock::now();
+    m_sender->onUp(steadyNow());
     if (!m_settings.ackTopic.empty()) {
-        sendAgain(m_stored);
-        ::mosquitto_subscribe(m_client, nullptr, m_settings.ackTopic.c_str(), 1);
+        m_link->subscribe(m_settings.ackTopic, 1);
     }
     if (m_settings.discovery != Discovery::Off) {
-        ::mosquitto_subscribe(m_client, nullptr, "homeassistant/status", 0);
+        m_link->subscribe(homeAssistantStatus, 0);
     }
     publishRetained(m_settings.place.statusTopic, "online");
     publishDiscovery();
-    pump();
+    m_sender->pump(steadyNow());
 }
 
-void MqttOutput::onDisconnect(int reason)
+void MqttOutput::onDown(std::string const& why)
 {
     std::lock_guard const lock(m_mutex);
-    m_connected = false;
-    if (reason != 0 && m_lastTold == "connected") {
-        tellOnce("the connection broke; readings wait in " + m_settings.spool);
-    }
+    m_sender->onDown();
+    tellOnce("no connection (" + why + "); readings wait in " + m_settings.spool);
 }
 
-// A broker may refuse what its rights forbid: that is no delivery.
-void MqttOutput::onPublish(int message, int reason)
+void MqttOutput::onDelivered(int message)
 {
     std::lock_guard const lock(m_mutex);
-    auto const flight = m_flights.find(message);
-    if (flight == m_flights.end()) {
-        return;
-    }
-    std::int64_t const last = flight->second;
-    m_flights.erase(flight);
-    if (reason >= 0x80) {
-        tellOnce(std::string("the broker refuses readings: ") + ::mosquitto_reason_string(reason));
-        sendAgain(0); // with what comes next
-        return;
-    }
-    m_ended[last] = true;
-    std::int64_t whole = 0;
-    while (!m_ended.empty() && m_ended.begin()->second) {
-        whole = m_ended.begin()->first;
-        m_ended.erase(m_ended.begin());
-    }
-    if (m_settings.ackTopic.empty() && whole > 0) {
-        forgetUpTo(whole);
-    }
-    pump();
+    m_sender->onDelivered(message, steadyNow());
+}
+
+void MqttOutput::onRefused(int message, std::string const& why)
+{
+    std::lock_guard const lock(m_mutex);
+    tellOnce("the broker refuses what is sent: " + why);
+    m_sender->onRefused(message);
 }
 
 void MqttOutput::onMessage(std::string const& topic, std::string const& payload)
 {
     std::lock_guard const lock(m_mutex);
-    if (topic == "homeassistant/status") {
+    if (topic == homeAssistantStatus) {
         if (payload == "online") {
             publishDiscovery();
         }
-        return;
-    }
-    std::optional<std::int64_t> const mark = storedMark(payload, m_spool->id());
-    if (mark && *mark > m_stored) {
-        m_stored = *mark;
-        m_progress = std::chrono::steady_clock::now();
-        m_sent = std::max(m_sent, m_stored);
-        forgetUpTo(m_stored);
-        pump();
-    }
-}
-
-// On libmosquitto's thread nobody catches; what could not be forgotten is sent again.
-void MqttOutput::forgetUpTo(std::int64_t seq)
-{
-    try {
-        m_spool->forget(seq);
-    } catch (Error const& error) {
-        tellOnce(error.what());
+    } else if (std::optional<std::int64_t> const mark = storedMark(payload, m_spool->id())) {
+        m_sender->onMark(*mark, steadyNow());
     }
 }
 
 void MqttOutput::write(Records records)
 {
     std::lock_guard const lock(m_mutex);
-    spoolRecords(records);
-    Spool::Gap const gap = m_spool->makeRoom();
-    if (gap.last > 0) {
-        m_spool->add({toLine({{"time", utcTime(std::chrono::system_clock::now())},
-                              {"event", "gap"},
-                              {"from", gap.first},
-                              {"to", gap.last}})});
-        tellOnce("the spool is full: its oldest readings were dropped");
+    watchClock(records);
+    for (SharedRecord const& record : records) {
+        takeForHome(*record);
     }
     publishState();
-    resendIfStuck();
-    pump();
+    m_sender->pump(steadyNow());
 }
 
-void MqttOutput::spoolRecords(Records records)
+// Times are repaired before they are sent and never after: a consumer may know a reading by its time, too.
+void MqttOutput::watchClock(Records records)
+{
+    ClockLook const look = m_clocks();
+    bool const held = m_judge.trust() == ClockJudge::Trust::Wait;
+    std::int64_t const step = m_judge.look(look);
+    Spool::Time const time = timeOf(m_judge.trust());
+    if (held && step != 0) {
+        m_spool->shiftHeld(step, stampOf(look));
+    } else if (time == Spool::Time::Held && !m_spool->heldStamp()) {
+        m_spool->keepStamp(stampOf(look));
+    }
+    spoolRecords(records, held ? step : 0, look);
+    if (held && time != Spool::Time::Held) {
+        m_spool->release(time);
+    }
+    makeRoom(look);
+}
+
+void MqttOutput::spoolRecords(Records records, std::int64_t step, ClockLook const& look)
 {
     std::vector<std::string> texts;
     for (SharedRecord const& record : records) {
-        if (auto const* const reading = std::get_if<Reading>(record.get())) {
-            takeState(*reading);
-        } else if (auto const* const list = std::get_if<SensorList>(record.get())) {
-            m_sensors = list->sensors;
-            publishDiscovery();
+        std::string text = spoolText(*record);
+        if (text.empty()) {
+            continue;
         }
-        std::string text = std::visit(SpoolText(), *record);
-        if (!text.empty()) {
-            texts.push_back(std::move(text));
-        }
+        bool const shifts = step != 0 && isFromBefore(*record, step, look);
+        texts.push_back(shifts ? shiftedText(text, step) : std::move(text));
     }
     if (!texts.empty()) {
-        m_spool->add(texts);
+        m_spool->add(texts, timeOf(m_judge.trust()));
     }
 }
 
-void MqttOutput::takeState(Reading const& reading)
+void MqttOutput::makeRoom(ClockLook const& look)
 {
-    nlohmann::ordered_json const value = toJsonValue(reading)["value"];
-    m_state[stateKey(reading.module, reading.sensor)] = value.is_null() ? nlohmann::ordered_json("None") : value;
-    m_stateChanged = true;
+    Spool::Gap const gap = m_spool->makeRoom();
+    if (gap.last > 0) {
+        nlohmann::ordered_json const event = {
+            {"time", look.wall}, {"event", "gap"}, {"from", gap.first}, {"to", gap.last}};
+        m_spool->add({toLine(event)}, timeOf(m_judge.trust()));
+        tellOnce("the spool is full: its oldest readings were dropped");
+    }
+}
+
+void MqttOutput::takeForHome(Record const& record)
+{
+    if (auto const* const reading = std::get_if<Reading>(&record)) {
+        nlohmann::ordered_json const value = valueJson(*reading);
+        m_state[stateKey(reading->module, reading->sensor)] = value.is_null() ? nlohmann::ordered_json("None") : value;
+        m_stateChanged = true;
+    } else if (auto const* const list = std::get_if<SensorList>(&record)) {
+        m_sensors = list->sensors;
+        publishDiscovery();
+    }
 }
 
 void MqttOutput::publishState()
 {
-    if (m_connected && m_stateChanged) {
+    auto const now = steadyNow();
+    // A little less than a second: writes come once a second, give or take.
+    if (m_sender->isUp() && m_stateChanged && now - m_stateTime >= statePause - statePause / 10) {
         m_stateChanged = false;
+        m_stateTime = now;
         publishRetained(m_settings.place.stateTopic, toLine(m_state));
     }
 }
 
 void MqttOutput::publishDiscovery()
 {
-    if (!m_connected) {
+    if (!m_sender->isUp()) {
         return;
     }
     for (auto const& [topic, payload] : discoveryMessages(m_settings.discovery, m_settings.place, m_sensors)) {
@@ -318,97 +248,38 @@ void MqttOutput::publishDiscovery()
 
 void MqttOutput::publishRetained(std::string const& topic, std::string const& payload)
 {
-    ::mosquitto_publish(m_client, nullptr, topic.c_str(), static_cast<int>(payload.size()), payload.data(), 1, true);
+    m_link->publish(topic, payload, 1, true);
 }
 
-// A consumer that reports nothing for long has lost what was sent, or the broker has.
-void MqttOutput::resendIfStuck()
+OutputState MqttOutput::state()
 {
-    auto const now = std::chrono::steady_clock::now();
-    if (m_settings.ackTopic.empty() || m_sent == m_stored) {
-        m_progress = now;
-    } else if (m_connected && m_flights.empty() && now - m_progress >= stuckAfter) {
-        m_progress = now;
-        sendAgain(m_stored);
-    }
+    std::lock_guard const lock(m_mutex);
+    return {m_sender->isUp(), static_cast<std::uint64_t>(m_spool->span())};
 }
 
-// What is under way counts no longer: an acknowledgement of a later batch must not stand for an earlier one.
-void MqttOutput::sendAgain(std::int64_t after)
+bool MqttOutput::underway()
 {
-    m_sent = after;
-    m_flights.clear();
-    m_ended.clear();
-}
-
-void MqttOutput::pump()
-{
-    try {
-        while (m_connected && m_flights.size() < batchesUnderWay && sendBatch()) {
-        }
-    } catch (Error const& error) {
-        tellOnce(error.what());
-    }
-}
-
-bool MqttOutput::sendBatch()
-{
-    std::vector<Spool::Row> const rows = m_spool->after(m_sent, readingsInBatch);
-    if (rows.empty()) {
-        return false;
-    }
-    std::string readings;
-    std::string events;
-    for (Spool::Row const& row : rows) {
-        bool const isReading = row.text.starts_with('[');
-        std::string& list = isReading ? readings : events;
-        list += (list.empty() ? "" : ",") + row.text.substr(0, 1) + (isReading ? "" : "\"seq\":") +
-                std::to_string(row.seq) + "," + row.text.substr(1);
-    }
-    std::string const payload = R"({"vehicle":")" + m_settings.place.vehicle + R"(","spool":")" + m_spool->id() +
-                                R"(","after":)" + std::to_string(m_sent) + R"(,"last":)" +
-                                std::to_string(rows.back().seq) + R"(,"readings":[)" + readings + R"(],"events":[)" +
-                                events + "]}";
-    int message = 0;
-    std::string const topic = m_settings.topic + "/readings";
-    int const result = ::mosquitto_publish(m_client, &message, topic.c_str(), static_cast<int>(payload.size()),
-                                           payload.data(), m_settings.qos, false);
-    if (result != MOSQ_ERR_SUCCESS && result != MOSQ_ERR_NO_CONN) {
-        return false;
-    }
-    m_sent = rows.back().seq;
-    m_flights[message] = m_sent;
-    m_ended[m_sent] = false;
-    return result == MOSQ_ERR_SUCCESS;
+    std::lock_guard const lock(m_mutex);
+    return m_sender->isUp() && m_sender->isUnderway();
 }
 
 void MqttOutput::close()
 {
-    if (m_client == nullptr) {
+    if (m_link == nullptr) {
         return;
     }
-    {
-        std::lock_guard const lock(m_mutex);
-        pump();
-        if (m_connected) {
-            publishRetained(m_settings.place.statusTopic, "offline");
-        }
-    }
-    auto const limit = std::chrono::steady_clock::now() + lastWords;
-    while (m_client != nullptr && ::mosquitto_want_write(m_client) && std::chrono::steady_clock::now() < limit) {
+    auto const limit = steadyNow() + lastWords;
+    while (underway() && steadyNow() < limit) {
         std::this_thread::sleep_for(std::chrono::milliseconds(5));
     }
-    {
-        std::lock_guard const lock(m_mutex);
-        m_stop = true;
-        m_wake.notify_all();
+    m_link->publish(m_settings.place.statusTopic, "offline", 1, true);
+    while (m_link->isBusy() && steadyNow() < limit + lastWords) {
+        std::this_thread::sleep_for(std::chrono::milliseconds(5));
     }
-    m_thread.join();
-    ::mosquitto_disconnect(m_client);
-    ::mosquitto_loop(m_client, 0, 1);
-    ::mosquitto_destroy(m_client);
-    m_client = nullptr;
+    m_link->stop();
+    m_link.reset();
     std::lock_guard const lock(m_mutex);
+    m_sender.reset();
     m_spool.reset();
 }
 

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "libvelmora/output/clockjudge.h"
 #include "libvelmora/output/health.h"
 #include "libvelmora/output/ioutput.h"
 #include "libvelmora/output/outputaddress.h"
@@ -17,6 +18,7 @@ struct OutputContext
     HealthSource health = [] { return Health(); };
     std::string vehicle = "car";       // its name in topics
     std::filesystem::path stateFolder; // for what an output has to keep, if it is not told where
+    ClockSource clocks = lookAtClocks;
     OutputRunner::Tell tell = [](std::string const& /*text*/) {};
 };
 

@@ -1,210 +1,34 @@
 #include "libvelmora/output/outputrunner.h"
 
-#include <velmora/error.h>
-
-#include <algorithm>
-
 namespace velmora {
 
 OutputRunner::OutputRunner(std::string name, std::unique_ptr<IOutput> output, Tell tell, OutputLimits const& limits)
-    : m_name(std::move(name)), m_output(std::move(output)), m_tell(std::move(tell)), m_limits(limits)
+    : m_worker(std::make_shared<OutputWorker>(std::move(name), std::move(output), std::move(tell), limits))
 {}
 
 void OutputRunner::start()
 {
-    try {
-        m_output->open();
-        m_open = true;
-    } catch (Error const& error) {
-        if (error.kind() == ErrorKind::WrongUse) {
-            throw;
-        }
-        onFailure(error.what());
-    }
-    m_thread = std::thread([this] { run(); });
-}
-
-void OutputRunner::push(SharedRecord record)
-{
-    std::lock_guard const lock(m_mutex);
-    m_queue.push_back(std::move(record));
-    ++m_counts.accepted;
-    if (m_queue.size() > m_limits.queue) {
-        m_queue.pop_front();
-        ++m_counts.dropped;
-    }
-    if (m_queue.size() == m_limits.batch || m_limits.interval.count() == 0) {
-        m_wake.notify_one();
-    }
-}
-
-void OutputRunner::flush()
-{
-    std::lock_guard const lock(m_mutex);
-    m_flush = true;
-    m_wake.notify_one();
-}
-
-void OutputRunner::beginStop()
-{
-    std::lock_guard const lock(m_mutex);
-    m_stopped = true;
-    m_wake.notify_one();
+    m_worker->open();
+    m_thread = std::thread([worker = m_worker] { worker->run(); });
 }
 
 void OutputRunner::stop()
 {
-    beginStop();
+    m_worker->beginStop();
     if (m_thread.joinable()) {
         m_thread.join();
     }
 }
 
-OutputCounts OutputRunner::counts() const
+bool OutputRunner::stopWithin(std::chrono::milliseconds limit)
 {
-    std::lock_guard const lock(m_mutex);
-    return m_counts;
-}
-
-void OutputRunner::run()
-{
-    while (true) {
-        waitForWork();
-        {
-            std::lock_guard const lock(m_mutex);
-            if (m_stopped) {
-                break;
-            }
-        }
-        takeBatch();
-        if (!openAgain() || !writeBatch()) {
-            pause();
-        }
-        tellDropped();
-    }
-    finish();
-}
-
-void OutputRunner::waitForWork()
-{
-    std::unique_lock lock(m_mutex);
-    auto const due = [this] { return m_stopped || m_flush || m_queue.size() >= m_limits.batch; };
-    if (m_limits.interval.count() == 0) {
-        m_wake.wait(lock, [&] { return due() || !m_queue.empty() || !m_batch.empty(); });
-    } else {
-        m_wake.wait_for(lock, m_limits.interval, due);
-    }
-    m_flush = false;
-}
-
-bool OutputRunner::openAgain()
-{
-    if (m_open) {
-        return true;
-    }
-    try {
-        m_output->open();
-        m_open = true;
-    } catch (std::exception const& error) {
-        onFailure(error.what());
-    }
-    return m_open;
-}
-
-// A batch that failed is tried again as it was.
-void OutputRunner::takeBatch()
-{
-    std::lock_guard const lock(m_mutex);
-    if (!m_batch.empty()) {
-        return;
-    }
-    auto const end = m_queue.begin() + static_cast<std::ptrdiff_t>(std::min(m_limits.batch, m_queue.size()));
-    m_batch.assign(std::make_move_iterator(m_queue.begin()), std::make_move_iterator(end));
-    m_queue.erase(m_queue.begin(), end);
-    m_counts.queued = m_queue.size() + m_batch.size();
-}
-
-bool OutputRunner::writeBatch()
-{
-    try {
-        m_output->write(m_batch);
-    } catch (std::exception const& error) {
-        onFailure(error.what());
+    m_worker->beginStop();
+    if (m_thread.joinable() && !m_worker->waitForEnd(limit)) {
+        m_thread.detach();
         return false;
     }
-    onSuccess();
+    stop();
     return true;
-}
-
-void OutputRunner::onFailure(std::string const& what)
-{
-    bool first = false;
-    {
-        std::lock_guard const lock(m_mutex);
-        first = !m_counts.failing;
-        m_counts.failing = true;
-        ++m_counts.failures;
-        m_counts.lastError = what;
-        m_counts.queued = m_queue.size() + m_batch.size();
-    }
-    m_pause = std::clamp(m_pause * 2, m_limits.firstPause, m_limits.longestPause);
-    if (first) {
-        m_tell(m_name + ": " + what);
-    }
-}
-
-void OutputRunner::onSuccess()
-{
-    bool recovered = false;
-    {
-        std::lock_guard const lock(m_mutex);
-        recovered = m_counts.failing;
-        m_counts.failing = false;
-        m_counts.written += m_batch.size();
-        m_batch.clear();
-        m_counts.queued = m_queue.size();
-    }
-    m_pause = std::chrono::milliseconds(0);
-    if (recovered) {
-        m_tell(m_name + ": works again");
-    }
-}
-
-void OutputRunner::pause()
-{
-    std::unique_lock lock(m_mutex);
-    m_wake.wait_for(lock, m_pause, [this] { return m_stopped; });
-}
-
-// Told when it begins, and then at each tenfold, so that a day without a broker is a handful of lines.
-void OutputRunner::tellDropped()
-{
-    std::uint64_t const dropped = counts().dropped;
-    if (dropped > 0 && dropped >= m_droppedTold * 10) {
-        m_droppedTold = dropped;
-        m_tell(m_name + ": too slow, " + std::to_string(dropped) + " records dropped so far");
-    }
-}
-
-void OutputRunner::finish()
-{
-    do {
-        takeBatch();
-        if (!openAgain() || !writeBatch()) {
-            break;
-        }
-    } while (counts().queued > 0);
-    std::size_t const left = counts().queued;
-    if (left > 0) {
-        m_tell(m_name + ": " + std::to_string(left) + " records could not be written before the end");
-    }
-    try {
-        if (m_open) {
-            m_output->close();
-        }
-    } catch (std::exception const& error) {
-        m_tell(m_name + ": " + error.what());
-    }
 }
 
 } // namespace velmora

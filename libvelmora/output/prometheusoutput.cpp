@@ -10,7 +10,7 @@ PrometheusOutput::PrometheusOutput(OutputAddress const& address, HealthSource he
         std::lock_guard const lock(m_mutex);
         HttpResponse response;
         response.contentType = "text/plain; version=0.0.4; charset=utf-8";
-        response.body = m_page.render(std::chrono::system_clock::now(), now);
+        response.body = m_page.render(std::chrono::steady_clock::now(), now);
         return response;
     });
 }
@@ -25,7 +25,7 @@ void PrometheusOutput::write(Records records)
     std::lock_guard const lock(m_mutex);
     for (SharedRecord const& record : records) {
         if (auto const* const reading = std::get_if<Reading>(record.get())) {
-            m_page.take(*reading);
+            m_page.take(*reading, std::chrono::steady_clock::now());
         }
     }
 }

@@ -13,6 +13,13 @@ namespace {
 
 using OrderedJson = nlohmann::ordered_json;
 
+OrderedJson orNull(std::optional<double> const& value)
+{
+    return value ? OrderedJson::parse(fmt::format("{:.6g}", *value)) : OrderedJson(nullptr);
+}
+
+} // namespace
+
 OrderedJson valueJson(Reading const& reading)
 {
     if (std::string const* const text = std::get_if<std::string>(&reading.value)) {
@@ -21,13 +28,6 @@ OrderedJson valueJson(Reading const& reading)
     std::optional<double> const number = numberOf(reading);
     return number ? OrderedJson::parse(numberText(*number)) : OrderedJson(nullptr);
 }
-
-OrderedJson orNull(std::optional<double> const& value)
-{
-    return value ? OrderedJson::parse(fmt::format("{:.6g}", *value)) : OrderedJson(nullptr);
-}
-
-} // namespace
 
 OrderedJson toJsonValue(Reading const& reading)
 {

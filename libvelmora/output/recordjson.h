@@ -8,6 +8,8 @@ namespace velmora {
 
 // {"time", "vehicle", "module", "pid", "sensor", "name", "value": number, text or null, "unit", "raw"}.
 nlohmann::ordered_json toJsonValue(Reading const& reading);
+// Its value alone.
+nlohmann::ordered_json valueJson(Reading const& reading);
 // {"time", "vehicle", "event", "module" or null, "text"}.
 nlohmann::ordered_json toJsonValue(Event const& event);
 // {"begin", "end", "vehicle", "kind", "distance_km", ...}.

@@ -1,8 +1,10 @@
 #pragma once
 
+#include "libvelmora/output/ballast.h"
 #include "libvelmora/output/database.h"
 
 #include <cstdint>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -13,9 +15,18 @@ namespace velmora {
 class Spool
 {
 public:
+    // What is known of the time in a row. It may change while the row is held, and never after that.
+    enum class Time
+    {
+        Held = 0, // the clock may still be set: not to be sent yet
+        Sure = 1,
+        Unsure = 2, // as the clock was, which nobody has set
+    };
+
     struct Row
     {
         std::int64_t seq = 0;
+        Time time = Time::Sure;
         std::string text;
     };
 
@@ -26,11 +37,14 @@ public:
     std::string const& id() const { return m_id; }
 
     // All of them or none. Throws Error.
-    void add(std::vector<std::string> const& texts);
-    // The first rows behind that number.
+    void add(std::vector<std::string> const& texts, Time time = Time::Sure);
+    // The first rows behind that number, up to the first that is held.
     std::vector<Row> after(std::int64_t seq, std::size_t most);
     // Forgets all up to that number.
     void forget(std::int64_t seq);
+    // The highest number that was ever given.
+    std::int64_t newest();
+
     // Makes room if the file is too large; the numbers that were lost are told as first and last, 0 for none.
     struct Gap
     {
@@ -39,15 +53,35 @@ public:
     };
     Gap makeRoom();
 
+    // By which clock held rows were stamped: the machine's start, and how far the wall clock was ahead of the time
+    // since then.
+    struct Stamp
+    {
+        std::string bootId;
+        std::int64_t offset = 0; // ms
+    };
+    std::optional<Stamp> heldStamp();
+    void keepStamp(Stamp const& stamp);
+    // Moves the times in all held rows, which are stamped like that from now on.
+    void shiftHeld(std::int64_t millis, Stamp const& stamp);
+    // No row is held any more.
+    void release(Time time);
+
     std::int64_t rows() { return m_database.number("SELECT count(*) FROM row"); }
+    // How many there are at most, without counting them.
+    std::int64_t span();
     // How many makeRoom has dropped, ever.
     std::int64_t dropped() { return m_database.number("SELECT dropped FROM meta"); }
 
 private:
     void prepare();
     std::int64_t usedBytes();
+    void writeStamp(Stamp const& stamp);
+    template <typename Work>
+    void change(Work const& work);
 
     Database m_database;
+    Ballast m_ballast;
     unsigned long long const m_maxBytes;
     std::string m_id;
 };

@@ -17,6 +17,8 @@ namespace velmora::cli {
 
 namespace {
 
+constexpr std::chrono::milliseconds endLimit{1300}; // for all outputs: a service manager's patience is short
+
 WatchTime timeNow()
 {
     return {std::chrono::steady_clock::now(), std::chrono::system_clock::now()};
@@ -60,6 +62,13 @@ OutputLimits limitsOf(OutputAddress const& address)
     return limits;
 }
 
+void sayUnless(bool quiet, std::string const& text)
+{
+    if (!quiet) {
+        tell(utcTime(std::chrono::system_clock::now()) + " " + text + "\n");
+    }
+}
+
 WatchRules rulesOf(WatchSettings const& settings, std::string const& vehicle)
 {
     WatchRules rules;
@@ -89,10 +98,11 @@ void WatchRun::addOutputs(WatchSettings const& settings)
     OutputContext context;
     context.vehicle = m_vehicle;
     context.stateFolder = stateFolder();
-    context.tell = [this](std::string const& text) { say(text); };
-    context.health = [this] {
-        std::lock_guard const lock(m_healthMutex);
-        return m_health;
+    // An output that hangs may outlive this object.
+    context.tell = [quiet = m_options.quiet](std::string const& text) { sayUnless(quiet, text); };
+    context.health = [board = m_health] {
+        std::lock_guard const lock(board->mutex);
+        return board->health;
     };
     for (OutputAddress const& address : settings.outputs) {
         m_outputs.push_back(std::make_unique<OutputRunner>(toString(address), makeOutput(address, context),
@@ -115,8 +125,13 @@ WatchRun::~WatchRun()
     for (std::unique_ptr<OutputRunner> const& each : m_outputs) {
         each->beginStop();
     }
+    auto const limit = std::chrono::steady_clock::now() + endLimit;
     for (std::unique_ptr<OutputRunner> const& each : m_outputs) {
-        each->stop();
+        auto const left =
+            std::chrono::duration_cast<std::chrono::milliseconds>(limit - std::chrono::steady_clock::now());
+        if (!each->stopWithin(std::max(left, std::chrono::milliseconds(0)))) {
+            say(each->name() + ": hangs, and is not waited for");
+        }
     }
 }
 
@@ -176,15 +191,13 @@ void WatchRun::takeHealth()
     for (std::unique_ptr<OutputRunner> const& each : m_outputs) {
         health.outputs.emplace_back(each->name(), each->counts());
     }
-    std::lock_guard const lock(m_healthMutex);
-    m_health = std::move(health);
+    std::lock_guard const lock(m_health->mutex);
+    m_health->health = std::move(health);
 }
 
 void WatchRun::say(std::string const& text) const
 {
-    if (!m_options.quiet) {
-        tell(utcTime(std::chrono::system_clock::now()) + " " + text + "\n");
-    }
+    sayUnless(m_options.quiet, text);
 }
 
 } // namespace velmora::cli

@@ -29,6 +29,12 @@ public:
     void end();
 
 private:
+    struct HealthBoard
+    {
+        std::mutex mutex;
+        Health health; // protected by mutex
+    };
+
     void addOutputs(WatchSettings const& settings);
     void take(Record record);
     void tellState();
@@ -39,8 +45,7 @@ private:
     ServiceNotify& m_notify;
     std::string const m_vehicle;
     SessionCar m_car;
-    std::mutex m_healthMutex;
-    Health m_health; // protected by m_healthMutex
+    std::shared_ptr<HealthBoard> const m_health = std::make_shared<HealthBoard>(); // shared with the outputs
     std::vector<std::unique_ptr<OutputRunner>> m_outputs;
     std::unique_ptr<WatchEngine> m_engine;
     std::string m_toldState;

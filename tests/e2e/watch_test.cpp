@@ -130,4 +130,26 @@ TEST(Watch, TheServiceManagerFindsNothingToSayAgainstTheUnit)
         << folder.read("log");
 }
 
+// How it ends in an unkind moment; the script tells what the cases are.
+void expectEnding(std::string const& name)
+{
+    std::string const script = VELMORA_SOURCE_DIR "/tests/e2e/ending.py";
+    EXPECT_EQ(std::system(("/usr/bin/python3 " + script + " " VELMORA_PROGRAM " " + name).c_str()), 0);
+}
+
+TEST(Watch, EndsInTimeWhileTheNameOfABrokerIsLookedUp)
+{
+    expectEnding("name");
+}
+
+TEST(Watch, EndsInTimeWhileNobodyReadsAnOutput)
+{
+    expectEnding("pipe");
+}
+
+TEST(Watch, ASecondSignalEndsItAtOnce)
+{
+    expectEnding("twice");
+}
+
 } // namespace

@@ -171,6 +171,27 @@ TEST(OutputRunner, TheEndWaitsForNoPauseAndTellsWhatIsLeft)
     EXPECT_EQ(runner.counts().lastError, "disk full");
 }
 
+TEST(OutputRunner, OneThatHangsIsLeftBehind)
+{
+    static Witness witness; // outlives the thread
+    witness.held = true;
+    {
+        OutputRunner runner("csv:a", std::make_unique<WitnessOutput>(witness), tellTo(witness), withoutWaiting());
+        runner.start();
+        pushValue(runner, 1.0);
+        witness.waitFor([&] { return witness.waiting == 1; });
+        EXPECT_FALSE(runner.stopWithin(std::chrono::milliseconds(1)));
+    }
+    witness.set(witness.held, false); // its thread goes on without the runner
+    witness.waitFor([&] { return witness.closed; });
+    EXPECT_THAT(witness.values, ElementsAre(1.0));
+    Witness quick;
+    OutputRunner runner("csv:b", std::make_unique<WitnessOutput>(quick), tellTo(quick), withoutWaiting());
+    runner.start();
+    EXPECT_TRUE(runner.stopWithin(std::chrono::hours(1)));
+    EXPECT_TRUE(quick.closed);
+}
+
 TEST(OutputRunner, WhatMakesNoSenseIsToldAtOnce)
 {
     class Senseless : public WitnessOutput

@@ -15,7 +15,6 @@ namespace {
 
 using testing::HasSubstr;
 using testing::Not;
-using testsupport::march;
 using testsupport::reading;
 using velmora::Health;
 using velmora::MetricsPage;
@@ -28,6 +27,8 @@ velmora::Reading inUnit(std::string const& sensor, double value, std::string con
     return result;
 }
 
+velmora::MetricsPage::SteadyTime const start(std::chrono::hours(100));
+
 Health busyHealth()
 {
     Health health;
@@ -36,7 +37,9 @@ Health busyHealth()
     health.requests = 17;
     velmora::OutputCounts counts;
     counts.dropped = 3;
-    health.outputs = {{"csv:a.csv", counts}, {"sqlite:\"b\"", counts}};
+    velmora::OutputCounts broker;
+    broker.state = {false, 118800};
+    health.outputs = {{"csv:a.csv", counts}, {"sqlite:\"b\"", counts}, {"mqtt://b/c", broker}};
     return health;
 }
 
@@ -48,16 +51,16 @@ MetricsPage fullPage()
         std::string const label = velmora::unitLabel(static_cast<MeasurementUnit>(unit));
         for (unsigned int const module : {0x7E8U, 0x7E9U}) {
             velmora::Reading each = inUnit("SENSOR_" + std::to_string(unit), 1.5, label, module);
-            page.take(each);
+            page.take(each, start);
             each.vehicle = "my \"van\"\\\n";
-            page.take(each);
+            page.take(each, start);
         }
     }
-    page.take(inUnit("FURLONGS", 1.0, "fur/14 nights"));
+    page.take(inUnit("FURLONGS", 1.0, "fur/14 nights"), start);
     return page;
 }
 
-std::string const page = fullPage().render(velmora::fromMillis(march + 2000), busyHealth());
+std::string const page = fullPage().render(start + std::chrono::milliseconds(2000), busyHealth());
 
 TEST(Prometheus, TheToolThatChecksMetricsIsContent)
 {
@@ -91,11 +94,11 @@ TEST(Prometheus, NoSeriesComesTwiceAndNoFamilyInTwoPlaces)
 TEST(Prometheus, NumbersAreInBaseUnits)
 {
     MetricsPage some;
-    some.take(inUnit("SPEED", 36.0, "km/h"));
-    some.take(inUnit("OIL", 212.0, "°F"));
-    some.take(inUnit("LOAD", 41.0, "%"));
-    some.take(inUnit("MAP", 101.3, "kPa"));
-    std::string const text = some.render(velmora::fromMillis(march + 1500), {});
+    some.take(inUnit("SPEED", 36.0, "km/h"), start);
+    some.take(inUnit("OIL", 212.0, "°F"), start);
+    some.take(inUnit("LOAD", 41.0, "%"), start);
+    some.take(inUnit("MAP", 101.3, "kPa"), start);
+    std::string const text = some.render(start + std::chrono::milliseconds(1500), {});
     std::string const labels = "{vehicle=\"van\",module=\"7E8\",sensor=";
     EXPECT_THAT(text, HasSubstr("velmora_speed_meters_per_second" + labels + "\"SPEED\"} 10\n"));
     EXPECT_THAT(text, HasSubstr("velmora_temperature_celsius" + labels + "\"OIL\"} 100\n"));
@@ -107,14 +110,14 @@ TEST(Prometheus, NumbersAreInBaseUnits)
 TEST(Prometheus, WhatIsOldOrWithoutANumberLeavesThePage)
 {
     MetricsPage some;
-    some.take(inUnit("SPEED", 36.0, "km/h"));
+    some.take(inUnit("SPEED", 36.0, "km/h"), start);
     velmora::Reading nothing = inUnit("OLD", 1.0, "km/h");
-    some.take(nothing);
+    some.take(nothing, start);
     nothing.value = {};
-    some.take(nothing);
-    EXPECT_THAT(some.render(velmora::fromMillis(march + 60000), {}), HasSubstr("SPEED"));
-    EXPECT_THAT(some.render(velmora::fromMillis(march + 60000), {}), Not(HasSubstr("OLD")));
-    EXPECT_THAT(some.render(velmora::fromMillis(march + 60001), {}), Not(HasSubstr("SPEED")));
+    some.take(nothing, start);
+    EXPECT_THAT(some.render(start + std::chrono::milliseconds(60000), {}), HasSubstr("SPEED"));
+    EXPECT_THAT(some.render(start + std::chrono::milliseconds(60000), {}), Not(HasSubstr("OLD")));
+    EXPECT_THAT(some.render(start + std::chrono::milliseconds(60001), {}), Not(HasSubstr("SPEED")));
 }
 
 TEST(Prometheus, TellsItsOwnHealth)
@@ -123,6 +126,9 @@ TEST(Prometheus, TellsItsOwnHealth)
     EXPECT_THAT(page, HasSubstr("velmora_requests_total 17\n"));
     EXPECT_THAT(page, HasSubstr("velmora_state_info{state=\"running\"} 1\n"));
     EXPECT_THAT(page, HasSubstr("velmora_output_dropped_total{output=\"csv:a.csv\"} 3\n"));
+    EXPECT_THAT(page, HasSubstr("velmora_output_up{output=\"mqtt://b/c\"} 0\n"));
+    EXPECT_THAT(page, HasSubstr("velmora_output_spool_records{output=\"mqtt://b/c\"} 118800\n"));
+    EXPECT_THAT(page, testing::Not(HasSubstr("velmora_output_up{output=\"csv")));
     EXPECT_THAT(page, HasSubstr("velmora_output_dropped_total{output=\"sqlite:\\\"b\\\"\"} 3\n"));
 }
 

@@ -1,0 +1,65 @@
+#include "libvelmora/output/clockjudge.h"
+
+#include <cstdlib>
+#include <ctime>
+#include <fstream>
+#include <sys/timex.h>
+
+namespace velmora {
+
+namespace {
+
+constexpr std::int64_t smallestStep = 2000;        // ms; less is the work of a time server that slews
+constexpr std::int64_t patience = 5 * 60 * 1000;   // ms without a step until a clock counts as it is
+constexpr std::int64_t earliest = 1735689600000LL; // 2025 began: this program is younger
+
+std::int64_t millisOf(clockid_t id)
+{
+    timespec time{};
+    ::clock_gettime(id, &time);
+    return std::int64_t{time.tv_sec} * 1000 + time.tv_nsec / 1000000;
+}
+
+bool knowsTimeServer()
+{
+    timex state{};
+    return ::adjtimex(&state) != -1 && (state.status & STA_UNSYNC) == 0;
+}
+
+std::string bootId()
+{
+    std::ifstream in("/proc/sys/kernel/random/boot_id");
+    std::string id;
+    std::getline(in, id);
+    return id;
+}
+
+} // namespace
+
+ClockLook lookAtClocks()
+{
+    static std::string const id = bootId();
+    return {millisOf(CLOCK_REALTIME), millisOf(CLOCK_BOOTTIME), knowsTimeServer(), id};
+}
+
+std::int64_t ClockJudge::look(ClockLook const& now)
+{
+    std::int64_t const offset = now.wall - now.boot;
+    std::int64_t step = m_known ? offset - m_offset : 0;
+    if (std::llabs(step) < smallestStep) {
+        step = 0;
+    } else {
+        m_lastSet = now.boot;
+    }
+    m_known = true;
+    m_offset = offset;
+    bool const stable = now.boot - m_lastSet >= patience;
+    if (now.synced || (stable && now.wall >= earliest)) {
+        m_trust = Trust::Sure;
+    } else {
+        m_trust = stable ? Trust::Never : Trust::Wait;
+    }
+    return step;
+}
+
+} // namespace velmora

@@ -1,0 +1,47 @@
+#pragma once
+
+#include <chrono>
+#include <cstdint>
+#include <functional>
+#include <string>
+
+namespace velmora {
+
+// What the machine's clocks tell at one moment. A machine without a clock battery starts in the past until a time
+// server sets it; the time since boot goes on through that, and through suspension.
+struct ClockLook
+{
+    std::int64_t wall = 0; // ms since 1970
+    std::int64_t boot = 0; // ms since the machine's start
+    bool synced = false;   // the kernel knows of a time server
+    std::string bootId;    // new with each start of the machine
+};
+
+using ClockSource = std::function<ClockLook()>;
+
+// The machine's own.
+ClockLook lookAtClocks();
+
+// Judges whether the wall clock can be believed, by its way beside the time since boot.
+class ClockJudge
+{
+public:
+    enum class Trust
+    {
+        Wait, // it may still be set
+        Sure,
+        Never, // it was not set in all that time, and can't be right
+    };
+
+    // Takes a look; tells by how many milliseconds the clock was set since the look before, 0 if it only ran on.
+    std::int64_t look(ClockLook const& now);
+    Trust trust() const { return m_trust; }
+
+private:
+    bool m_known = false;
+    std::int64_t m_offset = 0;  // wall less boot
+    std::int64_t m_lastSet = 0; // on the clock since boot
+    Trust m_trust = Trust::Wait;
+};
+
+} // namespace velmora

@@ -1,0 +1,223 @@
+#include "libvelmora/output/clockjudge.h"
+#include "libvelmora/output/mqttsettings.h"
+#include "libvelmora/output/spoolsender.h"
+#include "libvelmora/output/spooltext.h"
+#include "tests/support/broker.h"
+
+#include <velmora/error.h>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+#include <nlohmann/json.hpp>
+
+namespace {
+
+using namespace std::chrono_literals;
+using testing::ElementsAre;
+using testing::HasSubstr;
+using testsupport::brokerContext;
+using testsupport::TemporaryFolder;
+using velmora::ClockJudge;
+using velmora::Spool;
+using velmora::SpoolSender;
+
+TEST(MqttSpool, NumbersRiseAndAreNeverUsedAgain)
+{
+    TemporaryFolder const folder;
+    std::string id;
+    {
+        Spool spool(folder.file("s"), 1 << 20);
+        id = spool.id();
+        EXPECT_EQ(id.size(), 16U);
+        spool.add({"a", "b", "c"});
+        spool.forget(2);
+        EXPECT_EQ(spool.after(0, 10).size(), 1U);
+        spool.forget(3);
+    }
+    Spool spool(folder.file("s"), 1 << 20);
+    EXPECT_EQ(spool.id(), id);
+    spool.add({"d"});
+    EXPECT_EQ(spool.after(0, 10).at(0).seq, 4);
+    EXPECT_NE(Spool(folder.file("t"), 1 << 20).id(), id);
+}
+
+TEST(MqttSpool, ACapDropsTheOldestAndTellsWhich)
+{
+    TemporaryFolder const folder;
+    Spool spool(folder.file("s"), 100000);
+    EXPECT_EQ(spool.makeRoom().last, 0);
+    spool.add(std::vector<std::string>(2000, std::string(100, 'x')));
+    Spool::Gap const gap = spool.makeRoom();
+    EXPECT_EQ(gap.first, 1);
+    EXPECT_EQ(gap.last, 201);
+    EXPECT_EQ(spool.dropped(), 201);
+    EXPECT_EQ(spool.after(0, 1).at(0).seq, 202);
+}
+
+TEST(MqttSettings, RefusesWhatBrokersWouldNotTakeAndSecretsInTheOpen)
+{
+    TemporaryFolder const folder;
+    for (char const* const wrong :
+         {"mqtt://b/a.b", "mqtt://b/a b", "mqtt://b/a//b", "mqtt://b/", "mqtt://b:0/a", "mqtt://b:x/a",
+          "mqtt://me:pw@b/a", "mqtt://b/a?qos=2", "mqtt://b/a?password_file=/nowhere", "mqtt://b/a?discovery=yes"}) {
+        EXPECT_THROW(velmora::mqttSettings(velmora::parseOutputAddress(wrong), brokerContext(folder)), velmora::Error)
+            << wrong;
+    }
+    std::ofstream(folder.file("pw")) << "secret\n";
+    auto const settings = velmora::mqttSettings(
+        velmora::parseOutputAddress("mqtts://b/a/c?password_file=" + folder.file("pw")), brokerContext(folder));
+    EXPECT_EQ(settings.port, 8883);
+    EXPECT_EQ(settings.topic, "a/c/van");
+    EXPECT_EQ(settings.password, "secret");
+    EXPECT_EQ(velmora::storedMark(R"({"spool":"ab","seq":7})", "ab"), 7);
+    for (char const* const wrong : {"", "7", "{}", R"({"spool":"x","seq":7})", R"({"spool":"ab","seq":"7"})", "[1"}) {
+        EXPECT_FALSE(velmora::storedMark(wrong, "ab")) << wrong;
+    }
+}
+
+// Takes what a sender hands over, and numbers it.
+struct Sent
+{
+    TemporaryFolder const folder;
+    Spool spool{folder.file("s"), 1 << 24};
+    std::vector<nlohmann::json> batches;
+    std::vector<std::string> told;
+    bool takes = true;
+    SpoolSender sender;
+    SpoolSender::Time now{1h};
+
+    explicit Sent(bool waitsForMark)
+        : sender(
+              spool, "van", waitsForMark,
+              [this](std::string const& payload) {
+                  batches.push_back(nlohmann::json::parse(payload));
+                  return takes ? std::optional(static_cast<int>(batches.size())) : std::nullopt;
+              },
+              [this](std::string const& text) { told.push_back(text); })
+    {}
+    void add(int count)
+    {
+        spool.add(std::vector<std::string>(static_cast<std::size_t>(count), "[0,\"7E8\",\"RPM\",1,\"rpm\"]"));
+    }
+    void up()
+    {
+        sender.onUp(now);
+        sender.pump(now);
+    }
+};
+
+TEST(SpoolSender, ForgetsInOrderAndSendsAgainWhatNobodyVouchedFor)
+{
+    Sent sent(false);
+    sent.add(2500);
+    sent.sender.pump(sent.now);
+    EXPECT_TRUE(sent.batches.empty()); // no connection
+    sent.up();
+    ASSERT_EQ(sent.batches.size(), 3U);
+    EXPECT_EQ(sent.batches[1]["after"], 1000);
+    EXPECT_EQ(sent.batches[2]["last"], 2500);
+    sent.sender.onDelivered(2, sent.now);
+    EXPECT_EQ(sent.spool.rows(), 2500); // the first may still be lost
+    sent.sender.onDelivered(1, sent.now);
+    EXPECT_EQ(sent.spool.rows(), 500);
+    sent.sender.onDown();
+    sent.sender.onDelivered(3, sent.now); // of the connection that broke
+    EXPECT_EQ(sent.spool.rows(), 500);
+    sent.up();
+    ASSERT_EQ(sent.batches.size(), 4U);
+    EXPECT_EQ(sent.batches[3]["after"], 2000);
+    EXPECT_EQ(sent.batches[3]["stored"], 2000);
+    EXPECT_EQ(sent.batches[3]["readings"].size(), 500U);
+    sent.sender.onDelivered(4, sent.now);
+    EXPECT_EQ(sent.spool.rows(), 0);
+}
+
+TEST(SpoolSender, WaitsForTheConsumersMarkAndBelievesNoneThatCannotBe)
+{
+    Sent sent(true);
+    sent.add(10);
+    sent.up();
+    sent.sender.onDelivered(1, sent.now);
+    EXPECT_EQ(sent.spool.rows(), 10);
+    sent.sender.onMark(11, sent.now);
+    EXPECT_EQ(sent.spool.rows(), 10);
+    EXPECT_THAT(sent.told, ElementsAre(HasSubstr("11, which was never sent")));
+    sent.sender.onMark(4, sent.now);
+    EXPECT_EQ(sent.spool.rows(), 6);
+    sent.sender.onMark(3, sent.now); // an older message
+    EXPECT_EQ(sent.spool.rows(), 6);
+    sent.now += 29s;
+    sent.sender.pump(sent.now);
+    EXPECT_EQ(sent.batches.size(), 1U);
+    sent.now += 1s;
+    sent.sender.pump(sent.now); // lost on the way
+    ASSERT_EQ(sent.batches.size(), 2U);
+    EXPECT_EQ(sent.batches[1]["after"], 4);
+    EXPECT_EQ(sent.batches[1]["last"], 10);
+}
+
+TEST(SpoolSender, KeepsAWindowAndAMessagesSize)
+{
+    Sent sent(false);
+    sent.add(30000);
+    sent.up();
+    EXPECT_EQ(sent.batches.size(), 20U);
+    sent.sender.onRefused(1);
+    sent.takes = false;
+    sent.sender.pump(sent.now);
+    EXPECT_EQ(sent.batches.size(), 21U);
+    EXPECT_EQ(sent.batches.back()["after"], 0);
+    Sent large(false);
+    large.spool.add(std::vector<std::string>(10, "{\"text\":\"" + std::string(60000, 'x') + "\"}"));
+    large.up();
+    EXPECT_EQ(large.batches.size(), 10U);
+    EXPECT_EQ(large.batches[0]["events"][0]["seq"], 1);
+}
+
+TEST(SpoolSender, HoldsWhatIsNotDatedYetAndMarksWhatNeverWas)
+{
+    Sent sent(false);
+    sent.spool.add({"[5,\"7E8\",\"RPM\",1,\"rpm\"]", R"({"time":6,"event":"x"})", R"({"begin":7,"end":8})"},
+                   Spool::Time::Held);
+    sent.up();
+    EXPECT_TRUE(sent.batches.empty());
+    sent.spool.shiftHeld(1000, {"boot", 1000});
+    EXPECT_EQ(sent.spool.heldStamp()->offset, 1000);
+    sent.spool.release(Spool::Time::Unsure);
+    sent.add(1);
+    sent.sender.pump(sent.now);
+    ASSERT_EQ(sent.batches.size(), 2U); // one clock a batch
+    EXPECT_EQ(sent.batches[0]["clock"], false);
+    EXPECT_EQ(sent.batches[0]["readings"][0][1], 1005);
+    EXPECT_EQ(sent.batches[0]["events"][0]["time"], 1006);
+    EXPECT_EQ(sent.batches[0]["events"][1]["end"], 1008);
+    EXPECT_EQ(sent.batches[1]["clock"], true);
+    EXPECT_FALSE(sent.spool.heldStamp());
+}
+
+TEST(ClockJudge, TellsAWrongClockByItsWay)
+{
+    std::int64_t const sane = testsupport::march;
+    ClockJudge fresh; // a machine without a clock battery
+    EXPECT_EQ(fresh.look({1000, 10000, false, ""}), 0);
+    EXPECT_EQ(fresh.trust(), ClockJudge::Trust::Wait);
+    EXPECT_EQ(fresh.look({3000, 11000, false, ""}), 0); // a second is slewed, not set
+    EXPECT_EQ(fresh.look({sane, 12000, false, ""}), sane - 12000 - (3000 - 11000));
+    EXPECT_EQ(fresh.trust(), ClockJudge::Trust::Wait); // set, but by whom?
+    fresh.look({sane + 1, 12001, true, ""});
+    EXPECT_EQ(fresh.trust(), ClockJudge::Trust::Sure);
+
+    ClockJudge alone; // no time server ever
+    alone.look({sane, 299999, false, ""});
+    EXPECT_EQ(alone.trust(), ClockJudge::Trust::Wait);
+    alone.look({sane + 1, 300000, false, ""});
+    EXPECT_EQ(alone.trust(), ClockJudge::Trust::Sure);
+
+    ClockJudge lost;
+    lost.look({1000000, 300000, false, ""});
+    EXPECT_EQ(lost.trust(), ClockJudge::Trust::Never);
+    EXPECT_GT(velmora::lookAtClocks().boot, 0);
+    EXPECT_EQ(velmora::lookAtClocks().bootId.size(), 36U);
+}
+
+} // namespace
