@@ -159,7 +159,7 @@ TEST(SpoolSender, WaitsForTheConsumersMarkAndBelievesNoneThatCannotBe)
 TEST(SpoolSender, KeepsAWindowAndAMessagesSize)
 {
     Sent sent(false);
-    sent.add(30000);
+    sent.add(21000);
     sent.up();
     EXPECT_EQ(sent.batches.size(), 20U);
     sent.sender.onRefused(1);
