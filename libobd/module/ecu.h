@@ -12,6 +12,7 @@
 namespace obd {
 
 class IObdProxy;
+class IQuery;
 class OxygenSensorsPresent;
 class PowertrainParameter;
 class SupportedOids;
@@ -97,6 +98,7 @@ private:
 
     void detectModuleFacts(); // the first five
     bool isReported(PowertrainParameter const& parameter) const;
+    bool succeeds(IQuery& query) const;
     bool detectTesterConfiguration(TestEquipmentConfiguration& configuration, int number);
     // found gets what the module reports, so that the chain of ranges can go on.
     bool detectFirstTestIdentifiers(OxygenSensorLocation location, std::vector<unsigned char>& found);

@@ -7,6 +7,7 @@
 namespace obd {
 
 class PowertrainParameter;
+class TableParameter;
 
 // The models of the fuel consumption.
 enum class ConsumptionKind : int
@@ -31,5 +32,20 @@ ConsumptionKind chooseConsumption(IEcu const& ecu, IgnitionType ignitionType);
 // The parameter of that model. Null if none suits.
 std::shared_ptr<PowertrainParameter> createConsumption(IEcu const& ecu, IgnitionType ignitionType,
                                                        ConsumptionSettings const& settings);
+
+// From where a module's air to fuel ratio can be read.
+struct LambdaSource
+{
+    unsigned char pid;
+    char const* text; // for the log
+    // The parameter, whose first sensor is the equivalence ratio.
+    std::unique_ptr<TableParameter> (*make)();
+};
+
+// The best source that the module has; null if it has none.
+LambdaSource const* findLambdaSource(IEcu const& ecu);
+
+// What is said about the source in the log.
+char const* lambdaSourceText(LambdaSource const* source);
 
 } // namespace obd

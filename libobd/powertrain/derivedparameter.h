@@ -1,6 +1,6 @@
 #pragma once
 
-#include "libobd/powertrain/sample.h"
+#include "libobd/powertrain/samplelist.h"
 #include "libobd/powertrain/tableparameter.h"
 
 #include <obd/powertrainparameter.h>

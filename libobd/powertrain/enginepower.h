@@ -1,7 +1,7 @@
 #pragma once
 
 #include "libobd/powertrain/derivedparameter.h"
-#include "libobd/powertrain/ecuhistory.h"
+#include "libobd/powertrain/ecustore.h"
 #include "libobd/powertrain/numericparameters.h"
 #include "libobd/powertrain/samplelist.h"
 

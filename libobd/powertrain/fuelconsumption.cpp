@@ -1,6 +1,6 @@
 #include "libobd/powertrain/fuelconsumption.h"
 
-#include "libobd/powertrain/lambdasource.h"
+#include "libobd/powertrain/consumptionchoice.h"
 #include "libobd/powertrain/numericparameters.h"
 
 #include <common/logrecord.h>

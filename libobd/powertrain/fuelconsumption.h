@@ -2,7 +2,7 @@
 
 #include "libobd/powertrain/consumptiondata.h"
 #include "libobd/powertrain/derivedparameter.h"
-#include "libobd/powertrain/ecuhistory.h"
+#include "libobd/powertrain/ecustore.h"
 
 #include <memory>
 #include <vector>

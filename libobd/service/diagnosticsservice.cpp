@@ -5,6 +5,7 @@
 #include "libobd/parameters/performancetracking.h"
 #include "libobd/powertrain/readinessmonitors.h"
 #include "libobd/service/builtservice.h"
+#include "libobd/service/diagnosticmodels.h"
 
 #include <common/tracestream.h>
 #include <obd/iecu.h>
@@ -19,7 +20,6 @@ constexpr unsigned char sparkCounters = 0x08;
 constexpr unsigned char compressionCounters = 0x0B;
 
 using ReadinessMonitors = std::vector<std::shared_ptr<ReadinessMonitorDataModel>>;
-using DiagnosticTests = std::vector<std::shared_ptr<DiagnosticTestDataModel>>;
 using DiagnosticMonitors = std::vector<std::shared_ptr<DiagnosticMonitorDataModel>>;
 using OxygenSensorTests = std::vector<std::shared_ptr<OxygenSensorMonitorDataModel>>;
 using PerformanceCounters = std::vector<std::shared_ptr<PerformanceCounterDataModel>>;
@@ -33,30 +33,6 @@ ReadinessMonitors makeReadinessMonitors(IgnitionType ignition, Judge const& judg
         monitors.push_back(std::make_shared<ReadinessMonitorDataModel>(readinessMonitorText(test), judge(test)));
     }
     return monitors;
-}
-
-// The application counts the other way round than the reply does: the better, the higher.
-DiagnosticTestDataModel::Status testStatus(IMonitorTestItem::Status status)
-{
-    switch (status) {
-    case IMonitorTestItem::Passed:
-        return DiagnosticTestDataModel::Status::Passed;
-    case IMonitorTestItem::Failed:
-        return DiagnosticTestDataModel::Status::Failed;
-    default:
-        return DiagnosticTestDataModel::Status::NoResult;
-    }
-}
-
-DiagnosticTests makeTests(ObdMonitorTestItem::Items const& items)
-{
-    DiagnosticTests tests;
-    for (std::shared_ptr<IMonitorTestItem> const& item : items) {
-        tests.push_back(std::make_shared<DiagnosticTestDataModel>(item->testId(), item->description(), item->value(),
-                                                                  item->minimum(), item->maximum(), item->unit(),
-                                                                  testStatus(item->status())));
-    }
-    return tests;
 }
 
 template <typename Tracking>
@@ -165,8 +141,7 @@ Outcome<DiagnosticMonitors> DiagnosticsService::askMonitorTests()
             continue;
         }
         for (std::shared_ptr<ObdMonitorTestItem> const& monitor : results->getItems(*module)) {
-            monitors.push_back(std::make_shared<DiagnosticMonitorDataModel>(
-                static_cast<int>(monitor->id), monitor->description, makeTests(monitor->items(system))));
+            monitors.push_back(makeMonitorModel(*monitor, system));
         }
     }
     return outcomeOf(asked, *module, ObdMode::MonitorTests, std::move(monitors));
