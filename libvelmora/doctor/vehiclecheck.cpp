@@ -5,6 +5,7 @@
 
 #include <obd/iecu.h>
 #include <obd/parameterfactory.h>
+#include <obd/sensorpids.h>
 
 #include <fmt/format.h>
 
@@ -39,7 +40,7 @@ std::vector<unsigned char> usablePids(obd::IEcu const& ecu)
 {
     std::vector<unsigned char> pids;
     for (unsigned char const pid : ecu.supportedIds(obd::ObdMode::CurrentData, 0)) {
-        if (pid % 0x20 != 0 && lengthOf(pid)) {
+        if (!obd::isSupportMask(pid) && lengthOf(pid)) {
             pids.push_back(pid);
         }
     }

@@ -15,19 +15,11 @@ namespace velmora {
 
 namespace {
 
-// The channel tells when the adapter has answered; this is for one that never does.
-constexpr unsigned int longestAnswerMs = 5000;
-
-// The driver keeps the bus family only; the adapter tells the number, behind an A if it searched for it.
 ProtocolReport readProtocol(Session& session)
 {
     ProtocolReport report{std::nullopt, readable(session.adapter()->getProtocolDescription())};
-    std::string reply;
-    if (session.proxy()->execute("ATDPN", reply, longestAnswerMs) == obd::IDevice::Status::Ok) {
-        std::size_t const digit = reply.find_first_of("123456789");
-        if (digit != std::string::npos) {
-            report.number = reply[digit] - '0';
-        }
+    if (auto const protocol = session.proxy()->vehicleProtocol(); protocol != obd::VehicleProtocol::Automatic) {
+        report.number = static_cast<int>(protocol);
     }
     return report;
 }

@@ -1,4 +1,3 @@
-#include "libvelmora/read/offeredpids.h"
 #include "libvelmora/read/oxygencurrent.h"
 #include "libvelmora/read/topicanswer.h"
 #include "libvelmora/report/json.h"
@@ -104,19 +103,24 @@ std::string whyUnknown(obd::IEcu const& ecu, obd::ObdMode mode)
                : std::string();
 }
 
+// Up to it the library knows all PIDs, some of which are no parameters of their own.
+constexpr unsigned char lastWellKnownPid = 0x7F;
+
 // What the module offers and the library does not decode.
-std::vector<unsigned char> undecoded(obd::IEcu const& ecu, OfferedPids const& offered)
+std::vector<unsigned char> undecoded(obd::IEcu const& ecu)
 {
     std::vector<Offer> const known = offers(true);
-    std::vector<unsigned char> pids = offered.of(ecu.id());
+    std::vector<unsigned char> pids = ecu.supportedIds(obd::ObdMode::CurrentData, 0);
     std::erase_if(pids, [&known](unsigned char pid) {
-        return std::any_of(known.begin(), known.end(),
-                           [pid](Offer const& offer) { return static_cast<int>(offer.parameter->id) == pid; });
+        bool const isLater = pid > lastWellKnownPid && !obd::isSupportMask(pid);
+        return !isLater || std::any_of(known.begin(), known.end(), [pid](Offer const& offer) {
+            return static_cast<int>(offer.parameter->id) == pid;
+        });
     });
     return pids;
 }
 
-std::string toText(obd::IEcu const& ecu, OfferedPids const& offered, bool all)
+std::string toText(obd::IEcu const& ecu, bool all)
 {
     std::string text =
         fmt::format("Control module {:X}: {} ({})\n", ecu.id(), readable(ecu.name()), readable(ecu.description()));
@@ -129,7 +133,7 @@ std::string toText(obd::IEcu const& ecu, OfferedPids const& offered, bool all)
     for (Offer const& offer : offers(all)) {
         text += offerText(offer, all);
     }
-    for (unsigned char const pid : undecoded(ecu, offered)) {
+    for (unsigned char const pid : undecoded(ecu)) {
         text += fmt::format("  {:02X}  {} (not decoded)\n", pid, pidTitle(pid));
     }
     return text + "\n";
@@ -145,7 +149,7 @@ Json sensorJson(obd::SensorDataModel const& sensor)
     return json;
 }
 
-Json toJson(obd::IEcu const& ecu, OfferedPids const& offered, bool all)
+Json toJson(obd::IEcu const& ecu, bool all)
 {
     Json supported;
     for (Service const& service : services) {
@@ -163,7 +167,7 @@ Json toJson(obd::IEcu const& ecu, OfferedPids const& offered, bool all)
                               {"sensors", sensorList}});
     }
     Json rest = Json::array();
-    for (unsigned char const pid : undecoded(ecu, offered)) {
+    for (unsigned char const pid : undecoded(ecu)) {
         rest.push_back({{"id", fmt::format("{:02X}", pid)}, {"name", pidTitle(pid)}});
     }
     return {{"id", fmt::format("{:X}", ecu.id())},
@@ -178,15 +182,13 @@ ExitCode sensors(GlobalOptions const& options, bool all)
 {
     CommandSession session(options);
     session.connect();
-    OfferedPids const offered(*session.proxy());
-    session.check();
     Json modules = Json::array();
     for (std::shared_ptr<obd::IEcu> const& ecu : session.selectedModules()) {
         session.select(*ecu);
         if (options.json) {
-            modules.push_back(toJson(*ecu, offered, all));
+            modules.push_back(toJson(*ecu, all));
         } else {
-            printText(toText(*ecu, offered, all));
+            printText(toText(*ecu, all));
         }
     }
     if (options.json) {
