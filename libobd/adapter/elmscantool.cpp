@@ -63,6 +63,16 @@ ObdProtocol ElmScantool::getProtocol()
     return toObdProtocol(m_protocol);
 }
 
+VehicleProtocol ElmScantool::vehicleProtocol()
+{
+    return m_protocol;
+}
+
+AdapterNote ElmScantool::lastNote()
+{
+    return m_note;
+}
+
 bool ElmScantool::isEnabled() const
 {
     return m_enabled;

@@ -50,6 +50,8 @@ public:
     Status execute(std::string const& command, std::string& response, unsigned int timeoutMs) override;
     Status execute(std::vector<unsigned char> const& payload, ResponseMap& responses, unsigned int timeoutMs) override;
     bool activateEcu(unsigned int ecu) override;
+    VehicleProtocol vehicleProtocol() override;
+    AdapterNote lastNote() override;
 
     // Asks the adapter for its name. False if it gives none.
     bool identifyInterface();
@@ -143,6 +145,7 @@ private:
     std::atomic<VehicleProtocol> m_protocol{VehicleProtocol::Automatic};
     std::atomic<bool> m_headersOn{false};
     std::atomic<bool> m_disabled{false};
+    std::atomic<AdapterNote> m_note{AdapterNote::None};
 };
 
 } // namespace obd

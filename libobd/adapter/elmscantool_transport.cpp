@@ -8,6 +8,7 @@ namespace obd {
 
 bool ElmScantool::sendPayload(std::vector<unsigned char> const& payload)
 {
+    m_note = AdapterNote::None;
     if (m_disabled) {
         return false;
     }
@@ -20,7 +21,11 @@ bool ElmScantool::sendPayload(std::vector<unsigned char> const& payload)
 
 bool ElmScantool::receivePayload(std::vector<unsigned char>& data, unsigned int timeoutMs)
 {
-    TransportStatus const status = elmTransportReceive(m_connection, data, timeoutMs);
+    bool wasQuestion = false;
+    TransportStatus const status = elmTransportReceive(m_connection, data, timeoutMs, &wasQuestion);
+    if (wasQuestion) {
+        m_note = AdapterNote::NotUnderstood;
+    }
     // Only now, since another thread may have given the channel up during the read.
     if (m_disabled) {
         return false;
@@ -33,6 +38,9 @@ bool ElmScantool::receivePayload(std::vector<unsigned char>& data, unsigned int 
     }
     ProxyError const error = checkForErrors(data);
     if (error != ProxyError::None) {
+        if (isReplyLost(data)) {
+            m_note = AdapterNote::ReplyLost;
+        }
         data.clear();
         TERVEX_LOG(Fatal) << "Got error from adapter: " << static_cast<int>(error);
         return false;

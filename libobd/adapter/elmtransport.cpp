@@ -77,11 +77,16 @@ void cleanReply(std::vector<unsigned char>& data)
 }
 
 TransportStatus elmTransportReceive(std::shared_ptr<IDataConnection>& connection, std::vector<unsigned char>& data,
-                                    unsigned int timeoutMs)
+                                    unsigned int timeoutMs, bool* wasQuestion)
 {
     data.clear();
+    bool questioned = false;
     if (waitForMessage(*connection, data, timeoutMs)) {
+        questioned = std::find(data.begin(), data.end(), '?') != data.end();
         cleanReply(data);
+    }
+    if (wasQuestion != nullptr) {
+        *wasQuestion = questioned && data.empty();
     }
     if (!connection->isValid()) {
         TERVEX_LOG(Error) << "Invalid connection -> skip";

@@ -29,8 +29,9 @@ TransportStatus elmTransportSend(std::shared_ptr<IDataConnection>& connection,
 void cleanReply(std::vector<unsigned char>& data);
 
 // Waits for one reply and leaves it in data, cleaned. A reply of which nothing is left reads as Timeout, at once. A
-// connection that dies ends the wait within 250 ms.
+// connection that dies ends the wait within 250 ms. wasQuestion, if given, tells whether the reply was the adapter's
+// "?" and nothing else.
 TransportStatus elmTransportReceive(std::shared_ptr<IDataConnection>& connection, std::vector<unsigned char>& data,
-                                    unsigned int timeoutMs);
+                                    unsigned int timeoutMs, bool* wasQuestion = nullptr);
 
 } // namespace obd

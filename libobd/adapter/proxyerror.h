@@ -27,4 +27,8 @@ enum class ProxyError : int
 // first in the reply.
 ProxyError checkForErrors(std::vector<unsigned char> const& reply);
 
+// Whether the message tells that a reply came damaged or was cut off, on the bus or by a fault of the adapter. The
+// others tell that nothing came, or that the request did not get onto the bus: "BUS INIT: ...ERROR" is one of them.
+bool isReplyLost(std::vector<unsigned char> const& reply);
+
 } // namespace obd

@@ -116,17 +116,48 @@ std::shared_ptr<IEcu> ObdProxy::ecu(unsigned int id)
     return nullptr;
 }
 
-IDevice::Status ObdProxy::execute(std::string const& command, std::string& response, unsigned int timeoutMs)
+VehicleProtocol ObdProxy::vehicleProtocol()
+{
+    std::shared_lock const lock(m_mutex);
+    return deviceEnabled() ? m_device->vehicleProtocol() : VehicleProtocol::Automatic;
+}
+
+template <typename Request, typename Reply>
+IDevice::Status ObdProxy::exchange(Request const& request, Reply& reply, unsigned int timeoutMs, AdapterNote& note)
 {
     std::unique_lock const lock(m_mutex);
-    return deviceEnabled() ? m_device->execute(command, response, timeoutMs) : IDevice::Status::Unparsed;
+    note = AdapterNote::None;
+    if (!deviceEnabled()) {
+        return IDevice::Status::Unparsed;
+    }
+    IDevice::Status const status = m_device->execute(request, reply, timeoutMs);
+    note = m_device->lastNote();
+    return status;
+}
+
+IDevice::Status ObdProxy::execute(std::string const& command, std::string& response, unsigned int timeoutMs)
+{
+    AdapterNote note{};
+    return exchange(command, response, timeoutMs, note);
 }
 
 IDevice::Status ObdProxy::execute(std::vector<unsigned char> const& request, ResponseMap& responses,
                                   unsigned int timeoutMs)
 {
-    std::unique_lock const lock(m_mutex);
-    return deviceEnabled() ? m_device->execute(request, responses, timeoutMs) : IDevice::Status::Unparsed;
+    AdapterNote note{};
+    return exchange(request, responses, timeoutMs, note);
+}
+
+IDevice::Status ObdProxy::executeNoted(std::string const& command, std::string& response, unsigned int timeoutMs,
+                                       AdapterNote& note)
+{
+    return exchange(command, response, timeoutMs, note);
+}
+
+IDevice::Status ObdProxy::executeNoted(std::vector<unsigned char> const& request, ResponseMap& responses,
+                                       unsigned int timeoutMs, AdapterNote& note)
+{
+    return exchange(request, responses, timeoutMs, note);
 }
 
 float ObdProxy::batteryVoltage()

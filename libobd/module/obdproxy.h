@@ -25,6 +25,11 @@ public:
     IDevice::Status execute(std::vector<unsigned char> const& request, ResponseMap& responses,
                             unsigned int timeoutMs) override;
     float batteryVoltage() override;
+    VehicleProtocol vehicleProtocol() override;
+    IDevice::Status executeNoted(std::string const& command, std::string& response, unsigned int timeoutMs,
+                                 AdapterNote& note) override;
+    IDevice::Status executeNoted(std::vector<unsigned char> const& request, ResponseMap& responses,
+                                 unsigned int timeoutMs, AdapterNote& note) override;
 
     // Drops the control modules. They and the proxy hold each other, so the owner of the proxy calls this when it lets
     // the proxy go.
@@ -32,6 +37,8 @@ public:
 
 private:
     bool discoverEcus();
+    template <typename Request, typename Reply>
+    IDevice::Status exchange(Request const& request, Reply& reply, unsigned int timeoutMs, AdapterNote& note);
     // Called with m_mutex held.
     bool deviceEnabled() const;
     std::vector<std::shared_ptr<Ecu>> ecuList() const;

@@ -33,12 +33,13 @@ int nackCode(std::vector<unsigned char> const& data)
 }
 
 // What an exchange means for a module of which it brought nothing.
-OutcomeKind withoutReply(IDevice::Status status, IObdProxy& proxy)
+OutcomeKind withoutReply(IDevice::Status status, AdapterNote note, IObdProxy& proxy)
 {
     switch (status) {
     case IDevice::Status::Ok:
-    case IDevice::Status::NoResponse:
         return OutcomeKind::ModuleSilent;
+    case IDevice::Status::NoResponse: // where the adapter has more to tell than silence, it is none of the module
+        return note == AdapterNote::None ? OutcomeKind::ModuleSilent : OutcomeKind::Unreadable;
     case IDevice::Status::Unparsed: // so it also is without a link
         return proxy.isConnected() ? OutcomeKind::Unreadable : OutcomeKind::NotConnected;
     default:
@@ -57,8 +58,9 @@ IQuery::UpdateStatus ObdParameter::update(std::shared_ptr<IObdProxy> const& prox
     ResponseMap responses;
     try {
         getRequestData(request);
-        IDevice::Status const status = proxy->execute(request, responses, timeout());
-        m_others = withoutReply(status, *proxy);
+        AdapterNote note{};
+        IDevice::Status const status = proxy->executeNoted(request, responses, timeout(), note);
+        m_others = withoutReply(status, note, *proxy);
         if (status == IDevice::Status::NoResponse) {
             return UpdateStatus::UpdateNoData;
         }

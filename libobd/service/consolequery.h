@@ -16,6 +16,10 @@ public:
     UpdateStatus update(std::shared_ptr<IObdProxy> const& proxy) override;
     unsigned int timeout() const override { return static_cast<unsigned int>(m_timeout); }
     void clear() override { m_response.clear(); }
+    Verdict verdict(IEcu const& /*ecu*/) const override { return m_verdict; }
+
+    // How the last update went; ModuleSilent before one.
+    Verdict verdict() const { return m_verdict; }
 
     // What the adapter said; empty before an update.
     std::string response() const { return m_response; }
@@ -24,6 +28,7 @@ private:
     std::string m_request;
     int m_timeout;
     std::string m_response;
+    Verdict m_verdict{OutcomeKind::ModuleSilent};
 };
 
 } // namespace obd

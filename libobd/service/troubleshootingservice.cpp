@@ -2,6 +2,7 @@
 
 #include "libobd/dispatch/fetcher.h"
 #include "libobd/message/messageentry.h"
+#include "libobd/service/ask.h"
 #include "libobd/service/builtservice.h"
 #include "libobd/service/consolequery.h"
 
@@ -70,14 +71,27 @@ void TroubleshootingService::untap()
     }
 }
 
-std::string TroubleshootingService::query(std::string const& request, int timeout)
+Outcome<std::string> TroubleshootingService::askQuery(std::string const& request, int timeout)
 {
     auto const console = std::make_shared<ConsoleQuery>(request, timeout);
-    if (!fetch(console)) {
-        TERVEX_LOG(Error) << "Failed to query request: " << request;
-        return {};
+    FetchEnd const end = runFetch(console);
+    if (end == FetchEnd::Succeeded) {
+        return {Verdict{}, console->response()};
     }
-    return console->response();
+    TERVEX_LOG(Error) << "Failed to query request: " << request;
+    switch (end) {
+    case FetchEnd::Dropped:
+        return Verdict{OutcomeKind::NotConnected};
+    case FetchEnd::Failed:
+        return judged(*this, console->verdict());
+    default:
+        return judged(*this, {OutcomeKind::ModuleSilent}); // late: the query is not to be touched
+    }
+}
+
+std::string TroubleshootingService::query(std::string const& request, int timeout)
+{
+    return askQuery(request, timeout).value;
 }
 
 void TroubleshootingService::onDataSent(std::vector<unsigned char> const& data)

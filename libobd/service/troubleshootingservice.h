@@ -24,6 +24,7 @@ public:
     void startLogging() override { m_logging = true; }
     bool isLogging() override { return m_logging; }
     void stopLogging() override { m_logging = false; }
+    Outcome<std::string> askQuery(std::string const& request, int timeout) override;
 
     void onDataSent(std::vector<unsigned char> const& data) override;
     void onDataReceived(std::vector<unsigned char> const& data) override;

@@ -40,6 +40,7 @@ public:
     obd::IDevice::Status execute(std::vector<unsigned char> const& request, obd::ResponseMap& responses,
                                  unsigned int timeoutMs) override;
     float batteryVoltage() override { return m_wire.proxy().batteryVoltage(); }
+    obd::VehicleProtocol vehicleProtocol() override { return m_wire.proxy().vehicleProtocol(); }
 
 private:
     PollWire& m_wire;

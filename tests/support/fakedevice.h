@@ -41,6 +41,8 @@ public:
     std::vector<unsigned int> timeouts; // of the requests
     std::atomic<bool> enabled{true};
     obd::ObdProtocol busFamily = obd::ObdProtocolCan11;
+    obd::VehicleProtocol busNumber = obd::VehicleProtocol::Iso15765Can11Bit500;
+    obd::AdapterNote note = obd::AdapterNote::None;
     float volts = 12.5F;
     bool voltsRead = true;
     std::string lastCommand;
@@ -82,6 +84,8 @@ public:
         return found->second.status;
     }
     bool activateEcu(unsigned int /*ecu*/) override { return false; }
+    obd::VehicleProtocol vehicleProtocol() override { return busNumber; }
+    obd::AdapterNote lastNote() override { return note; }
 
 private:
     std::map<Bytes, Answer> m_answers;

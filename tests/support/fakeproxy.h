@@ -25,6 +25,7 @@ namespace support {
 //     proxy.answer("01 0D", {{0x7E8, "41 0D 50"}, {0x7E9, "7F 01 12"}});        // two modules
 //     proxy.answerOnce("03", "43 01 01 33");                                    // goes before what stands
 //     proxy.fail("01 05", obd::IDevice::Status::NotSent);
+//     proxy.note("01 07", obd::AdapterNote::ReplyLost);
 //     proxy.throwOn("01 06", "out of memory");
 //     proxy.answerCommand("ATRV", "12.4V");
 //     EXPECT_EQ(proxy.count("01 0C"), 1);
@@ -56,6 +57,14 @@ public:
 
     void fail(std::string_view request, Status status) { always(request, {status, {}, {}}); }
     void failOnce(std::string_view request, Status status) { once(request, {status, {}, {}}); }
+
+    // NoResponse, for the adapter says more than silence.
+    void note(std::string_view request, obd::AdapterNote note) { always(request, {Status::NoResponse, {}, {}, note}); }
+    void noteCommand(std::string const& command, obd::AdapterNote note)
+    {
+        std::lock_guard const lock(m_mutex);
+        m_commandAnswers.always(command, {Status::NoResponse, {}, {}, note});
+    }
 
     // The exchange ends in a std::runtime_error.
     void throwOn(std::string_view request, std::string const& what) { always(request, {Status::Ok, {}, what}); }
@@ -194,16 +203,30 @@ public:
 
     Status execute(std::string const& command, std::string& response, unsigned int timeoutMs) override
     {
+        obd::AdapterNote note{};
+        return executeNoted(command, response, timeoutMs, note);
+    }
+    Status execute(Bytes const& request, obd::ResponseMap& responses, unsigned int timeoutMs) override
+    {
+        obd::AdapterNote note{};
+        return executeNoted(request, responses, timeoutMs, note);
+    }
+    Status executeNoted(std::string const& command, std::string& response, unsigned int timeoutMs,
+                        obd::AdapterNote& note) override
+    {
         auto const answer = exchange(command, timeoutMs, m_commands, m_commandAnswers);
         if (answer.status == Status::Ok) {
             response = answer.reply;
         }
+        note = answer.note;
         return answer.status;
     }
-    Status execute(Bytes const& request, obd::ResponseMap& responses, unsigned int timeoutMs) override
+    Status executeNoted(Bytes const& request, obd::ResponseMap& responses, unsigned int timeoutMs,
+                        obd::AdapterNote& note) override
     {
         auto const answer = exchange(request, timeoutMs, m_requests, m_answers);
         responses.insert(answer.reply.begin(), answer.reply.end());
+        note = answer.note;
         return answer.status;
     }
 

@@ -22,6 +22,7 @@ public:
         obd::IDevice::Status status = obd::IDevice::Status::Ok;
         Reply reply{};
         std::optional<std::string> error{}; // thrown as std::runtime_error in place of an answer
+        obd::AdapterNote note = obd::AdapterNote::None;
     };
 
     void always(Question const& question, Answer answer) { m_standing[question] = std::move(answer); }

@@ -19,6 +19,11 @@ namespace obd {
 /// a flood of prompts, invalidate it: what then comes is dropped.
 ///
 /// Threads: send, receive, get, addLogger and removeLogger from any, set from one only.
+///
+///     auto const bridge = std::make_shared<obd::DataBridge>();
+///     std::thread reader([&] { while (port.read(bytes)) bridge->set(bytes); bridge->invalidate(); });
+///     std::thread writer([&] { while (bridge->isValid()) if (Bytes out; bridge->get(out)) port.write(out); });
+///     car->getConnectionManager()->openConnection(bridge, obd::VehicleProtocol::Automatic, false);
 class OBD_EXPORT DataBridge : public IDataBridge, public IDataConnection
 {
 public:

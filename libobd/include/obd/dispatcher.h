@@ -30,6 +30,11 @@ public:
 ///
 /// An application needs getInstance(), attach() and detach() of its IDispatchRunner, and dispatch(). The runners' list
 /// has no lock: attach before the first connection, detach after the last, on the main thread.
+///
+///     struct Runner : tervex::Observer<obd::IDispatchRunner> {
+///         void onDispatchRequested() override { eventLoop.post([] { obd::Dispatcher::getInstance().dispatch(); }); }
+///     } runner;
+///     obd::Dispatcher::getInstance().attach(&runner);
 class OBD_EXPORT Dispatcher : public virtual tervex::Notifier<IDispatchRunner>
 {
 public:

@@ -30,6 +30,12 @@ public:
 };
 
 /// Owns the life of one connection. Listeners and loggers are not owned: who adds one removes it before it dies.
+///
+///     auto const manager = car->getConnectionManager();
+///     if (!manager->openConnection(bridge, obd::VehicleProtocol::Automatic, false)) { // seconds to minutes
+///         bool const isAdapter = manager->getAdapter() != nullptr;                    // then the vehicle is silent
+///         manager->closeConnection();                                                 // and a fresh bridge next time
+///     }
 class IConnectionManager
 {
 public:

@@ -9,6 +9,14 @@
 
 namespace obd {
 
+/// What the adapter said where no usable reply came.
+enum class AdapterNote : int
+{
+    None = 0,          ///< nothing, or words that tell of silence on the bus, such as "NO DATA"
+    ReplyLost = 1,     ///< words for a reply that came damaged or was cut off: "DATA ERROR", "BUFFER FULL", "STOPPED"
+    NotUnderstood = 2, ///< "?": it does not know the command
+};
+
 /// The scan tool driver as the message layer sees it. One thread at a time may talk through it.
 class IDevice : public IAdapter
 {
@@ -43,6 +51,13 @@ public:
 
     /// Narrows what the adapter lets through to one CAN identifier. Not undone by the driver.
     virtual bool activateEcu(unsigned int ecu) = 0;
+
+    /// The adapter's number of the protocol in use; Automatic while none is known, or by a driver that does not tell
+    /// it.
+    virtual VehicleProtocol vehicleProtocol() { return VehicleProtocol::Automatic; }
+
+    /// Of the last execute, where its status is NoResponse or NotEnabled. The thread that talks through the device.
+    virtual AdapterNote lastNote() { return AdapterNote::None; }
 };
 
 } // namespace obd

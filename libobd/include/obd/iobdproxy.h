@@ -41,6 +41,24 @@ public:
 
     /// Supply voltage in volts by the adapter, 0.0 if it can't be read.
     virtual float batteryVoltage() = 0;
+
+    /// The adapter's number of the protocol in use; Automatic while no vehicle link stands, or by a device that does
+    /// not tell it.
+    virtual VehicleProtocol vehicleProtocol() { return VehicleProtocol::Automatic; }
+
+    /// execute, and in the same exchange what the adapter said where no usable reply came.
+    virtual IDevice::Status executeNoted(std::string const& command, std::string& response, unsigned int timeoutMs,
+                                         AdapterNote& note)
+    {
+        note = AdapterNote::None;
+        return execute(command, response, timeoutMs);
+    }
+    virtual IDevice::Status executeNoted(std::vector<unsigned char> const& request, ResponseMap& responses,
+                                         unsigned int timeoutMs, AdapterNote& note)
+    {
+        note = AdapterNote::None;
+        return execute(request, responses, timeoutMs);
+    }
 };
 
 } // namespace obd

@@ -19,6 +19,15 @@ class IVelmoraSettings;
 /// settings. Calls that reach observers on such another thread, onActiveEcuChanged and onInvalidated, are waited for by
 /// the dropping: they must not wait for the dispatching thread. A service may be built inside them, too. The observers'
 /// lists have no lock: attach and detach while no other thread closes, selects or changes settings.
+///
+///     obd::LIBOBDOpen("velmora.log");
+///     auto car = obd::ObdVelmoraBuilder::createObdVelmora(0, 0, 0, settings); // an ISettings of the application
+///     auto const bridge = std::make_shared<obd::DataBridge>();                // moved to and from the open port
+///     if (car->getConnectionManager()->openConnection(bridge, obd::VehicleProtocol::Automatic, false)) {
+///         auto const codes = obd::TroubleCodeServiceBuilder::createTroubleCodeService()->askConfirmedCodes();
+///     }
+///     car.reset(); // closes the connection
+///     obd::LIBOBDClose();
 class IObdVelmora
 {
 public:

@@ -40,6 +40,12 @@ public:
 /// Live values of the current control module, and of what is worked out from them: fuel consumption, boost, power,
 /// torque, battery voltage. attach, detach, updateOnce, startUpdates and reset belong to the application's thread, the
 /// one that dispatches; the others may be called from any thread.
+///
+///     auto const rpm = obd::ParameterIdentifier(0x0C).id();
+///     auto const sensors = obd::SensorServiceBuilder::createSensorService();
+///     auto const now = sensors->askSensors(rpm); // once; now.kind says whether now.value can be used
+///     sensors->attach(&observer);                // onSensorUpdated gets each reading
+///     sensors->startUpdates({rpm});              // until reset
 class ISensorService : public virtual tervex::INotifier<ISensorServiceObserver>
 {
 public:

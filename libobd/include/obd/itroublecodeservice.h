@@ -14,7 +14,13 @@ namespace obd {
 /// Trouble codes, malfunction indicator and freeze frames of the current control module. Every operation asks the
 /// vehicle once, or a few times, and blocks its caller meanwhile; call from any thread but the dispatcher's worker.
 /// Without a connection or a control module, and where the vehicle does not answer or refuses, lists are empty,
-/// pointers null and booleans false; the log tells why.
+/// pointers null and booleans false; the log tells why, and so do the operations that begin with "ask".
+///
+///     auto const codes = obd::TroubleCodeServiceBuilder::createTroubleCodeService();
+///     auto const outcome = codes->askConfirmedCodes();
+///     for (auto const& code : outcome.value) std::cout << code->code << ' ' << code->description << '\n';
+///     if (outcome.kind == obd::OutcomeKind::NothingStored) std::cout << "no codes\n";
+///     if (outcome.kind == obd::OutcomeKind::ModuleSilent) std::cout << "no answer\n";
 class ITroubleCodeService
 {
 public:

@@ -2,6 +2,7 @@
 
 #include <obd/export.h>
 #include <obd/messagedatamodel.h>
+#include <obd/outcome.h>
 #include <tervex/inotifier.h>
 
 #include <memory>
@@ -37,6 +38,12 @@ public:
     virtual void startLogging() = 0;
     virtual bool isLogging() = 0;
     virtual void stopLogging() = 0;
+
+    /// query, with how it went. Answered is any text, a control module's refusal among them: it is given as it came, so
+    /// there is no Refused, and an adapter stores nothing that it could have none of, so there is no NothingStored.
+    /// NotOffered is the adapter's "?": it does not know the command. ModuleSilent: nothing in time, or the adapter's
+    /// words for silence, such as "NO DATA". Unreadable: its words for a reply that was damaged or cut off.
+    virtual Outcome<std::string> askQuery(std::string const& request, int timeout) = 0;
 };
 
 namespace TroubleshootingServiceBuilder {

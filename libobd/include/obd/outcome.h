@@ -12,7 +12,7 @@ enum class OutcomeKind : int
     NothingStored = 1, ///< answered, and there is nothing of what was asked for
     ModuleSilent = 2,  ///< no answer of this module in time, whatever the others said
     Refused = 3,       ///< by a negative reply
-    Unreadable = 4,    ///< something came that can't be decoded
+    Unreadable = 4,    ///< something came that can't be decoded, or that the adapter says was damaged or cut off
     NotConnected = 5,  ///< no connection or no control module, or the link was lost meanwhile
     NotOffered = 6,    ///< the module does not have it, by what it says it supports or by its refusal
 };

@@ -66,6 +66,7 @@ TEST_F(ProtocolSetup, SearchGoesThroughTheProtocolsTwiceEach)
     EXPECT_TRUE(m_device.detectVehicle(VehicleProtocol::Automatic));
     EXPECT_EQ(m_device.getProtocol(), obd::ObdProtocolIso9141);
     EXPECT_TRUE(m_device.isEnabled());
+    EXPECT_EQ(m_device.vehicleProtocol(), VehicleProtocol::Iso9141);
     EXPECT_THAT(sent(), ElementsAre("ATTP0\r", "0100\r", "ATTP1\r", "0100\r", "ATTP1\r", "0100\r", "ATTP2\r", "0100\r",
                                     "ATTP2\r", "0100\r", "ATTP3\r", "0100\r", "ATDPN\r", "ATDP\r", "ATH1\r"));
 }

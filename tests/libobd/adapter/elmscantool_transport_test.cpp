@@ -76,6 +76,24 @@ TEST_F(ElmScantoolTransport, ErrorWordEmptiesTheReplyAndLeavesTheDeviceEnabled)
     EXPECT_THAT(m_log.lines(), ElementsAre("FATAL Got error from adapter: 12"));
 }
 
+TEST_F(ElmScantoolTransport, BesideNoResponseItTellsWhatTheAdapterSaid)
+{
+    connect();
+    struct Row
+    {
+        char const* reply;
+        obd::AdapterNote note;
+    };
+    for (Row const& row :
+         {Row{"BUFFER FULL\r\r>", obd::AdapterNote::ReplyLost}, Row{"?\r\r>", obd::AdapterNote::NotUnderstood},
+          Row{"NO DATA\r\r>", obd::AdapterNote::None}, Row{"\r\r>", obd::AdapterNote::None}}) {
+        m_channel->expect("0105").reply(row.reply);
+        std::string response;
+        EXPECT_EQ(m_device.execute("0105", response, 1000), Status::NoResponse);
+        EXPECT_EQ(m_device.lastNote(), row.note) << row.reply;
+    }
+}
+
 TEST_F(ElmScantoolTransport, SearchNoticeStaysInTheReply)
 {
     connect();

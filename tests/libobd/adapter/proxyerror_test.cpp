@@ -48,6 +48,17 @@ TEST(CheckForErrors, ErrorCutInTwoByTheSearchNoticeIsFound)
     EXPECT_EQ(errorOf("NO SEARCHING...DATA"), ProxyError::NoData);
 }
 
+TEST(CheckForErrors, WordsForADamagedReplyAreNotThoseForSilence)
+{
+    for (char const* reply : {"BUFFER FULL", "7E8 06 <DATA ERROR", "<RX ERROR", "STOPPED", "LV RESET", "ERR94"}) {
+        EXPECT_TRUE(obd::isReplyLost(support::bytes(reply))) << reply;
+    }
+    for (char const* reply : {"NO DATA", "UNABLE TO CONNECT", "BUS BUSY", "BUS ERROR", "CAN ERROR", "FB ERROR",
+                              "BUS INIT: ...ERROR", "SEARCHING...", "41 00", ""}) {
+        EXPECT_FALSE(obd::isReplyLost(support::bytes(reply))) << reply;
+    }
+}
+
 TEST(CheckForErrors, OrderOfSearchDecidesNotTheOrderInTheReply)
 {
     EXPECT_EQ(errorOf("STOPPED NO DATA"), ProxyError::NoData);

@@ -50,6 +50,22 @@ TEST_F(Proxy, BeforeADeviceIsSetRequestsAreUnparsedAndTheVoltageIsZeroWithoutALi
     EXPECT_TRUE(m_log.lines().empty());
 }
 
+TEST_F(Proxy, TellsInOneExchangeWhatTheAdapterSaidAndTheNumberOfTheBusWhileALinkStands)
+{
+    obd::ResponseMap responses;
+    obd::AdapterNote note = obd::AdapterNote::ReplyLost;
+    EXPECT_EQ(m_proxy->executeNoted(Bytes{0x01, 0x05}, responses, 100, note), IDevice::Status::Unparsed);
+    EXPECT_EQ(note, obd::AdapterNote::None) << "nobody was asked";
+    EXPECT_EQ(m_proxy->vehicleProtocol(), obd::VehicleProtocol::Automatic);
+    m_device->note = obd::AdapterNote::ReplyLost;
+    m_proxy->setDevice(m_device);
+    EXPECT_EQ(m_proxy->executeNoted(Bytes{0x01, 0x05}, responses, 100, note), IDevice::Status::NoResponse);
+    EXPECT_EQ(note, obd::AdapterNote::ReplyLost);
+    EXPECT_EQ(m_proxy->vehicleProtocol(), obd::VehicleProtocol::Iso15765Can11Bit500);
+    m_device->enabled = false;
+    EXPECT_EQ(m_proxy->vehicleProtocol(), obd::VehicleProtocol::Automatic);
+}
+
 TEST_F(Proxy, NoDataToTheFirstRequestFailsWithStatusThreeAndAnEmptyList)
 {
     m_device = std::make_shared<support::FakeDevice>();

@@ -5,6 +5,7 @@
 #include <obd/iroutineservice.h>
 #include <obd/isensorservice.h>
 #include <obd/itroublecodeservice.h>
+#include <obd/itroubleshootingservice.h>
 
 #include <functional>
 #include <optional>
@@ -49,9 +50,12 @@ struct Operation
     std::function<Told()> ask;
     std::string request;
     std::string answer;
-    std::string nothing; // empty for an operation that has no such reply
+    std::string nothing; // what tells that nothing is stored, or why no reply can
     std::string unreadable;
     std::optional<ObdMode> offered; // the service by whose set the module offers it
+
+    // A sentence is no reply.
+    bool canBeEmpty() const { return nothing.find("none") == std::string::npos; }
 };
 
 class Outcomes : public support::ServiceTest
@@ -98,12 +102,12 @@ protected:
              {}},
             {"pending", [s] { return told(s->askPendingCodes()); }, "07", "47 01 01 33", "47 00", "47 01", {}},
             {"permanent", [s] { return told(s->askPermanentCodes()); }, "0A", "4A 01 01 33", "4A 00", "4A", {}},
-            {"lamp", [s] { return told(s->askMilStatus()); }, "01 01", "41 01 81 07 65 04", "", "41 01 81",
-             ObdMode::CurrentData},
-            {"distance", [s] { return told(s->askDistance(true)); }, "01 21", "41 21 00 05", "", "41 21 00",
-             ObdMode::CurrentData},
-            {"run time", [s] { return told(s->askRuntime(false)); }, "01 4E", "41 4E 00 05", "", "41 4E",
-             ObdMode::CurrentData},
+            {"lamp", [s] { return told(s->askMilStatus()); }, "01 01", "41 01 81 07 65 04", "none: a lamp is on or off",
+             "41 01 81", ObdMode::CurrentData},
+            {"distance", [s] { return told(s->askDistance(true)); }, "01 21", "41 21 00 05", "none: 0 km is a distance",
+             "41 21 00", ObdMode::CurrentData},
+            {"run time", [s] { return told(s->askRuntime(false)); }, "01 4E", "41 4E 00 05",
+             "none: 0 minutes are a time", "41 4E", ObdMode::CurrentData},
             {"frame code",
              [s] { return told(s->askFreezeFrameTroubleCode(0)); },
              "02 02 00",
@@ -115,7 +119,7 @@ protected:
              "42 03 00 02 00", "42 03 00 00 00", "42 03 00 02", ObdMode::FreezeFrame},
             {"frame parameter", [s] { return told(s->askFreezeFrameParameter(0, pid(0x03))); }, "02 03 00",
              "42 03 00 02 00", "42 03 00 00 00", "42 03 01 02 00", ObdMode::FreezeFrame},
-            {"clearing", [s] { return told(s->askResetCodes()); }, "04", "44", "", "45", {}},
+            {"clearing", [s] { return told(s->askResetCodes()); }, "04", "44", "none: it asks for nothing", "45", {}},
         };
     }
 
@@ -128,29 +132,29 @@ protected:
         return {
             {"readiness", [d] { return told(d->askReadinessMonitors()); }, "01 01", "41 01 00 07 65 04",
              "41 01 00 00 00 00", "41 01 00", ObdMode::CurrentData},
-            {"this cycle", [d] { return told(d->askReadinessMonitorsThisCycle()); }, "01 41", "41 41 00 07 65 04", "",
-             "41 41", ObdMode::CurrentData},
-            {"monitors", [d] { return told(d->askMonitorTests()); }, "06 21", "46 21 81 16 04 B0 00 00 0F A0", "",
-             "46 21 81", ObdMode::MonitorTests},
+            {"this cycle", [d] { return told(d->askReadinessMonitorsThisCycle()); }, "01 41", "41 41 00 07 65 04",
+             "41 41 00 00 00 00", "41 41", ObdMode::CurrentData},
+            {"monitors", [d] { return told(d->askMonitorTests()); }, "06 21", "46 21 81 16 04 B0 00 00 0F A0",
+             "none: a monitor that is offered has its tests", "46 21 81", ObdMode::MonitorTests},
             {"counters", [d] { return told(d->askPerformanceCounters()); }, "09 08",
              "49 08 02 03 3F 0C A1" + blank + blank, "49 08 02 00 00 00 00" + blank + blank, "49 08 02",
              ObdMode::VehicleInformation},
-            {"oxygen", [d] { return told(d->askOxygenSensorTests(front)); }, "05 05 01", "45 05 01 14 00 20", "",
-             "45 05", ObdMode::MonitorTests},
+            {"oxygen", [d] { return told(d->askOxygenSensorTests(front)); }, "05 05 01", "45 05 01 14 00 20",
+             "none: a test that is offered has a value", "45 05", ObdMode::MonitorTests},
             {"oxygen complete", [d] { return told(d->askOxygenSensorTestComplete()); }, "01 01", "41 01 00 00 20 00",
              "41 01 00 00 00 00", "41 01", ObdMode::CurrentData},
             {"VIN", [e] { return told(e->askVehicleIdentificationNumber()); }, "09 02", "49 02 01" + vin,
              "49 02 01" + blank, "49 02 01 31", ObdMode::VehicleInformation},
-            {"calibrations", [e] { return told(e->askCalibrationIds()); }, "09 04", "49 04 01" + vin.substr(0, 48), "",
-             "49 04", ObdMode::VehicleInformation},
-            {"verification", [e] { return told(e->askVerificationNumbers()); }, "09 06", "49 06 01 17 91 BC 82", "",
-             "49 06", ObdMode::VehicleInformation},
+            {"calibrations", [e] { return told(e->askCalibrationIds()); }, "09 04", "49 04 01" + vin.substr(0, 48),
+             "49 04 00" + blank.substr(0, 48), "49 04", ObdMode::VehicleInformation},
+            {"verification", [e] { return told(e->askVerificationNumbers()); }, "09 06", "49 06 01 17 91 BC 82",
+             "49 06 00 00 00 00 00", "49 06", ObdMode::VehicleInformation},
             {"serial number", [e] { return told(e->askEngineSerialNumber()); }, "09 0D", "49 0D 01" + vin,
              "49 0D 01" + blank, "49 0D", ObdMode::VehicleInformation},
             {"approval", [e] { return told(e->askErotan()); }, "09 0F", "49 0F 01" + vin, "49 0F 01" + blank, "49 0F",
              ObdMode::VehicleInformation},
-            {"routine", [this] { return told(routines->askRoutine(1)); }, "08 01", "48 01", "", "48 02",
-             ObdMode::SystemControl},
+            {"routine", [this] { return told(routines->askRoutine(1)); }, "08 01", "48 01", "none: it asks for nothing",
+             "48 02", ObdMode::SystemControl},
             {"sensors", [this] { return told(sensors->askSensors(pid(0x03))); }, "01 03", "41 03 02 00", "41 03 00 00",
              "41 03 02", ObdMode::CurrentData},
         };
@@ -195,15 +199,17 @@ TEST_F(Outcomes, AnsweredComesWithAValue)
 TEST_F(Outcomes, NothingStoredIsAnAnswer)
 {
     open();
-    int asked = 0;
+    int without = 0;
     forEach([&](Operation const& operation) {
-        if (!operation.nothing.empty()) {
-            reply(operation, operation.nothing);
-            EXPECT_EQ(operation.ask().verdict, Verdict{OutcomeKind::NothingStored});
-            ++asked;
+        if (!operation.canBeEmpty()) {
+            ++without;
+            return;
         }
+        proxy().answer("01 01", "41 01 00 00 00 00"); // no monitor is there
+        reply(operation, operation.nothing);
+        EXPECT_EQ(operation.ask().verdict, Verdict{OutcomeKind::NothingStored});
     });
-    EXPECT_EQ(asked, 13);
+    EXPECT_EQ(without, 7);
 }
 
 TEST_F(Outcomes, AModuleIsSilentWhetherOrNotOthersAnswer)
@@ -245,13 +251,31 @@ TEST_F(Outcomes, WhatCannotBeReadIsNoSilence)
     });
 }
 
+TEST_F(Outcomes, AReplyThatTheAdapterLostIsNoSilence)
+{
+    open();
+    forEach([this](Operation const& operation) {
+        for (obd::AdapterNote const note : {obd::AdapterNote::ReplyLost, obd::AdapterNote::NotUnderstood}) {
+            proxy().note(operation.request, note);
+            EXPECT_EQ(operation.ask().verdict, Verdict{OutcomeKind::Unreadable});
+        }
+    });
+}
+
 TEST_F(Outcomes, WithoutAConnectionOrALinkNothingIsAskedOrBlamedOnTheModule)
 {
     forEach([](Operation const& operation) {
         EXPECT_EQ(operation.ask().verdict, Verdict{OutcomeKind::NotConnected}) << "before the opening";
     });
     open();
+    forEach([this](Operation const& operation) {
+        for (auto const status : {obd::IDevice::Status::NotSent, obd::IDevice::Status::NotEnabled}) {
+            proxy().fail(operation.request, status);
+            EXPECT_EQ(operation.ask().verdict, Verdict{OutcomeKind::NotConnected}) << "the link goes meanwhile";
+        }
+    });
     proxy().setConnected(false);
+    proxy().forgetRequests();
     forEach([](Operation const& operation) {
         EXPECT_EQ(operation.ask().verdict, Verdict{OutcomeKind::NotConnected}) << "the link is lost";
     });
@@ -324,8 +348,38 @@ TEST_F(Outcomes, OfRoutinesComeFromTheAskingForThem)
     EXPECT_EQ(routines->askRoutines().kind, OutcomeKind::NotOffered);
     m_engine->setDetection(ObdMode::SystemControl, {OutcomeKind::Refused, 0x22});
     EXPECT_EQ(Verdict(routines->askRoutines()), (Verdict{OutcomeKind::Refused, 0x22}));
-    m_engine->setDetection(ObdMode::SystemControl, {OutcomeKind::Unreadable});
-    EXPECT_EQ(routines->askRoutines().kind, OutcomeKind::Unreadable);
+    for (OutcomeKind const kind : {OutcomeKind::Unreadable, OutcomeKind::ModuleSilent}) {
+        m_engine->setDetection(ObdMode::SystemControl, {kind});
+        EXPECT_EQ(routines->askRoutines().kind, kind);
+    }
+}
+
+// An adapter's text is given as it came, so a refusal in it is an answer, and there is none that says "nothing stored".
+TEST_F(Outcomes, OfACommandToTheAdapterTellWhatItSaid)
+{
+    auto const service = obd::TroubleshootingServiceBuilder::createTroubleshootingService();
+    auto const ask = [&service] { return service->askQuery("0100", 100); };
+    EXPECT_EQ(ask().kind, OutcomeKind::NotConnected) << "before the opening";
+    open();
+    for (std::string const text : {"ELM327 v1.5", "7F0112"}) {
+        proxy().answerCommand("0100", text);
+        EXPECT_EQ(Verdict(ask()), Verdict{});
+        EXPECT_EQ(ask().value, text);
+    }
+    proxy().failCommand("0100", obd::IDevice::Status::NoResponse);
+    EXPECT_EQ(Verdict(ask()), Verdict{OutcomeKind::ModuleSilent});
+    EXPECT_EQ(ask().value, "");
+    proxy().noteCommand("0100", obd::AdapterNote::ReplyLost);
+    EXPECT_EQ(Verdict(ask()), Verdict{OutcomeKind::Unreadable});
+    proxy().noteCommand("0100", obd::AdapterNote::NotUnderstood);
+    EXPECT_EQ(Verdict(ask()), Verdict{OutcomeKind::NotOffered});
+    for (auto const status :
+         {obd::IDevice::Status::NotSent, obd::IDevice::Status::NotEnabled, obd::IDevice::Status::Unparsed}) {
+        proxy().failCommand("0100", status);
+        EXPECT_EQ(Verdict(ask()), Verdict{OutcomeKind::NotConnected});
+    }
+    m_rig.close();
+    EXPECT_EQ(ask().kind, OutcomeKind::NotConnected) << "after the closing";
 }
 
 TEST_F(Outcomes, WhatIsToldInPartTellsWhatIsMissing)
