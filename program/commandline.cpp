@@ -1,6 +1,7 @@
 #include "program/commandline.h"
 
 #include "libvelmora/output/outputfactory.h"
+#include "program/selfdescription.h"
 #include "program/terminal/output.h"
 #include "program/terminal/terminal.h"
 #include "program/view/layout.h"
@@ -164,6 +165,9 @@ CLI::App* CommandLine::addCommand(std::string const& name, std::string const& he
 ExitCode CommandLine::run(int argc, char const* const* argv)
 {
     try {
+        if (auto const described = describeItself(m_app, argc, argv)) {
+            return *described;
+        }
         m_app.parse(argc, argv);
     } catch (CLI::Success const& wanted) {
         m_action = [&](GlobalOptions const& /*options*/) {

@@ -22,7 +22,7 @@ need() {
 
 build_packages=(g++ cmake ninja-build libasio-dev libcli11-dev nlohmann-json3-dev libfmt-dev libtomlplusplus-dev
     libsqlite3-dev libboost-dev libmosquitto-dev)
-test_packages=(pkgconf libgtest-dev libgmock-dev libbenchmark-dev python3-jsonschema clang libclang-rt-14-dev clang-format
+test_packages=(pkgconf man-db bash-completion zsh fish libgtest-dev libgmock-dev libbenchmark-dev python3-jsonschema clang libclang-rt-14-dev clang-format
     clang-tidy strace prometheus systemd mosquitto
     mosquitto-clients nats-server chromium poppler-utils default-jre-headless)
 # Some have a newer Node with an npm of its own, which Debian's package would collide with.

@@ -44,16 +44,6 @@ std::string joined(std::string const& name)
     return fmt::format("{}", fmt::join(catalogueWords(name), ""));
 }
 
-std::vector<std::string> makers()
-{
-    std::vector<std::string> names;
-    for (int maker = obd::Manufacturer::Generic; maker <= obd::Manufacturer::Volvo; ++maker) {
-        names.push_back(
-            obd::Manufacturer::manufacturerToString(static_cast<obd::Manufacturer::AutoManufacturer>(maker)));
-    }
-    return names;
-}
-
 bool holdsAll(std::vector<std::string> const& words, std::vector<std::string> const& wanted)
 {
     return std::all_of(wanted.begin(), wanted.end(), [&words](std::string const& start) {
@@ -64,9 +54,19 @@ bool holdsAll(std::vector<std::string> const& words, std::vector<std::string> co
 
 } // namespace
 
+std::vector<std::string> catalogueMakers()
+{
+    std::vector<std::string> names;
+    for (int maker = obd::Manufacturer::Generic; maker <= obd::Manufacturer::Volvo; ++maker) {
+        names.push_back(
+            obd::Manufacturer::manufacturerToString(static_cast<obd::Manufacturer::AutoManufacturer>(maker)));
+    }
+    return names;
+}
+
 std::string findMaker(std::string const& name)
 {
-    std::vector<std::string> const names = makers();
+    std::vector<std::string> const names = catalogueMakers();
     auto const found = std::find_if(names.begin(), names.end(), [&name](std::string const& candidate) {
         return joined(candidate) == joined(name);
     });

@@ -91,13 +91,27 @@ Offered findTitles(std::string const& text, Offered const& offered)
                 hints);
 }
 
+// Some names that people know are of no sensor, but have a command of their own.
+char const* betterCommand(int pid)
+{
+    switch (pid) {
+    case 0x01:
+    case 0x41:
+        return "`velmora readiness` tells lamp and monitors";
+    case 0x02:
+        return "`velmora freeze` tells the code that froze values, and them";
+    default:
+        return listHint;
+    }
+}
+
 [[noreturn]] void failNotOffered(int pid)
 {
     std::string const name = sensorNameOf(pid);
     throw Error(ErrorKind::NotSupported,
                 fmt::format("The vehicle does not offer the sensor {:02X}{}", pid,
                             name.empty() ? "" : fmt::format(" ({})", name)),
-                {listHint, "another control module may offer it: --ecu ID"});
+                {betterCommand(pid), "another control module may offer it: --ecu ID"});
 }
 
 [[noreturn]] void failUnknown(std::string const& text)

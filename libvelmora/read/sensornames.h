@@ -16,7 +16,10 @@ struct SensorName
 // All names, by PID.
 std::vector<SensorName> const& sensorNames();
 
-// The PID of a name in any letter case, with '-' or a blank for '_'.
+// Names that other tools' users know, by PID: understood, but never written, so that keys stay as they are.
+std::vector<SensorName> const& sensorAliases();
+
+// The PID of a name or an alias in any letter case, with '-' or a blank for '_'.
 std::optional<int> findSensorName(std::string const& text);
 
 // The first name of a PID, empty for one without.

@@ -2,12 +2,15 @@
 #include "simulator/serve/session.h"
 #include "simulator/server.h"
 #include "simulator/simulation.h"
+#include "tools/manual/completion.h"
+#include "tools/manual/manualpage.h"
 
 #include <CLI/CLI.hpp>
 #include <asio/io_context.hpp>
 #include <asio/signal_set.hpp>
 
 #include <cstdio>
+#include <string_view>
 #include <thread>
 
 namespace {
@@ -60,6 +63,41 @@ void serve(obdsim::SessionOptions const& options)
     waiting.join();
 }
 
+// What the program tells packages and shells of its own command line: see describeItself of the other one.
+bool describeItself(CLI::App const& app, int argc, char const* const* argv)
+{
+    using namespace velmora::manual;
+    auto const names = [](std::vector<std::string> const& words) {
+        Completion completion;
+        for (std::string const& word : words) {
+            completion.candidates.push_back({word, {}});
+        }
+        return completion;
+    };
+    std::string_view const wish = argc > 1 ? argv[1] : "";
+    if (wish == "__manual" && argc == 3) {
+        writeManual(argv[2], describe(app), {OBDSIM_VERSION, manualDate(), ".BR velmora (1)"});
+        return true;
+    }
+    if (wish == "__complete") {
+        auto const files = [](std::string const& /*begun*/) { return Completion{{}, true}; };
+        Sources const sources = {
+            {"--vehicle", [&names](std::string const& /*begun*/) { return names(obdsim::simulatedVehicles()); }},
+            {"--adapter", [&names](std::string const& /*begun*/) { return names(obdsim::simulatedAdapters()); }},
+            {"--listen",
+             [&names](std::string const& /*begun*/) {
+                 return names({"pty", "tcp://127.0.0.1:0"});
+             }},
+            {"--replay", files},
+            {"--scenario", files},
+            {"--write-scenario", files},
+            {"--trace", files}};
+        std::fputs(printed(complete(describe(app), sources, {argv + 2, argv + argc})).c_str(), stdout);
+        return true;
+    }
+    return false;
+}
+
 } // namespace
 
 int main(int argc, char** argv)
@@ -82,6 +120,9 @@ int main(int argc, char** argv)
     app.add_option("--trace", options.trace, "Write all that passes to this file");
     app.add_flag("--list", list, "List vehicles, adapters, faults and control lines");
     try {
+        if (describeItself(app, argc, argv)) {
+            return 0;
+        }
         app.parse(argc, argv);
         if (list) {
             printAll();

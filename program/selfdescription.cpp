@@ -1,0 +1,131 @@
+#include "program/selfdescription.h"
+
+#include "libvelmora/port/serialportlist.h"
+#include "libvelmora/read/catalogueselection.h"
+#include "libvelmora/read/sensornames.h"
+#include "libvelmora/session/libraryuse.h"
+#include "libvelmora/text/text.h"
+#include "program/terminal/output.h"
+#include "simulator/simulation.h"
+#include "tools/manual/completion.h"
+#include "tools/manual/manualpage.h"
+
+#include <obd/troublecodecatalogue.h>
+#include <velmora/version.h>
+
+#include <fmt/format.h>
+
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace velmora::cli {
+
+namespace {
+
+using manual::Completion;
+
+Completion ports(std::string const& /*begun*/)
+{
+    Completion completion;
+    for (SerialPortEntry const& port : listSerialPorts()) {
+        completion.candidates.push_back({port.device, port.description});
+    }
+    completion.candidates.push_back({"auto", "Look for an adapter"});
+    for (std::string const& vehicle : obdsim::simulatedVehicles()) {
+        completion.candidates.push_back({"sim:" + vehicle, "Simulated vehicle"});
+    }
+    return completion;
+}
+
+Completion names(std::vector<std::string> const& words)
+{
+    Completion completion;
+    for (std::string const& word : words) {
+        completion.candidates.push_back({word, {}});
+    }
+    return completion;
+}
+
+Completion sensors(std::string const& /*begun*/)
+{
+    Completion completion;
+    for (SensorName const& each : sensorNames()) {
+        completion.candidates.push_back({each.name, fmt::format("PID {:02X}", each.pid)});
+    }
+    for (SensorName const& each : sensorAliases()) {
+        completion.candidates.push_back({each.name, fmt::format("PID {:02X}", each.pid)});
+    }
+    completion.candidates.push_back({"all", "All that a control module offers"});
+    return completion;
+}
+
+// The whole catalogue is too much to look at: only from a letter and two digits on.
+Completion troubleCodes(std::string const& begun)
+{
+    Completion completion;
+    if (begun.size() < 3) {
+        return completion;
+    }
+    LibraryUse const catalogue{std::string()};
+    std::string const wanted = toUpper(begun);
+    std::string last;
+    for (auto const& row : obd::TroubleCodeCatalogue::getRows()) {
+        if (row->code.starts_with(wanted) && row->code != last) {
+            completion.candidates.push_back({row->code, row->description});
+            last = row->code;
+        }
+    }
+    return completion;
+}
+
+Completion files(std::string const& /*begun*/)
+{
+    Completion completion;
+    completion.files = true;
+    return completion;
+}
+
+manual::Sources sources()
+{
+    auto const fixed = [](std::vector<std::string> words) {
+        return [words = std::move(words)](std::string const& /*begun*/) { return names(words); };
+    };
+    auto const vehicles = [](std::string const& /*begun*/) { return names(obdsim::simulatedVehicles()); };
+    auto const adapters = [](std::string const& /*begun*/) { return names(obdsim::simulatedAdapters()); };
+    auto const makers = [](std::string const& /*begun*/) { return names(catalogueMakers()); };
+    return {{"PORT", ports},
+            {"SENSOR", sensors},
+            {"CODE", troubleCodes},
+            {"MAKER", makers},
+            {"SYSTEM", fixed({"metric", "imperial"})},
+            {"WHEN", fixed({"auto", "always", "never"})},
+            {"KIND:TARGET", fixed({"csv:", "csv-long:", "ndjson:", "sqlite:", "influx:", "prometheus:", "mqtt://"})},
+            {"--listen", fixed({"pty", "tcp://127.0.0.1:0"})},
+            {"--vehicle", vehicles},
+            {"--adapter", adapters},
+            {"--scenario", files},
+            {"--replay", files},
+            {"--bundle", files},
+            {"DB", files},
+            {"FILE", files}};
+}
+
+} // namespace
+
+std::optional<ExitCode> describeItself(CLI::App const& app, int argc, char const* const* argv)
+{
+    std::string_view const wish = argc > 1 ? argv[1] : "";
+    if (wish == "__manual" && argc == 3) {
+        manual::writeManual(argv[2], manual::describe(app), {versionText, manual::manualDate(), {}});
+        return ExitCode::Done;
+    }
+    if (wish == "__complete") {
+        std::vector<std::string> const words(argv + 2, argv + argc);
+        writeOutput(manual::printed(manual::complete(manual::describe(app), sources(), words)));
+        return ExitCode::Done;
+    }
+    return std::nullopt;
+}
+
+} // namespace velmora::cli
