@@ -20,11 +20,17 @@ need() {
     as_root env DEBIAN_FRONTEND=noninteractive apt-get install -y -qq --no-install-recommends "${missing[@]}"
 }
 
-build_packages=(g++ cmake ninja-build libasio-dev libcli11-dev nlohmann-json3-dev libfmt-dev libtomlplusplus-dev
-    libsqlite3-dev libboost-dev libmosquitto-dev)
-test_packages=(pkgconf man-db bash-completion zsh fish libgtest-dev libgmock-dev libbenchmark-dev python3-jsonschema clang libclang-rt-14-dev clang-format
-    clang-tidy strace prometheus systemd mosquitto
-    mosquitto-clients nats-server chromium poppler-utils default-jre-headless)
+build_packages=(g++ cmake ninja-build)
+build_packages+=(libasio-dev libcli11-dev nlohmann-json3-dev libfmt-dev libtomlplusplus-dev)
+build_packages+=(libsqlite3-dev libboost-dev libmosquitto-dev)
+build_packages+=(libsystemd-dev) # Bluetooth's service
+test_packages=(libgtest-dev libgmock-dev libbenchmark-dev strace)
+test_packages+=(clang libclang-rt-14-dev clang-format clang-tidy)
+test_packages+=(python3-jsonschema pkgconf)
+test_packages+=(man-db bash-completion zsh fish)                            # what manual and completion are read by
+test_packages+=(prometheus systemd mosquitto mosquitto-clients nats-server) # what outputs speak to
+test_packages+=(chromium poppler-utils default-jre-headless)                # what reads reports and pages
+test_packages+=(python3-dbusmock)                                           # plays the Bluetooth service
 # Some have a newer Node with an npm of its own, which Debian's package would collide with.
 command -v npm >/dev/null || test_packages+=(nodejs npm)
 

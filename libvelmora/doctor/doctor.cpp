@@ -3,7 +3,7 @@
 #include "libvelmora/doctor/adaptercheck.h"
 #include "libvelmora/doctor/portcheck.h"
 #include "libvelmora/doctor/vehiclecheck.h"
-#include "libvelmora/port/openport.h"
+#include "libvelmora/port/opening/openport.h"
 #include "libvelmora/port/recordedport.h"
 #include "libvelmora/record/vinmask.h"
 

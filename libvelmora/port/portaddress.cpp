@@ -1,5 +1,7 @@
 #include "libvelmora/port/portaddress.h"
 
+#include "libvelmora/text/text.h"
+
 #include <velmora/error.h>
 
 #include <charconv>
@@ -15,6 +17,7 @@ namespace {
     throw Error(ErrorKind::WrongUse, "\"" + text + "\" is no port: " + why,
                 {"a serial port: /dev/ttyUSB0 or serial:///dev/ttyUSB0?baud=38400",
                  "a network adapter: 192.168.0.10:35000 or tcp://192.168.0.10:35000",
+                 "a Bluetooth adapter: bt://MAC or ble://MAC, as `velmora ports` lists them",
                  "a simulated car: sim:petrol-can11", "a recorded car: replay:FILE"});
 }
 
@@ -61,6 +64,22 @@ SimulatorAddress parseSimulator(std::string const& whole, std::string_view rest)
         reject(whole, "after ? only instant is understood");
     }
     return {std::string(rest.substr(0, query)), query != std::string_view::npos};
+}
+
+constexpr unsigned int lastChannel = 30; // of RFCOMM
+
+BluetoothAddress parseBluetooth(std::string const& whole, std::string_view rest)
+{
+    std::size_t const query = rest.find('?');
+    BluetoothAddress address{parseBluetoothMac(std::string(rest.substr(0, query))), {}};
+    if (query != std::string_view::npos) {
+        std::string_view option = rest.substr(query + 1);
+        address.channel = takePrefix(option, "channel=") ? readNumber<unsigned int>(option) : std::nullopt;
+        if (!address.channel || *address.channel > lastChannel) {
+            reject(whole, "after ? only channel=N is understood, from 1 to 30");
+        }
+    }
+    return address;
 }
 
 // A host in square brackets holds colons of its own (IPv6).
@@ -118,6 +137,11 @@ struct Printer
         return "sim:" + address.vehicle + (address.instant ? "?instant" : "");
     }
     std::string operator()(ReplayAddress const& address) const { return "replay:" + address.file; }
+    std::string operator()(BluetoothAddress const& address) const
+    {
+        return "bt://" + address.mac + (address.channel ? "?channel=" + std::to_string(*address.channel) : "");
+    }
+    std::string operator()(BleAddress const& address) const { return "ble://" + address.mac; }
 };
 
 // The name of a serial device without its path, which no host has.
@@ -133,6 +157,21 @@ bool namesSerialDevice(std::string_view text)
 
 } // namespace
 
+std::string parseBluetoothMac(std::string const& text)
+{
+    constexpr std::size_t digits = 17;
+    std::string const mac = toUpper(text);
+    bool good = mac.size() == digits;
+    for (std::size_t i = 0; good && i < digits; ++i) {
+        bool const isDigit = std::string_view("0123456789ABCDEF").find(mac[i]) != std::string_view::npos;
+        good = i % 3 == 2 ? mac[i] == ':' : isDigit;
+    }
+    if (!good) {
+        reject(text, "a Bluetooth address is six pairs of digits, such as 00:1D:A5:68:98:8B");
+    }
+    return mac;
+}
+
 PortAddress parsePortAddress(std::string const& text, unsigned int baud)
 {
     std::string_view rest = text;
@@ -144,6 +183,12 @@ PortAddress parsePortAddress(std::string const& text, unsigned int baud)
             reject(text, "the file is missing");
         }
         return ReplayAddress{std::string(rest)};
+    }
+    if (takePrefix(rest, "bt://")) {
+        return parseBluetooth(text, rest);
+    }
+    if (takePrefix(rest, "ble://")) {
+        return BleAddress{parseBluetoothMac(std::string(rest))};
     }
     if (takePrefix(rest, "serial://") || takePrefix(rest, "serial:") || rest.starts_with('/')) {
         return parseSerial(text, rest, baud);

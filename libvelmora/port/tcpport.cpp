@@ -14,6 +14,7 @@ namespace velmora {
 namespace {
 
 constexpr std::chrono::seconds connectLimit(10);
+constexpr std::chrono::milliseconds stopStep(100);
 
 [[noreturn]] void failConnect(TcpAddress const& address, std::string const& why)
 {
@@ -25,7 +26,7 @@ constexpr std::chrono::seconds connectLimit(10);
 
 } // namespace
 
-std::unique_ptr<IPort> openTcpPort(TcpAddress const& address)
+std::unique_ptr<IPort> openTcpPort(TcpAddress const& address, OpeningStop const& stop)
 {
     using asio::ip::tcp;
     auto context = std::make_unique<asio::io_context>();
@@ -39,7 +40,13 @@ std::unique_ptr<IPort> openTcpPort(TcpAddress const& address)
     error = asio::error::timed_out;
     asio::async_connect(socket, endpoints,
                         [&error](asio::error_code const& result, tcp::endpoint const&) { error = result; });
-    context->run_for(connectLimit);
+    auto const end = std::chrono::steady_clock::now() + connectLimit;
+    while (!context->stopped() && std::chrono::steady_clock::now() < end) {
+        if (stop && stop()) {
+            failInterruptedOpening();
+        }
+        context->run_for(stopStep);
+    }
     if (error) {
         failConnect(address, error == asio::error::timed_out ? "no answer" : error.message());
     }

@@ -19,6 +19,10 @@ Error silentAdapter(std::string const& port, std::optional<PortAddress> const& a
     } else if (address && std::holds_alternative<TcpAddress>(*address)) {
         hints.emplace_back("is another program connected to the adapter? most take one at a time");
     }
+    if (address &&
+        (std::holds_alternative<BluetoothAddress>(*address) || std::holds_alternative<BleAddress>(*address))) {
+        hints.emplace_back("is it the adapter? `velmora ports` lists Bluetooth devices by name");
+    }
     hints.emplace_back("pull the adapter and plug it in again, or try --reset");
     return {ErrorKind::AdapterSilent, "Nothing on " + port + " answers like an ELM327 adapter", hints};
 }

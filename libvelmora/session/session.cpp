@@ -1,7 +1,7 @@
 #include "libvelmora/session/session.h"
 
-#include "libvelmora/port/openport.h"
-#include "libvelmora/port/portsearch.h"
+#include "libvelmora/port/opening/openport.h"
+#include "libvelmora/port/opening/portsearch.h"
 #include "libvelmora/port/recordedport.h"
 #include "libvelmora/record/traffictrace.h"
 #include "libvelmora/session/openingfailure.h"
@@ -38,6 +38,16 @@ std::string portKey()
 std::string foundPortKey()
 {
     return "velmora/foundport";
+}
+
+// None where there is no Bluetooth, which is no reason not to look elsewhere.
+std::vector<BluetoothEntry> pairedAdapters()
+{
+    try {
+        return listBluetoothAdapters(std::chrono::seconds(0), {});
+    } catch (Error const&) {
+        return {};
+    }
 }
 
 [[noreturn]] void failInterrupted()
@@ -117,16 +127,14 @@ PortAddress Session::searchPort()
 {
     PortSearch search;
     search.ports = listSerialPorts();
+    search.paired = pairedAdapters();
     search.baud = m_options.baud;
     search.tell = [this](std::string const& line) { tellProgress(line); };
     search.stop = [this] { return m_interrupted.load(); };
     if (std::string last; m_settings->getString(foundPortKey(), last)) {
-        PortAddress const address = parsePortAddress(last);
-        if (auto const* const serial = std::get_if<SerialAddress>(&address)) {
-            search.last = *serial;
-        }
+        search.last = parsePortAddress(last);
     }
-    SerialAddress const found = findAdapter(search);
+    PortAddress const found = findAdapter(search);
     if (found != search.last) {
         rememberPort(found);
     }
@@ -134,7 +142,7 @@ PortAddress Session::searchPort()
 }
 
 // A help for the next time, which must not stand in the way of this one.
-void Session::rememberPort(SerialAddress const& address)
+void Session::rememberPort(PortAddress const& address)
 {
     try {
         m_settings->setString(foundPortKey(), toAddressText(address));
@@ -189,7 +197,8 @@ std::string Session::failedTrace() const
 
 void Session::openLink()
 {
-    std::unique_ptr<IPort> port = m_options.openPort ? m_options.openPort() : openPort(findPort());
+    std::unique_ptr<IPort> port =
+        m_options.openPort ? m_options.openPort() : openPort(findPort(), [this] { return m_interrupted.load(); });
     if (m_recorder != nullptr) {
         port = std::make_unique<RecordedPort>(std::move(port), *m_recorder);
     }

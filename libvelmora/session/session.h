@@ -93,7 +93,7 @@ private:
     };
 
     PortAddress searchPort();
-    void rememberPort(SerialAddress const& address);
+    void rememberPort(PortAddress const& address);
     void openLink();
     void enter(Phase phase);
     obd::VehicleProtocol protocol() const;

@@ -1,7 +1,7 @@
 #include "libvelmora/watch/sessioncar.h"
 
 #include "libvelmora/poll/sensorwish.h"
-#include "libvelmora/port/openport.h"
+#include "libvelmora/port/opening/openport.h"
 #include "libvelmora/read/codereader.h"
 #include "libvelmora/read/diagnosticreaders.h"
 #include "libvelmora/read/sensorchoice.h"

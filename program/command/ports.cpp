@@ -1,22 +1,91 @@
+#include "libvelmora/port/bluetooth/adapterlist.h"
+#include "libvelmora/port/bluetooth/pairing.h"
+#include "libvelmora/port/portaddress.h"
 #include "libvelmora/port/serialportlist.h"
 #include "libvelmora/report/json.h"
 #include "program/command/commands.h"
 #include "program/commandline.h"
+#include "program/terminal/interrupt.h"
 #include "program/terminal/output.h"
 
+#include <velmora/error.h>
+
+#include <CLI/App.hpp>
 #include <fmt/format.h>
+
+#include <memory>
 
 namespace velmora::cli {
 
 namespace {
 
-ExitCode listPorts(GlobalOptions const& options)
+constexpr std::chrono::seconds inquiry{11}; // one takes 10.24 s
+
+struct PortsOptions
+{
+    CLI::App* pair = nullptr;
+    std::string device;
+    bool known = false;
+};
+
+bool interrupted()
+{
+    return Interrupt::instance().raised();
+}
+
+// A computer without Bluetooth is no failure, only a remark.
+std::vector<BluetoothEntry> bluetoothAdapters(bool known)
+{
+    try {
+        std::vector<BluetoothEntry> entries = listBluetoothAdapters(std::chrono::seconds(0), interrupted);
+        if (!known) {
+            tell(fmt::format("Listening for Bluetooth adapters nearby, {} s ...\n", inquiry.count()));
+            entries = listBluetoothAdapters(inquiry, interrupted);
+        }
+        return entries;
+    } catch (Error const& error) {
+        if (error.kind() == ErrorKind::Interrupted) {
+            throw;
+        }
+        tell(std::string("No Bluetooth: ") + error.what() + "\n");
+        return {};
+    }
+}
+
+std::string describe(BluetoothEntry const& entry)
+{
+    std::string text = entry.name.empty() ? "no name" : entry.name;
+    text += entry.paired ? ", paired" : entry.nearby ? ", nearby, not paired" : ", not paired";
+    return entry.namedAsOne ? text : text + "; its service could be an adapter's, or a printer's";
+}
+
+Json toJsonValue(SerialPortEntry const& port)
+{
+    return {{"device", port.device},
+            {"kind", "serial"},
+            {"description", textOrNull(port.description)},
+            {"paired", nullptr}};
+}
+
+Json toJsonValue(BluetoothEntry const& entry)
+{
+    return {{"device", entry.address},
+            {"kind", entry.address.starts_with("ble:") ? "ble" : "bluetooth"},
+            {"description", textOrNull(entry.name)},
+            {"paired", entry.paired}};
+}
+
+ExitCode listPorts(PortsOptions const& options, bool json)
 {
     std::vector<SerialPortEntry> const ports = listSerialPorts();
-    if (options.json) {
+    std::vector<BluetoothEntry> const adapters = bluetoothAdapters(options.known);
+    if (json) {
         Json list = Json::array();
         for (SerialPortEntry const& port : ports) {
-            list.push_back({{"device", port.device}, {"description", textOrNull(port.description)}});
+            list.push_back(toJsonValue(port));
+        }
+        for (BluetoothEntry const& entry : adapters) {
+            list.push_back(toJsonValue(entry));
         }
         fmt::print("{}", printed(list));
         return ExitCode::Done;
@@ -24,9 +93,24 @@ ExitCode listPorts(GlobalOptions const& options)
     for (SerialPortEntry const& port : ports) {
         fmt::print("{}{}{}\n", port.device, port.description.empty() ? "" : "  ", port.description);
     }
-    if (ports.empty()) {
-        tell("No serial port that looks like an adapter. A network adapter needs none: --port HOST:PORT\n");
+    for (BluetoothEntry const& entry : adapters) {
+        fmt::print("{}  {}\n", entry.address, describe(entry));
     }
+    if (ports.empty() && adapters.empty()) {
+        tell("No port that looks like an adapter. A network adapter needs none: --port HOST:PORT\n");
+    }
+    return ExitCode::Done;
+}
+
+ExitCode pair(std::string const& device)
+{
+    std::string const text = device.starts_with("bt://")    ? device.substr(5)
+                             : device.starts_with("ble://") ? device.substr(6)
+                                                            : device;
+    std::string const mac = parseBluetoothMac(text);
+    pairDevice(
+        mac, [](std::string const& line) { tell(line); }, interrupted);
+    tell("Paired with " + mac + "\n");
     return ExitCode::Done;
 }
 
@@ -34,7 +118,16 @@ ExitCode listPorts(GlobalOptions const& options)
 
 void addPortsCommand(CommandLine& commandLine)
 {
-    commandLine.addCommand("ports", "List serial ports that look like adapters", listPorts);
+    auto const options = std::make_shared<PortsOptions>();
+    CLI::App* const command = commandLine.addCommand(
+        "ports", "List serial ports and Bluetooth devices that look like adapters",
+        [options](GlobalOptions const& global) {
+            return options->pair->parsed() ? pair(options->device) : listPorts(*options, global.json);
+        });
+    command->add_flag("--known", options->known, "Only what is known; don't listen for Bluetooth adapters nearby");
+    options->pair =
+        command->add_subcommand("pair", "Pair with a Bluetooth adapter, by the PINs that they usually have");
+    options->pair->add_option("MAC", options->device, "The adapter's address, 00:1D:A5:68:98:8B")->required();
 }
 
 } // namespace velmora::cli

@@ -21,7 +21,7 @@ std::string run(std::string const& car, std::vector<std::string> const& command)
 
 TEST(JsonSchema, HoldsForCommandsWithoutAVehicle)
 {
-    expectValid(runVelmora({"--json", "ports"}).out, "ports");
+    expectValid(runVelmora({"--json", "ports", "--known"}).out, "ports");
     expectValid(runVelmora({"--json", "dtc", "P0420", "P1000"}).out, "dtc");
     expectValid(runVelmora({"--json", "vin", "1M8GDM9AXKP042788"}).out, "vin");
     expectValid(runVelmora({"--json", "vin", "TM9ZZZ1Z000000001"}).out, "vin");

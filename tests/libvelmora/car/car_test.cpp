@@ -1,4 +1,4 @@
-#include "libvelmora/port/openport.h"
+#include "libvelmora/port/opening/openport.h"
 
 #include <obd/iconnectionmanager.h>
 #include <obd/iecumanager.h>

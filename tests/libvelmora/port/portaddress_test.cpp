@@ -32,6 +32,9 @@ TEST(PortAddress, UnderstandsEveryForm)
         {"sim:", SimulatorAddress{""}},
         {"sim:petrol-can11?instant", SimulatorAddress{"petrol-can11", true}},
         {"replay:car.dialogue", ReplayAddress{"car.dialogue"}},
+        {"bt://00:1d:a5:68:98:8b", velmora::BluetoothAddress{"00:1D:A5:68:98:8B", {}}},
+        {"bt://00:1D:A5:68:98:8B?channel=2", velmora::BluetoothAddress{"00:1D:A5:68:98:8B", 2}},
+        {"ble://AA:BB:CC:DD:EE:FF", velmora::BleAddress{"AA:BB:CC:DD:EE:FF"}},
     };
     for (AddressCase const& row : cases) {
         EXPECT_EQ(parsePortAddress(row.text), row.expected) << row.text;
@@ -47,9 +50,31 @@ TEST(PortAddress, BaudOptionHoldsWhereTheAddressNamesNone)
 
 TEST(PortAddress, RefusesWhatIsNoAddressAndTellsTheForms)
 {
-    for (char const* text : {"", ":35000", "host:", "host:0", "host:65536", "host:12a", "[::1", "[::1]x", "ftp://host",
-                             "ftp:host:21", "fe80::1", "replay:", "serial://", "/dev/ttyUSB0?rate=1",
-                             "/dev/ttyUSB0?baud=x", "sim:x?", "sim:x?fast", "two words"}) {
+    for (char const* text : {"",
+                             ":35000",
+                             "host:",
+                             "host:0",
+                             "host:65536",
+                             "host:12a",
+                             "[::1",
+                             "[::1]x",
+                             "ftp://host",
+                             "ftp:host:21",
+                             "fe80::1",
+                             "replay:",
+                             "serial://",
+                             "/dev/ttyUSB0?rate=1",
+                             "/dev/ttyUSB0?baud=x",
+                             "sim:x?",
+                             "sim:x?fast",
+                             "two words",
+                             "bt://",
+                             "bt://00:1D:A5:68:98",
+                             "bt://00-1D-A5-68-98-8B",
+                             "bt://00:1D:A5:68:98:8B?channel=31",
+                             "bt://00:1D:A5:68:98:8B?channel=0",
+                             "ble://AA:BB:CC:DD:EE:FG",
+                             "ble://AA:BB:CC:DD:EE:FF?x"}) {
         try {
             parsePortAddress(text);
             ADD_FAILURE() << text << " was taken";

@@ -1,4 +1,4 @@
-#include "libvelmora/port/portsearch.h"
+#include "libvelmora/port/opening/portsearch.h"
 #include "simulator/server.h"
 #include "simulator/simulation.h"
 
@@ -190,7 +190,7 @@ TEST(PortSearch, TriesTheLastGoodOneFirstAndPassesOthersBy)
     search.ports = {{"/dev/velmora-none", ""}, {modem.path(), ""}, {server->address(), ""}};
     search.baud = 38400;
     search.tell = [&](std::string const& line) { told += line; };
-    EXPECT_EQ(velmora::findAdapter(search), (SerialAddress{server->address(), 38400}));
+    EXPECT_EQ(velmora::findAdapter(search), velmora::PortAddress(SerialAddress{server->address(), 38400}));
     EXPECT_EQ(told, fmt::format("Trying {} at 38400 baud ...\nTrying {} at 38400 baud ...\n", modem.path(),
                                 server->address()));
     told.clear();

@@ -1,0 +1,169 @@
+#!/usr/bin/env python3
+"""The program over Bluetooth, against a played Bluetooth service on a message bus of its own.
+
+    bluetooth_test.py PROGRAM SIMULATOR        starts the bus, and itself again on it
+"""
+import os
+import signal
+import subprocess
+import sys
+import time
+import unittest
+
+import dbus
+
+HERE = os.path.dirname(os.path.abspath(__file__))
+BLE, CLASSIC, OTHER = 'AA:BB:CC:DD:EE:01', 'AA:BB:CC:DD:EE:02', 'AA:BB:CC:DD:EE:09'
+UART = '0000fff0-0000-1000-8000-00805f9b34fb'
+NOTIFY, WRITE = UART.replace('fff0', 'fff1'), UART.replace('fff0', 'fff2')
+
+
+def run(*arguments, seconds=40, environment=None):
+    result = subprocess.run([PROGRAM, '--settings', os.path.join(FOLDER, 'settings'), *arguments], text=True,
+                            capture_output=True, timeout=seconds, env={**os.environ, **(environment or {})}, check=False)
+    return result.returncode, result.stdout, result.stderr
+
+
+def start_simulator():
+    process = subprocess.Popen([SIMULATOR, '--listen', 'tcp://127.0.0.1:0', '--vehicle', 'petrol-can11'],
+                               stdout=subprocess.PIPE, stderr=subprocess.DEVNULL, text=True)
+    return process, int(process.stdout.readline().rsplit(':', 1)[1])
+
+
+class Bluetooth(unittest.TestCase):
+    def setUp(self):
+        self.simulator, self.port = start_simulator()
+        self.service = subprocess.Popen(
+            ['/usr/bin/python3', '-m', 'dbusmock', '--template', os.path.join(HERE, 'bluez_template.py')],
+            stdout=subprocess.DEVNULL)
+        bus = dbus.SystemBus()
+        end = time.monotonic() + 10
+        while not bus.name_has_owner('org.bluez'):
+            self.assertLess(time.monotonic(), end, 'the played service does not start')
+            time.sleep(0.02)
+        self.control = dbus.Interface(bus.get_object('org.bluez', '/'), 'org.bluez.Mock')
+        self.control.AddAdapter('hci0', 'test')
+
+    def tearDown(self):
+        for process in (self.service, self.simulator):
+            process.send_signal(signal.SIGTERM)
+            process.wait(10)
+            if process.stdout:
+                process.stdout.close()
+
+    def add_ble(self, mtu=23, flags=('write', 'write-without-response'), notify=NOTIFY, write=WRITE, service=UART):
+        return self.control.AddLowEnergy('hci0', BLE, 'OBDBLE', service, notify, write, dbus.Array(flags, signature='s'),
+                                         dbus.UInt16(mtu), dbus.Int32(self.port))
+
+    def add_classic(self):
+        return self.control.AddClassic('hci0', CLASSIC, 'OBDII', dbus.Int32(self.port))
+
+    def expect(self, arguments, code, *words):
+        result = run(*arguments)
+        self.assertEqual(result[0], code, result)
+        for word in words:
+            self.assertIn(word, result[1] + result[2])
+        return result
+
+    def test_low_energy_by_sockets_writes_within_the_unit(self):
+        path = self.add_ble()
+        self.expect(['-p', f'ble://{BLE}', 'info'], 0, 'VIN')
+        count, longest, dropped = self.control.Writes(path)
+        self.assertGreater(count, 10)
+        self.assertLessEqual(longest, 20)
+        self.assertEqual(dropped, 0)
+
+    def test_low_energy_by_messages_where_no_socket_is_given(self):
+        path = self.add_ble(flags=('write',), notify=WRITE, write=WRITE)
+        self.control.GiveSockets(path, False)
+        self.expect(['-p', f'ble://{BLE}', 'info'], 0, 'VIN')
+
+    def test_low_energy_of_an_unknown_service_and_swapped_names(self):
+        self.add_ble(service='12345678-0000-1000-8000-00805f9b34fb', notify=WRITE, write=NOTIFY)
+        self.expect(['-p', f'ble://{BLE}', 'info'], 0, 'VIN')
+
+    def test_low_energy_gets_through_after_failures_on_the_edge_of_reach(self):
+        path = self.add_ble()
+        self.control.Fail(path, 'Failed:le-connection-abort-by-local|Failed:le-connection-abort-by-local')
+        self.expect(['-p', f'ble://{BLE}', 'info'], 0, 'VIN')
+
+    def test_loss_in_mid_session_is_told_as_a_lost_link(self):
+        path = self.add_ble()
+        self.control.LoseAfter(path, 25)
+        self.expect(['-p', f'ble://{BLE}', 'scan'], 8)
+
+    def test_errors_of_low_energy_name_what_to_do(self):
+        path = self.add_ble()
+        rows = [('NotReady:Resource Not Ready', 'Bluetooth is off'),
+                ('AuthenticationFailed:x', 'ports pair'),
+                ('InProgress:Operation already in progress', 'another program'),
+                ('Failed:le-connection-refused', 'le-connection-refused'),
+                ('Failed:br-connection-page-timeout', 'out of reach')]
+        for error, words in rows:
+            self.control.Fail(path, error)
+            self.expect(['-p', f'ble://{BLE}', 'info'], 3, words)
+
+    def test_classic_by_the_service_hands_over_a_socket(self):
+        path = self.add_classic()
+        self.expect(['-p', f'bt://{CLASSIC}', 'info'], 0, 'VIN')
+        self.control.LoseAfter(path, 25)
+        self.expect(['-p', f'bt://{CLASSIC}', 'scan'], 8)
+
+    def test_classic_goes_past_a_service_that_refuses_to_the_kernel(self):
+        path = self.add_classic()
+        self.control.Fail(path, 'NotAvailable:br-connection-profile-unavailable')
+        code, _, said = self.expect(['-p', f'bt://{CLASSIC}', 'info'], 3, CLASSIC)
+        self.assertRegex(said, 'no Bluetooth support|not loaded|is off|no answer')
+
+    def test_ports_lists_adapters_and_auto_tries_only_paired_ones(self):
+        ble = self.add_ble()
+        self.control.AddDevice('hci0', OTHER, 'Kitchen lamp')
+        self.control.SetPaired(self.add_classic(), True)
+        _, out, _ = self.expect(['ports', '--known'], 0)
+        self.assertIn(f'bt://{CLASSIC}  OBDII, paired', out)
+        self.assertIn(f'ble://{BLE}  OBDBLE, nearby, not paired', out)
+        self.assertNotIn('lamp', out)
+        self.assertEqual(self.control.Writes(ble)[0], 0)
+        self.expect(['-p', 'auto', 'info'], 0, 'VIN', f'bt://{CLASSIC}')
+        self.assertEqual(self.control.Writes(ble)[0], 0, 'nothing is written to a device that is only nearby')
+
+    def test_pairing_tells_the_usual_pins_one_after_the_other(self):
+        path = self.add_classic()
+        self.control.WantPin(path, '0000')
+        self.expect(['ports', 'pair', CLASSIC], 0, 'Paired with ' + CLASSIC)
+        self.expect(['ports', 'pair', CLASSIC], 0, 'Paired with')
+        ble = self.add_ble()
+        self.expect(['ports', 'pair', f'ble://{BLE}'], 0, 'Paired with')
+        self.control.SetPaired(ble, False)
+        self.control.WantPin(ble, '9753')
+        self.expect(['ports', 'pair', BLE], 3, 'refused the usual PINs')
+
+    def test_interrupt_ends_the_search_for_an_absent_device_at_once(self):
+        process = subprocess.Popen([PROGRAM, '-p', f'ble://{OTHER}', 'info'], stderr=subprocess.PIPE, text=True)
+        time.sleep(1.5)
+        start = time.monotonic()
+        process.send_signal(signal.SIGINT)
+        _, said = process.communicate(timeout=20)
+        self.assertEqual(process.returncode, 130, said)
+        self.assertLess(time.monotonic() - start, 1.5)
+
+    def test_no_bus_and_no_service_are_told(self):
+        code, _, said = run('-p', f'ble://{BLE}', 'info', environment={'DBUS_SYSTEM_BUS_ADDRESS': 'unix:path=/nonexistent'})
+        self.assertEqual(code, 3)
+        self.assertIn('no system bus', said)
+        self.service.send_signal(signal.SIGTERM)
+        self.service.wait(10)
+        self.expect(['-p', f'ble://{BLE}', 'info'], 3, 'bluetoothd')
+        code, _, said = run('-p', 'ble://AA:BB', 'info')
+        self.assertEqual(code, 2, said)
+
+
+if __name__ == '__main__':
+    if 'BLUETOOTH_TEST_ON_ITS_BUS' not in os.environ:
+        os.environ['BLUETOOTH_TEST_ON_ITS_BUS'] = '1'
+        os.execvp('dbus-run-session', ['dbus-run-session', '--', '/usr/bin/python3', *sys.argv])
+    os.environ['DBUS_SYSTEM_BUS_ADDRESS'] = os.environ['DBUS_SESSION_BUS_ADDRESS']
+    PROGRAM, SIMULATOR, FOLDER = sys.argv[1:4]
+    os.makedirs(FOLDER, exist_ok=True)
+    os.environ['HOME'] = FOLDER
+    unittest.main(argv=[sys.argv[0], '-v', *sys.argv[4:]])
