@@ -1,0 +1,12 @@
+# Whether the Python package can be built. ThreadSanitizer can't follow an interpreter that it was not built into.
+if(VELMORA_PYTHON)
+    find_package(Python3 3.11 QUIET COMPONENTS Interpreter Development.Module)
+    set(PYBIND11_FINDPYTHON ON)
+    find_package(pybind11 2.10 CONFIG QUIET)
+    if(NOT Python3_Development.Module_FOUND OR NOT pybind11_FOUND)
+        message(STATUS "No Python package: Python 3.11 or pybind11 is not found (VELMORA_PYTHON=OFF says so)")
+        set(VELMORA_PYTHON OFF)
+    elseif(VELMORA_SANITIZE MATCHES "thread" OR (NOT VELMORA_COMPANION AND NOT VELMORA_PROGRAM AND NOT VELMORA_TESTS))
+        set(VELMORA_PYTHON OFF)
+    endif()
+endif()
