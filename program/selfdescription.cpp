@@ -93,6 +93,7 @@ manual::Sources sources()
     };
     auto const vehicles = [](std::string const& /*begun*/) { return names(obdsim::simulatedVehicles()); };
     auto const adapters = [](std::string const& /*begun*/) { return names(obdsim::simulatedAdapters()); };
+    auto const drives = [](std::string const& /*begun*/) { return names(obdsim::simulatedDrives()); };
     auto const makers = [](std::string const& /*begun*/) { return names(catalogueMakers()); };
     return {{"PORT", ports},
             {"SENSOR", sensors},
@@ -104,6 +105,7 @@ manual::Sources sources()
             {"--listen", fixed({"pty", "tcp://127.0.0.1:0"})},
             {"--vehicle", vehicles},
             {"--adapter", adapters},
+            {"--drive", drives},
             {"--scenario", files},
             {"--replay", files},
             {"--bundle", files},

@@ -28,7 +28,8 @@ class Simulator::Impl
 {
 public:
     explicit Impl(Options const& options)
-        : m_car(obdsim::simulateCar({options.vehicle, options.adapter, options.faults, options.scenario}))
+        : m_car(
+              obdsim::simulateCar({options.vehicle, options.adapter, options.faults, options.scenario, options.drive}))
     {}
 
     /// Works on the car: on the server's thread while it serves.

@@ -1,5 +1,6 @@
 #include "simulator/simulation.h"
 
+#include "simulator/car/course.h"
 #include "simulator/car/vehiclelibrary.h"
 #include "simulator/faultypeer.h"
 #include "simulator/linerate.h"
@@ -41,6 +42,13 @@ std::shared_ptr<IPeer> onTheWire(std::shared_ptr<Adapter> const& adapter, FaultP
     return baud == 0 ? peer : std::make_shared<LineRate>(std::move(peer), baud);
 }
 
+void follow(DrivePlan const& plan, EngineData& engine)
+{
+    engine.course = std::make_shared<Course const>(plan.course);
+    engine.ambientCelsius = plan.ambientCelsius.value_or(engine.ambientCelsius);
+    engine.startCoolantCelsius = plan.startCoolantCelsius.value_or(engine.startCoolantCelsius);
+}
+
 /// What only a car can judge of a scenario is judged before it begins.
 void rehearse(SimulatedCar& car, std::vector<ScenarioLine> const& scenario)
 {
@@ -61,7 +69,10 @@ std::vector<std::shared_ptr<SimulatedCar>> simulateFleet(SimulationOptions const
     const FaultPlan plan = parseFaults(options.faults);
     AdapterProfile profile = adapterProfile(options.adapter);
     apply(plan, profile);
-    const VehicleData vehicle = loadVehicle(options.vehicle);
+    VehicleData vehicle = loadVehicle(options.vehicle);
+    if (!options.drive.empty()) {
+        follow(loadDrive(options.drive), vehicle.engine);
+    }
     auto const scenario = options.scenario.empty() ? std::vector<ScenarioLine>() : loadScenario(options.scenario);
     SimulatedCar trial(vehicle, profile, plan);
     rehearse(trial, scenario);
@@ -99,6 +110,11 @@ std::vector<std::string> simulatedVehicles()
 std::vector<std::string> simulatedAdapters()
 {
     return profileKeys();
+}
+
+std::vector<std::string> simulatedDrives()
+{
+    return driveNames();
 }
 
 std::vector<std::string> faultForms()

@@ -13,8 +13,9 @@ struct SimulationOptions
 {
     std::string vehicle = "petrol-can11"; ///< or the path of a vehicle file
     std::string adapter = "elm327-v1.5";
-    std::vector<std::string> faults; ///< in the forms of parseFaults()
-    std::string scenario = {};       ///< path of a scenario file; empty: none
+    std::vector<std::string> faults = {}; ///< in the forms of parseFaults()
+    std::string scenario = {};            ///< path of a scenario file; empty: none
+    std::string drive = {};               ///< a name of simulatedDrives(), or a CSV file; empty: the vehicle's own
 };
 
 class SimulatedCar;
@@ -35,6 +36,7 @@ std::shared_ptr<IPeer> replay(std::string const& path, std::vector<std::string> 
 /// Names of the built-in vehicles and of the adapters, for help texts.
 std::vector<std::string> simulatedVehicles();
 std::vector<std::string> simulatedAdapters();
+std::vector<std::string> simulatedDrives();
 
 /// The forms of faults, and those of control lines with what they do.
 std::vector<std::string> faultForms();

@@ -51,6 +51,7 @@ ExitCode simulate(SimulateOptions const& options, GlobalOptions const& global)
     if (options.list) {
         printNames("Vehicles", obdsim::simulatedVehicles());
         printNames("Adapters", obdsim::simulatedAdapters());
+        printNames("Drives", obdsim::simulatedDrives());
         printNames("Faults", obdsim::faultForms());
         printNames("Control lines", obdsim::controlForms());
         return ExitCode::Done;
@@ -84,6 +85,7 @@ void addSimulateCommand(CommandLine& commandLine)
     command->add_option("--fault", session.simulation.faults,
                         "Something that goes wrong, such as cut@120; may be repeated");
     command->add_option("--scenario", session.simulation.scenario, "Control lines with their times");
+    command->add_option("--drive", session.simulation.drive, "A built-in drive, or a CSV file (seconds,speed,...)");
     command->add_option("--write-scenario", session.written, "Write what control lines have changed as a scenario");
     command->add_option("--control", session.control, "Take control lines on this port of 127.0.0.1 (0: any free one)")
         ->check(CLI::Range(0, 65535));

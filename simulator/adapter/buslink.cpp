@@ -172,6 +172,9 @@ BusReply BusLink::wake(BusInit init)
         reply.texts.push_back({chosen->probe * i / 4, "."});
     }
     reply.end = chosen->probe;
+    if (m_open && init == BusInit::FiveBaud) {
+        reply.end += m_vehicle->addressPause() - shortestAddressPause; // which the probe has in it
+    }
     reply.texts.push_back({reply.end, m_open ? "OK\r" : "ERROR\r"});
     return reply;
 }

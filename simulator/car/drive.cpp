@@ -63,6 +63,7 @@ DriveState Drive::at(Time time) const
     DriveState state = DriveModel(m_engine).at(m_stoppedAt.value_or(time) - m_start);
     state.totalSeconds = m_secondsBefore + state.seconds;
     state.kilometres += m_kilometresBefore;
+    addColumns(state);
     if (m_stoppedAt) {
         stand(state);
     }
@@ -71,6 +72,20 @@ DriveState Drive::at(Time time) const
         state.*row.member = held == m_held.end() ? state.*row.member : held->second;
     }
     return state;
+}
+
+/// What a recorded drive has beside its speed goes before what the model makes of it.
+void Drive::addColumns(DriveState& state) const
+{
+    if (!m_engine.course) {
+        return;
+    }
+    auto const& columns = m_engine.course->columns();
+    for (std::size_t i = 1; i < columns.size(); ++i) {
+        auto const row = std::find_if(std::begin(heldRows), std::end(heldRows),
+                                      [&](HeldRow const& each) { return each.name == columns[i].name; });
+        state.*row->member = m_engine.course->value(columns[i], state.seconds);
+    }
 }
 
 DriveState Drive::planned(Time time) const

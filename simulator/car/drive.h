@@ -36,6 +36,8 @@ public:
     static std::vector<std::string> names();
 
 private:
+    void addColumns(DriveState& state) const;
+
     EngineData m_planned;
     EngineData m_engine; ///< of the drive since the last start
     Time m_start{};

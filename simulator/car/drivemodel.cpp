@@ -63,6 +63,18 @@ double warmUp(double start, double end, double seconds, double constant)
     return end - (end - start) * std::exp(-seconds / constant);
 }
 
+double coolantCelsius(EngineData const& engine, double seconds)
+{
+    return warmUp(engine.startCoolantCelsius, 91, seconds, 180);
+}
+
+/// A cold engine idles faster.
+double coldIdleRpm(double coolantCelsius)
+{
+    constexpr double warm = 45;
+    return std::max(0.0, warm - coolantCelsius) * 9;
+}
+
 } // namespace
 
 DriveModel::DriveModel(EngineData const& engine) : m_engine(engine) {}
@@ -83,8 +95,7 @@ DriveState DriveModel::at(Time time) const
 
 void DriveModel::addBattery(DriveState& state) const
 {
-    double const t = std::fmod(state.seconds, cycle);
-    bool const braking = t > brakeAt && t < standAt;
+    bool const braking = speedKmh(state.seconds + 0.5) - speedKmh(state.seconds) < -0.5;
     state.gearboxCelsius = warmUp(m_engine.ambientCelsius + 4, 82, state.seconds, 260);
     state.batteryPercent = std::max(5.0, 78 - state.kilometres * 0.22);
     state.batteryAmps = braking ? -state.speedKmh * 0.9 : 4 + state.loadPercent * state.speedKmh * 0.02;
@@ -92,20 +103,32 @@ void DriveModel::addBattery(DriveState& state) const
     state.batteryCelsius = warmUp(m_engine.ambientCelsius, m_engine.ambientCelsius + 9, state.seconds, 900);
 }
 
+double DriveModel::speedKmh(double seconds) const
+{
+    return m_engine.course ? m_engine.course->kmh(seconds)
+                           : m_engine.topSpeedKmh * speedPart(std::fmod(seconds, cycle));
+}
+
+double DriveModel::kilometres(double seconds) const
+{
+    if (m_engine.course) {
+        return m_engine.course->kilometres(seconds);
+    }
+    double const cycles = std::floor(seconds / cycle);
+    return m_engine.topSpeedKmh / 3600.0 * (cycles * wayPart(cycle) + wayPart(std::fmod(seconds, cycle)));
+}
+
 void DriveModel::addMotion(DriveState& state) const
 {
-    double const t = std::fmod(state.seconds, cycle);
-    double const cycles = std::floor(state.seconds / cycle);
-    double const top = m_engine.topSpeedKmh;
-    state.speedKmh = std::max(0.0, top * speedPart(t));
-    state.kilometres = top / 3600.0 * (cycles * wayPart(cycle) + wayPart(t));
+    state.speedKmh = std::max(0.0, speedKmh(state.seconds));
+    state.kilometres = kilometres(state.seconds);
     state.odometerKm = m_engine.startOdometerKm + state.kilometres;
 
     double const wobble = 8 * std::sin(state.seconds * 2.1);
     double const driven = state.speedKmh * gearRatio(state.speedKmh) * (m_engine.compression ? 0.75 : 1.0);
-    state.rpm = std::max(m_engine.idleRpm, driven) + wobble;
+    state.rpm = std::max(m_engine.idleRpm + coldIdleRpm(coolantCelsius(m_engine, state.seconds)), driven) + wobble;
 
-    double const accelerationKmhPerS = top * (speedPart(t + 0.5) - speedPart(t));
+    double const accelerationKmhPerS = speedKmh(state.seconds + 0.5) - speedKmh(state.seconds);
     double const cruiseLoad = 24 + state.speedKmh * 0.16;
     state.loadPercent = std::clamp(cruiseLoad + accelerationKmhPerS * 12, 3.0, 92.0);
     state.pedalPercent = state.loadPercent > 25 ? std::min(100.0, (state.loadPercent - 22) * 0.9) : 0;
@@ -136,7 +159,7 @@ void DriveModel::addAir(DriveState& state) const
 void DriveModel::addTemperatures(DriveState& state) const
 {
     double const s = state.seconds;
-    state.coolantCelsius = warmUp(m_engine.startCoolantCelsius, 91, s, 180) + 0.4 * std::sin(s / 20);
+    state.coolantCelsius = coolantCelsius(m_engine, s) + 0.4 * std::sin(s / 20);
     state.oilCelsius = warmUp(m_engine.startCoolantCelsius - 6, 96, s, 320);
     state.intakeCelsius = m_engine.ambientCelsius + 14 - state.speedKmh * 0.06;
     state.catalystCelsius = warmUp(210, 470, s, 70) + state.loadPercent * 1.6;

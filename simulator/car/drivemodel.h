@@ -1,6 +1,9 @@
 #pragma once
 
+#include "simulator/car/course.h"
 #include "simulator/peer.h"
+
+#include <memory>
 
 namespace obdsim {
 
@@ -15,7 +18,8 @@ struct EngineData
     double startCoolantCelsius = 62;
     double startOdometerKm = 48210;
     double startFuelPercent = 63;
-    double topSpeedKmh = 92; ///< of the cruise in each cycle
+    double topSpeedKmh = 92;                   ///< of the cruise in each cycle
+    std::shared_ptr<Course const> course = {}; ///< in place of the cycle
 };
 
 /// A moment of the drive, in the units of the standard's PIDs.
@@ -60,7 +64,7 @@ struct DriveState
 };
 
 /// A drive that repeats every two minutes: idle, accelerate through the gears,
-/// cruise, brake to a stop. A pure function of time, so that runs are repeatable.
+/// cruise, brake to a stop; or the engine's course. A pure function of time, so that runs are repeatable.
 class DriveModel
 {
 public:
@@ -69,6 +73,8 @@ public:
     DriveState at(Time time) const;
 
 private:
+    double speedKmh(double seconds) const;
+    double kilometres(double seconds) const;
     void addMotion(DriveState& state) const;
     void addAir(DriveState& state) const;
     void addTemperatures(DriveState& state) const;

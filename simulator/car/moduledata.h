@@ -155,6 +155,9 @@ struct ModuleData
     std::vector<UdsCode> udsCodes;
 };
 
+/// The least that ISO 9141-2 has for its W4.
+constexpr Time shortestAddressPause = Ms(25);
+
 /// A whole vehicle file.
 struct VehicleData
 {
@@ -162,6 +165,7 @@ struct VehicleData
     int protocol = 6;
     std::optional<double> volts; ///< fixed adapter voltage; else that of the drive
     Padding padding;
+    Time addressPause = shortestAddressPause; ///< see Vehicle::addressPause
     EngineData engine;
     std::vector<ModuleData> modules;
 };

@@ -71,8 +71,8 @@ void tell(std::vector<ModuleMessage>& messages, Module& module, bool everyone, B
 } // namespace
 
 Vehicle::Vehicle(VehicleData const& data)
-    : m_name(data.name), m_protocol(protocolOf(data)), m_padding(data.padding), m_volts(data.volts),
-      m_drive(data.engine)
+    : m_name(data.name), m_protocol(protocolOf(data)), m_padding(data.padding), m_addressPause(data.addressPause),
+      m_volts(data.volts), m_drive(data.engine)
 {
     const DataLayout layout = isCan(m_protocol) ? DataLayout::Can : DataLayout::Numbered;
     for (auto const& module : data.modules) {

@@ -31,6 +31,9 @@ public:
     /// Voltage at the diagnostic socket.
     double volts(Time now) const;
 
+    /// What it waits at the end of a 5 baud initialisation, before it returns its address inverted (W4 of ISO 9141-2).
+    Time addressPause() const { return m_addressPause; }
+
     /// Anything on the bus: the ignition is on and there is a module.
     bool isAwake() const;
 
@@ -53,6 +56,7 @@ private:
     std::string m_name;
     Protocol const& m_protocol;
     Padding m_padding;
+    Time m_addressPause;
     std::optional<double> m_volts;
     std::optional<double> m_chosenVolts;
     Drive m_drive;

@@ -43,6 +43,9 @@ VehicleData readVehicle(TableReader& table)
         vehicle.volts = table.number("volts", 0);
     }
     vehicle.padding = readPadding(table);
+    if (table.has("w4")) {
+        vehicle.addressPause = Ms(table.integer("w4", 25, 50));
+    }
     table.table("engine", [&](TableReader& engine) { vehicle.engine = readEngine(engine); });
     table.tables("module", [&](TableReader& module) { vehicle.modules.push_back(readModule(module, vehicle)); });
     return vehicle;

@@ -30,6 +30,7 @@ void printAll()
 {
     printNames("Vehicles", obdsim::simulatedVehicles());
     printNames("Adapters", obdsim::simulatedAdapters());
+    printNames("Drives", obdsim::simulatedDrives());
     printNames("Faults", obdsim::faultForms());
     printNames("Control lines", obdsim::controlForms());
 }
@@ -89,6 +90,7 @@ bool describeItself(CLI::App const& app, int argc, char const* const* argv)
                  return names({"pty", "tcp://127.0.0.1:0"});
              }},
             {"--replay", files},
+            {"--drive", [&names](std::string const& /*begun*/) { return names(obdsim::simulatedDrives()); }},
             {"--scenario", files},
             {"--write-scenario", files},
             {"--trace", files}};
@@ -112,6 +114,7 @@ int main(int argc, char** argv)
     app.add_option("--adapter", options.simulation.adapter, "A built-in adapter")->capture_default_str();
     app.add_option("--fault", options.simulation.faults, "Something that goes wrong, such as cut@120; may be repeated");
     app.add_option("--scenario", options.simulation.scenario, "Control lines with their times");
+    app.add_option("--drive", options.simulation.drive, "A built-in drive, or a CSV file (seconds,speed,...)");
     app.add_option("--write-scenario", options.written, "Write what control lines have changed as a scenario");
     app.add_option("--control", options.control, "Take control lines on this port of 127.0.0.1 (0: any free one)")
         ->check(CLI::Range(0, 65535));

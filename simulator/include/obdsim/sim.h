@@ -27,8 +27,9 @@ struct Options
 {
     std::string vehicle = "petrol-can11"; ///< one of vehicles(), or the path of a vehicle file
     std::string adapter = "elm327-v1.5";  ///< one of adapters()
-    std::vector<std::string> faults;      ///< such as "cut@120", "quirk:prompt-late", "baud=38400"
-    std::string scenario;                 ///< path of a scenario file; empty: none
+    std::vector<std::string> faults = {}; ///< such as "cut@120", "quirk:prompt-late", "baud=38400"
+    std::string scenario = {};            ///< path of a scenario file; empty: none
+    std::string drive = {};               ///< "town", "motorway", "cold-start", or a CSV file; empty: the vehicle's own
 };
 
 /// A line that the host has sent, in capitals and without blanks.

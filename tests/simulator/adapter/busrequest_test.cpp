@@ -298,4 +298,13 @@ TEST(ProtocolSearch, closedBusIsStartedAnew)
     EXPECT_EQ(host.ask("ATSI"), "BUS INIT: ...ERROR\r\r>");
 }
 
+TEST(BusRequest, moduleThatWaitsLongBeforeItsInvertedAddressOpensTheBusLater)
+{
+    Conversation quick = simulated("petrol-iso9141");
+    Conversation slow = simulated("two-iso9141");
+    EXPECT_EQ(quick.ask({"ATE0", "ATSP3", "ATSI"}), "BUS INIT: ...OK\r\r>");
+    EXPECT_EQ(slow.ask({"ATE0", "ATSP3", "ATSI"}), "BUS INIT: ...OK\r\r>");
+    EXPECT_EQ(slow.lastWait() - quick.lastWait(), obdsim::Ms(25));
+}
+
 } // namespace
