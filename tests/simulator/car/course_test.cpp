@@ -60,8 +60,8 @@ TEST(Course, columnsGoBeforeTheModel)
     Conversation talk(peer);
     talk.ask("ATE0");
     talk.ask("ATSP6");
-    EXPECT_NE(talk.ask("010D1").find("41 0D 24"), std::string::npos) << "36 km/h";
-    EXPECT_NE(talk.ask("01051").find("41 05 78"), std::string::npos) << "80 degrees";
+    EXPECT_NE(talk.ask("010D").find("41 0D 24"), std::string::npos) << "36 km/h";
+    EXPECT_NE(talk.ask("0105").find("41 05 78"), std::string::npos) << "80 degrees";
 }
 
 TEST(Course, mistakesNameFileAndLine)
