@@ -4,7 +4,6 @@
 
 #include <arpa/inet.h>
 #include <iostream>
-#include <sys/socket.h>
 #include <thread>
 #include <unistd.h>
 
@@ -12,22 +11,20 @@ struct Socket : velmora::IPort
 {
     int const link = socket(AF_INET, SOCK_STREAM, 0);
     std::thread reader;
-
-    Socket(char const* host, int port)
+    Socket(char const* host, char const* port)
     {
-        sockaddr_in const address{AF_INET, htons(static_cast<in_port_t>(port)), {inet_addr(host)}, {}};
+        sockaddr_in const address{AF_INET, htons(static_cast<in_port_t>(std::stoi(port))), {inet_addr(host)}, {}};
         if (connect(link, reinterpret_cast<sockaddr const*>(&address), sizeof(address)) != 0)
             throw velmora::Error(velmora::ErrorKind::PortFailed, "Nobody listens there");
     }
     ~Socket() override { Socket::close(), ::close(link); }
-    void start(Receiver onBytes, LossHandler onLost) override
+    void start(Receiver bytes, LossHandler lost) override { reader = std::thread(&Socket::run, this, bytes, lost); }
+    void run(Receiver const& onBytes, LossHandler const& onLost) const
     {
-        reader = std::thread([this, onBytes, onLost] {
-            char bytes[256];
-            for (ssize_t n = 0; (n = recv(link, bytes, sizeof(bytes), 0)) > 0;)
-                onBytes({bytes, static_cast<std::size_t>(n)});
-            onLost();
-        });
+        char bytes[256];
+        for (ssize_t n = 0; (n = recv(link, bytes, sizeof(bytes), 0)) > 0;)
+            onBytes({bytes, static_cast<std::size_t>(n)});
+        onLost();
     }
     void write(std::string_view bytes) override { send(link, bytes.data(), bytes.size(), MSG_NOSIGNAL); }
     void close() override { shutdown(link, SHUT_RDWR), reader.joinable() ? reader.join() : void(); }
@@ -35,9 +32,8 @@ struct Socket : velmora::IPort
 
 int main(int count, char** arguments)
 try {
-    velmora::CarOptions options;
-    options.openPort = [&] { return std::make_unique<Socket>(arguments[1], count > 2 ? std::stoi(arguments[2]) : 0); };
-    std::cout << velmora::Car(options).read({"RPM"}).front() << '\n';
+    auto const open = [=] { return std::make_unique<Socket>(arguments[count > 2], count > 2 ? arguments[2] : "0"); };
+    std::cout << velmora::Car(velmora::CarOptions{.openPort = open}).read({"RPM"}).front() << '\n';
 } catch (velmora::Error const& error) {
     return std::cerr << error << '\n', static_cast<int>(error.kind());
 }

@@ -14,9 +14,6 @@ namespace velmora {
 namespace {
 
 constexpr std::chrono::milliseconds step{100};
-constexpr std::chrono::seconds silence{3};
-constexpr std::chrono::seconds longestPause{16};
-
 // The core has one top-level object.
 std::atomic<bool> carStands{false};
 
@@ -26,26 +23,6 @@ void claim()
         throw Error(ErrorKind::WrongUse, "There is a car in this process already",
                     {"a process has one car at a time: destroy the first one, or run another process"});
     }
-}
-
-SessionOptions sessionOptions(CarOptions const& options)
-{
-    SessionOptions result;
-    result.port = options.port;
-    result.baud = options.baud;
-    if (options.protocol) {
-        if (*options.protocol < 1 || *options.protocol > 9) {
-            throw Error(ErrorKind::WrongUse, "A protocol is a number from 1 to 9");
-        }
-        result.protocol = static_cast<obd::VehicleProtocol>(*options.protocol);
-    }
-    result.reset = options.reset;
-    result.logFile = options.logFile;
-    result.traceFile = options.traceFile;
-    result.settingsFile = options.settingsFile;
-    result.onProgress = options.onProgress;
-    result.openPort = options.openPort;
-    return result;
 }
 
 } // namespace
@@ -133,32 +110,6 @@ void CarCore::run(std::promise<void>& connected)
     disconnect();
 }
 
-void CarCore::connect()
-{
-    auto session = std::make_unique<Session>(sessionOptions(m_options));
-    {
-        std::lock_guard const lock(m_mutex);
-        m_session = std::move(session);
-        if (m_stop) {
-            m_session->interrupt();
-        }
-    }
-    m_session->connect();
-    m_lastReading = Clock::now();
-}
-
-void CarCore::disconnect()
-{
-    for (std::shared_ptr<WatchState> const& watch : m_watches) {
-        watch->setPoller(nullptr);
-    }
-    std::unique_ptr<Session> session;
-    {
-        std::lock_guard const lock(m_mutex);
-        session = std::move(m_session);
-    }
-}
-
 void CarCore::wait()
 {
     auto const limit = Clock::now() + step;
@@ -222,68 +173,6 @@ void CarCore::dropEnded()
             watch->setPoller(nullptr);
         }
         return watch->ended();
-    });
-}
-
-void CarCore::superviseLink()
-{
-    if (m_watches.empty()) {
-        return; // the next call finds out
-    }
-    if (m_session == nullptr) {
-        comeBack();
-    } else if (isLinkLost()) {
-        disconnect();
-        m_nextTry = Clock::now();
-        m_pause = std::chrono::seconds(1);
-        for (std::shared_ptr<WatchState> const& watch : m_watches) {
-            watch->tell(LinkState::Lost);
-        }
-    }
-}
-
-// An adapter that has gone quiet is asked whether it is there.
-bool CarCore::isLinkLost()
-{
-    if (m_session->lost()) {
-        return true;
-    }
-    if (Clock::now() - m_lastReading < silence) {
-        return false;
-    }
-    m_lastReading = Clock::now();
-    return !m_session->proxy()->isConnected();
-}
-
-void CarCore::comeBack()
-{
-    if (Clock::now() < m_nextTry) {
-        return;
-    }
-    try {
-        connect();
-        for (std::shared_ptr<WatchState> const& watch : m_watches) {
-            startWatch(watch);
-        }
-    } catch (Error const&) {
-        disconnect();
-        m_nextTry = Clock::now() + m_pause;
-        m_pause = std::min(2 * m_pause, longestPause);
-        return;
-    }
-    for (std::shared_ptr<WatchState> const& watch : m_watches) {
-        watch->tell(LinkState::Returned);
-    }
-}
-
-void CarCore::reconnect()
-{
-    onThread([this] {
-        disconnect();
-        connect();
-        for (std::shared_ptr<WatchState> const& watch : m_watches) {
-            startWatch(watch);
-        }
     });
 }
 

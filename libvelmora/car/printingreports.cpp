@@ -1,7 +1,11 @@
+#include "libvelmora/report/clearreport.h"
 #include "libvelmora/report/codereport.h"
 #include "libvelmora/report/limittest.h"
+#include "libvelmora/report/oxygenreport.h"
 #include "libvelmora/report/readinessreport.h"
+#include "libvelmora/report/routinesreport.h"
 
+#include <velmora/actions.h>
 #include <velmora/report.h>
 
 #include <fmt/format.h>
@@ -41,6 +45,11 @@ char const* answerOf(CodeList const& list)
 {
     static constexpr char const* words[] = {"none stored", "refused", "no answer", "unreadable"};
     return words[static_cast<int>(list.answer)];
+}
+
+std::ostream& withReason(std::ostream& out, std::string const& reason)
+{
+    return reason.empty() ? out : out << ": " << reason;
 }
 
 std::string readingText(InfoReport::Reading const& reading)
@@ -132,6 +141,60 @@ std::ostream& operator<<(std::ostream& out, MonitorsReport const& report)
         }
     }
     return out;
+}
+
+std::ostream& operator<<(std::ostream& out, CountersReport const& report)
+{
+    if (report.counters.empty()) {
+        return out << report.answer;
+    }
+    Lines lines(out);
+    for (CountersReport::Counter const& counter : report.counters) {
+        lines.next() << counter.name << ": " << counter.value;
+    }
+    return out;
+}
+
+std::ostream& operator<<(std::ostream& out, OxygenReport const& report)
+{
+    if (report.sensors.empty()) {
+        return out << report.answer;
+    }
+    Lines lines(out);
+    for (OxygenSensor const& sensor : report.sensors) {
+        lines.next() << locationName(sensor.location);
+        for (LimitTest const& test : sensor.tests) {
+            lines.next() << locationName(sensor.location) << ": " << test;
+        }
+    }
+    return out;
+}
+
+std::ostream& operator<<(std::ostream& out, Routine const& routine)
+{
+    return out << routineId(routine.id) << ' ' << routine.name;
+}
+
+std::ostream& operator<<(std::ostream& out, RoutinesReport const& report)
+{
+    if (report.routines.empty()) {
+        return out << report.answer;
+    }
+    Lines lines(out);
+    for (Routine const& routine : report.routines) {
+        lines.next() << routine;
+    }
+    return out;
+}
+
+std::ostream& operator<<(std::ostream& out, RoutineRun const& run)
+{
+    return withReason(out << run.routine << ": " << resultWord(run.result), run.reason);
+}
+
+std::ostream& operator<<(std::ostream& out, ClearReport const& report)
+{
+    return withReason(out << resultWord(report.result), report.reason);
 }
 
 std::ostream& operator<<(std::ostream& out, InfoReport const& report)

@@ -1,31 +1,26 @@
 #include "libvelmora/read/routinereader.h"
 
-#include <obd/iroutineservice.h>
-#include <obd/nack.h>
+#include "libvelmora/read/topicanswer.h"
 
-#include <cctype>
+#include <obd/iroutineservice.h>
+#include <velmora/error.h>
+
+#include <fmt/format.h>
 
 namespace velmora {
 
 namespace {
 
-// The legacy buses refuse without a code; the library then gives the text of code 0, which is no reason.
-std::string reason(std::string text)
+RoutineRun::Result toResult(obd::Verdict const& verdict)
 {
-    if (text.empty() || text == obd::NackToString(obd::NackAcknowledged)) {
-        return {};
-    }
-    text.front() = static_cast<char>(std::tolower(static_cast<unsigned char>(text.front())));
-    return text;
-}
-
-RoutineRun::Result toResult(int status)
-{
-    switch (status) {
-    case obd::TestRoutineDataModel::Accepted:
+    switch (verdict.kind) {
+    case obd::OutcomeKind::Answered:
         return RoutineRun::Result::Accepted;
-    case obd::TestRoutineDataModel::Refused:
+    case obd::OutcomeKind::Refused:
+    case obd::OutcomeKind::NotOffered: // it refused what it said it has
         return RoutineRun::Result::Refused;
+    case obd::OutcomeKind::Unreadable:
+        return RoutineRun::Result::Unreadable;
     default:
         return RoutineRun::Result::NoAnswer;
     }
@@ -36,24 +31,57 @@ RoutineRun::Result toResult(int status)
 RoutinesReport readRoutines(Session& session, obd::IEcu const& ecu)
 {
     session.select(ecu);
+    auto const outcome = obd::RoutineServiceBuilder::createRoutineService()->askRoutines();
     RoutinesReport report;
-    for (auto const& routine : obd::RoutineServiceBuilder::createRoutineService()->getRoutines()) {
-        report.answer = TopicAnswer::Read;
+    // A module whose routines are all unknown offers none that can be run.
+    report.answer = outcome.kind == obd::OutcomeKind::NothingStored ? TopicAnswer::NotOffered : toAnswer(outcome);
+    for (auto const& routine : outcome.value) {
         report.routines.push_back({routine->id, routine->name, routine->description});
     }
     return report;
+}
+
+RoutineChoice findRoutine(Session& session, int id)
+{
+    for (std::shared_ptr<obd::IEcu> const& ecu : session.selectedModules()) {
+        for (Routine const& routine : readRoutines(session, *ecu).routines) {
+            if (routine.id == id) {
+                return {ecu, routine};
+            }
+        }
+    }
+    throw Error(ErrorKind::NotSupported, fmt::format("No control module offers a known routine {}", routineId(id)),
+                {"`velmora routines` lists those that can be run"});
 }
 
 RoutineRun runRoutine(Session& session, obd::IEcu const& ecu, Routine const& routine)
 {
     session.select(ecu);
     auto const outcome =
-        obd::RoutineServiceBuilder::createRoutineService()->runRoutine(static_cast<unsigned char>(routine.id));
+        obd::RoutineServiceBuilder::createRoutineService()->askRoutine(static_cast<unsigned char>(routine.id));
     session.check();
-    if (outcome == nullptr) {
-        return {routine, RoutineRun::Result::NoAnswer, {}};
+    return {routine, toResult(outcome), refusalText(outcome.code)};
+}
+
+void requireAccepted(RoutineRun const& run)
+{
+    std::string const id = routineId(run.routine.id);
+    switch (run.result) {
+    case RoutineRun::Result::Accepted:
+        return;
+    case RoutineRun::Result::Refused:
+        throw Error(
+            ErrorKind::Refused,
+            fmt::format("The vehicle refused to run routine {}{}{}", id, run.reason.empty() ? "" : ": ", run.reason),
+            {"the vehicle decides when a routine may run; its maker's documents tell the conditions"});
+    case RoutineRun::Result::Unreadable:
+        throw Error(ErrorKind::VehicleSilent, fmt::format("What the vehicle said to routine {} can't be read", id),
+                    {"it may run all the same"});
+    case RoutineRun::Result::NoAnswer:
+        break;
     }
-    return {routine, toResult(outcome->status), reason(outcome->message)};
+    throw Error(ErrorKind::VehicleSilent, fmt::format("The vehicle did not say whether it runs routine {}", id),
+                {"is the ignition still on?", "it may run all the same"});
 }
 
 } // namespace velmora

@@ -15,7 +15,11 @@ constexpr unsigned char negative = 0x7F;
 ServiceReplies::ServiceReplies(obd::IObdProxy& proxy, unsigned char service, unsigned int timeoutMs)
     : m_service(service)
 {
-    proxy.execute(std::vector<unsigned char>{service}, m_responses, timeoutMs);
+    obd::AdapterNote note{};
+    auto const status = proxy.executeNoted(std::vector<unsigned char>{service}, m_responses, timeoutMs, note);
+    if (status == obd::IDevice::Status::Unparsed || note != obd::AdapterNote::None) {
+        m_others = ServiceReply::Kind::Unreadable;
+    }
 }
 
 ServiceReplies::ServiceReplies(unsigned char service, obd::ResponseMap responses)
@@ -26,7 +30,7 @@ ServiceReply ServiceReplies::of(unsigned int ecu) const
 {
     auto const found = m_responses.find(ecu);
     if (found == m_responses.end() || found->second.empty()) {
-        return {};
+        return {m_others, {}, {}};
     }
     std::vector<unsigned char> const& bytes = found->second;
     if (bytes[0] == m_service + 0x40) {
@@ -35,7 +39,7 @@ ServiceReply ServiceReplies::of(unsigned int ecu) const
     if (bytes[0] == negative && bytes.size() >= 3 && bytes[1] == m_service) {
         return {ServiceReply::Kind::Refused, bytes, refusalText(bytes[2])};
     }
-    return {ServiceReply::Kind::Foreign, bytes, {}};
+    return {ServiceReply::Kind::Unreadable, bytes, {}};
 }
 
 std::vector<unsigned int> ServiceReplies::answering() const

@@ -16,7 +16,7 @@ struct ServiceReply
         Positive,
         Refused, // a negative reply
         Silent,
-        Foreign, // a reply to something else
+        Unreadable, // a reply to something else, or one that came damaged
     };
 
     Kind kind = Kind::Silent;
@@ -39,6 +39,7 @@ public:
 private:
     unsigned char m_service;
     obd::ResponseMap m_responses;
+    ServiceReply::Kind m_others = ServiceReply::Kind::Silent; // of those that no reply could be read of
 };
 
 } // namespace velmora

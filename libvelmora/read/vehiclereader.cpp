@@ -15,23 +15,6 @@ namespace velmora {
 
 namespace {
 
-ProtocolReport readProtocol(Session& session)
-{
-    ProtocolReport report{std::nullopt, readable(session.adapter()->getProtocolDescription())};
-    if (auto const protocol = session.proxy()->vehicleProtocol(); protocol != obd::VehicleProtocol::Automatic) {
-        report.number = static_cast<int>(protocol);
-    }
-    return report;
-}
-
-AdapterReport readAdapter(Session& session)
-{
-    std::shared_ptr<obd::IAdapter> const adapter = session.adapter();
-    float const volts = session.proxy()->batteryVoltage();
-    return {readable(adapter->device()), readable(adapter->description()), readable(adapter->identification()),
-            volts > 0.0F ? std::optional(volts) : std::nullopt};
-}
-
 std::vector<unsigned int> sensorsOf(obd::IEcu const& ecu)
 {
     std::vector<unsigned int> sensors;
@@ -73,6 +56,23 @@ void giveMeanings(VehicleReport& report, std::string const& named)
 }
 
 } // namespace
+
+ProtocolReport readProtocol(Session& session)
+{
+    ProtocolReport report{std::nullopt, readable(session.adapter()->getProtocolDescription())};
+    if (auto const protocol = session.proxy()->vehicleProtocol(); protocol != obd::VehicleProtocol::Automatic) {
+        report.number = static_cast<int>(protocol);
+    }
+    return report;
+}
+
+AdapterReport readAdapter(Session& session)
+{
+    std::shared_ptr<obd::IAdapter> const adapter = session.adapter();
+    float const volts = session.proxy()->batteryVoltage();
+    return {readable(adapter->device()), readable(adapter->description()), readable(adapter->identification()),
+            volts > 0.0F ? std::optional(volts) : std::nullopt};
+}
 
 VehicleReport readVehicle(Session& session, std::string const& maker)
 {

@@ -10,4 +10,9 @@ namespace velmora {
 // maker: the one whose meanings the codes are given, or empty for that of the vehicle identification number.
 VehicleReport readVehicle(Session& session, std::string const& maker = {});
 
+// What the adapter says of itself, with the supply voltage that it measures.
+AdapterReport readAdapter(Session& session);
+// The bus that the vehicle was found on, as the opening found it.
+ProtocolReport readProtocol(Session& session);
+
 } // namespace velmora

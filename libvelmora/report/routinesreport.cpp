@@ -20,7 +20,7 @@ std::string routineId(int id)
 
 char const* resultWord(RoutineRun::Result result)
 {
-    static constexpr char const* words[] = {"accepted", "refused", "no answer"};
+    static constexpr char const* words[] = {"accepted", "refused", "no answer", "unreadable"};
     return words[static_cast<int>(result)];
 }
 

@@ -1,24 +1,19 @@
-#include "libvelmora/read/servicereplies.h"
-#include "libvelmora/report/json.h"
+#include "libvelmora/read/codeclearing.h"
+#include "libvelmora/report/clearreport.h"
 #include "program/command/commands.h"
 #include "program/command/commandsession.h"
 #include "program/command/confirm.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
+#include "program/view/printtext.h"
 
 #include <velmora/error.h>
 
 #include <fmt/format.h>
 
-#include <set>
-
 namespace velmora::cli {
 
 namespace {
-
-constexpr unsigned char clearService = 0x04;
-// Some modules write their memory before they answer.
-constexpr unsigned int clearLimitMs = 5000;
 
 constexpr char const* clearWarning =
     R"(This clears the confirmed and pending trouble codes of all control modules and turns the lamp off.
@@ -26,19 +21,6 @@ It also erases: freeze frames, readiness (the vehicle must be driven before it c
 test), monitor test results, and the distance and time since codes were cleared.
 Permanent codes stay. Note codes and freeze frame down first if they may be needed.
 )";
-
-struct ModuleOutcome
-{
-    unsigned int id;
-    std::string name;
-    ServiceReply reply;
-};
-
-char const* resultWord(ServiceReply::Kind kind)
-{
-    static constexpr char const* words[] = {"cleared", "refused", "no answer", "the reply can't be read"};
-    return words[static_cast<int>(kind)];
-}
 
 // Clearing is functional: the request reaches every module, whichever one is selected.
 void checkOptions(GlobalOptions const& options)
@@ -50,68 +32,21 @@ void checkOptions(GlobalOptions const& options)
     requireConsent(options, "Clearing", "clears without asking");
 }
 
-// The library's own clearing tells of the current module alone, and not why it failed; asking again to learn of the
-// others would clear twice.
-std::vector<ModuleOutcome> clearCodes(Session& session)
+std::string toText(ModuleTopic<ClearReport> const& module)
 {
-    ServiceReplies const replies(*session.proxy(), clearService, clearLimitMs);
-    session.check();
-    obd::IEcuManager& modules = *session.obd().getEcuManager();
-    std::vector<unsigned int> known;
-    modules.getEcuIds(known);
-    std::set<unsigned int> ids(known.begin(), known.end());
-    for (unsigned int const id : replies.answering()) {
-        ids.insert(id);
-    }
-    std::vector<ModuleOutcome> outcomes;
-    for (unsigned int const id : ids) {
-        outcomes.push_back({id, modules.getEcuName(id), replies.of(id)});
-    }
-    for (std::shared_ptr<obd::IEcu> const& ecu : modules.getEcus()) {
-        if (replies.of(ecu->id()).kind == ServiceReply::Kind::Positive) {
-            ecu->resetFreezeFrameConfiguration(); // the module has erased what the library knows of them
+    return fmt::format("Control module {:X}{}{}: {}{}{}\n", module.id, module.name.empty() ? "" : " ", module.name,
+                       resultWord(module.report.result), module.report.reason.empty() ? "" : ": ",
+                       module.report.reason);
+}
+
+ExitCode judge(std::vector<ModuleTopic<ClearReport>> const& modules)
+{
+    for (ModuleTopic<ClearReport> const& module : modules) {
+        if (module.report.result == ClearReport::Result::Refused) {
+            throw refusedToClear(module);
         }
     }
-    return outcomes;
-}
-
-void printOutcomes(std::vector<ModuleOutcome> const& outcomes)
-{
-    for (ModuleOutcome const& outcome : outcomes) {
-        fmt::print("Control module {:X}{}{}: {}{}{}\n", outcome.id, outcome.name.empty() ? "" : " ", outcome.name,
-                   resultWord(outcome.reply.kind), outcome.reply.reason.empty() ? "" : ": ", outcome.reply.reason);
-    }
-}
-
-void printJson(std::vector<ModuleOutcome> const& outcomes)
-{
-    Json list = Json::array();
-    for (ModuleOutcome const& outcome : outcomes) {
-        list.push_back({{"id", fmt::format("{:X}", outcome.id)},
-                        {"name", textOrNull(outcome.name)},
-                        {"cleared", outcome.reply.kind == ServiceReply::Kind::Positive},
-                        {"result", resultWord(outcome.reply.kind)},
-                        {"reason", textOrNull(outcome.reply.reason)}});
-    }
-    fmt::print("{}", printed(list));
-}
-
-ExitCode judge(std::vector<ModuleOutcome> const& outcomes)
-{
-    bool cleared = false;
-    for (ModuleOutcome const& outcome : outcomes) {
-        if (outcome.reply.kind == ServiceReply::Kind::Refused) {
-            throw Error(
-                ErrorKind::Refused,
-                fmt::format("Control module {:X} refused to clear its codes: {}", outcome.id, outcome.reply.reason),
-                {"most modules clear only with the ignition on and the engine off"});
-        }
-        cleared = cleared || outcome.reply.kind == ServiceReply::Kind::Positive;
-    }
-    if (!cleared) {
-        throw Error(ErrorKind::VehicleSilent, "No control module confirmed that it cleared its codes",
-                    {"is the ignition still on?", "`velmora codes` tells what is stored now"});
-    }
+    requireCleared(modules);
     return ExitCode::Done;
 }
 
@@ -124,14 +59,16 @@ ExitCode clear(GlobalOptions const& options)
         tell("Nothing was cleared.\n");
         return ExitCode::Failed;
     }
-    std::vector<ModuleOutcome> const outcomes = clearCodes(session);
+    auto const modules = clearCodes(session);
     if (options.json) {
-        printJson(outcomes);
+        fmt::print("{}", toJson(modules));
     } else {
-        printOutcomes(outcomes);
+        for (ModuleTopic<ClearReport> const& module : modules) {
+            printText(toText(module));
+        }
     }
     flushOutput();
-    return judge(outcomes);
+    return judge(modules);
 }
 
 } // namespace

@@ -1,7 +1,7 @@
 #pragma once
 
+#include "libvelmora/read/modulereader.h"
 #include "libvelmora/report/moduletopic.h"
-#include "libvelmora/text/text.h"
 #include "program/command/commandsession.h"
 #include "program/exitcode.h"
 #include "program/terminal/output.h"
@@ -19,19 +19,6 @@
 // The common shape of the commands that show one topic of every control module.
 
 namespace velmora::cli {
-
-// read: a Report of a Session and one of its modules, which it selects as the current one.
-template <typename Read>
-auto readModules(Session& session, Read const& read)
-{
-    using Report = std::invoke_result_t<Read const&, Session&, obd::IEcu const&>;
-    std::vector<ModuleTopic<Report>> modules;
-    for (std::shared_ptr<obd::IEcu> const& ecu : session.selectedModules()) {
-        modules.push_back({ecu->id(), readable(ecu->name()), read(session, *ecu)});
-        session.check();
-    }
-    return modules;
-}
 
 template <typename Report>
 void print(std::vector<ModuleTopic<Report>> const& modules, GlobalOptions const& options)
@@ -57,9 +44,10 @@ void requireAnswer(std::vector<ModuleTopic<Report>> const& modules, Error const&
     }
     if constexpr (HasTopicAnswer<Report>) {
         if (any([](Report const& report) { return report.answer == TopicAnswer::Silent; })) {
-            throw Error(ErrorKind::VehicleSilent, "The vehicle offers this, but did not answer",
-                        {"is the ignition still on?", "some vehicles answer only with the engine running, or only "
-                                                      "with it off"});
+            throw Error(ErrorKind::VehicleSilent, "The vehicle did not answer this",
+                        {"is the ignition still on?",
+                         "some vehicles answer only with the engine running, or only with it off",
+                         "a control module that does not offer it may stay silent, too"});
         }
     }
     throw notOffered;

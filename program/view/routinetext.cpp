@@ -7,7 +7,7 @@ namespace {
 
 Mark mark(RoutineRun::Result result)
 {
-    static constexpr Mark marks[] = {Mark::Good, Mark::Bad, Mark::Warning};
+    static constexpr Mark marks[] = {Mark::Good, Mark::Bad, Mark::Warning, Mark::Warning};
     return marks[static_cast<int>(result)];
 }
 

@@ -110,7 +110,7 @@ TEST(Diagnostics, RoutineThatIsRefusedIsExitCodeSevenWithItsReason)
 {
     Outcome const run = runVelmora({"-q", "-y", "-p", "sim:petrol-can11?instant", "routines", "--run", "02"});
     EXPECT_EQ(run.exitCode, 7) << run.err;
-    EXPECT_TRUE(holds(run.out, "Result         refused: conditions not correct\n")) << run.out;
+    EXPECT_TRUE(holds(run.out, "Result         refused: conditions not correct (22)\n")) << run.out;
     EXPECT_TRUE(holds(run.err, "refused to run routine 02: conditions not correct")) << run.err;
 }
 

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <obd/unitsystem.h>
+#include <velmora/actions.h>
 #include <velmora/error.h>
 #include <velmora/export.h>
 #include <velmora/iport.h>
@@ -22,21 +24,27 @@ class CarCore;
 class WatchState;
 
 /// How a car is to be reached. What stays empty comes from the settings file, or is the default.
+///
+///     velmora::Car car(velmora::CarOptions{.port = "/dev/ttyUSB0", .protocol = 6});
 struct CarOptions
 {
-    std::string port;                 ///< as the program's --port takes it: "192.168.0.10:35000", "sim:petrol-can11"
-    std::optional<unsigned int> baud; ///< line rate of a serial port
-    std::optional<int> protocol;      ///< the adapter's number of the bus, 1 to 9; searched for if empty
-    bool reset = false;               ///< restore and reset the adapter before use
-    std::string logFile;
-    std::string traceFile;    ///< gets the traffic with the adapter
-    std::string settingsFile; ///< velmora/settings.toml in the user's configuration folder if empty
+    std::string port = {}; ///< as the program's --port takes it: "192.168.0.10:35000", "sim:petrol-can11"
+    std::optional<unsigned int> baud = {}; ///< line rate of a serial port
+    std::optional<int> protocol = {};      ///< the adapter's number of the bus, 1 to 9; searched for if empty
+    std::optional<obd::UnitSystem> units = {};
+    std::optional<unsigned int> module = {}; ///< id of the one control module to ask; all of them if empty
+    bool reset = false;                      ///< restore and reset the adapter before use
+    bool sleep = false;                      ///< send the adapter to sleep at the end, which costs the next visit time
+    bool forget = false;                     ///< drop what earlier visits have learnt of adapters and vehicles
+    std::string logFile = {};
+    std::string traceFile = {};    ///< gets the traffic with the adapter
+    std::string settingsFile = {}; ///< velmora/settings.toml in the user's configuration folder if empty
 
     /// What the car is at while it connects and reads, as lines with their line feeds. On the car's thread.
-    std::function<void(std::string const&)> onProgress;
+    std::function<void(std::string const&)> onProgress = {};
     /// Opens a transport of the application's own in place of `port`; throws Error if it can't. Called for each
     /// connection, on the car's thread.
-    std::function<std::unique_ptr<IPort>()> openPort;
+    std::function<std::unique_ptr<IPort>()> openPort = {};
 };
 
 /// A control module that answers.
@@ -88,6 +96,12 @@ private:
 /// Works on a thread of its own, on which all callbacks are called, one at a time. The functions wait for it and may be
 /// called from any thread but that one: from a callback they throw Error. They all throw Error if the link is lost.
 /// Sensors are named as the program takes them: "RPM", "0C", "coolant", "7E9:RPM", all of a module by "all".
+///
+///     velmora::Car car("192.168.0.10:35000"); // or "auto", "/dev/ttyUSB0", "sim:petrol-can11", "replay:file"
+///     for (auto const& reading : car.read({"RPM", "COOLANT_TEMP"})) std::cout << reading << '\n';
+///     for (auto const& code : car.codes()) std::cout << code << '\n';
+///     auto const watch = car.watch({"RPM"}, [](velmora::Reading const& reading) { std::cout << reading << '\n'; });
+///     std::cout << car.report().toJson();
 class VELMORA_EXPORT Car
 {
 public:
@@ -117,12 +131,32 @@ public:
     /// Of all control modules, the newest frame as a rule being 0.
     std::vector<ModuleTopic<FreezeReport>> freezeFrame(unsigned char frame = 0);
     std::vector<ModuleTopic<ReadinessReport>> readiness();
+    /// The results of on-board tests. Asks once for each monitor, which takes seconds.
     std::vector<ModuleTopic<MonitorsReport>> monitors();
+    /// The oxygen sensors, on legacy buses with their tests.
+    std::vector<ModuleTopic<OxygenReport>> oxygen();
+    std::vector<ModuleTopic<CountersReport>> counters();
     std::vector<ModuleTopic<InfoReport>> info();
     std::vector<Module> modules();
     std::vector<Sensor> sensors();
+    /// Measures the supply voltage, too.
+    AdapterReport adapter();
+    ProtocolReport protocol();
     /// All of the above but readings. Takes seconds.
     VehicleReport report();
+
+    /// Clears the confirmed and pending codes of all control modules, whichever CarOptions::module names, and turns the
+    /// lamp off. Also erases freeze frames, readiness, test results, and the distance and time since the last clearing:
+    /// the vehicle must be driven before it can pass an emissions test. Asks nothing back. Gives what each module said;
+    /// throws Error if none cleared its codes: Refused if one refused, else VehicleSilent.
+    std::vector<ModuleTopic<ClearReport>> clearCodes();
+
+    /// The on-board test routines that can be run.
+    std::vector<ModuleTopic<RoutinesReport>> routines();
+    /// Runs a routine on the first control module that offers it. It acts on the vehicle, which should be parked with
+    /// nobody near moving or hot parts. Asks nothing back. Throws Error if no module offers it, or if the module
+    /// refuses or does not say that it runs it.
+    ModuleTopic<RoutineRun> runRoutine(int id);
 
     /// Connects anew after a loss.
     void reconnect();

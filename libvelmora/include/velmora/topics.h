@@ -174,6 +174,10 @@ VELMORA_EXPORT std::ostream& operator<<(std::ostream& out, MonitorsReport const&
 VELMORA_EXPORT std::ostream& operator<<(std::ostream& out, FreezeReport const& report);
 /// A line for each text that was told.
 VELMORA_EXPORT std::ostream& operator<<(std::ostream& out, InfoReport const& report);
+/// A line for each counter, or why there are none.
+VELMORA_EXPORT std::ostream& operator<<(std::ostream& out, CountersReport const& report);
+/// A line for each sensor and for each test of it, or why there are none.
+VELMORA_EXPORT std::ostream& operator<<(std::ostream& out, OxygenReport const& report);
 /// Lamp and codes, a line each.
 VELMORA_EXPORT std::ostream& operator<<(std::ostream& out, CodeReport const& report);
 

@@ -99,7 +99,6 @@ std::unique_ptr<Car> CarTest::shared;
 
 TEST_F(CarTest, GivesAllThatACarTells)
 {
-
     auto const modules = car.modules();
     ASSERT_EQ(modules.size(), 2U);
     EXPECT_EQ(printed(modules[0]), "7E8 ECM");
@@ -130,7 +129,37 @@ TEST_F(CarTest, GivesAllThatACarTells)
     ASSERT_NE(rpm, sensors.end());
     EXPECT_EQ(rpm->pid, "010C");
 
+    EXPECT_EQ(car.counters()[0].report.counters.at(0).value, 412U);
+    EXPECT_TRUE(car.oxygen()[0].report.onCan);
+    EXPECT_GT(car.adapter().volts.value_or(0.0F), 11.0F);
+    EXPECT_EQ(car.protocol().number, 6);
+
     EXPECT_NE(car.report().toJson().find("\"P0171\""), std::string::npos);
+}
+
+TEST_F(CarTest, PrintsTopics)
+{
+    EXPECT_EQ(printed(car.routines()[0]).substr(0, 39), "7E8 ECM\n01 Evaporative system leak test");
+    EXPECT_NE(printed(car.counters()[0]).find(": 412\n"), std::string::npos);
+    EXPECT_NE(printed(car.oxygen()[0]).find("Bank 1 sensor 1"), std::string::npos);
+    EXPECT_EQ(printed(velmora::OxygenReport()), "not supported");
+    EXPECT_EQ(printed(velmora::RoutinesReport{velmora::TopicAnswer::Silent, {}}), "no answer");
+}
+
+TEST_F(CarTest, RunsARoutineOrSaysWhyNot)
+{
+    EXPECT_EQ(printed(car.runRoutine(1)), "7E8 ECM\n01 Evaporative system leak test: accepted");
+    auto const kind = [this](int id) {
+        try {
+            car.runRoutine(id);
+        } catch (Error const& error) {
+            return error.kind();
+        }
+        return ErrorKind::Failed;
+    };
+    EXPECT_EQ(kind(2), ErrorKind::Refused);
+    EXPECT_EQ(kind(3), ErrorKind::NotSupported);
+    EXPECT_EQ(kind(500), ErrorKind::NotSupported);
 }
 
 TEST_F(CarTest, SaysWhatIsWrongWithSensors)
@@ -181,6 +210,28 @@ TEST(CarLife, AFailedOneLeavesRoomForTheNext)
             EXPECT_NE(std::string(error.what()).find("no-such-vehicle"), std::string::npos) << error;
         }
     }
+}
+
+TEST(CarLife, ClearsCodesOfAllModules)
+{
+    Car car(simulated("petrol-can11"));
+    auto const cleared = car.clearCodes();
+    ASSERT_EQ(cleared.size(), 2U);
+    EXPECT_EQ(printed(cleared[0]), "7E8 ECM\ncleared");
+    for (velmora::StoredCode const& code : car.codes()) {
+        EXPECT_EQ(code.kind, velmora::CodeKind::Permanent) << code;
+    }
+}
+
+TEST(CarLife, KeepsToOneModuleAndToTheUnitsOfItsOptions)
+{
+    CarOptions options = simulated("petrol-can11");
+    options.module = 0x7E9;
+    options.units = obd::UnitSystem::Imperial;
+    Car car(options);
+    ASSERT_EQ(car.modules().size(), 1U);
+    EXPECT_EQ(car.modules()[0].id, 0x7E9U);
+    EXPECT_EQ(car.read({"COOLANT_TEMP"})[0].unit, "°F");
 }
 
 TEST_F(CarTest, WatchCallsOnOneThreadOfItsOwnUntilItEnds)

@@ -1,6 +1,7 @@
 #include "libvelmora/read/codereader.h"
 #include "libvelmora/read/servicereplies.h"
 #include "libvelmora/read/topicanswer.h"
+#include "tests/support/fakeproxy.h"
 
 #include <gtest/gtest.h>
 
@@ -21,12 +22,25 @@ TEST(ServiceReplies, TellsWhatEachModuleSaid)
     EXPECT_EQ(replies.of(0x7E8).kind, Kind::Positive);
     EXPECT_EQ(replies.of(0x7E9).kind, Kind::Refused);
     EXPECT_EQ(replies.of(0x7E9).reason, "conditions not correct (22)");
-    EXPECT_EQ(replies.of(0x7EA).kind, Kind::Foreign);
+    EXPECT_EQ(replies.of(0x7EA).kind, Kind::Unreadable);
     EXPECT_EQ(replies.of(0x7EB).kind, Kind::Silent);
     EXPECT_EQ(replies.of(0x7EC).reason, "response code 31");
-    EXPECT_EQ(replies.of(0x7ED).kind, Kind::Foreign);
+    EXPECT_EQ(replies.of(0x7ED).kind, Kind::Unreadable);
     EXPECT_EQ(replies.of(0x7E0).kind, Kind::Silent);
     EXPECT_EQ(replies.answering().size(), 6U);
+}
+
+TEST(ServiceReplies, OfALostReplyAreNoSilence)
+{
+    support::FakeProxy proxy;
+    auto const kind = [&proxy] { return ServiceReplies(proxy, 0x04, 100).of(0x7E8).kind; };
+    EXPECT_EQ(kind(), Kind::Silent);
+    proxy.note("04", obd::AdapterNote::ReplyLost);
+    EXPECT_EQ(kind(), Kind::Unreadable);
+    proxy.fail("04", obd::IDevice::Status::Unparsed);
+    EXPECT_EQ(kind(), Kind::Unreadable);
+    proxy.answer("04", "44");
+    EXPECT_EQ(kind(), Kind::Positive);
 }
 
 TEST(TopicAnswers, KeepSilenceRefusalAndUnreadableApart)

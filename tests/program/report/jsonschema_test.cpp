@@ -1,5 +1,6 @@
 // What --json prints, against docs/json.schema.json; and that the schema can refuse.
 
+#include "libvelmora/report/clearreport.h"
 #include "libvelmora/report/codereport.h"
 #include "libvelmora/report/countersreport.h"
 #include "libvelmora/report/freezereport.h"
@@ -88,8 +89,11 @@ TEST(JsonSchema, HoldsForInformationAndRoutines)
     Routine const routine{1, "A", "B"};
     expectValid(document(RoutinesReport{TopicAnswer::Read, {routine}}, RoutinesReport()), "routines");
     expectValid(document(RoutineRun{routine, RoutineRun::Result::Refused, "busy"},
-                         RoutineRun{routine, RoutineRun::Result::NoAnswer, {}}),
+                         RoutineRun{routine, RoutineRun::Result::Unreadable, {}}),
                 "routinesRun");
+    expectValid(
+        document(ClearReport{ClearReport::Result::Cleared, {}}, ClearReport{ClearReport::Result::Unreadable, "busy"}),
+        "clear");
 }
 
 TEST(JsonSchema, HoldsForAScan)

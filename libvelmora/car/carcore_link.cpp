@@ -1,0 +1,105 @@
+// The link of a car: connecting, finding out that it is lost, and coming back.
+
+#include "libvelmora/car/carcore.h"
+#include "libvelmora/car/caroptions.h"
+
+#include <algorithm>
+
+namespace velmora {
+
+namespace {
+
+constexpr std::chrono::seconds silence{3};
+constexpr std::chrono::seconds longestPause{16};
+
+} // namespace
+
+void CarCore::connect()
+{
+    auto session = std::make_unique<Session>(sessionOptions(m_options));
+    {
+        std::lock_guard const lock(m_mutex);
+        m_session = std::move(session);
+        if (m_stop) {
+            m_session->interrupt();
+        }
+    }
+    m_session->connect();
+    m_lastReading = Clock::now();
+}
+
+void CarCore::disconnect()
+{
+    for (std::shared_ptr<WatchState> const& watch : m_watches) {
+        watch->setPoller(nullptr);
+    }
+    std::unique_ptr<Session> session;
+    {
+        std::lock_guard const lock(m_mutex);
+        session = std::move(m_session);
+    }
+}
+
+void CarCore::superviseLink()
+{
+    if (m_watches.empty()) {
+        return; // the next call finds out
+    }
+    if (m_session == nullptr) {
+        comeBack();
+    } else if (isLinkLost()) {
+        disconnect();
+        m_nextTry = Clock::now();
+        m_pause = std::chrono::seconds(1);
+        for (std::shared_ptr<WatchState> const& watch : m_watches) {
+            watch->tell(LinkState::Lost);
+        }
+    }
+}
+
+// An adapter that has gone quiet is asked whether it is there.
+bool CarCore::isLinkLost()
+{
+    if (m_session->lost()) {
+        return true;
+    }
+    if (Clock::now() - m_lastReading < silence) {
+        return false;
+    }
+    m_lastReading = Clock::now();
+    return !m_session->proxy()->isConnected();
+}
+
+void CarCore::comeBack()
+{
+    if (Clock::now() < m_nextTry) {
+        return;
+    }
+    try {
+        connect();
+        for (std::shared_ptr<WatchState> const& watch : m_watches) {
+            startWatch(watch);
+        }
+    } catch (Error const&) {
+        disconnect();
+        m_nextTry = Clock::now() + m_pause;
+        m_pause = std::min(2 * m_pause, longestPause);
+        return;
+    }
+    for (std::shared_ptr<WatchState> const& watch : m_watches) {
+        watch->tell(LinkState::Returned);
+    }
+}
+
+void CarCore::reconnect()
+{
+    onThread([this] {
+        disconnect();
+        connect();
+        for (std::shared_ptr<WatchState> const& watch : m_watches) {
+            startWatch(watch);
+        }
+    });
+}
+
+} // namespace velmora

@@ -1,0 +1,31 @@
+#include "libvelmora/car/caroptions.h"
+
+#include <velmora/error.h>
+
+namespace velmora {
+
+SessionOptions sessionOptions(CarOptions const& options)
+{
+    SessionOptions result;
+    result.port = options.port;
+    result.baud = options.baud;
+    if (options.protocol) {
+        if (*options.protocol < 1 || *options.protocol > 9) {
+            throw Error(ErrorKind::WrongUse, "A protocol is a number from 1 to 9");
+        }
+        result.protocol = static_cast<obd::VehicleProtocol>(*options.protocol);
+    }
+    result.units = options.units;
+    result.ecu = options.module;
+    result.reset = options.reset;
+    result.sleep = options.sleep;
+    result.forget = options.forget;
+    result.logFile = options.logFile;
+    result.traceFile = options.traceFile;
+    result.settingsFile = options.settingsFile;
+    result.onProgress = options.onProgress;
+    result.openPort = options.openPort;
+    return result;
+}
+
+} // namespace velmora

@@ -1,0 +1,12 @@
+#pragma once
+
+#include "libvelmora/session/sessionoptions.h"
+
+#include <velmora/car.h>
+
+namespace velmora {
+
+// What a car's session is to use. Throws Error for what makes no sense.
+SessionOptions sessionOptions(CarOptions const& options);
+
+} // namespace velmora

@@ -1,0 +1,70 @@
+#pragma once
+
+#include <velmora/export.h>
+#include <velmora/topics.h>
+
+#include <iosfwd>
+#include <string>
+#include <vector>
+
+/// What a tool may make a vehicle do.
+
+namespace velmora {
+
+/// An on-board test routine of service 08.
+struct Routine
+{
+    int id; ///< 0 to 255
+    std::string name;
+    std::string description;
+};
+
+/// The routines of one control module that can be run: those that it offers and that are known here. What another one
+/// does, nobody can be warned of.
+struct RoutinesReport
+{
+    TopicAnswer answer = TopicAnswer::NotOffered;
+    std::vector<Routine> routines;
+};
+
+/// What a control module said when it was asked to run a routine.
+struct RoutineRun
+{
+    enum class Result
+    {
+        Accepted,
+        Refused,
+        NoAnswer,   ///< it may run all the same
+        Unreadable, ///< it answered in a form that can't be decoded
+    };
+
+    Routine routine;
+    Result result;
+    std::string reason; ///< of a refusal, such as "conditions not correct (22)"; empty if the module gave none
+};
+
+/// What a control module said when it was asked to clear its trouble codes.
+struct ClearReport
+{
+    enum class Result
+    {
+        Cleared,
+        Refused,
+        NoAnswer,
+        Unreadable, ///< it answered in a form that can't be decoded
+    };
+
+    Result result;
+    std::string reason; ///< of a refusal
+};
+
+/// "01 Evaporative system leak test"
+VELMORA_EXPORT std::ostream& operator<<(std::ostream& out, Routine const& routine);
+/// A line for each routine, or why there are none.
+VELMORA_EXPORT std::ostream& operator<<(std::ostream& out, RoutinesReport const& report);
+/// "01 Evaporative system leak test: refused: conditions not correct (22)"
+VELMORA_EXPORT std::ostream& operator<<(std::ostream& out, RoutineRun const& run);
+/// "cleared", or "refused: conditions not correct (22)"
+VELMORA_EXPORT std::ostream& operator<<(std::ostream& out, ClearReport const& report);
+
+} // namespace velmora
