@@ -31,6 +31,7 @@ test_packages+=(python3-jsonschema pkgconf)
 test_packages+=(python3-pytest python3-venv python3-pip mypy)
 test_packages+=(man-db bash-completion zsh fish)                            # what manual and completion are read by
 test_packages+=(prometheus systemd mosquitto mosquitto-clients nats-server) # what outputs speak to
+test_packages+=(openssl postgresql python3-paho-mqtt python3-psycopg)           # what fleets are made of
 test_packages+=(chromium poppler-utils default-jre-headless)                # what reads reports and pages
 test_packages+=(python3-dbusmock)                                           # plays the Bluetooth service
 # Some have a newer Node with an npm of its own, which Debian's package would collide with.
