@@ -227,7 +227,11 @@ class Fleet:
 
     def is_drained(self):
         self.supervise()
-        return all(self.waiting(path.stem) == 0 for path in self.folder.glob("*.spool"))
+        return not self.left()
+
+    def left(self):
+        counts = {path.stem: self.waiting(path.stem) for path in self.folder.glob("*.spool")}
+        return {name: count for name, count in sorted(counts.items()) if count > 0}
 
     # The count
 
@@ -312,7 +316,11 @@ def run(arguments, folder):
         say("all have ended; what was under way is sent by watches without a car")
         for name in fleet.cars():
             fleet.start_car(name, "tcp://127.0.0.1:1")
-        wait_for("empty spools", fleet.is_drained, 120)
+        try:
+            wait_for("empty spools", fleet.is_drained, 120)
+        except RuntimeError:
+            say("readings that wait: " + ", ".join(f"{name} {count}" for name, count in fleet.left().items()))
+            raise
         fleet.end(fleet.cars())
         return fleet.judge()
     finally:

@@ -142,10 +142,15 @@ void BrokerLink::attempt()
 void BrokerLink::follow(mosquitto* client)
 {
     auto const limit = std::chrono::steady_clock::now() + answerLimit;
+    m_again = false;
     while (!m_stop) {
         int const result = ::mosquitto_loop(client, loopMillis, 1);
         if (result != MOSQ_ERR_SUCCESS) {
             fail(::mosquitto_strerror(result));
+            return;
+        }
+        if (m_again) {
+            fail("nothing that was sent is confirmed");
             return;
         }
         std::lock_guard const lock(m_mutex);

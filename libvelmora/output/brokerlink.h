@@ -52,6 +52,8 @@ public:
     // The number by which the delivery will be told; nothing without a connection. Any thread.
     std::optional<int> publish(std::string const& topic, std::string const& payload, int qos, bool retain);
     void subscribe(std::string const& topic, int qos);
+    // Gives the connection up for a new one. Any thread.
+    void reconnect() { m_again = true; }
     // Whether libmosquitto still has bytes to write.
     bool isBusy();
     // Ends the thread, which may be waiting for a name to be resolved.
@@ -74,6 +76,7 @@ private:
     Listener& m_listener;
     std::thread m_thread;
     std::atomic<bool> m_stop{false};
+    std::atomic<bool> m_again{false};
     bool m_oldProtocol = false; // the link's thread alone, as are the next two
     bool m_atOnce = false;      // no pause before the next attempt
     std::string m_why;

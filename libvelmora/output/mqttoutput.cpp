@@ -114,14 +114,15 @@ void MqttOutput::onUp()
     tellOnce("connected");
     m_sender->onUp(steadyNow());
     if (!m_settings.ackTopic.empty()) {
-        m_link->subscribe(m_settings.ackTopic, 1);
+        // A mark that gets lost is followed by the next; QoS 1 would cost a cluster a queue for each car.
+        m_link->subscribe(m_settings.ackTopic, 0);
     }
     if (m_settings.discovery != Discovery::Off) {
         m_link->subscribe(homeAssistantStatus, 0);
     }
     publishRetained(m_settings.place.statusTopic, "online");
     publishDiscovery();
-    m_sender->pump(steadyNow());
+    m_sender->pump();
 }
 
 void MqttOutput::onDown(std::string const& why)
@@ -164,7 +165,10 @@ void MqttOutput::write(Records records)
         takeForHome(*record);
     }
     publishState();
-    m_sender->pump(steadyNow());
+    if (m_sender->isStuck(steadyNow())) {
+        m_link->reconnect();
+    }
+    m_sender->pump();
 }
 
 // Times are repaired before they are sent and never after: a consumer may know a reading by its time, too.

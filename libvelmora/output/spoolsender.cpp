@@ -14,6 +14,8 @@ constexpr std::size_t readingsInBatch = 1000;
 constexpr std::size_t bytesInBatch = 100000; // what all brokers take
 constexpr std::size_t batchesUnderWay = 20;
 constexpr std::chrono::seconds stuckAfter{30};
+constexpr std::chrono::seconds longestPatience{
+    1000}; // for a consumer that is away: what is sent again waits there twice
 
 // Rows of one kind of time, and no more than a message may hold.
 void cutBatch(std::vector<Spool::Row>& rows)
@@ -34,7 +36,7 @@ void cutBatch(std::vector<Spool::Row>& rows)
 
 SpoolSender::SpoolSender(Spool& spool, std::string vehicle, bool waitsForMark, Publish publish, Tell tell)
     : m_spool(spool), m_vehicle(std::move(vehicle)), m_waitsForMark(waitsForMark), m_publish(std::move(publish)),
-      m_tell(std::move(tell))
+      m_tell(std::move(tell)), m_patience(stuckAfter)
 {}
 
 void SpoolSender::onUp(Time now)
@@ -72,9 +74,10 @@ void SpoolSender::onDelivered(int message, Time now)
         m_ended.erase(m_ended.begin());
     }
     if (!m_waitsForMark && whole > 0) {
+        onProgress(now);
         keep(whole);
     }
-    pump(now);
+    pump();
 }
 
 void SpoolSender::onRefused(int message)
@@ -92,11 +95,11 @@ void SpoolSender::onMark(std::int64_t seq, Time now)
         return;
     }
     if (seq > m_stored) {
-        m_progress = now;
+        onProgress(now);
         keep(seq);
         m_sent = std::max(m_sent, m_stored);
     }
-    pump(now);
+    pump();
 }
 
 // What could not be forgotten is sent again one day, and known by its number.
@@ -110,23 +113,33 @@ void SpoolSender::keep(std::int64_t seq)
     }
 }
 
-// A consumer that reports nothing for long has lost what was sent, or the broker has.
-void SpoolSender::resendIfStuck(Time now)
+void SpoolSender::onProgress(Time now)
 {
-    if (!m_waitsForMark || m_sent == m_stored) {
-        m_progress = now;
-    } else if (m_flights.empty() && now - m_progress >= stuckAfter) {
-        m_progress = now;
-        startAgain();
-    }
+    m_progress = now;
+    m_patience = stuckAfter;
 }
 
-void SpoolSender::pump(Time now)
+// Messages, their acknowledgements and marks get lost when nodes of a cluster do.
+bool SpoolSender::isStuck(Time now)
+{
+    bool const waits = m_up && (m_waitsForMark ? m_sent > m_stored : isUnderway());
+    if (!waits) {
+        m_progress = now;
+        return false;
+    }
+    if (now - m_progress < m_patience) {
+        return false;
+    }
+    m_progress = now;
+    m_patience = std::min(2 * m_patience, longestPatience);
+    return true;
+}
+
+void SpoolSender::pump()
 {
     if (!m_up) {
         return;
     }
-    resendIfStuck(now);
     try {
         while (m_flights.size() < batchesUnderWay && sendBatch()) {
         }

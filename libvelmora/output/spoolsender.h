@@ -32,7 +32,11 @@ public:
     // The consumer has stored all up to that number.
     void onMark(std::int64_t seq, Time now);
     // Sends what there is. Call it often.
-    void pump(Time now);
+    void pump();
+
+    // Whether nothing was heard of what was sent for so long that the connection is worth a new one. Once: then it has
+    // more patience than before, until something moves.
+    bool isStuck(Time now);
 
     bool isUp() const { return m_up; }
     bool isUnderway() const { return !m_flights.empty(); }
@@ -41,7 +45,7 @@ private:
     bool sendBatch();
     void keep(std::int64_t seq);
     void startAgain();
-    void resendIfStuck(Time now);
+    void onProgress(Time now);
 
     Spool& m_spool;
     std::string const m_vehicle;
@@ -54,6 +58,7 @@ private:
     std::map<int, std::int64_t> m_flights; // message, last number in it
     std::map<std::int64_t, bool> m_ended;  // last number of each batch under way, and whether it was delivered
     Time m_progress;
+    std::chrono::seconds m_patience;
 };
 
 } // namespace velmora

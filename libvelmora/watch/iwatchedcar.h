@@ -25,6 +25,9 @@ public:
     virtual std::vector<ModuleInfo> modules() = 0;
     virtual SensorList sensors() = 0;
 
+    // Of the vehicle that was brought up last; empty if it tells none.
+    virtual std::string vin() const = 0;
+
     // Begins and ends to read the sensors.
     virtual void startAsking() = 0;
     virtual void stopAsking() = 0;
@@ -38,6 +41,10 @@ public:
     virtual std::optional<double> volts() = 0;
     // One request to the vehicle.
     virtual bool probe() = 0;
+    // Lets go of the vehicle and sends the adapter to sleep. False if that knows no sleep.
+    virtual bool startNap() = 0;
+    // Whether the adapter has woken up by itself.
+    virtual bool napIsOver() = 0;
     // How many requests went to control modules, and how many brought no answer.
     virtual std::uint64_t requests() const = 0;
     virtual std::uint64_t errors() const = 0;

@@ -2,11 +2,11 @@
 
 #include "libvelmora/poll/poller.h"
 #include "libvelmora/session/session.h"
+#include "libvelmora/watch/adapternap.h"
 #include "libvelmora/watch/iwatchedcar.h"
+#include "libvelmora/watch/requestcount.h"
 
-#include <obd/idataconnection.h>
-
-#include <atomic>
+#include <condition_variable>
 #include <mutex>
 
 namespace velmora {
@@ -21,7 +21,7 @@ struct SessionCarOptions
 };
 
 // The car behind a port: a session of the library while it is awake, the bare port while it sleeps.
-class SessionCar : public IWatchedCar, private obd::IConnectionLogger
+class SessionCar : public IWatchedCar
 {
 public:
     explicit SessionCar(SessionCarOptions options) : m_options(std::move(options)) {}
@@ -38,8 +38,11 @@ public:
     void check() override;
     std::optional<double> volts() override;
     bool probe() override;
-    std::uint64_t requests() const override { return m_requests; }
-    std::uint64_t errors() const override { return m_errors; }
+    std::string vin() const override { return m_vin; }
+    bool startNap() override;
+    bool napIsOver() override;
+    std::uint64_t requests() const override { return m_count.requests(); }
+    std::uint64_t errors() const override { return m_count.errors(); }
 
     // Dispatches what the library asks for until the time has come or interrupt was called.
     void wait(std::chrono::milliseconds time);
@@ -47,10 +50,7 @@ public:
     void interrupt();
 
 private:
-    void chooseSources();
-    std::vector<PollSource> sourcesFor(std::string const& wish, bool required);
-    void onDataSent(std::vector<unsigned char> const& data) override;
-    void onDataReceived(std::vector<unsigned char> const& data) override;
+    std::unique_ptr<IPort> openBarePort() const;
 
     SessionCarOptions const m_options;
     std::mutex m_mutex;
@@ -61,8 +61,9 @@ private:
     std::vector<Reading> m_readings; // protected by m_mutex
     std::vector<PollSource> m_sources;
     std::unique_ptr<Poller> m_poller;
-    std::atomic<std::uint64_t> m_requests{0};
-    std::atomic<std::uint64_t> m_errors{0};
+    std::unique_ptr<AdapterNap> m_nap;
+    std::string m_vin;
+    RequestCount m_count;
 };
 
 } // namespace velmora

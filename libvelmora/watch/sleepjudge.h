@@ -18,6 +18,7 @@ struct BatterySettings
     double wakeChange = 0.2;                       // V between two looks
     std::optional<std::chrono::minutes> wakeEvery; // one request that often while parked
     bool electric = false;                         // hybrid or electric: an engine that stands says nothing
+    bool adapterSleep = false;                     // while parked, in place of looks at the voltage
     std::chrono::minutes stillLimit{30};           // a running voltage without movement counts no longer
 };
 

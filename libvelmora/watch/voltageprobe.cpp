@@ -1,52 +1,14 @@
 #include "libvelmora/watch/voltageprobe.h"
 
-#include <velmora/error.h>
+#include "libvelmora/watch/portinbox.h"
 
 #include <algorithm>
 #include <charconv>
-#include <condition_variable>
-#include <mutex>
 #include <string>
 
 namespace velmora {
 
 namespace {
-
-// What came from a port, for the thread that waits for it.
-class Inbox
-{
-public:
-    void add(std::string_view bytes)
-    {
-        std::lock_guard const lock(m_mutex);
-        m_text += bytes;
-        m_wake.notify_one();
-    }
-    void lose()
-    {
-        std::lock_guard const lock(m_mutex);
-        m_lost = true;
-        m_wake.notify_one();
-    }
-    // All up to the prompt; what there is when the time runs out.
-    std::string takeUntilPrompt(std::chrono::steady_clock::time_point limit)
-    {
-        std::unique_lock lock(m_mutex);
-        m_wake.wait_until(lock, limit, [this] { return m_lost || m_text.find('>') != std::string::npos; });
-        if (m_lost) {
-            throw Error(ErrorKind::LinkLost, "The link to the adapter broke");
-        }
-        std::string text = m_text.substr(0, m_text.find('>'));
-        m_text.erase(0, std::min(m_text.size(), text.size() + 1));
-        return text;
-    }
-
-private:
-    std::mutex m_mutex;
-    std::condition_variable m_wake;
-    std::string m_text;  // protected by m_mutex
-    bool m_lost = false; // protected by m_mutex
-};
 
 constexpr std::chrono::milliseconds wakeTime{500};
 
@@ -72,7 +34,7 @@ std::optional<double> findVolts(std::string_view text)
 
 std::optional<double> probeVoltage(std::unique_ptr<IPort> port, std::chrono::milliseconds limit)
 {
-    Inbox inbox;
+    PortInbox inbox;
     auto const end = std::chrono::steady_clock::now() + limit;
     port->start([&inbox](std::string_view bytes) { inbox.add(bytes); }, [&inbox] { inbox.lose(); });
     struct Closer

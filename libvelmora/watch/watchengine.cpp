@@ -28,6 +28,9 @@ void WatchEngine::tell(std::string const& kind, std::string const& text, WatchTi
 
 std::chrono::milliseconds WatchEngine::step(WatchTime const& now)
 {
+    if (m_metStranger) {
+        return restingStep;
+    }
     // Without a link nobody knows whether the car still runs.
     if (m_connected || m_judge.state() != SleepJudge::State::Asking) {
         m_judge.onTime(now.steady);
@@ -63,6 +66,11 @@ void WatchEngine::connect(WatchTime const& now)
         m_trouble = error.what();
         m_car.disconnect();
         m_judge.sleep(now.steady);
+        return;
+    }
+    if (m_rules.isStranger(m_car.vin())) {
+        m_metStranger = true;
+        m_car.disconnect();
         return;
     }
     m_connected = true;
@@ -102,6 +110,7 @@ void WatchEngine::onLost(Error const& error, WatchTime const& now)
     m_trouble = error.what();
     m_asking = false;
     m_connected = false;
+    m_napping = false;
     m_car.disconnect();
     m_nextAttempt = now.steady + m_backoff.next();
     m_state = "no link";
@@ -218,7 +227,24 @@ void WatchEngine::stopAsking(WatchTime const& now)
 
 void WatchEngine::park(WatchTime const& now)
 {
-    m_state = m_judge.state() == SleepJudge::State::Settling ? "settling" : "parked";
+    bool const settling = m_judge.state() == SleepJudge::State::Settling;
+    m_state = settling ? "settling" : "parked";
+    if (settling) {
+        return;
+    }
+    if (m_rules.battery.adapterSleep && !m_sleepless) {
+        nap(now);
+    } else {
+        lookAtVoltage(now);
+    }
+    followJudge(now);
+    if (m_judge.state() == SleepJudge::State::Asking) {
+        tell("awake", "The car seems to wake up", now);
+    }
+}
+
+void WatchEngine::lookAtVoltage(WatchTime const& now)
+{
     if (m_judge.wantsVolts(now.steady)) {
         std::optional<double> const volts = m_car.volts();
         onLinkBack(now);
@@ -228,9 +254,21 @@ void WatchEngine::park(WatchTime const& now)
         ++m_probes;
         m_judge.onProbe(m_car.probe(), now.steady);
     }
-    followJudge(now);
-    if (m_judge.state() == SleepJudge::State::Asking) {
-        tell("awake", "The car seems to wake up", now);
+}
+
+// An adapter that sleeps tells no voltage; one that does not know how to goes on telling it.
+void WatchEngine::nap(WatchTime const& now)
+{
+    if (!m_napping) {
+        m_connected = false;
+        m_napping = m_car.startNap();
+        m_sleepless = !m_napping;
+        onLinkBack(now);
+        m_napping ? tell("adapter_asleep", "The adapter sleeps until its own triggers wake it", now)
+                  : tell("adapter_awake", "The adapter knows no sleep: it is asked for the voltage", now);
+    } else if (m_car.napIsOver()) {
+        m_napping = false;
+        m_judge.wake(now.steady);
     }
 }
 

@@ -23,7 +23,9 @@ struct WatchRules
     std::chrono::minutes codesEvery{10};
     std::chrono::seconds silence{10};   // without a reading while asking: the link is looked at
     std::chrono::seconds silentCar{60}; // without a reading while asking: the car sleeps
-    unsigned int seed = 1;              // of the jitter of pauses
+    // Whether a vehicle identification number is that of another vehicle than the one to be watched.
+    std::function<bool(std::string const& vin)> isStranger = [](std::string const& /*vin*/) { return false; };
+    unsigned int seed = 1; // of the jitter of pauses
 };
 
 // The watch without its clock and its loop: connects, asks, judges, tells. Call step as often as it says.
@@ -43,6 +45,8 @@ public:
     // Without the outputs.
     Health health() const;
     std::string const& state() const { return m_state; }
+    // Whether another vehicle than the one to be watched was found; nothing is done from then on.
+    bool metStranger() const { return m_metStranger; }
     // Why there is no link, or no vehicle; empty while both are there.
     std::string const& trouble() const { return m_trouble; }
 
@@ -54,6 +58,8 @@ private:
     void work(WatchTime const& now);
     void ask(WatchTime const& now);
     void park(WatchTime const& now);
+    void lookAtVoltage(WatchTime const& now);
+    void nap(WatchTime const& now);
     void take(Reading const& reading, WatchTime const& now);
     void watchSilence(WatchTime const& now);
     void lookAtCodes(WatchTime const& now);
@@ -75,7 +81,10 @@ private:
     bool m_connected = false; // adapter and vehicle were brought up
     bool m_asking = false;
     bool m_everConnected = false;
-    bool m_lost = false; // after a link that stood
+    bool m_metStranger = false;
+    bool m_napping = false;
+    bool m_sleepless = false; // the adapter knows no sleep
+    bool m_lost = false;      // after a link that stood
     bool m_ignition = false;
     bool m_running = false;
     bool m_lowTold = false;

@@ -1,16 +1,15 @@
 #include "libvelmora/watch/watchsettings.h"
 
 #include "libvelmora/poll/sensorwish.h"
+#include "libvelmora/watch/settingstable.h"
 
 #include <velmora/error.h>
 
 #include <fmt/format.h>
-#include <toml++/toml.h>
 
 #include <algorithm>
 #include <charconv>
 #include <fstream>
-#include <functional>
 #include <iterator>
 
 namespace velmora {
@@ -18,137 +17,69 @@ namespace velmora {
 namespace {
 
 constexpr double lowestVolts = 6.0;
-constexpr double highestVolts = 16.0;
 
-// Reads the file's tables and takes down what is wrong with them, so that all is told at once.
-class SettingsReader
+// The file's keys.
+class WatchSettingsReader
 {
 public:
-    explicit SettingsReader(std::string name) : m_name(std::move(name)) {}
+    explicit WatchSettingsReader(std::string const& file) : m_table(file) {}
 
     WatchSettings read(toml::table const& root);
-    std::vector<std::string> const& mistakes() const { return m_mistakes; }
+    std::vector<std::string> const& mistakes() const { return m_table.mistakes(); }
 
 private:
-    using Taker = std::function<void(toml::node const&, std::string const&)>;
+    using Taker = SettingsTable::Taker;
 
-    void readTable(toml::table const& table, std::string const& prefix, std::map<std::string, Taker> const& keys);
+    void readOutputs(toml::node const& node, std::string const& key);
     void readOutput(toml::node const& node);
     void readSensors(toml::node const& node);
-    void mistake(toml::node const& node, std::string const& key, std::string const& what);
+    void readBattery(toml::node const& node, std::string const& key);
+    void readVehicle(toml::node const& node, std::string const& key);
+    void readVin(toml::node const& node, std::string const& key);
+    void readWake(toml::node const& node, std::string const& key);
+    Taker by(void (WatchSettingsReader::*way)(toml::node const&, std::string const&));
 
-    template <typename T>
-    Taker into(T& target, char const* expected);
-    template <typename Duration>
-    Taker duration(Duration& target);
-    Taker volts(double& target, double lowest);
-    Taker vehicle();
-    Taker vin();
-    Taker wake();
-
-    std::string const m_name;
-    std::vector<std::string> m_mistakes;
+    SettingsTable m_table;
     WatchSettings m_settings;
 };
 
-void SettingsReader::mistake(toml::node const& node, std::string const& key, std::string const& what)
+WatchSettingsReader::Taker WatchSettingsReader::by(void (WatchSettingsReader::*way)(toml::node const&,
+                                                                                    std::string const&))
 {
-    m_mistakes.push_back(fmt::format("{}:{}: {}: {}", m_name, node.source().begin.line, key, what));
+    return [this, way](toml::node const& node, std::string const& key) { (this->*way)(node, key); };
 }
 
-void SettingsReader::readTable(toml::table const& table, std::string const& prefix,
-                               std::map<std::string, Taker> const& keys)
+void WatchSettingsReader::readVehicle(toml::node const& node, std::string const& key)
 {
-    for (auto const& [key, node] : table) {
-        std::string const name(key.str());
-        auto const found = keys.find(name);
-        if (found != keys.end()) {
-            found->second(node, prefix + name);
-            continue;
-        }
-        std::string list;
-        for (auto const& [known, taker] : keys) {
-            list += (list.empty() ? "" : ", ") + known;
-        }
-        mistake(node, prefix + name, "is not known here; " + list + " are");
+    std::string const name = node.value_exact<std::string>().value_or("");
+    if (isVehicleName(name)) {
+        m_settings.vehicle = name;
+    } else {
+        m_table.mistake(node, key, "must be a name of letters, digits, - and _");
     }
 }
 
-template <typename T>
-SettingsReader::Taker SettingsReader::into(T& target, char const* expected)
+void WatchSettingsReader::readVin(toml::node const& node, std::string const& key)
 {
-    return [this, &target, expected](toml::node const& node, std::string const& key) {
-        if (std::optional<T> const value = node.value_exact<T>()) {
-            target = *value;
-        } else {
-            mistake(node, key, std::string("must be ") + expected);
-        }
-    };
+    std::string const text = node.value_exact<std::string>().value_or("");
+    if (text != "none" && text != "full") {
+        m_table.mistake(node, key, "must be \"none\" or \"full\"");
+    }
+    m_settings.fullVin = text == "full";
 }
 
-template <typename Duration>
-SettingsReader::Taker SettingsReader::duration(Duration& target)
+void WatchSettingsReader::readWake(toml::node const& node, std::string const& key)
 {
-    return [this, &target](toml::node const& node, std::string const& key) {
-        auto const value = parseDuration(node.value_exact<std::string>().value_or(""));
-        if (value && std::chrono::floor<Duration>(*value).count() > 0) {
-            target = std::chrono::floor<Duration>(*value);
-        } else {
-            mistake(node, key, "must be a time in quotes, such as \"90s\" or \"10min\"");
-        }
-    };
+    if (!parseWake(node.value_exact<std::string>().value_or(""), m_settings.battery)) {
+        m_table.mistake(node, key, "must be \"voltage\" or such as \"every 30min\"");
+    }
 }
 
-SettingsReader::Taker SettingsReader::volts(double& target, double lowest)
-{
-    return [this, &target, lowest](toml::node const& node, std::string const& key) {
-        std::optional<double> const value = node.value<double>();
-        if (value && *value >= lowest && *value <= highestVolts) {
-            target = *value;
-        } else {
-            mistake(node, key,
-                    fmt::format("must be a number of volts from {} to {}, of a 12 V system", lowest, highestVolts));
-        }
-    };
-}
-
-SettingsReader::Taker SettingsReader::vehicle()
-{
-    return [this](toml::node const& node, std::string const& key) {
-        std::string const name = node.value_exact<std::string>().value_or("");
-        if (isVehicleName(name)) {
-            m_settings.vehicle = name;
-        } else {
-            mistake(node, key, "must be a name of letters, digits, - and _");
-        }
-    };
-}
-
-SettingsReader::Taker SettingsReader::vin()
-{
-    return [this](toml::node const& node, std::string const& key) {
-        std::string const text = node.value_exact<std::string>().value_or("");
-        if (text != "none" && text != "full") {
-            mistake(node, key, "must be \"none\" or \"full\"");
-        }
-        m_settings.fullVin = text == "full";
-    };
-}
-
-SettingsReader::Taker SettingsReader::wake()
-{
-    return [this](toml::node const& node, std::string const& key) {
-        if (!parseWake(node.value_exact<std::string>().value_or(""), m_settings.battery)) {
-            mistake(node, key, "must be \"voltage\" or such as \"every 30min\"");
-        }
-    };
-}
-
-void SettingsReader::readSensors(toml::node const& node)
+void WatchSettingsReader::readSensors(toml::node const& node)
 {
     toml::array const* const list = node.as_array();
     if (list == nullptr) {
-        mistake(node, "sensors", "must be a list of texts, such as [\"RPM\", \"SPEED@10hz\"]");
+        m_table.mistake(node, "sensors", "must be a list of texts, such as [\"RPM\", \"SPEED@10hz\"]");
         return;
     }
     for (toml::node const& each : *list) {
@@ -157,18 +88,18 @@ void SettingsReader::readSensors(toml::node const& node)
             parseSensorWish(text);
             m_settings.sensors.push_back(text);
         } catch (Error const& error) {
-            mistake(each, "sensors", error.what());
+            m_table.mistake(each, "sensors", error.what());
         }
     }
 }
 
 // "to" is the address; the other keys are its settings.
-void SettingsReader::readOutput(toml::node const& node)
+void WatchSettingsReader::readOutput(toml::node const& node)
 {
     toml::table const* const table = node.as_table();
     std::optional<std::string> const to = table == nullptr ? std::nullopt : (*table)["to"].value_exact<std::string>();
     if (!to) {
-        mistake(node, "output.to", "is missing: where the output goes, such as \"csv:drive.csv\"");
+        m_table.mistake(node, "output.to", "is missing: where the output goes, such as \"csv:drive.csv\"");
         return;
     }
     try {
@@ -181,54 +112,62 @@ void SettingsReader::readOutput(toml::node const& node)
                 continue;
             }
             if (!text && !number) {
-                mistake(value, "output." + name, "must be a text or a whole number");
+                m_table.mistake(value, "output." + name, "must be a text or a whole number");
                 continue;
             }
             addOption(address, name, number ? std::to_string(*number) : *text);
         }
         m_settings.outputs.push_back(std::move(address));
     } catch (Error const& error) {
-        mistake(*table, "output", error.what());
+        m_table.mistake(*table, "output", error.what());
     }
 }
 
-WatchSettings SettingsReader::read(toml::table const& root)
+void WatchSettingsReader::readOutputs(toml::node const& node, std::string const& key)
 {
+    toml::array const* const list = node.as_array();
+    if (list == nullptr) {
+        m_table.mistake(node, key, "must be written as [[output]]");
+        return;
+    }
+    std::ranges::for_each(*list, [this](toml::node const& each) { readOutput(each); });
+}
+
+void WatchSettingsReader::readBattery(toml::node const& node, std::string const& key)
+{
+    toml::table const* const table = node.as_table();
+    if (table == nullptr) {
+        m_table.mistake(node, key, "must be a table: [battery]");
+        return;
+    }
     BatterySettings& battery = m_settings.battery;
-    std::map<std::string, Taker> const batteryKeys = {
-        {"stop_after", duration(battery.stopAfter)},
-        {"settle", duration(battery.settle)},
-        {"voltage_every", duration(battery.voltageEvery)},
-        {"running_volts", volts(battery.runningVolts, lowestVolts)},
-        {"low_volts", volts(battery.lowVolts, lowestVolts)},
-        {"wake_change", volts(battery.wakeChange, 0.1)},
-        {"still_limit", duration(battery.stillLimit)},
-        {"electric", into(battery.electric, "true or false")},
-        {"wake", wake()},
-    };
-    readTable(root, "",
-              {{"port", into(m_settings.port, "a text")},
-               {"vehicle", vehicle()},
-               {"vin", vin()},
-               {"fast", into(m_settings.fast, "true or false")},
-               {"codes_every", duration(m_settings.codesEvery)},
-               {"sensors", [this](toml::node const& node, std::string const&) { readSensors(node); }},
-               {"output",
-                [this](toml::node const& node, std::string const& key) {
-                    toml::array const* const list = node.as_array();
-                    if (list == nullptr) {
-                        mistake(node, key, "must be written as [[output]]");
-                        return;
-                    }
-                    std::ranges::for_each(*list, [this](toml::node const& each) { readOutput(each); });
-                }},
-               {"battery", [&](toml::node const& node, std::string const& key) {
-                    if (toml::table const* const table = node.as_table()) {
-                        readTable(*table, "battery.", batteryKeys);
-                    } else {
-                        mistake(node, key, "must be a table: [battery]");
-                    }
-                }}});
+    m_table.read(*table, key + ".",
+                 {{"stop_after", m_table.duration(battery.stopAfter)},
+                  {"settle", m_table.duration(battery.settle)},
+                  {"voltage_every", m_table.duration(battery.voltageEvery)},
+                  {"running_volts", m_table.volts(battery.runningVolts, lowestVolts)},
+                  {"low_volts", m_table.volts(battery.lowVolts, lowestVolts)},
+                  {"wake_change", m_table.volts(battery.wakeChange, 0.1)},
+                  {"still_limit", m_table.duration(battery.stillLimit)},
+                  {"electric", m_table.into(battery.electric, "true or false")},
+                  {"adapter_sleep", m_table.into(battery.adapterSleep, "true or false")},
+                  {"wake", by(&WatchSettingsReader::readWake)}});
+    if (battery.adapterSleep && battery.wakeEvery) {
+        m_table.mistake(*table, "battery.adapter_sleep", "a request would wake the adapter: choose this or wake");
+    }
+}
+
+WatchSettings WatchSettingsReader::read(toml::table const& root)
+{
+    m_table.read(root, "",
+                 {{"port", m_table.into(m_settings.port, "a text")},
+                  {"vehicle", by(&WatchSettingsReader::readVehicle)},
+                  {"vin", by(&WatchSettingsReader::readVin)},
+                  {"fast", m_table.into(m_settings.fast, "true or false")},
+                  {"codes_every", m_table.duration(m_settings.codesEvery)},
+                  {"sensors", [this](toml::node const& node, std::string const&) { readSensors(node); }},
+                  {"output", by(&WatchSettingsReader::readOutputs)},
+                  {"battery", by(&WatchSettingsReader::readBattery)}});
     return m_settings;
 }
 
@@ -236,7 +175,7 @@ WatchSettings SettingsReader::read(toml::table const& root)
 
 WatchSettings parseWatchSettings(std::string_view text, std::string const& name)
 {
-    SettingsReader reader(name);
+    WatchSettingsReader reader(name);
     WatchSettings settings;
     try {
         settings = reader.read(toml::parse(text));

@@ -1,11 +1,14 @@
 #include "libvelmora/poll/sensorwish.h"
 #include "program/command/commands.h"
+#include "program/command/lastresort.h"
 #include "program/command/watchrun.h"
 #include "program/commandline.h"
 #include "program/terminal/interrupt.h"
 #include "program/terminal/output.h"
 
 #include <velmora/error.h>
+
+#include <unistd.h>
 
 namespace velmora::cli {
 
@@ -67,6 +70,8 @@ WatchSettings settingsOf(WatchOptions const& chosen)
     return settings;
 }
 
+constexpr std::chrono::milliseconds patience{700}; // with the car, before the outputs are ended without it
+
 // A run, and what signals do to it.
 class WatchCommand
 {
@@ -74,7 +79,10 @@ public:
     WatchCommand(GlobalOptions const& global, WatchOptions const& chosen)
         : m_global(global), m_chosen(chosen), m_settings(settingsOf(chosen))
     {
-        Interrupt::instance().setHandler([this] { end(); });
+        Interrupt::instance().setHandler([this] {
+            end();
+            m_lastResort.arm(patience, [this] { giveUp(); });
+        });
         Interrupt::instance().setHangUpHandler([this] {
             m_reload = true;
             end();
@@ -103,18 +111,21 @@ public:
 private:
     void runOnce()
     {
-        WatchRun run(m_global, m_settings, m_notify);
+        auto run = std::make_unique<WatchRun>(m_global, m_settings, m_notify);
+        WatchRun& now = *run;
         {
             std::lock_guard const lock(m_mutex);
-            m_run = &run;
+            m_run = std::move(run);
         }
-        if (!Interrupt::instance().raised() && !m_reload) {
-            try {
-                run.run();
-            } catch (...) {
-                forget();
-                throw;
+        try {
+            if (!Interrupt::instance().raised() && !m_reload) {
+                now.run();
             }
+            now.finish();
+        } catch (...) {
+            now.finish();
+            forget();
+            throw;
         }
         forget();
     }
@@ -122,7 +133,7 @@ private:
     void forget()
     {
         std::lock_guard const lock(m_mutex);
-        m_run = nullptr;
+        m_run.reset();
     }
 
     void end()
@@ -130,6 +141,16 @@ private:
         std::lock_guard const lock(m_mutex);
         if (m_run != nullptr) {
             m_run->end();
+        }
+    }
+
+    // What hangs in the operating system, such as the way to an adapter that is out of reach, hears no signal.
+    void giveUp()
+    {
+        std::lock_guard const lock(m_mutex);
+        if (m_run == nullptr || m_run->endOutputs()) {
+            m_notify.tell("STOPPING=1");
+            ::_exit(static_cast<int>(ExitCode::Done));
         }
     }
 
@@ -151,7 +172,8 @@ private:
     ServiceNotify m_notify;
     std::atomic<bool> m_reload{false};
     std::mutex m_mutex;
-    WatchRun* m_run = nullptr; // protected by m_mutex
+    std::unique_ptr<WatchRun> m_run; // protected by m_mutex
+    LastResort m_lastResort;
 };
 
 ExitCode watch(GlobalOptions const& global, WatchOptions const& chosen)

@@ -12,12 +12,13 @@
 #include <algorithm>
 #include <charconv>
 #include <random>
+#include <utility>
 
 namespace velmora::cli {
 
 namespace {
 
-constexpr std::chrono::milliseconds endLimit{1300}; // for all outputs: a service manager's patience is short
+constexpr std::chrono::milliseconds endLimit{1200}; // for all outputs: a service manager's patience is short
 
 WatchTime timeNow()
 {
@@ -48,7 +49,7 @@ SessionCarOptions carOptions(GlobalOptions const& options, WatchSettings const& 
 
 std::string vehicleName(WatchSettings const& settings)
 {
-    return settings.vehicle.empty() ? keptVehicleName(stateFolder()) : settings.vehicle;
+    return settings.vehicle.empty() ? VehicleNames(stateFolder()).last() : settings.vehicle;
 }
 
 OutputLimits limitsOf(OutputAddress const& address)
@@ -76,6 +77,11 @@ WatchRules rulesOf(WatchSettings const& settings, std::string const& vehicle)
     rules.battery = settings.battery;
     rules.codesEvery = settings.codesEvery;
     rules.seed = std::random_device()();
+    if (settings.vehicle.empty()) {
+        rules.isStranger = [vehicle](std::string const& vin) {
+            return !vin.empty() && VehicleNames(stateFolder()).of(vin) != vehicle;
+        };
+    }
     return rules;
 }
 
@@ -115,12 +121,28 @@ void WatchRun::addOutputs(WatchSettings const& settings)
 
 WatchRun::~WatchRun()
 {
+    finish();
+}
+
+void WatchRun::finish()
+{
+    if (std::exchange(m_finished, true)) {
+        return;
+    }
     if (m_engine != nullptr) {
         try {
             m_engine->finish(timeNow());
         } catch (std::exception const& error) {
             say(error.what());
         }
+    }
+    endOutputs();
+}
+
+bool WatchRun::endOutputs()
+{
+    if (m_outputsEnded.exchange(true)) {
+        return false;
     }
     for (std::unique_ptr<OutputRunner> const& each : m_outputs) {
         each->beginStop();
@@ -133,6 +155,7 @@ WatchRun::~WatchRun()
             say(each->name() + ": hangs, and is not waited for");
         }
     }
+    return true;
 }
 
 void WatchRun::end()
@@ -158,6 +181,10 @@ void WatchRun::run()
         takeHealth();
         tellState();
         m_notify.alive(std::chrono::steady_clock::now());
+        if (m_engine->metStranger()) {
+            say("another vehicle answers: its values get a name of their own");
+            return;
+        }
         m_car.wait(pause);
     }
 }

@@ -18,15 +18,20 @@ class WatchRun
 public:
     // Opens the outputs. Throws Error for settings that make no sense.
     WatchRun(GlobalOptions const& options, WatchSettings const& settings, ServiceNotify& notify);
-    // Ends the trip under way and flushes the outputs.
     ~WatchRun();
     WatchRun(WatchRun const&) = delete;
     WatchRun& operator=(WatchRun const&) = delete;
 
-    // Until end is called. Throws Error for what trying again can't mend.
+    // Until end is called, or another vehicle than the one that the outputs are named after answers. Throws Error for
+    // what trying again can't mend.
     void run();
     // Any thread.
     void end();
+    // Ends the trip under way and flushes the outputs.
+    void finish();
+    // The last part of it: flushes the outputs, and waits only for those that don't hang. Any thread, at most one that
+    // does it: false for the others.
+    bool endOutputs();
 
 private:
     struct HealthBoard
@@ -50,6 +55,8 @@ private:
     std::unique_ptr<WatchEngine> m_engine;
     std::string m_toldState;
     std::atomic<bool> m_end{false};
+    std::atomic<bool> m_outputsEnded{false};
+    bool m_finished = false;
 };
 
 } // namespace velmora::cli

@@ -1,7 +1,7 @@
 """ending.py PROGRAM CASE: ends a watch in an unkind moment. Prints what went wrong; exits 0 if nothing did.
 
 name: a name server that never answers holds the way to the broker. pipe: nobody reads what an output writes. twice: the
-same, and a second signal comes."""
+same, and a second signal comes. adapter: the way to it is being built up, and nobody answers."""
 
 import fcntl
 import os
@@ -17,8 +17,8 @@ LIMIT = 2.0  # seconds that an end may take
 SMALL_PIPE = 4096
 
 
-def start(program, folder, output, stdout):
-    command = [program, "watch", "--port", "sim:petrol-can11?instant", "--output", output,
+def start(program, folder, output, stdout, port="sim:petrol-can11?instant"):
+    command = [program, "watch", "--port", port, "--output", output,
                "--settings", folder + "/settings"]
     return subprocess.Popen(command, stdout=stdout, stderr=subprocess.DEVNULL,
                             env=dict(os.environ, STATE_DIRECTORY=folder))
@@ -67,6 +67,21 @@ def name(program, folder):
     check(f"ended with {code} after {seconds:.1f} s", code == 0 and seconds < LIMIT)
 
 
+def adapter(program, folder):
+    with socket.socket() as deaf, socket.socket() as first, socket.socket() as second:
+        deaf.bind(("127.0.0.1", 0))
+        deaf.listen(0)
+        for caller in (first, second):  # its queue is full from now on
+            caller.setblocking(False)
+            caller.connect_ex(deaf.getsockname())
+        time.sleep(0.2)
+        place = "127.0.0.1:%d" % deaf.getsockname()[1]
+        watch = start(program, folder, "csv:" + folder + "/a.csv", subprocess.DEVNULL, "tcp://" + place)
+        time.sleep(2.0)
+        code, seconds = end(watch)
+        check(f"ended with {code} after {seconds:.1f} s", code == 0 and seconds < LIMIT)
+
+
 def pipe(program, folder, twice=False):
     reading, writing = os.pipe()
     fcntl.fcntl(writing, fcntl.F_SETPIPE_SZ, SMALL_PIPE)
@@ -98,6 +113,8 @@ def main():
             sys.exit(in_own_network([program, "inner"], folder))
         if case == "inner":
             name(program, folder)
+        elif case == "adapter":
+            adapter(program, folder)
         else:
             pipe(program, folder, case == "twice")
 

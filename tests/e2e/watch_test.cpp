@@ -95,6 +95,34 @@ TEST(Watch, RunsAsAServiceWritesAndEndsWithinTwoSecondsWithAllOnTheDisk)
     EXPECT_EQ(trips["trips"][0]["kind"], "engine run");
 }
 
+// Reads from a vehicle until it is known by which name, and tells that.
+std::string nameOf(std::string const& vehicle)
+{
+    ChildProcess watch({"watch", "--port", "sim:" + vehicle + "?instant", "--output", "ndjson:-", "--quiet"});
+    std::string name;
+    for (std::string line = watch.readLine(); name.empty() && !line.empty(); line = watch.readLine()) {
+        if (line.find("\"sensor\"") != std::string::npos) {
+            name = nlohmann::json::parse(line)["vehicle"];
+        }
+    }
+    watch.interrupt();
+    EXPECT_EQ(watch.wait(), 0);
+    return name;
+}
+
+TEST(Watch, AnAdapterThatMovesToAnotherCarTakesAnotherName)
+{
+    TemporaryFolder const folder;
+    ::setenv("STATE_DIRECTORY", folder.file("state").c_str(), 1);
+    std::string const first = nameOf("petrol-can11");
+    std::string const second = nameOf("diesel-can29");
+    EXPECT_THAT(first, StartsWith("car-"));
+    EXPECT_THAT(second, StartsWith("car-"));
+    EXPECT_NE(first, second);
+    EXPECT_EQ(nameOf("petrol-can11"), first);
+    ::unsetenv("STATE_DIRECTORY");
+}
+
 TEST(Watch, TellsMistakesInItsSettings)
 {
     TemporaryFolder const folder;
@@ -145,6 +173,11 @@ TEST(Watch, EndsInTimeWhileTheNameOfABrokerIsLookedUp)
 TEST(Watch, EndsInTimeWhileNobodyReadsAnOutput)
 {
     expectEnding("pipe");
+}
+
+TEST(Watch, EndsInTimeWhileAnAdapterIsCalledThatDoesNotAnswer)
+{
+    expectEnding("adapter");
 }
 
 TEST(Watch, ASecondSignalEndsItAtOnce)

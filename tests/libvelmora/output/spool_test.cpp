@@ -102,7 +102,7 @@ struct Sent
     void up()
     {
         sender.onUp(now);
-        sender.pump(now);
+        sender.pump();
     }
 };
 
@@ -110,7 +110,7 @@ TEST(SpoolSender, ForgetsInOrderAndSendsAgainWhatNobodyVouchedFor)
 {
     Sent sent(false);
     sent.add(2500);
-    sent.sender.pump(sent.now);
+    sent.sender.pump();
     EXPECT_TRUE(sent.batches.empty()); // no connection
     sent.up();
     ASSERT_EQ(sent.batches.size(), 3U);
@@ -147,13 +147,23 @@ TEST(SpoolSender, WaitsForTheConsumersMarkAndBelievesNoneThatCannotBe)
     sent.sender.onMark(3, sent.now); // an older message
     EXPECT_EQ(sent.spool.rows(), 6);
     sent.now += 29s;
-    sent.sender.pump(sent.now);
-    EXPECT_EQ(sent.batches.size(), 1U);
+    EXPECT_FALSE(sent.sender.isStuck(sent.now));
     sent.now += 1s;
-    sent.sender.pump(sent.now); // lost on the way
+    EXPECT_TRUE(sent.sender.isStuck(sent.now)); // lost on the way: over a new connection, then
+    sent.up();
     ASSERT_EQ(sent.batches.size(), 2U);
     EXPECT_EQ(sent.batches[1]["after"], 4);
     EXPECT_EQ(sent.batches[1]["last"], 10);
+    sent.now += 59s;
+    EXPECT_FALSE(sent.sender.isStuck(sent.now)); // a consumer that is away gets it again ever more seldom
+    sent.now += 1s;
+    EXPECT_TRUE(sent.sender.isStuck(sent.now));
+    sent.sender.onMark(9, sent.now);
+    sent.now += 30s;
+    EXPECT_TRUE(sent.sender.isStuck(sent.now));
+    sent.sender.onMark(10, sent.now);
+    sent.now += 1h;
+    EXPECT_FALSE(sent.sender.isStuck(sent.now)); // nothing waits
 }
 
 TEST(SpoolSender, KeepsAWindowAndAMessagesSize)
@@ -164,7 +174,7 @@ TEST(SpoolSender, KeepsAWindowAndAMessagesSize)
     EXPECT_EQ(sent.batches.size(), 20U);
     sent.sender.onRefused(1);
     sent.takes = false;
-    sent.sender.pump(sent.now);
+    sent.sender.pump();
     EXPECT_EQ(sent.batches.size(), 21U);
     EXPECT_EQ(sent.batches.back()["after"], 0);
     Sent large(false);
@@ -185,7 +195,7 @@ TEST(SpoolSender, HoldsWhatIsNotDatedYetAndMarksWhatNeverWas)
     EXPECT_EQ(sent.spool.heldStamp()->offset, 1000);
     sent.spool.release(Spool::Time::Unsure);
     sent.add(1);
-    sent.sender.pump(sent.now);
+    sent.sender.pump();
     ASSERT_EQ(sent.batches.size(), 2U); // one clock a batch
     EXPECT_EQ(sent.batches[0]["clock"], false);
     EXPECT_EQ(sent.batches[0]["readings"][0][1], 1005);

@@ -31,6 +31,10 @@ public:
     std::uint64_t asked = 0;
     int connects = 0;
     int voltLooks = 0;
+    std::string number = "VIN-1";
+    bool canNap = true;
+    bool woken = false;
+    int naps = 0;
     int given = 0; // readings
 
     void connect() override
@@ -90,6 +94,15 @@ public:
         ++asked;
         return answers;
     }
+    std::string vin() const override { return number; }
+    bool startNap() override
+    {
+        needLink();
+        disconnect();
+        ++naps;
+        return canNap;
+    }
+    bool napIsOver() override { return woken; }
     std::uint64_t requests() const override { return asked; }
     std::uint64_t errors() const override { return 0; }
 
@@ -300,6 +313,45 @@ TEST(WatchEngine, AProbeIsMadeOnlyIfToldAndIsCounted)
     watch.car.answers = true;
     watch.run(31min);
     EXPECT_THAT(watch.events, Contains("ignition_on"));
+}
+
+TEST(WatchEngine, AnAdapterThatSleepsIsLeftAloneUntilItWakes)
+{
+    velmora::WatchRules rules;
+    rules.battery.adapterSleep = true;
+    Watch watch(rules);
+    watch.drive(2min);
+    watch.car.answers = false;
+    watch.run(8h);
+    EXPECT_EQ(watch.car.naps, 1);
+    EXPECT_EQ(watch.car.voltLooks, 0);
+    EXPECT_EQ(watch.events.back(), "adapter_asleep");
+    watch.car.woken = true;
+    watch.drive(2min);
+    EXPECT_EQ(watch.engine.state(), "running");
+    EXPECT_EQ(watch.car.connects, 2);
+    watch.car.canNap = false;
+    watch.run(1h);
+    EXPECT_EQ(watch.car.naps, 2);
+    EXPECT_GT(watch.car.voltLooks, 50); // one that knows no sleep is asked for the voltage
+    EXPECT_THAT(watch.events, Contains("adapter_awake"));
+}
+
+TEST(WatchEngine, DoesNothingWithAnotherVehicle)
+{
+    velmora::WatchRules rules;
+    rules.isStranger = [](std::string const& vin) { return vin == "VIN-2"; };
+    Watch watch(rules);
+    watch.drive(1min);
+    int const before = watch.readings;
+    watch.car.plugged = false;
+    watch.run(10s);
+    watch.car.plugged = true;
+    watch.car.number = "VIN-2";
+    EXPECT_FALSE(watch.engine.metStranger());
+    watch.drive(2min);
+    EXPECT_TRUE(watch.engine.metStranger());
+    EXPECT_LE(watch.readings, before + 2);
 }
 
 TEST(WatchEngine, AnEndKeepsTheTripUnderWay)

@@ -65,6 +65,13 @@ ca = "/etc/ca.pem"
     EXPECT_EQ(settings.outputs[1].option("qos"), "1");
 }
 
+TEST(WatchSettings, AnAdapterThatSleepsIsAskedNothing)
+{
+    EXPECT_TRUE(parseWatchSettings("battery.adapter_sleep = true", "w").battery.adapterSleep);
+    EXPECT_THAT(settingsComplaint("[battery]\nadapter_sleep = true\nwake = \"every 30min\""),
+                HasSubstr("w.toml:1: battery.adapter_sleep: a request would wake the adapter"));
+}
+
 TEST(WatchSettings, TellsEveryMistakeWithLineAndKey)
 {
     EXPECT_THAT(settingsComplaint(R"(prot = "x"

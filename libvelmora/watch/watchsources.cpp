@@ -1,0 +1,120 @@
+#include "libvelmora/watch/watchsources.h"
+
+#include "libvelmora/poll/sensorwish.h"
+#include "libvelmora/read/sensorchoice.h"
+#include "libvelmora/read/sensornames.h"
+#include "libvelmora/report/unitlabel.h"
+
+#include <obd/iecumanager.h>
+#include <obd/isensorservice.h>
+#include <obd/ivelmorasettings.h>
+#include <obd/parameterfactory.h>
+#include <obd/powertrainparameter.h>
+#include <obd/sensorinfo.h>
+#include <velmora/error.h>
+
+#include <fmt/format.h>
+
+#include <algorithm>
+
+namespace velmora {
+
+namespace {
+
+// As far as a car offers it.
+std::vector<std::string> const& usualSensors()
+{
+    static std::vector<std::string> const words = {"RPM",
+                                                   "SPEED",
+                                                   "COOLANT_TEMP",
+                                                   "ENGINE_LOAD",
+                                                   "THROTTLE_POS",
+                                                   "FUEL_LEVEL@0.1hz",
+                                                   "MODULE_VOLTAGE@0.5hz",
+                                                   "CLEAR_DISTANCE@0.1hz"};
+    return words;
+}
+
+// Puts back the module that the library's services work with.
+class CurrentModule
+{
+public:
+    explicit CurrentModule(obd::IEcuManager& manager) : m_manager(manager), m_id(manager.getCurrentEcu()->id()) {}
+    ~CurrentModule() { m_manager.setCurrentEcu(m_id); }
+    CurrentModule(CurrentModule const&) = delete;
+    CurrentModule& operator=(CurrentModule const&) = delete;
+
+private:
+    obd::IEcuManager& m_manager;
+    unsigned int const m_id;
+};
+
+std::vector<PollSource> sourcesFor(Session& session, std::string const& text, bool required)
+{
+    SensorWish const wish = parseSensorWish(text);
+    obd::IEcuManager& manager = *session.obd().getEcuManager();
+    CurrentModule const back(manager);
+    if (wish.module) {
+        manager.setCurrentEcu(*wish.module);
+    }
+    std::shared_ptr<obd::IEcu> const ecu = manager.getCurrentEcu();
+    std::vector<PollSource> sources;
+    if (ecu == nullptr) {
+        return sources;
+    }
+    SensorIds ids;
+    try {
+        ids = chooseSensors({wish.sensor}, offeredSensors(*obd::SensorServiceBuilder::createSensorService()));
+    } catch (Error const&) {
+        if (required) {
+            throw;
+        }
+    }
+    for (obd::ParameterIdentifier::Id const id : ids) {
+        if (auto parameter = obd::ParameterFactory().createParameter(*ecu, *session.obd().getSettings(), id)) {
+            sources.push_back({ecu, std::move(parameter), wish.hertz});
+        }
+    }
+    return sources;
+}
+
+} // namespace
+
+std::vector<PollSource> watchSources(Session& session, std::vector<std::string> const& wishes)
+{
+    std::vector<PollSource> sources;
+    bool const usual = wishes.empty();
+    for (std::string const& wish : usual ? usualSensors() : wishes) {
+        std::ranges::move(sourcesFor(session, wish, !usual), std::back_inserter(sources));
+    }
+    for (char const* const needed : {"RPM", "SPEED"}) {
+        for (PollSource& each : sourcesFor(session, needed, false)) {
+            bool const there = std::ranges::any_of(
+                sources, [&](PollSource const& one) { return one.parameter->pid() == each.parameter->pid(); });
+            if (!there) {
+                sources.push_back(std::move(each));
+            }
+        }
+    }
+    return sources;
+}
+
+SensorList sensorList(std::string const& vehicle, std::vector<PollSource> const& sources)
+{
+    SensorList list{std::chrono::system_clock::now(), vehicle, {}};
+    for (PollSource const& each : sources) {
+        auto const infos = each.parameter->sensorInfo(*each.ecu);
+        int const pid = each.parameter->pid();
+        std::string const title = each.parameter->description(*each.ecu);
+        for (auto const& info : infos) {
+            bool const alone = infos.size() == 1;
+            std::string const key = alone ? sensorKey(pid) : fmt::format("{}_{}", sensorKey(pid), info->uid() % 10 + 1);
+            list.sensors.push_back({each.ecu->id(), key, fmt::format("01{:02X}", pid),
+                                    alone ? title : title + ": " + info->description(),
+                                    unitLabel(info->unit(obd::UnitSystem::Metric))});
+        }
+    }
+    return list;
+}
+
+} // namespace velmora
