@@ -2,7 +2,7 @@
 //
 // Each NAME gets the readings of the recording (lines of JSON, as the output ndjson writes them) at RATE a second, with
 // the time of now, through the real output with its queue, thread and spool. At SIGTERM it waits until all spools are
-// empty, at most a minute, and tells how many readings each was given: "sent NAME COUNT".
+// empty, at most five minutes, and tells how many readings each was given: "sent NAME COUNT".
 
 #include "libvelmora/output/outputfactory.h"
 #include "libvelmora/output/outputrunner.h"
@@ -104,7 +104,7 @@ int main(int argc, char** argv)
         next += std::chrono::duration_cast<std::chrono::steady_clock::duration>(period);
         std::this_thread::sleep_until(next);
     }
-    auto const limit = std::chrono::steady_clock::now() + std::chrono::minutes(1);
+    auto const limit = std::chrono::steady_clock::now() + std::chrono::minutes(5);
     while (!std::ranges::all_of(senders, isDrained) && std::chrono::steady_clock::now() < limit) {
         std::this_thread::sleep_for(std::chrono::milliseconds(100));
     }

@@ -213,7 +213,7 @@ class Fleet:
         for name in names:
             self.processes[name].send_signal(signal.SIGTERM)
         for name in names:
-            code = self.processes[name].wait(timeout=60)
+            code = self.processes[name].wait(timeout=400)
             if code != 0:
                 raise RuntimeError(f"{name} ended with {code}: see {self.folder}/{name}.log")
 

@@ -117,12 +117,16 @@ void SessionCar::check()
     }
 }
 
-std::unique_ptr<IPort> SessionCar::openBarePort() const
+std::unique_ptr<IPort> SessionCar::openBarePort()
 {
     if (m_options.session.openPort) {
         return m_options.session.openPort();
     }
-    return openPort(parsePortAddress(m_options.session.port, m_options.session.baud.value_or(defaultBaud)));
+    PortAddress const address = parsePortAddress(m_options.session.port, m_options.session.baud.value_or(defaultBaud));
+    return openPort(address, [this] {
+        std::lock_guard const lock(m_mutex);
+        return m_interrupted;
+    });
 }
 
 bool SessionCar::startNap()

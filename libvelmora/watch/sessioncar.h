@@ -50,7 +50,7 @@ public:
     void interrupt();
 
 private:
-    std::unique_ptr<IPort> openBarePort() const;
+    std::unique_ptr<IPort> openBarePort();
 
     SessionCarOptions const m_options;
     std::mutex m_mutex;
