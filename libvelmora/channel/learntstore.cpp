@@ -1,6 +1,6 @@
 #include "libvelmora/channel/learntstore.h"
 
-#include <toml++/toml.h>
+#include "libvelmora/text/toml.h"
 
 #include <fstream>
 #include <system_error>

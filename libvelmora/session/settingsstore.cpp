@@ -2,10 +2,9 @@
 
 #include "libvelmora/record/checkedfile.h"
 #include "libvelmora/session/vehiclesettings.h"
+#include "libvelmora/text/toml.h"
 
 #include <velmora/error.h>
-
-#include <toml++/toml.h>
 
 #include <cerrno>
 #include <cmath>

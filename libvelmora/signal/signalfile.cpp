@@ -1,10 +1,9 @@
 #include "libvelmora/signal/signalfile.h"
 
 #include "libvelmora/signal/signaltable.h"
+#include "libvelmora/text/toml.h"
 
 #include <velmora/error.h>
-
-#include <toml++/toml.h>
 
 #include <filesystem>
 #include <fstream>

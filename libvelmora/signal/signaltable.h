@@ -1,8 +1,7 @@
 #pragma once
 
 #include "libvelmora/signal/signal.h"
-
-#include <toml++/toml.h>
+#include "libvelmora/text/toml.h"
 
 #include <string>
 #include <vector>

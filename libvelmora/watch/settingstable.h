@@ -1,8 +1,7 @@
 #pragma once
 
+#include "libvelmora/text/toml.h"
 #include "libvelmora/watch/watchsettings.h"
-
-#include <toml++/toml.h>
 
 #include <functional>
 #include <map>

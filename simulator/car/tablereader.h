@@ -1,8 +1,7 @@
 #pragma once
 
 #include "simulator/bytes.h"
-
-#include <toml++/toml.h>
+#include "simulator/toml.h"
 
 #include <functional>
 #include <set>

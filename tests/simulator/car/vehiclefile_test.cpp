@@ -33,6 +33,7 @@ TEST(VehicleFile, errorsNameFileAndLine)
 {
     const ErrorCase cases[] = {
         {"name = ", "car.toml:1: "},
+        {"[%]\n", "car.toml:1: "},
         {"protocol = 6\n", "car.toml:1: the vehicle needs \"name\""},
         {"name = \"Car\"\nprotocol = 10\n", "car.toml:2: \"protocol\" must be a whole number from 1 to 9"},
         {"name = \"Car\"\nprotocol = \"6\"\n", "car.toml:2: \"protocol\" must be a whole number from 1 to 9"},
