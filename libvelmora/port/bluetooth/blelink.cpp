@@ -13,8 +13,8 @@ using namespace std::chrono_literals;
 
 constexpr char const* deviceInterface = "org.bluez.Device1";
 constexpr char const* characteristicInterface = "org.bluez.GattCharacteristic1";
-constexpr std::chrono::seconds searchLimit{12};  // an inquiry takes 10.24 s
-constexpr std::chrono::seconds connectLimit{45}; // the kernel's own is up to 40 s
+constexpr std::chrono::seconds bleSearchLimit{12};  // an inquiry takes 10.24 s
+constexpr std::chrono::seconds bleConnectLimit{45}; // the kernel's own is up to 40 s
 constexpr std::chrono::seconds resolveLimit{15};
 constexpr std::chrono::milliseconds resolveStep{100};
 constexpr int connectAttempts = 3;
@@ -31,7 +31,7 @@ void connectDevice(SystemBus& bus, BluezDevice const& device)
 {
     for (int attempt = 1;; ++attempt) {
         try {
-            bus.call(device.path, deviceInterface, "Connect", connectLimit);
+            bus.call(device.path, deviceInterface, "Connect", bleConnectLimit);
             return;
         } catch (BusError const& error) {
             if (error.name() == "org.bluez.Error.AlreadyConnected") {
@@ -110,7 +110,7 @@ BleLink connectBle(BleAddress const& address, OpeningStop const& stop)
     try {
         BleLink link;
         link.bus = std::make_unique<SystemBus>(stop);
-        BluezDevice const device = findBluezDevice(*link.bus, address.mac, searchLimit);
+        BluezDevice const device = findBluezDevice(*link.bus, address.mac, bleSearchLimit);
         link.device = device.path;
         link.wasConnected = device.connected;
         connectDevice(*link.bus, device);

@@ -22,7 +22,7 @@ namespace {
 using asio::generic::seq_packet_protocol;
 
 constexpr char const* propertiesInterface = "org.freedesktop.DBus.Properties";
-constexpr char const* characteristicInterface = "org.bluez.GattCharacteristic1";
+constexpr char const* characteristicFace = "org.bluez.GattCharacteristic1";
 
 // Pieces that come within one connection event cost some adapters bytes.
 constexpr std::chrono::milliseconds betweenPieces{15};
@@ -117,7 +117,7 @@ private:
     void writeValue()
     {
         BusMessage const request =
-            m_link.bus->makeCall(m_link.characteristics.write.path, characteristicInterface, "WriteValue");
+            m_link.bus->makeCall(m_link.characteristics.write.path, characteristicFace, "WriteValue");
         checked(sd_bus_message_append_array(request.get(), 'y', m_piece.data(), m_piece.size()));
         checked(sd_bus_message_append(request.get(), "a{sv}", 1, "type", "s", "request"));
         auto const answered = [](sd_bus_message* answer, void* port, sd_bus_error*) {
@@ -163,7 +163,7 @@ private:
             static_cast<BlePort*>(port)->onValueChanged(message);
             return 0;
         });
-        m_link.bus->call(path, characteristicInterface, "StartNotify");
+        m_link.bus->call(path, characteristicFace, "StartNotify");
     }
 
     BusSlot watch(std::string const& path, sd_bus_message_handler_t handler)

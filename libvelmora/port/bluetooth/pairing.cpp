@@ -11,8 +11,8 @@ namespace velmora {
 namespace {
 
 constexpr char const* agentPath = "/velmora/agent";
-constexpr char const* managerInterface = "org.bluez.AgentManager1";
-constexpr std::chrono::seconds searchLimit{12};
+constexpr char const* agentManagerInterface = "org.bluez.AgentManager1";
+constexpr std::chrono::seconds pairingSearchLimit{12};
 constexpr std::chrono::seconds pairLimit{60};
 constexpr std::array<char const*, 2> usualPins{"1234", "0000"};
 
@@ -55,7 +55,7 @@ constexpr sd_bus_vtable agentObject[] = {
 // An agent of the same bus connection is the one that the service asks, so it need not become the default one.
 void registerAgent(SystemBus& bus)
 {
-    BusMessage const request = bus.makeCall("/org/bluez", managerInterface, "RegisterAgent");
+    BusMessage const request = bus.makeCall("/org/bluez", agentManagerInterface, "RegisterAgent");
     checked(sd_bus_message_append(request.get(), "os", agentPath, "KeyboardDisplay"));
     bus.call(request);
 }
@@ -92,7 +92,7 @@ void pairDevice(std::string const& mac, std::function<void(std::string const& li
     try {
         SystemBus bus(stop);
         tell("Looking for " + mac + " ...\n");
-        BluezDevice const device = findBluezDevice(bus, mac, searchLimit);
+        BluezDevice const device = findBluezDevice(bus, mac, pairingSearchLimit);
         Agent agent;
         sd_bus_slot* slot = nullptr;
         checked(sd_bus_add_object_vtable(bus.raw(), &slot, agentPath, "org.bluez.Agent1", agentObject, &agent));

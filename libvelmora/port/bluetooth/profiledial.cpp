@@ -10,10 +10,10 @@ namespace velmora {
 namespace {
 
 constexpr char const* objectPath = "/velmora/serialport";
-constexpr char const* serialPortService = "00001101-0000-1000-8000-00805f9b34fb";
+constexpr char const* dialledService = "00001101-0000-1000-8000-00805f9b34fb";
 constexpr char const* managerPath = "/org/bluez";
-constexpr char const* managerInterface = "org.bluez.ProfileManager1";
-constexpr std::chrono::seconds connectLimit{30};
+constexpr char const* profileManagerInterface = "org.bluez.ProfileManager1";
+constexpr std::chrono::seconds dialConnectLimit{30};
 
 int keepConnection(sd_bus_message* message, void* socket, sd_bus_error* error)
 {
@@ -48,8 +48,8 @@ constexpr sd_bus_vtable profileObject[] = {
 
 void registerProfile(SystemBus& bus)
 {
-    BusMessage const request = bus.makeCall(managerPath, managerInterface, "RegisterProfile");
-    checked(sd_bus_message_append(request.get(), "osa{sv}", objectPath, serialPortService, 4, "Name", "s", "Velmora",
+    BusMessage const request = bus.makeCall(managerPath, profileManagerInterface, "RegisterProfile");
+    checked(sd_bus_message_append(request.get(), "osa{sv}", objectPath, dialledService, 4, "Name", "s", "Velmora",
                                   "Role", "s", "client", "RequireAuthentication", "b", 0, "AutoConnect", "b", 0));
     bus.call(request);
 }
@@ -57,8 +57,8 @@ void registerProfile(SystemBus& bus)
 void connectProfile(SystemBus& bus, std::string const& device)
 {
     BusMessage const request = bus.makeCall(device, "org.bluez.Device1", "ConnectProfile");
-    checked(sd_bus_message_append(request.get(), "s", serialPortService));
-    bus.call(request, connectLimit);
+    checked(sd_bus_message_append(request.get(), "s", dialledService));
+    bus.call(request, dialConnectLimit);
 }
 
 // What has to stay while the socket is used: the service may take the connection back when the profile goes.

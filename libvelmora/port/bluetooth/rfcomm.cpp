@@ -11,19 +11,19 @@ namespace velmora {
 
 namespace {
 
-constexpr std::chrono::milliseconds stopStep{100};
-constexpr std::chrono::seconds connectLimit{30}; // the kernel's own
+constexpr std::chrono::milliseconds rfcommStopStep{100};
+constexpr std::chrono::seconds rfcommConnectLimit{30}; // the kernel's own
 
 // The result of a connect that goes on in the background.
 int awaitConnected(int socket, OpeningStop const& stop)
 {
-    auto const end = std::chrono::steady_clock::now() + connectLimit;
+    auto const end = std::chrono::steady_clock::now() + rfcommConnectLimit;
     while (std::chrono::steady_clock::now() < end) {
         if (stop && stop()) {
             return ECANCELED;
         }
         pollfd state{socket, POLLOUT, 0};
-        if (::poll(&state, 1, static_cast<int>(stopStep.count())) > 0) {
+        if (::poll(&state, 1, static_cast<int>(rfcommStopStep.count())) > 0) {
             int error = 0;
             socklen_t size = sizeof(error);
             return ::getsockopt(socket, SOL_SOCKET, SO_ERROR, &error, &size) == 0 ? error : errno;

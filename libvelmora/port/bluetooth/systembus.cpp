@@ -11,7 +11,7 @@ namespace velmora {
 
 namespace {
 
-constexpr std::chrono::milliseconds stopStep{100};
+constexpr std::chrono::milliseconds busStopStep{100};
 
 std::uint64_t microseconds(std::chrono::microseconds time)
 {
@@ -85,7 +85,7 @@ bool SystemBus::waitUntil(std::function<bool()> const& done, std::chrono::millis
             return false;
         }
         if (checked(sd_bus_process(m_bus.get(), nullptr)) == 0) {
-            int const waited = sd_bus_wait(m_bus.get(), microseconds(stopStep));
+            int const waited = sd_bus_wait(m_bus.get(), microseconds(busStopStep));
             checked(waited == -EINTR ? 0 : waited);
         }
     }

@@ -9,13 +9,13 @@ namespace velmora {
 
 namespace {
 
-constexpr std::chrono::seconds answerLimit{3}; // a radio takes up to some tenths more than a wire
-constexpr std::chrono::milliseconds stopStep{100};
-constexpr std::size_t longestAnswer = 4096;
+constexpr std::chrono::seconds probeAnswerLimit{3}; // a radio takes up to some tenths more than a wire
+constexpr std::chrono::milliseconds probeStopStep{100};
+constexpr std::size_t longestProbeAnswer = 4096;
 
 struct Answer
 {
-    bool isWhole() const { return lost || text.size() > longestAnswer || text.find('>') != std::string::npos; }
+    bool isWhole() const { return lost || text.size() > longestProbeAnswer || text.find('>') != std::string::npos; }
 
     std::mutex mutex;
     std::condition_variable more;
@@ -36,11 +36,11 @@ bool answersAsAdapter(std::unique_ptr<IPort> port, OpeningStop const& stop)
     port->start([&](std::string_view bytes) { change([&] { answer.text += bytes; }); },
                 [&] { change([&] { answer.lost = true; }); });
     port->write("ATI\r");
-    auto const end = std::chrono::steady_clock::now() + answerLimit;
+    auto const end = std::chrono::steady_clock::now() + probeAnswerLimit;
     {
         std::unique_lock lock(answer.mutex);
         while (!answer.isWhole() && std::chrono::steady_clock::now() < end && !(stop && stop())) {
-            answer.more.wait_for(lock, stopStep);
+            answer.more.wait_for(lock, probeStopStep);
         }
     }
     port->close();
