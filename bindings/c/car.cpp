@@ -42,6 +42,14 @@ public:
     Calling& operator=(Calling const&) = delete;
 };
 
+obd::UnitSystem unitSystem(uint32_t number)
+{
+    if (number != VELMORA_UNITS_METRIC && number != VELMORA_UNITS_IMPERIAL) {
+        throw Error(ErrorKind::WrongUse, "velmora_options.units is one of VELMORA_UNITS_...");
+    }
+    return number == VELMORA_UNITS_METRIC ? obd::UnitSystem::Metric : obd::UnitSystem::Imperial;
+}
+
 CarOptions carOptions(velmora_car const* car, char const* port, velmora_options const& given)
 {
     CarOptions options;
@@ -56,6 +64,13 @@ CarOptions carOptions(velmora_car const* car, char const* port, velmora_options 
     if (given.protocol != 0) {
         options.protocol = static_cast<int>(std::min<uint32_t>(given.protocol, 10));
     }
+    if (given.module != 0) {
+        options.module = given.module;
+    }
+    if (given.units != VELMORA_UNITS_BY_SETTINGS) {
+        options.units = unitSystem(given.units);
+    }
+    options.sleep = given.sleep != 0;
     if (given.on_progress != nullptr) {
         options.onProgress = [car, tell = given.on_progress, user = given.progress_user](std::string const& text) {
             Calling const noted(car);

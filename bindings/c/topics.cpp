@@ -185,6 +185,28 @@ void tell(ModuleTopic<InfoReport> const& module, velmora_info_fn fn, void* user)
     teller.tell("time_since_cleared", report.sinceCleared.runTime);
 }
 
+void tell(ModuleTopic<ClearReport> const& module, velmora_cleared_fn fn, void* user)
+{
+    auto plain = begun<velmora_cleared>(module);
+    plain.reason = module.report.reason.c_str();
+    plain.result = static_cast<uint32_t>(module.report.result);
+    fn(&plain, user);
+}
+
+void tell(ModuleTopic<CountersReport> const& module, velmora_counter_fn fn, void* user)
+{
+    auto plain = begun<velmora_counter>(module);
+    plain.answer = number(module.report.answer);
+    if (module.report.counters.empty()) {
+        fn(&plain, user);
+    }
+    for (CountersReport::Counter const& counter : module.report.counters) {
+        plain.name = counter.name.c_str();
+        plain.value = counter.value;
+        fn(&plain, user);
+    }
+}
+
 void tell(Module const& module, velmora_module_fn fn, void* user)
 {
     velmora_module const plain{sizeof(plain), module.name.c_str(), module.description.c_str(), module.id, 0};
@@ -262,6 +284,22 @@ int velmora_car_info(velmora_car* car, velmora_info_fn fn, void* user, velmora_e
 {
     return cface::tellEach(
         car, [](Car& each) { return each.info(); }, fn, user, error);
+}
+
+int velmora_car_clear(velmora_car* car, uint32_t flags, velmora_cleared_fn fn, void* user, velmora_error** error)
+{
+    if (flags != VELMORA_CLEAR_ERASES_READINESS) {
+        return cface::fail(error, VELMORA_WRONG_USE, "Clearing also erases readiness and freeze frames",
+                           {"pass VELMORA_CLEAR_ERASES_READINESS if that is meant"});
+    }
+    return cface::tellEach(
+        car, [](Car& each) { return each.clearCodes(); }, fn, user, error);
+}
+
+int velmora_car_counters(velmora_car* car, velmora_counter_fn fn, void* user, velmora_error** error)
+{
+    return cface::tellEach(
+        car, [](Car& each) { return each.counters(); }, fn, user, error);
 }
 
 int velmora_car_report_json(velmora_car* car, char** json, velmora_error** error)

@@ -97,6 +97,8 @@ PYBIND11_MODULE(_velmora, module)
         .def("readiness", &NativeCar::readiness)
         .def("monitors", &NativeCar::monitors)
         .def("info", &NativeCar::info)
+        .def("counters", &NativeCar::counters)
+        .def("clear", &NativeCar::clear)
         .def("report_json", &NativeCar::reportJson)
         .def("reconnect", &NativeCar::reconnect)
         .def("close", &NativeCar::close);

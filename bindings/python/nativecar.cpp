@@ -93,6 +93,11 @@ std::unique_ptr<NativeCar> openCar(std::string const& port, py::dict const& give
     take(given, "baud", options.baud);
     take(given, "protocol", options.protocol);
     take(given, "reset", options.reset);
+    take(given, "module", options.module);
+    take(given, "sleep", options.sleep);
+    if (given.contains("imperial") && !given["imperial"].is_none()) {
+        options.units = given["imperial"].cast<bool>() ? obd::UnitSystem::Imperial : obd::UnitSystem::Metric;
+    }
     take(given, "log_file", options.logFile);
     take(given, "trace_file", options.traceFile);
     take(given, "settings_file", options.settingsFile);

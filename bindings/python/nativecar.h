@@ -34,6 +34,8 @@ public:
     pybind11::list readiness() const;
     pybind11::list monitors() const;
     pybind11::list info() const;
+    pybind11::list counters() const;
+    pybind11::list clear() const;
 
     void close();
 

@@ -169,6 +169,35 @@ py::tuple plain(InfoReport const& report)
                           reading(report.sinceCleared.runTime));
 }
 
+py::tuple plain(CountersReport const& report)
+{
+    py::list counters;
+    for (CountersReport::Counter const& counter : report.counters) {
+        counters.append(py::make_tuple(text(counter.name), counter.value));
+    }
+    return py::make_tuple(printed(report.answer), counters);
+}
+
+char const* word(ClearReport::Result result)
+{
+    switch (result) {
+    case ClearReport::Result::Cleared:
+        return "cleared";
+    case ClearReport::Result::Refused:
+        return "refused";
+    case ClearReport::Result::NoAnswer:
+        return "no answer";
+    case ClearReport::Result::Unreadable:
+        break;
+    }
+    return "unreadable";
+}
+
+py::tuple plain(ClearReport const& report)
+{
+    return py::make_tuple(word(report.result), textOrNone(report.reason));
+}
+
 // Each control module with its report.
 template <typename Report>
 py::list plainModules(std::vector<ModuleTopic<Report>> const& modules)
@@ -241,6 +270,16 @@ py::list NativeCar::monitors() const
 py::list NativeCar::info() const
 {
     return plainModules(interruptibly([car = open()] { return car->info(); }));
+}
+
+py::list NativeCar::counters() const
+{
+    return plainModules(interruptibly([car = open()] { return car->counters(); }));
+}
+
+py::list NativeCar::clear() const
+{
+    return plainModules(interruptibly([car = open()] { return car->clearCodes(); }));
 }
 
 py::tuple explainCode(std::string const& code)

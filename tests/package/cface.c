@@ -69,6 +69,22 @@ static void on_monitor(velmora_readiness const* monitor, void* user)
     ++seen->count;
 }
 
+static void on_counter(velmora_counter const* counter, void* user)
+{
+    struct seen* const seen = user;
+    CHECK(counter->size == sizeof(velmora_counter) && (counter->name == NULL || counter->value > 0));
+    seen->with_value += counter->name != NULL;
+    ++seen->count;
+}
+
+static void on_cleared(velmora_cleared const* module, void* user)
+{
+    struct seen* const seen = user;
+    CHECK(module->size == sizeof(velmora_cleared) && module->reason != NULL);
+    seen->with_value += module->result == VELMORA_CLEARED;
+    ++seen->count;
+}
+
 static void on_test(velmora_test const* test, void* user)
 {
     struct seen* const seen = user;
@@ -186,6 +202,8 @@ static void check_topics(velmora_car* car)
     memset(&seen, 0, sizeof(seen));
     CHECK(velmora_car_monitors(car, on_test, &seen, NULL) == VELMORA_OK && seen.with_value > 3);
     memset(&seen, 0, sizeof(seen));
+    CHECK(velmora_car_counters(car, on_counter, &seen, NULL) == VELMORA_OK && seen.with_value > 0);
+    memset(&seen, 0, sizeof(seen));
     CHECK(velmora_car_info(car, on_info, &seen, NULL) == VELMORA_OK && strlen(seen.last) == 17);
     memset(&seen, 0, sizeof(seen));
     CHECK(velmora_catalogue_find("p0420", on_meaning, &seen, NULL) == VELMORA_OK &&
@@ -227,6 +245,21 @@ static void check_readings(velmora_car* car)
     pthread_mutex_destroy(&seen.mutex);
 }
 
+/* Clearing needs its flag, and clears. */
+static void check_clearing(velmora_car* car)
+{
+    struct seen seen = {0};
+    velmora_error* error = NULL;
+
+    CHECK(velmora_car_clear(car, 0, on_cleared, &seen, &error) == VELMORA_WRONG_USE && seen.count == 0);
+    CHECK(velmora_error_hint_count(error) == 1);
+    velmora_error_free(error);
+    CHECK(velmora_car_codes(car, on_code, &seen, NULL) == VELMORA_OK && seen.with_value == 1);
+    memset(&seen, 0, sizeof(seen));
+    CHECK(velmora_car_clear(car, VELMORA_CLEAR_ERASES_READINESS, on_cleared, &seen, NULL) == VELMORA_OK);
+    CHECK(seen.with_value > 0);
+}
+
 int main(void)
 {
     velmora_options options = VELMORA_OPTIONS_INIT;
@@ -250,6 +283,7 @@ int main(void)
     check_topics(car);
     check_readings(car);
     CHECK(velmora_car_reconnect(car, NULL) == VELMORA_OK);
+    check_clearing(car);
 
     pthread_mutex_init(&seen.mutex, NULL);
     pthread_cond_init(&seen.wake, NULL);

@@ -19,13 +19,13 @@ from collections.abc import AsyncIterator, Callable, Iterator
 from typing import Any
 
 from . import _topics, _velmora
-from ._topics import (Calibration, CodeList, FreezeFrame, FrozenReading, Info, Meaning, Module, ModuleCodes, Monitor,
+from ._topics import (Calibration, Cleared, CodeList, Counter, Counters, FreezeFrame, FrozenReading, Info, Meaning, Module, ModuleCodes, Monitor,
                       Monitors, Readiness, ReadinessMonitor, Sensor, Test, TroubleCode)
 from ._velmora import (AdapterSilentError, Error, InterruptedByUserError, LinkLostError, NotSupportedError, PortError,
                        RefusedError, VehicleSilentError, WrongUseError)
 
 __all__ = [
-    "AdapterSilentError", "Calibration", "Car", "CodeList", "Error", "FreezeFrame", "FrozenReading", "Info",
+    "AdapterSilentError", "Calibration", "Car", "Cleared", "CodeList", "Counter", "Counters", "Error", "FreezeFrame", "FrozenReading", "Info",
     "InterruptedByUserError", "LinkLostError", "Meaning", "Module", "ModuleCodes", "Monitor", "Monitors",
     "NotSupportedError", "PortError", "Reading", "Readiness", "ReadinessMonitor", "RefusedError", "Sensor", "Test",
     "TroubleCode", "VehicleSilentError", "Watch", "WrongUseError", "explain",
@@ -121,7 +121,8 @@ class Car:
     """
 
     def __init__(self, port: str = "auto", *, baud: int | None = None, protocol: int | None = None,
-                 reset: bool = False, log_file: str | os.PathLike[str] | None = None,
+                 reset: bool = False, module: int | None = None, imperial: bool | None = None, sleep: bool = False,
+                 log_file: str | os.PathLike[str] | None = None,
                  trace_file: str | os.PathLike[str] | None = None,
                  settings_file: str | os.PathLike[str] | None = None,
                  progress: Callable[[str], object] | None = None) -> None:
@@ -129,7 +130,8 @@ class Car:
             return None if file is None else os.fspath(file)
 
         self._native = _velmora.Car(port, {
-            "baud": baud, "protocol": protocol, "reset": reset, "log_file": path(log_file),
+            "baud": baud, "protocol": protocol, "reset": reset, "module": module, "imperial": imperial,
+            "sleep": sleep, "log_file": path(log_file),
             "trace_file": path(trace_file), "settings_file": path(settings_file), "progress": progress})
 
     def __enter__(self) -> Car:
@@ -190,6 +192,20 @@ class Car:
     def info(self) -> list[Info]:
         """What each control module says of itself and the vehicle."""
         return [_topics.info(each) for each in self._native.info()]
+
+    def counters(self) -> list[Counters]:
+        """How often monitors could run and did."""
+        return [_topics.counters(each) for each in self._native.counters()]
+
+    def clear(self, *, erase_readiness: bool) -> list[Cleared]:
+        """Clears the confirmed and pending codes of all control modules, and turns the lamp off.
+
+        Also erases freeze frames, readiness and test results: the vehicle must be driven before it can pass an emissions
+        test. Only with erase_readiness=True, which says that this is known. Raises Error if no module cleared its codes.
+        """
+        if erase_readiness is not True:
+            raise WrongUseError("clearing also erases readiness: pass erase_readiness=True if that is meant")
+        return [_topics.cleared(each) for each in self._native.clear()]
 
     def report_json(self) -> str:
         """All that the vehicle tells, as the JSON document of ``velmora scan --json``. Takes seconds."""

@@ -174,6 +174,34 @@ class Info:
     time_since_cleared: str | None
 
 
+@dataclasses.dataclass(frozen=True)
+class Counter:
+    """How often a monitor could run, or did."""
+
+    name: str
+    value: int
+
+
+@dataclasses.dataclass(frozen=True)
+class Counters:
+    """The in-use counters of one control module that are not 0."""
+
+    module: int
+    name: str
+    answer: str
+    counters: tuple[Counter, ...]
+
+
+@dataclasses.dataclass(frozen=True)
+class Cleared:
+    """What one control module said to clearing: "cleared", "refused", "no answer" or "unreadable"."""
+
+    module: int
+    name: str
+    result: str
+    reason: str | None
+
+
 def trouble_code(plain: Any) -> TroubleCode:
     code, system, meanings, maker, text = plain
     return TroubleCode(code, system, tuple(Meaning(*each) for each in meanings), maker, text)
@@ -207,3 +235,13 @@ def info(plain: Any) -> Info:
     module, name, (vin, description, standard, protocol, calibrations, *more) = plain
     return Info(module, name, vin, description, standard, protocol,
                 tuple(Calibration(*each) for each in calibrations), *more)
+
+
+def counters(plain: Any) -> Counters:
+    module, name, (answer, told) = plain
+    return Counters(module, name, answer, tuple(Counter(*each) for each in told))
+
+
+def cleared(plain: Any) -> Cleared:
+    module, name, (result, reason) = plain
+    return Cleared(module, name, result, reason)

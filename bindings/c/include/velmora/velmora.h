@@ -94,6 +94,14 @@ VELMORA_API char const* velmora_version(void);
 /** What the car is at while it connects and reads, as lines with their line feeds. On the car's thread. */
 typedef void (*velmora_progress_fn)(char const* text, void* user);
 
+/** The units that values are told in. */
+enum
+{
+    VELMORA_UNITS_BY_SETTINGS = 0,
+    VELMORA_UNITS_METRIC = 1,
+    VELMORA_UNITS_IMPERIAL = 2
+};
+
 /** How a car is to be reached. What is NULL or 0 comes from the settings file, or is the default. */
 typedef struct velmora_options
 {
@@ -106,12 +114,14 @@ typedef struct velmora_options
     uint32_t baud;     /**< line rate of a serial port */
     uint32_t protocol; /**< the adapter's number of the bus, 1 to 9 */
     uint32_t reset;    /**< not 0: restore and reset the adapter before use */
-    uint32_t unused;   /**< 0 */
+    uint32_t module;   /**< id of the one control module to ask, such as 0x7E8; all of them if 0 */
+    uint32_t units;    /**< VELMORA_UNITS_... */
+    uint32_t sleep;    /**< not 0: send the adapter to sleep at the end, which costs the next visit time */
 } velmora_options;
 
 #define VELMORA_OPTIONS_INIT                                                                                           \
     {                                                                                                                  \
-        sizeof(velmora_options), NULL, NULL, NULL, NULL, NULL, 0, 0, 0, 0                                              \
+        sizeof(velmora_options), NULL, NULL, NULL, NULL, NULL, 0, 0, 0, 0, 0, 0                                        \
     }
 
 /**
@@ -244,6 +254,53 @@ typedef struct velmora_code
 typedef void (*velmora_code_fn)(velmora_code const* code, void* user);
 /** Tells each trouble code of each list of each control module, and of each list without codes that it has none. */
 VELMORA_API int velmora_car_codes(velmora_car* car, velmora_code_fn fn, void* user, velmora_error** error);
+
+/** What a control module said when it was asked to clear its codes. */
+enum
+{
+    VELMORA_CLEARED = 0,
+    VELMORA_CLEAR_REFUSED = 1,
+    VELMORA_CLEAR_NO_ANSWER = 2,
+    VELMORA_CLEAR_UNREADABLE = 3
+};
+
+/** That one control module has cleared its codes, or why not. */
+typedef struct velmora_cleared
+{
+    size_t size;
+    char const* reason; /**< of a refusal; else empty */
+    char const* module_name;
+    uint32_t module;
+    uint32_t result; /**< VELMORA_CLEARED and so on */
+} velmora_cleared;
+typedef void (*velmora_cleared_fn)(velmora_cleared const* module, void* user);
+
+/** That the caller knows what is erased: without it velmora_car_clear does nothing. */
+#define VELMORA_CLEAR_ERASES_READINESS 0x1u
+
+/**
+ * Clears the confirmed and pending codes of all control modules and turns the lamp off. Also erases freeze frames,
+ * readiness, test results, and the distance and time since the last clearing: the vehicle must be driven before it can
+ * pass an emissions test. `flags` is VELMORA_CLEAR_ERASES_READINESS. `fn` is told of each module; the function fails if
+ * none cleared its codes.
+ */
+VELMORA_API int velmora_car_clear(velmora_car* car, uint32_t flags, velmora_cleared_fn fn, void* user,
+                                  velmora_error** error);
+
+/** How often a monitor could run and did, or that a control module tells of none. */
+typedef struct velmora_counter
+{
+    size_t size;
+    char const* name; /**< NULL if the module told of no counter that is not 0 */
+    char const* module_name;
+    uint32_t module;
+    uint32_t answer; /**< VELMORA_ANSWER_... */
+    uint32_t value;
+    uint32_t unused;
+} velmora_counter;
+typedef void (*velmora_counter_fn)(velmora_counter const* counter, void* user);
+/** Tells the in-use counters of each control module that are not 0, each module at least once. */
+VELMORA_API int velmora_car_counters(velmora_car* car, velmora_counter_fn fn, void* user, velmora_error** error);
 
 /** How far an on-board monitor has come. */
 enum
