@@ -65,4 +65,5 @@ install(
     FILES ${PROJECT_BINARY_DIR}/velmoraConfig.cmake ${PROJECT_BINARY_DIR}/velmoraConfigVersion.cmake
     DESTINATION ${package_folder}
 )
+install(FILES LICENSE THIRD-PARTY-NOTICES DESTINATION ${CMAKE_INSTALL_DOCDIR})
 include(cmake/pkgconfig.cmake)

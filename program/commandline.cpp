@@ -1,13 +1,16 @@
 #include "program/commandline.h"
 
 #include "libvelmora/output/outputfactory.h"
+#include "program/licencetext.h"
 #include "program/selfdescription.h"
 #include "program/terminal/output.h"
 #include "program/terminal/terminal.h"
 #include "program/view/layout.h"
 #include "velmora/version.h"
 
+#include <obd/version.h>
 #include <velmora/error.h>
+#include <velmora/velmora.h>
 
 #include <CLI/Config.hpp>
 #include <CLI/Formatter.hpp>
@@ -89,7 +92,8 @@ std::optional<ColorMode> parseColor(std::string const& text)
 // The version, and what was not left out of this build.
 std::string versionLines()
 {
-    return fmt::format("velmora {}\noutputs: {}", versionText, fmt::join(builtInOutputs(), ", "));
+    return fmt::format("velmora {}\nlibobd {}, C ABI {}\noutputs: {}\nparts: {}", versionText, OBD_VERSION,
+                       velmora_abi_version(), fmt::join(builtInOutputs(), ", "), VELMORA_PARTS);
 }
 
 } // namespace
@@ -98,6 +102,11 @@ CommandLine::CommandLine() : m_app("Reads live data, trouble codes and vehicle d
 {
     m_app.require_subcommand(1);
     m_app.set_version_flag("-V,--version", versionLines());
+    m_app
+        .add_flag_callback(
+            "--licenses", [] { throw CLI::CallForVersion(licenceText, 0); },
+            "Print the licence, and those of what is built in")
+        ->configurable(false);
     m_app.set_help_flag("-h,--help", "Print this help");
     m_app.set_help_all_flag("--help-all", "Print the help of all commands");
     m_app.footer(exitCodes);

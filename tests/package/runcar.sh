@@ -21,6 +21,15 @@ echo "$said"
 "$2/json" "$car" | python3 -c 'import json, sys; assert len(json.load(sys.stdin)["modules"]) == 2' ||
     fail "json prints no report of both modules"
 
+said=$("$2/readiness" "$car")
+[[ $said =~ 7E8\ ECM.*:\ complete ]] || fail "readiness tells no monitors: $said"
+said=$("$2/info" "$car")
+[[ $said =~ 7E8\ ECM.*[A-Z0-9]{17} ]] || fail "info tells no VIN: $said"
+[[ $("$2/explain" P0420) == P0420\ Generic:\ Catalyst* ]] || fail "explain tells no meaning"
+status=0
+"$2/explain" nonsense 2>/dev/null || status=$?
+[[ $status -eq 2 ]] || fail "nonsense is no code, but explain ended with $status"
+
 status=0
 "$2/read" sim:no-such-car RPM 2>/dev/null || status=$?
 [[ $status -ne 0 ]] || fail "there is no such car, but read succeeded"
