@@ -154,7 +154,8 @@ void CarCore::startWatch(std::shared_ptr<WatchState> const& state)
     auto sink = [this, state](PollResult const& result) {
         post([this, state, readings = result.readings] { deliver(state, readings); });
     };
-    state->setPoller(std::make_unique<Poller>(m_session->proxy(), pollSources(*m_session, state->sensors()), PollPace{},
+    state->setPoller(std::make_unique<Poller>(m_session->proxy(), pollSources(*m_session, state->sensors()),
+                                              carefulPace(m_session->proxy()->protocol()),
                                               m_session->obd().getSettings()->unitSystem(), sink));
 }
 

@@ -127,7 +127,7 @@ std::vector<Reading> readOnce(Session& session, std::vector<PollSource> const& s
 {
     std::vector<PollResult> results;
     PollCycle cycle(
-        session.proxy(), sources, PollPace{},
+        session.proxy(), sources, carefulPace(session.proxy()->protocol()),
         [](unsigned char pid) { return obd::ParameterFactory::dataLength(obd::ParameterIdentifier(pid).id()); },
         session.obd().getSettings()->unitSystem(), [&results](PollResult const& result) { results.push_back(result); });
     auto const told = [&results](PollRate const& rate) {

@@ -25,8 +25,8 @@ std::set<unsigned int> modulesOf(std::vector<std::size_t> const& members, std::v
 } // namespace
 
 PollCycle::PollCycle(std::shared_ptr<obd::IObdProxy> const& proxy, std::vector<PollSource> const& sources,
-                     PollPace const& pace, PidLength length, obd::UnitSystem units, Sink sink)
-    : m_wire(proxy, pace.gap), m_pace(pace), m_length(std::move(length)), m_sink(std::move(sink)),
+                     PollPace const& pace, PidLength length, obd::UnitSystem units, Sink sink, IChannelControl* channel)
+    : m_wire(proxy, pace.gap, channel), m_pace(pace), m_length(std::move(length)), m_sink(std::move(sink)),
       m_meters(sources.size()), m_silent(sources.size(), 0)
 {
     for (PollSource const& source : sources) {
@@ -36,6 +36,7 @@ PollCycle::PollCycle(std::shared_ptr<obd::IObdProxy> const& proxy, std::vector<P
         m_parameters.push_back(std::move(parameter));
         m_limits.try_emplace(source.ecu->id(), pace.pidsPerRequest);
     }
+    m_mayAddress = pace.addresses && channel != nullptr && proxy->ecus().size() > 1;
     plan();
 }
 
@@ -78,6 +79,26 @@ void PollCycle::step()
     }
 }
 
+// What is of one module only may go to its own address, if that proves quicker than the replies of all.
+obd::IDevice::Status PollCycle::ask(std::vector<unsigned char> const& request, std::set<unsigned int> const& modules,
+                                    obd::ResponseMap& responses)
+{
+    if (!m_mayAddress || modules.size() != 1) {
+        return m_wire.execute(request, responses, replyLimitMs);
+    }
+    unsigned int const module = *modules.begin();
+    AddressTrial& trial = m_trials[{module, request}];
+    PollTime const start = m_wire.now();
+    obd::IDevice::Status const status =
+        m_wire.execute(request, responses, replyLimitMs, trial.isAddressed() ? std::optional(module) : std::nullopt);
+    if (responses.contains(module)) {
+        trial.answered(std::chrono::duration_cast<std::chrono::milliseconds>(m_wire.now() - start));
+    } else {
+        trial.missed();
+    }
+    return status;
+}
+
 bool PollCycle::run(PollTask const& task)
 {
     if (task.pids.empty()) {
@@ -92,7 +113,7 @@ bool PollCycle::run(PollTask const& task)
 bool PollCycle::runSingle(PollTask const& task)
 {
     obd::ResponseMap responses;
-    m_wire.execute({currentData, task.pids.front()}, responses, replyLimitMs);
+    ask({currentData, task.pids.front()}, modulesOf(task.members, m_wishes), responses);
     bool success = false;
     for (std::size_t const member : task.members) {
         auto const found = responses.find(m_wishes[member].module);
@@ -178,7 +199,7 @@ std::map<unsigned int, PollCycle::Parts> PollCycle::fetch(std::vector<unsigned c
     std::vector<unsigned char> request{currentData};
     request.insert(request.end(), pids.begin(), pids.end());
     obd::ResponseMap responses;
-    if (m_wire.execute(request, responses, replyLimitMs) != obd::IDevice::Status::Ok) {
+    if (ask(request, modules, responses) != obd::IDevice::Status::Ok) {
         responses.clear();
     }
     PollTime const now = m_wire.now();

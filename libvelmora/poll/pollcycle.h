@@ -1,5 +1,6 @@
 #pragma once
 
+#include "libvelmora/poll/addresstrial.h"
 #include "libvelmora/poll/deadlinescheduler.h"
 #include "libvelmora/poll/polledparameter.h"
 #include "libvelmora/poll/pollpace.h"
@@ -11,6 +12,7 @@
 #include <mutex>
 #include <optional>
 #include <set>
+#include <utility>
 #include <vector>
 
 namespace velmora {
@@ -33,14 +35,16 @@ struct PollSource
     std::optional<double> hertz;
 };
 
-// The poller without its thread: takes one turn after the other, on one thread.
+// The poller without its thread: takes one turn after the other, on one thread. channel, if there is one, must outlive
+// it.
 class PollCycle
 {
 public:
     using Sink = std::function<void(PollResult const& result)>;
 
     PollCycle(std::shared_ptr<obd::IObdProxy> const& proxy, std::vector<PollSource> const& sources,
-              PollPace const& pace, PidLength length, obd::UnitSystem units, Sink sink);
+              PollPace const& pace, PidLength length, obd::UnitSystem units, Sink sink,
+              IChannelControl* channel = nullptr);
 
     // How long nothing is to be done yet.
     std::chrono::milliseconds wait();
@@ -54,6 +58,8 @@ private:
     using Parts = std::map<unsigned char, std::vector<unsigned char>>; // by PID
 
     void plan();
+    obd::IDevice::Status ask(std::vector<unsigned char> const& request, std::set<unsigned int> const& modules,
+                             obd::ResponseMap& responses);
     bool run(PollTask const& task);
     bool runSingle(PollTask const& task);
     bool runMulti(PollTask const& task);
@@ -72,6 +78,9 @@ private:
     std::vector<PollWish> m_wishes;
     std::vector<std::unique_ptr<PolledParameter>> m_parameters; // one for each wish
     MultiLimits m_limits;
+    // By module and request, where modules' own addresses may be used.
+    std::map<std::pair<unsigned int, std::vector<unsigned char>>, AddressTrial> m_trials;
+    bool m_mayAddress = false;
     std::vector<PollTask> m_tasks;
     std::vector<int> m_failures; // in a row, for each task
     DeadlineScheduler m_scheduler;

@@ -18,6 +18,7 @@ PollPace choosePace(PollWill const& will, obd::ObdProtocol protocol, int modelYe
         if (will.fast) {
             pace.floor = std::chrono::milliseconds(0);
             pace.pidsPerRequest = will.pidsPerRequest;
+            pace.addresses = true;
         }
         break;
     case obd::ObdProtocolJ1850:
@@ -31,6 +32,11 @@ PollPace choosePace(PollWill const& will, obd::ObdProtocol protocol, int modelYe
         break;
     }
     return pace;
+}
+
+PollPace carefulPace(obd::ObdProtocol protocol)
+{
+    return choosePace({}, protocol, 0);
 }
 
 } // namespace velmora

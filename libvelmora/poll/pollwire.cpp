@@ -13,8 +13,8 @@ constexpr unsigned char liveServiceReply = 0x41;
 
 } // namespace
 
-PollWire::PollWire(std::shared_ptr<obd::IObdProxy> proxy, std::chrono::milliseconds gap)
-    : m_proxy(std::move(proxy)), m_gap(gap), m_millis(tervex::currentMillis())
+PollWire::PollWire(std::shared_ptr<obd::IObdProxy> proxy, std::chrono::milliseconds gap, IChannelControl* channel)
+    : m_proxy(std::move(proxy)), m_gap(gap), m_channel(channel), m_millis(tervex::currentMillis())
 {}
 
 PollWire::Time PollWire::now()
@@ -36,16 +36,20 @@ void PollWire::keepGap()
 }
 
 obd::IDevice::Status PollWire::execute(std::vector<unsigned char> const& request, obd::ResponseMap& responses,
-                                       unsigned int timeoutMs)
+                                       unsigned int timeoutMs, std::optional<unsigned int> module)
 {
     keepGap();
+    std::optional<AddressedModule> address;
+    if (module && m_channel != nullptr) {
+        address.emplace(*m_channel, *module);
+    }
     obd::IDevice::Status const status = m_proxy->execute(request, responses, timeoutMs);
     if (status != obd::IDevice::Status::Ok || request.size() != 2 || request[0] != liveService) {
         return status;
     }
-    for (auto const& [module, payload] : responses) {
+    for (auto const& [sender, payload] : responses) {
         if (payload.size() > 2 && payload[0] == liveServiceReply && payload[1] == request[1]) {
-            m_notes.note(module, request[1], now());
+            m_notes.note(sender, request[1], now());
         }
     }
     return status;

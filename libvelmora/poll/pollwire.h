@@ -1,5 +1,6 @@
 #pragma once
 
+#include "libvelmora/channel/ichannelcontrol.h"
 #include "libvelmora/poll/answernotes.h"
 
 #include <obd/iobdproxy.h>
@@ -7,6 +8,7 @@
 #include <chrono>
 #include <cstdint>
 #include <memory>
+#include <optional>
 
 namespace velmora {
 
@@ -16,10 +18,11 @@ class PollWire
 public:
     using Time = AnswerNotes::Time;
 
-    PollWire(std::shared_ptr<obd::IObdProxy> proxy, std::chrono::milliseconds gap);
+    // channel sends requests to one module alone; null where there is none.
+    PollWire(std::shared_ptr<obd::IObdProxy> proxy, std::chrono::milliseconds gap, IChannelControl* channel = nullptr);
 
     obd::IDevice::Status execute(std::vector<unsigned char> const& request, obd::ResponseMap& responses,
-                                 unsigned int timeoutMs);
+                                 unsigned int timeoutMs, std::optional<unsigned int> module = {});
 
     obd::IObdProxy& proxy() const { return *m_proxy; }
     AnswerNotes& notes() { return m_notes; }
@@ -32,6 +35,7 @@ private:
 
     std::shared_ptr<obd::IObdProxy> m_proxy;
     std::chrono::milliseconds m_gap;
+    IChannelControl* m_channel;
     AnswerNotes m_notes;
     Time m_next; // no request before
     Time m_now{std::chrono::hours(1)};

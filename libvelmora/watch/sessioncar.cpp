@@ -83,14 +83,16 @@ void SessionCar::startAsking()
 {
     std::shared_ptr<obd::IObdProxy> const proxy = m_session->proxy();
     PollPace const pace = choosePace({m_options.fast, 6}, proxy->protocol(), obd::GetVehicleModelYear(m_vin));
-    m_poller =
-        std::make_unique<Poller>(proxy, m_sources, pace, obd::UnitSystem::Metric, [this](PollResult const& result) {
+    m_poller = std::make_unique<Poller>(
+        proxy, m_sources, pace, obd::UnitSystem::Metric,
+        [this](PollResult const& result) {
             std::lock_guard const lock(m_mutex);
             for (Reading const& each : result.readings) {
                 m_readings.push_back(each);
                 m_readings.back().vehicle = m_options.vehicle;
             }
-        });
+        },
+        &m_session->channel());
 }
 
 void SessionCar::stopAsking()

@@ -5,14 +5,17 @@
 namespace velmora::cli {
 
 LiveFeed::LiveFeed(obd::IObdVelmora const& obd, DispatchLoop& loop, std::vector<PollChoice> const& choices,
-                   PollWill const& will)
-    : m_poller(pollVehicle(obd, choices, will, [this, &loop](PollResult const& result) {
-          {
-              std::lock_guard const lock(m_mutex);
-              m_results.push_back(result);
-          }
-          loop.wake();
-      }))
+                   PollWill const& will, IChannelControl& channel)
+    : m_poller(pollVehicle(
+          obd, choices, will,
+          [this, &loop](PollResult const& result) {
+              {
+                  std::lock_guard const lock(m_mutex);
+                  m_results.push_back(result);
+              }
+              loop.wake();
+          },
+          &channel))
 {}
 
 bool LiveFeed::hasNew() const

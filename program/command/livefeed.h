@@ -13,9 +13,9 @@ namespace velmora::cli {
 class LiveFeed
 {
 public:
-    // Polls from here on; both must outlive it.
+    // Polls from here on; library, loop and channel must outlive it.
     LiveFeed(obd::IObdVelmora const& obd, DispatchLoop& loop, std::vector<PollChoice> const& choices,
-             PollWill const& will);
+             PollWill const& will, IChannelControl& channel);
 
     bool hasNew() const;
     std::vector<PollResult> take();

@@ -26,6 +26,8 @@ constexpr milliseconds step{50};
 constexpr seconds silence{3};
 constexpr seconds longSilence{15};
 constexpr seconds ratesSettle{5};
+constexpr char const* fastWarning =
+    "Asking without the pause that spares the vehicle; too much traffic has upset control modules";
 
 // The modules that words mean which name none: those of --ecu, or the first one.
 std::vector<unsigned int> meantModules(CommandSession const& session)
@@ -72,7 +74,8 @@ void LiveRun::start(std::vector<PollChoice> const& choices)
     m_feed.reset();
     m_choices = choices;
     select();
-    m_feed = std::make_unique<LiveFeed>(m_session.obd(), m_session.loop(), m_choices, m_options.will);
+    m_feed =
+        std::make_unique<LiveFeed>(m_session.obd(), m_session.loop(), m_choices, m_options.will, m_session.channel());
 }
 
 void LiveRun::run()
@@ -86,10 +89,13 @@ void LiveRun::run()
     if (m_csv != nullptr) {
         m_csv->begin(m_table, m_start, std::chrono::system_clock::now());
     }
-    if (m_options.will.fast && !m_session.options().quiet && m_terminal == nullptr) {
-        tell("Asking without the pause that spares the vehicle; too much traffic has upset control modules\n");
+    if (m_options.will.fast && m_terminal != nullptr) {
+        m_note = fastWarning;
+    } else if (m_options.will.fast && !m_session.options().quiet) {
+        tell(std::string(fastWarning) + "\n");
     }
-    m_feed = std::make_unique<LiveFeed>(m_session.obd(), m_session.loop(), m_choices, m_options.will);
+    m_feed =
+        std::make_unique<LiveFeed>(m_session.obd(), m_session.loop(), m_choices, m_options.will, m_session.channel());
     try {
         while (!isDone()) {
             runOnce();

@@ -21,6 +21,19 @@ using velmora::PollResult;
 constexpr PollPace careful{};
 constexpr PollPace fastSingle{std::chrono::milliseconds(0), std::chrono::milliseconds(0), 1};
 constexpr PollPace fastSix{std::chrono::milliseconds(0), std::chrono::milliseconds(0), 6};
+constexpr PollPace fastAddressed{std::chrono::milliseconds(0), std::chrono::milliseconds(0), 1, true};
+
+// Notes which module requests go to.
+struct FakeChannel : velmora::IChannelControl
+{
+    void addressModule(std::optional<unsigned int> id) override { module = id; }
+    void address(std::optional<velmora::RequestAddress> const& /*address*/) override {}
+    std::string refusedAddress() const override { return {}; }
+    void onConnected() override {}
+    velmora::ChannelStatistics statistics() const override { return {}; }
+
+    std::optional<unsigned int> module;
+};
 
 // A vehicle whose modules answer in 12 ms, and a poller on it that runs in a time of its own.
 class PollCycleTest : public testing::Test
@@ -47,7 +60,7 @@ protected:
             m_cycle = std::make_unique<PollCycle>(
                 m_proxy, m_sources, pace,
                 [](unsigned char pid) { return obd::ParameterFactory::dataLength(obd::ParameterIdentifier(pid).id()); },
-                obd::UnitSystem::Metric, [this](PollResult const& result) { m_results.push_back(result); });
+                obd::UnitSystem::Metric, [this](PollResult const& result) { m_results.push_back(result); }, &m_channel);
         }
         unsigned int const end = m_clock.millis() + ms;
         while (m_clock.millis() < end) {
@@ -77,7 +90,23 @@ protected:
         }));
     }
 
+    // Modules answer in so many milliseconds, and at their own addresses in so many; 0: not at all. Notes how requests
+    // go.
+    void answerIn(unsigned int broadcast, unsigned int addressed)
+    {
+        m_proxy->during([this, broadcast, addressed] {
+            m_way += m_channel.module ? 'a' : 'b';
+            m_clock.advance(m_channel.module ? std::max(addressed, 20U) : broadcast);
+            if (addressed == 0) {
+                m_channel.module ? m_proxy->fail("01 0C", FakeProxy::Status::NoResponse)
+                                 : m_proxy->answer("01 0C", "41 0C 1A F8");
+            }
+        });
+    }
+
     support::FakeClock m_clock;
+    FakeChannel m_channel;
+    std::string m_way;
     std::shared_ptr<FakeProxy> m_proxy = std::make_shared<FakeProxy>();
     std::shared_ptr<FakeEcu> m_engine = std::make_shared<FakeEcu>(0x7E8);
     std::shared_ptr<FakeEcu> m_gearbox = std::make_shared<FakeEcu>(0x7E9);
@@ -285,6 +314,44 @@ TEST_F(PollCycleTest, InputsOfADerivedValueAreFetchedTogether)
     EXPECT_EQ(m_proxy->count("01 0D"), 1);
     EXPECT_EQ(m_proxy->count("01 0C 0D"), 18);
     EXPECT_EQ(count(0x7E8, obd::ParameterIdentifier::Torque), 19U);
+}
+
+TEST_F(PollCycleTest, OneModulesValuesGoTheQuickerWay)
+{
+    want(0x0C);
+    m_proxy->answer("01 0C", "41 0C 1A F8");
+    answerIn(40, 25);
+    run(fastAddressed, 600);
+    EXPECT_EQ(m_way.substr(0, 20), "bbbbbbaaaaaaaaaaaaaa");
+    EXPECT_EQ(m_channel.module, std::nullopt) << "for the scope of a request only";
+    m_way.clear();
+    m_cycle.reset();
+    answerIn(40, 38);
+    run(fastAddressed, 800);
+    EXPECT_EQ(m_way.substr(0, 20), "bbbbbbaaaaaabbbbbbbb") << "what it gains is not worth the traffic";
+    m_way.clear();
+    m_cycle.reset();
+    answerIn(40, 0);
+    run(fastAddressed, 800);
+    EXPECT_EQ(m_way.substr(0, 14), "bbbbbbaabbbbbb") << "it answers requests to all only";
+}
+
+TEST_F(PollCycleTest, OnlyRequestsOfOneModuleAmongSeveralAreAddressed)
+{
+    m_proxy->answer("01 0C", {{0x7E8, "41 0C 1A F8"}, {0x7E9, "41 0C 0B B8"}});
+    answerIn(40, 25);
+    want(0x0C);
+    run(careful, 1000);
+    EXPECT_EQ(m_way.find('a'), std::string::npos) << "not unasked";
+    m_cycle.reset();
+    want(m_gearbox, 0x0C);
+    run(fastAddressed, 1000);
+    EXPECT_EQ(m_way.find('a'), std::string::npos) << "both are wanted";
+    m_cycle.reset();
+    m_sources.pop_back();
+    m_proxy->setEcus({m_engine});
+    run(fastAddressed, 1000);
+    EXPECT_EQ(m_way.find('a'), std::string::npos) << "nobody else answers";
 }
 
 TEST_F(PollCycleTest, TheBatteryIsTheAdaptersAffair)

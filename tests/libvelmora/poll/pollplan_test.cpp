@@ -92,9 +92,11 @@ TEST(PollPace, FollowsTheBus)
     velmora::PollPace const can = velmora::choosePace(fast, obd::ObdProtocolCan29, 0);
     EXPECT_EQ(can.floor.count(), 0);
     EXPECT_EQ(can.pidsPerRequest, 6U);
+    EXPECT_TRUE(can.addresses);
     velmora::PollPace const careful = velmora::choosePace({}, obd::ObdProtocolCan11, 0);
     EXPECT_EQ(careful.floor.count(), 30);
     EXPECT_EQ(careful.pidsPerRequest, 1U);
+    EXPECT_FALSE(careful.addresses);
     for (obd::ObdProtocol const line : {obd::ObdProtocolIso9141, obd::ObdProtocolIso14230}) {
         EXPECT_EQ(velmora::choosePace(fast, line, 2010).floor.count(), 30);
         EXPECT_EQ(velmora::choosePace(fast, line, 2010).pidsPerRequest, 1U);
@@ -104,6 +106,7 @@ TEST(PollPace, FollowsTheBus)
     EXPECT_EQ(velmora::choosePace(fast, obd::ObdProtocolJ1850, 2003).gap.count(), 0);
     EXPECT_EQ(velmora::choosePace(fast, obd::ObdProtocolJ1850, 2003).floor.count(), 0);
     EXPECT_EQ(velmora::choosePace(fast, obd::ObdProtocolJ1850, 2003).pidsPerRequest, 1U);
+    EXPECT_EQ(velmora::carefulPace(obd::ObdProtocolJ1850).gap.count(), 100);
 }
 
 } // namespace
