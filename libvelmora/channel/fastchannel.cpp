@@ -7,8 +7,8 @@ namespace velmora {
 
 namespace {
 
-// For a second piece behind a prompt, which some adapters send; at 9600 baud it is a few characters' time.
-constexpr WireTime grace{5};
+// For a second piece behind a prompt, which some adapters send; at 9600 baud it is one character's time.
+constexpr WireTime grace{1};
 // A sender waits for the exchange of another thread no longer than for a late prompt.
 constexpr WireTime longestTurn{6000};
 constexpr WireTime turnSlice{100};
@@ -148,7 +148,6 @@ void FastChannel::publish()
     m_working.countingWorks = m_learner.works();
     m_working.countingOff = m_learner.isOff();
     m_working.slowestReplyMs = static_cast<unsigned int>(m_slowest.count());
-    m_working.waitMs.reset();
     if (m_waitSteps != 0) {
         m_working.waitMs = static_cast<unsigned int>(m_waitSteps * stepMs);
     }

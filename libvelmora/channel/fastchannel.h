@@ -181,6 +181,7 @@ private:
     bool m_protocolTried = false;
     unsigned int m_waitSteps = 0;  // of 4.096 ms, where the channel has shortened the wait
     unsigned int m_waitBefore = 0; // what a wait that was given back had been
+    bool m_waitsLong = false;      // the adapter does not adapt its wait behind replies
     WireTime m_slowest{0};
     std::vector<AddressStep> m_restore; // takes back the address that is in force
     int m_addressFailures = 0;          // of modules' own addresses

@@ -26,6 +26,10 @@ void FastChannel::begin(std::string const& text)
     if (m_connected && m_memory.isOn()) {
         m_memory.stop();
     }
+    if (m_connected && m_waitSteps != 0 && !m_waitsLong) {
+        giveWaitBack();
+        m_waitBefore = 0;
+    }
     if (std::optional<std::string> const known = m_memory.recall(pending.command)) {
         ++m_working.fromMemory;
         m_ready.push_back(*known);

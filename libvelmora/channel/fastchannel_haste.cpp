@@ -13,7 +13,7 @@ namespace {
 constexpr WireTime ownCommandLimit{700};
 constexpr double adapterStepMs = 4.096;
 constexpr unsigned int shortestWaitSteps = 25; // 102.4 ms: what STN adapters have by default
-constexpr WireTime worthShortening{150};       // adapters that adapt their wait need no other
+constexpr WireTime longWait{150};              // behind a reply: adapters that adapt it wait less
 constexpr int j1850Pwm = 1;
 
 unsigned int stepsOf(std::string const& setting)
@@ -102,7 +102,9 @@ bool FastChannel::fallsBackToSearch(HealedReply const& reply)
 }
 
 // A module that was discovered has said nothing while the wait was shorter than the core has set it: the first time
-// that this request shows that, it gets the full wait.
+// that this request shows that, it gets the full wait. An adapter that adapts its wait behind replies by itself loses
+// none behind a reply. Masks that nobody answers while the connection is brought up are taken at their word: the
+// modules have just shown how fast they are, and services that none of them has are the rule.
 bool FastChannel::needsFullWait(HealedReply const& reply) const
 {
     if (m_waitSteps == 0 || !m_pending->command.onlyReads() || m_verified.contains(m_pending->key)) {
@@ -111,22 +113,27 @@ bool FastChannel::needsFullWait(HealedReply const& reply) const
     if (m_pending->addressed) {
         return m_pending->module && !reply.spoke.contains(*m_pending->module);
     }
+    if (reply.spoke.empty()) {
+        return m_connected || !m_pending->command.asksForMask();
+    }
     std::set<unsigned int> const& modules = m_memory.modules();
-    return !std::includes(reply.spoke.begin(), reply.spoke.end(), modules.begin(), modules.end());
+    return m_waitsLong && !std::includes(reply.spoke.begin(), reply.spoke.end(), modules.begin(), modules.end());
 }
 
 // Not under what an adapter has by default, not under twice the slowest reply, never on a K line, where a wait that is
-// too short makes the adapter talk over a module that still answers.
+// too short makes the adapter talk over a module that still answers. An adapter that adapts its wait by itself gains
+// too: for a request that nobody answers it waits all of ATST.
 void FastChannel::adaptWait(HealedReply const& reply)
 {
     if (!reply.answered || reply.notices || m_pending->woken || m_pending->addressed) {
         return; // the time of a search, of a bus start or of a lost prompt is no module's; an address has its own wait
     }
     m_slowest = std::max(m_slowest, m_pending->dataAt - m_pending->sentAt);
-    bool const waitsLong = m_waitSteps != 0 || m_wire->now() - m_pending->dataAt > worthShortening;
     unsigned int const full = stepsOf(m_state.setting("ATST"));
+    m_waitsLong = m_waitsLong || (m_waitSteps == 0 && m_wire->now() - m_pending->dataAt > longWait);
+    bool const pays = m_waitsLong || !m_connected;
     bool const kLine = m_state.shownBus() == BusKind::Iso9141 || m_state.shownBus() == BusKind::Kwp;
-    if (!m_options.shortWait || !waitsLong || kLine || full == 0 || m_pending->verifying) {
+    if (!m_options.shortWait || !pays || kLine || full == 0 || m_pending->verifying) {
         return;
     }
     auto const twice =

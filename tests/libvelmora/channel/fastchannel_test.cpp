@@ -25,7 +25,7 @@ TEST(FastChannel, AReceiveThatCanBringNothingEndsAfterAShortGrace)
     std::vector<unsigned char> bytes;
     EXPECT_FALSE(rig.channel.receive(bytes, 200));
     EXPECT_LE(rig.wire->now() - before, WireTime(5));
-    rig.wire->say("more\r>", WireTime(3)); // a second piece
+    rig.wire->say("more\r>", WireTime(1)); // a second piece
     EXPECT_TRUE(rig.channel.receive(bytes, 200));
 }
 
@@ -113,6 +113,19 @@ TEST(FastChannel, APromptWithoutAReplyIsNotTakenForOne)
     ChannelRig rig;
     rig.wire->on("ATL0", ScriptedReply{{">"}, {"OK\r\r>", WireTime(20)}});
     EXPECT_THAT(rig.ask("ATL0"), Optional(std::string("OK")));
+    EXPECT_EQ(rig.met(Habit::EmptyReply), 1U);
+}
+
+TEST(FastChannel, WhatWasSaidUnaskedIsNobodysReply)
+{
+    ChannelRig rig;
+    rig.connect();
+    rig.wire->on("010C", engineSpeed);
+    rig.wire->say("BUS ERROR\r\r>", WireTime(10));
+    rig.wire->read(rig.wire->now());
+    rig.wire->say("7E803410D20\r\r>", WireTime(0));
+    rig.wire->say("7E80341", WireTime(0));
+    EXPECT_THAT(rig.ask("010C"), Optional(engineSpeed));
 }
 
 TEST(FastChannel, AnAdapterThatResetItselfIsSetUpAgainOnce)

@@ -187,12 +187,12 @@ TEST(BringUp, MasksThatWereAskedAreAnsweredFromMemoryUntilTheSessionStands)
     for (char const* request : {"0100", "0900", "0120", "0101", "0100", "0900", "0120", "0101"}) {
         EXPECT_NE(rig.ask(request), std::nullopt);
     }
-    EXPECT_THAT(rig.wire->takeCommands(), ElementsAre("0100", "0900", "0120", "0101", "0120", "0101"))
+    EXPECT_THAT(rig.wire->takeCommands(), ElementsAre("0100", "ATST19", "0900", "0120", "0101", "0120", "0101"))
         << "a reply without a module, or that is no mask, is not remembered";
     EXPECT_EQ(rig.channel.statistics().fromMemory, 2U);
     rig.channel.onConnected();
     rig.ask("0100");
-    EXPECT_THAT(rig.wire->takeCommands(), ElementsAre("0100"));
+    EXPECT_THAT(rig.wire->takeCommands(), ElementsAre("ATST64", "0100"));
 }
 
 TEST(BringUp, TheBusOfTheLastVisitIsTriedFirstAndASearchFollowsIfItIsNot)
@@ -286,7 +286,7 @@ TEST(ShortWait, FollowsALongOneAndIsGivenBackForASilentModule)
     EXPECT_THAT(rig.wire->takeCommands(), ElementsAre("ATST64"));
 }
 
-TEST(ShortWait, IsNotForKLinesNorForAdaptersThatAdaptThemselves)
+TEST(ShortWait, IsNotForKLines)
 {
     ChannelRig kLine;
     kLine.wire->on("0100", saidSlowly("86F1114100BE3EB81134", 400));
@@ -295,12 +295,28 @@ TEST(ShortWait, IsNotForKLinesNorForAdaptersThatAdaptThemselves)
     kLine.wire->takeCommands();
     kLine.ask("0100");
     EXPECT_THAT(kLine.wire->takeCommands(), ElementsAre("0100"));
-    ChannelRig adaptive;
-    adaptive.wire->on("0100", saidSlowly("7E8064100BE3EA813", 60));
-    adaptive.bringUp();
-    adaptive.wire->takeCommands();
-    adaptive.ask("0100");
-    EXPECT_THAT(adaptive.wire->takeCommands(), ElementsAre("0100"));
+}
+
+// An adapter that adapts its wait behind replies still gives silence all of ATST.
+TEST(ShortWait, OfAnAdapterThatAdaptsItselfIsForTheBringUpOnly)
+{
+    ChannelRig rig;
+    rig.wire->on("0100", saidSlowly("7E8064100BE3EA813\r7E906410080000001", 60)).on("0800", "NO DATA");
+    rig.wire->on("0101", "NO DATA").on("0120", saidSlowly("7E8064120A007F011", 60));
+    rig.bringUp();
+    rig.wire->takeCommands();
+    for (char const* request : {"0100", "0800", "0120"}) {
+        rig.ask(request);
+    }
+    EXPECT_THAT(rig.wire->takeCommands(), ElementsAre("0100", "ATST19", "0800", "0120"));
+    rig.ask("0101");
+    EXPECT_THAT(rig.wire->takeCommands(), ElementsAre("0101", "ATST64", "0101", "ATST19"))
+        << "no mask: the full wait once";
+    rig.channel.onConnected();
+    rig.ask("0800");
+    rig.ask("0100");
+    EXPECT_THAT(rig.wire->takeCommands(), ElementsAre("ATST64", "0800", "0100"));
+    EXPECT_EQ(rig.channel.statistics().waitMs, 102U) << "what was done is told all the same";
 }
 
 TEST(ShortWait, IsNeverUnderTwiceTheSlowestReply)
