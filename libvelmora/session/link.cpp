@@ -4,14 +4,21 @@
 
 namespace velmora {
 
-Link::Link(std::unique_ptr<IPort> port, ChannelOptions options, std::shared_ptr<LearntStore> learnt)
+Link::Link(std::unique_ptr<IPort> port, ChannelOptions options, std::shared_ptr<LearntStore> learnt, Maker const& make)
     : m_wire(std::make_shared<PortWire>(std::move(port))),
-      m_channel(std::make_shared<FastChannel>(m_wire, std::move(options), std::move(learnt)))
+      m_channel(std::make_shared<FastChannel>(m_wire, std::move(options), std::move(learnt))),
+      m_connection(make ? make(m_wire) : m_channel)
 {}
 
 Link::~Link()
 {
     cut();
+}
+
+IChannelControl& Link::control() const
+{
+    auto* const made = dynamic_cast<IChannelControl*>(m_connection.get());
+    return made != nullptr ? *made : *m_channel;
 }
 
 void Link::cut()

@@ -4,6 +4,7 @@
 #include "libvelmora/channel/portwire.h"
 #include "libvelmora/port/iport.h"
 
+#include <functional>
 #include <memory>
 
 namespace velmora {
@@ -12,15 +13,19 @@ namespace velmora {
 class Link
 {
 public:
-    Link(std::unique_ptr<IPort> port, ChannelOptions options, std::shared_ptr<LearntStore> learnt);
+    // What the library opens in place of the channel; null for the channel.
+    using Maker = std::function<std::shared_ptr<obd::IDataConnection>(std::shared_ptr<IWire> const& wire)>;
+
+    Link(std::unique_ptr<IPort> port, ChannelOptions options, std::shared_ptr<LearntStore> learnt,
+         Maker const& make = nullptr);
     ~Link();
     Link(Link const&) = delete;
     Link& operator=(Link const&) = delete;
 
     // What the library opens.
-    std::shared_ptr<obd::IDataConnection> connection() const { return m_channel; }
+    std::shared_ptr<obd::IDataConnection> connection() const { return m_connection; }
     // What it is told beside the bytes, and what it tells.
-    IChannelControl& control() const { return *m_channel; }
+    IChannelControl& control() const;
     // Ends all waiting on the link for good. Any thread.
     void cut();
     // Whether the port was lost, or the adapter can't be kept at work, rather than the link being cut here.
@@ -29,6 +34,7 @@ public:
 private:
     std::shared_ptr<PortWire> m_wire;
     std::shared_ptr<FastChannel> m_channel;
+    std::shared_ptr<obd::IDataConnection> m_connection;
 };
 
 } // namespace velmora

@@ -214,7 +214,8 @@ void Session::openLink()
     options.counting = !recorded;
     options.shortWait = !recorded;
     // What is simulated in this process is no adapter that somebody comes back to.
-    m_link = std::make_unique<Link>(std::move(port), std::move(options), inProcess ? nullptr : std::move(learnt));
+    m_link = std::make_unique<Link>(std::move(port), std::move(options), inProcess ? nullptr : std::move(learnt),
+                                    m_options.makeChannel);
 }
 
 void Session::tellProgress(std::string const& lines) const

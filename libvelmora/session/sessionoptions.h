@@ -9,7 +9,13 @@
 #include <optional>
 #include <string>
 
+namespace obd {
+class IDataConnection;
+}
+
 namespace velmora {
+
+class IWire;
 
 // What a session is to use; the settings file fills what stays empty.
 struct SessionOptions
@@ -28,6 +34,10 @@ struct SessionOptions
 
     // Opens a transport in place of the port, whose text is then its name only.
     std::function<std::unique_ptr<IPort>()> openPort;
+
+    // Makes what stands between the library and the open port in place of the fast and healing channel, to be compared
+    // with it; null for that channel.
+    std::function<std::shared_ptr<obd::IDataConnection>(std::shared_ptr<IWire> const& wire)> makeChannel;
 
     // Told what the session is at, each time as lines with their line feeds; null for nobody. On the thread that
     // calls the session.
