@@ -87,14 +87,14 @@ ClassifiedLine classifyLine(std::string_view line)
         return {LineKind::Notice, true, {}};
     }
     LineKind kind = LineKind::Text;
-    if (text.find("<DATAERROR") != std::string::npos || text.find("<RXERROR") != std::string::npos) {
+    if (isAllHex(text)) { // no word of trouble is
+        kind = LineKind::Data;
+    } else if (text.find("<DATAERROR") != std::string::npos || text.find("<RXERROR") != std::string::npos) {
         kind = LineKind::Flagged;
     } else if (holdsError(text)) {
         kind = LineKind::Error;
     } else if (text == "?") {
         kind = LineKind::Refused;
-    } else if (isAllHex(text)) {
-        kind = LineKind::Data;
     }
     return {kind, hadNotice, text};
 }

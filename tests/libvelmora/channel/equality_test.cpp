@@ -5,6 +5,7 @@
 #include "libvelmora/channel/fastchannel.h"
 #include "simulator/simulation.h"
 #include "tests/support/dialoguefolder.h"
+#include "tests/support/fakeclock.h"
 #include "tests/support/memorysettings.h"
 #include "tests/support/peerconnection.h"
 #include "tests/support/peerwire.h"
@@ -14,7 +15,11 @@
 #include <obd/iecu.h>
 #include <obd/iobdproxy.h>
 #include <obd/iobdvelmora.h>
+#include <obd/ivelmorasettings.h>
 #include <obd/obdvelmorabuilder.h>
+#include <obd/parameterfactory.h>
+#include <obd/powertrainparameter.h>
+#include <obd/sensorvalue.h>
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -28,6 +33,8 @@ namespace velmora {
 namespace {
 
 using RequestBytes = std::vector<unsigned char>;
+
+constexpr unsigned char firstDerived = 0xF0;
 
 // What came of each request, in their order; empty if the connection did not come to stand.
 using Outcome = std::vector<std::string>;
@@ -63,9 +70,34 @@ protected:
                 outcome.push_back(outcomeText(request, status, responses));
                 at += std::chrono::seconds(20);
             }
+            for (std::shared_ptr<obd::IEcu> const& ecu : proxy->ecus()) {
+                for (unsigned char const id : ecu->supportedIds(obd::ObdMode::CurrentData, 0)) {
+                    if (id >= firstDerived) { // asks several at moments of its own
+                        continue;
+                    }
+                    passUntil(at);
+                    outcome.push_back(valueText(proxy, *ecu, id));
+                    at += std::chrono::seconds(20);
+                }
+            }
         }
         manager.closeConnection();
         return outcome;
+    }
+
+    // What a parameter of a module tells, as a reader of it sees it.
+    std::string valueText(std::shared_ptr<obd::IObdProxy> const& proxy, obd::IEcu& ecu, unsigned char pid)
+    {
+        auto const parameter =
+            obd::ParameterFactory().createParameter(ecu, *m_obd->getSettings(), obd::ParameterIdentifier(pid).id());
+        std::string text = std::to_string(ecu.id()) + "/" + std::to_string(pid);
+        if (parameter == nullptr || parameter->update(proxy) != obd::IQuery::UpdateStatus::UpdateOk) {
+            return text + " not told";
+        }
+        for (std::shared_ptr<obd::SensorValue> const& value : parameter->values(ecu, obd::UnitSystem::Metric)) {
+            text += " " + value->textualValue();
+        }
+        return text;
     }
 
     Outcome readPlain(std::shared_ptr<obdsim::IPeer> peer, Requests const& requests)
@@ -86,6 +118,7 @@ protected:
         return outcome;
     }
 
+    support::FakeClock m_clock; // the pauses of the library take no time
     std::shared_ptr<obd::IObdVelmora> m_obd =
         obd::ObdVelmoraBuilder::createObdVelmora(0, 0, 0, std::make_shared<support::MemorySettings>());
     unsigned int m_counted = 0;

@@ -1,6 +1,7 @@
 // An adapter that lies: it cuts replies at another count than it was told, brings a reply with the next request,
 // forgets every fiftieth prompt and loses characters. No value may ever stand under the wrong sensor.
 
+#include "libobd/message/messageparser.h"
 #include "libvelmora/channel/fastchannel.h"
 #include "tests/libvelmora/channel/channelrig.h"
 
@@ -31,7 +32,8 @@ std::size_t dataBytes(unsigned int pid)
 class LyingWire : public IWire
 {
 public:
-    explicit LyingWire(unsigned int seed) : m_random(seed) {}
+    // severity: how many times as often as it should be.
+    LyingWire(unsigned int seed, unsigned int severity) : m_random(seed), m_severity(severity) {}
 
     void write(std::string_view bytes) override
     {
@@ -65,7 +67,7 @@ public:
 private:
     bool happens(unsigned int oneIn)
     {
-        bool const does = m_random() % oneIn == 0;
+        bool const does = m_random() % std::max(oneIn / m_severity, 2U) == 0;
         faults += does ? 1 : 0;
         return does;
     }
@@ -114,7 +116,8 @@ private:
             m_held.assign(lines.begin() + static_cast<std::ptrdiff_t>(m_random() % (lines.size() + 1)), lines.end());
             lines.resize(lines.size() - m_held.size());
         }
-        lines.insert(happens(3) ? lines.end() : lines.begin(), late.begin(), late.end());
+        bool const behind = m_random() % 3 == 0; // in its place it is one fault with the loss before
+        lines.insert(behind ? lines.end() : lines.begin(), late.begin(), late.end());
         say(lines, told);
     }
 
@@ -142,40 +145,18 @@ private:
     }
 
     std::mt19937 m_random;
+    unsigned int const m_severity;
     std::multimap<WireTime, std::string> m_output;
     std::vector<std::string> m_held;
     std::string m_line;
     WireTime m_now{1000};
 };
 
-// Reads the frames of one module as a strict reader does; its values only, each under the PID that its message names.
-std::map<unsigned int, std::vector<std::uint8_t>> valuesOf(std::string const& text, unsigned int asked)
+// What the library reads under a PID, by module.
+obd::ResponseMap valuesOf(std::string const& reply, unsigned int asked)
 {
-    std::map<unsigned int, std::vector<std::uint8_t>> values;
-    std::map<unsigned int, std::vector<std::uint8_t>> open;
-    std::size_t at = 0;
-    auto const byte = [&text](std::size_t i) {
-        return static_cast<std::uint8_t>(std::stoul(text.substr(i, 2), nullptr, 16));
-    };
-    while (at + 5 <= text.size()) {
-        unsigned int const module = static_cast<unsigned int>(std::stoul(text.substr(at, 3), nullptr, 16));
-        std::size_t const type = byte(at + 3) >> 4U;
-        std::size_t const count = type == 0 ? byte(at + 3) : type == 1 ? 7U : 7U;
-        std::vector<std::uint8_t> data;
-        for (std::size_t i = 0; i < count && at + 5 + 2 * i + 2 <= text.size(); ++i) {
-            data.push_back(byte(at + 5 + 2 * i));
-        }
-        at += 5 + 2 * count;
-        if (type == 0) {
-            values[module] = data;
-        } else if (type == 1) {
-            values.erase(module);
-            open[module].assign(data.begin() + 1, data.end());
-        } else {
-            open[module].insert(open[module].end(), data.begin(), data.end());
-            values[module] = open[module];
-        }
-    }
+    obd::ResponseMap values;
+    obd::MessageParser::parseResponseMessage(obd::ObdProtocolCan11, {reply.begin(), reply.end()}, values);
     std::erase_if(values, [asked](auto const& entry) {
         return entry.second.size() < 2 + dataBytes(asked) || entry.second[0] != 0x41 || entry.second[1] != asked;
     });
@@ -184,14 +165,22 @@ std::map<unsigned int, std::vector<std::uint8_t>> valuesOf(std::string const& te
 
 TEST(LyingAdapter, NoValueEverStandsUnderTheWrongSensorInAHundredThousandFaults)
 {
+    // One thread does it all, so that ThreadSanitizer has nothing to find that a tenth does not show.
+#ifdef __SANITIZE_THREAD__
+    constexpr int faultsInAll = 10000;
+#else
     constexpr int faultsInAll = 100000;
-    constexpr int faultsEach = 2500; // then a new adapter, since this one's counting is off by then
+#endif
+    constexpr int faultsEach = 500; // then a new adapter, since this one's counting is off by then
+    // A prompt dropped one time in fifty, and the like; and adapters that are worse than any real one, which make many
+    // faults in little time and meet two of them at once.
+    constexpr unsigned int severities[] = {1, 4, 4, 8, 8};
     int faults = 0;
     long answered = 0;
     long values = 0;
     unsigned int counted = 0;
     for (unsigned int seed = 1; faults < faultsInAll; ++seed) {
-        auto const wire = std::make_shared<LyingWire>(seed);
+        auto const wire = std::make_shared<LyingWire>(seed, severities[seed % std::size(severities)]);
         FastChannel channel(wire, {});
         for (char const* command : {"ATI", "ATE0", "ATST64", "ATTP0", "ATDPN", "ATH1"}) {
             test::speak(channel, command, 700);
@@ -215,9 +204,11 @@ TEST(LyingAdapter, NoValueEverStandsUnderTheWrongSensorInAHundredThousandFaults)
         faults += wire->faults;
         counted += channel.statistics().counted;
     }
-    EXPECT_GT(answered, 100000);
-    EXPECT_GT(values, answered) << "two modules answer most of the time";
-    EXPECT_GT(counted, 100U) << "the counting was on trial, too";
+    EXPECT_GT(answered, faultsInAll / 2);
+    EXPECT_GT(values, faultsInAll / 2);
+    EXPECT_GT(counted, static_cast<unsigned int>(faultsInAll) / 100) << "the counting was on trial, too";
+    RecordProperty("faults", faults);
+    RecordProperty("values", std::to_string(values));
 }
 
 } // namespace

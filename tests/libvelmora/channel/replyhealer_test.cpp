@@ -29,6 +29,11 @@ HabitCase const habitCases[] = {
      "86F1114100BE3EB81134\r", Habit::Notice},
     {"line feeds, and a junk byte on a line of its own", BusKind::Can11, "010C", "\xFC\r\n7E804410C1AF8\r\n\r\n",
      "7E804410C1AF8\r", Habit::StrayBytes},
+    {"unpadded frames of two modules, mixed", BusKind::Can11, "0904",
+     "7E8100F490401303132\r7E9100F490401413132\r7E82133343536373839\r7E92133343536373839\r7E8223031\r7E9223031\r\r",
+     "7E8100F490401303132\r7E9100F490401413132\r7E82133343536373839\r7E92133343536373839\r"
+     "7E82230310000000000\r7E92230310000000000\r",
+     Habit::ShortLastFrame},
     {"a junk byte inside a line that is whole without it", BusKind::Can11, "010C",
      "7E80441\xFE\x30\x43\x31\x41\x46\x38"
      "000000\r\r",
@@ -116,6 +121,18 @@ TEST(ReplyHealer, WhatIsNotAWholeAnswerIsNotWhole)
         ReplyHealer healer(counts);
         EXPECT_FALSE(healer.heal(raw, {ElmCommand("010C"), "010C", BusKind::Can11, true}).whole()) << raw;
     }
+}
+
+// A NUL means nothing by the data sheet, so that the line that it stands in is trusted.
+TEST(ReplyHealer, ANulIsTakenOut)
+{
+    HabitCounts counts{};
+    ReplyHealer healer(counts);
+    std::string const raw("7E80441\0"
+                          "0C1AF8\r",
+                          15);
+    EXPECT_EQ(healer.heal(raw, {ElmCommand("010C"), "010C", BusKind::Can11, true}).text(), "7E804410C1AF8\r");
+    EXPECT_EQ(counts[static_cast<std::size_t>(Habit::StrayBytes)], 1U);
 }
 
 // Two frames with the same number and other data: nothing tells which of them is right.
