@@ -68,6 +68,19 @@ std::optional<DoctorCheck> judgeVoltage(std::string const& reply)
         text + (volts >= engineRuns ? ": the battery is charged, the engine runs" : ": the engine is off"), ""};
 }
 
+std::optional<DoctorCheck> judgeIgnition(std::string const& reply)
+{
+    if (reply == "ON") {
+        return DoctorCheck{"ignition", Verdict::Good, "on, by the adapter's pin", ""};
+    }
+    if (reply == "OFF") {
+        // Few boards wire the pin, so that this alone is no fault.
+        return DoctorCheck{"ignition", Verdict::Note, "off, by the adapter's pin, which few boards connect",
+                           "switch the ignition on if no control module answers"};
+    }
+    return std::nullopt;
+}
+
 bool checkAdapter(AdapterTalk& talk, DoctorReport& report)
 {
     std::optional<std::string> identity = talk.ask("ATI", answerLimit);
@@ -95,6 +108,9 @@ bool checkAdapter(AdapterTalk& talk, DoctorReport& report)
     report.checks.push_back(
         judgeVoltage(volts.value_or(""))
             .value_or(DoctorCheck{"voltage", Verdict::Note, "the adapter does not tell the voltage", ""}));
+    if (std::optional<DoctorCheck> const ignition = judgeIgnition(ask("ATIGN").value_or(""))) {
+        report.checks.push_back(*ignition);
+    }
     return true;
 }
 

@@ -12,7 +12,7 @@ std::vector<CommandRow> const& commandRows()
         {"1.0", "ATI", false, true},    {"2.2", "ATIA", false, false},  {"1.4", "ATIGN", false, true},
         {"1.3", "ATKW", false, true},   {"1.1", "ATPPS", false, true},  {"1.4", "ATRD", false, true},
         {"1.0", "ATRV", false, true},   {"1.0", "ATAL", true, true},    {"1.2", "ATAR", true, true},
-        {"1.2", "ATAT0", true, true},   {"1.2", "ATAT1", true, true},   {"1.2", "ATAT2", true, true},
+        {"1.2", "ATAT0", true, true},   {"1.2", "ATAT2", true, true},   {"1.2", "ATAT1", true, true},
         {"1.2", "ATBRT0F", true, true}, {"2.3", "ATC1", true, false},   {"1.0", "ATCAF1", true, true},
         {"1.4", "ATCEA", true, true},   {"1.0", "ATCFC1", true, true},  {"1.0", "ATCP18", true, true},
         {"1.4b", "ATCRA", true, true},  {"1.4b", "ATCSM1", true, true}, {"2.1", "ATCTM1", true, false},

@@ -79,6 +79,7 @@ DoctorReport examine(Session& session, DialogueRecorder& recorder)
         }
         report.checks.push_back(
             {"bus", Verdict::Bad, error.what(), error.hints().empty() ? std::string() : error.hints().front()});
+        noteHabits(session, report);
         session.disconnect();
         if (error.kind() == ErrorKind::VehicleSilent) {
             checkBuses(*openTalk(address, recorder), report);
@@ -86,6 +87,7 @@ DoctorReport examine(Session& session, DialogueRecorder& recorder)
         return report;
     }
     checkVehicle(session, report);
+    noteHabits(session, report);
     return report;
 }
 

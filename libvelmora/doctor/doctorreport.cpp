@@ -68,6 +68,9 @@ std::string toText(DoctorReport const& report)
     if (!report.missing.empty()) {
         text += fmt::format("Commands that are missing: {}\n", fmt::join(report.missing, ", "));
     }
+    for (auto const& [habit, times] : report.habits) {
+        text += fmt::format("Met on the way: {}, {}x\n", habit, times);
+    }
     if (report.figures) {
         text += "\n" + toText(*report.figures);
     }
@@ -86,7 +89,15 @@ Json toJson(DoctorReport const& report)
                           {"finding", check.finding},
                           {"advice", textOrNull(check.advice)}});
     }
-    Json json = {{"checks", checks}, {"missing", report.missing}, {"figures", nullptr}, {"verdict", report.verdict()}};
+    Json habits = Json::array();
+    for (auto const& [habit, times] : report.habits) {
+        habits.push_back({{"habit", habit}, {"times", times}});
+    }
+    Json json = {{"checks", checks},
+                 {"missing", report.missing},
+                 {"habits", habits},
+                 {"figures", nullptr},
+                 {"verdict", report.verdict()}};
     if (report.figures) {
         DoctorFigures const& figures = *report.figures;
         json["figures"] = {{"requests", figures.requests},

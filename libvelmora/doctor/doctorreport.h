@@ -4,6 +4,7 @@
 
 #include <optional>
 #include <string>
+#include <utility>
 #include <vector>
 
 namespace velmora {
@@ -42,6 +43,8 @@ struct DoctorReport
 {
     std::vector<DoctorCheck> checks; // along the chain, up to the first link that is dead
     std::optional<DoctorFigures> figures;
+    // Habits of adapter and vehicle that were met, and how often: what was dropped or healed on the way.
+    std::vector<std::pair<std::string, unsigned int>> habits;
     std::vector<std::string> missing; // commands that the adapter's version should know and this one does not
 
     bool isHealthy() const;

@@ -82,6 +82,32 @@ TEST(DoctorVoltage, IsJudgedByWhatItMeans)
     EXPECT_FALSE(velmora::judgeVoltage("").has_value());
 }
 
+TEST(DoctorIgnition, IsWhatThePinSaysAndNoFaultAlone)
+{
+    EXPECT_EQ(velmora::judgeIgnition("ON")->verdict, Verdict::Good);
+    EXPECT_EQ(velmora::judgeIgnition("OFF")->verdict, Verdict::Note);
+    EXPECT_FALSE(velmora::judgeIgnition("?").has_value());
+}
+
+// What the matrix sends stays in force where no later row gives it back.
+TEST(CommandMatrix, LeavesNoSettingThatTheAdapterWouldNotHaveAnyway)
+{
+    std::vector<std::string> sent;
+    velmora::probeCommands(
+        [&sent](std::string const& command) {
+            sent.push_back(command);
+            return "?";
+        },
+        "ELM327 v2.3", false);
+    EXPECT_EQ(sent.front(), "ATQQ");
+    auto const last = [&sent](std::string const& word) {
+        return *std::find_if(sent.rbegin(), sent.rend(), [&](auto const& each) { return each.starts_with(word); });
+    };
+    EXPECT_EQ(last("ATAT"), "ATAT1");
+    EXPECT_EQ(last("ATCAF"), "ATCAF1");
+    EXPECT_GT(std::find(sent.begin(), sent.end(), "ATNL"), std::find(sent.begin(), sent.end(), "ATAL"));
+}
+
 class DoctorTest : public testing::Test
 {
 protected:
@@ -125,6 +151,11 @@ TEST_F(DoctorTest, AHealthyChainIsMeasured)
     EXPECT_EQ(report.figures->pidsPerRequest, 6U);
     EXPECT_GE(report.figures->longestReply, 20U); // the identification number
     EXPECT_GT(report.figures->valuesPerSecond, 0.0);
+    EXPECT_TRUE(has(report, "ignition", "on")) << toText(report);
+    EXPECT_EQ(toJson(report)["habits"].size(), report.habits.size());
+    EXPECT_TRUE(std::any_of(report.habits.begin(), report.habits.end(), [](auto const& each) {
+        return each.first == "notices in front of data";
+    })) << toText(report);
     EXPECT_NE(m_bundle.find("Everything works"), std::string::npos);
     EXPECT_NE(m_bundle.find("0902"), std::string::npos);
 }
