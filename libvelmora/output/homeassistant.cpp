@@ -16,7 +16,7 @@ namespace {
 struct UnitRow
 {
     std::string_view ours;
-    char const* theirs;
+    char const* theirs;      // null for none
     char const* deviceClass; // null for none
 };
 
@@ -42,7 +42,17 @@ constexpr UnitRow unitRows[] = {
     {"l/h", "L/h", "volume_flow_rate"},
     {"l", "L", "volume_storage"},
     {"l/100 km", "L/100km", nullptr},
+    {"lambda", nullptr, nullptr},
 };
+
+constexpr std::string_view barometer = "0133";
+
+// What only rises until it begins anew: a statistic of differences then, not of means.
+bool isCounter(SensorEntry const& sensor)
+{
+    constexpr std::string_view runTime = "011F"; // since the engine's start
+    return sensor.unit == "km" || sensor.unit == "mi" || sensor.pid == runTime;
+}
 
 nlohmann::ordered_json device(HomeAssistantPlace const& place)
 {
@@ -60,10 +70,12 @@ nlohmann::ordered_json component(HomeAssistantPlace const& place, SensorEntry co
     if (!sensor.unit.empty()) {
         auto const* const row = std::ranges::find(unitRows, sensor.unit, &UnitRow::ours);
         bool const known = row != std::end(unitRows);
-        entity["unit_of_measurement"] = known ? row->theirs : sensor.unit;
-        entity["state_class"] = "measurement";
+        if (!known || row->theirs != nullptr) {
+            entity["unit_of_measurement"] = known ? row->theirs : sensor.unit;
+        }
+        entity["state_class"] = isCounter(sensor) ? "total_increasing" : "measurement";
         if (known && row->deviceClass != nullptr) {
-            entity["device_class"] = row->deviceClass;
+            entity["device_class"] = sensor.pid == barometer ? "atmospheric_pressure" : row->deviceClass;
         }
     }
     return entity;

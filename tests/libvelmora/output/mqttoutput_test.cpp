@@ -65,6 +65,10 @@ TEST(MqttOutput, TellsHomeAssistantOfTheCar)
                                              {{0x7E8, "SPEED", "010D", "Speed", "km/h"},
                                               {0x7E8, "RPM", "010C", "Engine speed", "rpm"},
                                               {0x7E8, "FUEL_RATE", "015E", "Fuel", "l/h"},
+                                              {0x7E8, "RUN_TIME", "011F", "Time", "s"},
+                                              {0x7E8, "DISTANCE", "0131", "Distance", "km"},
+                                              {0x7E8, "BARO", "0133", "Barometer", "kPa"},
+                                              {0x7E8, "RATIO", "0144", "Ratio", "lambda"},
                                               {0x7E8, "X", "01C2", "Odd", "furlong"}}},
                          speed));
     ASSERT_TRUE(isEmptied(folder)); // connected
@@ -79,7 +83,13 @@ TEST(MqttOutput, TellsHomeAssistantOfTheCar)
     std::string const config = retained["homeassistant/device/velmora_van/config"];
     EXPECT_EQ(discoveryComplaint(folder, config), 0);
     EXPECT_NE(discoveryComplaint(folder, R"({"device":{}})"), 0);
-    EXPECT_EQ(nlohmann::json::parse(config)["components"]["7e8_speed"]["device_class"], "speed");
+    auto const components = nlohmann::json::parse(config)["components"];
+    EXPECT_EQ(components["7e8_speed"]["device_class"], "speed");
+    EXPECT_EQ(components["7e8_speed"]["state_class"], "measurement");
+    EXPECT_EQ(components["7e8_run_time"]["state_class"], "total_increasing");
+    EXPECT_EQ(components["7e8_distance"]["state_class"], "total_increasing");
+    EXPECT_EQ(components["7e8_baro"]["device_class"], "atmospheric_pressure");
+    EXPECT_FALSE(components["7e8_ratio"].contains("unit_of_measurement"));
     output.close();
     EXPECT_EQ(Subscriber(port, "-t cars/van/status", 1).lines(), std::vector<std::string>{"cars/van/status offline"});
 }
