@@ -43,7 +43,7 @@ TEST(RequestAddress, AModuleIsAddressedInsideTheExchangeOnly)
     EXPECT_FALSE(rig.channel.isValid()) << "an address that stays would hide the other modules";
 }
 
-struct AddressCase
+struct HeaderCase
 {
     char const* why;
     char protocol;
@@ -52,7 +52,7 @@ struct AddressCase
     std::vector<std::string> restore;
 };
 
-AddressCase const addressCases[] = {
+HeaderCase const headerCases[] = {
     {"a pair of the standard", '6', {.header = "7E1", .reply = "7E9"}, {"ATSH7E1", "ATCRA7E9"}, {"ATCRA", "ATSH7DF"}},
     {"another pair, with flow control and patience",
      '6',
@@ -77,7 +77,7 @@ AddressCase const addressCases[] = {
 
 TEST(RequestAddress, EachKindIsSetAndTakenBackInTheOppositeOrder)
 {
-    for (AddressCase const& row : addressCases) {
+    for (HeaderCase const& row : headerCases) {
         ChannelRig rig;
         rig.wire->on("ATDPN", std::string("A") + row.protocol);
         rig.connect();

@@ -25,7 +25,7 @@ namespace velmora {
 namespace {
 
 // A port of which nothing is wanted: the channels bring their own wire.
-class NoPort : public IPort
+class UnusedPort : public IPort
 {
 public:
     void start(Receiver /*onBytes*/, LossHandler /*onLost*/) override {}
@@ -42,7 +42,7 @@ protected:
         SessionOptions options;
         options.port = "a car";
         options.settingsFile = (m_folder.path() / "settings.toml").string();
-        options.openPort = [] { return std::make_unique<NoPort>(); };
+        options.openPort = [] { return std::make_unique<UnusedPort>(); };
         options.makeChannel = [&](std::shared_ptr<IWire> const&) -> std::shared_ptr<obd::IDataConnection> {
             auto const wire = std::make_shared<support::PeerWire>(peer);
             if (plain) {
