@@ -18,7 +18,7 @@ namespace velmora::cli {
 
 namespace {
 
-constexpr std::chrono::milliseconds endLimit{1200}; // for all outputs: a service manager's patience is short
+constexpr std::chrono::milliseconds endLimit{900}; // for all outputs: a service manager's patience is short
 
 WatchTime timeNow()
 {
