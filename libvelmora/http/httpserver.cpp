@@ -12,9 +12,10 @@
 #include <boost/beast/http.hpp>
 
 #include <algorithm>
-#include <map>
+#include <atomic>
 #include <set>
 #include <thread>
+#include <utility>
 
 namespace velmora {
 
@@ -24,21 +25,10 @@ namespace beast = boost::beast;
 namespace http = boost::beast::http;
 namespace net = boost::asio;
 using net::ip::tcp;
+constexpr int streamBuffer = 64 * 1024; // of the system, so that what a slow reader gets is not old
+
 using Reply = http::response<http::string_body>;
 using ErrorCode = boost::system::error_code;
-
-struct Route
-{
-    std::string path;
-    std::map<std::string, HttpServer::Handler> handlers; // by method
-    HttpServer::StreamGreeting greeting;                 // of a stream
-};
-
-bool fits(Route const& route, std::string const& path)
-{
-    bool const open = !route.path.empty() && route.path.back() == '*';
-    return open ? path.starts_with(std::string_view(route.path).substr(0, route.path.size() - 1)) : path == route.path;
-}
 
 HttpRequest toRequest(http::request<http::string_body> const& from)
 {
@@ -58,14 +48,6 @@ HttpRequest toRequest(http::request<http::string_body> const& from)
     return request;
 }
 
-HttpResponse plainResponse(unsigned int status, std::string const& text)
-{
-    HttpResponse response;
-    response.status = status;
-    response.body = text + "\n";
-    return response;
-}
-
 } // namespace
 
 struct HttpServer::Core
@@ -75,14 +57,15 @@ struct HttpServer::Core
     explicit Core(HttpLimits const& chosen) : limits(chosen) {}
 
     void accept();
-    Route const* find(std::string const& path) const;
-    HttpResponse answer(HttpRequest const& request) const;
+    template <typename Do>
+    void forReaders(std::string const& path, Do action) const;
 
     HttpLimits const limits;
-    std::vector<Route> routes; // does not change after start
+    HttpRoutes routes; // does not change after start
     net::io_context context{1};
     tcp::acceptor acceptor{context};
     std::set<std::shared_ptr<Client>> clients; // the server's thread, as what the clients hold
+    std::atomic<std::size_t> readers{0};       // of all streams
     std::thread thread;
 };
 
@@ -90,12 +73,15 @@ struct HttpServer::Core
 class HttpServer::Core::Client : public std::enable_shared_from_this<Client>
 {
 public:
-    Client(Core& core, tcp::socket socket) : m_core(core), m_stream(std::move(socket)), m_ping(core.context) {}
+    Client(Core& core, tcp::socket socket)
+        : m_core(core), m_stream(std::move(socket)), m_buffer(2 * core.limits.header), m_timer(core.context)
+    {}
 
     void read();
     void close();
-    bool reads(std::string const& path) const { return m_streamPath == path; }
+    bool reads(std::string const& path) const { return m_route != nullptr && m_route->path == path; }
     void publish(std::string const& event);
+    void publishLatest(std::string const& event);
 
 private:
     using Parser = http::request_parser<http::string_body>;
@@ -103,8 +89,10 @@ private:
     void onRead(ErrorCode const& error);
     void refuse(unsigned int status, std::string const& text);
     void reply(HttpResponse const& response, bool keepAlive, bool headOnly);
-    void beginStream(Route const& route, HttpRequest const& request);
+    void send(bool keepAlive, bool headOnly);
+    void beginStream(HttpRoutes::Route const& route, HttpRequest const& request);
     void writePending();
+    void catchUp();
     void schedulePing();
     void watchForEnd();
 
@@ -114,10 +102,13 @@ private:
     std::unique_ptr<Parser> m_parser;
     std::unique_ptr<Reply> m_reply;
     std::unique_ptr<http::response_serializer<http::string_body>> m_serializer;
-    std::string m_streamPath; // empty: no stream
-    std::string m_pending;    // events that wait
-    std::string m_writing;    // events under way
-    net::steady_timer m_ping;
+    HttpRoutes::Route const* m_route = nullptr; // of a stream
+    HttpRequest m_request;                      // that for the stream
+    std::string m_pending;                      // events that wait
+    std::string m_writing;                      // events under way
+    std::chrono::steady_clock::time_point m_writingSince;
+    bool m_behind = false;     // has missed some of publishLatest
+    net::steady_timer m_timer; // until a late reply, or the next ping
     char m_ignored = 0;
 };
 
@@ -134,10 +125,12 @@ void HttpServer::Core::Client::read()
 void HttpServer::Core::Client::close()
 {
     ErrorCode ignored;
-    m_ping.cancel();
+    m_timer.cancel();
     m_stream.socket().shutdown(tcp::socket::shutdown_both, ignored);
     m_stream.close();
-    m_core.clients.erase(shared_from_this());
+    if (m_core.clients.erase(shared_from_this()) > 0 && m_route != nullptr) {
+        --m_core.readers;
+    }
 }
 
 void HttpServer::Core::Client::onRead(ErrorCode const& error)
@@ -154,11 +147,11 @@ void HttpServer::Core::Client::onRead(ErrorCode const& error)
     } else {
         bool const keepAlive = m_parser->get().keep_alive();
         HttpRequest const request = toRequest(m_parser->release());
-        Route const* const route = m_core.find(request.path);
-        if (route != nullptr && route->greeting && request.method == "GET") {
-            beginStream(*route, request);
+        HttpRoutes::Route const* const stream = m_core.routes.stream(request);
+        if (stream != nullptr) {
+            beginStream(*stream, request);
         } else {
-            reply(m_core.answer(request), keepAlive, request.method == "HEAD");
+            reply(m_core.routes.answer(request), keepAlive, request.method == "HEAD");
         }
     }
 }
@@ -181,6 +174,21 @@ void HttpServer::Core::Client::reply(HttpResponse const& response, bool keepAliv
     m_reply->body() = response.body;
     m_reply->prepare_payload();
     m_serializer = std::make_unique<http::response_serializer<http::string_body>>(*m_reply);
+    if (response.delay.count() == 0) {
+        send(keepAlive, headOnly);
+        return;
+    }
+    m_stream.expires_never();
+    m_timer.expires_after(response.delay);
+    m_timer.async_wait([self = shared_from_this(), keepAlive, headOnly](ErrorCode const& error) {
+        if (!error) {
+            self->send(keepAlive, headOnly);
+        }
+    });
+}
+
+void HttpServer::Core::Client::send(bool keepAlive, bool headOnly)
+{
     auto const done = [self = shared_from_this(), keepAlive](ErrorCode const& error, std::size_t) {
         if (error || !keepAlive) {
             self->close();
@@ -196,9 +204,13 @@ void HttpServer::Core::Client::reply(HttpResponse const& response, bool keepAliv
     }
 }
 
-void HttpServer::Core::Client::beginStream(Route const& route, HttpRequest const& request)
+void HttpServer::Core::Client::beginStream(HttpRoutes::Route const& route, HttpRequest const& request)
 {
-    m_streamPath = route.path;
+    m_route = &route;
+    m_request = request;
+    ++m_core.readers;
+    ErrorCode ignored;
+    m_stream.socket().set_option(net::socket_base::send_buffer_size(streamBuffer), ignored);
     m_pending = "HTTP/1.1 200 OK\r\nContent-Type: text/event-stream\r\nCache-Control: no-store\r\n"
                 "X-Content-Type-Options: nosniff\r\nConnection: close\r\n\r\n";
     m_pending += route.greeting(request);
@@ -218,31 +230,56 @@ void HttpServer::Core::Client::publish(std::string const& event)
     writePending();
 }
 
+void HttpServer::Core::Client::publishLatest(std::string const& event)
+{
+    if (!m_writing.empty()) {
+        m_behind = true;
+        return;
+    }
+    publish(event);
+}
+
 void HttpServer::Core::Client::writePending()
 {
     if (!m_writing.empty() || m_pending.empty()) {
         return;
     }
     m_writing.swap(m_pending);
+    m_writingSince = std::chrono::steady_clock::now();
     net::async_write(m_stream.socket(), net::buffer(m_writing),
                      [self = shared_from_this()](ErrorCode const& error, std::size_t) {
                          self->m_writing.clear();
                          if (error) {
                              self->close();
                          } else {
+                             self->catchUp();
                              self->writePending();
                          }
                      });
 }
 
+void HttpServer::Core::Client::catchUp()
+{
+    if (std::exchange(m_behind, false) && m_route->catchUp) {
+        m_pending += m_route->catchUp(m_request);
+    }
+}
+
 void HttpServer::Core::Client::schedulePing()
 {
-    m_ping.expires_after(m_core.limits.streamPing);
-    m_ping.async_wait([self = shared_from_this()](ErrorCode const& error) {
-        if (!error && self->m_stream.socket().is_open()) {
-            self->publish(": \n\n");
-            self->schedulePing();
+    m_timer.expires_after(m_core.limits.streamPing);
+    m_timer.async_wait([self = shared_from_this()](ErrorCode const& error) {
+        if (error || !self->m_stream.socket().is_open()) {
+            return;
         }
+        bool const stuck = !self->m_writing.empty() &&
+                           std::chrono::steady_clock::now() - self->m_writingSince > self->m_core.limits.streamStall;
+        if (stuck) {
+            self->close();
+            return;
+        }
+        self->publish(": \n\n");
+        self->schedulePing();
     });
 }
 
@@ -274,40 +311,14 @@ void HttpServer::Core::accept()
     });
 }
 
-Route const* HttpServer::Core::find(std::string const& path) const
+template <typename Do>
+void HttpServer::Core::forReaders(std::string const& path, Do action) const
 {
-    Route const* best = nullptr;
-    for (Route const& each : routes) {
-        if (fits(each, path) && (best == nullptr || each.path.size() > best->path.size())) {
-            best = &each;
+    std::vector<std::shared_ptr<Client>> const now(clients.begin(), clients.end());
+    for (std::shared_ptr<Client> const& client : now) {
+        if (client->reads(path)) {
+            action(*client);
         }
-    }
-    return best;
-}
-
-HttpResponse HttpServer::Core::answer(HttpRequest const& request) const
-{
-    Route const* const route = find(request.path);
-    if (route == nullptr) {
-        return plainResponse(404, "There is nothing here");
-    }
-    auto found = route->handlers.find(request.method);
-    if (found == route->handlers.end() && request.method == "HEAD") {
-        found = route->handlers.find("GET");
-    }
-    if (found == route->handlers.end()) {
-        HttpResponse response = plainResponse(405, "This method does not work here");
-        std::string allowed = route->greeting ? "GET" : "";
-        for (auto const& [method, handler] : route->handlers) {
-            allowed += (allowed.empty() ? "" : ", ") + method;
-        }
-        response.headers.emplace_back("Allow", allowed);
-        return response;
-    }
-    try {
-        return found->second(request);
-    } catch (std::exception const& error) {
-        return plainResponse(500, error.what());
     }
 }
 
@@ -320,16 +331,17 @@ HttpServer::~HttpServer()
 
 void HttpServer::addRoute(std::string const& method, std::string const& path, Handler handler)
 {
-    auto found = std::ranges::find(m_core->routes, path, &Route::path);
-    if (found == m_core->routes.end()) {
-        found = m_core->routes.insert(found, Route{path, {}, {}});
-    }
-    found->handlers[method] = std::move(handler);
+    m_core->routes.add(method, path, std::move(handler));
 }
 
-void HttpServer::addStream(std::string const& path, StreamGreeting greeting)
+void HttpServer::addStream(std::string const& path, HttpEvents greeting, HttpEvents catchUp)
 {
-    m_core->routes.push_back(Route{path, {}, std::move(greeting)});
+    m_core->routes.addStream(path, std::move(greeting), std::move(catchUp));
+}
+
+void HttpServer::setGate(HttpGate gate)
+{
+    m_core->routes.setGate(std::move(gate));
 }
 
 void HttpServer::start(HttpPlace const& place)
@@ -360,13 +372,20 @@ unsigned short HttpServer::port() const
 void HttpServer::publish(std::string const& path, std::string const& event)
 {
     net::post(m_core->context, [core = m_core.get(), path, event] {
-        std::vector<std::shared_ptr<Core::Client>> const clients(core->clients.begin(), core->clients.end());
-        for (std::shared_ptr<Core::Client> const& client : clients) {
-            if (client->reads(path)) {
-                client->publish(event);
-            }
-        }
+        core->forReaders(path, [&event](Core::Client& client) { client.publish(event); });
     });
+}
+
+void HttpServer::publishLatest(std::string const& path, std::string const& event)
+{
+    net::post(m_core->context, [core = m_core.get(), path, event] {
+        core->forReaders(path, [&event](Core::Client& client) { client.publishLatest(event); });
+    });
+}
+
+std::size_t HttpServer::readers() const
+{
+    return m_core->readers;
 }
 
 void HttpServer::stop()

@@ -1,43 +1,23 @@
 #pragma once
 
+#include "libvelmora/http/httproutes.h"
+
 #include <chrono>
-#include <functional>
 #include <memory>
 #include <string>
-#include <utility>
-#include <vector>
 
 namespace velmora {
-
-struct HttpRequest
-{
-    std::string method;                                       // "GET"
-    std::string path;                                         // "/metrics", as sent, without what stands behind ?
-    std::string query;                                        // behind ?, as sent
-    std::vector<std::pair<std::string, std::string>> headers; // names in lower case
-    std::string body;
-
-    // Empty for a header that was not sent.
-    std::string header(std::string const& name) const;
-};
-
-struct HttpResponse
-{
-    unsigned int status = 200;
-    std::string contentType = "text/plain; charset=utf-8";
-    std::string body;
-    std::vector<std::pair<std::string, std::string>> headers; // further ones
-};
 
 // What a client may cost.
 struct HttpLimits
 {
-    std::size_t header = 8 * 1024;               // bytes
-    std::size_t body = 64 * 1024;                // bytes
-    std::size_t connections = 16;                // further ones are closed at once
-    std::chrono::milliseconds time{10000};       // for one request to come, one reply to go, and between requests
-    std::size_t streamBacklog = 256 * 1024;      // bytes that wait for a slow reader of a stream, who is cut off then
-    std::chrono::milliseconds streamPing{15000}; // a silent stream is kept alive that often
+    std::size_t header = 8 * 1024;                // bytes
+    std::size_t body = 64 * 1024;                 // bytes
+    std::size_t connections = 16;                 // further ones are closed at once
+    std::chrono::milliseconds time{10000};        // for one request to come, one reply to go, and between requests
+    std::size_t streamBacklog = 256 * 1024;       // bytes that wait for a slow reader of a stream, who is cut off then
+    std::chrono::milliseconds streamStall{20000}; // a reader who takes nothing for that long is cut off, too
+    std::chrono::milliseconds streamPing{15000};  // a silent stream is kept alive that often
 };
 
 // Where a server listens: "127.0.0.1:9100", "[::1]:9100". Port 0 takes any that is free. Throws Error for other texts.
@@ -52,10 +32,7 @@ HttpPlace parseHttpPlace(std::string const& text);
 class HttpServer
 {
 public:
-    // Runs on the server's thread, which it holds up; what it throws becomes a reply of 500.
-    using Handler = std::function<HttpResponse(HttpRequest const&)>;
-    // Events that a new reader of a stream gets first, made by event().
-    using StreamGreeting = std::function<std::string(HttpRequest const&)>;
+    using Handler = HttpHandler;
 
     explicit HttpServer(HttpLimits const& limits = {});
     // Stops.
@@ -67,7 +44,10 @@ public:
     // HEAD as well.
     void addRoute(std::string const& method, std::string const& path, Handler handler);
     // A path whose readers get what is published there, as server-sent events, for as long as they stay.
-    void addStream(std::string const& path, StreamGreeting greeting);
+    // greeting: what a new reader gets first. catchUp: what one gets who was too slow for publishLatest.
+    void addStream(std::string const& path, HttpEvents greeting, HttpEvents catchUp = nullptr);
+    // Asked before everything else.
+    void setGate(HttpGate gate);
 
     // Throws Error if the place can't be had.
     void start(HttpPlace const& place);
@@ -75,6 +55,11 @@ public:
     unsigned short port() const;
     // Sends an event to the readers of a stream; never waits. Any thread, after start.
     void publish(std::string const& path, std::string const& event);
+    // The same for what is soon out of date: a reader who has not taken the last events yet gets no more of them, and
+    // the stream's catchUp when he has.
+    void publishLatest(std::string const& path, std::string const& event);
+    // How many read streams now. Any thread.
+    std::size_t readers() const;
     void stop();
 
     // A server-sent event of that name, empty for none, with data of any number of lines.

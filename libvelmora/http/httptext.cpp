@@ -2,6 +2,7 @@
 
 #include <velmora/error.h>
 
+#include <algorithm>
 #include <charconv>
 
 namespace velmora {
@@ -46,6 +47,19 @@ std::string HttpRequest::header(std::string const& name) const
         }
     }
     return {};
+}
+
+std::size_t HttpRequest::count(std::string const& name) const
+{
+    return static_cast<std::size_t>(std::ranges::count(headers, name, [](auto const& each) { return each.first; }));
+}
+
+HttpResponse plainResponse(unsigned int status, std::string const& text)
+{
+    HttpResponse response;
+    response.status = status;
+    response.body = text + "\n";
+    return response;
 }
 
 std::string HttpServer::event(std::string const& name, std::string const& data)
