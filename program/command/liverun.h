@@ -74,6 +74,7 @@ private:
     std::string title() const;
     std::string status() const;
     FrameStyle style() const;
+    std::string big(FrameStyle& style) const;
 
     CommandSession& m_session;
     LiveOptions const m_options;
@@ -93,7 +94,9 @@ private:
     std::unique_ptr<Terminal> m_terminal; // null where lines are printed
     std::unique_ptr<SensorPicker> m_picker;
     std::size_t m_firstRow = 0;
-    std::string m_note; // in the status line, until the next key
+    bool m_big = true;   // digits that can be read from afar, where there is room
+    bool m_hold = false; // the screen stays as it is
+    std::string m_note;  // in the status line, until the next key
 };
 
 } // namespace velmora::cli

@@ -1,4 +1,5 @@
 #include "program/command/liverun.h"
+#include "program/view/livebig.h"
 #include "program/view/ratetext.h"
 #include "program/view/style.h"
 
@@ -36,7 +37,6 @@ void LiveRun::handleKey(Key key)
     switch (static_cast<int>(key)) {
     case 'q':
     case 'Q':
-    case static_cast<int>(Key::Escape):
         m_quit = true;
         break;
     case 'r':
@@ -44,6 +44,13 @@ void LiveRun::handleKey(Key key)
         break;
     case 'u':
         switchUnits();
+        break;
+    case 'b':
+        m_big = !m_big;
+        break;
+    case 'h':
+    case static_cast<int>(Key::Space):
+        m_hold = !m_hold;
         break;
     case 's':
         openPicker();
@@ -148,12 +155,14 @@ void LiveRun::switchUnits()
 
 int LiveRun::page() const
 {
-    return static_cast<int>(roomForRows(style()));
+    FrameStyle rest = style();
+    big(rest);
+    return static_cast<int>(roomForRows(rest));
 }
 
 void LiveRun::scroll(int lines)
 {
-    std::size_t const room = roomForRows(style());
+    auto const room = static_cast<std::size_t>(page());
     std::size_t const last = m_table.rows().size() > room ? m_table.rows().size() - room : 0;
     std::ptrdiff_t const wanted = static_cast<std::ptrdiff_t>(m_firstRow) + lines;
     m_firstRow = std::min(static_cast<std::size_t>(std::max(wanted, std::ptrdiff_t{0})), last);
@@ -162,7 +171,7 @@ void LiveRun::scroll(int lines)
 FrameStyle LiveRun::style() const
 {
     Terminal::Size const size = m_terminal->size();
-    return {size.columns, size.rows, outputStyle(m_session.options()).isColoured()};
+    return {size.columns, size.rows, outputStyle(m_session.options()).isColoured(), !Terminal::speaksUtf8()};
 }
 
 void LiveRun::draw(LiveTime now)
@@ -170,14 +179,32 @@ void LiveRun::draw(LiveTime now)
     if (now - m_lastDraw < drawStep) {
         return;
     }
+    if (m_hold && m_picker == nullptr && m_lastDraw != LiveTime()) {
+        return;
+    }
     m_lastDraw = now;
     m_terminal->draw(frame(style()));
 }
 
+// What stands above the table, which has the rest.
+std::string LiveRun::big(FrameStyle& style) const
+{
+    std::string const text = m_big ? drawBig(m_table.rows(), style) : std::string();
+    style.rows -= static_cast<std::size_t>(std::count(text.begin(), text.end(), '\n'));
+    return text;
+}
+
 std::string LiveRun::frame(FrameStyle const& style) const
 {
-    return m_picker != nullptr ? m_picker->draw(style)
-                               : drawTable(m_table.rows(), m_firstRow, title(), status(), style);
+    std::string text;
+    if (m_picker != nullptr) {
+        text = m_picker->draw(style);
+    } else {
+        FrameStyle rest = style;
+        text = big(rest);
+        text += drawTable(m_table.rows(), m_firstRow, title(), status(), rest);
+    }
+    return style.ascii ? toAscii(text) : text;
 }
 
 std::string LiveRun::title() const
@@ -201,8 +228,11 @@ std::string LiveRun::status() const
     if (!m_note.empty()) {
         return m_note;
     }
-    std::string const keys =
-        m_csv != nullptr ? "q quit  r reset  recording to " + m_csv->file() : "q quit  s sensors  u units  r reset";
+    std::string const keys = m_csv != nullptr ? "q quit  r reset  recording to " + m_csv->file()
+                                              : "q quit  s sensors  u units  r reset  b big  h hold";
+    if (m_hold) {
+        return "Held: h goes on  " + keys;
+    }
     return m_silenceTold ? "No answer from the vehicle  " + keys : keys;
 }
 

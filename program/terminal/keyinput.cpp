@@ -1,5 +1,6 @@
 #include "program/terminal/keyinput.h"
 
+#include <algorithm>
 #include <poll.h>
 #include <unistd.h>
 
@@ -20,6 +21,8 @@ constexpr Sequence sequences[] = {
     {"\033[1~", Key::Home},   {"\033[4~", Key::End}, {"\033[5~", Key::PageUp}, {"\033[6~", Key::PageDown},
     {"\033[3~", Key::Delete},
 };
+
+constexpr std::chrono::milliseconds splitLimit{150};
 
 // The length of a control sequence: it ends with the first letter or tilde behind its introducer.
 std::size_t sequenceLength(std::string const& bytes)
@@ -65,6 +68,16 @@ std::optional<Key> takeKey(std::string& bytes)
     return std::nullopt;
 }
 
+bool isUnfinished(std::string const& bytes)
+{
+    if (bytes.empty() || bytes.front() != '\033') {
+        return false;
+    }
+    bool const introduced = bytes.size() > 1 && (bytes[1] == '[' || bytes[1] == 'O');
+    return bytes.size() == 1 ||
+           (introduced && std::none_of(bytes.begin() + 2, bytes.end(), [](char c) { return c >= '@' && c <= '~'; }));
+}
+
 KeyInput::KeyInput() : m_active(::isatty(STDIN_FILENO) != 0 && ::tcgetattr(STDIN_FILENO, &m_before) == 0)
 {
     if (!m_active) {
@@ -90,19 +103,28 @@ void KeyInput::restore() const
     }
 }
 
-std::optional<Key> KeyInput::read(std::chrono::milliseconds limit)
+void KeyInput::take(std::chrono::milliseconds limit)
 {
-    if (std::optional<Key> const key = takeKey(m_bytes)) {
-        return key;
-    }
     pollfd input{STDIN_FILENO, POLLIN, 0};
     if (m_active && ::poll(&input, 1, static_cast<int>(limit.count())) > 0) {
         char bytes[64];
         ssize_t const count = ::read(STDIN_FILENO, bytes, sizeof bytes);
         m_ended = count <= 0;
         m_bytes.append(bytes, count > 0 ? static_cast<std::size_t>(count) : 0);
+        m_lastByte = Clock::now();
     }
-    return takeKey(m_bytes);
+}
+
+std::optional<Key> KeyInput::read(std::chrono::milliseconds limit)
+{
+    if (!isUnfinished(m_bytes)) {
+        if (std::optional<Key> const key = takeKey(m_bytes)) {
+            return key;
+        }
+    }
+    take(isUnfinished(m_bytes) ? std::min(limit, splitLimit) : limit);
+    bool const mayCome = isUnfinished(m_bytes) && Clock::now() - m_lastByte < splitLimit;
+    return mayCome ? std::nullopt : takeKey(m_bytes);
 }
 
 } // namespace velmora::cli

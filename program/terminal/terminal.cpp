@@ -13,7 +13,7 @@ namespace {
 
 // A page of its own without cursor, and back.
 constexpr char const* enterPage = "\033[?1049h\033[?25l\033[2J";
-constexpr char const* leavePage = "\033[?25h\033[?1049l";
+constexpr char const* leavePage = "\033[0m\033[?25h\033[?1049l";
 
 void writeAll(std::string const& text)
 {
@@ -35,13 +35,24 @@ bool Terminal::isUsable()
     return ::isatty(STDOUT_FILENO) != 0 && kind != nullptr && *kind != '\0' && std::strcmp(kind, "dumb") != 0;
 }
 
+bool Terminal::speaksUtf8()
+{
+    for (char const* const name : {"LC_ALL", "LC_CTYPE", "LANG"}) {
+        char const* const value = std::getenv(name);
+        if (value != nullptr && *value != '\0') {
+            return ::strcasestr(value, "UTF-8") != nullptr || ::strcasestr(value, "UTF8") != nullptr;
+        }
+    }
+    return false;
+}
+
 std::size_t Terminal::columnsOf(int descriptor)
 {
     winsize window{};
     return ::isatty(descriptor) != 0 && ::ioctl(descriptor, TIOCGWINSZ, &window) == 0 ? window.ws_col : 0;
 }
 
-Terminal::Terminal()
+Terminal::Terminal() : m_restore(leavePage, m_keys.before())
 {
     Interrupt::instance().setLastAct([this] { leave(); });
     m_inside = true;

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "program/terminal/fatalrestore.h"
 #include "program/terminal/keyinput.h"
 
 #include <cstddef>
@@ -23,6 +24,9 @@ public:
     // Whether standard output is a terminal that can be drawn on.
     static bool isUsable();
 
+    // Whether the user's locale is one of UTF-8; ASCII alone is shown elsewhere.
+    static bool speaksUtf8();
+
     // How many columns a line has on that end of the program; 0 if it is no terminal.
     static std::size_t columnsOf(int descriptor);
 
@@ -41,6 +45,7 @@ private:
     void leave();
 
     KeyInput m_keys;
+    FatalRestore m_restore;
     bool m_inside = false;
 };
 

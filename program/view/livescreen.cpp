@@ -67,7 +67,7 @@ std::string heading(Columns const& columns)
     return text + (columns.trend ? " Trend" : "");
 }
 
-std::string line(LiveRow const& row, Columns const& columns)
+std::string line(LiveRow const& row, Columns const& columns, bool ascii)
 {
     std::string text = fitted(row.name, columns.name);
     if (!row.numeric) {
@@ -79,7 +79,7 @@ std::string line(LiveRow const& row, Columns const& columns)
         text += right(orDash(row.minimum), columns) + right(orDash(row.mean), columns) +
                 right(orDash(row.maximum), columns);
     }
-    return text + (columns.trend ? " " + trendLine(row.trend, LiveTable::trendLength) : "");
+    return text + (columns.trend ? " " + trendLine(row.trend, LiveTable::trendLength, ascii) : "");
 }
 
 std::string emphasised(std::string const& text, FrameStyle const& style)
@@ -94,9 +94,10 @@ std::string cut(std::string const& text, std::size_t width)
 
 } // namespace
 
-std::string trendLine(std::deque<double> const& numbers, std::size_t width)
+std::string trendLine(std::deque<double> const& numbers, std::size_t width, bool ascii)
 {
     static constexpr char const* blocks[] = {"▁", "▂", "▃", "▄", "▅", "▆", "▇", "█"};
+    static constexpr char const* signs[] = {".", ":", "-", "=", "+", "*", "%", "#"};
     std::size_t const count = std::min(width, numbers.size());
     std::string text(width - count, ' ');
     if (count == 0) {
@@ -107,7 +108,7 @@ std::string trendLine(std::deque<double> const& numbers, std::size_t width)
     double const range = *std::max_element(first, numbers.end()) - low;
     for (auto number = first; number != numbers.end(); ++number) {
         double const part = range > 0.0 ? (*number - low) / range : 0.0;
-        text += blocks[static_cast<std::size_t>(std::lround(part * 7.0))];
+        text += (ascii ? signs : blocks)[static_cast<std::size_t>(std::lround(part * 7.0))];
     }
     return text;
 }
@@ -125,7 +126,7 @@ std::string drawTable(std::vector<LiveRow> const& rows, std::size_t first, std::
     text += emphasised(cut(heading(columns), style.columns), style) + "\n";
     std::size_t const end = std::min(rows.size(), first + roomForRows(style));
     for (std::size_t i = first; i < end; ++i) {
-        text += cut(line(rows[i], columns), style.columns) + "\n";
+        text += cut(line(rows[i], columns, style.ascii), style.columns) + "\n";
     }
     std::size_t const hidden = rows.size() - (end - std::min(first, end));
     std::string const more = hidden > 0 ? fmt::format("({} more: up and down) ", hidden) : "";

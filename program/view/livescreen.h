@@ -15,11 +15,12 @@ struct FrameStyle
 {
     std::size_t columns = 80;
     std::size_t rows = 24;
-    bool bold = false; // whether the heading may stand out
+    bool bold = false;  // whether the heading may stand out
+    bool ascii = false; // whether nothing but ASCII may be drawn
 };
 
-// A line of block characters, lowest to highest; right-aligned in the width.
-std::string trendLine(std::deque<double> const& numbers, std::size_t width);
+// A line of block characters, or of ASCII, lowest to highest; right-aligned in the width.
+std::string trendLine(std::deque<double> const& numbers, std::size_t width, bool ascii = false);
 
 // The table of live values: title, heading, the rows from first on as far as they fit, and status at the bottom, if
 // there is any.

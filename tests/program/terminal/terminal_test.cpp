@@ -47,6 +47,16 @@ TEST(Keys, EscapeAloneIsAKey)
     EXPECT_EQ(keys("\033q"), (std::vector<int>{static_cast<int>(Key::Escape), 'q'}));
 }
 
+TEST(Keys, ASequenceThatComesInPiecesIsWaitedFor)
+{
+    for (char const* const part : {"\033", "\033[", "\033O", "\033[1", "\033[1;5"}) {
+        EXPECT_TRUE(velmora::cli::isUnfinished(part)) << part + 1;
+    }
+    for (char const* const whole : {"", "q", "\033[A", "\033[1;5C", "\033q", "q\033"}) {
+        EXPECT_FALSE(velmora::cli::isUnfinished(whole)) << whole;
+    }
+}
+
 TEST(Keys, UnknownSequencesAreSkippedWhole)
 {
     EXPECT_EQ(keys("\033[1;5Cq"), std::vector<int>{'q'});

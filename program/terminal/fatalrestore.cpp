@@ -1,0 +1,61 @@
+#include "program/terminal/fatalrestore.h"
+
+#include <algorithm>
+#include <array>
+#include <csignal>
+#include <unistd.h>
+
+namespace velmora::cli {
+
+namespace {
+
+constexpr int fatalSignals[] = {SIGQUIT, SIGSEGV, SIGABRT, SIGBUS, SIGILL, SIGFPE};
+
+// What a handler may use: set before it is installed, and left alone as long as it is.
+struct Kept
+{
+    std::array<char, 64> text{};
+    std::size_t length = 0;
+    termios before{};
+    bool hasBefore = false;
+    std::array<struct sigaction, std::size(fatalSignals)> actions{};
+};
+
+Kept kept;
+
+void restoreAndEnd(int number)
+{
+    [[maybe_unused]] ssize_t const ignored = ::write(STDOUT_FILENO, kept.text.data(), kept.length);
+    if (kept.hasBefore) {
+        ::tcsetattr(STDIN_FILENO, TCSANOW, &kept.before);
+    }
+    std::signal(number, SIG_DFL);
+    std::raise(number);
+}
+
+} // namespace
+
+FatalRestore::FatalRestore(std::string const& text, termios const* before)
+{
+    kept.length = text.copy(kept.text.data(), kept.text.size());
+    kept.hasBefore = before != nullptr;
+    if (before != nullptr) {
+        kept.before = *before;
+    }
+    struct sigaction action
+    {};
+    action.sa_handler = restoreAndEnd;
+    sigemptyset(&action.sa_mask);
+    for (std::size_t i = 0; i < std::size(fatalSignals); ++i) {
+        ::sigaction(fatalSignals[i], &action, &kept.actions[i]);
+    }
+}
+
+FatalRestore::~FatalRestore()
+{
+    for (std::size_t i = 0; i < std::size(fatalSignals); ++i) {
+        ::sigaction(fatalSignals[i], &kept.actions[i], nullptr);
+    }
+}
+
+} // namespace velmora::cli
