@@ -23,9 +23,11 @@ need() {
 build_packages=(g++ cmake ninja-build)
 build_packages+=(libasio-dev libcli11-dev nlohmann-json3-dev libfmt-dev libtomlplusplus-dev)
 build_packages+=(libsqlite3-dev libboost-dev libmosquitto-dev)
+build_packages+=(libjs-chart.js libqrcodegencpp-dev) # of the page in the browser
 build_packages+=(libsystemd-dev) # Bluetooth's service
 build_packages+=(pybind11-dev libpython3-dev python3-dev)
 test_packages=(libgtest-dev libgmock-dev libbenchmark-dev strace)
+test_packages+=(tmux zbar-tools) # what the screen is read by
 test_packages+=(clang libclang-rt-14-dev clang-format clang-tidy)
 test_packages+=(python3-jsonschema pkgconf)
 test_packages+=(python3-pytest python3-venv python3-pip mypy)

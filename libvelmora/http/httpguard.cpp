@@ -17,7 +17,7 @@ bool isPortNumber(std::string_view text)
     return !text.empty() && text.size() <= 5 && text.find_first_not_of("0123456789") == std::string_view::npos;
 }
 
-std::string lowerCase(std::string_view text)
+std::string inLowerCase(std::string_view text)
 {
     std::string result(text);
     std::ranges::transform(result, result.begin(), [](unsigned char c) { return static_cast<char>(std::tolower(c)); });
@@ -45,7 +45,7 @@ std::optional<std::string> hostNameIn(std::string_view field)
     bool const nameFits = !name.empty() && name.size() <= 253 && std::ranges::all_of(name, [](unsigned char c) {
         return std::isalnum(c) != 0 || c == '.' || c == '-' || c == '_' || c == ':';
     });
-    return portFits && nameFits ? std::optional(lowerCase(name)) : std::nullopt;
+    return portFits && nameFits ? std::optional(inLowerCase(name)) : std::nullopt;
 }
 
 bool isAddress(std::string const& name)
@@ -118,7 +118,7 @@ std::optional<HttpResponse> refuseForeign(HttpRequest const& request, std::set<s
     bool const changes = request.method != "GET" && request.method != "HEAD";
     std::size_t const origins = request.count("origin");
     bool const own =
-        origins == 1 && lowerCase(request.header("origin")) == "http://" + lowerCase(request.header("host"));
+        origins == 1 && inLowerCase(request.header("origin")) == "http://" + inLowerCase(request.header("host"));
     if (origins > 0 ? !own : changes) {
         return plainResponse(403, "Another page may not ask this");
     }

@@ -14,6 +14,7 @@ struct Health
 {
     bool linkUp = false;        // adapter and vehicle answer
     std::string state;          // "running", "parked", "connecting", ...
+    std::string trouble;        // why there is no link or no vehicle; empty while both are there
     std::uint64_t requests = 0; // to control modules
     std::uint64_t errors = 0;   // requests without an answer
     std::uint64_t linkLosses = 0;

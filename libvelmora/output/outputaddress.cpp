@@ -23,9 +23,15 @@ std::vector<KnownKind> const& knownKinds()
     static std::vector<std::string_view> const broker = {"qos",       "ca",    "user_file", "password_file",
                                                          "ack_topic", "spool", "spool_max", "discovery"};
     static std::vector<KnownKind> const kinds = {
-        {"csv", false, {"rotate"}},    {"csv-long", false, {"rotate"}}, {"ndjson", false, {"rotate"}},
-        {"influx", false, {"rotate"}}, {"sqlite", false, {"ballast"}},  {"prometheus", false, {}},
-        {"mqtt", true, broker},        {"mqtts", true, broker},
+        {"csv", false, {"rotate"}},
+        {"csv-long", false, {"rotate"}},
+        {"ndjson", false, {"rotate"}},
+        {"influx", false, {"rotate"}},
+        {"sqlite", false, {"ballast"}},
+        {"prometheus", false, {}},
+        {"dash", false, {"allow_clear", "allow_console", "name"}},
+        {"mqtt", true, broker},
+        {"mqtts", true, broker},
     };
     return kinds;
 }
@@ -40,7 +46,8 @@ std::vector<std::string> const& outputForms()
 {
     static std::vector<std::string> const hints = {
         "files: csv:FILE, csv-long:FILE, ndjson:FILE, influx:FILE, sqlite:FILE; ndjson:- is standard output",
-        "network: mqtt://HOST:PORT/TOPIC, mqtts://HOST:PORT/TOPIC, prometheus:HOST:PORT, influx:udp://HOST:PORT",
+        "network: mqtt://HOST:PORT/TOPIC, mqtts://HOST:PORT/TOPIC, prometheus:HOST:PORT, dash:HOST:PORT, "
+        "influx:udp://HOST:PORT",
         "settings follow a question mark: csv:drive.csv?rotate=day"};
     return hints;
 }

@@ -1,7 +1,5 @@
 #include "libvelmora/watch/requestcount.h"
 
-#include <string_view>
-
 namespace velmora {
 
 namespace {
@@ -20,10 +18,16 @@ void RequestCount::onDataSent(std::vector<unsigned char> const& data)
     bool const request =
         text.size() > 1 && text.find_first_not_of("0123456789ABCDEFabcdef \r") == std::string_view::npos;
     m_requests += request ? 1 : 0;
+    if (m_tap) {
+        m_tap(true, text);
+    }
 }
 
 void RequestCount::onDataReceived(std::vector<unsigned char> const& data)
 {
+    if (m_tap) {
+        m_tap(false, viewOf(data));
+    }
     for (std::string_view const word : {"NO DATA", "ERROR", "UNABLE"}) {
         if (viewOf(data).find(word) != std::string_view::npos) {
             ++m_errors;

@@ -41,8 +41,31 @@ void SessionCar::connect()
     }
     m_session->connect();
     m_vin = readVin(*m_session, *m_session->obd().getEcuManager()->getCurrentEcu());
-    m_sources = watchSources(*m_session, m_options.sensors);
+    m_sources = chooseSources();
     m_up = true;
+    ++m_visits;
+}
+
+std::vector<PollSource> SessionCar::chooseSources()
+{
+    std::vector<PollSource> sources = watchSources(*m_session, m_options.sensors);
+    addSources(*m_session, m_further, sources);
+    return sources;
+}
+
+void SessionCar::readAlso(std::vector<std::string> const& wishes)
+{
+    m_further = wishes;
+    if (!m_up) {
+        return;
+    }
+    std::vector<PollSource> sources = chooseSources();
+    bool const asking = m_poller != nullptr;
+    stopAsking();
+    m_sources = std::move(sources);
+    if (asking) {
+        startAsking();
+    }
 }
 
 void SessionCar::disconnect()
@@ -86,6 +109,11 @@ void SessionCar::startAsking()
     m_poller = std::make_unique<Poller>(
         proxy, m_sources, pace, obd::UnitSystem::Metric,
         [this](PollResult const& result) {
+            if (m_options.onReading) {
+                for (Reading const& each : result.readings) {
+                    m_options.onReading(each);
+                }
+            }
             std::lock_guard const lock(m_mutex);
             for (Reading const& each : result.readings) {
                 m_readings.push_back(each);

@@ -7,7 +7,9 @@
 #include "libvelmora/watch/requestcount.h"
 
 #include <condition_variable>
+#include <functional>
 #include <mutex>
+#include <string_view>
 
 namespace velmora {
 
@@ -18,13 +20,17 @@ struct SessionCarOptions
     std::vector<std::string> sensors; // wishes; none: those that trips need, and load, throttle and fuel level
     bool fullVin = false;
     bool fast = false;
+    // Every reading as soon as it is there, on the thread that reads it.
+    std::function<void(Reading const&)> onReading;
+    // What passes between library and adapter, on the thread that sends or receives it.
+    std::function<void(bool sent, std::string_view text)> onTraffic;
 };
 
 // The car behind a port: a session of the library while it is awake, the bare port while it sleeps.
 class SessionCar : public IWatchedCar
 {
 public:
-    explicit SessionCar(SessionCarOptions options) : m_options(std::move(options)) {}
+    explicit SessionCar(SessionCarOptions options) : m_options(std::move(options)), m_count(m_options.onTraffic) {}
     ~SessionCar() override { disconnect(); }
 
     void connect() override;
@@ -44,6 +50,13 @@ public:
     std::uint64_t requests() const override { return m_count.requests(); }
     std::uint64_t errors() const override { return m_count.errors(); }
 
+    // Null while there is none that is brought up.
+    Session* session() const { return m_up ? m_session.get() : nullptr; }
+    // How often one was brought up.
+    unsigned int visits() const { return m_visits; }
+    // Reads these wishes beside the others from now on, as far as they are offered.
+    void readAlso(std::vector<std::string> const& wishes);
+
     // Dispatches what the library asks for until the time has come or interrupt was called.
     void wait(std::chrono::milliseconds time);
     // Ends what it is at, for good. Any thread.
@@ -51,14 +64,17 @@ public:
 
 private:
     std::unique_ptr<IPort> openBarePort();
+    std::vector<PollSource> chooseSources();
 
     SessionCarOptions const m_options;
     std::mutex m_mutex;
     std::condition_variable m_wake;
     std::unique_ptr<Session> m_session;
     bool m_up = false;
-    bool m_interrupted = false;      // protected by m_mutex, as is the pointer above
-    std::vector<Reading> m_readings; // protected by m_mutex
+    unsigned int m_visits = 0;
+    std::vector<std::string> m_further; // wishes beside those of the options
+    bool m_interrupted = false;         // protected by m_mutex, as is the pointer above
+    std::vector<Reading> m_readings;    // protected by m_mutex
     std::vector<PollSource> m_sources;
     std::unique_ptr<Poller> m_poller;
     std::unique_ptr<AdapterNap> m_nap;

@@ -302,6 +302,7 @@ Health WatchEngine::health() const
     Health health;
     health.linkUp = m_connected && m_asking;
     health.state = m_state;
+    health.trouble = m_trouble;
     health.requests = m_car.requests();
     health.errors = m_car.errors();
     health.linkLosses = m_losses;

@@ -39,6 +39,8 @@ public:
 
     // Does what is due. Tells how long nothing is, at most a second.
     std::chrono::milliseconds step(WatchTime const& now);
+    // The codes are looked at with the next step.
+    void lookAtCodesSoon() { m_nextCodes = SteadyTime(); }
     // Ends the trip under way and lets go of the car.
     void finish(WatchTime const& now);
 

@@ -78,6 +78,20 @@ std::vector<PollSource> sourcesFor(Session& session, std::string const& text, bo
     return sources;
 }
 
+void addEntries(std::vector<SensorEntry>& entries, obd::IEcu& ecu, obd::PowertrainParameter& parameter)
+{
+    auto const infos = parameter.sensorInfo(ecu);
+    int const pid = parameter.pid();
+    std::string const title = parameter.description(ecu);
+    for (auto const& info : infos) {
+        bool const alone = infos.size() == 1;
+        std::string const key = alone ? sensorKey(pid) : fmt::format("{}_{}", sensorKey(pid), info->uid() % 10 + 1);
+        entries.push_back({ecu.id(), key, fmt::format("01{:02X}", pid),
+                           alone ? title : title + ": " + info->description(),
+                           unitLabel(info->unit(obd::UnitSystem::Metric))});
+    }
+}
+
 } // namespace
 
 std::vector<PollSource> watchSources(Session& session, std::vector<std::string> const& wishes)
@@ -99,20 +113,41 @@ std::vector<PollSource> watchSources(Session& session, std::vector<std::string> 
     return sources;
 }
 
+void addSources(Session& session, std::vector<std::string> const& wishes, std::vector<PollSource>& sources)
+{
+    for (std::string const& wish : wishes) {
+        for (PollSource& each : sourcesFor(session, wish, false)) {
+            bool const there = std::ranges::any_of(sources, [&](PollSource const& one) {
+                return one.parameter->pid() == each.parameter->pid() && one.ecu->id() == each.ecu->id();
+            });
+            if (!there) {
+                sources.push_back(std::move(each));
+            }
+        }
+    }
+}
+
+std::vector<SensorEntry> offeredEntries(Session& session)
+{
+    std::vector<SensorEntry> entries;
+    CurrentModule const back(*session.obd().getEcuManager());
+    for (std::shared_ptr<obd::IEcu> const& ecu : session.selectedModules()) {
+        session.select(*ecu);
+        for (OfferedSensor const& each : offeredSensors(*obd::SensorServiceBuilder::createSensorService())) {
+            if (auto const parameter =
+                    obd::ParameterFactory().createParameter(*ecu, *session.obd().getSettings(), each.id)) {
+                addEntries(entries, *ecu, *parameter);
+            }
+        }
+    }
+    return entries;
+}
+
 SensorList sensorList(std::string const& vehicle, std::vector<PollSource> const& sources)
 {
     SensorList list{std::chrono::system_clock::now(), vehicle, {}};
     for (PollSource const& each : sources) {
-        auto const infos = each.parameter->sensorInfo(*each.ecu);
-        int const pid = each.parameter->pid();
-        std::string const title = each.parameter->description(*each.ecu);
-        for (auto const& info : infos) {
-            bool const alone = infos.size() == 1;
-            std::string const key = alone ? sensorKey(pid) : fmt::format("{}_{}", sensorKey(pid), info->uid() % 10 + 1);
-            list.sensors.push_back({each.ecu->id(), key, fmt::format("01{:02X}", pid),
-                                    alone ? title : title + ": " + info->description(),
-                                    unitLabel(info->unit(obd::UnitSystem::Metric))});
-        }
+        addEntries(list.sensors, *each.ecu, *each.parameter);
     }
     return list;
 }

@@ -14,6 +14,12 @@ namespace velmora {
 // it runs. Throws Error for a wish that the vehicle can't fulfil.
 std::vector<PollSource> watchSources(Session& session, std::vector<std::string> const& wishes);
 
+// Adds what further wishes name, as far as the vehicle has it and it is not among them yet.
+void addSources(Session& session, std::vector<std::string> const& wishes, std::vector<PollSource>& sources);
+
+// All that the selected modules offer.
+std::vector<SensorEntry> offeredEntries(Session& session);
+
 // How they are told to outputs.
 SensorList sensorList(std::string const& vehicle, std::vector<PollSource> const& sources);
 

@@ -23,6 +23,9 @@ void addCommands(CommandLine& commandLine)
     addLogCommand(commandLine);
     addRecordCommand(commandLine);
     addWatchCommand(commandLine);
+#ifdef VELMORA_DASH
+    addDashCommand(commandLine);
+#endif
     addTripsCommand(commandLine);
     addSettingsCommand(commandLine);
     addSignalsCommand(commandLine);

@@ -12,6 +12,9 @@ void addClearCommand(CommandLine& commandLine);
 void addCodesCommand(CommandLine& commandLine);
 void addConsoleCommand(CommandLine& commandLine);
 void addCountersCommand(CommandLine& commandLine);
+#ifdef VELMORA_DASH
+void addDashCommand(CommandLine& commandLine);
+#endif
 void addDoctorCommand(CommandLine& commandLine);
 void addDtcCommand(CommandLine& commandLine);
 void addFreezeCommand(CommandLine& commandLine);

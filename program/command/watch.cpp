@@ -1,6 +1,7 @@
 #include "libvelmora/poll/sensorwish.h"
 #include "program/command/commands.h"
 #include "program/command/lastresort.h"
+#include "program/command/watchcommand.h"
 #include "program/command/watchrun.h"
 #include "program/commandline.h"
 #include "program/terminal/interrupt.h"
@@ -13,20 +14,6 @@
 namespace velmora::cli {
 
 namespace {
-
-struct WatchOptions
-{
-    std::vector<std::string> sensors;
-    std::vector<std::string> outputs;
-    std::string config;
-    bool checkConfig = false;
-    std::string vehicle;
-    std::string vin;
-    std::string stopAfter;
-    std::string wake;
-    bool electric = false;
-    bool fast = false;
-};
 
 [[noreturn]] void rejectOption(std::string const& option, std::string const& text, std::string const& expected)
 {
@@ -111,7 +98,7 @@ public:
 private:
     void runOnce()
     {
-        auto run = std::make_unique<WatchRun>(m_global, m_settings, m_notify);
+        auto run = std::make_unique<WatchRun>(m_global, m_settings, m_notify, m_chosen.page);
         WatchRun& now = *run;
         {
             std::lock_guard const lock(m_mutex);
@@ -176,7 +163,9 @@ private:
     LastResort m_lastResort;
 };
 
-ExitCode watch(GlobalOptions const& global, WatchOptions const& chosen)
+} // namespace
+
+ExitCode runWatch(GlobalOptions const& global, WatchOptions const& chosen)
 {
     if (chosen.checkConfig) {
         settingsOf(chosen);
@@ -186,35 +175,38 @@ ExitCode watch(GlobalOptions const& global, WatchOptions const& chosen)
     return WatchCommand(global, chosen).run();
 }
 
-} // namespace
-
 void addWatchCommand(CommandLine& commandLine)
 {
     auto const chosen = std::make_shared<WatchOptions>();
     CLI::App* const command =
         commandLine.addCommand("watch", "Read for months, write to any number of outputs, spare the battery",
-                               [chosen](GlobalOptions const& global) { return watch(global, *chosen); });
-    command->add_option("SENSOR", chosen->sensors,
-                        "Sensors with rates: RPM@10hz, 7E8:SPEED; without: those of trips, load, throttle, fuel level");
+                               [chosen](GlobalOptions const& global) { return runWatch(global, *chosen); });
+    addWatchOptions(*command, *chosen);
+}
+
+void addWatchOptions(CLI::App& command, WatchOptions& chosen)
+{
+    command.add_option("SENSOR", chosen.sensors,
+                       "Sensors with rates: RPM@10hz, 7E8:SPEED; without: those of trips, load, throttle, fuel level");
     command
-        ->add_option("-o,--output", chosen->outputs,
-                     "csv:FILE, csv-long:FILE, ndjson:FILE, sqlite:FILE, influx:FILE,\n"
-                     "influx:udp://HOST:PORT, prometheus:HOST:PORT, mqtt://HOST:PORT/TOPIC;\n"
-                     "settings behind a question mark: csv:a.csv?rotate=day. May be repeated")
+        .add_option("-o,--output", chosen.outputs,
+                    "csv:FILE, csv-long:FILE, ndjson:FILE, sqlite:FILE, influx:FILE,\n"
+                    "influx:udp://HOST:PORT, prometheus:HOST:PORT, dash:HOST:PORT, mqtt://HOST:PORT/TOPIC;\n"
+                    "settings behind a question mark: csv:a.csv?rotate=day. May be repeated")
         ->type_name("KIND:TARGET")
         ->allow_extra_args(false);
-    command->add_option("--config", chosen->config, "Settings of the watch (TOML)")->type_name("FILE");
-    command->add_flag("--check-config", chosen->checkConfig, "Only tell mistakes in the settings");
-    command->add_option("--vehicle", chosen->vehicle, "Name of the vehicle in all outputs")->type_name("NAME");
-    command->add_option("--vin", chosen->vin, "Whether the outputs may hold the VIN: none or full")
+    command.add_option("--config", chosen.config, "Settings of the watch (TOML)")->type_name("FILE");
+    command.add_flag("--check-config", chosen.checkConfig, "Only tell mistakes in the settings");
+    command.add_option("--vehicle", chosen.vehicle, "Name of the vehicle in all outputs")->type_name("NAME");
+    command.add_option("--vin", chosen.vin, "Whether the outputs may hold the VIN: none or full")
         ->type_name("none|full")
         ->check(CLI::IsMember({"none", "full"}));
-    command->add_option("--stop-after", chosen->stopAfter, "Ask on that long after the engine has stopped (120s)")
+    command.add_option("--stop-after", chosen.stopAfter, "Ask on that long after the engine has stopped (120s)")
         ->type_name("TIME");
-    command->add_option("--wake", chosen->wake, "voltage, or \"every 30min\" for one request to the parked car")
+    command.add_option("--wake", chosen.wake, "voltage, or \"every 30min\" for one request to the parked car")
         ->type_name("WAY");
-    command->add_flag("--electric", chosen->electric, "The car is hybrid or electric");
-    command->add_flag("--fast", chosen->fast, "Ask as fast as the bus allows");
+    command.add_flag("--electric", chosen.electric, "The car is hybrid or electric");
+    command.add_flag("--fast", chosen.fast, "Ask as fast as the bus allows");
 }
 
 } // namespace velmora::cli

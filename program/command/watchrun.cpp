@@ -2,6 +2,7 @@
 
 #include "libvelmora/output/outputfactory.h"
 #include "libvelmora/output/valuetext.h"
+#include "libvelmora/session/settingsstore.h"
 #include "libvelmora/watch/statefolder.h"
 #include "program/terminal/output.h"
 
@@ -70,6 +71,12 @@ void sayUnless(bool quiet, std::string const& text)
     }
 }
 
+std::filesystem::path settingsPath(GlobalOptions const& options)
+{
+    std::string const named = carOptions(options, {}, {}).session.settingsFile;
+    return named.empty() ? SettingsStore::defaultFile() : std::filesystem::path(named);
+}
+
 WatchRules rulesOf(WatchSettings const& settings, std::string const& vehicle)
 {
     WatchRules rules;
@@ -87,9 +94,9 @@ WatchRules rulesOf(WatchSettings const& settings, std::string const& vehicle)
 
 } // namespace
 
-WatchRun::WatchRun(GlobalOptions const& options, WatchSettings const& settings, ServiceNotify& notify)
-    : m_options(options), m_notify(notify), m_vehicle(vehicleName(settings)),
-      m_car(carOptions(options, settings, m_vehicle))
+WatchRun::WatchRun(GlobalOptions const& options, WatchSettings const& settings, ServiceNotify& notify, bool page)
+    : m_options(options), m_notify(notify), m_vehicle(vehicleName(settings)), m_page(settings.outputs, m_vehicle, page),
+      m_car(m_page.withTaps(carOptions(options, settings, m_vehicle)))
 {
     if (options.port.empty() && settings.port.empty()) {
         throw Error(ErrorKind::WrongUse, "No port is named", {"name it with --port, or as port in the settings"});
@@ -111,8 +118,15 @@ void WatchRun::addOutputs(WatchSettings const& settings)
         return board->health;
     };
     for (OutputAddress const& address : settings.outputs) {
-        m_outputs.push_back(std::make_unique<OutputRunner>(toString(address), makeOutput(address, context),
-                                                           context.tell, limitsOf(address)));
+        OutputLimits limits = limitsOf(address);
+        std::unique_ptr<IOutput> output;
+        if (WatchPage::is(address)) {
+            limits.interval = WatchPage::interval;
+            output = m_page.makeOutput(address, context.health, settingsPath(m_options));
+        } else {
+            output = makeOutput(address, context);
+        }
+        m_outputs.push_back(std::make_unique<OutputRunner>(toString(address), std::move(output), context.tell, limits));
     }
     for (std::unique_ptr<OutputRunner> const& each : m_outputs) {
         each->start();
@@ -172,6 +186,7 @@ void WatchRun::run()
         std::chrono::milliseconds pause{0};
         try {
             pause = m_engine->step(timeNow());
+            m_page.serve(m_car, *m_engine, [this](Record record) { take(std::move(record)); });
         } catch (Error const& error) {
             if (error.kind() == ErrorKind::Interrupted) {
                 return;

@@ -5,6 +5,7 @@
 #include "libvelmora/watch/sessioncar.h"
 #include "libvelmora/watch/watchengine.h"
 #include "libvelmora/watch/watchsettings.h"
+#include "program/command/watchpage.h"
 #include "program/globaloptions.h"
 
 #include <atomic>
@@ -16,8 +17,8 @@ namespace velmora::cli {
 class WatchRun
 {
 public:
-    // Opens the outputs. Throws Error for settings that make no sense.
-    WatchRun(GlobalOptions const& options, WatchSettings const& settings, ServiceNotify& notify);
+    // Opens the outputs. page: the page in the browser is what it is for. Throws Error for settings that make no sense.
+    WatchRun(GlobalOptions const& options, WatchSettings const& settings, ServiceNotify& notify, bool page = false);
     ~WatchRun();
     WatchRun(WatchRun const&) = delete;
     WatchRun& operator=(WatchRun const&) = delete;
@@ -49,6 +50,7 @@ private:
     GlobalOptions const m_options;
     ServiceNotify& m_notify;
     std::string const m_vehicle;
+    WatchPage m_page;
     SessionCar m_car;
     std::shared_ptr<HealthBoard> const m_health = std::make_shared<HealthBoard>(); // shared with the outputs
     std::vector<std::unique_ptr<OutputRunner>> m_outputs;

@@ -14,7 +14,7 @@ namespace velmora::cli {
 namespace {
 
 constexpr std::size_t mostBig = 6;
-constexpr std::size_t narrowest = 26;
+constexpr std::size_t narrowestCard = 26;
 constexpr std::size_t tableLines = 12; // that the table keeps
 
 std::optional<double> bigNumber(std::string const& text)
@@ -79,12 +79,12 @@ std::string drawBig(std::vector<LiveRow> const& rows, FrameStyle const& style)
             shown.push_back(&row);
         }
     }
-    std::size_t const across = std::max<std::size_t>(1, std::min(mostBig, style.columns / narrowest));
+    std::size_t const across = std::max<std::size_t>(1, std::min(mostBig, style.columns / narrowestCard));
     std::size_t const height = bigLines(style.ascii) + 3; // name, digits, bar, an empty line
     std::size_t const room = style.rows > tableLines ? (style.rows - tableLines) / height : 0;
     shown.resize(std::min(shown.size(), across * room));
     std::size_t const width = shown.empty() ? 0 : style.columns / std::min(across, shown.size());
-    if (width < narrowest) {
+    if (width < narrowestCard) {
         return {};
     }
     std::string text;

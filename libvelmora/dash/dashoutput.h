@@ -1,0 +1,69 @@
+#pragma once
+
+#include "libvelmora/dash/dashaccess.h"
+#include "libvelmora/dash/dashlayouts.h"
+#include "libvelmora/dash/dashstate.h"
+#include "libvelmora/http/httpserver.h"
+#include "libvelmora/output/health.h"
+#include "libvelmora/output/ioutput.h"
+#include "libvelmora/output/outputaddress.h"
+
+namespace velmora {
+
+// What the page knows of the one that feeds it.
+struct DashContext
+{
+    std::shared_ptr<DashDesk> desk;
+    HealthSource health = [] { return Health(); };
+    std::filesystem::path layouts;
+    std::string token;       // where one is needed; empty: made up
+    bool mustListen = false; // a port that can't be had ends all, rather than being tried again
+    // Where the page is, and what to know about it. Called by open.
+    std::function<void(std::string const& link, std::string const& remark)> onLink = [](auto const&, auto const&) {};
+};
+
+// Serves the page on HOST:PORT. Values reach it over the desk as soon as they are read; the other records as those of
+// any output. Settings: allow_clear, allow_console (yes or no), name (further names of the host, with commas between).
+class DashOutput : public IOutput
+{
+public:
+    // Throws Error for settings that make no sense.
+    DashOutput(OutputAddress const& address, DashContext context);
+    ~DashOutput() override;
+
+    void open() override;
+    void write(Records records) override;
+    void close() override { m_server.stop(); }
+
+    // Once it is open.
+    unsigned short port() const { return m_server.port(); }
+    std::string link() const;
+
+private:
+    void addRoutes();
+    void addHandler(std::string const& method, std::string const& path, HttpHandler handler);
+    void listen();
+    HttpResponse takeAsk(HttpRequest const& request);
+    HttpResponse takeLayout(HttpRequest const& request);
+    HttpResponse tellHistory(HttpRequest const& request) const;
+    void takeVehicle(DashVehicle const& vehicle);
+    void takeAnswer(DashAnswer const& answer);
+    void wishSensors(Json const& layout);
+    Json layout() const;
+    std::string greeting() const;
+
+    HttpPlace const m_place;
+    DashContext const m_context;
+    bool const m_allowClear;
+    bool const m_allowConsole;
+    DashAccess m_access;
+    DashLayouts const m_layouts;
+    DashState m_state;
+    mutable std::mutex m_layoutMutex;
+    Json m_layout; // protected by m_layoutMutex
+    std::chrono::steady_clock::time_point m_lastBeat;
+    HttpServer m_server;
+    std::shared_ptr<void> m_listening;
+};
+
+} // namespace velmora

@@ -1,0 +1,203 @@
+// The chart of the last minutes, with an axis for each unit. Chart.js is loaded when it is first looked at.
+import { byId, element, setText } from './tables.js';
+import { chosen, change, setting } from './layout.js';
+import { getJson, programNow } from './link.js';
+import { sensors, takeHistory, titleOf } from './store.js';
+import { convert, show, unitOf } from './units.js';
+
+const light = ['#0b63bd', '#b3202a', '#176b41', '#7a3fb8', '#855300', '#0f6d78'];
+const dark = ['#62b4ff', '#ff8582', '#54d08d', '#c9a2ff', '#f4bd55', '#5fd3de'];
+const dashes = [[], [8, 4], [2, 3], [12, 4, 2, 4], [5, 5], [1, 2]]; // no line is told by its colour alone
+
+let chart = null;
+let loading = null;
+let view = null; // {from, to} while zoomed, else live
+
+function load() {
+  loading ??= new Promise((resolve, reject) => {
+    const script = element('script', { src: '/page/chart.min.js' });
+    script.onload = resolve;
+    script.onerror = reject;
+    document.head.append(script);
+  });
+  return loading;
+}
+
+function style(name) {
+  return getComputedStyle(document.documentElement).getPropertyValue(name).trim();
+}
+
+function colours() {
+  return matchMedia('(prefers-color-scheme: dark)').matches && document.documentElement.dataset.theme !== 'light' ||
+    document.documentElement.dataset.theme === 'dark' ? dark : light;
+}
+
+function clock(ms) {
+  return new Date(ms).toLocaleTimeString([], { hour: '2-digit', minute: '2-digit', second: '2-digit', hour12: false });
+}
+
+function shown() {
+  return chosen('chart').map((id) => sensors.get(id)).filter(Boolean);
+}
+
+function datasets() {
+  const palette = colours();
+  return shown().map((sensor, index) => ({
+    label: titleOf(sensor), data: [], borderColor: palette[index % 6], backgroundColor: palette[index % 6],
+    borderDash: dashes[index % 6], borderWidth: 2, pointRadius: 0, tension: 0, spanGaps: false, yAxisID: axisOf(sensor),
+  }));
+}
+
+function axisOf(sensor) {
+  return `y-${unitOf(sensor) || 'none'}`;
+}
+
+// Whole minutes or seconds, as a clock has them.
+function ticks(axis) {
+  const length = axis.max - axis.min;
+  const step = [1000, 5000, 10000, 30000, 60000, 180000].find((each) => length / each <= (axis.width < 500 ? 4 : 8)) ?? 300000;
+  axis.ticks = [];
+  for (let at = Math.ceil(axis.min / step) * step; at <= axis.max; at += step) axis.ticks.push({ value: at });
+}
+
+function scales() {
+  const ink = style('--faint');
+  const grid = style('--line');
+  const result = { x: { type: 'linear', ticks: { color: ink, maxTicksLimit: 7, maxRotation: 0, callback: clock }, grid: { color: grid }, afterBuildTicks: ticks } };
+  [...new Set(shown().map(axisOf))].forEach((id, index) => {
+    result[id] = { type: 'linear', grace: '8%', position: index % 2 ? 'right' : 'left', ticks: { color: ink, maxTicksLimit: 7 },
+      grid: { color: grid, drawOnChartArea: index === 0 }, title: { display: true, color: ink, text: id.slice(2).replace('none', '') } };
+  });
+  return result;
+}
+
+// A value in the units that are wanted; the same points again where these are the car's own.
+function pointsOf(sensor, from, to) {
+  const points = sensor.points;
+  let first = points.findIndex((point) => point.x >= from);
+  if (first < 0) return [];
+  first = Math.max(0, first - 1);
+  const part = points.slice(first).filter((point) => point.x <= to + 1000);
+  return unitOf(sensor) === sensor.unit ? part : part.map((point) => ({ x: point.x, y: convert(sensor, point.y) }));
+}
+
+function range() {
+  const to = programNow();
+  return view ?? { from: to - setting('minutes', 5) * 60000, to };
+}
+
+async function fetchHistories() {
+  for (const sensor of shown().filter((each) => !each.hasHistory)) {
+    sensor.hasHistory = true;
+    try {
+      takeHistory(await getJson(`/history?${sensor.id}`));
+    } catch {
+      sensor.hasHistory = false;
+    }
+  }
+}
+
+export async function rebuild() {
+  byId('minutes').value = String(setting('minutes', 5));
+  if (byId('canvas').closest('section').hidden) return;
+  await load();
+  await fetchHistories();
+  chart?.destroy();
+  chart = new window.Chart(byId('canvas'), {
+    type: 'line',
+    data: { datasets: datasets() },
+    options: { parsing: false, animation: false, normalized: true, maintainAspectRatio: false, interaction: { mode: 'nearest', axis: 'x', intersect: false },
+      scales: scales(), plugins: { decimation: { enabled: true, algorithm: 'min-max', threshold: 400 },
+        legend: { labels: { color: style('--ink'), boxHeight: 0, boxWidth: 36 } }, tooltip: { callbacks: { title: (items) => clock(items[0].parsed.x) } } } },
+  });
+  update();
+}
+
+// Called four times a second at most.
+export function update() {
+  if (!chart) return;
+  const { from, to } = range();
+  chart.options.scales.x.min = from;
+  chart.options.scales.x.max = to;
+  shown().forEach((sensor, index) => {
+    if (chart.data.datasets[index]) chart.data.datasets[index].data = pointsOf(sensor, from, to);
+  });
+  chart.update('none');
+  figures(from, to);
+}
+
+function figures(from, to) {
+  const table = byId('figures');
+  const list = shown();
+  if (table.rows.length !== list.length + 1) {
+    const head = ['Sensor', 'Lowest', 'Mean', 'Highest', 'Last', 'Unit'].map((text, index) =>
+      element('th', { scope: 'col', class: index > 0 && index < 5 ? 'right' : null }, text));
+    table.replaceChildren(element('thead', {}, element('tr', {}, ...head)), element('tbody', {}, ...list.map(() =>
+      element('tr', {}, element('th', { scope: 'row' }), ...[1, 2, 3, 4].map(() => element('td', { class: 'right' })), element('td')))));
+  }
+  list.forEach((sensor, index) => {
+    const values = sensor.points.filter((point) => point.x >= from && point.x <= to).map((point) => point.y);
+    const mean = values.length ? values.reduce((sum, value) => sum + value, 0) / values.length : null;
+    const texts = [titleOf(sensor), ...[values.length ? Math.min(...values) : null, mean, values.length ? Math.max(...values) : null, values.at(-1) ?? null]
+      .map((value) => show(sensor, value)), unitOf(sensor)];
+    texts.forEach((text, cell) => setText(table.tBodies[0].rows[index].cells[cell], text));
+  });
+}
+
+function zoom(kind) {
+  const { from, to } = range();
+  const length = to - from;
+  const moves = { in: [0.25, -0.25], out: [-0.5, 0.5], back: [-0.5, -0.5], forth: [0.5, 0.5] };
+  if (kind === 'live') view = null;
+  else view = { from: from + moves[kind][0] * length, to: to + moves[kind][1] * length };
+  if (view && view.to - view.from < 2000) view = { from, to };
+  if (view && (view.to >= programNow() && kind !== 'in' || view.to - view.from > 15 * 60000)) view = null;
+  update();
+}
+
+function selectByPointer(box) {
+  let begin = null;
+  const mark = element('div', { class: 'select', hidden: true });
+  box.append(mark);
+  const place = (event) => Math.max(0, Math.min(box.clientWidth, event.clientX - box.getBoundingClientRect().left));
+  const value = (x) => chart.scales.x.getValueForPixel(x - byId('canvas').offsetLeft);
+  box.addEventListener('pointerdown', (event) => {
+    if (event.pointerType === 'mouse' && chart) begin = place(event);
+  });
+  box.addEventListener('pointermove', (event) => {
+    if (begin === null) return;
+    const x = place(event);
+    mark.hidden = false;
+    mark.style.left = `${Math.min(begin, x)}px`;
+    mark.style.width = `${Math.abs(x - begin)}px`;
+  });
+  addEventListener('pointerup', (event) => {
+    if (begin === null) return;
+    const [low, high] = [begin, place(event)].sort((a, b) => a - b);
+    begin = null;
+    mark.hidden = true;
+    if (high - low > 12) {
+      view = { from: value(low), to: value(high) };
+      update();
+    }
+  });
+}
+
+export function start() {
+  byId('minutes').addEventListener('change', (event) => {
+    view = null;
+    change({ minutes: Number(event.target.value) });
+  });
+  for (const each of document.querySelectorAll('[data-zoom]')) each.addEventListener('click', () => zoom(each.dataset.zoom));
+  const box = byId('plot');
+  box.addEventListener('keydown', (event) => {
+    const kinds = { '+': 'in', '-': 'out', ArrowLeft: 'back', ArrowRight: 'forth', Home: 'live' };
+    if (kinds[event.key]) {
+      event.preventDefault();
+      zoom(kinds[event.key]);
+    }
+  });
+  box.addEventListener('dblclick', () => zoom('live'));
+  selectByPointer(box);
+  matchMedia('(prefers-color-scheme: dark)').addEventListener('change', rebuild);
+}

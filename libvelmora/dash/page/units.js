@@ -1,0 +1,69 @@
+// Values come in metric units; here alone value and label are turned into those that the user wants.
+
+const imperial = {
+  'km/h': ['mph', (v) => v * 0.621371, 0],
+  km: ['mi', (v) => v * 0.621371, 0],
+  '°C': ['°F', (v) => v * 1.8 + 32, 0],
+  K: ['°F', (v) => v * 1.8, 0],
+  kPa: ['psi', (v) => v * 0.1450377, 1],
+  Pa: ['inH2O', (v) => v * 0.00401463, 3],
+  'g/s': ['lb/min', (v) => v * 0.1322774, 1],
+  Nm: ['lb-ft', (v) => v * 0.7375621, 0],
+  kW: ['hp', (v) => v * 1.3410221, 0],
+  mm: ['in', (v) => v / 25.4, 2],
+};
+
+let system = 'metric';
+export function setSystem(name) {
+  system = name;
+}
+
+function rule(unit) {
+  return system === 'imperial' ? imperial[unit] : undefined;
+}
+
+export function unitOf(sensor) {
+  return rule(sensor.unit)?.[0] ?? sensor.unit;
+}
+
+export function convert(sensor, value) {
+  const found = rule(sensor.unit);
+  return found && typeof value === 'number' ? found[1](value) : value;
+}
+
+// The value as people read it, without its unit.
+export function show(sensor, value) {
+  if (value == null) return '–';
+  if (typeof value !== 'number') return String(value);
+  const digits = Math.min(6, (sensor.precision ?? 0) + (rule(sensor.unit)?.[2] ?? 0));
+  return convert(sensor, value).toFixed(digits).replace(/^-(0(\.0+)?)$/, '$1');
+}
+
+export function withUnit(sensor, value) {
+  const unit = unitOf(sensor);
+  return show(sensor, value) + (unit && value != null ? ` ${unit}` : '');
+}
+
+const ranges = {
+  RPM: [0, 8000], SPEED: [0, 220], COOLANT_TEMP: [-40, 140], OIL_TEMP: [-40, 160], MODULE_VOLTAGE: [8, 16],
+  INTAKE_TEMP: [-40, 80], AMBIENT_TEMP: [-40, 60], TIMING_ADVANCE: [-20, 60], MAF: [0, 200], INTAKE_PRESSURE: [0, 255],
+};
+const unitRanges = { '%': [0, 100], '°C': [-40, 150], lambda: [0.5, 1.5] };
+
+// Where the gauge of a sensor begins and ends: as usual for it, else as far as it was seen.
+export function rangeOf(sensor) {
+  let [low, high] = ranges[sensor.sensor] ?? unitRanges[sensor.unit] ?? [0, 1];
+  const { min, max } = sensor.stats;
+  if (sensor.unit === '%' && min < 0 && !ranges[sensor.sensor]) low = -100;
+  if (min != null) {
+    low = Math.min(low, min);
+    high = Math.max(high, max);
+  }
+  return [low, nice(high, low)];
+}
+
+function nice(high, low) {
+  if (high === low) return low + 1;
+  const step = 10 ** Math.floor(Math.log10(high - low));
+  return Math.ceil((high - low) / (step / 2)) * (step / 2) + low;
+}

@@ -1,0 +1,288 @@
+#include "libvelmora/dash/dashoutput.h"
+#include "tests/support/httpclient.h"
+#include "tests/support/temporaryfolder.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+namespace {
+
+using testing::HasSubstr;
+using testing::Not;
+using testing::StartsWith;
+using testsupport::httpBody;
+using testsupport::HttpClient;
+using velmora::DashDesk;
+using velmora::DashOutput;
+using velmora::Json;
+using velmora::Reading;
+
+Reading dashReading(std::string const& sensor, double value, std::int64_t millis = 1000)
+{
+    Reading reading;
+    reading.time = std::chrono::system_clock::time_point(std::chrono::milliseconds(millis));
+    reading.module = 0x7E8;
+    reading.sensor = sensor;
+    reading.name = "Engine " + sensor;
+    reading.unit = "rpm";
+    reading.value = value;
+    return reading;
+}
+
+// The page's server with a car that the test plays.
+struct Page
+{
+    testsupport::TemporaryFolder folder;
+    std::shared_ptr<DashDesk> desk = std::make_shared<DashDesk>();
+    std::string link;
+    std::unique_ptr<DashOutput> output;
+
+    explicit Page(std::string const& options = "")
+    {
+        velmora::DashContext context;
+        context.desk = desk;
+        context.layouts = folder.file("layouts.toml");
+        context.onLink = [this](std::string const& where, std::string const& /*remark*/) { link = where; };
+        output = std::make_unique<DashOutput>(velmora::parseOutputAddress("dash:127.0.0.1:0" + options), context);
+        output->open();
+        desk->tell(velmora::DashVehicle{"van", {{0x7E8, "RPM", "010C", "Engine RPM", "rpm"}}});
+    }
+
+    std::string host() const { return "127.0.0.1:" + std::to_string(output->port()); }
+    std::string token() const { return link.find("#t=") == std::string::npos ? "" : link.substr(link.find("#t=") + 3); }
+    std::string get(std::string const& path, std::string const& more = "") const
+    {
+        return HttpClient(output->port())
+            .ask("GET " + path + " HTTP/1.1\r\nHost: " + host() + "\r\nConnection: close\r\n" + more + "\r\n");
+    }
+    std::string post(std::string const& path, std::string const& body, std::string const& more = "") const
+    {
+        return HttpClient(output->port())
+            .ask("POST " + path + " HTTP/1.1\r\nHost: " + host() + "\r\nOrigin: http://" + host() +
+                 "\r\nConnection: close\r\nContent-Length: " + std::to_string(body.size()) + "\r\n" + more + "\r\n" +
+                 body);
+    }
+    std::string cookie() const { return "Cookie: velmora_" + std::to_string(output->port()) + "=" + token() + "\r\n"; }
+};
+
+// The data of the next event of that name.
+Json nextEvent(HttpClient& stream, std::string const& name)
+{
+    stream.readUntil("event: " + name + "\ndata: ");
+    return Json::parse(stream.readUntil("\n"), nullptr, false);
+}
+
+TEST(DashOutput, ServesThePageWithoutAnythingFromElsewhere)
+{
+    Page const page;
+    std::string const shell = page.get("/");
+    EXPECT_THAT(shell, HasSubstr("<title>Velmora</title>"));
+    EXPECT_THAT(shell, HasSubstr("Content-Security-Policy: default-src 'none'; script-src 'self'"));
+    std::string const body = httpBody(shell);
+    for (char const* const inlined : {"<style", " style=", "onclick=", "http://", "https://"}) {
+        EXPECT_THAT(body, Not(HasSubstr(inlined)));
+    }
+    std::string const packed = page.get("/page/chart.min.js", "Accept-Encoding: gzip\r\n");
+    EXPECT_THAT(packed, HasSubstr("Content-Encoding: gzip"));
+    EXPECT_THAT(httpBody(packed), StartsWith("\x1F\x8B"));
+    EXPECT_LT(packed.size(), 80000U);
+    std::string const tag = packed.substr(packed.find("ETag: ") + 6, 18);
+    EXPECT_THAT(page.get("/page/chart.min.js", "If-None-Match: " + tag + "\r\n"), StartsWith("HTTP/1.1 304"));
+    EXPECT_THAT(page.get("/notices.txt"), HasSubstr("Permission is hereby granted"));
+    EXPECT_THAT(page.get("/page/../dash.js"), StartsWith("HTTP/1.1 404"));
+    EXPECT_THAT(page.link, StartsWith("http://127.0.0.1:"));
+    EXPECT_EQ(page.token(), "");
+}
+
+TEST(DashOutput, TellsABrowserAllAtFirstAndThenWhatChanges)
+{
+    Page const page;
+    page.desk->tell(dashReading("RPM", 800.0));
+    HttpClient stream(page.output->port());
+    stream.send("GET /events HTTP/1.1\r\nHost: localhost\r\n\r\n");
+    Json const hello = nextEvent(stream, "hello");
+    EXPECT_EQ(hello["vehicle"]["offered"][0]["id"], "7E8/RPM");
+    EXPECT_EQ(hello["values"]["v"], Json::parse(R"([["7E8/RPM", 1000, 800]])"));
+    EXPECT_EQ(hello["values"]["sensors"][0]["name"], "Engine RPM");
+    EXPECT_EQ(hello["layout"], nullptr);
+    EXPECT_EQ(hello["allow"]["clear"], false);
+    page.get("/"); // by now the server knows that the stream has taken all
+
+    page.desk->tell(dashReading("RPM", 900.0, 2000));
+    auto const code = std::make_shared<velmora::Record const>(
+        velmora::CodeChange{{}, "van", 0x7E8, "P0133", "confirmed", "O2 <b>slow</b>", true});
+    std::vector<velmora::SharedRecord> const records = {code};
+    page.output->write(records);
+    EXPECT_EQ(nextEvent(stream, "values")["v"], Json::parse(R"([["7E8/RPM", 2000, 900]])"));
+    EXPECT_EQ(nextEvent(stream, "news")["codes"][0]["code"], "P0133");
+    EXPECT_TRUE(nextEvent(stream, "beat").contains("state"));
+    page.desk->tell(velmora::DashAnswer{"info", true, Json::array({1})});
+    EXPECT_EQ(nextEvent(stream, "answer")["data"], Json::array({1}));
+    EXPECT_THAT(page.get("/history?7E8/RPM"), HasSubstr(R"({"id":"7E8/RPM","t":[1000,2000],"v":[800,900]})"));
+}
+
+TEST(DashOutput, KeepsALayoutForItsVehicle)
+{
+    Page page;
+    EXPECT_THAT(page.post("/layout", R"({"gauges":["7E8/RPM"],"units":"imperial"})"), StartsWith("HTTP/1.1 204"));
+    auto const wish = page.desk->next();
+    ASSERT_TRUE(wish.has_value());
+    EXPECT_EQ(wish->topic, "sensors");
+    EXPECT_EQ(wish->text, "7E8/RPM\n");
+    for (char const* const wrong : {"", "[]", "{", R"({"gauges":"x"})", R"({"gauges":[1]})", R"({"evil":1})",
+                                    R"({"units":"stones"})", R"({"minutes":99})", R"({"minutes":"5"})"}) {
+        EXPECT_THAT(page.post("/layout", wrong), StartsWith("HTTP/1.1 400")) << wrong;
+    }
+    page.desk->tell(velmora::DashVehicle{"other", {}});
+    HttpClient other(page.output->port());
+    other.send("GET /events HTTP/1.1\r\nHost: localhost\r\n\r\n");
+    EXPECT_EQ(nextEvent(other, "hello")["layout"], nullptr);
+    page.desk->tell(velmora::DashVehicle{"van", {}});
+    EXPECT_EQ(nextEvent(other, "hello")["layout"]["units"], "imperial");
+}
+
+TEST(DashOutput, AsksTheCarForWhatIsAllowedOnly)
+{
+    Page const page;
+    EXPECT_THAT(page.post("/ask", R"({"topic":"codes"})"), StartsWith("HTTP/1.1 202"));
+    EXPECT_THAT(page.post("/ask", R"({"topic":"codes"})"), StartsWith("HTTP/1.1 202")); // the same once more
+    EXPECT_EQ(page.desk->next()->topic, "codes");
+    EXPECT_FALSE(page.desk->next().has_value());
+    EXPECT_THAT(page.post("/ask", R"({"topic":"clear","sure":true})"), StartsWith("HTTP/1.1 403"));
+    EXPECT_THAT(page.post("/ask", R"({"topic":"console","text":"ATI"})"), StartsWith("HTTP/1.1 403"));
+    EXPECT_THAT(page.post("/ask", R"({"topic":"sensors","text":"x"})"), StartsWith("HTTP/1.1 400"));
+    EXPECT_THAT(page.post("/ask", "nonsense"), StartsWith("HTTP/1.1 400"));
+    EXPECT_THAT(page.get("/ask"), StartsWith("HTTP/1.1 405"));
+    EXPECT_FALSE(page.desk->next().has_value());
+
+    Page const open("?allow_clear=yes&allow_console=yes");
+    EXPECT_THAT(open.post("/ask", R"({"topic":"clear"})", open.cookie()), StartsWith("HTTP/1.1 400"));
+    EXPECT_THAT(open.post("/ask", R"({"topic":"clear","sure":true})", open.cookie()), StartsWith("HTTP/1.1 202"));
+    EXPECT_THAT(open.post("/ask", "{\"topic\":\"console\",\"text\":\"ATI\\rATZ\"}", open.cookie()),
+                StartsWith("HTTP/1.1 400"));
+    EXPECT_THAT(open.post("/ask", R"({"topic":"console","text":"ATI"})", open.cookie()), StartsWith("HTTP/1.1 202"));
+    EXPECT_EQ(open.desk->next()->topic, "clear");
+    EXPECT_EQ(open.desk->next()->text, "ATI");
+}
+
+TEST(DashOutput, LetsInWhoHasTheTokenOnly)
+{
+    Page const page("?allow_clear=yes");
+    ASSERT_EQ(page.token().size(), 22U);
+    EXPECT_THAT(page.get("/"), StartsWith("HTTP/1.1 200")); // the shell tells nothing
+    for (char const* const path : {"/events", "/traffic", "/history?7E8/RPM", "/nothing"}) {
+        EXPECT_THAT(page.get(path), StartsWith("HTTP/1.1 401")) << path;
+    }
+    EXPECT_THAT(page.post("/ask", R"({"topic":"codes"})"), StartsWith("HTTP/1.1 401"));
+    EXPECT_THAT(page.post("/layout", "{}"), StartsWith("HTTP/1.1 401"));
+    EXPECT_THAT(page.post("/login", "wrong"), StartsWith("HTTP/1.1 401"));
+    std::string const in = page.post("/login", page.token());
+    EXPECT_THAT(in, HasSubstr("Set-Cookie: velmora_" + std::to_string(page.output->port()) + "=" + page.token() +
+                              "; Path=/; HttpOnly; SameSite=Strict"));
+    EXPECT_THAT(page.get("/history?7E8/RPM", page.cookie()), StartsWith("HTTP/1.1 200"));
+}
+
+TEST(DashOutput, SlowsThoseDownWhoTryTokens)
+{
+    Page const page("?allow_console=yes");
+    auto const begin = std::chrono::steady_clock::now();
+    for (int i = 0; i < 10; ++i) {
+        page.post("/login", "wrong");
+    }
+    EXPECT_LT(std::chrono::steady_clock::now() - begin, std::chrono::milliseconds(900));
+    HttpClient slow(page.output->port());
+    slow.send("POST /login HTTP/1.1\r\nHost: " + page.host() + "\r\nOrigin: http://" + page.host() +
+              "\r\nContent-Length: 1\r\nConnection: close\r\n\r\nx");
+    EXPECT_THAT(page.get("/"), StartsWith("HTTP/1.1 200")); // nobody else waits
+    EXPECT_THAT(slow.readAll(), StartsWith("HTTP/1.1 401"));
+    EXPECT_GT(std::chrono::steady_clock::now() - begin, std::chrono::milliseconds(900));
+}
+
+TEST(DashOutput, HostileClientsStopNobodyAndCostNothing)
+{
+    Page const page;
+    std::string const host = "Host: " + page.host() + "\r\n";
+    std::vector<std::unique_ptr<HttpClient>> halves;
+    for (int i = 0; i < 40; ++i) {
+        halves.push_back(std::make_unique<HttpClient>(page.output->port()));
+        halves.back()->send("GET /events HTTP/1.1\r\nHo");
+    }
+    auto const begin = std::chrono::steady_clock::now();
+    EXPECT_THAT(page.get("/"), StartsWith("HTTP/1.1 200"));
+    std::string fields = "GET / HTTP/1.1\r\n" + host;
+    for (int i = 0; i < 300000; ++i) {
+        fields += "X: y\r\n";
+    }
+    EXPECT_THAT(HttpClient(page.output->port()).ask(fields + "\r\n"), Not(HasSubstr("200 OK")));
+    HttpClient line(page.output->port());
+    std::string const megabyte(1 << 20, 'x');
+    line.send("GET / HTTP/1.1\r\n" + host + "X: ");
+    for (int i = 0; i < 100 && line.send(megabyte); ++i) {
+        // a line of 100 MB, until nobody takes it any more
+    }
+    EXPECT_THAT(line.readAll(), Not(HasSubstr("200 OK")));
+    for (char const* const smuggled : {"POST /ask HTTP/1.1\r\nContent-Length: 5\r\nTransfer-Encoding: chunked\r\n",
+                                       "GET / HTTP/1.1\r\nHost: a\r\n", "GET / HTTP/9.9\r\n", "GET /\r\n"}) {
+        EXPECT_THAT(HttpClient(page.output->port()).ask(smuggled + host + "Connection: close\r\n\r\n"),
+                    StartsWith("HTTP/1.1 400"))
+            << smuggled;
+    }
+    EXPECT_THAT(page.get("/"), StartsWith("HTTP/1.1 200"));
+    EXPECT_LT(std::chrono::steady_clock::now() - begin, std::chrono::seconds(3));
+}
+
+TEST(DashOutput, AReaderWhoIsTooSlowGetsTheLatestValuesInTheEnd)
+{
+    Page const page;
+    HttpClient stream(page.output->port());
+    stream.send("GET /events HTTP/1.1\r\nHost: localhost\r\n\r\n");
+    stream.readUntil("event: hello");
+    constexpr int sensors = 100;
+    constexpr int rounds = 1500; // far more than the buffers of both ends hold
+    std::size_t told = 0;
+    for (int round = 0; round < rounds; ++round) {
+        for (int i = 0; i < sensors; ++i) {
+            page.desk->tell(dashReading("S" + std::to_string(i), round, 1000 + round));
+        }
+        page.output->write({});
+        ++told;
+    }
+    std::string const last = "\"7E8/S99\"," + std::to_string(1000 + rounds - 1) + ",";
+    std::string const all = stream.readUntil(last);
+    EXPECT_THAT(all, testing::EndsWith(last));
+    std::size_t events = 0;
+    for (std::size_t at = all.find("event: values"); at != std::string::npos; at = all.find("event: values", at + 1)) {
+        ++events;
+    }
+    EXPECT_LT(events, told); // the ones between were left out, not kept
+}
+
+TEST(DashOutput, EndsAtOnceWithBrowsersConnected)
+{
+    Page page;
+    HttpClient stream(page.output->port());
+    stream.send("GET /events HTTP/1.1\r\nHost: localhost\r\n\r\n");
+    stream.readUntil("event: hello");
+    HttpClient const idle(page.output->port());
+    auto const begin = std::chrono::steady_clock::now();
+    page.output->close();
+    page.output.reset();
+    EXPECT_LT(std::chrono::steady_clock::now() - begin, std::chrono::milliseconds(500));
+    page.desk->tell(dashReading("RPM", 1.0)); // nobody listens any more
+}
+
+TEST(DashState, ThinsAHistoryAndKeepsItsPeaks)
+{
+    velmora::DashState state;
+    for (int i = 0; i < 3000; ++i) {
+        state.take(dashReading("RPM", i == 1234 ? 9999.0 : 800.0, 100 * i));
+    }
+    Json const history = state.history("7E8/RPM", 200);
+    EXPECT_LE(history["t"].size(), 220U);
+    EXPECT_EQ(history["t"].size(), history["v"].size());
+    EXPECT_THAT(history["v"], testing::Contains(9999.0));
+    EXPECT_EQ(history["t"].back(), 299900);
+    EXPECT_EQ(state.history("none", 200)["t"], Json::array());
+}
+
+} // namespace
