@@ -13,9 +13,9 @@ namespace velmora {
 namespace {
 
 constexpr int keepAliveSeconds = 30;
-constexpr int withoutMqtt5 = 0x84;              // what a broker answers that has no MQTT 5
-constexpr int refusals = 0x80;                  // reasons from here on
-constexpr std::chrono::seconds answerLimit{15}; // a cluster that has lost a node takes 4 s and more
+constexpr int withoutMqtt5 = 0x84;               // what a broker answers that has no MQTT 5
+constexpr int refusals = 0x80;                   // reasons from here on
+constexpr std::chrono::seconds connackLimit{15}; // a cluster that has lost a node takes 4 s and more
 constexpr int loopMillis = 100;
 
 struct Mosquitto
@@ -106,7 +106,7 @@ void BrokerLink::run()
         if (m_stop) {
             return;
         }
-        if (stood && std::chrono::steady_clock::now() - begin > answerLimit) {
+        if (stood && std::chrono::steady_clock::now() - begin > connackLimit) {
             backoff.reset();
         }
         if (!m_atOnce) {
@@ -141,7 +141,7 @@ void BrokerLink::attempt()
 
 void BrokerLink::follow(mosquitto* client)
 {
-    auto const limit = std::chrono::steady_clock::now() + answerLimit;
+    auto const limit = std::chrono::steady_clock::now() + connackLimit;
     m_again = false;
     while (!m_stop) {
         int const result = ::mosquitto_loop(client, loopMillis, 1);

@@ -9,9 +9,9 @@ namespace velmora {
 
 namespace {
 
-constexpr std::int64_t smallestStep = 2000;        // ms; less is the work of a time server that slews
-constexpr std::int64_t patience = 5 * 60 * 1000;   // ms without a step until a clock counts as it is
-constexpr std::int64_t earliest = 1735689600000LL; // 2025 began: this program is younger
+constexpr std::int64_t smallestStep = 2000;           // ms; less is the work of a time server that slews
+constexpr std::int64_t untilBelieved = 5 * 60 * 1000; // ms without a step until a clock counts as it is
+constexpr std::int64_t earliest = 1735689600000LL;    // 2025 began: this program is younger
 
 std::int64_t millisOf(clockid_t id)
 {
@@ -53,7 +53,7 @@ std::int64_t ClockJudge::look(ClockLook const& now)
     }
     m_known = true;
     m_offset = offset;
-    bool const stable = now.boot - m_lastSet >= patience;
+    bool const stable = now.boot - m_lastSet >= untilBelieved;
     if (now.synced || (stable && now.wall >= earliest)) {
         m_trust = Trust::Sure;
     } else {

@@ -57,7 +57,7 @@ WatchSettings settingsOf(WatchOptions const& chosen)
     return settings;
 }
 
-constexpr std::chrono::milliseconds patience{700}; // with the car, before the outputs are ended without it
+constexpr std::chrono::milliseconds carPatience{700}; // with the car, before the outputs are ended without it
 
 // A run, and what signals do to it.
 class WatchCommand
@@ -68,7 +68,7 @@ public:
     {
         Interrupt::instance().setHandler([this] {
             end();
-            m_lastResort.arm(patience, [this] { giveUp(); });
+            m_lastResort.arm(carPatience, [this] { giveUp(); });
         });
         Interrupt::instance().setHangUpHandler([this] {
             m_reload = true;

@@ -27,7 +27,7 @@ velmora::Reading inUnit(std::string const& sensor, double value, std::string con
     return result;
 }
 
-velmora::MetricsPage::SteadyTime const start(std::chrono::hours(100));
+velmora::MetricsPage::SteadyTime const pageStart(std::chrono::hours(100));
 
 Health busyHealth()
 {
@@ -51,16 +51,16 @@ MetricsPage fullPage()
         std::string const label = velmora::unitLabel(static_cast<MeasurementUnit>(unit));
         for (unsigned int const module : {0x7E8U, 0x7E9U}) {
             velmora::Reading each = inUnit("SENSOR_" + std::to_string(unit), 1.5, label, module);
-            page.take(each, start);
+            page.take(each, pageStart);
             each.vehicle = "my \"van\"\\\n";
-            page.take(each, start);
+            page.take(each, pageStart);
         }
     }
-    page.take(inUnit("FURLONGS", 1.0, "fur/14 nights"), start);
+    page.take(inUnit("FURLONGS", 1.0, "fur/14 nights"), pageStart);
     return page;
 }
 
-std::string const page = fullPage().render(start + std::chrono::milliseconds(2000), busyHealth());
+std::string const page = fullPage().render(pageStart + std::chrono::milliseconds(2000), busyHealth());
 
 TEST(Prometheus, TheToolThatChecksMetricsIsContent)
 {
@@ -94,11 +94,11 @@ TEST(Prometheus, NoSeriesComesTwiceAndNoFamilyInTwoPlaces)
 TEST(Prometheus, NumbersAreInBaseUnits)
 {
     MetricsPage some;
-    some.take(inUnit("SPEED", 36.0, "km/h"), start);
-    some.take(inUnit("OIL", 212.0, "°F"), start);
-    some.take(inUnit("LOAD", 41.0, "%"), start);
-    some.take(inUnit("MAP", 101.3, "kPa"), start);
-    std::string const text = some.render(start + std::chrono::milliseconds(1500), {});
+    some.take(inUnit("SPEED", 36.0, "km/h"), pageStart);
+    some.take(inUnit("OIL", 212.0, "°F"), pageStart);
+    some.take(inUnit("LOAD", 41.0, "%"), pageStart);
+    some.take(inUnit("MAP", 101.3, "kPa"), pageStart);
+    std::string const text = some.render(pageStart + std::chrono::milliseconds(1500), {});
     std::string const labels = "{vehicle=\"van\",module=\"7E8\",sensor=";
     EXPECT_THAT(text, HasSubstr("velmora_speed_meters_per_second" + labels + "\"SPEED\"} 10\n"));
     EXPECT_THAT(text, HasSubstr("velmora_temperature_celsius" + labels + "\"OIL\"} 100\n"));
@@ -110,14 +110,14 @@ TEST(Prometheus, NumbersAreInBaseUnits)
 TEST(Prometheus, WhatIsOldOrWithoutANumberLeavesThePage)
 {
     MetricsPage some;
-    some.take(inUnit("SPEED", 36.0, "km/h"), start);
+    some.take(inUnit("SPEED", 36.0, "km/h"), pageStart);
     velmora::Reading nothing = inUnit("OLD", 1.0, "km/h");
-    some.take(nothing, start);
+    some.take(nothing, pageStart);
     nothing.value = {};
-    some.take(nothing, start);
-    EXPECT_THAT(some.render(start + std::chrono::milliseconds(60000), {}), HasSubstr("SPEED"));
-    EXPECT_THAT(some.render(start + std::chrono::milliseconds(60000), {}), Not(HasSubstr("OLD")));
-    EXPECT_THAT(some.render(start + std::chrono::milliseconds(60001), {}), Not(HasSubstr("SPEED")));
+    some.take(nothing, pageStart);
+    EXPECT_THAT(some.render(pageStart + std::chrono::milliseconds(60000), {}), HasSubstr("SPEED"));
+    EXPECT_THAT(some.render(pageStart + std::chrono::milliseconds(60000), {}), Not(HasSubstr("OLD")));
+    EXPECT_THAT(some.render(pageStart + std::chrono::milliseconds(60001), {}), Not(HasSubstr("SPEED")));
 }
 
 TEST(Prometheus, TellsItsOwnHealth)
