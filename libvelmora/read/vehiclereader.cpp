@@ -4,6 +4,7 @@
 #include "libvelmora/read/diagnosticreaders.h"
 #include "libvelmora/read/freezereader.h"
 #include "libvelmora/read/topicanswer.h"
+#include "libvelmora/read/valuesreader.h"
 #include "libvelmora/text/text.h"
 
 #include <obd/iecu.h>
@@ -29,17 +30,23 @@ std::vector<unsigned int> sensorsOf(obd::IEcu const& ecu)
 ModuleReport readModule(Session& session, obd::IEcu const& ecu, CodeReader& reader)
 {
     constexpr unsigned char newestFrame = 0;
-    return {ecu.id(),
-            readable(ecu.name()),
-            sensorsOf(ecu),
-            readInfo(session, ecu),
-            reader.read(ecu, {CodeKind::Confirmed, CodeKind::Pending, CodeKind::Permanent}),
-            readFreeze(session, ecu, newestFrame),
-            readReadiness(session, ecu),
-            readMonitors(session, ecu),
-            readOxygen(session, ecu),
-            readCounters(session, ecu),
-            toAnswer(ecu.detection(obd::ObdMode::CurrentData, 0))};
+    // Between the two readings of the values lies all else, which takes seconds: what is the same in both lasts.
+    std::vector<LiveValue> values = readValues(session, ecu);
+    ModuleReport report{ecu.id(),
+                        readable(ecu.name()),
+                        sensorsOf(ecu),
+                        readInfo(session, ecu),
+                        reader.read(ecu, {CodeKind::Confirmed, CodeKind::Pending, CodeKind::Permanent}),
+                        readFreeze(session, ecu, newestFrame),
+                        readReadiness(session, ecu),
+                        readMonitors(session, ecu),
+                        readOxygen(session, ecu),
+                        readCounters(session, ecu),
+                        toAnswer(ecu.detection(obd::ObdMode::CurrentData, 0)),
+                        {}};
+    readValuesAgain(session, ecu, values);
+    report.values = std::move(values);
+    return report;
 }
 
 void giveMeanings(VehicleReport& report, std::string const& named)

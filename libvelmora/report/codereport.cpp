@@ -1,5 +1,7 @@
 #include "libvelmora/report/codereport.h"
 
+#include "libvelmora/report/texts/findingtexts.h"
+
 #include <algorithm>
 
 namespace velmora {
@@ -71,11 +73,11 @@ std::vector<std::string> untold(CodeReport const& report)
 {
     std::vector<std::string> list;
     if (!report.lamp && report.lampAnswer != TopicAnswer::NotOffered) {
-        list.emplace_back("lamp");
+        list.emplace_back(texts::finding::lampTopic);
     }
     for (CodeList const& codes : report.lists) {
         if (codes.kind == CodeKind::Confirmed && codes.answer != CodeList::Answer::Read && codes.offered) {
-            list.emplace_back("confirmed codes");
+            list.emplace_back(texts::finding::confirmedTopic);
         }
     }
     return list;
@@ -83,10 +85,13 @@ std::vector<std::string> untold(CodeReport const& report)
 
 Json toJsonValue(CodeReport const& report)
 {
-    Json document = {{"lamp", valueOrNull(report.lamp)}, {"maker", toJson(report.maker)}};
+    Json document = {{"lamp", valueOrNull(report.lamp)},
+                     {"lampAnswer", answerWord(report.lamp ? TopicAnswer::Read : report.lampAnswer)},
+                     {"maker", toJson(report.maker)}};
     for (CodeList const& list : report.lists) {
         bool const read = list.answer == CodeList::Answer::Read;
         document[kindKey(list.kind)] = {{"answer", answerKey(list.answer)},
+                                        {"offered", list.offered},
                                         {"reason", textOrNull(list.reason)},
                                         {"codes", read ? toJsonValue(list.codes) : Json(nullptr)}};
     }

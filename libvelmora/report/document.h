@@ -45,6 +45,7 @@ struct DocumentCell
     DocumentMark mark = DocumentMark::None;
     bool isNumber = false;       // aligned at the right
     std::optional<LimitBar> bar; // drawn where the form can
+    std::string link = {};       // anchor of the section that the text leads to
 };
 
 struct DocumentTable
@@ -64,13 +65,29 @@ struct DocumentParagraph
     DocumentCell text;
 };
 
-using DocumentBlock = std::variant<DocumentParagraph, DocumentFacts, DocumentTable>;
+// A few numbers that one sees first.
+struct DocumentTiles
+{
+    std::vector<std::pair<std::string, DocumentCell>> tiles;
+};
+
+// One thing worth telling with what speaks for it.
+struct DocumentNote
+{
+    DocumentCell word; // how it is to be taken, with its mark
+    std::string title;
+    std::string text;
+    std::vector<std::pair<std::string, std::vector<DocumentCell>>> lists; // each under its label
+};
+
+using DocumentBlock = std::variant<DocumentParagraph, DocumentFacts, DocumentTable, DocumentTiles, DocumentNote>;
 
 struct DocumentSection
 {
     int level; // 1 is the highest below the title
     std::string title;
     std::vector<DocumentBlock> blocks;
+    std::string anchor = {}; // letters, digits and hyphens; empty for a section that nothing leads to
 };
 
 struct ReportDocument
@@ -78,6 +95,7 @@ struct ReportDocument
     std::string title;
     std::vector<DocumentSection> sections;
     std::string footer;
+    std::string contents = {}; // title of a list of the sections of level 1, which is left out without one
 };
 
 // One page that needs nothing else: no script, no picture from elsewhere; it prints on A4 and Letter.

@@ -1,5 +1,9 @@
 #include "libvelmora/report/findings.h"
 
+#include "libvelmora/report/findingparts.h"
+#include "libvelmora/report/texts/findingtexts.h"
+#include "libvelmora/report/texts/labels.h"
+
 #include <fmt/format.h>
 
 #include <algorithm>
@@ -9,21 +13,21 @@ namespace velmora {
 
 namespace {
 
-std::string nameOf(ModuleReport const& module)
-{
-    return fmt::format("{:X}{}{}", module.id, module.name.empty() ? "" : " ", module.name);
-}
-
 char const* kindWord(CodeKind kind)
 {
-    static constexpr std::array words = {"confirmed", "pending", "permanent"};
-    return words[static_cast<std::size_t>(kind)];
+    static constexpr std::array all = {texts::confirmedWord, texts::pendingWord, texts::permanentWord};
+    return all[static_cast<std::size_t>(kind)];
 }
 
 void addLamp(std::vector<Finding>& list, ModuleReport const& module)
 {
     if (module.codes.lamp.value_or(false)) {
-        list.push_back({Severity::Bad, nameOf(module), "lamp", "the malfunction indicator is on"});
+        list.push_back({Severity::Bad,
+                        nameOf(module),
+                        texts::finding::lamp,
+                        texts::finding::lampOn,
+                        "lamp-on",
+                        {{DataTopic::Codes, module.id}}});
     }
 }
 
@@ -46,17 +50,23 @@ void addCodes(std::vector<Finding>& list, ModuleReport const& module)
                 continue;
             }
             Severity const severity = codes.kind == CodeKind::Pending ? Severity::Warning : Severity::Bad;
-            list.push_back({severity, nameOf(module), kindWord(codes.kind), text});
+            list.push_back(
+                {severity, nameOf(module), kindWord(codes.kind), text, "code", {{DataTopic::Codes, module.id}}});
         }
     }
 }
 
-void addFailed(std::vector<Finding>& list, ModuleReport const& module, std::string const& what,
+void addFailed(std::vector<Finding>& list, ModuleReport const& module, std::string const& what, DataTopic topic,
                std::vector<LimitTest> const& tests)
 {
     for (LimitTest const& test : tests) {
         if (test.verdict == LimitTest::Verdict::Failed) {
-            list.push_back({Severity::Bad, nameOf(module), "failed test", what + ": " + test.description});
+            list.push_back({Severity::Bad,
+                            nameOf(module),
+                            texts::finding::failedTest,
+                            what + ": " + test.description,
+                            "test-failed",
+                            {{topic, module.id}}});
         }
     }
 }
@@ -64,10 +74,10 @@ void addFailed(std::vector<Finding>& list, ModuleReport const& module, std::stri
 void addTests(std::vector<Finding>& list, ModuleReport const& module)
 {
     for (OnBoardMonitor const& monitor : module.monitors.monitors) {
-        addFailed(list, module, monitor.description, monitor.tests);
+        addFailed(list, module, monitor.description, DataTopic::Monitors, monitor.tests);
     }
     for (OxygenSensor const& sensor : module.oxygen.sensors) {
-        addFailed(list, module, locationName(sensor.location), sensor.tests);
+        addFailed(list, module, locationName(sensor.location), DataTopic::Oxygen, sensor.tests);
     }
 }
 
@@ -75,7 +85,12 @@ void addReadiness(std::vector<Finding>& list, ModuleReport const& module)
 {
     for (ReadinessMonitor const& monitor : module.readiness.monitors) {
         if (monitor.sinceCleared == ReadinessStatus::NotComplete) {
-            list.push_back({Severity::Warning, nameOf(module), "not complete", monitor.name});
+            list.push_back({Severity::Warning,
+                            nameOf(module),
+                            texts::finding::notComplete,
+                            monitor.name,
+                            "not-complete",
+                            {{DataTopic::Readiness, module.id}}});
         }
     }
 }
@@ -84,11 +99,18 @@ void addReadiness(std::vector<Finding>& list, ModuleReport const& module)
 void addUntold(std::vector<Finding>& list, ModuleReport const& module)
 {
     std::vector<std::string> topics = untold(module.codes);
+    std::vector<Evidence> evidence;
+    if (!topics.empty()) {
+        evidence.push_back({DataTopic::Codes, module.id});
+    }
     if (!toldOffers(module)) {
-        topics.push_back(fmt::format("all that it supports ({})", answerWord(module.offers)));
+        topics.push_back(fmt::format(texts::finding::supportsTopic, answerWord(module.offers)));
+        evidence.push_back({DataTopic::Supported, module.id});
     }
     if (!topics.empty()) {
-        list.push_back({Severity::Warning, nameOf(module), "not told", fmt::format("{}", fmt::join(topics, " and "))});
+        list.push_back({Severity::Warning, nameOf(module), texts::finding::untold,
+                        fmt::format("{}", fmt::join(topics, texts::finding::joinAnd)), "not-told",
+                        std::move(evidence)});
     }
 }
 
@@ -101,6 +123,10 @@ std::vector<Finding> findings(VehicleReport const& report)
         for (ModuleReport const& module : report.modules) {
             add(list, module);
         }
+    }
+    for (auto const add : {addClearedCodes, addLampsWithoutCode, addDifferingVins, addNearLimits, addFuelTrims,
+                           addTemperatures, addVoltages, addMisfires, addMissingVerification}) {
+        add(list, report);
     }
     return list;
 }

@@ -1,5 +1,7 @@
 #include "libvelmora/report/document.h"
+#include "libvelmora/report/htmlescape.h"
 #include "libvelmora/report/htmlstyle.h"
+#include "libvelmora/report/limitbar.h"
 
 #include <fmt/format.h>
 
@@ -8,30 +10,6 @@
 namespace velmora {
 
 namespace {
-
-std::string escaped(std::string const& text)
-{
-    std::string result;
-    for (char const each : text) {
-        switch (each) {
-        case '&':
-            result += "&amp;";
-            break;
-        case '<':
-            result += "&lt;";
-            break;
-        case '>':
-            result += "&gt;";
-            break;
-        case '"':
-            result += "&quot;";
-            break;
-        default:
-            result += each;
-        }
-    }
-    return result;
-}
 
 char const* className(DocumentMark mark)
 {
@@ -48,44 +26,16 @@ std::string classes(DocumentCell const& cell)
     return names.empty() ? "" : fmt::format(" class=\"{}\"", names);
 }
 
-// The part of the bar, 0 to 1, at which a number stands: the limits are at a fifth and four fifths, so that what lies
-// outside is seen outside. With one limit the bar begins or ends at 0.
-struct BarScale
-{
-    double low;
-    double high;
-
-    explicit BarScale(LimitBar const& bar)
-    {
-        double const min = bar.min.value_or(std::min(0.0, *bar.max));
-        double const max = bar.max.value_or(std::max(0.0, *bar.min));
-        double const span = max > min ? max - min : 1.0;
-        low = min - (bar.min ? span / 3.0 : 0.0);
-        high = max + (bar.max ? span / 3.0 : span);
-    }
-
-    double place(double number) const { return std::clamp((number - low) / (high - low), 0.0, 1.0) * 100.0; }
-};
-
-std::string barOf(LimitBar const& bar)
-{
-    if (!bar.min && !bar.max) {
-        return {};
-    }
-    BarScale const scale(bar);
-    double const from = bar.min ? scale.place(*bar.min) : 0.0;
-    double const to = bar.max ? scale.place(*bar.max) : 100.0;
-    return fmt::format("<svg class=\"bar\" viewBox=\"0 0 100 10\" width=\"100\" height=\"10\" aria-hidden=\"true\">"
-                       "<rect x=\"0.5\" y=\"3\" width=\"99\" height=\"4\" class=\"outside\"/>"
-                       "<rect x=\"{:.1f}\" y=\"3\" width=\"{:.1f}\" height=\"4\" class=\"inside\"/>"
-                       "<rect x=\"{:.1f}\" y=\"0\" width=\"2\" height=\"10\" class=\"value\"/></svg>",
-                       from, std::max(to - from, 0.5), std::clamp(scale.place(bar.value) - 1.0, 0.0, 98.0));
-}
-
 std::string content(DocumentCell const& cell)
 {
-    std::string const text = cell.text.empty() ? "-" : escaped(cell.text);
-    return cell.bar ? text + " " + barOf(*cell.bar) : text;
+    std::string text = cell.text.empty() ? "-" : escapedHtml(cell.text);
+    if (cell.mark == DocumentMark::Good || cell.mark == DocumentMark::Warning || cell.mark == DocumentMark::Bad) {
+        text = fmt::format("<span class=\"mark\">{}</span>", text);
+    }
+    if (!cell.link.empty()) {
+        text = fmt::format("<a href=\"#{}\">{}</a>", escapedHtml(cell.link), text);
+    }
+    return cell.bar ? text + " " + drawnBar(*cell.bar) : text;
 }
 
 struct HtmlBlock
@@ -99,38 +49,92 @@ struct HtmlBlock
     {
         std::string rows;
         for (auto const& [label, cell] : facts.rows) {
-            rows += fmt::format("<tr><th scope=\"row\">{}</th><td{}>{}</td></tr>\n", escaped(label), classes(cell),
+            rows += fmt::format("<tr><th scope=\"row\">{}</th><td{}>{}</td></tr>\n", escapedHtml(label), classes(cell),
                                 content(cell));
         }
         return "<table class=\"facts\">\n<tbody>\n" + rows + "</tbody>\n</table>\n";
     }
 
+    // A row of a wide table becomes a block on a phone, each cell behind the head that it stands under.
     std::string operator()(DocumentTable const& table) const
     {
-        std::string html = "<table>\n<thead>\n<tr>";
+        constexpr std::size_t manyColumns = 5;
+        bool const wide = table.heads.size() >= manyColumns;
+        std::string html = wide ? "<table class=\"wide\">\n<thead>\n<tr>" : "<table>\n<thead>\n<tr>";
         for (DocumentCell const& head : table.heads) {
-            html += fmt::format("<th scope=\"col\"{}>{}</th>", classes(head), escaped(head.text));
+            html += fmt::format("<th scope=\"col\"{}>{}</th>", classes(head), escapedHtml(head.text));
         }
         html += "</tr>\n</thead>\n<tbody>\n";
         for (std::vector<DocumentCell> const& row : table.rows) {
             html += "<tr>";
-            for (DocumentCell const& cell : row) {
-                html += fmt::format("<td{}>{}</td>", classes(cell), content(cell));
+            for (std::size_t i = 0; i < row.size(); ++i) {
+                std::string const head = wide ? headOf(table, i) : std::string();
+                html += fmt::format("<td{}{}>{}</td>", classes(row[i]), head, content(row[i]));
             }
             html += "</tr>\n";
         }
         return html + "</tbody>\n</table>\n";
+    }
+
+    static std::string headOf(DocumentTable const& table, std::size_t column)
+    {
+        return column < table.heads.size() ? fmt::format(" data-head=\"{}\"", escapedHtml(table.heads[column].text))
+                                           : std::string();
+    }
+
+    std::string operator()(DocumentTiles const& tiles) const
+    {
+        std::string html = "<dl class=\"tiles\">\n";
+        for (auto const& [label, cell] : tiles.tiles) {
+            html +=
+                fmt::format("<div{}><dt>{}</dt><dd>{}</dd></div>\n", classes(cell), escapedHtml(label), content(cell));
+        }
+        return html + "</dl>\n";
+    }
+
+    std::string operator()(DocumentNote const& note) const
+    {
+        std::string html = fmt::format(
+            "<div class=\"note {}\">\n<p class=\"title\"><span class=\"mark\">{}</span> {}</p>\n"
+            "<p>{}</p>\n",
+            className(note.word.mark), escapedHtml(note.word.text), escapedHtml(note.title), escapedHtml(note.text));
+        for (auto const& [label, cells] : note.lists) {
+            html += fmt::format("<p class=\"label\">{}</p>\n<ul>\n", escapedHtml(label));
+            for (DocumentCell const& cell : cells) {
+                html += fmt::format("<li>{}</li>\n", content(cell));
+            }
+            html += "</ul>\n";
+        }
+        return html + "</div>\n";
     }
 };
 
 std::string sectionOf(DocumentSection const& section)
 {
     int const level = std::clamp(section.level + 1, 2, 6);
-    std::string html = fmt::format("<section>\n<h{0}>{1}</h{0}>\n", level, escaped(section.title));
+    std::string const anchor =
+        section.anchor.empty() ? std::string() : fmt::format(" id=\"{}\"", escapedHtml(section.anchor));
+    std::string html =
+        fmt::format("<section class=\"level{0}\"{1}>\n<h{0}>{2}</h{0}>\n", level, anchor, escapedHtml(section.title));
     for (DocumentBlock const& block : section.blocks) {
         html += std::visit(HtmlBlock{}, block);
     }
     return html + "</section>\n";
+}
+
+std::string contentsOf(ReportDocument const& document)
+{
+    if (document.contents.empty()) {
+        return {};
+    }
+    std::string html = fmt::format("<nav aria-label=\"{}\">\n<ul>\n", escapedHtml(document.contents));
+    for (DocumentSection const& section : document.sections) {
+        if (section.level == 1 && !section.anchor.empty()) {
+            html += fmt::format("<li><a href=\"#{}\">{}</a></li>\n", escapedHtml(section.anchor),
+                                escapedHtml(section.title));
+        }
+    }
+    return html + "</ul>\n</nav>\n";
 }
 
 } // namespace
@@ -141,12 +145,12 @@ std::string toHtml(ReportDocument const& document)
         "<!DOCTYPE html>\n<html lang=\"en\">\n<head>\n<meta charset=\"utf-8\">\n"
         "<meta http-equiv=\"Content-Security-Policy\" content=\"default-src 'none'; style-src 'unsafe-inline'\">\n"
         "<meta name=\"viewport\" content=\"width=device-width, initial-scale=1\">\n"
-        "<title>{0}</title>\n<style>\n{1}</style>\n</head>\n<body>\n<main>\n<h1>{0}</h1>\n",
-        escaped(document.title), htmlStyle);
+        "<title>{0}</title>\n<style>\n{1}</style>\n</head>\n<body>\n<header>\n<h1>{0}</h1>\n{2}</header>\n<main>\n",
+        escapedHtml(document.title), htmlStyle, contentsOf(document));
     for (DocumentSection const& section : document.sections) {
         html += sectionOf(section);
     }
-    return html + "</main>\n<footer><p>" + escaped(document.footer) + "</p></footer>\n</body>\n</html>\n";
+    return html + "</main>\n<footer><p>" + escapedHtml(document.footer) + "</p></footer>\n</body>\n</html>\n";
 }
 
 } // namespace velmora

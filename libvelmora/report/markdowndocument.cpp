@@ -14,7 +14,7 @@ std::string escapedText(std::string const& text)
     constexpr std::string_view marks = "\\`*_{}[]<>()#+!|~&";
     std::string result;
     for (char const each : text) {
-        if (each == '\n' || each == '\r') {
+        if (static_cast<unsigned char>(each) < ' ') {
             result += ' ';
             continue;
         }
@@ -29,7 +29,14 @@ std::string escapedText(std::string const& text)
 std::string cellText(DocumentCell const& cell)
 {
     std::string const text = cell.text.empty() ? "-" : escapedText(cell.text);
-    return cell.mark == DocumentMark::Bad ? "**" + text + "**" : text;
+    std::string const marked = cell.mark == DocumentMark::Bad ? "**" + text + "**" : text;
+    return cell.link.empty() ? marked : "[" + marked + "](#" + cell.link + ")";
+}
+
+// Readers of Markdown make no anchor that is the same everywhere, so each section has one of ours before its heading.
+std::string anchorLine(DocumentSection const& section)
+{
+    return section.anchor.empty() ? "" : "<a id=\"" + section.anchor + "\"></a>\n\n";
 }
 
 struct MarkdownBlock
@@ -63,6 +70,27 @@ struct MarkdownBlock
         }
         return text + "\n";
     }
+
+    std::string operator()(DocumentTiles const& tiles) const
+    {
+        DocumentFacts facts;
+        facts.rows = tiles.tiles;
+        return (*this)(facts);
+    }
+
+    std::string operator()(DocumentNote const& note) const
+    {
+        std::string text = "**" + escapedText(note.word.text) + ": " + escapedText(note.title) + "**\n\n" +
+                           escapedText(note.text) + "\n\n";
+        for (auto const& [label, cells] : note.lists) {
+            text += escapedText(label) + ":\n\n";
+            for (DocumentCell const& cell : cells) {
+                text += "- " + cellText(cell) + "\n";
+            }
+            text += "\n";
+        }
+        return text;
+    }
 };
 
 } // namespace
@@ -71,8 +99,8 @@ std::string toMarkdown(ReportDocument const& document)
 {
     std::string text = "# " + escapedText(document.title) + "\n\n";
     for (DocumentSection const& section : document.sections) {
-        text +=
-            std::string(static_cast<std::size_t>(section.level) + 1, '#') + " " + escapedText(section.title) + "\n\n";
+        text += anchorLine(section) + std::string(static_cast<std::size_t>(section.level) + 1, '#') + " " +
+                escapedText(section.title) + "\n\n";
         for (DocumentBlock const& block : section.blocks) {
             text += std::visit(MarkdownBlock{}, block);
         }

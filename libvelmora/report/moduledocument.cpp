@@ -1,9 +1,9 @@
+#include "libvelmora/report/findings.h"
+#include "libvelmora/report/moduletables.h"
 #include "libvelmora/report/reportdocument.h"
-#include "libvelmora/report/texts.h"
+#include "libvelmora/report/texts/labels.h"
 
 #include <fmt/format.h>
-
-#include <charconv>
 
 namespace velmora {
 
@@ -35,13 +35,19 @@ DocumentSection infoSection(ModuleReport const& module, ReportFacts const& shown
     }
     addFact(facts, texts::engineSerial, info.engineSerialNumber);
     addFact(facts, texts::erotan, info.erotan);
-    addFact(facts, texts::sensors, std::to_string(module.supported.size()));
+    std::string const sensors = std::to_string(module.supported.size());
+    addFact(facts, texts::sensors,
+            toldOffers(module)
+                ? sensors
+                : fmt::format(texts::notAllTold, sensors, texts::answers[static_cast<std::size_t>(module.offers)]));
     addFact(facts, texts::distanceWithLamp, withUnit(info.withLamp.distance));
     addFact(facts, texts::timeWithLamp, withUnit(info.withLamp.runTime));
     addFact(facts, texts::distanceSinceCleared, withUnit(info.sinceCleared.distance));
     addFact(facts, texts::timeSinceCleared, withUnit(info.sinceCleared.runTime));
-    return {
-        1, fmt::format("{} {:X}{}{}", texts::module, module.id, module.name.empty() ? "" : ": ", module.name), {facts}};
+    return {1,
+            fmt::format("{} {:X}{}{}", texts::module, module.id, module.name.empty() ? "" : ": ", module.name),
+            {facts},
+            anchorOf({DataTopic::Info, module.id})};
 }
 
 DocumentCell lampCell(std::optional<bool> const& lamp)
@@ -56,6 +62,11 @@ char const* kindTitle(CodeKind kind)
 {
     static constexpr char const* titles[] = {texts::confirmed, texts::pending, texts::permanent};
     return titles[static_cast<int>(kind)];
+}
+
+DocumentMark markOf(CodeKind kind)
+{
+    return kind == CodeKind::Pending ? DocumentMark::Warning : DocumentMark::Bad;
 }
 
 DocumentCell listCell(CodeList const& list)
@@ -73,15 +84,21 @@ DocumentCell listCell(CodeList const& list)
     if (list.codes.empty()) {
         return {texts::noneStored, DocumentMark::Good};
     }
-    DocumentMark const mark = list.kind == CodeKind::Pending ? DocumentMark::Warning : DocumentMark::Bad;
-    return {std::to_string(list.codes.size()), mark};
+    return {std::to_string(list.codes.size()), markOf(list.kind)};
 }
 
-void addCodeRows(DocumentTable& table, char const* kind, TroubleCode const& code, DocumentMark mark)
+std::string makerLine(MakerChoice const& maker)
 {
-    TroubleCode::Meaning const* const meaning = meaningOf(code);
-    table.rows.push_back(
-        {{kind}, {code.code, mark}, {meaning != nullptr ? meaning->maker : std::string()}, {meaningText(code)}});
+    switch (maker.by) {
+    case MakerChoice::By::Option:
+        return fmt::format(texts::codesByOption, maker.maker);
+    case MakerChoice::By::Vin:
+        return fmt::format(texts::codesByVin, maker.maker);
+    case MakerChoice::By::Guess:
+        return fmt::format(texts::codesByGuess, maker.maker, maker.maker);
+    default:
+        return {};
+    }
 }
 
 DocumentSection codeSection(CodeReport const& report)
@@ -92,10 +109,10 @@ DocumentSection codeSection(CodeReport const& report)
     for (CodeList const& list : report.lists) {
         facts.rows.push_back({kindTitle(list.kind), listCell(list)});
         for (TroubleCode const& code : list.codes) {
-            addCodeRows(table, kindTitle(list.kind), code,
-                        list.kind == CodeKind::Pending ? DocumentMark::Warning : DocumentMark::Bad);
+            table.rows.push_back(codeRow(kindTitle(list.kind), code, markOf(list.kind)));
         }
     }
+    addFact(facts, texts::codesRead, makerLine(report.maker));
     DocumentSection section{2, texts::codes, {facts}};
     if (!table.rows.empty()) {
         section.blocks.push_back(table);
@@ -113,8 +130,9 @@ std::optional<DocumentSection> freezeSection(FreezeReport const& report)
         section.blocks.push_back(DocumentParagraph{{texts::noneStored}});
         return section;
     }
-    DocumentTable code{{{texts::freezeCode}, {texts::code}, {texts::make}, {texts::meaning}}, {}};
-    addCodeRows(code, "", report.frame->code, DocumentMark::Bad);
+    DocumentTable code{{{texts::code}, {texts::make}, {texts::meaning}}, {}};
+    std::vector<DocumentCell> cells = codeRow("", report.frame->code, DocumentMark::Bad);
+    code.rows.push_back({cells[1], cells[2], cells[3]});
     DocumentTable readings{{{texts::sensor}, {texts::value, DocumentMark::None, true}, {texts::unit}}, {}};
     for (FreezeFrame::Reading const& each : report.frame->readings) {
         readings.rows.push_back({{each.name}, {each.value.value_or(""), DocumentMark::None, true}, {each.unit}});
@@ -125,86 +143,49 @@ std::optional<DocumentSection> freezeSection(FreezeReport const& report)
 }
 
 // What a module did not tell, as a paragraph, unless it does not offer it, which is told of nobody.
-std::optional<DocumentSection> untold(char const* title, TopicAnswer answer)
+std::optional<DocumentSection> untoldSection(char const* title, TopicAnswer answer)
 {
     if (answer == TopicAnswer::NotOffered) {
         return std::nullopt;
     }
-    return DocumentSection{2, title, {DocumentParagraph{{answerWord(answer), DocumentMark::Faint}}}};
+    return DocumentSection{
+        2, title, {DocumentParagraph{{texts::answers[static_cast<std::size_t>(answer)], DocumentMark::Faint}}}};
 }
 
-DocumentMark statusMark(ReadinessStatus status)
+DocumentCell statusCell(std::optional<ReadinessStatus> status, bool marked)
 {
-    return status == ReadinessStatus::NotComplete ? DocumentMark::Warning : DocumentMark::None;
+    if (!status) {
+        return {};
+    }
+    bool const open = marked && *status == ReadinessStatus::NotComplete;
+    return {texts::statuses[static_cast<std::size_t>(*status)], open ? DocumentMark::Warning : DocumentMark::None};
 }
 
 std::optional<DocumentSection> readinessSection(ReadinessReport const& report)
 {
     if (report.answer != TopicAnswer::Read) {
-        return untold(texts::readiness, report.answer);
+        return untoldSection(texts::readiness, report.answer);
     }
     DocumentTable table{{{texts::monitor}, {texts::sinceCleared}, {texts::thisCycle}}, {}};
     for (ReadinessMonitor const& each : notCompleteFirst(report.monitors)) {
-        table.rows.push_back({{each.name},
-                              {statusWord(each.sinceCleared), statusMark(each.sinceCleared)},
-                              {each.thisCycle ? statusWord(*each.thisCycle) : ""}});
+        table.rows.push_back({{each.name}, statusCell(each.sinceCleared, true), statusCell(each.thisCycle, false)});
     }
     return DocumentSection{2, texts::readiness, {table}};
 }
 
-std::optional<double> numberIn(std::string const& text)
+std::optional<DocumentSection> valueSection(std::vector<LiveValue> const& values)
 {
-    double number = 0.0;
-    auto const [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
-    bool const whole = !text.empty() && error == std::errc() && end == text.data() + text.size();
-    return whole ? std::optional(number) : std::nullopt;
-}
-
-std::optional<LimitBar> barOf(LimitTest const& test)
-{
-    auto const value = numberIn(test.value);
-    LimitBar const bar{value.value_or(0.0), numberIn(test.minimum), numberIn(test.maximum)};
-    bool const drawable = value && (bar.min || bar.max) && !(bar.min && bar.max && *bar.min >= *bar.max) &&
-                          test.verdict != LimitTest::Verdict::NoResult;
-    return drawable ? std::optional(bar) : std::nullopt;
-}
-
-std::vector<DocumentCell> testRow(LimitTest const& test)
-{
-    static constexpr DocumentMark marks[] = {DocumentMark::Bad, DocumentMark::Good, DocumentMark::Faint,
-                                             DocumentMark::None};
-    std::string const verdict = verdictWord(test.verdict);
-    return {{verdict.empty() ? texts::constant : verdict, marks[static_cast<int>(test.verdict)]},
-            {fmt::format("{} {}", testId(test.id), test.description)},
-            {test.value, DocumentMark::None, true, barOf(test)},
-            {test.minimum, DocumentMark::None, true},
-            {test.maximum, DocumentMark::None, true},
-            {test.unit}};
-}
-
-DocumentTable testTable(std::string const& name)
-{
-    return {{{texts::result},
-             {name.empty() ? std::string(texts::test) : name},
-             {texts::value, DocumentMark::None, true},
-             {texts::minimum, DocumentMark::None, true},
-             {texts::maximum, DocumentMark::None, true},
-             {texts::unit}},
-            {}};
+    return values.empty() ? std::nullopt : std::optional(DocumentSection{2, texts::values, {valueTable(values)}});
 }
 
 std::optional<DocumentSection> monitorSection(MonitorsReport const& report)
 {
     if (report.answer != TopicAnswer::Read) {
-        return untold(texts::monitorTests, report.answer);
+        return untoldSection(texts::monitorTests, report.answer);
     }
     DocumentSection section{2, texts::monitorTests, {}};
     for (OnBoardMonitor const& monitor : failedFirst(report.monitors)) {
-        DocumentTable table = testTable(fmt::format("{:02X} {}", monitor.id, monitor.description));
-        for (LimitTest const& test : monitor.tests) {
-            table.rows.push_back(testRow(test));
-        }
-        section.blocks.push_back(table);
+        section.blocks.push_back(testTable(fmt::format("{:02X} {}", monitor.id, monitor.description), monitor.tests));
     }
     return section;
 }
@@ -212,15 +193,11 @@ std::optional<DocumentSection> monitorSection(MonitorsReport const& report)
 std::optional<DocumentSection> oxygenSection(OxygenReport const& report)
 {
     if (report.answer != TopicAnswer::Read || report.onCan) {
-        return report.onCan ? std::nullopt : untold(texts::oxygenTests, report.answer);
+        return report.onCan ? std::nullopt : untoldSection(texts::oxygenTests, report.answer);
     }
     DocumentSection section{2, texts::oxygenTests, {}};
     for (OxygenSensor const& sensor : report.sensors) {
-        DocumentTable table = testTable(locationName(sensor.location));
-        for (LimitTest const& test : failedFirst(sensor.tests)) {
-            table.rows.push_back(testRow(test));
-        }
-        section.blocks.push_back(table);
+        section.blocks.push_back(testTable(locationName(sensor.location), failedFirst(sensor.tests)));
     }
     return section;
 }
@@ -228,27 +205,34 @@ std::optional<DocumentSection> oxygenSection(OxygenReport const& report)
 std::optional<DocumentSection> counterSection(CountersReport const& report)
 {
     if (report.answer != TopicAnswer::Read) {
-        return untold(texts::counters, report.answer);
+        return untoldSection(texts::counters, report.answer);
     }
-    DocumentTable table{{{texts::counter}, {texts::value, DocumentMark::None, true}}, {}};
-    for (CountersReport::Counter const& each : report.counters) {
-        table.rows.push_back({{each.name}, {std::to_string(each.value), DocumentMark::None, true}});
+    return DocumentSection{2, texts::counters, counterTables(report)};
+}
+
+// Each with the module in its title, since a report has several of a kind, and with the anchor that findings lead to.
+void addTopic(std::vector<DocumentSection>& sections, ModuleReport const& module, DataTopic topic,
+              std::optional<DocumentSection> section, bool leads = true)
+{
+    if (section && !section->blocks.empty()) {
+        section->title = fmt::format(texts::inSection, section->title, fmt::format("{:X}", module.id));
+        section->anchor = leads ? anchorOf({topic, module.id}) : std::string();
+        sections.push_back(std::move(*section));
     }
-    return DocumentSection{2, texts::counters, {table}};
 }
 
 } // namespace
 
 std::vector<DocumentSection> moduleSections(ModuleReport const& module, ReportFacts const& facts)
 {
-    std::vector<DocumentSection> sections = {infoSection(module, facts), codeSection(module.codes)};
-    for (auto const& section :
-         {freezeSection(module.freeze), readinessSection(module.readiness), monitorSection(module.monitors),
-          oxygenSection(module.oxygen), counterSection(module.counters)}) {
-        if (section) {
-            sections.push_back(*section);
-        }
-    }
+    std::vector<DocumentSection> sections = {infoSection(module, facts)};
+    addTopic(sections, module, DataTopic::Codes, codeSection(module.codes));
+    addTopic(sections, module, DataTopic::Codes, freezeSection(module.freeze), false);
+    addTopic(sections, module, DataTopic::Readiness, readinessSection(module.readiness));
+    addTopic(sections, module, DataTopic::Values, valueSection(module.values));
+    addTopic(sections, module, DataTopic::Monitors, monitorSection(module.monitors));
+    addTopic(sections, module, DataTopic::Oxygen, oxygenSection(module.oxygen));
+    addTopic(sections, module, DataTopic::Info, counterSection(module.counters), false);
     return sections;
 }
 

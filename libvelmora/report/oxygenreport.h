@@ -5,9 +5,13 @@
 
 #include <optional>
 #include <string>
+#include <utility>
 #include <vector>
 
 namespace velmora {
+
+// Bank and sensor, each from 1 on.
+std::pair<int, int> placeOf(obd::OxygenSensorLocation location);
 
 // "Bank 1 sensor 2"
 std::string locationName(obd::OxygenSensorLocation location);

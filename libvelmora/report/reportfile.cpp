@@ -21,7 +21,7 @@ std::string contentOf(ReportForm form, VehicleReport const& report, ReportFacts 
     case ReportForm::Markdown:
         return toMarkdown(makeDocument(report, facts));
     case ReportForm::Data:
-        return report.toJson();
+        return reportJson(report, facts);
     default:
         return text;
     }

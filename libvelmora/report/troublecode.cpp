@@ -1,6 +1,7 @@
 #include "libvelmora/report/troublecode.h"
 
 #include "libvelmora/report/json.h"
+#include "libvelmora/report/texts/labels.h"
 
 #include <fmt/format.h>
 
@@ -55,8 +56,9 @@ std::string meaningText(TroubleCode const& code)
         return meaning->text;
     }
     std::size_t const count = code.meanings.size();
-    return fmt::format("maker-specific, {} meaning{}{}", count, count == 1 ? "" : "s",
-                       code.maker.empty() ? "" : " of other makers");
+    char const* const others = code.maker.empty() ? "" : texts::ofOtherMakers;
+    return count == 1 ? fmt::format(texts::meaningsOne, count, others)
+                      : fmt::format(texts::meaningsMany, count, others);
 }
 
 std::vector<TroubleCode> groupByCode(std::vector<std::shared_ptr<obd::DtcDataModel>> const& models)

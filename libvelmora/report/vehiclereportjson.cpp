@@ -1,4 +1,6 @@
-#include "libvelmora/report/vehiclereport.h"
+#include "libvelmora/report/vehiclereportjson.h"
+
+#include "libvelmora/report/findings.h"
 
 #include <fmt/format.h>
 
@@ -14,6 +16,20 @@ Json voltsOrNull(std::optional<float> const& volts)
     return volts ? Json(static_cast<double>(std::lround(*volts * 10.0F)) / 10.0) : Json(nullptr);
 }
 
+Json toJsonValue(std::vector<LiveValue> const& values)
+{
+    Json list = Json::array();
+    for (LiveValue const& value : values) {
+        list.push_back({{"pid", fmt::format("{:02X}", value.pid)},
+                        {"part", value.part},
+                        {"name", value.name},
+                        {"value", textOrNull(value.value)},
+                        {"unit", textOrNull(value.unit)},
+                        {"samples", value.samples}});
+    }
+    return list;
+}
+
 Json moduleJson(ModuleReport const& module)
 {
     Json supported = Json::array();
@@ -24,27 +40,33 @@ Json moduleJson(ModuleReport const& module)
             {"info", toJsonValue(module.info)},           {"sensors", supported},
             {"codes", toJsonValue(module.codes)},         {"freeze", toJsonValue(module.freeze)},
             {"readiness", toJsonValue(module.readiness)}, {"monitors", toJsonValue(module.monitors)},
-            {"oxygen", toJsonValue(module.oxygen)},       {"counters", toJsonValue(module.counters)}};
+            {"oxygen", toJsonValue(module.oxygen)},       {"counters", toJsonValue(module.counters)},
+            {"supported", answerWord(module.offers)},     {"values", toJsonValue(module.values)}};
 }
 
 } // namespace
 
-std::string VehicleReport::toJson() const
+Json toJsonValue(VehicleReport const& report)
 {
     Json list = Json::array();
-    for (ModuleReport const& module : modules) {
+    for (ModuleReport const& module : report.modules) {
         list.push_back(moduleJson(module));
     }
-    Json const document = {
+    return {
         {"adapter",
-         {{"device", textOrNull(adapter.device)},
-          {"description", textOrNull(adapter.description)},
-          {"identification", textOrNull(adapter.identification)},
-          {"volts", voltsOrNull(adapter.volts)}}},
-        {"protocol", {{"number", valueOrNull(protocol.number)}, {"name", textOrNull(protocol.name)}}},
+         {{"device", textOrNull(report.adapter.device)},
+          {"description", textOrNull(report.adapter.description)},
+          {"identification", textOrNull(report.adapter.identification)},
+          {"volts", voltsOrNull(report.adapter.volts)}}},
+        {"protocol", {{"number", valueOrNull(report.protocol.number)}, {"name", textOrNull(report.protocol.name)}}},
+        {"findings", toJsonValue(findings(report), report)},
         {"modules", list},
     };
-    return printed(document);
+}
+
+std::string VehicleReport::toJson() const
+{
+    return printed(toJsonValue(*this));
 }
 
 } // namespace velmora

@@ -1,5 +1,7 @@
 #include "libvelmora/report/vinreport.h"
 
+#include "libvelmora/report/texts/labels.h"
+
 namespace velmora {
 
 namespace {
@@ -41,10 +43,10 @@ Json codeList(VinFacts const& facts)
 std::string makerText(VinFacts const& facts)
 {
     if (facts.smallMaker) {
-        return "a small maker" + (facts.country.empty() ? "" : " registered in " + facts.country);
+        return texts::smallMaker + (facts.country.empty() ? "" : texts::registeredIn + facts.country);
     }
     bool const sure = facts.maker.empty() || facts.standing == WmiRow::Standing::Listed;
-    return sure ? facts.maker : "probably " + facts.maker;
+    return sure ? facts.maker : texts::probably + facts.maker;
 }
 
 Json toJsonValue(VinFacts const& facts)

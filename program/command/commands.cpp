@@ -17,6 +17,10 @@ void addCommands(CommandLine& commandLine)
     addInfoCommand(commandLine);
     addRoutinesCommand(commandLine);
     addDoctorCommand(commandLine);
+#ifdef VELMORA_HISTORY
+    addHistoryCommand(commandLine);
+    addDiffCommand(commandLine);
+#endif
     addDtcCommand(commandLine);
     addVinCommand(commandLine);
     addConsoleCommand(commandLine);

@@ -15,9 +15,11 @@ void addCountersCommand(CommandLine& commandLine);
 #ifdef VELMORA_DASH
 void addDashCommand(CommandLine& commandLine);
 #endif
+void addDiffCommand(CommandLine& commandLine);
 void addDoctorCommand(CommandLine& commandLine);
 void addDtcCommand(CommandLine& commandLine);
 void addFreezeCommand(CommandLine& commandLine);
+void addHistoryCommand(CommandLine& commandLine);
 void addInfoCommand(CommandLine& commandLine);
 void addLiveCommand(CommandLine& commandLine);
 void addLogCommand(CommandLine& commandLine);

@@ -1,5 +1,6 @@
 #include "program/command/confirm.h"
 
+#include "program/terminal/interrupt.h"
 #include "program/terminal/linereader.h"
 #include "program/terminal/output.h"
 
@@ -7,9 +8,39 @@
 
 #include <fmt/format.h>
 
+#include <poll.h>
 #include <unistd.h>
 
 namespace velmora::cli {
+
+namespace {
+
+bool isYes(std::string const& answer)
+{
+    return answer == "y" || answer == "Y" || answer == "yes";
+}
+
+// A line of standard input, without its line feed. Throws Error on Ctrl-C.
+std::string readAnswer()
+{
+    std::string line;
+    while (true) {
+        pollfd input{STDIN_FILENO, POLLIN, 0};
+        bool const ready = ::poll(&input, 1, 100) > 0;
+        if (Interrupt::instance().raised()) {
+            throw Error(ErrorKind::Interrupted, "Interrupted");
+        }
+        char byte = 0;
+        if (ready && (::read(STDIN_FILENO, &byte, 1) <= 0 || byte == '\n')) {
+            return line;
+        }
+        if (ready) {
+            line += byte;
+        }
+    }
+}
+
+} // namespace
 
 void requireConsent(GlobalOptions const& options, std::string const& action, std::string const& yes)
 {
@@ -27,7 +58,17 @@ bool confirmed(CommandSession const& session, std::string const& warning, std::s
     dropTypedAhead();
     tell(fmt::format("{}{} [y/N] ", warning, question));
     std::string answer;
-    return LineReader(session).read(answer) && (answer == "y" || answer == "Y" || answer == "yes");
+    return LineReader(session).read(answer) && isYes(answer);
+}
+
+bool confirmed(GlobalOptions const& options, std::string const& warning, std::string const& question)
+{
+    if (options.yes) {
+        return true;
+    }
+    dropTypedAhead();
+    tell(fmt::format("{}{} [y/N] ", warning, question));
+    return isYes(readAnswer());
 }
 
 } // namespace velmora::cli

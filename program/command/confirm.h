@@ -15,4 +15,7 @@ void requireConsent(GlobalOptions const& options, std::string const& action, std
 // Asks, unless the options say yes already. The question is on standard error, behind the warning.
 bool confirmed(CommandSession const& session, std::string const& warning, std::string const& question);
 
+// The same without a vehicle.
+bool confirmed(GlobalOptions const& options, std::string const& warning, std::string const& question);
+
 } // namespace velmora::cli

@@ -2,6 +2,7 @@
 #include "libvelmora/report/reportfile.h"
 #include "program/command/commands.h"
 #include "program/command/commandsession.h"
+#include "program/command/keepscan.h"
 #include "program/command/makeoption.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
@@ -65,6 +66,8 @@ struct ScanOptions
     std::vector<std::string> reports;
     bool maskVin = false;
     bool force = false;
+    InspectionWish inspection;
+    KeepWish keeping;
 };
 
 ReportFacts factsOf(ScanOptions const& chosen, std::string const& port)
@@ -72,7 +75,13 @@ ReportFacts factsOf(ScanOptions const& chosen, std::string const& port)
     std::time_t const now = std::time(nullptr);
     std::tm local{};
     localtime_r(&now, &local);
-    return {fmt::format("{:%Y-%m-%d %H:%M}", local), port, versionText, chosen.maskVin, local.tm_year + 1900};
+    return {fmt::format("{:%Y-%m-%d %H:%M}", local),
+            port,
+            versionText,
+            chosen.maskVin,
+            local.tm_year + 1900,
+            chosen.inspection,
+            chosen.keeping.vehicle};
 }
 
 // What can be told before minutes are spent with the vehicle.
@@ -83,22 +92,54 @@ void checkReports(ScanOptions const& chosen)
     }
 }
 
-ExitCode scan(ScanOptions const& chosen, GlobalOptions const& options)
+ExitCode scan(ScanOptions& chosen, GlobalOptions const& options)
 {
     checkReports(chosen);
+    bool const keeps = decidesToKeep(chosen.keeping, options);
     CommandSession session(options);
     session.connect();
     ReportFacts const facts = factsOf(chosen, session.port());
-    VehicleReport const report = withShownVins(readVehicle(session, chosen.maker), facts);
+    VehicleReport const whole = readVehicle(session, chosen.maker);
+    VehicleReport const report = withShownVins(whole, facts);
+    std::optional<InspectionReport> const inspection =
+        facts.inspection.rule == InspectionRule::None ? std::nullopt
+                                                      : std::optional(inspect(report, facts.inspection, facts.year));
     for (std::string const& path : chosen.reports) {
-        writeReport(path, report, facts, toText(report, Style(false)), chosen.force);
+        writeReport(path, report, facts, toText(report, Style(false), inspection), chosen.force);
     }
     if (options.json) {
-        fmt::print("{}", report.toJson());
+        fmt::print("{}", reportJson(report, facts));
     } else {
-        printText(toText(report, outputStyle(options)));
+        printText(toText(report, outputStyle(options), inspection));
+    }
+    if (keeps) {
+        flushOutput();
+        keepScan(whole, chosen.keeping, options);
     }
     return chosen.checking ? check(report) : ExitCode::Done;
+}
+
+// The rules of the USA go by the model year; the others ignore it.
+void addInspectionOptions(CLI::App& command, InspectionWish& wish)
+{
+    command
+        .add_option_function<std::string>(
+            "--inspection",
+            [&wish](std::string const& text) {
+                auto const rule = parseInspectionRule(text);
+                if (!rule) {
+                    throw CLI::ValidationError(
+                        "\"" + text + "\" is no rule; known are us-epa, us-california, uk-mot, de-au and none");
+                }
+                wish.rule = *rule;
+            },
+            "What the report suggests for an inspection: us-epa, us-california, uk-mot, de-au or none (none)")
+        ->type_name("RULE");
+    command
+        .add_option("--model-year", wish.modelYear,
+                    "Model year, for the rules of the USA (by the VIN, where it tells the year for sure)")
+        ->type_name("YEAR")
+        ->check(CLI::Range(1980, 2100));
 }
 
 } // namespace
@@ -116,6 +157,8 @@ void addScanCommand(CommandLine& commandLine)
         ->type_name("FILE");
     command->add_flag("--mask-vin", chosen->maskVin, "Show the last six characters of the VIN as zeros");
     command->add_flag("--force", chosen->force, "Let --report replace a file");
+    addInspectionOptions(*command, chosen->inspection);
+    addKeepOptions(*command, chosen->keeping);
 }
 
 } // namespace velmora::cli

@@ -1,20 +1,93 @@
+#include "libvelmora/report/texts/findingtexts.h"
+#include "libvelmora/report/texts/inspectiontexts.h"
 #include "program/view/layout.h"
 #include "program/view/reporttext.h"
 
+#include <fmt/format.h>
+
 namespace velmora::cli {
 
-std::string toText(std::vector<Finding> const& findings, Style const& style)
+namespace {
+
+constexpr std::size_t textColumns = 76;
+
+Mark findingMark(Severity severity)
 {
-    std::string const heading = "Findings\n";
-    if (findings.empty()) {
-        return heading + "  " + style.paint(Mark::Good, "none in what the vehicle told") + "\n";
-    }
+    static constexpr Mark marks[] = {Mark::None, Mark::Warning, Mark::Bad};
+    return marks[static_cast<std::size_t>(severity)];
+}
+
+std::string toldText(std::vector<Finding> const& findings, Style const& style)
+{
     std::vector<std::vector<Cell>> rows;
     for (Finding const& finding : findings) {
-        Mark const mark = finding.severity == Severity::Bad ? Mark::Bad : Mark::Warning;
-        rows.push_back({{finding.module}, {finding.what, mark}, {finding.text}});
+        if (!isSuggestion(finding)) {
+            rows.push_back({{finding.module}, {finding.what, findingMark(finding.severity)}, {finding.text}});
+        }
     }
-    return heading + drawColumns(rows, "  ", style);
+    return rows.empty() ? std::string() : drawColumns(rows, "  ", style);
+}
+
+std::string pointText(std::string const& text)
+{
+    std::string lines = wrapped(text, textColumns, "      ");
+    lines[4] = '-';
+    return lines;
+}
+
+std::string suggestionText(Finding const& finding, Style const& style)
+{
+    std::string text = "  " + finding.module + "  " + style.paint(findingMark(finding.severity), finding.what) + "\n" +
+                       wrapped(finding.text, textColumns, "    ") + "    " + texts::finding::because + "\n";
+    for (Evidence const& each : finding.evidence) {
+        text += pointText(each.text);
+    }
+    text += std::string("    ") + texts::finding::orElse + "\n";
+    for (std::string const& each : finding.otherwise) {
+        text += pointText(each);
+    }
+    return text;
+}
+
+} // namespace
+
+// What the data suggests stands apart: it may be wrong.
+std::string toText(std::vector<Finding> const& findings, Style const& style)
+{
+    std::string const told = toldText(findings, style);
+    std::string text =
+        "Findings\n" + (told.empty() ? "  " + style.paint(Mark::Good, "none in what the vehicle told") + "\n" : told);
+    bool first = true;
+    for (Finding const& finding : findings) {
+        if (isSuggestion(finding)) {
+            text += (first ? "\nWhat the data suggests\n" : "") + suggestionText(finding, style);
+            first = false;
+        }
+    }
+    return text;
+}
+
+std::string toText(InspectionReport const& report, Style const& style)
+{
+    static constexpr Mark marks[] = {Mark::Faint, Mark::Good, Mark::Warning};
+    auto const verdict = static_cast<std::size_t>(report.verdict);
+    std::string text = std::string(texts::inspection::title) + "\n" +
+                       labelledLine(texts::inspection::verdictLabel,
+                                    style.paint(marks[verdict], texts::inspection::verdicts[verdict]));
+    for (std::string const& reason : report.reasons) {
+        text += labelledLine(texts::inspection::reasonLabel, reason);
+    }
+    text += labelledLine(texts::inspection::ruleLabel, report.name) +
+            labelledLine(texts::inspection::dateLabel, report.date);
+    if (report.modelYear) {
+        text += labelledLine(texts::inspection::yearLabel,
+                             report.yearByVin ? fmt::format(texts::inspection::yearByVin, *report.modelYear)
+                                              : fmt::format(texts::inspection::yearByOption, *report.modelYear));
+    }
+    for (std::string const& note : report.notes) {
+        text += labelledLine(texts::inspection::noteLabel, note);
+    }
+    return text;
 }
 
 } // namespace velmora::cli

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "libvelmora/report/findings.h"
+#include "libvelmora/report/inspection.h"
 #include "libvelmora/report/moduletopic.h"
 #include "libvelmora/report/routinesreport.h"
 #include "libvelmora/report/vehiclereport.h"
@@ -36,12 +37,15 @@ std::string toText(ReadinessReport const& report, Style const& style);
 std::string toText(RoutinesReport const& report, Style const& style);
 std::string toText(RoutineRun const& run, Style const& style);
 
-// The findings under a heading, or that there are none.
+// The findings under a heading, or that there are none; below them what the data suggests, with reasons and doubts.
 std::string toText(std::vector<Finding> const& findings, Style const& style);
 
+std::string toText(InspectionReport const& report, Style const& style);
+
 // Headings and aligned columns: adapter and protocol, what is wrong with the whole vehicle, then all that each module
-// told.
-std::string toText(VehicleReport const& report, Style const& style);
+// told. The inspection stands behind the findings, where there is one.
+std::string toText(VehicleReport const& report, Style const& style,
+                   std::optional<InspectionReport> const& inspection = std::nullopt);
 
 template <typename Report>
 std::string toText(std::vector<ModuleTopic<Report>> const& modules, Style const& style)

@@ -1,3 +1,4 @@
+#include "libvelmora/report/texts/labels.h"
 #include "program/view/layout.h"
 #include "program/view/reporttext.h"
 
@@ -45,6 +46,18 @@ std::string readinessText(ReadinessReport report, Style const& style)
     return topicText(report, style);
 }
 
+std::string valuesText(std::vector<LiveValue> const& values, Style const& style)
+{
+    if (values.empty()) {
+        return {};
+    }
+    std::vector<std::vector<Cell>> rows;
+    for (LiveValue const& value : values) {
+        rows.push_back({{value.name}, {value.value.empty() ? "-" : value.value, Mark::None, true}, {value.unit}});
+    }
+    return std::string("  ") + texts::values + "\n" + drawColumns(rows, "    ", style);
+}
+
 std::string moduleText(ModuleReport const& module, Style const& style)
 {
     std::string text = moduleHeading(module.id, module.name) + "\n" + toText(module.info, style) +
@@ -52,7 +65,7 @@ std::string moduleText(ModuleReport const& module, Style const& style)
     for (std::string const& topic :
          {toText(module.codes, style), hasAnswer(module.freeze) ? toText(module.freeze, style) : std::string(),
           readinessText(module.readiness, style), topicText(module.monitors, style), topicText(module.oxygen, style),
-          topicText(module.counters, style)}) {
+          topicText(module.counters, style), valuesText(module.values, style)}) {
         text += topic.empty() ? "" : "\n" + topic;
     }
     return text;
@@ -65,10 +78,11 @@ std::string moduleHeading(unsigned int id, std::string const& name)
     return fmt::format("Control module {:X}{}{}", id, name.empty() ? "" : ": ", name);
 }
 
-std::string toText(VehicleReport const& report, Style const& style)
+std::string toText(VehicleReport const& report, Style const& style, std::optional<InspectionReport> const& inspection)
 {
     std::string text =
         adapterText(report.adapter) + "\n" + protocolText(report.protocol) + "\n" + toText(findings(report), style);
+    text += inspection ? "\n" + toText(*inspection, style) : std::string();
     for (ModuleReport const& module : report.modules) {
         text += "\n" + moduleText(module, style);
     }

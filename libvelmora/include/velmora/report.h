@@ -26,6 +26,17 @@ struct ProtocolReport
     std::string name;          ///< the adapter's words
 };
 
+/// A sensor of service 01 as it stood while the report was made. Some are asked again behind all else.
+struct LiveValue
+{
+    unsigned int pid;            ///< of service 01
+    int part;                    ///< which of the PID's sensors, from 0 on
+    std::string name;            ///< title for people
+    std::string value;           ///< that of the last reading, in the unit system of the settings
+    std::string unit;            ///< label; empty for none
+    std::vector<double> samples; ///< all readings, metric whatever the unit system; none for a state in words
+};
+
 /// All that one control module told.
 struct ModuleReport
 {
@@ -40,6 +51,7 @@ struct ModuleReport
     OxygenReport oxygen;
     CountersReport counters;
     TopicAnswer offers = TopicAnswer::Read; ///< how asking for what it supports of service 01 went
+    std::vector<LiveValue> values = {};     ///< those of what it supports that findings need
 };
 
 /// Whether the module told all that it supports: else what is missing in its sets may only not have been read.

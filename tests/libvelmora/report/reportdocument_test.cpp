@@ -1,3 +1,4 @@
+#include "libvelmora/report/htmlescape.h"
 #include "libvelmora/report/reportdocument.h"
 #include "libvelmora/report/reportfile.h"
 
@@ -5,10 +6,12 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <filesystem>
 #include <fstream>
 #include <functional>
 #include <sstream>
+#include <string_view>
 
 namespace {
 
@@ -53,15 +56,34 @@ std::string unescaped(std::string text)
     return text;
 }
 
-// Every text of the JSON document that a person is to find again.
-void forEachText(nlohmann::json const& value, std::function<void(std::string const&)> const& visit)
+// Words for programs, which a page has in other words or not at all; the names of counters are in pairs there.
+bool isForPrograms(std::string const& key)
 {
-    if (value.is_structured()) {
+    static constexpr std::string_view keys[] = {"kind",   "severity", "answer",     "lampAnswer", "supported",
+                                                "pid",    "data",     "system",     "by",         "sensors",
+                                                "result", "counter",  "modelYearBy"};
+    return std::find(std::begin(keys), std::end(keys), key) != std::end(keys);
+}
+
+// Every text and number of the JSON document that a person is to find again.
+void forEachText(nlohmann::json const& value, std::string const& key,
+                 std::function<void(std::string const&)> const& visit)
+{
+    if (isForPrograms(key)) {
+        return;
+    }
+    if (value.is_object()) {
+        for (auto const& [inner, member] : value.items()) {
+            forEachText(member, key == "counters" && inner == "name" ? "counter" : inner, visit);
+        }
+    } else if (value.is_array()) {
         for (nlohmann::json const& inner : value) {
-            forEachText(inner, visit);
+            forEachText(inner, key, visit);
         }
     } else if (value.is_string()) {
         visit(value.get<std::string>());
+    } else if (value.is_number_integer() && key == "value") {
+        visit(std::to_string(value.get<long>()));
     }
 }
 
@@ -72,15 +94,63 @@ TEST(ReportDocument, HoldsEveryTextOfTheJsonInHtmlAndMarkdown)
     std::string markdown = toMarkdown(makeDocument(report, facts));
     std::erase(markdown, '\\');
     int texts = 0;
-    forEachText(nlohmann::json::parse(report.toJson()), [&](std::string const& text) {
-        if (text == "read" || text == "Powertrain" || text == "0C" || text == "unreadable" || text.empty()) {
-            return; // words of the JSON alone, and counts of what is listed
-        }
+    forEachText(nlohmann::json::parse(report.toJson()), {}, [&](std::string const& text) {
         ++texts;
         EXPECT_NE(html.find(text), std::string::npos) << text;
         EXPECT_NE(markdown.find(text), std::string::npos) << text;
     });
-    EXPECT_GT(texts, 20);
+    EXPECT_GT(texts, 40);
+}
+
+TEST(ReportDocument, ShowsCountersAsRatios)
+{
+    VehicleReport report = richVehicle();
+    report.modules[0].counters.counters = {{"OBD Monitoring Conditions Encountered Counts", 400},
+                                           {"Catalyst Monitor Completion Counts Bank 1", 388},
+                                           {"Catalyst Monitor Conditions Encountered Counts Bank 1", 412},
+                                           {"EVAP Monitor Conditions Encountered Counts", 7}};
+    std::string const html = toHtml(makeDocument(report, facts));
+    EXPECT_NE(html.find("<td>Catalyst Monitor Bank 1</td><td class=\"number\">388</td><td class=\"number\">412</td>"
+                        "<td class=\"number\">0.94</td>"),
+              std::string::npos);
+    EXPECT_NE(html.find("<td>EVAP Monitor</td><td class=\"number\">0</td><td class=\"number\">7</td>"
+                        "<td class=\"number\">0.00</td>"),
+              std::string::npos)
+        << "counters that are 0 are not told";
+    EXPECT_NE(html.find("<td>OBD Monitoring Conditions Encountered Counts</td>"), std::string::npos);
+}
+
+// Every link of the page has its target, and each id stands once.
+TEST(ReportDocument, LeadsFromFindingsToTheirData)
+{
+    VehicleReport report = richVehicle();
+    report.modules.push_back(report.modules[0]);
+    report.modules[1].id = 0x7E9;
+    std::string const html = toHtml(makeDocument(report, facts));
+    int links = 0;
+    for (std::size_t at = html.find("href=\"#"); at != std::string::npos; at = html.find("href=\"#", at + 1)) {
+        std::string const anchor = html.substr(at + 7, html.find('"', at + 7) - at - 7);
+        std::string const target = " id=\"" + anchor + "\"";
+        std::size_t const found = html.find(target);
+        EXPECT_NE(found, std::string::npos) << anchor;
+        EXPECT_EQ(html.find(target, found + 1), std::string::npos) << anchor << " stands twice";
+        ++links;
+    }
+    EXPECT_GT(links, 8);
+    EXPECT_NE(html.find("href=\"#codes-7E9\""), std::string::npos);
+}
+
+// Bytes that are no text in UTF-8, and characters that HTML has no form for.
+TEST(ReportDocument, ReplacesWhatIsNoText)
+{
+    for (std::string const bytes :
+         {"\xFF", "\xC0\xAF", "\xE2\x82", "\xED\xA0\x80", "\xF5\x80\x80\x80", "\x01", "\x7F", "\xC2\x85"}) {
+        EXPECT_NE(escapedHtml("a" + bytes + "b").find("\xEF\xBF\xBD"), std::string::npos)
+            << testing::PrintToString(bytes);
+        EXPECT_EQ(escapedHtml("a" + bytes + "b").back(), 'b');
+    }
+    EXPECT_EQ(escapedHtml("\u00E9 \u20AC \U0001F697"), "\u00E9 \u20AC \U0001F697");
+    EXPECT_EQ(escapedHtml("\"<&>'"), "&quot;&lt;&amp;&gt;'");
 }
 
 TEST(ReportDocument, EscapesWhatTheVehicleSays)

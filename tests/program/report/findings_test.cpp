@@ -95,6 +95,26 @@ TEST(Findings, TellAModuleThatHidesItsCodes)
     EXPECT_EQ(toText(findings(report), Style()), "Findings\n  7E8 ECM  not told  all that it supports (no answer)\n");
 }
 
+TEST(Findings, ShowWhatTheDataSuggestsWithReasonsAndDoubts)
+{
+    VehicleReport report;
+    report.modules = {module(0x7E8, "ECM")};
+    report.modules[0].codes = {true, {list(CodeKind::Confirmed, {})}};
+    EXPECT_EQ(toText(findings(report), Style()),
+              "Findings\n"
+              "  7E8 ECM  lamp  the malfunction indicator is on\n"
+              "\n"
+              "What the data suggests\n"
+              "  7E8 ECM  lamp without code\n"
+              "    the lamp is commanded on, and no module that commands it has a confirmed\n"
+              "    code\n"
+              "    because\n"
+              "    - 7E8 ECM commands the lamp on and tells no confirmed code\n"
+              "    it may also be\n"
+              "    - a reason outside of OBD, which the maker's own tool would show\n"
+              "    - a code that came or went while the report was made\n");
+}
+
 TEST(Findings, AreMarkedByWeight)
 {
     VehicleReport report;

@@ -8,6 +8,7 @@
 #include "libvelmora/report/monitorsreport.h"
 #include "libvelmora/report/oxygenreport.h"
 #include "libvelmora/report/readinessreport.h"
+#include "libvelmora/report/reportdocument.h"
 #include "libvelmora/report/routinesreport.h"
 #include "libvelmora/report/vehiclereport.h"
 #include "program/view/livelines.h"
@@ -109,6 +110,15 @@ TEST(JsonSchema, HoldsForAScan)
     empty.codes.lamp.reset();
     report.modules = {full, empty};
     expectValid(report.toJson(), "scan");
+    full.values = {{0x05, 0, "Coolant", "88", "\u00B0C", {87.0, 88.0}}, {0x03, 0, "Fuel system", "", "", {}}};
+    full.codes.lists[0].codes.clear();
+    report.modules = {full};
+    for (InspectionRule const rule : {InspectionRule::UsEpa, InspectionRule::DeAu}) {
+        std::string const document = reportJson(report, {"", "", "", false, 2026, {rule, {}}, {}});
+        expectValid(document, "scan");
+        EXPECT_TRUE(Json::parse(document)["inspection"].is_object());
+        EXPECT_EQ(Json::parse(document)["findings"].back()["kind"], "no-verification-number");
+    }
 }
 
 TEST(JsonSchema, RefusesAScanThatMissesATopic)

@@ -88,7 +88,9 @@ TEST(VehicleReportView, JsonHoldsEachTopicUnderItsName)
                                             {"readiness", toJsonValue(module.readiness)},
                                             {"monitors", toJsonValue(module.monitors)},
                                             {"oxygen", toJsonValue(module.oxygen)},
-                                            {"counters", toJsonValue(module.counters)}}));
+                                            {"counters", toJsonValue(module.counters)},
+                                            {"supported", "read"},
+                                            {"values", Json::array()}}));
 }
 
 } // namespace

@@ -44,7 +44,6 @@ inline constexpr char const* code = "Code";
 inline constexpr char const* make = "Maker";
 inline constexpr char const* meaning = "Meaning";
 inline constexpr char const* freezeFrame = "Freeze frame";
-inline constexpr char const* freezeCode = "Frozen by";
 inline constexpr char const* sensor = "Sensor";
 inline constexpr char const* value = "Value";
 inline constexpr char const* unit = "Unit";
@@ -58,9 +57,25 @@ inline constexpr char const* result = "Result";
 inline constexpr char const* test = "Test";
 inline constexpr char const* minimum = "Minimum";
 inline constexpr char const* maximum = "Maximum";
-inline constexpr char const* constant = "constant";
 inline constexpr char const* counters = "In-use performance";
 inline constexpr char const* counter = "Counter";
+inline constexpr char const* allZero = "All counters are 0.";
+inline constexpr char const* notAllTold = "{} (not known in full: {})";
+inline constexpr char const* program = "Velmora ";
+inline constexpr char const* ratio = "Ratio";
+inline constexpr char const* completed = "Completed";
+inline constexpr char const* conditionsMet = "Conditions met";
+inline constexpr char const* values = "Values while the report was made";
+inline constexpr char const* suggested = "What the data suggests";
+inline constexpr char const* lampShort = "Lamp";
+inline constexpr char const* codeCount = "Stored codes";
+inline constexpr char const* incompleteCount = "Monitors not complete";
+inline constexpr char const* moduleCount = "Control modules";
+inline constexpr char const* suggestionCount = "Worth a look";
+inline constexpr char const* name = "Name";
+inline constexpr char const* contents = "Contents";
+inline constexpr char const* howRun = "Read with";
+inline constexpr char const* inSection = "{} ({})";
 inline constexpr char const* distanceWithLamp = "Distance with the lamp on";
 inline constexpr char const* timeWithLamp = "Engine run time with the lamp on";
 inline constexpr char const* distanceSinceCleared = "Distance since codes were cleared";
@@ -69,5 +84,27 @@ inline constexpr char const* howRead = "How it was read";
 inline constexpr char const* footer = "Read by OBD-II services of SAE J1979. What a module did not tell is shown as "
                                       "\"-\" or \"not told\"; it is not known "
                                       "to be in order. Made by Velmora ";
+
+// Words in a sentence or a table cell.
+inline constexpr char const* confirmedWord = "confirmed";
+inline constexpr char const* pendingWord = "pending";
+inline constexpr char const* permanentWord = "permanent";
+// By the number of TopicAnswer, of ReadinessStatus and of LimitTest::Verdict.
+inline constexpr char const* answers[] = {"read", "not supported", "no answer", "unreadable", "refused"};
+inline constexpr char const* statuses[] = {"complete", "not complete", "disabled this cycle", "not available"};
+inline constexpr char const* verdicts[] = {"failed", "passed", "no result", "constant"};
+inline constexpr char const* bankSensor = "Bank {} sensor {}";
+inline constexpr char const* meaningsOne = "maker-specific, {} meaning{}";
+inline constexpr char const* meaningsMany = "maker-specific, {} meanings{}";
+inline constexpr char const* ofOtherMakers = " of other makers";
+inline constexpr char const* smallMaker = "a small maker";
+inline constexpr char const* registeredIn = " registered in ";
+inline constexpr char const* probably = "probably ";
+inline constexpr char const* orYear = " or ";
+inline constexpr char const* yearPerhaps = "{}, if this maker codes it";
+inline constexpr char const* codesRead = "Trouble codes read";
+inline constexpr char const* codesByOption = "with {}'s list, as chosen";
+inline constexpr char const* codesByVin = "with {}'s list, by the VIN";
+inline constexpr char const* codesByGuess = "with no maker's list; {}'s may fit: --make \"{}\"";
 
 } // namespace velmora::texts

@@ -1,0 +1,125 @@
+#include "program/command/keepscan.h"
+
+#ifdef VELMORA_HISTORY
+#include "libvelmora/history/history.h"
+#include "libvelmora/history/scanjson.h"
+#endif
+
+#include "libvelmora/session/settingsstore.h"
+#include "program/command/confirm.h"
+#include "program/terminal/output.h"
+
+#include <velmora/error.h>
+#include <velmora/version.h>
+
+#include <fmt/format.h>
+
+#include <unistd.h>
+
+namespace velmora::cli {
+
+void addKeepOptions(CLI::App& command, KeepWish& wish)
+{
+    command.add_option("--vehicle", wish.vehicle, "Name of a vehicle that does not tell its identification number")
+        ->type_name("NAME");
+#ifdef VELMORA_HISTORY
+    CLI::Option* const keep =
+        command.add_flag("--history", wish.keep, "Keep the scan in the history of the vehicle (asked once)");
+    command.add_flag("--no-history", wish.drop, "Do not keep the scan, and do not ask")->excludes(keep);
+#endif
+}
+
+#ifdef VELMORA_HISTORY
+
+namespace {
+
+constexpr char const* keepKey = "history/keep";
+constexpr char const* nameKey = "history/vehicle";
+
+bool hasTerminal()
+{
+    return ::isatty(STDIN_FILENO) != 0 && ::isatty(STDERR_FILENO) != 0;
+}
+
+SettingsStore openSettings(GlobalOptions const& options)
+{
+    return SettingsStore(options.settingsFile.empty() ? SettingsStore::defaultFile()
+                                                      : std::filesystem::path(options.settingsFile));
+}
+
+void remember(SettingsStore& store, bool keep)
+{
+    try {
+        store.setInt(keepKey, keep ? 1 : 0);
+        store.sync();
+    } catch (Error const& error) {
+        tell(fmt::format("velmora: the answer is not remembered: {}\n", error.what()));
+    }
+}
+
+bool ask(SettingsStore& store, GlobalOptions const& options)
+{
+    std::string const what = fmt::format(
+        "velmora can keep each scan, by the vehicle's identification number, to tell later what has changed:\n"
+        "  {}\nNothing leaves this machine. velmora history shows, exports and forgets it.\n",
+        History::defaultFile().string());
+    bool const keep = confirmed(options, what, "Keep this scan and those to come?");
+    remember(store, keep);
+    tell(keep ? "" : "Nothing is kept; scan --history keeps a single one.\n");
+    return keep;
+}
+
+} // namespace
+
+bool decidesToKeep(KeepWish& wish, GlobalOptions const& options)
+{
+    if (wish.drop) {
+        return false;
+    }
+    bool const mayAsk = !wish.keep && hasTerminal() && !options.json;
+    if (!wish.keep && !mayAsk) {
+        return false;
+    }
+    SettingsStore store = openSettings(options);
+    if (wish.vehicle.empty()) {
+        store.getString(nameKey, wish.vehicle);
+    }
+    int kept = 0;
+    if (wish.keep || store.getInt(keepKey, kept)) {
+        return wish.keep || kept != 0;
+    }
+    return !options.yes && ask(store, options); // who wants no questions has not said yes to this one
+}
+
+void keepScan(VehicleReport const& report, KeepWish const& wish, GlobalOptions const& options)
+{
+    using namespace std::chrono;
+    try {
+        History history(History::defaultFile(), History::Access::Keep);
+        KeptScan const scan =
+            makeScan(report, wish.vehicle, floor<milliseconds>(system_clock::now()), std::string(versionText));
+        std::optional<std::int64_t> const number = history.add(scan);
+        if (number && !options.quiet) {
+            tell(fmt::format("Kept as scan {} of {}; velmora diff tells what has changed\n", *number, scan.vehicle));
+        }
+    } catch (Error const& error) {
+        std::string text = fmt::format("The scan is not kept: {}", error.what());
+        for (std::string const& hint : error.hints()) {
+            text += "\n  - " + hint;
+        }
+        wish.keep ? tellLateFailure(text) : tell("velmora: " + text + "\n");
+    }
+}
+
+#else
+
+bool decidesToKeep(KeepWish& /*wish*/, GlobalOptions const& /*options*/)
+{
+    return false;
+}
+
+void keepScan(VehicleReport const& /*report*/, KeepWish const& /*wish*/, GlobalOptions const& /*options*/) {}
+
+#endif
+
+} // namespace velmora::cli
