@@ -1,0 +1,31 @@
+#!/usr/bin/env bash
+# Finds words for people in the files that write reports and compare scans: they belong to libvelmora/report/texts, where
+# they can be read and translated in one place. What is for programs or for a browser is none: text within HTML tags,
+# kinds and anchors (lower case with hyphens), and single words that name a member, a class or a form.
+#   reporttexts.sh SOURCE_FOLDER
+set -euo pipefail
+cd "$1"
+shopt -s nullglob
+files=(libvelmora/report/{findings,findingparts,inspection,moduledocument,moduletables,reportdocument}*.cpp
+    libvelmora/report/{htmldocument,markdowndocument,limitbar,vinreport,troublecode,oxygenreport}.cpp
+    libvelmora/history/*changes.cpp)
+[[ ${#files[@]} -gt 10 ]] || { echo "the files are not where they were"; exit 1; }
+perl -ne '
+    next if /^\s*#\s*include|^\s*\/\//;
+    # Names of the core, by which its monitors and counters are known, and states of a sensor.
+    next if /isOneOf|"(Misfire|NMHC Catalyst|Evaporative System|PM filter|Generic|Unknown|OBD )"/;
+    next if /\{" Co[a-z]+ |Closed loop/;
+    # Words of the JSON document, and classes.
+    next if /"not ready"|"not judged"|"needle/;
+    while (/"((?:[^"\\]|\\.)*)"/g) {
+        my ($whole, $literal) = ($1, $1);
+        $literal =~ s/\\[nt"]/ /g;
+        $literal =~ s/<[^<>]*>?//g;              # tags
+        $literal =~ s/[\w-]+=\s*\{?[^>]*//g;      # attributes of a tag that goes on
+        $literal =~ s/\{[^{}]*\}//g;             # places to fill in
+        if ($literal =~ /[A-Za-z]{2,} +[A-Za-z]{2,}/ || $literal =~ /^[A-Z][a-z]{2,}/) {
+            print "$ARGV: \"$whole\" is a text for people: put it into libvelmora/report/texts\n";
+            $found = 1;
+        }
+    }
+    END { exit($found ? 1 : 0) }' "${files[@]}"
