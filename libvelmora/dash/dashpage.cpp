@@ -1,6 +1,6 @@
 #include "libvelmora/dash/dashpage.h"
 
-#include "dashassets.h"
+#include "libvelmora/dash/dashassets.h"
 
 #include <fmt/format.h>
 
@@ -62,7 +62,7 @@ std::vector<std::pair<std::string, std::string>> dashHeaders()
 
 void addDashPage(HttpServer& server)
 {
-    for (DashAsset const& asset : dashAssets) {
+    for (DashAsset const& asset : dashAssets()) {
         std::string const name = asset.name;
         std::string const path = name == "index.html" ? "/" : name == "notices.txt" ? "/notices.txt" : "/page/" + name;
         server.addRoute("GET", path, [&asset, tag = tagOf(asset)](HttpRequest const& request) {

@@ -1,5 +1,5 @@
 # Makes C++ of the page's files, so that the program needs none of them where it runs: cmake -D OUT=... -D FILES=... -P.
-# Each is kept packed, for the browsers, which all understand that, and plain. OUT.h and OUT.cpp are written. The same
+# Each is kept packed, for the browsers, which all understand that, and plain. OUT.cpp is written. The same
 # files give the same bytes where SOURCE_DATE_EPOCH is set, since a packed file holds its time.
 function(append_bytes file name text)
     file(READ "${file}" hex HEX)
@@ -23,5 +23,4 @@ foreach(path IN LISTS FILES)
     math(EXPR count "${count} + 1")
 endforeach()
 file(REMOVE "${OUT}.gz")
-file(WRITE "${OUT}.h" "#pragma once\n\n#include <cstddef>\n\nnamespace velmora {\n\nstruct DashAsset\n{\n    char const* name;\n    unsigned char const* packed;\n    std::size_t packedSize;\n    unsigned char const* plain;\n    std::size_t plainSize;\n};\n\nextern DashAsset const dashAssets[${count}];\n\n} // namespace velmora\n")
-file(WRITE "${OUT}.cpp" "#include \"dashassets.h\"\n\nnamespace velmora {\n\nnamespace {\n\n${arrays}\n} // namespace\n\nDashAsset const dashAssets[${count}] = {\n${rows}};\n\n} // namespace velmora\n")
+file(WRITE "${OUT}.cpp" "#include \"libvelmora/dash/dashassets.h\"\n\nnamespace velmora {\n\nnamespace {\n\n${arrays}\nDashAsset const assets[${count}] = {\n${rows}};\n\n} // namespace\n\nstd::span<DashAsset const> dashAssets()\n{\n    return assets;\n}\n\n} // namespace velmora\n")

@@ -1,5 +1,4 @@
 // How the page is arranged. The program keeps it, for each vehicle.
-import { post } from './link.js';
 import { keepPoints, offered, readNow, sensors } from './store.js';
 import { programNow } from './link.js';
 import { setSystem } from './units.js';
@@ -50,5 +49,14 @@ export function change(part) {
   stored = { ...stored, ...part };
   apply();
   clearTimeout(sending);
-  sending = setTimeout(() => post('/layout', stored), 300);
+  sending = setTimeout(send, 300);
 }
+
+function send() {
+  clearTimeout(sending);
+  sending = null;
+  fetch('/layout', { method: 'POST', body: JSON.stringify(stored), keepalive: true }).catch(() => {});
+}
+
+// What was just arranged outlives a page that is closed at once.
+addEventListener('pagehide', () => sending && send());
