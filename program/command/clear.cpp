@@ -32,7 +32,7 @@ void checkOptions(GlobalOptions const& options)
     requireConsent(options, "Clearing", "clears without asking");
 }
 
-std::string toText(ModuleTopic<ClearReport> const& module)
+std::string outcomeText(ModuleTopic<ClearReport> const& module)
 {
     return fmt::format("Control module {:X}{}{}: {}{}{}\n", module.id, module.name.empty() ? "" : " ", module.name,
                        resultWord(module.report.result), module.report.reason.empty() ? "" : ": ",
@@ -64,7 +64,7 @@ ExitCode clear(GlobalOptions const& options)
         fmt::print("{}", toJson(modules));
     } else {
         for (ModuleTopic<ClearReport> const& module : modules) {
-            printText(toText(module));
+            printText(outcomeText(module));
         }
     }
     flushOutput();

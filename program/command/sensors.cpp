@@ -120,7 +120,7 @@ std::vector<unsigned char> undecoded(obd::IEcu const& ecu)
     return pids;
 }
 
-std::string toText(obd::IEcu const& ecu, bool all)
+std::string offerText(obd::IEcu const& ecu, bool all)
 {
     std::string text =
         fmt::format("Control module {:X}: {} ({})\n", ecu.id(), readable(ecu.name()), readable(ecu.description()));
@@ -188,7 +188,7 @@ ExitCode sensors(GlobalOptions const& options, bool all)
         if (options.json) {
             modules.push_back(toJson(*ecu, all));
         } else {
-            printText(toText(*ecu, all));
+            printText(offerText(*ecu, all));
         }
     }
     if (options.json) {
