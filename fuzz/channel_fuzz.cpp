@@ -4,12 +4,12 @@
 // frame.
 
 #include "libvelmora/channel/fastchannel.h"
+#include "tests/support/timedwire.h"
 
 #include <algorithm>
 #include <cstdint>
 #include <cstdlib>
 #include <iostream>
-#include <map>
 #include <optional>
 #include <utility>
 
@@ -17,7 +17,7 @@ namespace {
 
 using velmora::WireTime;
 
-class InputWire : public velmora::IWire
+class InputWire : public support::TimedWire
 {
 public:
     InputWire(std::uint8_t const* data, std::size_t size) : m_data(data), m_size(size) {}
@@ -25,26 +25,11 @@ public:
     void write(std::string_view bytes) override
     {
         if (bytes.starts_with("AT") && m_bringUp) {
-            say(std::string(bytes.starts_with("ATI") ? "ELM327 v1.5" : "OK") + "\r\r>", WireTime(5));
+            sayShown(std::string(bytes.starts_with("ATI") ? "ELM327 v1.5" : "OK") + "\r\r>", WireTime(5));
         } else {
             sayNext();
         }
     }
-    std::string read(WireTime until) override
-    {
-        auto const next = m_output.begin();
-        if (next == m_output.end() || next->first > until) {
-            m_now = std::max(m_now, until);
-            return {};
-        }
-        m_now = std::max(m_now, next->first);
-        std::string bytes = next->second;
-        m_output.erase(next);
-        return bytes;
-    }
-    WireTime now() const override { return m_now; }
-    bool isUp() const override { return m_up; }
-    void giveUp() override { m_up = false; }
     bool resume() override { return false; }
 
     void endBringUp() { m_bringUp = false; }
@@ -63,12 +48,12 @@ private:
         std::string const text(reinterpret_cast<char const*>(m_data) + 1, length);
         m_data += length + 1;
         m_size -= length + 1;
-        say(text, delay);
-        say("\r>", delay);
+        sayShown(text, delay);
+        sayShown("\r>", delay);
     }
-    void say(std::string const& text, WireTime delay)
+    void sayShown(std::string const& text, WireTime delay)
     {
-        m_output.emplace(m_now + delay, text);
+        say(text, delay);
         for (char const character : text) {
             bool const shown = character > ' ' && character < '\x7F';
             m_said += shown ? velmora::compactText(std::string(1, character)) : "";
@@ -77,10 +62,7 @@ private:
 
     std::uint8_t const* m_data;
     std::size_t m_size;
-    std::multimap<WireTime, std::string> m_output;
     std::string m_said;
-    WireTime m_now{1000};
-    bool m_up = true;
     bool m_bringUp = true;
 };
 
