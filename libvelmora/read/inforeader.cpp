@@ -23,9 +23,9 @@ InfoReport::Travel readTravel(Session& session, bool sinceMil)
 {
     auto const service = obd::TroubleCodeServiceBuilder::createTroubleCodeService();
     InfoReport::Travel travel;
-    travel.distance = toReading(service->fetchDistance(sinceMil));
+    travel.distance = toReading(service->askDistance(sinceMil).value);
     session.check();
-    travel.runTime = toReading(service->fetchRuntime(sinceMil));
+    travel.runTime = toReading(service->askRuntime(sinceMil).value);
     session.check();
     return travel;
 }
@@ -41,54 +41,39 @@ std::vector<std::string> shown(std::vector<std::string> texts)
     return texts;
 }
 
-// Asks the vehicle only for what the module says it has.
-class InfoFetch
+// Asks the vehicle for one thing, unless the module says that it lacks it.
+template <typename Value>
+Value askFor(Session& session, obd::Outcome<Value> (obd::IEcuService::*ask)())
 {
-public:
-    explicit InfoFetch(Session& session) : m_session(session), m_service(obd::EcuServiceBuilder::createEcuService()) {}
-
-    obd::IEcuService& service() const { return *m_service; }
-
-    template <typename Value>
-    Value operator()(bool (obd::IEcuService::*has)(), Value (obd::IEcuService::*fetch)()) const
-    {
-        if (!((*m_service).*has)()) {
-            return {};
-        }
-        Value const value = ((*m_service).*fetch)();
-        m_session.check();
-        return shown(value);
-    }
-
-private:
-    Session& m_session;
-    std::shared_ptr<obd::IEcuService> m_service;
-};
+    auto const service = obd::EcuServiceBuilder::createEcuService();
+    Value const value = ((*service).*ask)().value;
+    session.check();
+    return shown(value);
+}
 
 } // namespace
 
 std::string readVin(Session& session, obd::IEcu const& ecu)
 {
-    using Service = obd::IEcuService;
     session.select(ecu);
-    return InfoFetch(session)(&Service::hasVehicleIdentificationNumber, &Service::fetchVehicleIdentificationNumber);
+    return askFor(session, &obd::IEcuService::askVehicleIdentificationNumber);
 }
 
 InfoReport readInfo(Session& session, obd::IEcu const& ecu)
 {
     using Service = obd::IEcuService;
     session.select(ecu);
-    InfoFetch const fetch(session);
     InfoReport report;
-    report.description = readable(fetch.service().ecuDescription());
-    report.standard = fetch.service().standardDescription();
-    report.protocol = fetch.service().protocolDescription();
-    report.vin = fetch(&Service::hasVehicleIdentificationNumber, &Service::fetchVehicleIdentificationNumber);
-    auto const ids = fetch(&Service::hasCalibrationIds, &Service::fetchCalibrationIds);
-    auto const numbers = fetch(&Service::hasVerificationNumbers, &Service::fetchVerificationNumbers);
+    auto const service = obd::EcuServiceBuilder::createEcuService();
+    report.description = readable(service->ecuDescription());
+    report.standard = service->standardDescription();
+    report.protocol = service->protocolDescription();
+    report.vin = askFor(session, &Service::askVehicleIdentificationNumber);
+    auto const ids = askFor(session, &Service::askCalibrationIds);
+    auto const numbers = askFor(session, &Service::askVerificationNumbers);
     report.calibrations = pairCalibrations(ids, numbers);
-    report.engineSerialNumber = fetch(&Service::hasEngineSerialNumber, &Service::fetchEngineSerialNumber);
-    report.erotan = fetch(&Service::hasErotan, &Service::fetchErotan);
+    report.engineSerialNumber = askFor(session, &Service::askEngineSerialNumber);
+    report.erotan = askFor(session, &Service::askErotan);
     report.withLamp = readTravel(session, true);
     report.sinceCleared = readTravel(session, false);
     return report;
