@@ -186,7 +186,7 @@ ExitCode CommandLine::run(int argc, char const* const* argv)
         return runAction();
     } catch (CLI::ParseError const& error) {
         std::vector<std::string> const unknown = m_app.remaining();
-        tell(fmt::format("velmora: {}\n  - velmora --help tells the options and commands\n",
+        tell(fmt::format("velmora: {}\n  - velmora --help lists the options and commands\n",
                          unknown.empty() ? error.what() : "\"" + unknown.front() + "\" is no command or option"));
         return ExitCode::WrongUse;
     } catch (Error const& wrong) {

@@ -50,10 +50,10 @@ void requireCodes(std::vector<ModuleTopic<CodeReport>> const& modules)
         return;
     }
     if (anyRefused(modules)) {
-        throw Error(ErrorKind::Refused, "The vehicle refused to tell its trouble codes",
+        throw Error(ErrorKind::Refused, "The vehicle refused to report its trouble codes",
                     {"try again with the ignition on and the engine off"});
     }
-    throw Error(ErrorKind::NotSupported, "No control module told its trouble codes", {"is the ignition on?"});
+    throw Error(ErrorKind::NotSupported, "No control module reported its trouble codes", {"is the ignition on?"});
 }
 
 } // namespace

@@ -28,7 +28,7 @@ void judgeMatrix(CommandMatrix const& matrix, bool isStn, DoctorReport& report)
 {
     if (matrix.agreesToAll) {
         report.checks.push_back({"adapter", Verdict::Note, "says OK to a command that does not exist",
-                                 "a clone: what it claims to know tells nothing"});
+                                 "a clone: what it claims to know proves nothing"});
         return;
     }
     if (matrix.claimIsMadeUp && !isStn) {
@@ -107,7 +107,7 @@ bool checkAdapter(AdapterTalk& talk, DoctorReport& report)
     std::optional<std::string> const volts = ask("ATRV");
     report.checks.push_back(
         judgeVoltage(volts.value_or(""))
-            .value_or(DoctorCheck{"voltage", Verdict::Note, "the adapter does not tell the voltage", ""}));
+            .value_or(DoctorCheck{"voltage", Verdict::Note, "the adapter does not report the voltage", ""}));
     if (std::optional<DoctorCheck> const ignition = judgeIgnition(ask("ATIGN").value_or(""))) {
         report.checks.push_back(*ignition);
     }

@@ -95,8 +95,8 @@ std::string makeBundle(DoctorReport const& report, Session const& session, Dialo
                        bool keepVin)
 {
     obdsim::Dialogue dialogue = recorder.dialogue();
-    dialogue.vehicle = "not told";
-    dialogue.adapter = session.adapter() != nullptr ? session.adapter()->device() : "not told";
+    dialogue.vehicle = "unknown";
+    dialogue.adapter = session.adapter() != nullptr ? session.adapter()->device() : "unknown";
     if (!keepVin) {
         maskVins(dialogue);
     }

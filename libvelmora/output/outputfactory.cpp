@@ -81,7 +81,7 @@ std::unique_ptr<IOutput> makeOutput(OutputAddress const& address, OutputContext 
         }
     }
     throw Error(ErrorKind::WrongUse, "This build has no output of kind " + address.kind,
-                {"velmora --version tells which outputs it has"});
+                {"velmora --version lists its outputs"});
 }
 
 } // namespace velmora

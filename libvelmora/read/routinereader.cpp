@@ -73,7 +73,7 @@ void requireAccepted(RoutineRun const& run)
         throw Error(
             ErrorKind::Refused,
             fmt::format("The vehicle refused to run routine {}{}{}", id, run.reason.empty() ? "" : ": ", run.reason),
-            {"the vehicle decides when a routine may run; its maker's documents tell the conditions"});
+            {"the vehicle decides when a routine may run; its maker's documents state the conditions"});
     case RoutineRun::Result::Unreadable:
         throw Error(ErrorKind::VehicleSilent, fmt::format("What the vehicle said to routine {} can't be read", id),
                     {"it may run all the same"});

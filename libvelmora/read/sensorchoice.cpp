@@ -97,9 +97,9 @@ char const* betterCommand(int pid)
     switch (pid) {
     case 0x01:
     case 0x41:
-        return "`velmora readiness` tells lamp and monitors";
+        return "`velmora readiness` shows lamp and monitors";
     case 0x02:
-        return "`velmora freeze` tells the code that froze values, and them";
+        return "`velmora freeze` shows the code that froze values, and the values";
     default:
         return listHint;
     }

@@ -11,7 +11,7 @@ namespace {
 std::filesystem::path const& unused(std::filesystem::path const& path)
 {
     if (std::filesystem::exists(path)) {
-        throw Error(ErrorKind::WrongUse, "The file " + path.string() + " stands already",
+        throw Error(ErrorKind::WrongUse, "The file " + path.string() + " exists already",
                     {"record to another name, or remove the file first"});
     }
     return path;
@@ -43,7 +43,7 @@ void DialogueFile::save(obdsim::Dialogue const& dialogue)
     m_saved = true;
     if (!m_out) {
         throw Error(ErrorKind::Failed, "Could not write the recording " + m_path.string(),
-                    {"is the disk full? what stands there is cut off"});
+                    {"is the disk full? what is there is cut off"});
     }
 }
 

@@ -11,7 +11,7 @@ namespace velmora {
 class DialogueFile
 {
 public:
-    // Throws Error if the file stands already or can't be written.
+    // Throws Error if the file exists already or can't be written.
     explicit DialogueFile(std::filesystem::path path);
     ~DialogueFile();
     DialogueFile(DialogueFile const&) = delete;

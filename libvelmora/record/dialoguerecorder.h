@@ -8,7 +8,7 @@
 
 namespace velmora {
 
-// Takes down what passes a port as a recorded dialogue, byte for byte and with its pauses. Any thread.
+// Records what passes a port as a dialogue, byte for byte and with its pauses. Any thread.
 class DialogueRecorder
 {
 public:

@@ -48,7 +48,7 @@ void checkReportPath(std::string const& path, bool replace)
 {
     reportFormOf(path);
     if (!replace && std::filesystem::exists(path)) {
-        throw Error(ErrorKind::Failed, "The report " + path + " stands already", {"--force replaces it"});
+        throw Error(ErrorKind::Failed, "The report " + path + " exists already", {"--force replaces it"});
     }
 }
 

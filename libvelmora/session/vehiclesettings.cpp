@@ -71,7 +71,7 @@ constexpr VehicleSetting allSettings[] = {
      {},
      "Factor on the fuel consumption shown. If the pump says 5 % more than the display, set 1.05."},
     {"fuel", "Kind of fuel", "", settings::fuelTypeOverride, 0, 0, 1, true, 0, fuelWords,
-     "reported takes what the vehicle tells, override the setting ignition in its place."},
+     "reported takes what the vehicle reports, override the setting ignition in its place."},
     {"ignition", "Ignition", "", settings::ignitionType, 0, 0, 1, true, 0, ignitionWords,
      "spark is petrol, gas or alcohol, compression is diesel. Counts with fuel set to override."},
 };

@@ -46,12 +46,12 @@ Error withoutAnswer(std::vector<ModuleCodes> const& modules)
 {
     if (anyRefused(modules)) {
         return {ErrorKind::Refused,
-                "The vehicle refused to tell these codes",
+                "The vehicle refused to report these codes",
                 {"try again with the ignition on and the engine off"}};
     }
     return {ErrorKind::NotSupported,
-            "No control module told these codes",
-            {"is the ignition on?", "pending codes are not told by all vehicles, permanent ones only by newer"}};
+            "No control module reported these codes",
+            {"is the ignition on?", "not all vehicles report pending codes, and only newer ones permanent codes"}};
 }
 
 // The vehicle identification number is asked for only where it matters.

@@ -20,7 +20,7 @@ ExitCode info(GlobalOptions const& options)
 
 void addInfoCommand(CommandLine& commandLine)
 {
-    commandLine.addCommand("info", "Show what the control modules tell of themselves and the vehicle", info);
+    commandLine.addCommand("info", "Show what the control modules report about themselves and the vehicle", info);
 }
 
 } // namespace velmora::cli

@@ -11,7 +11,7 @@ void addReadinessCommand(CommandLine& commandLine)
                            [](GlobalOptions const& options) {
                                return showTopic(options, readReadiness,
                                                 {ErrorKind::NotSupported,
-                                                 "No control module tells its readiness",
+                                                 "No control module reports its readiness",
                                                  {"some gearboxes and brakes don't; leave --ecu out to ask all"}});
                            });
 }

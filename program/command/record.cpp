@@ -56,8 +56,8 @@ void save(DialogueRecorder const& recorder, CommandSession const& session, Recor
         return;
     }
     auto const adapter = session.adapter();
-    dialogue.vehicle = headerText(chosen.vehicle, "not told");
-    dialogue.adapter = headerText(adapter != nullptr ? adapter->device() : std::string(), "not told");
+    dialogue.vehicle = headerText(chosen.vehicle, "unknown");
+    dialogue.adapter = headerText(adapter != nullptr ? adapter->device() : std::string(), "unknown");
     if (!chosen.keepVin) {
         maskVins(dialogue);
     }

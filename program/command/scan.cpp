@@ -53,7 +53,8 @@ ExitCode check(VehicleReport const& report)
     }
     if (!anyModule(canBeChecked)) {
         flushOutput();
-        throw Error(ErrorKind::NotSupported, "No control module told its trouble codes, so there is nothing to check",
+        throw Error(ErrorKind::NotSupported,
+                    "No control module reported its trouble codes, so there is nothing to check",
                     {"is the ignition on?"});
     }
     return ExitCode::Done;

@@ -63,7 +63,7 @@ ExitCode simulate(SimulateOptions const& options, GlobalOptions const& global)
     } catch (obdsim::ServerError const& error) {
         throw Error(ErrorKind::PortFailed, error.what(), {"choose another address with --listen"});
     } catch (obdsim::SimulatorError const& error) {
-        throw Error(ErrorKind::WrongUse, error.what(), {"velmora simulate --list tells what there is to choose from"});
+        throw Error(ErrorKind::WrongUse, error.what(), {"velmora simulate --list shows what there is to choose from"});
     }
     return ExitCode::Done;
 }

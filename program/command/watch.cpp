@@ -196,7 +196,7 @@ void addWatchOptions(CLI::App& command, WatchOptions& chosen)
         ->type_name("KIND:TARGET")
         ->allow_extra_args(false);
     command.add_option("--config", chosen.config, "Settings of the watch (TOML)")->type_name("FILE");
-    command.add_flag("--check-config", chosen.checkConfig, "Only tell mistakes in the settings");
+    command.add_flag("--check-config", chosen.checkConfig, "Only report mistakes in the settings");
     command.add_option("--vehicle", chosen.vehicle, "Name of the vehicle in all outputs")->type_name("NAME");
     command.add_option("--vin", chosen.vin, "Whether the outputs may hold the VIN: none or full")
         ->type_name("none|full")

@@ -50,11 +50,11 @@ std::string makerText(MakerChoice const& choice)
     case MakerChoice::By::Vin:
         return choice.maker + "'s, by the VIN";
     case MakerChoice::By::Guess:
-        return fmt::format("not told; perhaps {0}'s: --make \"{0}\"", choice.maker);
+        return fmt::format("not known; perhaps {0}'s: --make \"{0}\"", choice.maker);
     case MakerChoice::By::Nothing:
         break;
     }
-    return "not told; --make MAKER names the maker, -v lists all";
+    return "not known; --make MAKER names the maker, -v lists all";
 }
 
 } // namespace

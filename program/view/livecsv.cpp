@@ -89,7 +89,7 @@ bool LiveCsv::joins(std::string const& header) const
     if (begin == header) {
         return true;
     }
-    throw Error(ErrorKind::WrongUse, "The file " + m_file + " stands already, and has not these columns",
+    throw Error(ErrorKind::WrongUse, "The file " + m_file + " exists already, and has other columns",
                 {"--force replaces it", "record to another name, or choose the sensors and units that it has"});
 }
 

@@ -20,7 +20,7 @@ class LiveCsv
 public:
     using WallTime = std::chrono::system_clock::time_point;
 
-    // "-" is standard output, which goes on from where it is. A file that stands already is left alone until begin;
+    // "-" is standard output, which goes on from where it is. A file that exists already is left alone until begin;
     // replaced tells what happens to it then. Throws Error if the file can't be opened.
     explicit LiveCsv(std::string const& file, bool replaced = false);
 

@@ -16,7 +16,7 @@ std::string yearText(VinFacts const& facts)
     }
     std::string const years = fmt::format("{}", fmt::join(facts.years, " or "));
     if (facts.yearBasis == VinFacts::YearBasis::Position) {
-        return fmt::format("{} (position 10 is {}, position 7 tells the round)", years, facts.vin[9]);
+        return fmt::format("{} (position 10 is {}, position 7 says which cycle of 30 years)", years, facts.vin[9]);
     }
     return fmt::format("{}, if this maker codes it (position 10 is {})", years, facts.vin[9]);
 }

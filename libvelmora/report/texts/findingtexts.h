@@ -9,7 +9,7 @@ namespace velmora::texts::finding {
 inline constexpr char const* lamp = "lamp";
 inline constexpr char const* failedTest = "failed test";
 inline constexpr char const* notComplete = "not complete";
-inline constexpr char const* untold = "not told";
+inline constexpr char const* untold = "not reported";
 inline constexpr char const* cleared = "codes cleared";
 inline constexpr char const* permanentAlone = "permanent code alone";
 inline constexpr char const* lampAlone = "lamp without code";

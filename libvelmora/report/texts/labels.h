@@ -31,7 +31,7 @@ inline constexpr char const* codes = "Trouble codes";
 inline constexpr char const* lamp = "Malfunction indicator lamp";
 inline constexpr char const* on = "on";
 inline constexpr char const* off = "off";
-inline constexpr char const* notTold = "not told";
+inline constexpr char const* notTold = "not reported";
 inline constexpr char const* confirmed = "Confirmed";
 inline constexpr char const* pending = "Pending";
 inline constexpr char const* permanent = "Permanent";
@@ -81,8 +81,8 @@ inline constexpr char const* timeWithLamp = "Engine run time with the lamp on";
 inline constexpr char const* distanceSinceCleared = "Distance since codes were cleared";
 inline constexpr char const* timeSinceCleared = "Engine run time since codes were cleared";
 inline constexpr char const* howRead = "How it was read";
-inline constexpr char const* footer = "Read by OBD-II services of SAE J1979. What a module did not tell is shown as "
-                                      "\"-\" or \"not told\"; it is not known "
+inline constexpr char const* footer = "Read by OBD-II services of SAE J1979. What a module did not report is shown as "
+                                      "\"-\" or \"not reported\"; it is not known "
                                       "to be in order. Made by Velmora ";
 
 // Words in a sentence or a table cell.

@@ -4,6 +4,7 @@
 #include "libobd/message/messageparser.h"
 #include "libvelmora/channel/fastchannel.h"
 #include "tests/libvelmora/channel/channelrig.h"
+#include "tests/support/timedwire.h"
 
 #include <obd/obdprotocol.h>
 
@@ -29,38 +30,11 @@ std::size_t dataBytes(unsigned int pid)
     return pid == 0x0C ? 2U : pid == 0x4F ? 4U : pid == 0x64 ? 9U : pid == 0x7F ? 13U : 1U; // two take more frames
 }
 
-class LyingWire : public IWire
+class LyingWire : public support::LineWire
 {
 public:
     // severity: how many times as often as it should be.
     LyingWire(unsigned int seed, unsigned int severity) : m_random(seed), m_severity(severity) {}
-
-    void write(std::string_view bytes) override
-    {
-        for (char const character : bytes) {
-            if (character == '\r') {
-                answer(std::exchange(m_line, {}));
-            } else {
-                m_line += character;
-            }
-        }
-    }
-    std::string read(WireTime until) override
-    {
-        auto const next = m_output.begin();
-        if (next == m_output.end() || next->first > until) {
-            m_now = std::max(m_now, until);
-            return {};
-        }
-        m_now = std::max(m_now, next->first);
-        std::string bytes = next->second;
-        m_output.erase(next);
-        return bytes;
-    }
-    WireTime now() const override { return m_now; }
-    bool isUp() const override { return true; }
-    void giveUp() override {}
-    bool resume() override { return true; }
 
     int faults = 0;
 
@@ -90,11 +64,11 @@ private:
         return frames;
     }
 
-    void answer(std::string const& command)
+    void answer(std::string const& command) override
     {
         if (command.starts_with("AT")) {
             std::string const text = command == "ATI" ? "ELM327 v1.5" : command == "ATDPN" ? "A6" : "OK";
-            m_output.emplace(m_now + WireTime(4), text + "\r\r>");
+            say(text + "\r\r>", WireTime(4));
             return;
         }
         std::size_t const told = command.size() % 2 != 0 ? static_cast<std::size_t>(command.back() - '0') : 0;
@@ -118,10 +92,10 @@ private:
         }
         bool const behind = m_random() % 3 == 0; // in its place it is one fault with the loss before
         lines.insert(behind ? lines.end() : lines.begin(), late.begin(), late.end());
-        say(lines, told);
+        sayLines(lines, told);
     }
 
-    void say(std::vector<std::string>& lines, std::size_t told)
+    void sayLines(std::vector<std::string>& lines, std::size_t told)
     {
         std::string text;
         for (std::string& line : lines) {
@@ -135,21 +109,18 @@ private:
             m_held.push_back(text + "\r>"); // all of it, its prompt too, with the next request
             std::string const all = std::exchange(m_held.back(), {});
             m_held.clear();
-            m_output.emplace(m_now + WireTime(1700 + m_random() % 2000), all);
+            say(all, WireTime(1700 + m_random() % 2000));
             return;
         }
-        m_output.emplace(m_now + WireTime(15), text);
+        say(text, WireTime(15));
         if (!happens(50)) {
-            m_output.emplace(m_now + WireTime(told != 0 ? 16 : 80), "\r>");
+            say("\r>", WireTime(told != 0 ? 16 : 80));
         }
     }
 
     std::mt19937 m_random;
     unsigned int const m_severity;
-    std::multimap<WireTime, std::string> m_output;
     std::vector<std::string> m_held;
-    std::string m_line;
-    WireTime m_now{1000};
 };
 
 // What the library reads under a PID, by module.

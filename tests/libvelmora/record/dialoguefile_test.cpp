@@ -50,7 +50,7 @@ TEST_F(DialogueFileTest, replacesNoFile)
         FAIL() << "opened";
     } catch (Error const& failure) {
         EXPECT_EQ(failure.kind(), ErrorKind::WrongUse);
-        EXPECT_NE(std::string(failure.what()).find("stands already"), std::string::npos);
+        EXPECT_NE(std::string(failure.what()).find("exists already"), std::string::npos);
     }
     EXPECT_TRUE(std::filesystem::exists(m_path));
 }

@@ -173,7 +173,7 @@ TEST(ReportDocument, TellsSilenceAndRefusalAsWhatTheyAre)
     EXPECT_EQ(html.find("none stored"), std::string::npos);
     ModuleReport silent{0x7E9, "", {}, {}, {}, {}, {}, {}, {}, {}};
     std::string const untold = toHtml(makeDocument({{}, {}, {silent}}, facts));
-    EXPECT_NE(untold.find("not told"), std::string::npos) << "the lamp";
+    EXPECT_NE(untold.find("not reported"), std::string::npos) << "the lamp";
 }
 
 TEST(ReportDocument, DrawsABarWhereThereAreLimits)

@@ -113,9 +113,9 @@ TEST(CodeReportView, GivesMakersCodesTheMeaningOfTheMakerAlone)
     std::string const head = "  Lamp           on\n  Confirmed      1 code\n";
     std::string const unknown = head + "    P1131  -              maker-specific, 2 meanings\n";
     EXPECT_EQ(text(MakerChoice::By::Nothing, ""),
-              unknown + "  Meanings       not told; --make MAKER names the maker, -v lists all\n");
+              unknown + "  Meanings       not known; --make MAKER names the maker, -v lists all\n");
     EXPECT_EQ(text(MakerChoice::By::Guess, "Volkswagen"),
-              unknown + "  Meanings       not told; perhaps Volkswagen's: --make \"Volkswagen\"\n");
+              unknown + "  Meanings       not known; perhaps Volkswagen's: --make \"Volkswagen\"\n");
     std::string const known = head + "    P1131  Volkswagen     Two\n";
     EXPECT_EQ(text(MakerChoice::By::Option, "Volkswagen"), known + "  Meanings       Volkswagen's\n");
     EXPECT_EQ(text(MakerChoice::By::Vin, "Volkswagen"), known + "  Meanings       Volkswagen's, by the VIN\n");

@@ -83,16 +83,17 @@ TEST(Findings, TellAModuleThatHidesItsCodes)
     VehicleReport report;
     report.modules = {module(0x7E8, "ECM")};
     report.modules[0].codes = {{}, {{CodeKind::Confirmed, CodeList::Answer::Silent, {}, {}}}};
-    EXPECT_EQ(toText(findings(report), Style()), "Findings\n  7E8 ECM  not told  lamp and confirmed codes\n");
+    EXPECT_EQ(toText(findings(report), Style()), "Findings\n  7E8 ECM  not reported  lamp and confirmed codes\n");
     report.modules[0].codes.lamp = false;
-    EXPECT_EQ(toText(findings(report), Style()), "Findings\n  7E8 ECM  not told  confirmed codes\n");
+    EXPECT_EQ(toText(findings(report), Style()), "Findings\n  7E8 ECM  not reported  confirmed codes\n");
     report.modules[0].codes.lists[0].offered = false;
     EXPECT_TRUE(findings(report).empty()) << "the module has no such list";
     report.modules[0].codes.lamp.reset();
     report.modules[0].codes.lampAnswer = TopicAnswer::NotOffered;
     EXPECT_TRUE(untold(report.modules[0].codes).empty()) << "nor a lamp";
     report.modules[0].offers = TopicAnswer::Silent;
-    EXPECT_EQ(toText(findings(report), Style()), "Findings\n  7E8 ECM  not told  all that it supports (no answer)\n");
+    EXPECT_EQ(toText(findings(report), Style()),
+              "Findings\n  7E8 ECM  not reported  all that it supports (no answer)\n");
 }
 
 TEST(Findings, ShowWhatTheDataSuggestsWithReasonsAndDoubts)
