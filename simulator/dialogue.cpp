@@ -273,9 +273,9 @@ Dialogue parseDialogue(std::string const& text, std::string const& origin)
 
 Dialogue loadDialogue(std::string const& path)
 {
-    auto const text = readTextFile(path);
+    auto const text = readTextFile(path, largestRecording);
     if (!text) {
-        throw DialogueError(path + ": cannot be read");
+        throw DialogueError(path + ": cannot be read: " + whyNoText(path, largestRecording));
     }
     return parseDialogue(*text, path);
 }

@@ -24,11 +24,14 @@ constexpr FaultForm forms[] = {
     {"prompt", FaultKind::Prompt, true, true, false},    {"cut", FaultKind::Cut, false, true, false},
     {"stall", FaultKind::Stall, false, true, true},      {"slow", FaultKind::Slow, false, false, true},
     {"loss", FaultKind::Loss, false, true, false},       {"error", FaultKind::Error, true, true, false},
+    {"silent", FaultKind::Silent, false, true, false},   {"reset", FaultKind::Reset, false, true, false},
 };
 
 constexpr char const* usage =
     "the faults are garbage=P, nul=P, prompt=P, prompt@COMMAND, cut@BYTE, stall@BYTE:MS, slow=MS, loss@BYTE, "
-    "error:WORDS@COMMAND, error:WORDS=P, echo, quirk:NAME, command=MS, wait=MS, baud=RATE and seed=N";
+    "error:WORDS@COMMAND, error:WORDS=P, silent@COMMAND, reset@COMMAND, reset:banner@COMMAND, reset:WORDS@COMMAND, "
+    "echo, "
+    "quirk:NAME, command=MS, wait=MS, baud=RATE and seed=N";
 
 [[noreturn]] void fail(std::string const& text, std::string const& why)
 {
@@ -163,7 +166,8 @@ Fault parseFault(std::string const& text)
     Fault fault;
     fault.kind = form->kind;
     std::string rest = text.substr(mark);
-    if (form->kind == FaultKind::Error) {
+    bool const mayHaveWords = form->kind == FaultKind::Reset && rest[0] == ':';
+    if (form->kind == FaultKind::Error || mayHaveWords) {
         auto const end = rest.find_last_of("=@");
         if (rest[0] != ':' || end == std::string::npos || end < 2) {
             fail(text, usage);

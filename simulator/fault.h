@@ -23,7 +23,9 @@ enum class FaultKind : int
     Stall,   ///< a pause in front of a byte
     Slow,    ///< everything comes later
     Loss,    ///< the link breaks in front of a byte
-    Error    ///< an error word in place of a reply
+    Error,   ///< an error word in place of a reply
+    Silent,  ///< the adapter hears and says nothing from a command on
+    Reset    ///< the adapter starts anew in place of a reply
 };
 
 /// One fault. Positions count from 1 and from the beginning of a connection:
@@ -34,7 +36,7 @@ struct Fault
     double probability = 0;
     std::uint64_t position = 0; ///< 0: by probability
     Time duration{};
-    std::string word;
+    std::string word; ///< of Error; of Reset what it says: nothing, "banner", or these words
 };
 
 /// All faults of a simulation.

@@ -18,7 +18,8 @@ FaultyPeer::FaultyPeer(std::shared_ptr<IPeer> inner, FaultPlan plan)
 /// Without faults nothing is counted, and the places of the first one count from zero.
 void FaultyPeer::add(Fault fault)
 {
-    bool const byCommand = fault.kind == FaultKind::Prompt || fault.kind == FaultKind::Error;
+    bool const byCommand = fault.kind == FaultKind::Prompt || fault.kind == FaultKind::Error ||
+                           fault.kind == FaultKind::Silent || fault.kind == FaultKind::Reset;
     fault.position += fault.position == 0 ? 0 : byCommand ? m_command : m_byte;
     m_plan.faults.push_back(std::move(fault));
 }
@@ -26,6 +27,7 @@ void FaultyPeer::add(Fault fault)
 void FaultyPeer::clear()
 {
     m_plan.faults.clear();
+    m_silent = false;
 }
 
 void FaultyPeer::breakLink()
@@ -43,10 +45,47 @@ void FaultyPeer::receive(std::string_view bytes)
         if (!m_linkUp) {
             return;
         }
+        if (byte == '\r' && ends(m_command + 1)) {
+            ++m_command;
+            continue;
+        }
+        if (m_silent) {
+            continue;
+        }
         m_inner->receive(std::string_view(&byte, 1));
         if (byte == '\r') {
             startCommand();
         }
+    }
+}
+
+/// Whether the command does not come to its end: the adapter starts anew, or is silent for good.
+bool FaultyPeer::ends(std::uint64_t command)
+{
+    for (auto const& fault : m_plan.faults) {
+        if (fault.position != command) {
+            continue;
+        }
+        if (fault.kind == FaultKind::Silent) {
+            pull(now());
+            m_silent = true;
+        } else if (fault.kind == FaultKind::Reset) {
+            restart(fault.word);
+            return true;
+        }
+    }
+    return m_silent;
+}
+
+void FaultyPeer::restart(std::string const& word)
+{
+    pull(now());
+    m_inner->connect();
+    m_inner->receive("ATZ\r");
+    m_promptLost = false;
+    m_dropping = word != "banner";
+    if (!word.empty() && m_dropping) {
+        m_output.push(now() + errorTime, word + "\r\r>");
     }
 }
 
@@ -100,6 +139,7 @@ void FaultyPeer::connect()
     m_command = 0;
     m_dropping = false;
     m_promptLost = false;
+    m_silent = false;
     m_linkUp = true;
 }
 
@@ -121,7 +161,7 @@ void FaultyPeer::pull(Time time)
 
 void FaultyPeer::pass(char byte, Time time)
 {
-    if (m_dropping || !m_linkUp) {
+    if (m_dropping || m_silent || !m_linkUp) {
         m_dropping = m_dropping && byte != prompt;
         return;
     }

@@ -33,6 +33,8 @@ public:
 
 private:
     void startCommand();
+    bool ends(std::uint64_t command);
+    void restart(std::string const& word);
     void pull(Time time);
     void pass(char byte, Time time);
     void addNoise(Time time);
@@ -48,6 +50,7 @@ private:
     std::uint64_t m_command = 0; ///< commands received so far
     bool m_dropping = false;     ///< the rest of a reply, up to its prompt
     bool m_promptLost = false;   ///< the reply under way will lack its prompt
+    bool m_silent = false;
     bool m_linkUp = true;
 };
 

@@ -119,10 +119,25 @@ std::vector<std::string> simulatedDrives()
 
 std::vector<std::string> faultForms()
 {
-    std::vector<std::string> forms = {
-        "garbage=P",     "nul=P",      "prompt=P",  "prompt@COMMAND", "cut@BYTE",
-        "stall@BYTE:MS", "slow=MS",    "loss@BYTE", "error:WORDS=P",  "error:WORDS@COMMAND",
-        "echo",          "command=MS", "wait=MS",   "baud=RATE",      "seed=N"};
+    std::vector<std::string> forms = {"garbage=P",
+                                      "nul=P",
+                                      "prompt=P",
+                                      "prompt@COMMAND",
+                                      "cut@BYTE",
+                                      "stall@BYTE:MS",
+                                      "slow=MS",
+                                      "loss@BYTE",
+                                      "error:WORDS=P",
+                                      "error:WORDS@COMMAND",
+                                      "silent@COMMAND",
+                                      "reset@COMMAND",
+                                      "reset:banner@COMMAND",
+                                      "reset:WORDS@COMMAND",
+                                      "echo",
+                                      "command=MS",
+                                      "wait=MS",
+                                      "baud=RATE",
+                                      "seed=N"};
     for (auto const& quirk : quirkNames()) {
         forms.push_back("quirk:" + quirk);
     }

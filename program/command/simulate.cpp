@@ -31,7 +31,8 @@ void printNames(char const* title, std::vector<std::string> const& names)
     }
 }
 
-void serve(obdsim::SessionOptions const& options)
+// False if the trace could not be written.
+bool serve(obdsim::SessionOptions const& options)
 {
     obdsim::Session session(options);
     for (std::string const& address : session.addresses()) {
@@ -44,6 +45,7 @@ void serve(obdsim::SessionOptions const& options)
     Interrupt::instance().setHandler([&session] { session.stop(); });
     session.run();
     Interrupt::instance().setHandler(nullptr);
+    return !session.traceFailed();
 }
 
 ExitCode simulate(SimulateOptions const& options, GlobalOptions const& global)
@@ -59,13 +61,12 @@ ExitCode simulate(SimulateOptions const& options, GlobalOptions const& global)
     obdsim::SessionOptions session = options.session;
     session.trace = global.traceFile;
     try {
-        serve(session);
+        return serve(session) ? ExitCode::Done : ExitCode::Failed;
     } catch (obdsim::ServerError const& error) {
         throw Error(ErrorKind::PortFailed, error.what(), {"choose another address with --listen"});
     } catch (obdsim::SimulatorError const& error) {
         throw Error(ErrorKind::WrongUse, error.what(), {"velmora simulate --list shows what there is to choose from"});
     }
-    return ExitCode::Done;
 }
 
 } // namespace
@@ -78,18 +79,26 @@ void addSimulateCommand(CommandLine& commandLine)
                                [options](GlobalOptions const& global) { return simulate(*options, global); });
     obdsim::SessionOptions& session = options->session;
     command->add_option("--listen", session.listen, "tcp://HOST:PORT (port 0: any free one) or pty")
+        ->type_name("ADDRESS")
         ->capture_default_str();
-    command->add_option("--vehicle", session.simulation.vehicle, "A built-in vehicle, or a vehicle file");
-    command->add_option("--replay", session.replay, "Serve a recorded dialogue instead of a vehicle");
-    command->add_option("--adapter", session.simulation.adapter, "A built-in adapter");
-    command->add_option("--fault", session.simulation.faults,
-                        "Something that goes wrong, such as cut@120; may be repeated");
-    command->add_option("--scenario", session.simulation.scenario, "Control lines with their times");
-    command->add_option("--drive", session.simulation.drive, "A built-in drive, or a CSV file (seconds,speed,...)");
-    command->add_option("--write-scenario", session.written, "Write what control lines have changed as a scenario");
+    command->add_option("--vehicle", session.simulation.vehicle, "A built-in vehicle, or a vehicle file")
+        ->type_name("VEHICLE");
+    command->add_option("--replay", session.replay, "Serve a recorded dialogue instead of a vehicle")
+        ->type_name("FILE");
+    command->add_option("--adapter", session.simulation.adapter, "A built-in adapter")->type_name("ADAPTER");
+    command
+        ->add_option("--fault", session.simulation.faults,
+                     "Something that goes wrong, such as cut@120; may be repeated")
+        ->type_name("FAULT");
+    command->add_option("--scenario", session.simulation.scenario, "Control lines with their times")->type_name("FILE");
+    command->add_option("--drive", session.simulation.drive, "A built-in drive, or a CSV file (seconds,speed,...)")
+        ->type_name("DRIVE");
+    command->add_option("--write-scenario", session.written, "Write what control lines have changed as a scenario")
+        ->type_name("FILE");
     command->add_option("--control", session.control, "Take control lines on this port of 127.0.0.1 (0: any free one)")
+        ->type_name("N")
         ->check(CLI::Range(0, 65535));
-    command->add_option("--fleet", session.fleet, "Serve so many cars, each at an address of its own");
+    command->add_option("--fleet", session.fleet, "Serve so many cars, each at an address of its own")->type_name("N");
     command->add_flag("--list", options->list, "List vehicles, adapters, faults and control lines");
 }
 

@@ -27,6 +27,19 @@ bool isConsecutiveFrame(Frame const& frame, bool extended)
     return pciOf(frame, extended) >> 4 == 0x2;
 }
 
+/// The consecutive frames that a first frame promises (ISO 15765-2).
+std::size_t promisedFrames(Frame const& frame, bool extended)
+{
+    const std::size_t at = extended ? 1 : 0;
+    if (frame.data.size() < at + 2) {
+        return 0;
+    }
+    const std::size_t length = (frame.data[at] & 0x0FU) << 8U | frame.data[at + 1];
+    const std::size_t inFirst = 6 - at;
+    const std::size_t inEach = 7 - at;
+    return length > inFirst ? (length - inFirst + inEach - 1) / inEach : 0;
+}
+
 std::size_t serialBytes(Frame const& frame)
 {
     return frame.header.size() + frame.data.size() + (frame.checksum ? 1 : 0);
@@ -215,6 +228,7 @@ void BusWire::listen(BusRequest const& request, Settings const& settings, BusRep
     Time deadline = sent + settings.timeout();
     std::map<std::uint32_t, Time> promised; // modules that asked for patience, whatever the others say meanwhile
     std::map<std::uint32_t, Time> heard;
+    std::map<std::uint32_t, std::size_t> missing; // frames of messages that have begun
     Time slowest{};
     bool anything = false;
     auto next = m_frames.begin();
@@ -234,7 +248,8 @@ void BusWire::listen(BusRequest const& request, Settings const& settings, BusRep
         if (isPending(bus, frame, settings.extendedAddress.has_value())) {
             promised[next->frame.source] = next->time + pendingWait(settings);
         }
-        deadline = next->time + m_timer.wait(settings);
+        bool const rest = isCan(bus) && awaitsRest(frame, settings, missing);
+        deadline = next->time + (rest ? m_timer.waitForRest(settings) : m_timer.wait(settings));
         for (auto const& [module, until] : promised) {
             deadline = std::max(deadline, until);
         }
@@ -249,6 +264,19 @@ void BusWire::listen(BusRequest const& request, Settings const& settings, BusRep
     if (!anything) {
         reply.texts.push_back({reply.end, "NO DATA\r"});
     }
+}
+
+/// Whether a module owes frames of its message behind this frame.
+bool BusWire::awaitsRest(Frame const& frame, Settings const& settings, std::map<std::uint32_t, std::size_t>& missing)
+{
+    bool const extended = settings.extendedAddress.has_value();
+    std::size_t& own = missing[frame.source];
+    if (isFirstFrame(frame, extended)) {
+        own = settings.flowControl ? promisedFrames(frame, extended) : 0;
+    } else if (isConsecutiveFrame(frame, extended) && own != 0) {
+        --own;
+    }
+    return std::any_of(missing.begin(), missing.end(), [](auto const& each) { return each.second != 0; });
 }
 
 /// A consecutive frame comes only upon flow control that its module heeds.

@@ -3,6 +3,7 @@
 #include "simulator/adapter/replytimer.h"
 #include "simulator/car/vehicle.h"
 
+#include <map>
 #include <memory>
 
 namespace obdsim {
@@ -52,6 +53,7 @@ private:
     Time free(Time at) const;
     Time send(BusRequest const& request, Settings const& settings, Time at);
     void listen(BusRequest const& request, Settings const& settings, BusReply& reply, Time now, Time sent);
+    static bool awaitsRest(Frame const& frame, Settings const& settings, std::map<std::uint32_t, std::size_t>& missing);
     bool isSent(Frame const& frame, Settings const& settings);
     Time pendingWait(Settings const& settings) const;
 

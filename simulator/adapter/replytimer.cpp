@@ -20,6 +20,11 @@ Time ReplyTimer::wait(Settings const& settings) const
     return std::min(adapted, settings.timeout());
 }
 
+Time ReplyTimer::waitForRest(Settings const& settings) const
+{
+    return m_timing.wait.value_or(settings.timeout());
+}
+
 void ReplyTimer::learn(Time reply)
 {
     m_slowest = std::max(reply, m_slowest.value_or(Time(0)));

@@ -15,6 +15,10 @@ public:
 
     Time wait(Settings const& settings) const;
 
+    /// The same behind a frame that promises more of its message. An adapter that makes up flow control by itself knows
+    /// of them, and what it has learnt of single frames says nothing of their gaps.
+    Time waitForRest(Settings const& settings) const;
+
     /// A reply came that long after the end of the request.
     void learn(Time reply);
 

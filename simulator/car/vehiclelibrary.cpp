@@ -17,7 +17,8 @@ std::string readFile(std::string const& path)
         for (auto const& name : vehicleNames()) {
             names += names.empty() ? name : ", " + name;
         }
-        throw VehicleFileError(path + ": no such file, and no vehicle of that name; the vehicles are " + names);
+        throw VehicleFileError(path + ": no vehicle of that name, and no vehicle file, for " + whyNoText(path) +
+                               "; the vehicles are " + names);
     }
     return *std::move(text);
 }

@@ -66,7 +66,7 @@ std::vector<ScenarioLine> loadScenario(std::string const& path)
 {
     auto const text = readTextFile(path);
     if (!text) {
-        throw ControlError(path + ": the scenario file cannot be read");
+        throw ControlError(path + ": the scenario file cannot be read: " + whyNoText(path));
     }
     return parseScenario(*text, path);
 }

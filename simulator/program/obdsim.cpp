@@ -35,7 +35,8 @@ void printAll()
     printNames("Control lines", obdsim::controlForms());
 }
 
-void serve(obdsim::SessionOptions const& options)
+// False if the trace could not be written.
+bool serve(obdsim::SessionOptions const& options)
 {
     obdsim::Session session(options);
     for (auto const& address : session.addresses()) {
@@ -62,6 +63,7 @@ void serve(obdsim::SessionOptions const& options)
     }
     context.stop();
     waiting.join();
+    return !session.traceFailed();
 }
 
 // What the program tells packages and shells of its own command line: see describeItself of the other one.
@@ -129,8 +131,8 @@ int main(int argc, char** argv)
         app.parse(argc, argv);
         if (list) {
             printAll();
-        } else {
-            serve(options);
+        } else if (!serve(options)) {
+            return failed;
         }
         return 0;
     } catch (CLI::ParseError const& error) {

@@ -85,6 +85,8 @@ public:
         }
     }
 
+    bool traceFailed() const { return m_trace != nullptr && m_trace->failed(); }
+
 private:
     Peers peers(SessionOptions const& options)
     {
@@ -99,9 +101,9 @@ private:
             all.push_back(replay(options.replay, options.simulation.faults));
         }
         if (!options.trace.empty()) {
-            auto const file = std::make_shared<TraceFile>(options.trace);
+            m_trace = std::make_shared<TraceFile>(options.trace);
             for (std::size_t i = 0; i < all.size(); ++i) {
-                all[i] = std::make_shared<TracePeer>(std::move(all[i]), file, i + 1);
+                all[i] = std::make_shared<TracePeer>(std::move(all[i]), m_trace, i + 1);
             }
         }
         return all;
@@ -125,6 +127,7 @@ private:
     }
 
     std::string m_written;
+    std::shared_ptr<TraceFile> m_trace; ///< null without one
     std::vector<std::shared_ptr<SimulatedCar>> m_cars;
     std::unique_ptr<IServer> m_server;
     std::unique_ptr<ControlSocket> m_socket;
@@ -149,6 +152,11 @@ void Session::run()
 {
     m_impl->server().run();
     m_impl->writeScenario();
+}
+
+bool Session::traceFailed() const
+{
+    return m_impl->traceFailed();
 }
 
 void Session::stop()

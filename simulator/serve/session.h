@@ -40,6 +40,9 @@ public:
     void run();
     void stop();
 
+    /// Whether the trace could not be written to its end, which is told on standard error when it happens.
+    bool traceFailed() const;
+
 private:
     class Impl;
     std::unique_ptr<Impl> m_impl;

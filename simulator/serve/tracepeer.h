@@ -18,6 +18,9 @@ public:
     TraceFile& operator=(TraceFile const&) = delete;
 
     /// "12.345678 3 > 010C\r": seconds, number of the car, from or to the host, the bytes with escapes.
+    /// Whether something of it could not be written.
+    bool failed() const { return m_told; }
+
     void write(Time time, std::size_t car, char direction, std::string_view bytes);
 
 private:

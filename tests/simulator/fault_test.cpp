@@ -18,10 +18,10 @@ Conversation faulty(std::vector<std::string> const& faults)
 
 TEST(Fault, textsAreRead)
 {
-    auto const plan =
-        parseFaults({"garbage=0.25", "nul=1", "cut@120", "stall@80:500", "slow=30", "loss@99", "error:BUS BUSY@3",
-                     "error:CAN ERROR=0.5", "prompt@2", "prompt=0.1", "echo", "quirk:prompt-late", "seed=7"});
-    ASSERT_EQ(plan.faults.size(), 10U);
+    auto const plan = parseFaults({"garbage=0.25", "nul=1", "cut@120", "stall@80:500", "slow=30", "loss@99",
+                                   "error:BUS BUSY@3", "error:CAN ERROR=0.5", "prompt@2", "prompt=0.1", "echo",
+                                   "quirk:prompt-late", "seed=7", "silent@4", "reset@5", "reset:LV RESET@6"});
+    ASSERT_EQ(plan.faults.size(), 13U);
     EXPECT_EQ(plan.faults[0].kind, FaultKind::Garbage);
     EXPECT_EQ(plan.faults[0].probability, 0.25);
     EXPECT_EQ(plan.faults[2].kind, FaultKind::Cut);
@@ -31,6 +31,12 @@ TEST(Fault, textsAreRead)
     EXPECT_EQ(plan.faults[6].word, "BUS BUSY");
     EXPECT_EQ(plan.faults[6].position, 3U);
     EXPECT_EQ(plan.faults[7].probability, 0.5);
+    EXPECT_EQ(plan.faults[10].kind, FaultKind::Silent);
+    EXPECT_EQ(plan.faults[10].position, 4U);
+    EXPECT_EQ(plan.faults[11].kind, FaultKind::Reset);
+    EXPECT_EQ(plan.faults[11].word, "");
+    EXPECT_EQ(plan.faults[12].word, "LV RESET");
+    EXPECT_EQ(plan.faults[12].position, 6U);
     EXPECT_TRUE(plan.quirks.has(obdsim::Quirk::EchoStuck));
     EXPECT_TRUE(plan.quirks.has(obdsim::Quirk::PromptLate));
     EXPECT_EQ(plan.seed, 7U);
@@ -40,10 +46,11 @@ TEST(Fault, textsAreRead)
 TEST(Fault, wrongTextIsToldWithTheFormsThereAre)
 {
     for (char const* text :
-         {"",       "garbage", "garbage=", "garbage=2",      "garbage=-1", "garbage=x",  "garbage@5", "cut=3",
-          "cut@0",  "cut@x",   "cut@5:3",  "stall@5",        "stall=5",    "stall@5:x",  "slow=x",    "slow@5",
-          "loss=3", "error@3", "error:@3", "error:BUS BUSY", "error:X@",   "quirk:none", "seed=x",    "baud=9",
-          "baud",   "wait=x",  "command=", "fire=1",         "prompt"}) {
+         {"",         "garbage",  "garbage=", "garbage=2",      "garbage=-1", "garbage=x",  "garbage@5", "cut=3",
+          "cut@0",    "cut@x",    "cut@5:3",  "stall@5",        "stall=5",    "stall@5:x",  "slow=x",    "slow@5",
+          "loss=3",   "error@3",  "error:@3", "error:BUS BUSY", "error:X@",   "quirk:none", "silent",    "silent=1",
+          "silent@0", "reset",    "reset:@3", "reset:X",        "reset=1",    "seed=x",     "baud=9",    "baud",
+          "wait=x",   "command=", "fire=1",   "prompt"}) {
         try {
             parseFaults({text});
             ADD_FAILURE() << text;
@@ -128,6 +135,34 @@ TEST(FaultyPeer, linkBreaksAndANewClientHasItAgain)
     host.peer().connect();
     EXPECT_TRUE(host.peer().linkIsUp());
     EXPECT_EQ(host.ask("ATI"), "ELM327 v1.5\r\r") << "and loses it at the same byte";
+}
+
+TEST(FaultyPeer, adapterFallsSilentAndSpeaksAgainToANewClient)
+{
+    auto host = faulty({"silent@3"});
+    EXPECT_EQ(host.ask("ATE0"), "ATE0\rOK\r\r>");
+    EXPECT_EQ(host.ask("ATI"), "ELM327 v1.5\r\r>");
+    EXPECT_EQ(host.ask("ATI"), "");
+    EXPECT_EQ(host.ask("ATI"), "");
+    host.peer().connect();
+    EXPECT_EQ(host.ask("ATI"), "ELM327 v1.5\r\r>");
+}
+
+TEST(FaultyPeer, adapterStartsAnewInPlaceOfAReply)
+{
+    struct Row
+    {
+        char const* fault;
+        char const* said;
+    };
+    for (auto const& row : {Row{"reset@3", ""}, Row{"reset:LV RESET@3", "LV RESET\r\r>"},
+                            Row{"reset:banner@3", "\r\rELM327 v1.5\r\r>"}}) {
+        auto host = faulty({row.fault});
+        host.ask({"ATE0", "ATH1"});
+        EXPECT_EQ(host.ask("0100"), row.said) << row.fault;
+        EXPECT_EQ(host.ask("ATI"), "ATI\rELM327 v1.5\r\r>") << "the echo is on again";
+        EXPECT_EQ(host.ask("0100"), "0100\rSEARCHING...\r41 00 BE 3F B8 13 \r41 00 88 18 00 11 \r\r>");
+    }
 }
 
 TEST(FaultyPeer, echoStaysOn)

@@ -58,6 +58,27 @@ TEST(ReplyTimer, firstReplyHasAllTheTime)
     EXPECT_EQ(host.ask({"ATSH7E1", "0100"}), "7E90641009818001100\r\r>");
 }
 
+TEST(ReplyTimer, restOfAMessageHasAllTheTimeHoweverFastTheModuleIs)
+{
+    constexpr char const* hasty = R"(
+name = "A module of 1 ms that leaves 30 ms between its frames"
+protocol = 6
+[[module]]
+id = "7E8"
+latency = 1
+frame_gap = 30
+raw = { "010D" = "41 0D 37", "0902" = "49 02 01 31 4E 34 41 4C 33 41 50 37 44" }
+)";
+    auto host = quiet(hasty);
+    host.ask({"010D", "010D"});
+    EXPECT_EQ(host.ask("0902"), "7E8100D490201314E34\r7E821414C3341503744\r\r>");
+    double const wait = waitAfter(host, "010D");
+    EXPECT_NEAR(wait, 4.2 + 1 + 0.3 + 1.5 * 1.2, 1) << "single frames are awaited as briefly as before";
+    host.ask("ATCFC0");
+    EXPECT_EQ(host.ask("0902"), "7E8100D490201314E34\r\r>") << "without flow control no more is promised";
+    EXPECT_LT(host.lastWait(), Ms(50));
+}
+
 TEST(ReplyTimer, stnWaitsHalfAsLongByItself)
 {
     auto host = quiet(fastAndSlow, "stn2120");

@@ -115,7 +115,9 @@ TEST(VehicleLibrary, readsAFileAndNamesAMissingOne)
         obdsim::loadVehicle("no-such-car");
         FAIL();
     } catch (VehicleFileError const& error) {
-        EXPECT_NE(std::string(error.what()).find("no-such-car: no such file"), std::string::npos);
+        EXPECT_NE(std::string(error.what())
+                      .find("no-such-car: no vehicle of that name, and no vehicle file, for there is no such file"),
+                  std::string::npos);
         EXPECT_NE(std::string(error.what()).find("petrol-can11"), std::string::npos) << "tells what there is";
     }
 }

@@ -1,0 +1,71 @@
+#include "simulator/car/vehiclelibrary.h"
+#include "simulator/control/scenario.h"
+#include "simulator/error.h"
+#include "simulator/serve/tracepeer.h"
+#include "simulator/simulation.h"
+#include "simulator/textfile.h"
+
+#include <gtest/gtest.h>
+
+#include <cstdio>
+#include <fstream>
+#include <sys/stat.h>
+
+namespace {
+
+class TextFile : public testing::Test
+{
+protected:
+    TextFile()
+    {
+        std::ofstream(m_file) << "12345";
+        std::remove(m_pipe.c_str());
+        EXPECT_EQ(::mkfifo(m_pipe.c_str(), 0600), 0);
+    }
+    ~TextFile() override
+    {
+        std::remove(m_file.c_str());
+        std::remove(m_pipe.c_str());
+    }
+
+    std::string m_file = testing::TempDir() + "obdsim-text";
+    std::string m_pipe = testing::TempDir() + "obdsim-pipe";
+};
+
+TEST_F(TextFile, onlyPlainFilesOfABoundedSizeAreRead)
+{
+    EXPECT_EQ(obdsim::readTextFile(m_file, 5), "12345");
+    EXPECT_EQ(obdsim::readTextFile(m_file, 4), std::nullopt);
+    EXPECT_EQ(obdsim::whyNoText(m_file, 4), "it is larger than 0 MiB");
+    for (const std::string path : {"/dev/zero", "/dev/null", "/", m_pipe.c_str()}) {
+        EXPECT_EQ(obdsim::readTextFile(path), std::nullopt) << path;
+        EXPECT_EQ(obdsim::whyNoText(path), "it is no plain file") << path;
+    }
+    EXPECT_EQ(obdsim::whyNoText("/no/such/file"), "there is no such file");
+}
+
+TEST_F(TextFile, carsRecordingsAndScenariosAreTextFiles)
+{
+    for (std::string const& path : {std::string("/dev/zero"), m_pipe}) {
+        EXPECT_THROW(obdsim::loadVehicle(path), obdsim::SimulatorError);
+        EXPECT_THROW(obdsim::replay(path), obdsim::SimulatorError);
+        EXPECT_THROW(obdsim::loadScenario(path), obdsim::SimulatorError);
+    }
+}
+
+TEST_F(TextFile, traceToAPipeThatNobodyReadsIsRefusedAndAFullDiskIsNoted)
+{
+    EXPECT_THROW(obdsim::TraceFile{m_pipe}, obdsim::SimulatorError);
+    obdsim::TraceFile full("/dev/full");
+    full.write(obdsim::Time(0), 1, '>', "ATI\r");
+    EXPECT_TRUE(full.failed());
+    obdsim::TraceFile good(m_file);
+    good.write(obdsim::Time(1500), 2, '<', "OK\r\n\\\x01");
+    EXPECT_FALSE(good.failed());
+    std::ifstream in(m_file);
+    std::string line;
+    std::getline(in, line);
+    EXPECT_EQ(line, "0.001500 2 < OK\\r\\n\\\\\\x01");
+}
+
+} // namespace
