@@ -1,6 +1,7 @@
 #include "program/commandline.h"
 
 #include "libvelmora/output/outputfactory.h"
+#include "program/helpformatter.h"
 #include "program/licencetext.h"
 #include "program/selfdescription.h"
 #include "program/terminal/output.h"
@@ -100,6 +101,7 @@ std::string versionLines()
 
 CommandLine::CommandLine() : m_app("Reads live data, trouble codes and vehicle data from a car.", "velmora")
 {
+    m_app.formatter(std::make_shared<HelpFormatter>()); // the commands take it over
     m_app.require_subcommand(1);
     m_app.set_version_flag("-V,--version", versionLines());
     m_app

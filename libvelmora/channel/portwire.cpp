@@ -16,8 +16,10 @@ PortWire::PortWire(std::unique_ptr<IPort> port) : m_port(std::move(port))
     m_port->start(
         [this](std::string_view bytes) {
             std::lock_guard const lock(m_mutex);
-            m_incoming += bytes;
-            m_open = m_open && m_incoming.size() <= mostUnread;
+            if (m_open) { // a port that floods goes on until it is closed
+                m_incoming += bytes;
+                m_open = m_incoming.size() <= mostUnread;
+            }
             m_wake.notify_one();
         },
         [this] {

@@ -1,5 +1,7 @@
 #include "libvelmora/output/mqttsettings.h"
 
+#include "libvelmora/record/checkedfile.h"
+
 #include <velmora/error.h>
 
 #include <nlohmann/json.hpp>
@@ -41,7 +43,11 @@ std::string secret(OutputAddress const& address, std::string const& key, char co
         char const* const value = std::getenv(variable);
         return value == nullptr ? "" : value;
     }
-    std::ifstream in(file);
+    constexpr std::uintmax_t largest = 1U << 16U;
+    std::ifstream in;
+    if (whyUnreadable(file, largest).empty()) {
+        in.open(file);
+    }
     std::string line;
     if (!std::getline(in, line) || line.empty()) {
         rejectBroker(address, key + " names " + file + ", which can't be read or is empty");

@@ -1,6 +1,7 @@
 #include "libvelmora/watch/watchsettings.h"
 
 #include "libvelmora/poll/sensorwish.h"
+#include "libvelmora/record/checkedfile.h"
 #include "libvelmora/watch/settingstable.h"
 
 #include <velmora/error.h>
@@ -191,6 +192,11 @@ WatchSettings parseWatchSettings(std::string_view text, std::string const& name)
 
 WatchSettings readWatchSettings(std::string const& file)
 {
+    constexpr std::uintmax_t largest = 1U << 20U;
+    if (std::string const why = whyUnreadable(file, largest); !why.empty()) {
+        throw Error(ErrorKind::WrongUse, "Could not read " + file + ": " + why,
+                    {"the settings of the watch are a text in TOML"});
+    }
     std::ifstream in(file, std::ios::binary);
     std::string const text{std::istreambuf_iterator<char>(in), {}};
     if (!in) {

@@ -1,5 +1,6 @@
 #include "libvelmora/doctor/doctor.h"
 
+#include "libvelmora/record/checkedfile.h"
 #include "libvelmora/record/dialoguerecorder.h"
 #include "program/command/commands.h"
 #include "program/command/commandsession.h"
@@ -11,6 +12,7 @@
 #include <fmt/format.h>
 
 #include <cstring>
+#include <filesystem>
 #include <fstream>
 
 namespace velmora::cli {
@@ -21,7 +23,22 @@ struct DoctorOptions
 {
     std::string bundle;
     bool keepVin = false;
+    bool force = false;
 };
+
+// What can be told before a minute is spent with the vehicle.
+void checkBundle(DoctorOptions const& chosen)
+{
+    std::error_code error;
+    if (chosen.bundle.empty()) {
+        return;
+    }
+    if (!chosen.force && std::filesystem::exists(chosen.bundle, error)) {
+        throw Error(ErrorKind::WrongUse, "The file " + chosen.bundle + " stands already",
+                    {"--force replaces it", "write to another name"});
+    }
+    requireWritable(chosen.bundle, "bundle");
+}
 
 void save(std::string const& file, std::string const& text)
 {
@@ -35,6 +52,7 @@ void save(std::string const& file, std::string const& text)
 
 ExitCode examineChain(DoctorOptions const& chosen, GlobalOptions const& options)
 {
+    checkBundle(chosen);
     CommandSession session(options);
     DialogueRecorder recorder;
     DoctorReport const report = examine(session, recorder);
@@ -55,6 +73,7 @@ void addDoctorCommand(CommandLine& commandLine)
         [chosen](GlobalOptions const& options) { return examineChain(*chosen, options); });
     command->add_option("--bundle", chosen->bundle, "Write all of it to one text file, to attach to a question")
         ->type_name("FILE");
+    command->add_flag("--force", chosen->force, "Let --bundle replace a file");
     command->add_flag("--keep-vin", chosen->keepVin,
                       "Keep the whole vehicle identification number in it; otherwise its last six characters become 0");
 }
