@@ -16,7 +16,7 @@ constexpr WireTime turnSlice{100};
 } // namespace
 
 FastChannel::FastChannel(std::shared_ptr<IWire> wire, ChannelOptions options, std::shared_ptr<LearntStore> store)
-    : m_wire(std::move(wire)), m_options(std::move(options)), m_store(std::move(store))
+    : m_wire(std::move(wire)), m_options(std::move(options)), m_store(std::move(store)), m_returns(m_options.returns)
 {
     if (!m_options.counting) {
         m_learner.switchOff();
@@ -26,6 +26,7 @@ FastChannel::FastChannel(std::shared_ptr<IWire> wire, ChannelOptions options, st
 FastChannel::~FastChannel()
 {
     leaveNoAddress();
+    strikeNote();
     keepLearnt();
 }
 
@@ -80,6 +81,8 @@ void FastChannel::send(std::vector<unsigned char> const& bytes)
     }
     if (sleep) {
         if (lock.owns_lock() && !m_pending) {
+            endStay();
+            strikeNote();
             giveWaitBack();
             keepLearnt();
         }

@@ -6,6 +6,7 @@
 #include "libvelmora/channel/ichannelcontrol.h"
 #include "libvelmora/channel/learntstore.h"
 #include "libvelmora/channel/replyhealer.h"
+#include "libvelmora/channel/returnnote.h"
 #include "libvelmora/channel/turn.h"
 #include "libvelmora/channel/wire.h"
 
@@ -13,6 +14,7 @@
 
 #include <atomic>
 #include <deque>
+#include <filesystem>
 #include <map>
 #include <memory>
 #include <mutex>
@@ -24,10 +26,11 @@ namespace velmora {
 
 struct ChannelOptions
 {
-    std::string port;        // where the adapter is, for what is kept of it
-    bool sleepAtEnd = false; // the core's wish to send the adapter to sleep is passed on
-    bool counting = true;    // requests may get an expected count
-    bool shortWait = true;   // the adapter's wait for more replies may be shortened
+    std::string port;                // where the adapter is, for what is kept of it
+    bool sleepAtEnd = false;         // the core's wish to send the adapter to sleep is passed on
+    bool counting = true;            // requests may get an expected count
+    bool shortWait = true;           // the adapter's wait for more replies may be shortened
+    std::filesystem::path returns{}; // file of what adapters were not given back; empty: kept in this process only
 };
 
 // The channel between the core's driver, which is slow and careful, and an adapter, which may be odd: fast and
@@ -40,7 +43,8 @@ struct ChannelOptions
 //
 // All work is done on the threads that send and receive. The members stand in several files: fastchannel.cpp (the
 // interface), fastchannel_exchange.cpp (one exchange), fastchannel_recovery.cpp (prompts lost, adapters reset),
-// fastchannel_haste.cpp (counts, waits, memory), fastchannel_address.cpp (requests to one module).
+// fastchannel_haste.cpp (counts, waits, memory), fastchannel_address.cpp (requests to one module),
+// fastchannel_stay.cpp (several of them, and what a broken link leaves behind).
 class FastChannel : public obd::IDataConnection, public IChannelControl
 {
 public:
@@ -60,6 +64,7 @@ public:
     void addressModule(std::optional<unsigned int> module) override;
     void address(std::optional<RequestAddress> const& address) override;
     std::string refusedAddress() const override;
+    AddressedReply takeReply() override;
     void onConnected() override;
     ChannelStatistics statistics() const override;
 
@@ -86,6 +91,7 @@ private:
         bool woken = false;
         bool verifying = false; // asked once more with the full wait
         bool setUpAgain = false;
+        std::thread::id asker{};
     };
 
     // What a thread has told of its requests.
@@ -94,6 +100,7 @@ private:
         std::optional<unsigned int> module;
         std::optional<RequestAddress> address;
         std::string refused;
+        AddressedReply reply;
     };
 
     // One exchange.
@@ -130,6 +137,13 @@ private:
     std::string takeOn(std::vector<AddressChange> const& changes);
     void restoreAddress();
     void leaveNoAddress();
+    bool moveStay(std::vector<AddressChange> const& changes, std::string& refused);
+    void endStay();
+    void noteStay(std::vector<AddressChange> const& changes);
+    void strikeNote();
+    void giveLeftOversBack();
+    void tellReply(HealedReply const& reply);
+    void tellHeard(std::string const& raw);
 
     // Counts, waits, memory.
     std::optional<unsigned int> countFor(Pending const& pending) const;
@@ -157,6 +171,7 @@ private:
     std::atomic<bool> m_lost{false};
     std::atomic<bool> m_sleepAnswered{false};
     std::atomic<bool> m_connected{false};
+    ReturnNotes const m_returns;
 
     // An exchange holds it; so does each look at what belongs to one.
     Turn m_exchange;
@@ -183,9 +198,12 @@ private:
     unsigned int m_waitBefore = 0; // what a wait that was given back had been
     bool m_waitsLong = false;      // the adapter does not adapt its wait behind replies
     WireTime m_slowest{0};
-    std::vector<AddressStep> m_restore; // takes back the address that is in force
-    int m_addressFailures = 0;          // of modules' own addresses
-    std::set<std::string> m_verified;   // requests whose silent modules were given the full wait once
+    std::vector<AddressStep> m_restore;      // takes back the address that is in force
+    std::optional<RequestAddress> m_staying; // the address that is in force between exchanges
+    std::vector<AddressChange> m_stayChanges;
+    std::vector<std::string> m_noted; // what stands in the note of this port
+    int m_addressFailures = 0;        // of modules' own addresses
+    std::set<std::string> m_verified; // requests whose silent modules were given the full wait once
     std::string m_vin;
 
     std::mutex m_loggerMutex; // held while a logger is called, so that none is called once it is removed

@@ -2,6 +2,7 @@
 
 #include "libvelmora/channel/fastchannel.h"
 
+#include <algorithm>
 #include <utility>
 
 namespace velmora {
@@ -27,7 +28,7 @@ void FastChannel::addressModule(std::optional<unsigned int> module)
 {
     std::lock_guard const lock(m_sharedMutex);
     if (module) {
-        m_addresses[std::this_thread::get_id()] = {*module, {}, {}};
+        m_addresses[std::this_thread::get_id()] = {*module, {}, {}, {}};
     } else {
         m_addresses.erase(std::this_thread::get_id());
     }
@@ -37,7 +38,7 @@ void FastChannel::address(std::optional<RequestAddress> const& address)
 {
     std::lock_guard const lock(m_sharedMutex);
     if (address) {
-        m_addresses[std::this_thread::get_id()] = {std::nullopt, address, {}};
+        m_addresses[std::this_thread::get_id()] = {std::nullopt, address, {}, {}};
     } else {
         m_addresses.erase(std::this_thread::get_id());
     }
@@ -70,6 +71,9 @@ bool FastChannel::setAddress(Pending& pending)
 {
     ThreadAddress const wanted = wantedAddress();
     bool const onlySavesTime = wanted.module.has_value();
+    if (m_staying && !(wanted.address && wanted.address->stays)) {
+        endStay();
+    }
     if (onlySavesTime && m_addressFailures >= mostAddressFailures) {
         return true;
     }
@@ -80,10 +84,20 @@ bool FastChannel::setAddress(Pending& pending)
     }
     std::string const wait = m_waitSteps != 0 ? waitCommand(m_waitSteps) : m_state.setting("ATST");
     std::vector<AddressChange> const changes = addressChanges(*address, m_state, wait);
-    std::string const refused = changes.empty() ? "bus" : takeOn(changes);
+    std::string refused = changes.empty() ? "bus" : "";
+    if (refused.empty() && address->stays && !(m_staying && *m_staying == *address)) {
+        noteStay(changes);
+        m_staying.reset();
+        if (moveStay(changes, refused)) {
+            m_staying = address;
+        }
+    } else if (refused.empty() && !address->stays) {
+        refused = takeOn(changes);
+    }
     noteRefusal(refused);
     if (!refused.empty()) {
         m_addressFailures += onlySavesTime ? 1 : 0;
+        endStay();
         restoreAddress();
         return onlySavesTime && isValid();
     }
@@ -102,7 +116,10 @@ std::string FastChannel::takeOn(std::vector<AddressChange> const& changes)
 {
     for (AddressChange const& change : changes) {
         if (!change.restore.command.empty()) {
-            m_restore.insert(m_restore.begin(), change.restore);
+            auto const later = std::find_if(m_restore.begin(), m_restore.end(), [&change](AddressStep const& each) {
+                return restoreOrder(each.command) > restoreOrder(change.restore.command);
+            });
+            m_restore.insert(later, change.restore);
         }
         if (!confirms(change.set, addressLimit)) {
             return change.set;

@@ -21,7 +21,9 @@ bool isBlank(std::string_view text)
 
 void FastChannel::begin(std::string const& text)
 {
-    m_begun = true;
+    if (!std::exchange(m_begun, true)) {
+        giveLeftOversBack();
+    }
     Pending pending{.command = ElmCommand(text), .sent = {}, .key = {}, .module = {}, .count = {}};
     if (m_connected && m_memory.isOn()) {
         m_memory.stop();
@@ -36,12 +38,19 @@ void FastChannel::begin(std::string const& text)
         return;
     }
     pending.key = pending.command.text();
+    pending.asker = std::this_thread::get_id();
     m_starting = pending.command.resets();
-    if (pending.command.isRequest()) {
+    bool const reachesBus = pending.command.isRequest() || pending.command.monitors();
+    if (!reachesBus && !pending.command.onlyAsks()) {
+        endStay();
+    }
+    if (reachesBus) {
         if (!setAddress(pending)) {
             m_ready.emplace_back("?\r");
             return;
         }
+    }
+    if (pending.command.isRequest()) {
         pending.count = countFor(pending);
     }
     m_pending = std::move(pending);
@@ -174,6 +183,9 @@ void FastChannel::finish(std::string const& raw)
         m_learner.learn(m_pending->key, reply.frames, took, m_wire->now());
     }
     observe(reply);
+    if (m_pending->addressed) {
+        tellReply(reply);
+    }
     deliver(reply.text());
 }
 
@@ -204,7 +216,9 @@ void FastChannel::observe(HealedReply const& reply)
         m_busSpoke = m_busSpoke || reply.data;
         m_memory.remember(command, reply);
         learnVehicle(reply);
-        adaptWait(reply);
+        if (!m_staying) {
+            adaptWait(reply);
+        }
         return;
     }
     if (!wasEchoing && m_state.echoOff() && !m_echoChecked) {
@@ -241,7 +255,9 @@ void FastChannel::endExchange()
     if (done.verifying && m_waitBefore != 0) {
         setWait(m_waitBefore);
     }
-    restoreAddress();
+    if (!m_staying) {
+        restoreAddress();
+    }
 }
 
 // An exchange of the channel's own, between those of the core.

@@ -107,7 +107,7 @@ bool FastChannel::fallsBackToSearch(HealedReply const& reply)
 // modules have just shown how fast they are, and services that none of them has are the rule.
 bool FastChannel::needsFullWait(HealedReply const& reply) const
 {
-    if (m_waitSteps == 0 || !m_pending->command.onlyReads() || m_verified.contains(m_pending->key)) {
+    if (m_staying || m_waitSteps == 0 || !m_pending->command.onlyReads() || m_verified.contains(m_pending->key)) {
         return false;
     }
     if (m_pending->addressed) {

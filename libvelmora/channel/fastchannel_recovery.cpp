@@ -112,6 +112,9 @@ void FastChannel::settle()
         note(Habit::LostPrompt);
         std::string before;
         m_silent = !wake(before);
+        if (m_pending->addressed && m_pending->command.monitors()) {
+            tellHeard(before);
+        }
     }
     endExchange();
 }
@@ -185,6 +188,7 @@ bool FastChannel::setUpAgain(HealedReply const& reply)
     }
     m_waitSteps = 0;
     m_restore.clear(); // a reset has taken it back
+    m_staying.reset();
     m_learner.clear();
     ElmCommand const& command = m_pending->command;
     if (command.isRequest() && !command.onlyReads()) {

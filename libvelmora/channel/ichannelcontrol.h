@@ -5,6 +5,7 @@
 
 #include <optional>
 #include <string>
+#include <vector>
 
 namespace velmora {
 
@@ -20,6 +21,15 @@ struct ChannelStatistics
     bool countingOff = false;           // the adapter made three mistakes by it, or refuses it
     std::optional<unsigned int> waitMs; // how long the adapter waits, where the channel has shortened it
     unsigned int slowestReplyMs = 0;    // of the vehicle
+};
+
+// What the last request to an address brought, beyond what the library tells of it.
+struct AddressedReply
+{
+    bool answered = false;          // the adapter's prompt came
+    std::vector<std::string> lines; // healed, headers shown, address bytes left out
+    std::string error;              // the adapter's first word of trouble, without blanks: "NODATA"
+    bool broken = false;            // something of it was not fit to be handed on
 };
 
 // What the companion tells its channel beside the bytes. Any thread.
@@ -41,6 +51,9 @@ public:
     // The command of the calling thread's last address that the adapter refused; empty if it took all of them. "bus"
     // for an address that is none of the bus.
     virtual std::string refusedAddress() const = 0;
+
+    // Of the calling thread's last request to an address; once.
+    virtual AddressedReply takeReply() = 0;
 
     // The connection stands: from now on nothing is answered from memory.
     virtual void onConnected() = 0;

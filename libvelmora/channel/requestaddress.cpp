@@ -1,6 +1,7 @@
 #include "libvelmora/channel/requestaddress.h"
 
 #include <algorithm>
+#include <iterator>
 
 namespace velmora {
 
@@ -17,11 +18,17 @@ bool isAllDigits(std::string const& text)
     return std::all_of(text.begin(), text.end(), [](char each) { return hexDigitValue(each) >= 0; });
 }
 
+// An X takes any digit.
+bool isPattern(std::string const& text)
+{
+    return std::all_of(text.begin(), text.end(), [](char each) { return each == 'X' || hexDigitValue(each) >= 0; });
+}
+
 bool fitsBus(RequestAddress const& address, BusKind bus)
 {
     std::size_t const digits = address.header.size();
     bool const only = address.reply.empty() && address.extended.empty() && address.flowHeader.empty();
-    bool const hex = isAllDigits(address.header) && isAllDigits(address.reply) && isAllDigits(address.extended) &&
+    bool const hex = isAllDigits(address.header) && isPattern(address.reply) && isAllDigits(address.extended) &&
                      isAllDigits(address.tester) && isAllDigits(address.flowHeader) && isAllDigits(address.flowData);
     switch (bus) {
     case BusKind::Unknown:
@@ -81,6 +88,21 @@ void addHeaderChanges(std::vector<AddressChange>& changes, std::string const& he
     changes.push_back({"ATSH" + (hasPriority ? header.substr(2) : header), {usualHeader(state), {}}});
 }
 
+// Filter and mask, since ATCRA takes an X from level 2.0 on only.
+void addPattern(std::vector<AddressChange>& changes, std::string const& reply)
+{
+    std::string filter = reply;
+    std::string mask = reply;
+    for (std::size_t i = 0; i < reply.size(); ++i) {
+        bool const any = reply[i] == 'X';
+        char const whole = i > 0 ? 'F' : reply.size() == 3 ? '7' : '1'; // 11 and 29 bits
+        filter[i] = any ? '0' : reply[i];
+        mask[i] = any ? '0' : whole;
+    }
+    changes.push_back({"ATCF" + filter, {"ATCRA", "ATAR"}});
+    changes.push_back({"ATCM" + mask, {}});
+}
+
 } // namespace
 
 std::vector<AddressChange> addressChanges(RequestAddress const& address, AdapterState const& state,
@@ -97,7 +119,10 @@ std::vector<AddressChange> addressChanges(RequestAddress const& address, Adapter
     if (!address.tester.empty()) {
         changes.push_back({"ATTA" + address.tester, {}});
     }
-    if (!address.reply.empty()) {
+    bool const isAny = address.reply.find('X') != std::string::npos;
+    if (isAny) {
+        addPattern(changes, address.reply);
+    } else if (!address.reply.empty()) {
         // Without an argument it came with v1.4b; ATAR has the same effect.
         changes.push_back({"ATCRA" + address.reply, {settingOr(state, "ATCRA", "ATCRA"), "ATAR"}});
     }
@@ -107,10 +132,30 @@ std::vector<AddressChange> addressChanges(RequestAddress const& address, Adapter
         changes.push_back({"ATFCSD" + address.flowData, {}});
         changes.push_back({"ATFCSM1", {"ATFCSM0", {}}});
     }
-    if (address.waitMs != 0 && !wait.empty()) {
-        changes.push_back({ownWaitCommand(address.waitMs), {wait, {}}});
+    std::string const full = address.stays ? state.setting("ATST") : std::string();
+    std::string const wanted = address.waitMs != 0 ? ownWaitCommand(address.waitMs) : full;
+    if (!wanted.empty() && !wait.empty() && wanted != wait) {
+        changes.push_back({wanted, {wait, {}}});
+    }
+    if (!address.adaptive) {
+        changes.push_back({"ATAT0", {settingOr(state, "ATAT", "ATAT1"), {}}});
     }
     return changes;
+}
+
+int restoreOrder(std::string const& command)
+{
+    constexpr std::string_view order[] = {"ATFCSM", "ATCEA", "ATCRA", "ATAR", "ATCP", "ATSH", "ATAT", "ATST"};
+    auto const* const found =
+        std::ranges::find_if(order, [&command](std::string_view word) { return command.starts_with(word); });
+    return static_cast<int>(found - std::begin(order));
+}
+
+std::string addressWord(std::string const& command)
+{
+    bool const filter = command.starts_with("ATCEA") || command.starts_with("ATCRA");
+    std::size_t const length = command.starts_with("ATFC") ? 6 : filter ? 5 : 4;
+    return command.substr(0, length);
 }
 
 std::optional<RequestAddress> physicalAddress(BusKind bus, unsigned int module)

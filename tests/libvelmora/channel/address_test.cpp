@@ -58,24 +58,29 @@ HeaderCase const headerCases[] = {
      '6',
      {.header = "7B3", .reply = "7BB", .flowHeader = "7B3", .flowData = "300000", .waitMs = 600},
      {"ATSH7B3", "ATCRA7BB", "ATFCSH7B3", "ATFCSD300000", "ATFCSM1", "ATST93"},
-     {"ATST64", "ATFCSM0", "ATCRA", "ATSH7DF"}},
+     {"ATFCSM0", "ATCRA", "ATSH7DF", "ATST64"}},
     {"an address byte",
      '6',
      {.header = "6F1", .reply = "607", .extended = "07", .tester = "F1"},
      {"ATSH6F1", "ATCEA07", "ATTAF1", "ATCRA607"},
-     {"ATCRA", "ATCEA", "ATSH7DF"}},
+     {"ATCEA", "ATCRA", "ATSH7DF"}},
+    {"whoever answers",
+     '6',
+     {.header = "700", .reply = "7XX"},
+     {"ATSH700", "ATCF700", "ATCM700"},
+     {"ATCRA", "ATSH7DF"}},
     {"29 bits",
      '7',
      {.header = "18DADBF1", .reply = "18DAF1DB"},
      {"ATSHDADBF1", "ATCRA18DAF1DB"},
      {"ATCRA", "ATSHDB33F1"}},
-    {"29 bits of another priority", '7', {.header = "17FC007B"}, {"ATCP17", "ATSHFC007B"}, {"ATSHDB33F1", "ATCP18"}},
+    {"29 bits of another priority", '7', {.header = "17FC007B"}, {"ATCP17", "ATSHFC007B"}, {"ATCP18", "ATSHDB33F1"}},
     {"ISO 14230", '5', {.header = "8110F1"}, {"ATSH8110F1"}, {"ATSHC033F1"}},
     {"ISO 9141-2", '3', {.header = "686AF1"}, {"ATSH686AF1"}, {"ATSH686AF1"}},
     {"SAE J1850 PWM", '1', {.header = "C410F1"}, {"ATSHC410F1"}, {"ATSH616AF1"}},
 };
 
-TEST(RequestAddress, EachKindIsSetAndTakenBackInTheOppositeOrder)
+TEST(RequestAddress, EachKindIsSetAndTakenBackInItsOrder)
 {
     for (HeaderCase const& row : headerCases) {
         ChannelRig rig;
