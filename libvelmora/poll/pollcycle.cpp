@@ -26,10 +26,13 @@ std::set<unsigned int> modulesOf(std::vector<std::size_t> const& members, std::v
 
 PollCycle::PollCycle(std::shared_ptr<obd::IObdProxy> const& proxy, std::vector<PollSource> const& sources,
                      PollPace const& pace, PidLength length, obd::UnitSystem units, Sink sink, IChannelControl* channel)
-    : m_wire(proxy, pace.gap, channel), m_pace(pace), m_length(std::move(length)), m_sink(std::move(sink)),
-      m_meters(sources.size()), m_silent(sources.size(), 0)
+    : m_wire(proxy, pace.gap, channel), m_pace(pace), m_length(std::move(length)), m_sink(std::move(sink))
 {
     for (PollSource const& source : sources) {
+        if (source.guest != nullptr) {
+            m_guests.push_back({source.guest, source.hertz, source.guest->wishes(), 0});
+            continue;
+        }
         auto parameter = std::make_unique<PolledParameter>(m_wire, source.ecu, source.parameter, units);
         auto const pid = static_cast<unsigned char>(source.parameter->pid());
         m_wishes.push_back({source.ecu->id(), pid, source.hertz, parameter->isDerived()});
@@ -37,17 +40,27 @@ PollCycle::PollCycle(std::shared_ptr<obd::IObdProxy> const& proxy, std::vector<P
         m_limits.try_emplace(source.ecu->id(), pace.pidsPerRequest);
     }
     m_mayAddress = pace.addresses && channel != nullptr && proxy->ecus().size() > 1;
+    std::size_t meters = m_wishes.size();
+    for (Guest& guest : m_guests) {
+        guest.first = meters;
+        meters += guest.wishes.size();
+    }
+    m_meters.resize(meters);
+    m_silent.resize(meters, 0);
     plan();
 }
 
 void PollCycle::plan()
 {
     m_tasks = planPolling(m_wishes, m_limits, m_length);
-    m_failures.assign(m_tasks.size(), 0);
+    m_failures.assign(m_tasks.size() + m_guests.size(), 0);
     m_scheduler = DeadlineScheduler();
     PollTime const now = m_wire.now();
     for (PollTask const& task : m_tasks) {
         m_scheduler.add(task.hertz, now);
+    }
+    for (Guest const& guest : m_guests) {
+        m_scheduler.add(guest.hertz, now);
     }
 }
 
@@ -68,7 +81,8 @@ void PollCycle::step()
     }
     std::size_t const task = turn->task;
     m_scheduler.started(task, start);
-    if (run(m_tasks[task])) {
+    bool const isGuest = task >= m_tasks.size();
+    if (isGuest ? runGuest(m_guests[task - m_tasks.size()]) : run(m_tasks[task])) {
         m_failures[task] = 0;
         m_notBefore = start + m_pace.floor;
     } else if (++m_failures[task] >= mostFailures) {
@@ -108,6 +122,28 @@ bool PollCycle::run(PollTask const& task)
         m_parameters[member]->begin();
     }
     return task.pids.size() > 1 ? runMulti(task) : runSingle(task);
+}
+
+bool PollCycle::runGuest(Guest& guest)
+{
+    std::vector<PollResult> const results = guest.guest->turn(m_wire);
+    {
+        std::lock_guard const lock(m_mutex);
+        m_now = m_wire.now();
+        for (std::size_t i = 0; i < guest.wishes.size(); ++i) {
+            bool const told = std::any_of(results.begin(), results.end(), [&](PollResult const& result) {
+                return result.module == guest.wishes[i].module && result.id == guest.wishes[i].id;
+            });
+            if (told) {
+                m_meters[guest.first + i].count(m_now);
+            }
+            m_silent[guest.first + i] = told ? 0 : m_silent[guest.first + i] + 1;
+        }
+    }
+    for (PollResult const& result : results) {
+        m_sink(result);
+    }
+    return !results.empty();
 }
 
 bool PollCycle::runSingle(PollTask const& task)
@@ -264,7 +300,22 @@ std::vector<PollRate> PollCycle::rates()
         rates.push_back(
             {m_wishes[i].module, m_wishes[i].pid, m_wishes[i].hertz, m_meters[i].hertz(m_now), m_silent[i]});
     }
+    for (Guest const& guest : m_guests) {
+        for (std::size_t i = 0; i < guest.wishes.size(); ++i) {
+            PollGuestWish const& wish = guest.wishes[i];
+            std::size_t const meter = guest.first + i;
+            rates.push_back(
+                {wish.module, wish.id, guest.hertz, m_meters[meter].hertz(m_now), m_silent[meter], wish.sensor});
+        }
+    }
     return rates;
+}
+
+void PollCycle::stop()
+{
+    for (Guest const& guest : m_guests) {
+        guest.guest->stop();
+    }
 }
 
 } // namespace velmora

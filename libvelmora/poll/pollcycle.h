@@ -2,6 +2,7 @@
 
 #include "libvelmora/poll/addresstrial.h"
 #include "libvelmora/poll/deadlinescheduler.h"
+#include "libvelmora/poll/ipollguest.h"
 #include "libvelmora/poll/polledparameter.h"
 #include "libvelmora/poll/pollpace.h"
 #include "libvelmora/poll/pollplan.h"
@@ -21,18 +22,20 @@ namespace velmora {
 struct PollRate
 {
     unsigned int module = 0;
-    unsigned char pid = 0;
+    int pid = 0;                 // or the id of a guest's value
     std::optional<double> asked; // hertz
     double reached = 0.0;        // hertz, of late
     int silent = 0;              // turns in a row that brought no value
+    std::string sensor{};        // the key of a guest's value; empty for a PID
 };
 
-// One parameter to be polled, ready made.
+// One parameter to be polled, ready made; or a guest.
 struct PollSource
 {
     std::shared_ptr<obd::IEcu> ecu;
     std::shared_ptr<obd::PowertrainParameter> parameter;
     std::optional<double> hertz;
+    std::shared_ptr<IPollGuest> guest{}; // in the place of module and parameter
 };
 
 // The poller without its thread: takes one turn after the other, on one thread. channel, if there is one, must outlive
@@ -51,16 +54,27 @@ public:
     // Takes the next turn, due or not.
     void step();
 
-    // Any thread.
+    // Any thread, as what follows.
     std::vector<PollRate> rates();
+    // Ends a turn of a guest soon.
+    void stop();
 
 private:
+    struct Guest
+    {
+        std::shared_ptr<IPollGuest> guest;
+        std::optional<double> hertz;
+        std::vector<PollGuestWish> wishes;
+        std::size_t first = 0; // of its meters
+    };
+
     using Parts = std::map<unsigned char, std::vector<unsigned char>>; // by PID
 
     void plan();
     obd::IDevice::Status ask(std::vector<unsigned char> const& request, std::set<unsigned int> const& modules,
                              obd::ResponseMap& responses);
     bool run(PollTask const& task);
+    bool runGuest(Guest& guest);
     bool runSingle(PollTask const& task);
     bool runMulti(PollTask const& task);
     bool runDerived(std::size_t member);
@@ -82,15 +96,16 @@ private:
     std::map<std::pair<unsigned int, std::vector<unsigned char>>, AddressTrial> m_trials;
     bool m_mayAddress = false;
     std::vector<PollTask> m_tasks;
-    std::vector<int> m_failures; // in a row, for each task
+    std::vector<Guest> m_guests;
+    std::vector<int> m_failures; // in a row, for each task, then for each guest
     DeadlineScheduler m_scheduler;
     PollTime m_notBefore{};
     bool m_limitsChanged = false;
 
     std::mutex m_mutex;
     PollTime m_now{};                // of the last turn; protected by m_mutex
-    std::vector<RateMeter> m_meters; // one for each wish; protected by m_mutex
-    std::vector<int> m_silent;       // one for each wish; protected by m_mutex
+    std::vector<RateMeter> m_meters; // one for each wish, of the guests too; protected by m_mutex
+    std::vector<int> m_silent;       // the same; protected by m_mutex
 };
 
 } // namespace velmora

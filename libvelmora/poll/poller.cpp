@@ -20,7 +20,7 @@ bool isTrim(unsigned char pid)
 PidLength lengths(std::vector<PollSource> const& sources)
 {
     bool const fourBanks = std::any_of(sources.begin(), sources.end(), [](PollSource const& source) {
-        return source.ecu->oxygenSensorBanks() == obd::OxygenSensorBank::Pid1D;
+        return source.ecu != nullptr && source.ecu->oxygenSensorBanks() == obd::OxygenSensorBank::Pid1D;
     });
     return [fourBanks](unsigned char pid) {
         return fourBanks && isTrim(pid) ? std::nullopt
@@ -38,6 +38,7 @@ Poller::Poller(std::shared_ptr<obd::IObdProxy> const& proxy, std::vector<PollSou
 Poller::~Poller()
 {
     m_stop = true;
+    m_cycle.stop();
     m_thread.join();
 }
 

@@ -55,14 +55,16 @@ std::vector<ModuleOffer> moduleOffers(obd::IObdVelmora const& obd, std::vector<u
 }
 
 std::unique_ptr<Poller> pollVehicle(obd::IObdVelmora const& obd, std::vector<PollChoice> const& choices,
-                                    PollWill const& will, PollCycle::Sink sink, IChannelControl* channel)
+                                    PollWill const& will, PollCycle::Sink sink, IChannelControl* channel,
+                                    std::vector<PollSource> const& guests)
 {
     std::shared_ptr<obd::IObdProxy> const proxy = obd.getConnectionManager()->getProxy();
     obd::IVelmoraSettings const& settings = *obd.getSettings();
     obd::ObdProtocol const protocol = proxy->protocol();
     PollPace const pace = choosePace(will, protocol, protocol == obd::ObdProtocolJ1850 ? modelYear() : 0);
-    return std::make_unique<Poller>(proxy, makeSources(choices, settings), pace, settings.unitSystem(), std::move(sink),
-                                    channel);
+    std::vector<PollSource> sources = makeSources(choices, settings);
+    sources.insert(sources.end(), guests.begin(), guests.end());
+    return std::make_unique<Poller>(proxy, sources, pace, settings.unitSystem(), std::move(sink), channel);
 }
 
 } // namespace velmora

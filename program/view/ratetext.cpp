@@ -20,9 +20,9 @@ std::string describe(std::vector<PollRate> const& rates, double below)
     std::string text;
     for (PollRate const& rate : rates) {
         if (rate.asked && rate.reached < *rate.asked * below) {
-            text += fmt::format("{}{}{} {} of {} Hz", text.empty() ? "" : ", ",
-                                several ? fmt::format("{:X} ", rate.module) : "", sensorKey(rate.pid),
-                                rateText(rate.reached), rateText(*rate.asked));
+            text += fmt::format(
+                "{}{}{} {} of {} Hz", text.empty() ? "" : ", ", several ? fmt::format("{:X} ", rate.module) : "",
+                rate.sensor.empty() ? sensorKey(rate.pid) : rate.sensor, rateText(rate.reached), rateText(*rate.asked));
         }
     }
     return text;
