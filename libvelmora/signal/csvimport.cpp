@@ -3,6 +3,7 @@
 #include "libvelmora/signal/importedrow.h"
 #include "libvelmora/signal/lookuptable.h"
 #include "libvelmora/signal/signalhex.h"
+#include "libvelmora/signal/standardpid.h"
 
 #include <velmora/error.h>
 
@@ -222,7 +223,7 @@ private:
                 refuse("it reads bytes, but has no request");
                 return false;
             }
-            return scale(signal, cells[Scale]);
+            return readOthers(signal, cells[Equation]) && scale(signal, cells[Scale]);
         } catch (FormulaError const& error) {
             refuse("equation \"" + cells[Equation] + "\": " + error.what() + " (at character " +
                    std::to_string(error.position() + 1) + ")");
@@ -239,6 +240,27 @@ private:
         } else {
             signal.formula = parseFormula(equation, FormulaDialect::Phone);
         }
+    }
+
+    // Values of standard PIDs in an equation, [0D], become signals of their own.
+    bool readOthers(Signal const& signal, std::string const& equation)
+    {
+        for (std::string const& name : valuesReadBy(*signal.formula)) {
+            auto const bytes = name.starts_with("[") ? hexBytes(name.substr(1, 2)) : std::nullopt;
+            if (!bytes || m_collector.knows(name)) {
+                continue;
+            }
+            std::optional<Signal> other = standardPidSignal(bytes->front());
+            if (!other) {
+                refuse("equation \"" + equation + "\": the value of PID " + name + " is not known here");
+                return false;
+            }
+            other->id = m_collector.newId("PID_" + hexText(*bytes));
+            m_collector.call(name, other->id);
+            m_collector.note(m_line, m_name, "reads the standard PID " + name + ", which comes in as " + other->id);
+            m_collector.add(m_line, std::move(*other));
+        }
+        return true;
     }
 
     bool scale(Signal& signal, std::string const& cell)

@@ -193,6 +193,9 @@ private:
             FormulaNode bit = {FormulaStep::Bit, 0.0, {}, operands("}", depth)};
             return checkedCount(std::move(bit), 2, 2);
         }
+        if (m_phone && at("[")) {
+            return otherPid();
+        }
         fail(m_token.kind == FormulaToken::Kind::End ? "the formula ends too early"
                                                      : "\"" + m_token.text + "\" stands in the wrong place");
     }
@@ -231,6 +234,18 @@ private:
             demand(")");
         }
         return {FormulaStep::Value, 0.0, name.text, {}};
+    }
+
+    // [0d]: the value of a standard PID. From ff upward they are sensors of the phone itself.
+    FormulaNode otherPid()
+    {
+        FormulaToken const name = named("[", ']');
+        std::string const digits = inCase(name.text, std::toupper);
+        bool const hexadecimal = digits.find_first_not_of("0123456789ABCDEF") == std::string::npos;
+        if (!hexadecimal || digits.size() != 2 || digits == "FF") {
+            throw FormulaError("[" + name.text + "] is no standard PID", name.position);
+        }
+        return {FormulaStep::Value, 0.0, "[" + digits + "]", {}};
     }
 
     FormulaToken named(std::string_view opening, char closing)

@@ -20,6 +20,9 @@ public:
     void refuse(std::size_t line, std::string const& what, std::string const& why);
     void note(std::size_t line, std::string const& what, std::string const& why);
     void add(std::size_t line, Signal signal);
+    // A further name that formulas have for a signal.
+    void call(std::string const& name, std::string const& id) { m_idOf.emplace(name, id); }
+    bool knows(std::string const& name) const { return m_idOf.contains(name); }
 
     // Puts ids in the place of names in formulas; refuses signals whose formula names none of this file.
     SignalImport finish();

@@ -1,5 +1,6 @@
 #include "libvelmora/signal/signal.h"
 
+#include "libvelmora/signal/readingonly.h"
 #include "libvelmora/signal/signalhex.h"
 
 #include <algorithm>
@@ -30,34 +31,6 @@ ServiceRow const* rowOf(std::vector<unsigned char> const& request)
     return found == std::end(services) ? nullptr : &*found;
 }
 
-// Why services that people put into such files anyhow are kept out.
-char const* dangerOf(unsigned char service)
-{
-    switch (service) {
-    case 0x03:
-    case 0x07:
-    case 0x0A:
-    case 0x12:
-    case 0x13:
-    case 0x17:
-    case 0x18:
-    case 0x19:
-        return "reads trouble codes, which `velmora codes` does";
-    case 0x10:
-        return "changes the session: a module may stop its normal work";
-    case 0x23:
-        return "reads memory by address, which can hang a module";
-    case 0x2A:
-    case 0x86:
-    case 0xAA:
-        return "makes a module send on by itself";
-    case 0x3E:
-        return "keeps a session open, which only the program itself does";
-    default:
-        return "is none of those that only read (01, 02, 05, 06, 09, 1A, 21, 22)";
-    }
-}
-
 } // namespace
 
 std::size_t echoLength(std::vector<unsigned char> const& request)
@@ -66,18 +39,17 @@ std::size_t echoLength(std::vector<unsigned char> const& request)
     return row != nullptr ? row->echoLength : request.size();
 }
 
+// A signal has one identifier: several are put together by who asks.
 std::optional<std::string> refusalOf(std::vector<unsigned char> const& request)
 {
-    if (request.empty()) {
-        return "the request is empty";
+    if (std::optional<std::string> const refusal = refusalFor(request, RequestPurpose::Signal)) {
+        return refusal;
     }
     ServiceRow const* const row = rowOf(request);
-    if (row == nullptr) {
-        return "service " + hexText({request.front()}) + " " + dangerOf(request.front());
-    }
-    if (request.size() != row->requestLength) {
-        return "service " + hexText({request.front()}) + " wants " + std::to_string(row->requestLength) +
-               " bytes, here are " + std::to_string(request.size());
+    if (row == nullptr || request.size() != row->requestLength) {
+        return "service " + hexText({request.front()}) + " wants " +
+               std::to_string(row != nullptr ? row->requestLength : 0) + " bytes, here are " +
+               std::to_string(request.size());
     }
     return std::nullopt;
 }

@@ -138,3 +138,21 @@ TEST(CsvTable, CutsAnyText)
     EXPECT_FALSE(isUtf8("\xB0"));
     EXPECT_FALSE(isUtf8("\xC2"));
 }
+
+TEST(CsvImport, TakesStandardPidsOfEquationsAsSignals)
+{
+    SignalImport const import = importOf(heading + "Power,P,220101,A*[0d]+[0D],0,1,kW,7E4\n"
+                                                   "Other,O,220102,A+[0d],0,1,,7E4\n"
+                                                   "Phone,X,220103,A+[ff1001],0,1,,7E4\n"
+                                                   "Unknown,U,220104,A+[71],0,1,,7E4\n");
+    ASSERT_EQ(import.file.signals.size(), 3U);
+    Signal const& speed = import.file.signals[0];
+    EXPECT_EQ(speed.id, "PID_0D");
+    EXPECT_EQ(speed.request, (std::vector<unsigned char>{0x01, 0x0D}));
+    EXPECT_EQ(speed.unit, "km/h");
+    EXPECT_EQ(toText(*import.file.signals[1].formula), "A*value(\"PID_0D\")+value(\"PID_0D\")");
+    EXPECT_EQ(toText(*import.file.signals[2].formula), "A+value(\"PID_0D\")");
+    ASSERT_EQ(import.refused.size(), 2U);
+    EXPECT_NE(import.refused[0].what.find("no standard PID"), std::string::npos) << import.refused[0].what;
+    EXPECT_NE(import.refused[1].what.find("[71] is not known"), std::string::npos) << import.refused[1].what;
+}

@@ -166,7 +166,7 @@ TEST(Formula, GuessesNothingOfThePhonesDialect)
 {
     for (char const* const text :
          {"A<7", "8<A", "A>3", "A<=8", "-A+B<8", "~A", "Signed(A*256)+B", "(Signed(BD)*256))+BE", "AVG(5:A)",
-          "EWMAF(A:3)", "BARO()", "RANDOM()", "[0d]", "{A:1} -1 * -1}", "(A-80)/2)"}) {
+          "EWMAF(A:3)", "BARO()", "RANDOM()", "[ff1001]", "[0", "[123]", "{A:1} -1 * -1}", "(A-80)/2)"}) {
         EXPECT_NE(mistakeIn(text, FormulaDialect::Phone), "none") << text;
     }
 }

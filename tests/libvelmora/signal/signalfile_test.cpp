@@ -138,7 +138,7 @@ max = 5
         "f.toml:4: signal 1, id: must be a text of capitals, digits and '_'",
         "f.toml:5: signal 1, name: must be a text that is not empty",
         "f.toml:6: signal 1, header: must be a text of hexadecimal digits, as many as one of 3, 6, 8",
-        "f.toml:7: signal 1, request: service 2E is none of those that only read (01, 02, 05, 06, 09, 1A, 21, 22)",
+        "f.toml:7: signal 1, request: service 2E writes into a module",
         "f.toml:8: signal 1, formula: the formula ends too early (at character 3)",
         "f.toml:9: signal 1, colour: is no key of a signal",
         "f.toml:10: signal 2, reply: is missing; only 7E0 to 7E7 and 18DAxxF1 have replies that follow from the header",
