@@ -151,6 +151,13 @@ void CommandLine::addGlobalOptions()
     m_app.add_option("--log", m_options.logFile, "Write the library's log there")->type_name("FILE");
     m_app.add_option("--trace", m_options.traceFile, "Write the adapter traffic there, with times")->type_name("FILE");
     m_app
+        .add_option("--signals", m_options.signalFiles,
+                    "Signals of your own (repeatable); those in the folder signals beside the settings\n"
+                    "file are known without it")
+        ->type_name("FILE")
+        ->expected(1)
+        ->multi_option_policy(CLI::MultiOptionPolicy::TakeAll);
+    m_app
         .add_option("--settings", m_options.settingsFile,
                     "Settings file (velmora/settings.toml in the user's configuration folder)")
         ->type_name("FILE")

@@ -5,6 +5,7 @@
 
 #include <optional>
 #include <string>
+#include <vector>
 
 namespace velmora::cli {
 
@@ -28,6 +29,7 @@ struct GlobalOptions
     std::string logFile;
     std::string traceFile;
     std::string settingsFile;
+    std::vector<std::string> signalFiles;
     bool reset = false;
     bool sleep = false;  // send the adapter to sleep at the end
     bool forget = false; // drop what earlier visits have learnt

@@ -23,6 +23,7 @@ SessionOptions sessionOptions(CarOptions const& options)
     result.logFile = options.logFile;
     result.traceFile = options.traceFile;
     result.settingsFile = options.settingsFile;
+    result.signalFiles = options.signalFiles;
     result.onProgress = options.onProgress;
     result.openPort = options.openPort;
     return result;

@@ -3,6 +3,7 @@
 #include "libvelmora/poll/sensorwish.h"
 #include "libvelmora/read/sensorchoice.h"
 #include "libvelmora/read/sensornames.h"
+#include "libvelmora/uds/signalchoice.h"
 
 #include <common/clock.h>
 #include <obd/ivelmorasettings.h>
@@ -51,7 +52,7 @@ void addSource(std::vector<PollSource>& sources, Session& session, std::shared_p
                obd::ParameterIdentifier::Id id, std::optional<double> hertz)
 {
     bool const known = std::any_of(sources.begin(), sources.end(), [&](PollSource const& source) {
-        return source.ecu == ecu && source.parameter->pid() == id;
+        return source.guest == nullptr && source.ecu == ecu && source.parameter->pid() == id;
     });
     auto parameter = obd::ParameterFactory().createParameter(*ecu, *session.obd().getSettings(), id);
     if (!known && parameter != nullptr) {
@@ -82,7 +83,7 @@ Reading untold(PollRate const& rate)
     Reading reading;
     reading.time = std::chrono::system_clock::now();
     reading.module = rate.module;
-    reading.sensor = sensorKey(rate.pid);
+    reading.sensor = rate.sensor.empty() ? sensorKey(rate.pid) : rate.sensor;
     reading.name = reading.sensor;
     return reading;
 }
@@ -116,9 +117,26 @@ std::vector<PollSource> pollSources(Session& session, std::vector<std::string> c
     if (words.empty()) {
         addWish(sources, session, all, {}, {});
     }
+    SignalChoice signals(session);
+    std::vector<unsigned int> modules;
+    for (Offer const& offer : all) {
+        modules.push_back(offer.ecu->id());
+    }
     for (std::string const& word : words) {
         SensorWish const wish = parseSensorWish(word);
-        addWish(sources, session, all, wish, {wish.sensor});
+        if (signals.choose(wish, modules)) {
+            continue;
+        }
+        try {
+            addWish(sources, session, all, wish, {wish.sensor});
+        } catch (Error const&) {
+            if (!signals.chooseByName(wish, modules)) {
+                throw;
+            }
+        }
+    }
+    for (PollSource& each : signals.sources(sources.empty())) {
+        sources.push_back(std::move(each));
     }
     return sources;
 }

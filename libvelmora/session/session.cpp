@@ -111,6 +111,15 @@ std::filesystem::path const& Session::settingsFile() const
     return m_settings->file();
 }
 
+std::shared_ptr<SignalSet const> Session::signals()
+{
+    if (m_signals == nullptr) {
+        m_signals = std::make_shared<SignalSet const>(
+            m_options.signalFiles, SignalSet::folderBesides(m_settings->file()), m_options.onProgress);
+    }
+    return m_signals;
+}
+
 PortAddress Session::findPort()
 {
     if (!m_address) {
@@ -207,6 +216,7 @@ void Session::openLink()
         learnt->forget();
     }
     ChannelOptions options{.port = this->port(), .sleepAtEnd = m_options.sleep};
+    options.returns = ReturnNotes::besides(m_settings->file());
     bool const replayed = m_address && std::holds_alternative<ReplayAddress>(*m_address);
     bool const inProcess = replayed || (m_address && std::holds_alternative<SimulatorAddress>(*m_address));
     // A recording holds what every reader of it would ask, which is no matter of haste.
@@ -214,6 +224,9 @@ void Session::openLink()
     options.counting = !recorded;
     options.shortWait = !recorded;
     // What is simulated in this process is no adapter that somebody comes back to.
+    if (inProcess) {
+        options.returns.clear();
+    }
     m_link = std::make_unique<Link>(std::move(port), std::move(options), inProcess ? nullptr : std::move(learnt),
                                     m_options.makeChannel);
 }

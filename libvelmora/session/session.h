@@ -7,6 +7,7 @@
 #include "libvelmora/session/link.h"
 #include "libvelmora/session/openingwatch.h"
 #include "libvelmora/session/sessionoptions.h"
+#include "libvelmora/signal/signalset.h"
 
 #include <obd/iadapter.h>
 #include <obd/iecumanager.h>
@@ -67,6 +68,9 @@ public:
     std::filesystem::path const& settingsFile() const;
     // What the channel to the adapter is told, and tells. After connect only.
     IChannelControl& channel() const { return m_link->control(); }
+    // Signals of one's own and built-in ones. Reads their files the first time: throws Error for one that was named and
+    // holds mistakes.
+    std::shared_ptr<SignalSet const> signals();
     DispatchLoop& loop() { return m_loop; }
     SessionOptions const& options() const { return m_options; }
     // Tells whoever wants to know what the session is at: lines with their line feeds.
@@ -120,6 +124,7 @@ private:
     DialogueRecorder* m_recorder = nullptr;
     std::unique_ptr<TrafficTrace> m_trace;
     OpeningWatch m_opening;
+    std::shared_ptr<SignalSet const> m_signals; // null until they are wanted
 };
 
 } // namespace velmora

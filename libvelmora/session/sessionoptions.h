@@ -8,6 +8,7 @@
 #include <memory>
 #include <optional>
 #include <string>
+#include <vector>
 
 namespace obd {
 class IDataConnection;
@@ -31,6 +32,7 @@ struct SessionOptions
     std::string logFile;
     std::string traceFile;
     std::string settingsFile;
+    std::vector<std::string> signalFiles; // of signals of one's own, beside those of the settings folder
 
     // Opens a transport in place of the port, whose text is then its name only.
     std::function<std::unique_ptr<IPort>()> openPort;

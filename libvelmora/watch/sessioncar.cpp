@@ -48,7 +48,8 @@ void SessionCar::connect()
 
 std::vector<PollSource> SessionCar::chooseSources()
 {
-    std::vector<PollSource> sources = watchSources(*m_session, m_options.sensors);
+    m_signals = std::make_unique<SignalChoice>(*m_session);
+    std::vector<PollSource> sources = watchSources(*m_session, m_options.sensors, *m_signals);
     addSources(*m_session, m_further, sources);
     return sources;
 }
@@ -73,6 +74,7 @@ void SessionCar::disconnect()
     m_up = false;
     m_poller.reset();
     m_sources.clear();
+    m_signals.reset();
     std::unique_ptr<Session> gone;
     {
         std::lock_guard const lock(m_mutex);
@@ -99,15 +101,23 @@ std::vector<ModuleInfo> SessionCar::modules()
 
 SensorList SessionCar::sensors()
 {
-    return sensorList(m_options.vehicle, m_sources);
+    SensorList list = sensorList(m_options.vehicle, m_sources);
+    for (SignalRow const& row : m_signals->rows()) {
+        list.sensors.push_back({row.module, row.sensor, row.request, row.name, row.unit});
+    }
+    return list;
 }
 
 void SessionCar::startAsking()
 {
     std::shared_ptr<obd::IObdProxy> const proxy = m_session->proxy();
     PollPace const pace = choosePace({m_options.fast, 6}, proxy->protocol(), obd::GetVehicleModelYear(m_vin));
+    std::vector<PollSource> sources = m_sources;
+    for (PollSource& each : m_signals->sources(false)) {
+        sources.push_back(std::move(each));
+    }
     m_poller = std::make_unique<Poller>(
-        proxy, m_sources, pace, obd::UnitSystem::Metric,
+        proxy, sources, pace, obd::UnitSystem::Metric,
         [this](PollResult const& result) {
             if (m_options.onReading) {
                 for (Reading const& each : result.readings) {

@@ -2,6 +2,7 @@
 
 #include "libvelmora/poll/poller.h"
 #include "libvelmora/session/session.h"
+#include "libvelmora/uds/signalchoice.h"
 #include "libvelmora/watch/adapternap.h"
 #include "libvelmora/watch/iwatchedcar.h"
 #include "libvelmora/watch/requestcount.h"
@@ -76,6 +77,7 @@ private:
     bool m_interrupted = false;         // protected by m_mutex, as is the pointer above
     std::vector<Reading> m_readings;    // protected by m_mutex
     std::vector<PollSource> m_sources;
+    std::unique_ptr<SignalChoice> m_signals; // of the session
     std::unique_ptr<Poller> m_poller;
     std::unique_ptr<AdapterNap> m_nap;
     std::string m_vin;

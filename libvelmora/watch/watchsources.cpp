@@ -16,6 +16,7 @@
 #include <fmt/format.h>
 
 #include <algorithm>
+#include <iterator>
 
 namespace velmora {
 
@@ -92,14 +93,33 @@ void addEntries(std::vector<SensorEntry>& entries, obd::IEcu& ecu, obd::Powertra
     }
 }
 
+// Signals of one's own first, by id or name; then standard sensors; then words of a signal's name.
+std::vector<PollSource> sourcesOrSignals(Session& session, std::string const& text, SignalChoice& signals)
+{
+    SensorWish const wish = parseSensorWish(text);
+    std::vector<unsigned int> const meant{session.obd().getEcuManager()->getCurrentEcu()->id()};
+    if (signals.choose(wish, meant)) {
+        return {};
+    }
+    try {
+        return sourcesFor(session, text, true);
+    } catch (Error const&) {
+        if (!signals.chooseByName(wish, meant)) {
+            throw;
+        }
+        return {};
+    }
+}
+
 } // namespace
 
-std::vector<PollSource> watchSources(Session& session, std::vector<std::string> const& wishes)
+std::vector<PollSource> watchSources(Session& session, std::vector<std::string> const& wishes, SignalChoice& signals)
 {
     std::vector<PollSource> sources;
     bool const usual = wishes.empty();
     for (std::string const& wish : usual ? usualSensors() : wishes) {
-        std::ranges::move(sourcesFor(session, wish, !usual), std::back_inserter(sources));
+        std::ranges::move(usual ? sourcesFor(session, wish, false) : sourcesOrSignals(session, wish, signals),
+                          std::back_inserter(sources));
     }
     for (char const* const needed : {"RPM", "SPEED"}) {
         for (PollSource& each : sourcesFor(session, needed, false)) {

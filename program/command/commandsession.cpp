@@ -30,6 +30,7 @@ SessionOptions sessionOptions(GlobalOptions const& options)
     result.logFile = options.logFile;
     result.traceFile = options.traceFile;
     result.settingsFile = options.settingsFile;
+    result.signalFiles = options.signalFiles;
     if (!options.quiet) {
         result.onProgress = tell;
         if (PromptReader::canRedraw()) {

@@ -39,6 +39,9 @@ ExitCode live(GlobalOptions const& global, LiveOptions const& given)
     session.connect();
     LiveRun run(session, options, csv.get());
     run.run();
+    if (std::string const troubles = run.signalTroubles(); !troubles.empty() && !global.quiet) {
+        tell(troubles);
+    }
     judgeSilence(run, options, global.quiet);
     return ExitCode::Done;
 }

@@ -5,7 +5,7 @@
 namespace velmora::cli {
 
 LiveFeed::LiveFeed(obd::IObdVelmora const& obd, DispatchLoop& loop, std::vector<PollChoice> const& choices,
-                   PollWill const& will, IChannelControl& channel)
+                   PollWill const& will, IChannelControl& channel, std::vector<PollSource> const& guests)
     : m_poller(pollVehicle(
           obd, choices, will,
           [this, &loop](PollResult const& result) {
@@ -15,7 +15,7 @@ LiveFeed::LiveFeed(obd::IObdVelmora const& obd, DispatchLoop& loop, std::vector<
               }
               loop.wake();
           },
-          &channel))
+          &channel, guests))
 {}
 
 bool LiveFeed::hasNew() const

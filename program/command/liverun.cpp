@@ -45,9 +45,39 @@ std::vector<unsigned int> meantModules(CommandSession const& session)
 
 LiveRun::LiveRun(CommandSession& session, LiveOptions const& options, LiveCsv* csv)
     : m_session(session), m_options(options), m_csv(csv), m_offers(moduleOffers(session.obd(), meantModules(session))),
-      m_choices(choosePolled(options.sensors, m_offers, options.hertz))
+      m_signals(session), m_choices(choose())
 {
     select();
+}
+
+// Signals of one's own first, by id or name; then standard sensors; then words of a signal's name.
+std::vector<PollChoice> LiveRun::choose()
+{
+    std::vector<unsigned int> meant;
+    for (ModuleOffer const& offer : m_offers) {
+        if (offer.meant) {
+            meant.push_back(offer.ecu->id());
+        }
+    }
+    std::vector<std::string> standard;
+    for (std::string const& word : m_options.sensors) {
+        SensorWish wish = parseSensorWish(word);
+        wish.hertz = wish.hertz ? wish.hertz : m_options.hertz;
+        if (m_signals.choose(wish, meant)) {
+            continue;
+        }
+        try {
+            choosePolled({word}, m_offers, m_options.hertz);
+        } catch (Error const&) {
+            if (!m_signals.chooseByName(wish, meant)) {
+                throw;
+            }
+            continue;
+        }
+        standard.push_back(word);
+    }
+    return standard.empty() && !m_signals.empty() ? std::vector<PollChoice>()
+                                                  : choosePolled(standard, m_offers, m_options.hertz);
 }
 
 LiveRun::~LiveRun() = default;
@@ -64,6 +94,9 @@ void LiveRun::select()
             chosen.emplace_back(descriptor, choice.ecu->id(), choice.hertz);
         }
     }
+    for (SignalRow const& row : m_signals.rows()) {
+        chosen.emplace_back(row);
+    }
     m_table.select(chosen);
     m_firstRow = 0;
 }
@@ -74,8 +107,28 @@ void LiveRun::start(std::vector<PollChoice> const& choices)
     m_feed.reset();
     m_choices = choices;
     select();
-    m_feed =
-        std::make_unique<LiveFeed>(m_session.obd(), m_session.loop(), m_choices, m_options.will, m_session.channel());
+    feed();
+}
+
+void LiveRun::feed()
+{
+    m_feed = std::make_unique<LiveFeed>(m_session.obd(), m_session.loop(), m_choices, m_options.will, m_session.channel(),
+                                        m_signals.sources(m_choices.empty()));
+}
+
+std::string LiveRun::signalTroubles() const
+{
+    std::string text;
+    for (SignalTrouble const& each :
+         m_signals.board() != nullptr ? m_signals.board()->troubles() : std::vector<SignalTrouble>()) {
+        if (each.withoutValue != 0) {
+            text += fmt::format("{}: replies without a value: {}\n", each.id, each.withoutValue);
+        }
+        if (!each.reason.empty()) {
+            text += fmt::format("{} {}\n", each.id, each.reason);
+        }
+    }
+    return text;
 }
 
 void LiveRun::run()
@@ -94,8 +147,7 @@ void LiveRun::run()
     } else if (m_options.will.fast && !m_session.options().quiet) {
         tell(std::string(fastWarning) + "\n");
     }
-    m_feed =
-        std::make_unique<LiveFeed>(m_session.obd(), m_session.loop(), m_choices, m_options.will, m_session.channel());
+    feed();
     try {
         while (!isDone()) {
             runOnce();

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "libvelmora/poll/pollchoice.h"
+#include "libvelmora/uds/signalchoice.h"
 #include "program/command/commandsession.h"
 #include "program/command/livefeed.h"
 #include "program/exitcode.h"
@@ -44,10 +45,14 @@ public:
 
     // The sensors that no value has come of, by their names.
     std::vector<std::string> silentSensors() const;
+    // Signals whose replies gave no value or were refused, a line each.
+    std::string signalTroubles() const;
     bool anyValue() const { return m_table.readings() > 0; }
 
 private:
+    std::vector<PollChoice> choose();
     void start(std::vector<PollChoice> const& choices);
+    void feed();
     void select();
     void takeReadings();
     void take(PollResult const& result);
@@ -80,6 +85,7 @@ private:
     LiveOptions const m_options;
     LiveCsv* const m_csv;
     std::vector<ModuleOffer> const m_offers;
+    SignalChoice m_signals;
     std::vector<PollChoice> m_choices;
     LiveTable m_table;
     std::unique_ptr<LiveFeed> m_feed;

@@ -38,6 +38,7 @@ SessionCarOptions carOptions(GlobalOptions const& options, WatchSettings const& 
     result.session.logFile = options.logFile;
     result.session.traceFile = options.traceFile;
     result.session.settingsFile = options.settingsFile;
+    result.session.signalFiles = options.signalFiles;
     if (result.session.settingsFile.empty() && runsAsService()) {
         result.session.settingsFile = stateFolder() / "settings.toml";
     }

@@ -46,7 +46,7 @@ std::string toLine(LiveRow const& row)
 
 std::string toJsonLine(LiveRow const& row, std::string const& time)
 {
-    Json const line = {
+    Json line = {
         {"time", time},
         {"module", fmt::format("{:X}", row.module)},
         {"pid", fmt::format("{:02X}", static_cast<int>(obd::Uid2Pid(row.uid)))},
@@ -58,6 +58,10 @@ std::string toJsonLine(LiveRow const& row, std::string const& time)
         {"mean", toJson(row.mean, row.numeric)},
         {"maximum", toJson(row.maximum, row.numeric)},
     };
+    if (!row.sensor.empty()) {
+        line["pid"] = textOrNull(row.request);
+        line["sensor"] = row.sensor;
+    }
     return line.dump(-1, ' ', false, Json::error_handler_t::replace) + "\n";
 }
 

@@ -32,6 +32,22 @@ LiveRow makeRow(LiveParameter const& chosen, obd::SensorDescriptor const& sensor
     return row;
 }
 
+LiveRow makeRow(LiveParameter const& chosen)
+{
+    LiveRow row{};
+    row.uid = obd::Pid2Uid(chosen.signal->id);
+    row.module = chosen.module;
+    if (chosen.hertz) {
+        row.period = std::chrono::duration_cast<LiveTime::duration>(std::chrono::duration<double>(1.0 / *chosen.hertz));
+    }
+    row.name = chosen.signal->name;
+    row.unit = chosen.signal->unit;
+    row.sensor = chosen.signal->sensor;
+    row.request = chosen.signal->request;
+    row.numeric = chosen.signal->numeric;
+    return row;
+}
+
 void addTrend(LiveRow& row, LiveTime now)
 {
     double number = 0.0;
@@ -78,6 +94,14 @@ void LiveTable::select(Parameters const& parameters)
         return each.module != parameters.front().module;
     });
     for (LiveParameter const& parameter : parameters) {
+        if (parameter.signal) {
+            m_rows.push_back(makeRow(parameter));
+            if (several && parameter.module != 0) {
+                m_rows.back().name.insert(0, fmt::format("{:X} ", parameter.module));
+            }
+            m_selected.insert({parameter.module, parameter.signal->id});
+            continue;
+        }
         auto const sensors = parameter.descriptor->sensors();
         for (auto const& sensor : sensors) {
             m_rows.push_back(makeRow(parameter, *sensor, sensors.size() == 1));

@@ -1,5 +1,7 @@
 #pragma once
 
+#include "libvelmora/uds/signalrow.h"
+
 #include <obd/parameterdescriptor.h>
 #include <obd/sensordatamodels.h>
 
@@ -24,9 +26,12 @@ struct LiveParameter
         : descriptor(std::move(parameter)), module(id), hertz(rate)
     {}
 
-    std::shared_ptr<obd::ParameterDescriptor> descriptor;
-    unsigned int module;         // id of the control module
-    std::optional<double> hertz; // how often it is to come
+    explicit LiveParameter(SignalRow const& row) : module(row.module), hertz(row.hertz), signal(row) {}
+
+    std::shared_ptr<obd::ParameterDescriptor> descriptor; // null for a signal
+    unsigned int module;                                  // id of the control module; 0: any
+    std::optional<double> hertz;                          // how often it is to come
+    std::optional<SignalRow> signal{};
 };
 
 // One sensor with what is known of it. Texts are empty where nothing is known, for a sensor that the vehicle no longer
@@ -37,6 +42,8 @@ struct LiveRow
     unsigned int module;
     std::string name; // with the module's id in front where there are several
     std::string unit;
+    std::string sensor;  // key of a signal; empty for a standard sensor
+    std::string request; // of a signal, hexadecimal
     bool numeric;
     std::string value;
     std::string minimum;

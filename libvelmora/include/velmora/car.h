@@ -39,6 +39,8 @@ struct CarOptions
     std::string logFile = {};
     std::string traceFile = {};    ///< gets the traffic with the adapter
     std::string settingsFile = {}; ///< velmora/settings.toml in the user's configuration folder if empty
+    /// Files of signals of one's own (docs/signals.md), beside those in the folder `signals` of the settings' folder.
+    std::vector<std::string> signalFiles = {};
 
     /// What the car is at while it connects and reads, as lines with their line feeds. On the car's thread.
     std::function<void(std::string const&)> onProgress = {};
@@ -116,7 +118,8 @@ public:
     Car(Car const&) = delete;
     Car& operator=(Car const&) = delete;
 
-    /// Each sensor once, in the order of the words. A sensor that told nothing has a reading without a value.
+    /// Each sensor once, in the order of the words, signals of one's own behind the standard ones. A sensor that told
+    /// nothing has a reading without a value.
     std::vector<Reading> read(std::vector<std::string> const& sensors);
     /// Reads over and over, until the result is destroyed. onLink is told of each loss and each return of the link;
     /// after a loss the car tries to come back for as long as there is a watch. onReading must take less time than the

@@ -1,0 +1,33 @@
+#pragma once
+
+#include <string>
+#include <vector>
+
+namespace velmora {
+
+// What the data of an identifier F180 to F19F (ISO 14229-1) is.
+enum class IdentifierKind
+{
+    Text,
+    CountedText, // a count of items may stand before the text
+    Bytes,
+    Session,
+    Date,
+    Vin,
+};
+
+struct IdentifierRow
+{
+    unsigned int did;
+    char const* name;
+    IdentifierKind kind;
+};
+
+// F180 to F19F, in rising order.
+std::vector<IdentifierRow> const& standardIdentifiers();
+
+// The data of such an identifier for people: text, "2023-05-17", "default session"; hexadecimal for what can't be read
+// as what it should be. Empty for data that is filling only.
+std::string identifierText(unsigned int did, std::vector<unsigned char> const& data);
+
+} // namespace velmora

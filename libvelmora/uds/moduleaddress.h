@@ -1,0 +1,38 @@
+#pragma once
+
+#include "libvelmora/channel/requestaddress.h"
+#include "libvelmora/signal/signal.h"
+
+#include <obd/obdprotocol.h>
+
+#include <optional>
+#include <string>
+
+namespace velmora {
+
+// How the module of a signal is reached on this bus; or why it can't be.
+struct AddressOrReason
+{
+    std::optional<RequestAddress> address;
+    std::string reason; // empty with an address
+};
+
+// Whether a signal goes to all modules, by the bus's standard request.
+bool isBroadcast(Signal const& signal);
+
+AddressOrReason addressOf(Signal const& signal, obd::ObdProtocol protocol);
+
+// Of a module by its identifiers alone: request and reply in hexadecimal, the reply empty where it follows from the
+// request. ext is the module's address byte, if it has one.
+AddressOrReason addressOf(std::string const& header, std::string const& reply, std::optional<unsigned char> ext,
+                          obd::ObdProtocol protocol);
+
+bool isCanBus(obd::ObdProtocol protocol);
+
+// Where a module of ISO 15765-4 listens, by the identifier of its replies: "7E0" for 7E8. Nothing for others.
+std::optional<std::string> standardRequest(unsigned int reply);
+
+// "7E0", "18DA10F1".
+std::string identifierText(unsigned int id);
+
+} // namespace velmora

@@ -1,0 +1,287 @@
+#include "libvelmora/uds/signalchoice.h"
+
+#include "libvelmora/read/sensornames.h"
+#include "libvelmora/signal/signalhex.h"
+#include "libvelmora/text/text.h"
+#include "libvelmora/uds/moduleaddress.h"
+#include "libvelmora/uds/signalgroup.h"
+
+#include <velmora/error.h>
+
+#include <fmt/format.h>
+
+#include <algorithm>
+#include <map>
+#include <tuple>
+#include <utility>
+
+namespace velmora {
+
+namespace {
+
+constexpr unsigned int vinLimitMs = 3000;
+constexpr std::size_t mostRequests = 8; // of a turn, so that other sensors do not wait long
+constexpr double usualRate = 1.0;       // of a module that others share the bus with: setting the adapter up takes time
+
+bool isSwitchedOff(SignalEntry const& entry)
+{
+    return !entry.signal.enabled;
+}
+
+// Where a group stands among the others: one for each module and rate.
+std::string groupKey(std::optional<RequestAddress> const& address, std::optional<double> hertz)
+{
+    std::string const where = address
+                                  ? fmt::format("{}/{}/{}/{}/{}/{}", address->header, address->reply, address->extended,
+                                                address->tester, address->flowHeader, address->waitMs)
+                                  : std::string();
+    return fmt::format("{}@{}", where, hertz.value_or(0.0));
+}
+
+std::string standingNote(SignalEntry const& entry)
+{
+    return entry.standing == PidStanding::NameOnly ? "no layout of its data is known"
+                                                   : "nobody tells for sure how its data is laid out";
+}
+
+} // namespace
+
+std::string vehicleVin(obd::IObdProxy& proxy)
+{
+    constexpr std::size_t vinLength = 17;
+    constexpr std::size_t lead = 3; // 49, 02, and the count of items
+    obd::ResponseMap replies;
+    proxy.execute(std::vector<unsigned char>{0x09, 0x02}, replies, vinLimitMs);
+    for (auto const& [module, bytes] : replies) {
+        if (bytes.size() >= lead + vinLength && bytes[0] == 0x49 && bytes[1] == 0x02) {
+            std::string const vin(bytes.end() - static_cast<std::ptrdiff_t>(vinLength), bytes.end());
+            if (std::all_of(vin.begin(), vin.end(), [](char each) { return each > ' ' && each < 0x7F; })) {
+                return vin;
+            }
+        }
+    }
+    return {};
+}
+
+bool SignalChoice::choose(SensorWish const& wish, std::vector<unsigned int> const& meant)
+{
+    std::vector<std::size_t> found = set().find(wish.sensor);
+    if (found.empty() || (set()[found.front()].isBuiltIn() && findSensorName(wish.sensor))) {
+        return false;
+    }
+    // Of a PID with several values those are meant that can be told.
+    if (found.size() > 1) {
+        auto const undecoded = [&](std::size_t index) { return !set()[index].signal.formula; };
+        if (!std::all_of(found.begin(), found.end(), undecoded)) {
+            std::erase_if(found, undecoded);
+        }
+    }
+    for (std::size_t const index : found) {
+        add(index, wish, meant);
+    }
+    return true;
+}
+
+bool SignalChoice::chooseByName(SensorWish const& wish, std::vector<unsigned int> const& meant)
+{
+    std::vector<std::size_t> const found = set().search(wish.sensor);
+    if (found.size() > 1) {
+        std::string list;
+        for (std::size_t i = 0; i < found.size() && i < 10; ++i) {
+            list += (list.empty() ? "" : ", ") + set()[found[i]].signal.id;
+        }
+        throw Error(ErrorKind::WrongUse, fmt::format("\"{}\" fits several signals", wish.sensor),
+                    {"choose by id: " + list});
+    }
+    for (std::size_t const index : found) {
+        add(index, wish, meant);
+    }
+    return !found.empty();
+}
+
+void SignalChoice::add(std::size_t index, SensorWish const& wish, std::vector<unsigned int> const& meant)
+{
+    if (set()[index].isBuiltIn()) {
+        addBuiltIn(index, wish, meant);
+    } else {
+        addOwn(index, wish);
+    }
+}
+
+void SignalChoice::addOnce(ChosenSignal const& signal)
+{
+    auto const same = std::find_if(m_chosen.begin(), m_chosen.end(), [&](ChosenSignal const& each) {
+        return each.index == signal.index && each.module == signal.module;
+    });
+    if (same == m_chosen.end()) {
+        m_chosen.push_back(signal);
+    } else if (signal.told) {
+        same->told = true;
+        same->hertz = signal.hertz;
+    }
+}
+
+void SignalChoice::checkVehicle(SignalEntry const& entry)
+{
+    if (entry.vin.empty()) {
+        return;
+    }
+    if (!m_vin) {
+        m_vin = vehicleVin(*m_session.proxy());
+    }
+    if (!m_vin->empty() && !fitsVin(entry.vin, *m_vin)) {
+        throw Error(ErrorKind::NotSupported,
+                    fmt::format("{} is for vehicles {}, and this one is {}", entry.signal.id, entry.vin, *m_vin),
+                    {"the file " + entry.path + " says so; take its key vin out if it is wrong"});
+    }
+}
+
+void SignalChoice::addOwn(std::size_t index, SensorWish const& wish)
+{
+    SignalEntry const& entry = set()[index];
+    if (isSwitchedOff(entry)) {
+        throw Error(ErrorKind::NotSupported,
+                    fmt::format("The signal {} is switched off: {}", entry.signal.id, entry.signal.reason),
+                    {"its file " + entry.path + " says so (enabled = false)"});
+    }
+    checkVehicle(entry);
+    if (!entry.signal.request.empty() && !isBroadcast(entry.signal)) {
+        AddressOrReason const reached = addressOf(entry.signal, m_session.proxy()->protocol());
+        if (!reached.address) {
+            throw Error(ErrorKind::NotSupported,
+                        fmt::format("The signal {} can't be asked for: {}", entry.signal.id, reached.reason));
+        }
+    }
+    std::optional<unsigned int> const module = isBroadcast(entry.signal) ? wish.module : std::optional<unsigned int>();
+    addOnce({index, module, wish.hertz ? wish.hertz : entry.signal.rate, true});
+    addInputs(index, wish.hertz);
+}
+
+// What it is worked out of is read, too, though not told.
+void SignalChoice::addInputs(std::size_t index, std::optional<double> hertz)
+{
+    if (!set()[index].signal.formula) {
+        return;
+    }
+    for (std::string const& id : valuesReadBy(*set()[index].signal.formula)) {
+        std::optional<std::size_t> const other = set().sibling(index, id);
+        if (!other || isSwitchedOff(set()[*other])) {
+            throw Error(ErrorKind::NotSupported, fmt::format("{} is worked out of {}, which is switched off or missing",
+                                                             set()[index].signal.id, id));
+        }
+        bool const known = std::any_of(m_chosen.begin(), m_chosen.end(),
+                                       [&](ChosenSignal const& each) { return each.index == *other; });
+        if (!known) {
+            addOnce({*other, {}, hertz ? hertz : set()[*other].signal.rate, false});
+            addInputs(*other, hertz);
+        }
+    }
+}
+
+void SignalChoice::addBuiltIn(std::size_t index, SensorWish const& wish, std::vector<unsigned int> const& meant)
+{
+    SignalEntry const& entry = set()[index];
+    unsigned char const pid = entry.signal.request[1];
+    if (!entry.signal.formula) {
+        throw Error(ErrorKind::NotSupported,
+                    fmt::format("PID {:02X} ({}) is not decoded: {}", pid, entry.signal.name, standingNote(entry)));
+    }
+    bool found = false;
+    for (unsigned int const module : wish.module ? std::vector<unsigned int>{*wish.module} : meant) {
+        std::shared_ptr<obd::IEcu> const ecu = m_session.proxy()->ecu(module);
+        if (ecu != nullptr && ecu->isSupported(obd::ObdMode::CurrentData, pid, 0)) {
+            addOnce({index, module, wish.hertz, true});
+            found = true;
+        }
+    }
+    if (!found) {
+        throw Error(ErrorKind::NotSupported,
+                    fmt::format("The vehicle does not offer PID {:02X} ({})", pid, entry.signal.name),
+                    {"`velmora sensors` lists what it offers"});
+    }
+}
+
+unsigned int SignalChoice::moduleOf(ChosenSignal const& signal) const
+{
+    if (signal.module) {
+        return *signal.module;
+    }
+    Signal const& own = set()[signal.index].signal;
+    if (own.request.empty() || isBroadcast(own)) {
+        return 0;
+    }
+    AddressOrReason const reached = addressOf(own, m_session.proxy()->protocol());
+    return reached.address ? parseHex(reached.address->reply, 0x1FFFFFFF).value_or(0) : 0;
+}
+
+std::optional<double> SignalChoice::rateOf(ChosenSignal const& signal, bool alone) const
+{
+    Signal const& own = set()[signal.index].signal;
+    bool const foreign = !own.request.empty() && !isBroadcast(own);
+    return signal.hertz || alone || !foreign ? signal.hertz : std::optional(usualRate);
+}
+
+std::vector<SignalRow> SignalChoice::rows() const
+{
+    std::vector<SignalRow> rows;
+    for (ChosenSignal const& each : m_chosen) {
+        Signal const& signal = set()[each.index].signal;
+        if (each.told) {
+            rows.push_back({moduleOf(each), signalId(each.index), signal.id, hexText(signal.request), signal.name,
+                            signal.unit, !signal.text && signal.values.empty(), each.hertz});
+        }
+    }
+    return rows;
+}
+
+std::vector<PollSource> SignalChoice::sources(bool alone)
+{
+    struct Group
+    {
+        std::shared_ptr<SignalGroup> guest;
+        std::optional<double> hertz;
+        std::vector<std::vector<unsigned char>> requests;
+    };
+    std::vector<Group> groups;
+    std::map<std::string, std::size_t> open; // by key: the group that takes more
+    m_board = std::make_shared<SignalBoard>(m_session.signals());
+    auto const asker = std::make_shared<ModuleAsker>(*m_session.proxy(), m_session.channel());
+    std::vector<ChosenSignal> workedOut;
+    for (ChosenSignal const& each : m_chosen) {
+        Signal const& signal = set()[each.index].signal;
+        if (signal.request.empty()) {
+            workedOut.push_back(each);
+            continue;
+        }
+        std::optional<RequestAddress> const address =
+            isBroadcast(signal) ? std::nullopt : addressOf(signal, m_session.proxy()->protocol()).address;
+        std::optional<double> const hertz = rateOf(each, alone);
+        std::string const key = groupKey(address, hertz);
+        auto found = open.find(key);
+        bool const full =
+            found != open.end() && groups[found->second].requests.size() >= mostRequests &&
+            std::ranges::find(groups[found->second].requests, signal.request) == groups[found->second].requests.end();
+        if (found == open.end() || full) {
+            groups.push_back({std::make_shared<SignalGroup>(m_board, asker, address), hertz, {}});
+            found = open.insert_or_assign(key, groups.size() - 1).first;
+        }
+        Group& group = groups[found->second];
+        if (std::ranges::find(group.requests, signal.request) == group.requests.end()) {
+            group.requests.push_back(signal.request);
+        }
+        group.guest->add(each, moduleOf(each));
+    }
+    if (groups.empty() && !workedOut.empty()) {
+        groups.push_back({std::make_shared<SignalGroup>(m_board, asker, std::nullopt), usualRate, {}});
+    }
+    for (ChosenSignal const& each : workedOut) {
+        groups.back().guest->addWorkedOut(each);
+    }
+    std::vector<PollSource> sources;
+    for (Group const& group : groups) {
+        sources.push_back({nullptr, nullptr, group.hertz, group.guest});
+    }
+    return sources;
+}
+
+} // namespace velmora

@@ -1,0 +1,158 @@
+#include "libvelmora/signal/signalfile.h"
+#include "libvelmora/uds/identifierprobe.h"
+#include "libvelmora/uds/modulestore.h"
+#include "tests/support/modulebench.h"
+#include "tests/support/temporaryfolder.h"
+
+#include <velmora/error.h>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+namespace velmora {
+
+namespace {
+
+using testing::ElementsAre;
+using testing::HasSubstr;
+using testing::Pair;
+
+// A module that knows some identifiers, and a vehicle that stands.
+class IdentifierProbeTest : public testing::Test
+{
+protected:
+    IdentifierProbeTest()
+    {
+        m_state.task = {"7E0", "7E8", {}, 0x22, 0xF186, 0xF191};
+        m_state.vin = "VELMRAS1M60000022";
+        m_bench.answer("01 0D", "41 0D 00");
+        m_bench.module("7E0", "22F186", {"7E80462F18601"});
+        m_bench.module("7E0", "22F187", {"7E8037F2233"}).module("7E0", "22F188", {"7E8037F227F"});
+        m_bench.module("7E0", "22F189", {"7E8037F2222"}).module("7E0", "22F18A", {"7E8037F2231"});
+        m_bench.module("7E0", "22F190", {"7E80662F190112233"}).module("7E0", "22F190", {"7E80662F190112244"});
+    }
+
+    void run()
+    {
+        IdentifierProbe probe(
+            m_asker,
+            [this] {
+                if (m_checksLeft-- == 0) {
+                    throw Error(ErrorKind::Interrupted, "Interrupted");
+                }
+            },
+            [this](ProbeState const& state) { m_saved = state; }, [](ProbeState const& /*state*/) {});
+        probe.run(m_state);
+    }
+    std::string failure()
+    {
+        try {
+            run();
+        } catch (Error const& error) {
+            return error.what();
+        }
+        return "none";
+    }
+
+    support::FakeClock m_clock;
+    support::ModuleBench m_bench{&m_clock};
+    ModuleAsker m_asker{m_bench, m_bench};
+    ProbeState m_state;
+    std::optional<ProbeState> m_saved;
+    int m_checksLeft = 1000;
+};
+
+TEST_F(IdentifierProbeTest, ListsWhatAnswersWhatIsLockedAndWhatChanges)
+{
+    unsigned int const start = m_clock.millis();
+    run();
+    EXPECT_GE(m_clock.millis() - start, 13U * 200) << "five a second: twelve identifiers, and two once more";
+    EXPECT_TRUE(m_state.done);
+    EXPECT_EQ(m_state.told.size(), 2U);
+    EXPECT_THAT(m_state.locked, ElementsAre(Pair(0xF187U, 0x33), Pair(0xF188U, 0x7F)));
+    EXPECT_THAT(m_state.later, ElementsAre(Pair(0xF189U, 0x22)));
+    EXPECT_NE(m_state.told.at(0xF190), m_state.second.at(0xF190)) << "it changes";
+    EXPECT_EQ(m_state.told.at(0xF186), m_state.second.at(0xF186));
+    SignalFile const file = toSignalFile(m_state);
+    EXPECT_EQ(file.vin, "VELMRAS1*");
+    SignalFileReading const again = readSignals(toToml(file), "again.toml");
+    EXPECT_TRUE(again.mistakes.empty()) << (again.mistakes.empty() ? "" : again.mistakes.front().what);
+    ASSERT_EQ(again.file.signals.size(), 2U);
+    EXPECT_EQ(again.file.signals[1].id, "M7E0_22_F190");
+}
+
+TEST_F(IdentifierProbeTest, GoesOnWhereItWasInterruptedOnTheSameVehicleOnly)
+{
+    testsupport::TemporaryFolder folder;
+    ProbeStore const store(folder.path() / "probe.json");
+    m_checksLeft = 4;
+    EXPECT_EQ(failure(), "Interrupted");
+    ASSERT_TRUE(m_saved);
+    EXPECT_EQ(m_saved->next, 0xF18AU);
+    store.save(*m_saved);
+    std::optional<ProbeState> const kept = store.load();
+    ASSERT_TRUE(kept);
+    EXPECT_EQ(kept->task, m_state.task);
+    EXPECT_EQ(kept->vin, m_state.vin);
+    EXPECT_EQ(kept->told, m_saved->told);
+    EXPECT_EQ(kept->locked, m_saved->locked);
+    m_state = *kept;
+    m_checksLeft = 1000;
+    m_bench.takeAsked();
+    run();
+    EXPECT_EQ(m_bench.takeAsked().front(), "7E0 22F18A") << "nothing is asked twice";
+    EXPECT_EQ(m_state.told.size(), 2U);
+    std::ofstream(folder.path() / "probe.json") << "{\"next\": \"x\"";
+    EXPECT_FALSE(store.load()) << "a broken file is as none";
+    store.drop();
+    EXPECT_FALSE(std::filesystem::exists(folder.path() / "probe.json"));
+}
+
+TEST_F(IdentifierProbeTest, StopsOnTrouble)
+{
+    m_bench.answer("01 0D", "41 0D 05");
+    EXPECT_THAT(failure(), HasSubstr("moves (5 km/h)"));
+    m_bench.answer("01 0D", "7F 01 12");
+    EXPECT_THAT(failure(), HasSubstr("no longer answers")) << "it does not answer 0100 either";
+    m_bench.answer("01 00", "41 00 00 00 00 00");
+    m_bench.module("7E2", "22F186", {"7EA037F2211"});
+    m_state.task.header = "7E2";
+    m_state.task.reply = "7EA";
+    m_state.next = 0;
+    EXPECT_THAT(failure(), HasSubstr("does not know service 22"));
+    m_state.task.header = "7E3";
+    m_state.task.reply = "7EB";
+    EXPECT_THAT(failure(), HasSubstr("does not answer"));
+    m_bench.module("7E4", "22F186", {"CAN ERROR"}).module("7E4", "22F187", {"CAN ERROR"});
+    m_bench.module("7E4", "22F188", {"BUS ERROR"});
+    m_state.task.header = "7E4";
+    m_state.task.reply = "7EC";
+    m_state.next = 0;
+    EXPECT_THAT(failure(), HasSubstr("trouble on the bus"));
+    m_state.task.service = 0x2E;
+    EXPECT_THAT(failure(), HasSubstr("writes into a module"));
+    m_state.task.service = 0x21;
+    EXPECT_THAT(failure(), HasSubstr("no range of identifiers"));
+}
+
+TEST(ModuleStore, RemembersByVin)
+{
+    testsupport::TemporaryFolder folder;
+    ModuleStore const store(folder.path() / "modules.json");
+    EXPECT_FALSE(store.find("A"));
+    store.keep("A", {{"743", "763", "BODY", "28400", "0023", 2U}});
+    store.keep("B", {});
+    auto const modules = store.find("A");
+    ASSERT_TRUE(modules);
+    ASSERT_EQ(modules->size(), 1U);
+    EXPECT_EQ(modules->front().reply, "763");
+    EXPECT_EQ(modules->front().codes, 2U);
+    EXPECT_TRUE(store.find("B")->empty());
+    EXPECT_FALSE(store.find("")) << "no vehicle without a VIN is remembered";
+    std::ofstream(folder.path() / "modules.json") << "[1, 2";
+    EXPECT_FALSE(store.find("A"));
+}
+
+} // namespace
+
+} // namespace velmora
