@@ -1,5 +1,6 @@
 #include "libvelmora/read/codereader.h"
 #include "libvelmora/read/makerreader.h"
+#include "program/command/codesuds.h"
 #include "program/command/commands.h"
 #include "program/command/commandsession.h"
 #include "program/command/makeoption.h"
@@ -17,6 +18,7 @@ struct CodesOptions
     bool confirmed = false;
     bool pending = false;
     bool permanent = false;
+    bool uds = false;
     std::string maker;
 };
 
@@ -67,6 +69,9 @@ void giveMeanings(Session& session, std::vector<ModuleCodes>& modules, std::stri
 
 ExitCode codes(CodesOptions const& chosen, GlobalOptions const& options)
 {
+    if (chosen.uds) {
+        return udsCodes(chosen.maker, options);
+    }
     CommandSession session(options);
     session.connect();
     CodeReader reader(session);
@@ -89,6 +94,13 @@ void addCodesCommand(CommandLine& commandLine)
     command->add_flag("--confirmed", chosen->confirmed, "The stored codes");
     command->add_flag("--pending", chosen->pending, "Codes of this or the last driving cycle");
     command->add_flag("--permanent", chosen->permanent, "Codes that only the vehicle itself erases");
+    command
+        ->add_flag("--uds", chosen->uds,
+                   "By service 19 of ISO 14229, with failure types and states; also of the\n"
+                   "modules that `modules` has found. CAN only")
+        ->excludes("--confirmed")
+        ->excludes("--pending")
+        ->excludes("--permanent");
     addMakeOption(*command, chosen->maker);
 }
 

@@ -33,6 +33,7 @@ void addCommands(CommandLine& commandLine)
     addTripsCommand(commandLine);
     addSettingsCommand(commandLine);
     addSignalsCommand(commandLine);
+    addModulesCommand(commandLine);
     addSimulateCommand(commandLine);
     addPortsCommand(commandLine);
 }

@@ -23,6 +23,7 @@ void addHistoryCommand(CommandLine& commandLine);
 void addInfoCommand(CommandLine& commandLine);
 void addLiveCommand(CommandLine& commandLine);
 void addLogCommand(CommandLine& commandLine);
+void addModulesCommand(CommandLine& commandLine);
 void addMonitorsCommand(CommandLine& commandLine);
 void addOxygenCommand(CommandLine& commandLine);
 void addPortsCommand(CommandLine& commandLine);

@@ -2,6 +2,7 @@
 #include "libvelmora/read/topicanswer.h"
 #include "libvelmora/report/json.h"
 #include "libvelmora/report/unitlabel.h"
+#include "libvelmora/signal/builtinpids.h"
 #include "libvelmora/text/text.h"
 #include "libvelmora/vehicle/pidtitles.h"
 #include "program/command/commands.h"
@@ -16,6 +17,7 @@
 #include <fmt/format.h>
 
 #include <algorithm>
+#include <iterator>
 
 namespace velmora::cli {
 
@@ -120,6 +122,31 @@ std::vector<unsigned char> undecoded(obd::IEcu const& ecu)
     return pids;
 }
 
+// The values of a PID that the library does not decode, as far as their layout is known, and how well it is.
+std::vector<BuiltinPid> laterValues(unsigned char pid)
+{
+    std::vector<BuiltinPid> values;
+    std::ranges::copy_if(builtinPids(), std::back_inserter(values),
+                         [pid](BuiltinPid const& each) { return each.pid == pid && isDecoded(each); });
+    return values;
+}
+
+std::string laterText(unsigned char pid)
+{
+    std::vector<BuiltinPid> const values = laterValues(pid);
+    if (values.empty()) {
+        return fmt::format("  {:02X}  {} (not decoded)\n", pid, pidTitle(pid));
+    }
+    std::string text;
+    std::string lead = fmt::format("{:02X}", pid);
+    for (BuiltinPid const& each : values) {
+        text += fmt::format("  {:<2}  {:<58}  {:<8}  {} ({})\n", lead, each.signal.name, each.signal.unit,
+                            each.signal.id, standingWord(each.standing));
+        lead.clear();
+    }
+    return text;
+}
+
 std::string offerText(obd::IEcu const& ecu, bool all)
 {
     std::string text =
@@ -134,7 +161,7 @@ std::string offerText(obd::IEcu const& ecu, bool all)
         text += offerText(offer, all);
     }
     for (unsigned char const pid : undecoded(ecu)) {
-        text += fmt::format("  {:02X}  {} (not decoded)\n", pid, pidTitle(pid));
+        text += laterText(pid);
     }
     return text + "\n";
 }
@@ -168,7 +195,14 @@ Json toJson(obd::IEcu const& ecu, bool all)
     }
     Json rest = Json::array();
     for (unsigned char const pid : undecoded(ecu)) {
-        rest.push_back({{"id", fmt::format("{:02X}", pid)}, {"name", pidTitle(pid)}});
+        Json values = Json::array();
+        for (BuiltinPid const& each : laterValues(pid)) {
+            values.push_back({{"sensor", each.signal.id},
+                              {"name", each.signal.name},
+                              {"unit", textOrNull(each.signal.unit)},
+                              {"standing", standingWord(each.standing)}});
+        }
+        rest.push_back({{"id", fmt::format("{:02X}", pid)}, {"name", pidTitle(pid)}, {"values", values}});
     }
     return {{"id", fmt::format("{:X}", ecu.id())},
             {"name", textOrNull(ecu.name())},

@@ -3,6 +3,7 @@
 #include "libvelmora/signal/signalhex.h"
 #include "libvelmora/signal/signalimport.h"
 #include "program/command/commands.h"
+#include "program/command/signalsprobe.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
 #include "program/view/layout.h"
@@ -25,6 +26,8 @@ struct SignalOptions
     CLI::App* list = nullptr;
     std::string source;
     std::vector<std::string> files;
+    CLI::App* probe = nullptr;
+    ProbeOptions probing;
 };
 
 void tellAll(std::vector<SignalMistake> const& mistakes, std::string const& path)
@@ -102,6 +105,9 @@ ExitCode runSignals(SignalOptions const& options, GlobalOptions const& global)
     if (options.import->parsed()) {
         return importFile(options, global.json);
     }
+    if (options.probe->parsed()) {
+        return probe(options.probing, global);
+    }
     return options.check->parsed() ? checkFiles(options) : listFiles(options, global);
 }
 
@@ -121,6 +127,7 @@ void addSignalsCommand(CommandLine& commandLine)
     options->check->add_option("FILE", options->files, "Signal files")->required();
     options->list = command->add_subcommand("list", "List the signals of signal files");
     options->list->add_option("FILE", options->files, "Signal files")->required();
+    options->probe = addProbe(*command, options->probing);
 }
 
 } // namespace velmora::cli
