@@ -112,8 +112,8 @@ void LiveRun::start(std::vector<PollChoice> const& choices)
 
 void LiveRun::feed()
 {
-    m_feed = std::make_unique<LiveFeed>(m_session.obd(), m_session.loop(), m_choices, m_options.will, m_session.channel(),
-                                        m_signals.sources(m_choices.empty()));
+    m_feed = std::make_unique<LiveFeed>(m_session.obd(), m_session.loop(), m_choices, m_options.will,
+                                        m_session.channel(), m_signals.sources(m_choices.empty()));
 }
 
 std::string LiveRun::signalTroubles() const
