@@ -10,7 +10,7 @@ namespace velmora {
 
 namespace {
 
-using Request = std::vector<unsigned char>;
+using RequestBytes = std::vector<unsigned char>;
 
 struct SignalService
 {
@@ -97,7 +97,7 @@ std::string whyNot(unsigned char service)
                                         : "is none of those that only read (01, 02, 05, 06, 09, 1A, 21, 22)");
 }
 
-std::optional<std::string> refusalForSignal(Request const& request)
+std::optional<std::string> refusalForSignal(RequestBytes const& request)
 {
     auto const* const row = std::ranges::find(signalServices, request.front(), &SignalService::service);
     if (row == std::end(signalServices)) {
@@ -112,7 +112,7 @@ std::optional<std::string> refusalForSignal(Request const& request)
     return std::nullopt;
 }
 
-std::optional<std::string> refusalForCodes(Request const& request)
+std::optional<std::string> refusalForCodes(RequestBytes const& request)
 {
     if (!contains(codeServices, request.front())) {
         return whyNot(request.front());
@@ -125,7 +125,7 @@ std::optional<std::string> refusalForCodes(Request const& request)
 
 } // namespace
 
-std::optional<std::string> refusalFor(Request const& request, RequestPurpose purpose)
+std::optional<std::string> refusalFor(RequestBytes const& request, RequestPurpose purpose)
 {
     if (request.empty()) {
         return "the request is empty";

@@ -17,7 +17,7 @@ bool isText(unsigned char byte)
 }
 
 // Filling at the ends belongs to no text.
-std::vector<unsigned char> trimmed(std::vector<unsigned char> data)
+std::vector<unsigned char> withoutFilling(std::vector<unsigned char> data)
 {
     auto const isFilling = [](unsigned char byte) { return byte == 0x00 || byte == 0xFF || byte == ' '; };
     while (!data.empty() && isFilling(data.back())) {
@@ -29,7 +29,7 @@ std::vector<unsigned char> trimmed(std::vector<unsigned char> data)
 
 std::optional<std::string> plainText(std::vector<unsigned char> const& data)
 {
-    std::vector<unsigned char> const text = trimmed(data);
+    std::vector<unsigned char> const text = withoutFilling(data);
     return std::all_of(text.begin(), text.end(), isText) ? std::optional(std::string(text.begin(), text.end()))
                                                          : std::nullopt;
 }

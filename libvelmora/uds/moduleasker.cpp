@@ -11,8 +11,8 @@ namespace velmora {
 
 namespace {
 
-constexpr unsigned char refusalService = 0x7F;
-constexpr unsigned char responsePending = 0x78;
+constexpr unsigned char udsRefusal = 0x7F;
+constexpr unsigned char udsPending = 0x78;
 constexpr unsigned char positiveBit = 0x40;
 constexpr unsigned int exchangeLimitMs = 6000;
 constexpr unsigned int longestWaitMs = 1044; // ATST FF
@@ -42,7 +42,7 @@ bool isEchoed(std::vector<unsigned char> const& request, std::vector<unsigned ch
 
 bool asksForTime(ModuleAnswer const& answer)
 {
-    return answer.kind == ModuleAnswer::Kind::Refused && answer.code == responsePending;
+    return answer.kind == ModuleAnswer::Kind::Refused && answer.code == udsPending;
 }
 
 } // namespace
@@ -78,8 +78,7 @@ ModuleAnswer judgeReply(std::vector<unsigned char> const& request, ReplyContent 
         if (isEchoed(request, each.payload)) {
             return {ModuleAnswer::Kind::Positive, each.id, each.payload, 0, {}};
         }
-        bool const refusal =
-            each.payload.size() > 2 && each.payload[0] == refusalService && each.payload[1] == request[0];
+        bool const refusal = each.payload.size() > 2 && each.payload[0] == udsRefusal && each.payload[1] == request[0];
         // Behind a "response pending" may come another refusal, which is the answer.
         if (refusal && (answer.kind != ModuleAnswer::Kind::Refused || asksForTime(answer))) {
             answer = {ModuleAnswer::Kind::Refused, each.id, {}, each.payload[2], {}};

@@ -17,7 +17,7 @@ std::string textIn(nlohmann::json const& object, char const* key)
     return found != object.end() && found->is_string() ? found->get<std::string>() : std::string();
 }
 
-nlohmann::ordered_json orNull(std::string const& text)
+nlohmann::ordered_json toldOrNull(std::string const& text)
 {
     return text.empty() ? nlohmann::ordered_json(nullptr) : nlohmann::ordered_json(text);
 }
@@ -29,9 +29,9 @@ nlohmann::ordered_json toJsonValue(FoundModule const& module)
     nlohmann::ordered_json json = {
         {"request", module.request},
         {"reply", module.reply},
-        {"name", orNull(module.name)},
-        {"part", orNull(module.part)},
-        {"software", orNull(module.software)},
+        {"name", toldOrNull(module.name)},
+        {"part", toldOrNull(module.part)},
+        {"software", toldOrNull(module.software)},
         {"codes", module.codes ? nlohmann::ordered_json(*module.codes) : nlohmann::ordered_json(nullptr)}};
     for (auto const& [did, text] : module.identifiers) {
         json["identifiers"][fmt::format("{:04X}", did)] = text;

@@ -36,7 +36,7 @@ Document dataList(std::map<unsigned int, std::vector<unsigned char>> const& data
     return list;
 }
 
-Document codeList(std::map<unsigned int, unsigned char> const& codes)
+Document refusalList(std::map<unsigned int, unsigned char> const& codes)
 {
     Document list = Document::object();
     for (auto const& [id, code] : codes) {
@@ -63,7 +63,7 @@ std::map<unsigned int, std::vector<unsigned char>> readList(nlohmann::json const
     return list;
 }
 
-std::map<unsigned int, unsigned char> readCodes(nlohmann::json const& document, char const* key)
+std::map<unsigned int, unsigned char> readRefusals(nlohmann::json const& document, char const* key)
 {
     std::map<unsigned int, unsigned char> codes;
     for (auto const& [id, bytes] : readList(document, key)) {
@@ -86,8 +86,8 @@ Document documentOf(ProbeState const& state)
             {"vin", state.vin},
             {"next", state.next},
             {"told", dataList(state.told)},
-            {"locked", codeList(state.locked)},
-            {"later", codeList(state.later)},
+            {"locked", refusalList(state.locked)},
+            {"later", refusalList(state.later)},
             {"second", dataList(state.second)}};
 }
 
@@ -112,8 +112,8 @@ std::optional<ProbeState> ProbeStore::load() const
     state.vin = memberOr<std::string>(document, "vin", "");
     state.next = memberOr<unsigned int>(document, "next", 0);
     state.told = readList(document, "told");
-    state.locked = readCodes(document, "locked");
-    state.later = readCodes(document, "later");
+    state.locked = readRefusals(document, "locked");
+    state.later = readRefusals(document, "later");
     state.second = readList(document, "second");
     return state;
 }

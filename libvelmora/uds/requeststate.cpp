@@ -9,7 +9,7 @@ namespace {
 constexpr std::chrono::seconds conditionsPause{30};
 constexpr std::chrono::milliseconds busyPause{200};
 constexpr int mostBusy = 3;
-constexpr int mostFailures = 3;
+constexpr int mostRefusals = 3;
 constexpr int mostSilent = 3;
 
 } // namespace
@@ -76,7 +76,7 @@ void RequestState::takeRefusal(unsigned char code, Time now)
 
 void RequestState::countFailure()
 {
-    if (++m_failures >= mostFailures) {
+    if (++m_failures >= mostRefusals) {
         end();
     }
 }

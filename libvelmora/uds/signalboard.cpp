@@ -17,7 +17,7 @@ namespace {
 constexpr std::chrono::seconds oldestValue{10};
 constexpr int deepestReference = 16;
 
-std::string numberText(double number, int precision)
+std::string fixedText(double number, int precision)
 {
     std::string const text = fmt::format("{:.{}f}", number, std::clamp(precision, 0, 9));
     bool const zero = text.find_first_not_of("-0.") == std::string::npos;
@@ -111,7 +111,7 @@ PollResult SignalBoard::result(ChosenSignal const& signal, unsigned int module, 
         each.maximum = each.count == 0 ? *number : std::max(each.maximum, *number);
         each.sum += *number;
         ++each.count;
-        auto const text = [&](double value) { return numberText(value, reading.precision); };
+        auto const text = [&](double value) { return fixedText(value, reading.precision); };
         double const mean = each.sum / each.count;
         auto values = std::make_shared<obd::SensorValueDataModel>(uid, text(*number), text(each.minimum),
                                                                   text(each.maximum), text(mean));

@@ -89,7 +89,7 @@ std::vector<Cell> row(UdsCodeReport const& report, UdsCode const& code, MakerCho
         {fmt::format("{}-{:02X}{}", code.code(), code.failureType(), hex)}, {states.empty() ? "-" : states}, {text}};
 }
 
-std::string moduleText(AskedModule const& module, MakerChoice const& maker, GlobalOptions const& options)
+std::string udsModuleText(AskedModule const& module, MakerChoice const& maker, GlobalOptions const& options)
 {
     std::string text =
         fmt::format("Control module {}{}\n", module.reply, module.name.empty() ? "" : ": " + module.name);
@@ -164,7 +164,7 @@ ExitCode udsCodes(std::string const& named, GlobalOptions const& options)
         if (options.json) {
             document.push_back(moduleJson(module, maker));
         } else {
-            fmt::print("{}", moduleText(module, maker, options));
+            fmt::print("{}", udsModuleText(module, maker, options));
         }
     }
     if (options.json) {

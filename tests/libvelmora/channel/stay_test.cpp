@@ -17,7 +17,7 @@ using test::ChannelRig;
 using testing::ElementsAre;
 
 RequestAddress const body{.header = "7B3", .reply = "7BB", .flowHeader = "7B3", .flowData = "300000", .stays = true};
-RequestAddress const gearbox{.header = "7E1", .reply = "7E9", .stays = true};
+RequestAddress const gearboxModule{.header = "7E1", .reply = "7E9", .stays = true};
 RequestAddress const slow{
     .header = "6F1", .reply = "607", .extended = "07", .tester = "F1", .waitMs = 600, .adaptive = false, .stays = true};
 std::string const bodyReply = "7BB04622801AA";
@@ -49,12 +49,12 @@ TEST(StayingAddress, SendsOnlyWhatDiffersFromTheModuleBefore)
         rig.ask(request);
         return rig.wire->takeCommands();
     };
-    EXPECT_THAT(ask(gearbox, "221E1C"), ElementsAre("ATSH7E1", "ATCRA7E9", "221E1C"));
+    EXPECT_THAT(ask(gearboxModule, "221E1C"), ElementsAre("ATSH7E1", "ATCRA7E9", "221E1C"));
     EXPECT_THAT(ask(slow, "22DDBC"),
                 ElementsAre("ATSH6F1", "ATCEA07", "ATTAF1", "ATCRA607", "ATST93", "ATAT0", "22DDBC"));
     EXPECT_THAT(ask(body, "222801"), ElementsAre("ATCEA", "ATAT1", "ATST64", "ATSH7B3", "ATCRA7BB", "ATFCSH7B3",
                                                  "ATFCSD300000", "ATFCSM1", "222801"));
-    EXPECT_THAT(ask(gearbox, "221E1C"), ElementsAre("ATFCSM0", "ATSH7E1", "ATCRA7E9", "221E1C"));
+    EXPECT_THAT(ask(gearboxModule, "221E1C"), ElementsAre("ATFCSM0", "ATSH7E1", "ATCRA7E9", "221E1C"));
     rig.ask("ATTP6");
     EXPECT_THAT(rig.wire->takeCommands(), ElementsAre("ATCRA", "ATSH7DF", "ATTP6"));
 }
@@ -64,7 +64,7 @@ TEST(StayingAddress, TellsWhatCameBeyondTheCore)
     ChannelRig rig;
     rig.connect();
     rig.wire->on("222801", bodyReply).on("222802", "CAN ERROR").on("222803", "NO DATA").on("ATFCSM1", "?");
-    AddressedModule const scope(rig.channel, gearbox);
+    AddressedModule const scope(rig.channel, gearboxModule);
     rig.ask("222801");
     EXPECT_THAT(rig.channel.takeReply().lines, ElementsAre(bodyReply));
     EXPECT_FALSE(rig.channel.takeReply().answered) << "it is told once";
@@ -145,7 +145,7 @@ TEST(StayingAddress, WhatIsMonitoredIsTold)
     rig.connect();
     rig.wire->on("ATMA", support::ScriptedWire::Reply{{"7302110\r7445566\r"}});
     rig.wire->on("ATI", "STOPPED").on("ATI", "ELM327 v1.5");
-    RequestAddress pattern = gearbox;
+    RequestAddress pattern = gearboxModule;
     pattern.reply = "7XX";
     AddressedModule const scope(rig.channel, pattern);
     EXPECT_EQ(rig.ask("ATMA", 300), std::nullopt);

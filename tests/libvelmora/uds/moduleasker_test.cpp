@@ -17,7 +17,7 @@ using support::ModuleBench;
 using testing::ElementsAre;
 using testing::IsEmpty;
 
-using Kind = ModuleAnswer::Kind;
+using AnswerKind = ModuleAnswer::Kind;
 
 RequestAddress moduleAt(std::string const& header, std::string const& reply = {}, std::optional<unsigned char> ext = {})
 {
@@ -99,21 +99,21 @@ TEST(ModuleAsker, CountsOnlyAnAnswerThatRepeatsServiceAndIdentifier)
     bench.module("7B3", "222803", {"7BB037F2231"});
     bench.module("7B3", "222804", {"CAN ERROR"});
     bench.module("7B3", "222805", {"7BB100A622805112233", "7BB2144556677000000"});
-    EXPECT_EQ(asker.ask(moduleAt("7B3", "7BB"), {0x22, 0x28, 0x01}).kind, Kind::Foreign);
+    EXPECT_EQ(asker.ask(moduleAt("7B3", "7BB"), {0x22, 0x28, 0x01}).kind, AnswerKind::Foreign);
     ModuleAnswer const right = asker.ask(moduleAt("7B3", "7BB"), {0x22, 0x28, 0x02});
-    EXPECT_EQ(right.kind, Kind::Positive);
+    EXPECT_EQ(right.kind, AnswerKind::Positive);
     EXPECT_EQ(right.module, 0x7BBU);
     EXPECT_THAT(right.payload, ElementsAre(0x62, 0x28, 0x02, 0x05));
     ModuleAnswer const refused = asker.ask(moduleAt("7B3", "7BB"), {0x22, 0x28, 0x03});
-    EXPECT_EQ(refused.kind, Kind::Refused);
+    EXPECT_EQ(refused.kind, AnswerKind::Refused);
     EXPECT_EQ(refused.code, 0x31);
     EXPECT_EQ(describe(refused), "is refused: Request Out of Range");
-    EXPECT_EQ(asker.ask(moduleAt("7B3", "7BB"), {0x22, 0x28, 0x04}).kind, Kind::BusTrouble);
+    EXPECT_EQ(asker.ask(moduleAt("7B3", "7BB"), {0x22, 0x28, 0x04}).kind, AnswerKind::BusTrouble);
     EXPECT_THAT(asker.ask(moduleAt("7B3", "7BB"), {0x22, 0x28, 0x05}).payload,
                 ElementsAre(0x62, 0x28, 0x05, 0x11, 0x22, 0x33, 0x44, 0x55, 0x66, 0x77));
-    EXPECT_EQ(asker.ask(moduleAt("7B3", "7BB"), {0x22, 0x28, 0x06}).kind, Kind::Silent);
+    EXPECT_EQ(asker.ask(moduleAt("7B3", "7BB"), {0x22, 0x28, 0x06}).kind, AnswerKind::Silent);
     bench.takeAsked();
-    EXPECT_EQ(asker.ask(moduleAt("7B3", "7BB"), {0x2E, 0x28, 0x01, 0x00}).kind, Kind::NotSent);
+    EXPECT_EQ(asker.ask(moduleAt("7B3", "7BB"), {0x2E, 0x28, 0x01, 0x00}).kind, AnswerKind::NotSent);
     EXPECT_THAT(bench.takeAsked(), IsEmpty()) << "nothing goes out";
     bench.refuseAddress("ATFCSM1");
     EXPECT_EQ(describe(asker.ask(moduleAt("7B3", "7BB"), {0x22, 0x28, 0x02})),
@@ -125,7 +125,7 @@ TEST(ModuleAsker, WaitsLongestForAModuleThatAskedForTime)
     ModuleBench bench;
     ModuleAsker asker(bench, bench);
     bench.module("7E4", "220106", {"7EC037F2278"}).module("7E4", "220106", {"7EC05620106038F"});
-    EXPECT_EQ(asker.ask(moduleAt("7E4"), {0x22, 0x01, 0x06}).kind, Kind::Positive);
+    EXPECT_EQ(asker.ask(moduleAt("7E4"), {0x22, 0x01, 0x06}).kind, AnswerKind::Positive);
     ASSERT_EQ(bench.addresses().size(), 2U);
     EXPECT_TRUE(bench.addresses()[0].adaptive);
     EXPECT_FALSE(bench.addresses()[1].adaptive) << "ATAT0";
@@ -148,7 +148,7 @@ TEST(ModuleAsker, TriesAModulesOwnAddressByteWhereTheTestersIsSilent)
     RequestAddress const tires = moduleAt("750", "758", 0x2A);
     EXPECT_EQ(tires.flowData, "2A300000");
     EXPECT_FALSE(tires.adaptive);
-    EXPECT_EQ(asker.ask(tires, {0x21, 0x30}).kind, Kind::Positive);
+    EXPECT_EQ(asker.ask(tires, {0x21, 0x30}).kind, AnswerKind::Positive);
     EXPECT_EQ(bench.addresses()[0].tester, "F1");
     EXPECT_EQ(bench.addresses()[1].tester, "2A");
     asker.ask(tires, {0x21, 0x30});
@@ -173,10 +173,10 @@ TEST(ModuleAddress, FollowsFromTheIdentifiers)
     EXPECT_EQ(standardRequest(0x763), std::nullopt);
 }
 
-ModuleAnswer refusal(unsigned char code)
+ModuleAnswer refusedBy(unsigned char code)
 {
     ModuleAnswer answer;
-    answer.kind = Kind::Refused;
+    answer.kind = AnswerKind::Refused;
     answer.code = code;
     return answer;
 }
@@ -186,34 +186,34 @@ TEST(RequestState, DoesWithEachRefusalWhatItMeans)
     RequestState::Time const now{seconds(1000)};
     for (int code : {0x11, 0x12, 0x13, 0x31, 0x33, 0x3A, 0x50, 0x5D, 0x7E, 0x7F}) {
         RequestState state;
-        state.take(refusal(static_cast<unsigned char>(code)), now);
+        state.take(refusedBy(static_cast<unsigned char>(code)), now);
         EXPECT_TRUE(state.ended()) << code;
         EXPECT_FALSE(state.isDue(now + std::chrono::hours(1))) << code;
     }
     for (int code : {0x22, 0x24, 0x26, 0x81, 0x94, 0xF0, 0xFE, 0x78}) {
         RequestState state;
-        state.take(refusal(static_cast<unsigned char>(code)), now);
+        state.take(refusedBy(static_cast<unsigned char>(code)), now);
         EXPECT_FALSE(state.isDue(now + milliseconds(29999))) << code;
         EXPECT_TRUE(state.isDue(now + seconds(30))) << code;
     }
     for (int code : {0x10, 0x3B, 0x40, 0x70, 0x80, 0x95, 0xFF}) {
         RequestState state;
-        state.take(refusal(static_cast<unsigned char>(code)), now);
-        state.take(refusal(static_cast<unsigned char>(code)), now);
+        state.take(refusedBy(static_cast<unsigned char>(code)), now);
+        state.take(refusedBy(static_cast<unsigned char>(code)), now);
         EXPECT_TRUE(state.isDue(now)) << code;
-        state.take(refusal(static_cast<unsigned char>(code)), now);
+        state.take(refusedBy(static_cast<unsigned char>(code)), now);
         EXPECT_TRUE(state.ended()) << code;
     }
     RequestState busy;
     for (int i = 0; i < 3; ++i) {
-        busy.take(refusal(0x21), now);
+        busy.take(refusedBy(0x21), now);
         EXPECT_FALSE(busy.isDue(now + milliseconds(199)));
         EXPECT_TRUE(busy.isDue(now + milliseconds(200)));
     }
-    busy.take(refusal(0x21), now);
+    busy.take(refusedBy(0x21), now);
     EXPECT_FALSE(busy.isDue(now + seconds(29)));
     RequestState split;
-    split.take(refusal(0x14), now);
+    split.take(refusedBy(0x14), now);
     EXPECT_TRUE(split.wantsSplit());
     RequestState silent;
     for (int i = 0; i < 3; ++i) {
@@ -222,7 +222,7 @@ TEST(RequestState, DoesWithEachRefusalWhatItMeans)
     }
     EXPECT_FALSE(silent.isDue(now + seconds(29)));
     ModuleAnswer good;
-    good.kind = Kind::Positive;
+    good.kind = AnswerKind::Positive;
     silent.take(good, now);
     EXPECT_TRUE(silent.isDue(now)) << "an answer forgives all";
     EXPECT_EQ(silent.reason(), "");
