@@ -94,4 +94,7 @@ PYTHON
 link=$(grep -oE 'http://127[^ ]*' "$folder/screen" | head -n 1)
 read=$(zbarimg --nodbus -q --raw "$folder/code.pgm") || fail "the QR code can't be read"
 [[ $read == "$link" ]] || fail "the QR code says $read, the link is $link"
+
+tmux -L "$name" send-keys C-c
+until_seen 'ended with 0' "Ctrl-C ends the page"
 echo "all of the screen is as it should be"
