@@ -70,10 +70,13 @@ public:
             end();
             m_lastResort.arm(carPatience, [this] { giveUp(); });
         });
-        Interrupt::instance().setHangUpHandler([this] {
-            m_reload = true;
-            end();
-        });
+        // The page ends with its terminal; there is no file to read again.
+        if (!m_chosen.page || !m_chosen.config.empty()) {
+            Interrupt::instance().setHangUpHandler([this] {
+                m_reload = true;
+                end();
+            });
+        }
     }
     ~WatchCommand()
     {
