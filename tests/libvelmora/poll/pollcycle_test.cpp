@@ -29,6 +29,7 @@ struct FakeChannel : velmora::IChannelControl
     void addressModule(std::optional<unsigned int> id) override { module = id; }
     void address(std::optional<velmora::RequestAddress> const& /*address*/) override {}
     std::string refusedAddress() const override { return {}; }
+    velmora::AddressedReply takeReply() override { return {}; }
     void onConnected() override {}
     velmora::ChannelStatistics statistics() const override { return {}; }
 
