@@ -24,10 +24,13 @@ if(TARGET velmoraLibrary)
                 target_link_libraries(velmoraLibrary PRIVATE $<INSTALL_INTERFACE:${part}>)
             endif()
         endforeach()
-        # It has no package of its own; every Debian linker finds it by its name.
-        if(MOSQUITTO_LIBRARY IN_LIST parts)
-            target_link_libraries(velmoraLibrary PRIVATE $<INSTALL_INTERFACE:mosquitto>)
-        endif()
+        # These have no packages of their own; every Debian linker finds them by their names.
+        foreach(part mosquitto systemd)
+            string(TOUPPER ${part}_LIBRARY library)
+            if(${library} IN_LIST parts)
+                target_link_libraries(velmoraLibrary PRIVATE $<INSTALL_INTERFACE:${part}>)
+            endif()
+        endforeach()
     endif()
     install(TARGETS velmoraLibrary EXPORT velmoraCompanionTargets)
     install(
