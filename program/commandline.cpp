@@ -21,6 +21,7 @@
 #include <cstdio>
 #include <exception>
 #include <map>
+#include <sstream>
 #include <system_error>
 #include <unistd.h>
 #include <utility>
@@ -189,7 +190,9 @@ ExitCode CommandLine::run(int argc, char const* const* argv)
         m_app.parse(argc, argv);
     } catch (CLI::Success const& wanted) {
         m_action = [&](GlobalOptions const& /*options*/) {
-            m_app.exit(wanted);
+            std::ostringstream out;
+            m_app.exit(wanted, out, out);
+            writeOutput(out.str()); // longer than the stream's buffer, so that flushing would not see it fail
             return ExitCode::Done;
         };
         return runAction();
