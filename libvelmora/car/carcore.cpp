@@ -81,7 +81,7 @@ Session& CarCore::openSession() const
         throw Error(ErrorKind::LinkLost, "The link to the adapter is lost",
                     {"a watch tries to come back by itself; reconnect() tries at once"});
     }
-    m_session->check();
+    m_session->checkAdapter(); // one that fell silent may be back
     return *m_session;
 }
 

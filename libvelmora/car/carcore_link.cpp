@@ -67,7 +67,7 @@ bool CarCore::isLinkLost()
         return false;
     }
     m_lastReading = Clock::now();
-    return !m_session->proxy()->isConnected();
+    return m_session->adapterSilent() || !m_session->proxy()->isConnected();
 }
 
 void CarCore::comeBack()

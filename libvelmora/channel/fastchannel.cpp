@@ -147,7 +147,9 @@ void FastChannel::publish()
 {
     constexpr double stepMs = 4.096;
     m_working.habits = m_habits;
-    m_working.adapterSilent = m_silent;
+    m_working.adapterSilent = isSilent();
+    m_working.unanswered = m_pending.has_value();
+    m_working.trouble = m_trouble;
     m_working.countingWorks = m_learner.works();
     m_working.countingOff = m_learner.isOff();
     m_working.slowestReplyMs = static_cast<unsigned int>(m_slowest.count());

@@ -70,8 +70,10 @@ public:
 
     // Ends whatever waits, soon. Any thread.
     void invalidate() { m_wire->giveUp(); }
-    // Whether the adapter reset itself so often that the link is taken for lost.
+    // Whether the adapter can't be kept at work, so that the link is taken for lost.
     bool adapterFails() const { return m_lost; }
+    // Whether that is because it reset itself again and again.
+    bool adapterResets() const { return m_resets; }
 
 private:
     struct Pending
@@ -126,6 +128,8 @@ private:
     void remedy();
     void settle();
     bool wake(std::string& before);
+    bool tryToWake(std::string& before);
+    bool isSilent() const;
     bool isIdentity(std::string const& reply) const;
     bool tellsLostSettings(HealedReply const& reply);
     bool setUpAgain(HealedReply const& reply);
@@ -169,6 +173,7 @@ private:
     std::shared_ptr<LearntStore> const m_store;
     std::atomic<char> m_delimiter{'>'};
     std::atomic<bool> m_lost{false};
+    std::atomic<bool> m_resets{false};
     std::atomic<bool> m_sleepAnswered{false};
     std::atomic<bool> m_connected{false};
     ReturnNotes const m_returns;
@@ -186,7 +191,9 @@ private:
     ChannelStatistics m_working;
     bool m_echoChecked = false;
     bool m_echoStuck = false;
-    bool m_silent = false;
+    bool m_silent = false;    // it did not answer when it was woken
+    WireTime m_silentFrom{0}; // where it is silent: the last it said, or was asked
+    std::string m_trouble;
     bool m_busSpoke = false; // a request has brought data
     bool m_begun = false;    // something was sent
     bool m_starting = false; // a reset was the last command

@@ -12,6 +12,17 @@ namespace {
 // No reply of a vehicle comes near it.
 constexpr std::size_t longestReply = 1U << 20U;
 
+// The adapter's word for it that a request brought nothing; empty for a vehicle that did not answer.
+std::string troubleOf(HealedReply const& reply)
+{
+    if (reply.data || reply.error == "NODATA") {
+        return {};
+    }
+    auto const word = std::ranges::find_if(
+        reply.lines, [](std::string const& line) { return classifyLine(line).kind == LineKind::Error; });
+    return word != reply.lines.end() ? *word : std::string();
+}
+
 bool isBlank(std::string_view text)
 {
     return compactText(text).empty();
@@ -214,6 +225,7 @@ void FastChannel::observe(HealedReply const& reply)
     m_state.observe(command, reply.text());
     if (command.isRequest()) {
         m_busSpoke = m_busSpoke || reply.data;
+        m_trouble = troubleOf(reply);
         m_memory.remember(command, reply);
         learnVehicle(reply);
         if (!m_staying) {

@@ -75,8 +75,7 @@ void FastChannel::remedy()
         return;
     }
     std::string before;
-    if (!wake(before)) {
-        m_silent = true;
+    if (!tryToWake(before)) {
         return;
     }
     std::size_t const end = before.find_last_of("\r\n");
@@ -111,7 +110,7 @@ void FastChannel::settle()
     } else if (isValid()) {
         note(Habit::LostPrompt);
         std::string before;
-        m_silent = !wake(before);
+        tryToWake(before);
         if (m_pending->addressed && m_pending->command.monitors()) {
             tellHeard(before);
         }
@@ -149,6 +148,24 @@ bool FastChannel::wake(std::string& before)
     return false;
 }
 
+// Notes whether it could be woken.
+bool FastChannel::tryToWake(std::string& before)
+{
+    bool const awake = wake(before);
+    if (!awake && !m_silent) {
+        m_silentFrom = m_pending->heardAt;
+        m_trouble.clear();
+    }
+    m_silent = !awake;
+    return awake;
+}
+
+// Not yet for one that pauses: slow clones do, for a second or two.
+bool FastChannel::isSilent() const
+{
+    return m_silent && m_wire->now() - m_silentFrom >= latePromptLimit;
+}
+
 bool FastChannel::isIdentity(std::string const& reply) const
 {
     std::string const text = compactText(reply);
@@ -175,6 +192,7 @@ bool FastChannel::setUpAgain(HealedReply const& reply)
     WireTime const now = m_wire->now();
     note(Habit::SettingsLost);
     if (m_resetAt && now - *m_resetAt < resetsTooClose) {
+        m_resets = true;
         m_lost = true;
         return false;
     }
@@ -182,6 +200,10 @@ bool FastChannel::setUpAgain(HealedReply const& reply)
     if (reply.error.find("LVRESET") != std::string::npos) {
         m_buffer.clear();
         m_wire->read(now + restartPause); // the supply may still be low; a banner in this time is dropped below
+    }
+    if (m_state.protocol() == 0 && !reply.error.empty()) {
+        // Behind LV RESET and ERR94 a search leaves CAN out until the adapter is told to forget them.
+        confirms("ATFE", settingLimit);
     }
     for (std::string const& command : m_state.setUp()) {
         confirms(command, settingLimit);

@@ -16,7 +16,10 @@ struct ChannelStatistics
     unsigned int exchanges = 0;         // commands and requests that were sent
     unsigned int counted = 0;           // of them with a count behind them
     unsigned int fromMemory = 0;        // requests that the channel answered while a connection was brought up
-    bool adapterSilent = false;         // it did not answer when it was woken last
+    bool adapterSilent = false;         // it has said nothing for seconds, though it was woken in between
+    bool unanswered = false;            // the last command or request has had no prompt so far
+    std::string trouble;                // the adapter's word for why the last request brought nothing: "CAN ERROR";
+                                        // empty if it brought something, or nothing came in time
     bool countingWorks = false;         // a counted reply was taken
     bool countingOff = false;           // the adapter made three mistakes by it, or refuses it
     std::optional<unsigned int> waitMs; // how long the adapter waits, where the channel has shortened it

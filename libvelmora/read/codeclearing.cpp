@@ -38,7 +38,7 @@ std::set<unsigned int> knownModules(obd::IEcuManager& modules)
 std::vector<ModuleTopic<ClearReport>> clearCodes(Session& session)
 {
     ServiceReplies const replies(*session.proxy(), clearService, clearLimitMs);
-    session.check();
+    session.checkAdapter();
     obd::IEcuManager& modules = *session.obd().getEcuManager();
     std::set<unsigned int> ids = knownModules(modules);
     for (unsigned int const id : replies.answering()) {

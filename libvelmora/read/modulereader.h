@@ -23,6 +23,7 @@ auto readModules(Session& session, Read const& read)
         modules.push_back({ecu->id(), readable(ecu->name()), read(session, *ecu)});
         session.check();
     }
+    session.checkAdapter();
     return modules;
 }
 

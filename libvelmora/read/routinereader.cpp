@@ -59,7 +59,7 @@ RoutineRun runRoutine(Session& session, obd::IEcu const& ecu, Routine const& rou
     session.select(ecu);
     auto const outcome =
         obd::RoutineServiceBuilder::createRoutineService()->askRoutine(static_cast<unsigned char>(routine.id));
-    session.check();
+    session.checkAdapter();
     return {routine, toResult(outcome), refusalText(outcome.code)};
 }
 

@@ -91,7 +91,7 @@ VehicleReport readVehicle(Session& session, std::string const& maker)
         session.tellProgress(fmt::format("Reading {:X} {} ...\n", ecu->id(), readable(ecu->name())));
         report.modules.push_back(readModule(session, *ecu, reader));
     }
-    session.check();
+    session.checkAdapter();
     giveMeanings(report, maker);
     return report;
 }

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "libvelmora/channel/fastchannel.h"
+#include "libvelmora/channel/plainchannel.h"
 #include "libvelmora/channel/portwire.h"
 #include "libvelmora/port/iport.h"
 
@@ -24,12 +25,18 @@ public:
 
     // What the library opens.
     std::shared_ptr<obd::IDataConnection> connection() const { return m_connection; }
+    // The bare bytes, for who talks to the adapter in place of the library.
+    std::shared_ptr<obd::IDataConnection> plainConnection() const { return std::make_shared<PlainChannel>(m_wire); }
     // What it is told beside the bytes, and what it tells.
     IChannelControl& control() const;
     // Ends all waiting on the link for good. Any thread.
     void cut();
     // Whether the port was lost, or the adapter can't be kept at work, rather than the link being cut here.
     bool lost() const;
+    // Whether it is the port that was lost.
+    bool portLost() const { return m_wire->lost(); }
+    // Whether the link is lost because the adapter reset itself again and again.
+    bool adapterResets() const { return m_channel->adapterResets(); }
 
 private:
     std::shared_ptr<PortWire> m_wire;

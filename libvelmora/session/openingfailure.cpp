@@ -35,4 +35,25 @@ Error headersMissing(std::string const& adapter, std::string const& port)
             {"this adapter does not do what ATH1 asks for; only another adapter helps"}};
 }
 
+Error silentVehicle(std::string const& adapter, std::string const& port, std::string const& trouble)
+{
+    std::vector<std::string> hints = {
+        "is the ignition on?", "is the adapter firmly in the car's OBD socket?",
+        "a car that is not found automatically may answer on a protocol you choose: --protocol 1 to 9"};
+    std::string what = "The adapter (" + adapter + ") on " + port + " works, but no control module answers";
+    if (!trouble.empty()) {
+        what += "; it reports " + trouble;
+        hints.insert(hints.begin() + 1, "does the wiring hold, and is nothing else plugged into the car's bus?");
+    }
+    return {ErrorKind::VehicleSilent, what, hints};
+}
+
+Error resettingAdapter(std::string const& port)
+{
+    return {ErrorKind::LinkLost,
+            "The adapter on " + port + " resets itself again and again",
+            {"is it firmly in its socket, and the car's battery well?",
+             "a cable or hub that gives too little current does the same; another adapter may do better"}};
+}
+
 } // namespace velmora::openingfailure

@@ -18,4 +18,10 @@ Error silentAdapter(std::string const& port, std::optional<PortAddress> const& a
 // Replies came, but without the headers that tell whose they are.
 Error headersMissing(std::string const& adapter, std::string const& port);
 
+// The adapter works, and no control module answers. trouble: the adapter's word for it; empty for none.
+Error silentVehicle(std::string const& adapter, std::string const& port, std::string const& trouble);
+
+// The adapter resets itself, again and again.
+Error resettingAdapter(std::string const& port);
+
 } // namespace velmora::openingfailure

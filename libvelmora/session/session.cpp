@@ -193,10 +193,11 @@ std::shared_ptr<obd::IDataConnection> Session::connectToPort()
     openLink();
     tellProgress(fmt::format("Connecting to {} ...\n", port()));
     enter(Phase::Open);
+    std::shared_ptr<obd::IDataConnection> const connection = m_link->plainConnection();
     if (m_trace != nullptr) {
-        m_link->connection()->addLogger(m_trace.get());
+        connection->addLogger(m_trace.get());
     }
-    return m_link->connection();
+    return connection;
 }
 
 std::string Session::failedTrace() const
@@ -246,6 +247,18 @@ void Session::tellConnected() const
     for (std::shared_ptr<obd::IEcu> const& ecu : m_obd->getEcuManager()->getEcus()) {
         m_options.onDetail(fmt::format("Control module {:X}: {} ({})\n", ecu->id(), readable(ecu->name()),
                                        readable(ecu->description())));
+    }
+}
+
+// Values went missing meanwhile, and the cause is one that grows worse.
+void Session::tellResets() const
+{
+    unsigned int const resets = channel().statistics().habits[static_cast<std::size_t>(Habit::SettingsLost)];
+    if (resets != 0) {
+        tellProgress(
+            fmt::format("The adapter reset itself {}x and was set up again; is it firmly in its socket, and the "
+                        "battery well?\n",
+                        resets));
     }
 }
 
@@ -327,6 +340,9 @@ void Session::failOpening()
     if (m_interrupted) {
         failInterrupted();
     }
+    if (m_link->adapterResets()) {
+        throw openingfailure::resettingAdapter(port);
+    }
     if (m_link->lost()) {
         throw Error(ErrorKind::LinkLost, "The link to the adapter on " + port + " broke while connecting",
                     {"is the adapter still plugged in and in reach?"});
@@ -335,13 +351,11 @@ void Session::failOpening()
     if (found == nullptr) {
         throw openingfailure::silentAdapter(port, m_address, m_opening);
     }
+    checkAdapter();
     if (m_opening.headersMissing()) {
         throw openingfailure::headersMissing(readable(found->device()), port);
     }
-    throw Error(ErrorKind::VehicleSilent,
-                "The adapter (" + readable(found->device()) + ") on " + port + " works, but no control module answers",
-                {"is the ignition on?", "is the adapter firmly in the car's OBD socket?",
-                 "a car that is not found automatically may answer on a protocol you choose: --protocol 1 to 9"});
+    throw openingfailure::silentVehicle(readable(found->device()), port, trouble());
 }
 
 void Session::selectEcu()
@@ -368,9 +382,37 @@ void Session::check() const
     if (m_interrupted) {
         failInterrupted();
     }
+    if (m_link != nullptr && m_link->adapterResets()) {
+        throw openingfailure::resettingAdapter(port());
+    }
+    // A channel that can't take an address back gives up, too; the cause is the silence.
+    if (adapterSilent() && !m_link->portLost()) {
+        throw Error(ErrorKind::AdapterSilent, "The adapter on " + port() + " no longer answers",
+                    {"is it still in its socket, and in reach?", "pull the adapter and plug it in again"});
+    }
     if (lost()) {
         throw Error(ErrorKind::LinkLost, "The link to the adapter broke", {"is it still plugged in and in reach?"});
     }
+}
+
+void Session::checkAdapter() const
+{
+    if (m_link != nullptr && channel().statistics().unanswered) {
+        std::shared_ptr<obd::IObdProxy> const bus = proxy();
+        std::shared_ptr<obd::IAdapter> const found = adapter();
+        float ignored = 0.0F;
+        if (bus != nullptr && bus->isConnected()) {
+            bus->batteryVoltage(); // a poller may be at work beside
+        } else if (found != nullptr) {
+            found->batteryVoltage(ignored);
+        }
+    }
+    check();
+}
+
+std::string Session::trouble() const
+{
+    return m_link != nullptr ? readable(channel().statistics().trouble) : std::string();
 }
 
 void Session::close()
@@ -383,6 +425,7 @@ void Session::close()
     m_obd->getConnectionManager()->closeConnection();
     m_link->cut();
     m_deadline.stop();
+    tellResets();
     if (m_options.onDetail) {
         tellHabits();
     }

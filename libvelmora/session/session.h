@@ -79,14 +79,21 @@ public:
     // The trace file's name if it could not be written to the end, else empty.
     std::string failedTrace() const;
 
-    // Throws Error if the link has broken or the session was interrupted meanwhile.
+    // Throws Error if the link has broken, the adapter has fallen silent or the session was interrupted meanwhile.
     void check() const;
+    // The same, and asks the adapter itself first where the last request brought nothing at all. That takes some
+    // seconds if it is silent.
+    void checkAdapter() const;
+    // The adapter's word for it that the last request brought nothing, such as "CAN ERROR"; empty for none.
+    std::string trouble() const;
 
     // Ends what the session is at, for good: the opening at once, else what is asked soon. Any thread.
     void interrupt();
     bool interrupted() const { return m_interrupted; }
     // Whether the link has broken.
     bool lost() const { return m_link != nullptr && m_link->lost(); }
+    // Whether the adapter has said nothing for seconds, though it was woken.
+    bool adapterSilent() const { return m_link != nullptr && channel().statistics().adapterSilent; }
 
 private:
     enum class Phase
@@ -106,6 +113,7 @@ private:
     [[noreturn]] void failOpening();
     void tellConnected() const;
     void tellHabits() const;
+    void tellResets() const;
     void selectEcu();
     void close();
 

@@ -36,24 +36,27 @@ std::vector<CodeKind> chosenKinds(CodesOptions const& options)
     return kinds;
 }
 
-bool anyRefused(std::vector<ModuleCodes> const& modules)
+bool anyList(std::vector<ModuleCodes> const& modules, CodeList::Answer answer)
 {
-    return std::any_of(modules.begin(), modules.end(), [](ModuleCodes const& module) {
+    return std::any_of(modules.begin(), modules.end(), [answer](ModuleCodes const& module) {
         return std::any_of(module.report.lists.begin(), module.report.lists.end(),
-                           [](CodeList const& list) { return list.answer == CodeList::Answer::Refused; });
+                           [answer](CodeList const& list) { return list.answer == answer; });
     });
 }
 
-Error withoutAnswer(std::vector<ModuleCodes> const& modules)
+Error withoutAnswer(Session const& session, std::vector<ModuleCodes> const& modules)
 {
-    if (anyRefused(modules)) {
+    if (anyList(modules, CodeList::Answer::Refused)) {
         return {ErrorKind::Refused,
                 "The vehicle refused to report these codes",
                 {"try again with the ignition on and the engine off"}};
     }
-    return {ErrorKind::NotSupported,
-            "No control module reported these codes",
-            {"is the ignition on?", "not all vehicles report pending codes, and only newer ones permanent codes"}};
+    std::vector<std::string> const hints = {
+        "is the ignition on?", "not all vehicles report pending codes, and only newer ones permanent codes"};
+    if (!session.trouble().empty()) {
+        return silentVehicle(session, "No control module reported these codes", hints);
+    }
+    return {ErrorKind::NotSupported, "No control module reported these codes", hints};
 }
 
 // The vehicle identification number is asked for only where it matters.
@@ -79,7 +82,7 @@ ExitCode codes(CodesOptions const& chosen, GlobalOptions const& options)
         session, [&](Session& /*session*/, obd::IEcu const& ecu) { return reader.read(ecu, chosenKinds(chosen)); });
     giveMeanings(session, modules, chosen.maker);
     print(modules, options);
-    requireAnswer(modules, withoutAnswer(modules));
+    requireAnswer(session, modules, withoutAnswer(session, modules));
     return ExitCode::Done;
 }
 

@@ -154,7 +154,7 @@ ExitCode udsCodes(std::string const& named, GlobalOptions const& options)
         if (reached.address) {
             module.report = readUdsCodes(asker, *reached.address);
         }
-        session.check();
+        session.checkAdapter();
         read = read || module.report.answer == TopicAnswer::Read;
         refused = refused || module.report.answer == TopicAnswer::Refused;
     }
@@ -172,10 +172,11 @@ ExitCode udsCodes(std::string const& named, GlobalOptions const& options)
     }
     flushOutput();
     if (!read) {
-        throw Error(refused ? ErrorKind::NotSupported : ErrorKind::VehicleSilent,
-                    refused ? "No control module tells its codes by service 19"
-                            : "No control module answered service 19",
-                    {"`velmora codes` asks the way that every OBD vehicle knows"});
+        std::vector<std::string> const hints = {"`velmora codes` asks the way that every OBD vehicle knows"};
+        if (refused) {
+            throw Error(ErrorKind::NotSupported, "No control module tells its codes by service 19", hints);
+        }
+        throw silentVehicle(session, "No control module answered service 19", hints);
     }
     return ExitCode::Done;
 }

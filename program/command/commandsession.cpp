@@ -6,6 +6,8 @@
 
 #include <obd/library.h>
 
+#include <utility>
+
 namespace velmora::cli {
 
 namespace {
@@ -59,6 +61,16 @@ CommandSession::~CommandSession()
     if (!m_options.logFile.empty() && obd::LIBOBDLogFailed()) {
         tellLateFailure("Could not write all of the log file " + m_options.logFile + "; is the disk full?");
     }
+}
+
+Error silentVehicle(Session const& session, std::string const& what, std::vector<std::string> hints)
+{
+    std::string const trouble = session.trouble();
+    if (trouble.empty()) {
+        return {ErrorKind::VehicleSilent, what, std::move(hints)};
+    }
+    hints.emplace_back("does the wiring hold, and is nothing else plugged into the car's bus?");
+    return {ErrorKind::VehicleSilent, what + "; the adapter reports " + trouble, std::move(hints)};
 }
 
 } // namespace velmora::cli

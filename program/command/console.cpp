@@ -56,8 +56,8 @@ public:
         if (await(message, ofAdapter ? adapterLimit : vehicleLimit)) {
             return {true, linesOf(message, command)};
         }
-        // An adapter that shows traffic without end stops at any character.
-        m_connection->send({'\r'});
+        // An adapter that shows traffic without end stops at any character. A CR would repeat a command that was done.
+        m_connection->send({' '});
         return await(message, adapterLimit) ? Answer{true, linesOf(message, command)} : Answer{};
     }
 

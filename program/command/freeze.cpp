@@ -39,9 +39,10 @@ ExitCode freeze(FreezeOptions const& chosen, GlobalOptions const& options)
         }
     }
     print(modules, options);
-    requireAnswer(modules, Error(ErrorKind::NotSupported,
-                                 fmt::format("No control module answers for freeze frame {}", chosen.frame),
-                                 {"vehicles with no code stored may not answer; most know frame 0 only"}));
+    requireAnswer(session, modules,
+                  Error(ErrorKind::NotSupported,
+                        fmt::format("No control module answers for freeze frame {}", chosen.frame),
+                        {"vehicles with no code stored may not answer; most know frame 0 only"}));
     return ExitCode::Done;
 }
 

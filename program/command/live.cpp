@@ -14,13 +14,14 @@ namespace velmora::cli {
 namespace {
 
 // Who waited for a time and saw nothing is told so; who ended it by hand saw it all.
-void judgeSilence(LiveRun const& run, LiveOptions const& options, bool quiet)
+void judgeSilence(Session const& session, LiveRun const& run, LiveOptions const& options, bool quiet)
 {
     std::vector<std::string> const silent = run.silentSensors();
     if (options.duration > 0.0 && !run.anyValue()) {
         flushOutput();
-        throw Error(ErrorKind::VehicleSilent, "The vehicle gave none of the chosen values",
-                    {"is the ignition on?", "`velmora sensors` lists what the vehicle offers"});
+        session.checkAdapter();
+        throw silentVehicle(session, "The vehicle gave none of the chosen values",
+                            {"is the ignition on?", "`velmora sensors` lists what the vehicle offers"});
     }
     if (!silent.empty() && run.anyValue() && !quiet) {
         tell(fmt::format("No value came of: {}\n", fmt::join(silent, ", ")));
@@ -42,7 +43,7 @@ ExitCode live(GlobalOptions const& global, LiveOptions const& given)
     if (std::string const troubles = run.signalTroubles(); !troubles.empty() && !global.quiet) {
         tell(troubles);
     }
-    judgeSilence(run, options, global.quiet);
+    judgeSilence(session, run, options, global.quiet);
     return ExitCode::Done;
 }
 

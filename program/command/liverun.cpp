@@ -292,16 +292,20 @@ void LiveRun::watchSilence(LiveTime now)
     m_lastLinkCheck = now;
     if (!m_session.proxy()->isConnected()) {
         m_session.check();
-        throw Error(ErrorKind::LinkLost, "The adapter no longer answers", {"is it still plugged in and in reach?"});
+        throw Error(ErrorKind::AdapterSilent, "The adapter no longer answers",
+                    {"is it still plugged in and in reach?"});
     }
     if (m_options.count > 0 && now - m_lastReading > longSilence) {
-        throw Error(ErrorKind::VehicleSilent,
-                    m_table.readings() == 0 ? "The vehicle gives none of the chosen values"
-                                            : "The vehicle no longer answers",
-                    {"is the ignition still on?"});
+        throw silentVehicle(m_session,
+                            m_table.readings() == 0 ? "The vehicle gives none of the chosen values"
+                                                    : "The vehicle no longer answers",
+                            {"is the ignition still on?"});
     }
     if (!m_silenceTold && m_terminal == nullptr && !m_session.options().quiet) {
-        tell("No values come from the vehicle; still asking. Is the ignition on?\n");
+        std::string const trouble = m_session.trouble();
+        tell(trouble.empty()
+                 ? "No values come from the vehicle; still asking. Is the ignition on?\n"
+                 : fmt::format("No values come from the vehicle, the adapter reports {}; still asking\n", trouble));
     }
     m_silenceTold = true;
 }

@@ -33,7 +33,7 @@ void print(std::vector<ModuleTopic<Report>> const& modules, GlobalOptions const&
 
 // Throws, if no module told anything: that the vehicle is silent, if one offers it, else what is given.
 template <typename Report>
-void requireAnswer(std::vector<ModuleTopic<Report>> const& modules, Error const& notOffered)
+void requireAnswer(Session const& session, std::vector<ModuleTopic<Report>> const& modules, Error const& notOffered)
 {
     auto const any = [&modules](auto const& holds) {
         return std::any_of(modules.begin(), modules.end(),
@@ -44,10 +44,10 @@ void requireAnswer(std::vector<ModuleTopic<Report>> const& modules, Error const&
     }
     if constexpr (HasTopicAnswer<Report>) {
         if (any([](Report const& report) { return report.answer == TopicAnswer::Silent; })) {
-            throw Error(ErrorKind::VehicleSilent, "The vehicle did not answer this",
-                        {"is the ignition still on?",
-                         "some vehicles answer only with the engine running, or only with it off",
-                         "a control module that does not offer it may stay silent, too"});
+            throw silentVehicle(session, "The vehicle did not answer this",
+                                {"is the ignition still on?",
+                                 "some vehicles answer only with the engine running, or only with it off",
+                                 "a control module that does not offer it may stay silent, too"});
         }
     }
     throw notOffered;
@@ -60,7 +60,7 @@ ExitCode showTopic(GlobalOptions const& options, Read const& read, Error const& 
     session.connect();
     auto const modules = readModules(session, read);
     print(modules, options);
-    requireAnswer(modules, notOffered);
+    requireAnswer(session, modules, notOffered);
     return ExitCode::Done;
 }
 

@@ -101,7 +101,7 @@ ExitCode modules(ModulesOptions const& chosen, GlobalOptions const& options)
             finder.readIdentifiers(each);
         }
     }
-    session.check();
+    session.checkAdapter();
     keep(store, vin, found, options.quiet);
     if (options.json) {
         Json document = Json::array();

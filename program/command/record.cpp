@@ -46,6 +46,7 @@ void readSensors(Session& session)
             session.check();
         }
     }
+    session.checkAdapter();
 }
 
 void save(DialogueRecorder const& recorder, CommandSession const& session, RecordOptions const& chosen,

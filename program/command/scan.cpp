@@ -36,7 +36,7 @@ std::string listUntold(VehicleReport const& report)
 }
 
 // A car that does not tell all of its codes is not known to be free of them.
-ExitCode check(VehicleReport const& report)
+ExitCode check(VehicleReport const& report, std::string const& trouble)
 {
     auto const anyModule = [&report](bool (*holds)(CodeReport const&)) {
         return std::any_of(report.modules.begin(), report.modules.end(),
@@ -48,7 +48,9 @@ ExitCode check(VehicleReport const& report)
     std::string const missing = listUntold(report);
     if (!missing.empty()) {
         flushOutput();
-        throw Error(ErrorKind::Failed, "Nothing was found, but not all was told: " + missing,
+        throw Error(ErrorKind::Failed,
+                    "Nothing was found, but not all was told: " + missing +
+                        (trouble.empty() ? "" : "; the adapter reports " + trouble),
                     {"is the ignition on?", "try again: a reply may have been lost on the bus"});
     }
     if (!anyModule(canBeChecked)) {
@@ -117,7 +119,7 @@ ExitCode scan(ScanOptions& chosen, GlobalOptions const& options)
         flushOutput();
         keepScan(whole, chosen.keeping, options);
     }
-    return chosen.checking ? check(report) : ExitCode::Done;
+    return chosen.checking ? check(report, session.trouble()) : ExitCode::Done;
 }
 
 // The rules of the USA go by the model year; the others ignore it.

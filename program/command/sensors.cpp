@@ -216,6 +216,7 @@ ExitCode sensors(GlobalOptions const& options, bool all)
 {
     CommandSession session(options);
     session.connect();
+    session.checkAdapter();
     Json modules = Json::array();
     for (std::shared_ptr<obd::IEcu> const& ecu : session.selectedModules()) {
         session.select(*ecu);

@@ -10,8 +10,10 @@
 #include <fcntl.h>
 #include <poll.h>
 #include <spawn.h>
+#include <sys/ioctl.h>
 #include <sys/wait.h>
 #include <unistd.h>
+#include <utility>
 
 extern char** environ;
 
@@ -107,6 +109,48 @@ Outcome runVelmora(std::vector<std::string> const& arguments, std::string const&
     ::waitpid(pid, &status, 0);
     ::close(out.read);
     ::close(err.read);
+    outcome.exitCode = exitCodeOf(status);
+    return outcome;
+}
+
+Outcome runOnTerminal(std::vector<std::string> const& arguments, std::string const& typed, std::string const& question,
+                      std::string answer)
+{
+    int const keyboard = ::posix_openpt(O_RDWR | O_NOCTTY | O_CLOEXEC);
+    EXPECT_EQ(::grantpt(keyboard), 0);
+    EXPECT_EQ(::unlockpt(keyboard), 0);
+    int const terminal = ::open(::ptsname(keyboard), O_RDWR | O_NOCTTY | O_CLOEXEC);
+    winsize const size{24, 80, 0, 0};
+    EXPECT_EQ(::ioctl(terminal, TIOCSWINSZ, &size), 0);
+    ::setenv("TERM", "xterm", 1);
+    pid_t const pid = spawn(arguments, terminal, terminal, terminal);
+    ::close(terminal);
+    auto const type = [keyboard](std::string const& text) {
+        EXPECT_EQ(::write(keyboard, text.data(), text.size()), static_cast<ssize_t>(text.size()));
+    };
+    type(typed);
+    Outcome outcome{};
+    auto const end = std::chrono::steady_clock::now() + limit;
+    while (true) {
+        pollfd source{keyboard, POLLIN, 0};
+        ::poll(&source, 1, 1000);
+        if (std::chrono::steady_clock::now() > end) {
+            ADD_FAILURE() << "the program does not end";
+            ::kill(pid, SIGKILL);
+        }
+        std::array<char, 4096> bytes{};
+        ssize_t const count = source.revents != 0 ? ::read(keyboard, bytes.data(), bytes.size()) : 0;
+        if (source.revents != 0 && count <= 0) {
+            break; // nobody has the terminal open any more
+        }
+        outcome.out.append(bytes.data(), static_cast<std::size_t>(count));
+        if (!answer.empty() && outcome.out.find(question) != std::string::npos) {
+            type(std::exchange(answer, {}));
+        }
+    }
+    int status = 0;
+    ::waitpid(pid, &status, 0);
+    ::close(keyboard);
     outcome.exitCode = exitCodeOf(status);
     return outcome;
 }

@@ -16,6 +16,11 @@ struct Outcome
 // Runs the velmora program to its end, at most two minutes. Fails the test if it takes longer.
 Outcome runVelmora(std::vector<std::string> const& arguments, std::string const& input = {});
 
+// The same on a terminal of 80 columns, where somebody types at once, and answers a question when it stands there. Its
+// output is all in one.
+Outcome runOnTerminal(std::vector<std::string> const& arguments, std::string const& typed = {},
+                      std::string const& question = {}, std::string answer = {});
+
 // A running velmora program; ended by its destructor.
 class ChildProcess
 {

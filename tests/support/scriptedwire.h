@@ -36,6 +36,9 @@ public:
     {
         return m_replies.contains(command) ? *this : on(command, reply);
     }
+    // While it is silent nothing is answered, whatever was told.
+    void setSilent(bool silent) { m_silent = silent; }
+
     // The commands that came, in their order; forgets them.
     std::vector<std::string> takeCommands() { return std::exchange(m_commands, {}); }
 
@@ -43,6 +46,9 @@ private:
     void answer(std::string const& command) override
     {
         m_commands.push_back(command);
+        if (m_silent) {
+            return;
+        }
         Reply reply{{"OK\r\r>"}};
         if (auto const known = m_replies.find(command); known != m_replies.end()) {
             reply = known->second.front();
@@ -59,6 +65,7 @@ private:
 
     std::map<std::string, std::deque<Reply>> m_replies;
     std::vector<std::string> m_commands;
+    bool m_silent = false;
 };
 
 } // namespace support

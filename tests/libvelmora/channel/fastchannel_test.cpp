@@ -140,7 +140,73 @@ TEST(FastChannel, AnAdapterThatResetItselfIsSetUpAgainOnce)
         EXPECT_EQ(rig.ask("010C", 5000), std::nullopt);
         EXPECT_FALSE(rig.channel.isValid()) << "twice in a minute is a lost link";
         EXPECT_TRUE(rig.channel.adapterFails());
+        EXPECT_TRUE(rig.channel.adapterResets());
     }
+}
+
+TEST(FastChannel, AnAdapterThatStaysSilentIsToldButNotOneThatPauses)
+{
+    ChannelRig rig;
+    rig.connect();
+    rig.wire->setSilent(true);
+    EXPECT_EQ(rig.ask("ATRV", 500), std::nullopt);
+    EXPECT_TRUE(rig.channel.statistics().unanswered);
+    EXPECT_EQ(rig.ask("ATRV", 500), std::nullopt);
+    EXPECT_FALSE(rig.channel.statistics().adapterSilent) << "two seconds are no more than a pause";
+    EXPECT_EQ(rig.ask("010C"), std::nullopt);
+    EXPECT_EQ(rig.ask("010C"), std::nullopt);
+    EXPECT_TRUE(rig.channel.statistics().adapterSilent);
+    rig.wire->setSilent(false);
+    rig.wire->on("010C", engineSpeed);
+    EXPECT_THAT(rig.ask("010C"), Optional(engineSpeed));
+    EXPECT_FALSE(rig.channel.statistics().adapterSilent);
+    EXPECT_FALSE(rig.channel.statistics().unanswered);
+}
+
+TEST(FastChannel, OneRequestWithoutAWordIsEnoughToTellThatTheAdapterIsSilent)
+{
+    ChannelRig rig;
+    rig.connect();
+    rig.wire->setSilent(true);
+    EXPECT_EQ(rig.ask("04"), std::nullopt);
+    EXPECT_FALSE(rig.channel.statistics().adapterSilent) << "a module may still be at it";
+    EXPECT_EQ(rig.ask("ATRV", 500), std::nullopt);
+    EXPECT_TRUE(rig.channel.statistics().adapterSilent);
+}
+
+TEST(FastChannel, KeepsTheAdaptersWordForARequestThatBroughtNothing)
+{
+    ChannelRig rig;
+    rig.connect();
+    auto const trouble = [&rig](std::string const& reply) {
+        rig.wire->on("015C", reply);
+        rig.ask("015C"); // as before
+        rig.ask("015C");
+        return rig.channel.statistics().trouble;
+    };
+    EXPECT_EQ(trouble("CAN ERROR"), "CAN ERROR");
+    EXPECT_EQ(trouble("NO DATA"), "") << "which is the vehicle's silence";
+    EXPECT_EQ(trouble("BUS BUSY"), "BUS BUSY");
+    EXPECT_EQ(trouble("7E803415C5A\r7E903415C5A\rBUFFER FULL"), "") << "something came";
+    EXPECT_EQ(trouble("7E803415C5A\rBUFFER FULL"), "BUFFER FULL") << "the line before it may have been cut";
+}
+
+TEST(FastChannel, ASearchBehindAResetIsToldToLookForCanAgain)
+{
+    for (char const* word : {"LV RESET", "ERR94"}) {
+        ChannelRig rig;
+        rig.bringUp();
+        rig.ask("ATTP0"); // the bus is not known any more
+        rig.wire->takeCommands();
+        rig.wire->on("010C", word).on("010C", engineSpeed);
+        EXPECT_THAT(rig.ask("010C", 5000), Optional(engineSpeed));
+        EXPECT_THAT(rig.wire->takeCommands(), testing::Contains("ATFE")) << word;
+    }
+    ChannelRig known;
+    known.connect();
+    known.wire->on("010C", "ERR94").on("010C", engineSpeed);
+    known.ask("010C", 5000);
+    EXPECT_THAT(known.wire->takeCommands(), testing::Not(testing::Contains("ATFE"))) << "no search is to come";
 }
 
 TEST(FastChannel, AResetWithoutAWordShowsInTheEcho)

@@ -82,4 +82,14 @@ TEST_F(OpeningWatchTest, AdviceFitsTheKindOfPort)
     EXPECT_EQ(error.kind(), velmora::ErrorKind::AdapterSilent);
 }
 
+TEST(OpeningFailure, ASilentVehicleIsToldWithTheAdaptersWord)
+{
+    velmora::Error const plain = velmora::openingfailure::silentVehicle("ELM327 v1.5", "sim:", "");
+    EXPECT_EQ(std::string(plain.what()), "The adapter (ELM327 v1.5) on sim: works, but no control module answers");
+    EXPECT_EQ(plain.kind(), velmora::ErrorKind::VehicleSilent);
+    velmora::Error const trouble = velmora::openingfailure::silentVehicle("ELM327 v1.5", "sim:", "BUS ERROR");
+    EXPECT_EQ(std::string(trouble.what()), std::string(plain.what()) + "; it reports BUS ERROR");
+    EXPECT_EQ(trouble.hints().size(), plain.hints().size() + 1) << "the wiring";
+}
+
 } // namespace

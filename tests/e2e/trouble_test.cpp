@@ -1,0 +1,197 @@
+// What goes wrong in mid-session, files that have no end, and the terminal, in real time.
+
+#include "tests/e2e/childprocess.h"
+
+#include <gtest/gtest.h>
+
+#include <chrono>
+#include <cstdio>
+#include <filesystem>
+#include <fstream>
+#include <memory>
+#include <sys/stat.h>
+
+namespace {
+
+using e2e::ChildProcess;
+using e2e::Outcome;
+using e2e::runOnTerminal;
+using e2e::runVelmora;
+
+bool contains(std::string const& text, std::string const& part)
+{
+    return text.find(part) != std::string::npos;
+}
+
+// A simulated car on a port of its own, with faults.
+class FaultyCar
+{
+public:
+    explicit FaultyCar(std::vector<std::string> const& faults, std::string const& vehicle = "petrol-can11")
+    {
+        std::vector<std::string> arguments = {"simulate", "--listen", "tcp://127.0.0.1:0", "--vehicle", vehicle};
+        for (std::string const& fault : faults) {
+            arguments.insert(arguments.end(), {"--fault", fault});
+        }
+        m_simulator = std::make_unique<ChildProcess>(arguments);
+        m_port = m_simulator->readLine();
+    }
+    std::string const& port() const { return m_port; }
+
+private:
+    std::unique_ptr<ChildProcess> m_simulator;
+    std::string m_port;
+};
+
+TEST(Trouble, AnAdapterThatFallsSilentIsExitCodeFourInEveryCommand)
+{
+    std::vector<std::vector<std::string>> const commands = {{"scan"},
+                                                            {"codes"},
+                                                            {"info"},
+                                                            {"monitors"},
+                                                            {"clear"},
+                                                            {"live", "RPM", "--duration", "60"},
+                                                            {"log", "RPM", "--duration", "60"}};
+    std::vector<FaultyCar> cars;
+    std::vector<std::unique_ptr<ChildProcess>> running; // at once: each mostly waits
+    for (std::vector<std::string> const& command : commands) {
+        // The connection stands after 36 commands.
+        cars.emplace_back(std::vector<std::string>{command.front() == "clear" ? "silent@37" : "silent@38"});
+        std::vector<std::string> arguments = {"-q", "-y", "-p", cars.back().port()};
+        arguments.insert(arguments.end(), command.begin(), command.end());
+        running.push_back(std::make_unique<ChildProcess>(arguments));
+    }
+    for (std::size_t i = 0; i < commands.size(); ++i) {
+        EXPECT_EQ(running[i]->wait(), 4) << commands[i].front();
+    }
+}
+
+TEST(Trouble, AnAdapterThatResetsItselfIsSetUpAgainAndNamed)
+{
+    for (char const* reset : {"reset:LV RESET@40", "reset:banner@40", "reset@40"}) {
+        FaultyCar const car({reset});
+        Outcome const outcome = runVelmora({"-p", car.port(), "info"});
+        EXPECT_EQ(outcome.exitCode, 0) << reset << outcome.err;
+        EXPECT_TRUE(contains(outcome.out, "VELMRAS1MM0000001")) << reset << outcome.out;
+        EXPECT_TRUE(contains(outcome.err, "reset itself 1x")) << reset << outcome.err;
+    }
+    FaultyCar const car({"reset:LV RESET@38", "reset:LV RESET@50"});
+    Outcome const outcome = runVelmora({"-p", car.port(), "scan"});
+    EXPECT_EQ(outcome.exitCode, 8) << outcome.err;
+    EXPECT_TRUE(contains(outcome.err, "resets itself again and again")) << outcome.err;
+    EXPECT_FALSE(contains(outcome.err, "ignition")) << outcome.err;
+}
+
+TEST(Trouble, TheAdaptersWordIsTold)
+{
+    std::vector<std::string> faults;
+    for (int command = 37; command < 80; ++command) {
+        faults.push_back("error:CAN ERROR@" + std::to_string(command));
+    }
+    FaultyCar const car(faults);
+    Outcome const outcome = runVelmora({"-q", "-p", car.port(), "counters"});
+    EXPECT_EQ(outcome.exitCode, 5) << outcome.err;
+    EXPECT_TRUE(contains(outcome.err, "CAN ERROR")) << outcome.err;
+}
+
+TEST(Trouble, ReadersThatGoEarlyEndAllCommandsAlike)
+{
+    for (char const* command : {"scan", "sensors", "live", "--json live", "log RPM"}) {
+        std::string const shell = std::string("bash -c '" VELMORA_PROGRAM " -q -p sim:petrol-can11?instant ") +
+                                  command + " | head -n 1 > /dev/null; exit ${PIPESTATUS[0]}'";
+        int const status = std::system(shell.c_str());
+        EXPECT_EQ(WEXITSTATUS(status), 0) << command;
+    }
+}
+
+TEST(Trouble, FilesWithoutAnEndOrABeginningAreRefusedAtOnce)
+{
+    std::string const pipe = testing::TempDir() + "velmora-pipe";
+    std::remove(pipe.c_str());
+    ASSERT_EQ(::mkfifo(pipe.c_str(), 0600), 0);
+    auto const start = std::chrono::steady_clock::now();
+    for (std::string const& file : {std::string("/dev/zero"), pipe}) {
+        for (std::vector<std::string> const& arguments : {std::vector<std::string>{"--settings", file, "settings"},
+                                                          {"-p", "sim:" + file, "info"},
+                                                          {"-p", "replay:" + file, "info"},
+                                                          {"simulate", "--vehicle", file},
+                                                          {"simulate", "--replay", file},
+                                                          {"simulate", "--scenario", file},
+                                                          {"watch", "--config", file},
+                                                          {"signals", "check", file},
+                                                          {"signals", "import", file},
+                                                          {"-p", "sim:", "record", file},
+                                                          {"-p", "sim:", "doctor", "--bundle", file}}) {
+            Outcome const outcome = runVelmora(arguments);
+            EXPECT_NE(outcome.exitCode, 0) << file << " " << arguments[arguments.size() - 2];
+            EXPECT_TRUE(contains(outcome.err, file)) << outcome.err;
+        }
+    }
+    EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(20));
+    std::remove(pipe.c_str());
+}
+
+TEST(Trouble, TheBundleReplacesNoFileUnlessItMay)
+{
+    std::string const file = testing::TempDir() + "velmora-bundle.txt";
+    std::ofstream(file) << "keep me";
+    Outcome const refused = runVelmora({"-p", "sim:petrol-can11?instant", "doctor", "--bundle", file});
+    EXPECT_EQ(refused.exitCode, 2);
+    EXPECT_TRUE(contains(refused.err, "--force")) << refused.err;
+    EXPECT_EQ(std::filesystem::file_size(file), 7U);
+    runVelmora({"-q", "-p", "sim:petrol-can11?instant", "doctor", "--bundle", file, "--force"});
+    EXPECT_GT(std::filesystem::file_size(file), 500U);
+    std::remove(file.c_str());
+}
+
+TEST(Trouble, SettingsSurviveAKillWhole)
+{
+    std::string const file = testing::TempDir() + "velmora-killed.toml";
+    ASSERT_EQ(runVelmora({"--settings", file, "settings", "weight", "1111"}).exitCode, 0);
+    for (int i = 0; i < 30; ++i) {
+        std::string const command = "timeout -s KILL 0.0" + std::to_string(10 + i) +
+                                    " " VELMORA_PROGRAM " --settings " + file + " settings weight 2222 > /dev/null";
+        [[maybe_unused]] int const status = std::system(command.c_str());
+        std::ifstream in(file);
+        std::string const text{std::istreambuf_iterator<char>(in), {}};
+        EXPECT_TRUE(text == "[common]\nvehicleweight = 1111\n" || text == "[common]\nvehicleweight = 2222\n") << text;
+    }
+    EXPECT_EQ(runVelmora({"--settings", file, "settings", "weight"}).exitCode, 0);
+    for (auto const& each : std::filesystem::directory_iterator(testing::TempDir())) {
+        if (each.path().filename().string().starts_with("velmora-killed.toml")) {
+            std::filesystem::remove(each.path());
+        }
+    }
+}
+
+TEST(Trouble, AFullDiskUnderTheSimulatorsTraceIsExitCodeOne)
+{
+    ChildProcess simulator({"simulate", "--listen", "tcp://127.0.0.1:0", "--trace", "/dev/full"});
+    runVelmora({"-q", "-p", simulator.readLine(), "console"}, "ATI\n");
+    simulator.interrupt();
+    EXPECT_EQ(simulator.wait(), 1);
+}
+
+TEST(Trouble, ConsoleShowsEachLineOfALongReply)
+{
+    Outcome const outcome = runVelmora({"-q", "-p", "sim:petrol-can11?instant", "console"}, "ATS0\n0902\n03ZZ\n0101\n");
+    EXPECT_EQ(outcome.out, "OK\nSEARCHING...\n014\n0:49020156454C\n1:4D524153314D4D\n2:30303030303031\n?\n"
+                           "41018207E524\n410100040000\n");
+}
+
+TEST(Trouble, ATerminalShowsWhatTheOpeningIsAt)
+{
+    Outcome const outcome = runOnTerminal({"-p", "sim:petrol-iso9141", "counters"});
+    EXPECT_TRUE(contains(outcome.out, "\r\033[KSearching for the bus ... 1 s")) << outcome.out;
+    EXPECT_TRUE(contains(outcome.out, "\r\033[KControl module")) << "the line goes when it is over: " << outcome.out;
+}
+
+TEST(Trouble, WhatWasTypedBeforeTheQuestionClearsNothing)
+{
+    Outcome const outcome =
+        runOnTerminal({"-q", "-p", "sim:petrol-can11?instant", "clear"}, "yes\n", "Clear now?", "no\n");
+    EXPECT_TRUE(contains(outcome.out, "Clear now?")) << outcome.out;
+    EXPECT_FALSE(contains(outcome.out, ": cleared")) << outcome.out;
+}
+
+} // namespace
