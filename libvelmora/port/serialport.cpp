@@ -21,7 +21,7 @@ namespace {
     if (error == asio::error_code(ENOENT, asio::error::get_system_category())) {
         throw Error(ErrorKind::PortFailed, what,
                     {"is the adapter plugged in? `velmora ports` lists what is there",
-                     "a Bluetooth adapter needs its port bound first (rfcomm bind)"});
+                     "a Bluetooth adapter needs no serial port: --port bt://MAC, as `velmora ports` lists them"});
     }
     if (error == asio::error_code(EACCES, asio::error::get_system_category())) {
         throw Error(ErrorKind::PortFailed, what,
