@@ -3,8 +3,8 @@
 // Fills a spool with 118,800 readings (33 a second) and sends them to the broker at ADDRESS (mqtt://HOST:PORT/TOPIC),
 // by the real output. Tells the seconds from the connection's begin until the last acknowledgement.
 
-#include "libvelmora/output/mqttoutput.h"
-#include "libvelmora/output/spooltext.h"
+#include "libvelmora/output/mqtt/mqttoutput.h"
+#include "libvelmora/output/mqtt/spooltext.h"
 
 #include <velmora/error.h>
 

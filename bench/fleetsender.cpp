@@ -4,7 +4,7 @@
 // the time of now, through the real output with its queue, thread and spool. At SIGTERM it waits until all spools are
 // empty, at most five minutes, and tells how many readings each was given: "sent NAME COUNT".
 
-#include "libvelmora/output/outputfactory.h"
+#include "libvelmora/output/opening/outputfactory.h"
 #include "libvelmora/output/outputrunner.h"
 
 #include <nlohmann/json.hpp>

@@ -3,8 +3,8 @@
 
 #include "libvelmora/history/changes.h"
 #include "libvelmora/history/scanjson.h"
-#include "libvelmora/report/reportdocument.h"
-#include "libvelmora/report/vehiclereportjson.h"
+#include "libvelmora/report/document/reportdocument.h"
+#include "libvelmora/report/document/vehiclereportjson.h"
 
 #include <velmora/error.h>
 

@@ -1,9 +1,9 @@
 // What a watch takes from people, brokers and its own spool, by the first byte of the input: settings files, addresses
 // of outputs, a consumer's mark, rows of a spool, what an adapter says when it is asked for the voltage.
 
-#include "libvelmora/output/mqttsettings.h"
+#include "libvelmora/output/mqtt/mqttsettings.h"
+#include "libvelmora/output/mqtt/spooltext.h"
 #include "libvelmora/output/outputaddress.h"
-#include "libvelmora/output/spooltext.h"
 #include "libvelmora/watch/voltageprobe.h"
 #include "libvelmora/watch/watchsettings.h"
 

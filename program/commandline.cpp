@@ -1,6 +1,6 @@
 #include "program/commandline.h"
 
-#include "libvelmora/output/outputfactory.h"
+#include "libvelmora/output/opening/outputfactory.h"
 #include "program/helpformatter.h"
 #include "program/licencetext.h"
 #include "program/selfdescription.h"

@@ -1,7 +1,7 @@
 #include "libvelmora/history/changes.h"
 
 #include "libvelmora/history/changeparts.h"
-#include "libvelmora/report/findingparts.h"
+#include "libvelmora/report/finding/findingparts.h"
 #include "libvelmora/report/texts/changetexts.h"
 #include "libvelmora/report/texts/labels.h"
 

@@ -1,8 +1,8 @@
 #include "libvelmora/history/scanjson.h"
 
 #include "libvelmora/report/codereport.h"
+#include "libvelmora/report/document/vehiclereportjson.h"
 #include "libvelmora/report/jsonplace.h"
-#include "libvelmora/report/vehiclereportjson.h"
 #include "libvelmora/vehicle/vin.h"
 
 #include <velmora/error.h>

@@ -1,5 +1,5 @@
 #include "libvelmora/read/vehiclereader.h"
-#include "libvelmora/report/reportfile.h"
+#include "libvelmora/report/document/reportfile.h"
 #include "program/command/commands.h"
 #include "program/command/commandsession.h"
 #include "program/command/keepscan.h"

@@ -1,6 +1,6 @@
 #include "program/command/watchrun.h"
 
-#include "libvelmora/output/outputfactory.h"
+#include "libvelmora/output/opening/outputfactory.h"
 #include "libvelmora/output/valuetext.h"
 #include "libvelmora/session/settingsstore.h"
 #include "libvelmora/watch/statefolder.h"

@@ -1,7 +1,7 @@
 #pragma once
 
-#include "libvelmora/report/findings.h"
-#include "libvelmora/report/inspection.h"
+#include "libvelmora/report/finding/findings.h"
+#include "libvelmora/report/finding/inspection.h"
 #include "libvelmora/report/moduletopic.h"
 #include "libvelmora/report/routinesreport.h"
 #include "libvelmora/report/vehiclereport.h"

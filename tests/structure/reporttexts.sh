@@ -6,8 +6,9 @@
 set -euo pipefail
 cd "$1"
 shopt -s nullglob
-files=(libvelmora/report/{findings,findingparts,inspection,moduledocument,moduletables,reportdocument}*.cpp
-    libvelmora/report/{htmldocument,markdowndocument,limitbar,vinreport,troublecode,oxygenreport}.cpp
+files=(libvelmora/report/finding/{findings,findingparts,inspection}*.cpp
+    libvelmora/report/document/{moduledocument,moduletables,reportdocument,htmldocument,markdowndocument,limitbar}*.cpp
+    libvelmora/report/{vinreport,troublecode,oxygenreport}.cpp
     libvelmora/history/*changes.cpp)
 [[ ${#files[@]} -gt 10 ]] || { echo "the files are not where they were"; exit 1; }
 perl -ne '

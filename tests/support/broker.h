@@ -1,6 +1,6 @@
 #pragma once
 
-#include "libvelmora/output/mqttoutput.h"
+#include "libvelmora/output/mqtt/mqttoutput.h"
 #include "tests/support/records.h"
 #include "tests/support/serverprocess.h"
 #include "tests/support/temporaryfolder.h"

@@ -1,5 +1,5 @@
+#include "libvelmora/output/opening/outputfactory.h"
 #include "libvelmora/output/outputaddress.h"
-#include "libvelmora/output/outputfactory.h"
 #include "libvelmora/output/valuetext.h"
 
 #include <velmora/error.h>

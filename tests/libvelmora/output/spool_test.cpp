@@ -1,7 +1,7 @@
 #include "libvelmora/output/clockjudge.h"
-#include "libvelmora/output/mqttsettings.h"
-#include "libvelmora/output/spoolsender.h"
-#include "libvelmora/output/spooltext.h"
+#include "libvelmora/output/mqtt/mqttsettings.h"
+#include "libvelmora/output/mqtt/spoolsender.h"
+#include "libvelmora/output/mqtt/spooltext.h"
 #include "tests/support/broker.h"
 
 #include <velmora/error.h>

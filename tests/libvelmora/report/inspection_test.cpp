@@ -1,4 +1,4 @@
-#include "libvelmora/report/inspection.h"
+#include "libvelmora/report/finding/inspection.h"
 #include "tests/libvelmora/report/carbuilder.h"
 
 #include <gtest/gtest.h>

@@ -1,6 +1,6 @@
-#include "libvelmora/report/htmlescape.h"
-#include "libvelmora/report/reportdocument.h"
-#include "libvelmora/report/reportfile.h"
+#include "libvelmora/report/document/htmlescape.h"
+#include "libvelmora/report/document/reportdocument.h"
+#include "libvelmora/report/document/reportfile.h"
 
 #include <velmora/error.h>
 

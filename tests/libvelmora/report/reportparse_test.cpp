@@ -1,4 +1,4 @@
-#include "libvelmora/report/vehiclereportjson.h"
+#include "libvelmora/report/document/vehiclereportjson.h"
 #include "tests/libvelmora/report/carbuilder.h"
 
 #include <velmora/error.h>

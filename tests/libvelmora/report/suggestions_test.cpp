@@ -1,5 +1,5 @@
-#include "libvelmora/report/findings.h"
-#include "libvelmora/report/testlimits.h"
+#include "libvelmora/report/finding/findings.h"
+#include "libvelmora/report/finding/testlimits.h"
 #include "tests/libvelmora/report/carbuilder.h"
 
 #include <gtest/gtest.h>

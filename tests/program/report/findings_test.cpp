@@ -1,4 +1,4 @@
-#include "libvelmora/report/findings.h"
+#include "libvelmora/report/finding/findings.h"
 #include "program/view/reporttext.h"
 
 #include <gtest/gtest.h>

@@ -1,0 +1,87 @@
+#include "libvelmora/output/opening/outputfactory.h"
+
+#include "libvelmora/output/csvoutput.h"
+#include "libvelmora/output/influxoutput.h"
+#include "libvelmora/output/mqtt/mqttoutput.h"
+#include "libvelmora/output/ndjsonoutput.h"
+#include "libvelmora/output/prometheusoutput.h"
+#include "libvelmora/output/sqliteoutput.h"
+
+#include <velmora/error.h>
+
+namespace velmora {
+
+namespace {
+
+struct Maker
+{
+    char const* kind;
+    std::unique_ptr<IOutput> (*make)(OutputAddress const&, OutputContext const&);
+};
+
+template <typename Output>
+std::unique_ptr<IOutput> makeOf(OutputAddress const& address, OutputContext const& /*context*/)
+{
+    return std::make_unique<Output>(address);
+}
+
+#ifdef VELMORA_OUTPUT_MQTT
+std::unique_ptr<IOutput> makeMqtt(OutputAddress const& address, OutputContext const& context)
+{
+    return std::make_unique<MqttOutput>(address, context);
+}
+#endif
+
+std::vector<Maker> const& makers()
+{
+    static std::vector<Maker> const list = {
+#ifdef VELMORA_OUTPUT_CSV
+        {"csv", makeOf<CsvOutput>},
+        {"csv-long", makeOf<CsvLongOutput>},
+#endif
+#ifdef VELMORA_OUTPUT_NDJSON
+        {"ndjson", makeOf<NdjsonOutput>},
+#endif
+#ifdef VELMORA_OUTPUT_INFLUX
+        {"influx", [](OutputAddress const& address, OutputContext const&) { return makeInfluxOutput(address); }},
+#endif
+#ifdef VELMORA_OUTPUT_SQLITE
+        {"sqlite", makeOf<SqliteOutput>},
+#endif
+#ifdef VELMORA_OUTPUT_PROMETHEUS
+        {"prometheus",
+         [](OutputAddress const& address, OutputContext const& context) -> std::unique_ptr<IOutput> {
+             return std::make_unique<PrometheusOutput>(address, context.health);
+         }},
+#endif
+#ifdef VELMORA_OUTPUT_MQTT
+        {"mqtt", makeMqtt},
+        {"mqtts", makeMqtt},
+#endif
+    };
+    return list;
+}
+
+} // namespace
+
+std::vector<std::string> builtInOutputs()
+{
+    std::vector<std::string> kinds;
+    for (Maker const& each : makers()) {
+        kinds.emplace_back(each.kind);
+    }
+    return kinds;
+}
+
+std::unique_ptr<IOutput> makeOutput(OutputAddress const& address, OutputContext const& context)
+{
+    for (Maker const& each : makers()) {
+        if (address.kind == each.kind) {
+            return each.make(address, context);
+        }
+    }
+    throw Error(ErrorKind::WrongUse, "This build has no output of kind " + address.kind,
+                {"velmora --version lists its outputs"});
+}
+
+} // namespace velmora

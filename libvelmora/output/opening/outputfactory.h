@@ -1,0 +1,19 @@
+#pragma once
+
+#include "libvelmora/output/ioutput.h"
+#include "libvelmora/output/outputaddress.h"
+#include "libvelmora/output/outputcontext.h"
+
+#include <memory>
+#include <string>
+#include <vector>
+
+namespace velmora {
+
+// The kinds that this build has, as they are written in an address.
+std::vector<std::string> builtInOutputs();
+
+// Throws Error if the address makes no sense, or names a kind that was left out of this build.
+std::unique_ptr<IOutput> makeOutput(OutputAddress const& address, OutputContext const& context);
+
+} // namespace velmora
