@@ -1,5 +1,6 @@
 #include "simulator/adapter/buswire.h"
 
+#include "simulator/adapter/flowcontrol.h"
 #include "simulator/adapter/framecounter.h"
 #include "simulator/adapter/framewriter.h"
 
@@ -9,36 +10,6 @@
 namespace obdsim {
 
 namespace {
-
-/// The PCI byte of a CAN frame, behind the address byte where there is one.
-std::uint8_t pciOf(Frame const& frame, bool extended)
-{
-    const std::size_t at = extended ? 1 : 0;
-    return frame.data.size() > at ? frame.data[at] : std::uint8_t{0};
-}
-
-bool isFirstFrame(Frame const& frame, bool extended)
-{
-    return pciOf(frame, extended) >> 4 == 0x1;
-}
-
-bool isConsecutiveFrame(Frame const& frame, bool extended)
-{
-    return pciOf(frame, extended) >> 4 == 0x2;
-}
-
-/// The consecutive frames that a first frame promises (ISO 15765-2).
-std::size_t promisedFrames(Frame const& frame, bool extended)
-{
-    const std::size_t at = extended ? 1 : 0;
-    if (frame.data.size() < at + 2) {
-        return 0;
-    }
-    const std::size_t length = (frame.data[at] & 0x0FU) << 8U | frame.data[at + 1];
-    const std::size_t inFirst = 6 - at;
-    const std::size_t inEach = 7 - at;
-    return length > inFirst ? (length - inFirst + inEach - 1) / inEach : 0;
-}
 
 std::size_t serialBytes(Frame const& frame)
 {
@@ -86,50 +57,6 @@ bool passes(Protocol const& protocol, Settings const& settings, Frame const& fra
     }
     const std::uint32_t mask = settings.canMask.value_or(0x1FFFFFFF);
     return ours && (frame.source & mask) == (settings.canFilter.value_or(0) & mask);
-}
-
-/// The identifier to which an adapter sends flow control by itself. For replies that are no OBD module's it takes that
-/// of the reply, which no module heeds.
-std::uint32_t automaticFlowHeader(Protocol const& protocol, std::uint32_t reply)
-{
-    if (protocol.family == BusFamily::Can11) {
-        return (reply & 0x7F8) == 0x7E8 ? reply - 8 : reply;
-    }
-    bool const obd = (reply & 0x1FFFFF00) == 0x18DAF100;
-    return obd ? 0x18DA00F1 | (reply & 0xFF) << 8 : reply;
-}
-
-std::uint32_t requestIdentifier(Protocol const& protocol, ModuleData const& module)
-{
-    const std::uint32_t usual = protocol.family == BusFamily::Can11
-                                    ? module.id - 8
-                                    : (module.id & 0xFFFF0000U) | (module.id & 0xFF) << 8 | (module.id >> 8 & 0xFF);
-    return module.request.value_or(usual);
-}
-
-/// How many consecutive frames a module sends upon the flow control of the adapter for its first frame: it heeds only
-/// what comes to its own identifier and address. An adapter answers a first frame once, so a block size ends the
-/// message.
-int allowedFrames(Protocol const& protocol, Settings const& settings, ModuleData const& module)
-{
-    constexpr int all = 0xFFF;
-    if (!settings.flowControl) {
-        return 0;
-    }
-    std::uint32_t header = settings.flowMode == 2 ? module.id : automaticFlowHeader(protocol, module.id);
-    Bytes data = {0x30, 0x00, 0x00};
-    if (settings.flowMode != 0) {
-        header = settings.flowMode == 1 ? settings.flowHeader.value_or(0) : header;
-        data = settings.flowData;
-    }
-    if (module.address) {
-        bool const addressed = !data.empty() && data[0] == *module.address;
-        data = addressed ? Bytes(data.begin() + 1, data.end()) : Bytes();
-    }
-    if (header != requestIdentifier(protocol, module) || data.empty() || data[0] != 0x30) {
-        return 0;
-    }
-    return data.size() < 2 || data[1] == 0 ? all : data[1];
 }
 
 /// The bytes of the header in the length that the bus has.

@@ -1,10 +1,10 @@
 #include "simulator/car/modulereader.h"
 
-#include "simulator/car/drive.h"
+#include "simulator/car/codereader.h"
+#include "simulator/car/inforeader.h"
 #include "simulator/car/livepids.h"
 #include "simulator/car/monitornames.h"
-
-#include <algorithm>
+#include "simulator/car/udsreader.h"
 
 namespace obdsim {
 
@@ -12,24 +12,6 @@ namespace {
 
 constexpr int largestWord = 0xFFFF;
 constexpr int longestDelayMs = 60000;
-
-std::uint16_t readCode(TableReader& table, std::string_view key, std::string const& text)
-{
-    auto const code = parseCode(text);
-    if (!code) {
-        table.fail(key, "\"" + text + "\" is no trouble code such as P0133");
-    }
-    return *code;
-}
-
-std::vector<std::uint16_t> readCodes(TableReader& table, std::string_view key)
-{
-    std::vector<std::uint16_t> codes;
-    for (auto const& text : table.texts(key)) {
-        codes.push_back(readCode(table, key, text));
-    }
-    return codes;
-}
 
 void readMonitorNames(TableReader& table, std::string_view key, bool compression, bool incomplete, MonitorBits& bits)
 {
@@ -87,59 +69,6 @@ MonitorTest readMonitorTest(TableReader& table, bool onCan)
     return test;
 }
 
-Bytes readVerification(TableReader& table, std::string const& text)
-{
-    constexpr std::size_t size = 4;
-    auto const value = parseHex(text);
-    if (!value || value->size() != size) {
-        table.fail("verifications", "a calibration verification number is four bytes");
-    }
-    return *value;
-}
-
-/// "ECM-EngineControl": the acronym fills four bytes, the dash is the fifth.
-std::string layOutName(std::string const& text)
-{
-    constexpr std::size_t acronymSize = 4;
-    std::string acronym = text.substr(0, text.find('-'));
-    const std::string rest = text.substr(acronym.size());
-    acronym.resize(std::max(acronymSize, acronym.size()), '\0');
-    return acronym + rest;
-}
-
-void checkLength(TableReader& table, std::string_view key, std::string const& text, std::size_t most)
-{
-    if (text.size() > most) {
-        table.fail(key, "\"" + std::string(key) + "\" is longer than " + std::to_string(most) + " characters");
-    }
-}
-
-VehicleInfo readInfo(TableReader& table)
-{
-    constexpr std::size_t numberSize = 17;
-    constexpr std::size_t calibrationSize = 16;
-    constexpr std::size_t nameSize = 20;
-    VehicleInfo info;
-    info.vin = table.text("vin", "");
-    info.serial = table.text("serial", "");
-    info.typeApproval = table.text("type_approval", "");
-    info.ecuName = layOutName(table.text("ecu_name", ""));
-    info.calibrations = table.texts("calibrations");
-    for (auto const& text : table.texts("verifications")) {
-        info.verifications.push_back(readVerification(table, text));
-    }
-    info.sparkCounters = table.words("spark_counters");
-    info.compressionCounters = table.words("compression_counters");
-    checkLength(table, "vin", info.vin, numberSize);
-    checkLength(table, "serial", info.serial, numberSize);
-    checkLength(table, "type_approval", info.typeApproval, numberSize);
-    checkLength(table, "ecu_name", info.ecuName, nameSize);
-    for (auto const& calibration : info.calibrations) {
-        checkLength(table, "calibrations", calibration, calibrationSize);
-    }
-    return info;
-}
-
 Routine readRoutine(TableReader& table)
 {
     return {table.bytes("data"), table.has("refusal") ? table.byte("refusal") : std::uint8_t{0}};
@@ -194,61 +123,6 @@ void readRecordedOf(ModuleData& module, TableReader& table)
         delays.tableEntries([&](const Bytes& request, TableReader& delay) {
             module.delays[request] = {delay.integer("times", 0, 100, 1),
                                       Ms(delay.integer("milliseconds", 0, longestDelayMs, 100))};
-        });
-    });
-}
-
-SignalField readField(TableReader& table, std::size_t size)
-{
-    constexpr int mostBytes = 4;
-    SignalField field;
-    field.bytes = static_cast<std::size_t>(table.integer("bytes", 1, mostBytes, 1));
-    field.at = static_cast<std::size_t>(table.integer("at", 0, 0xFFF));
-    field.value = table.text("value");
-    field.scale = table.number("scale", 1);
-    field.offset = table.number("offset", 0);
-    if (field.at + field.bytes > size) {
-        table.fail("at", "the field ends behind the data");
-    }
-    if (!Drive::value(DriveState{}, field.value)) {
-        table.fail("value", "the drive has no \"" + field.value + "\"");
-    }
-    return field;
-}
-
-void readSignal(ModuleData& module, TableReader& table)
-{
-    const Bytes request = table.bytes("request");
-    bool const local = request.size() == 2 && (request[0] == 0x21 || request[0] == 0x1A);
-    bool const identifier = request.size() == 3 && request[0] == 0x22;
-    if (!local && !identifier) {
-        table.fail("request", "a signal is asked by 22 and two bytes, or by 21 or 1A and one");
-    }
-    SignalData signal;
-    signal.data = table.has("text") ? Bytes() : table.bytes("data");
-    for (char const each : table.text("text", "")) {
-        signal.data.push_back(static_cast<std::uint8_t>(each));
-    }
-    table.tables("fields", [&](TableReader& field) { signal.fields.push_back(readField(field, signal.data.size())); });
-    module.signals[request] = std::move(signal);
-}
-
-/// What a module tells beyond OBD.
-void readUdsOf(ModuleData& module, TableReader& table)
-{
-    module.uds = table.flag("uds", false);
-    table.tables("signals", [&](TableReader& signal) { readSignal(module, signal); });
-    table.tables("uds_codes", [&](TableReader& code) {
-        const std::uint16_t number = readCode(code, "code", code.text("code"));
-        const std::uint8_t type = code.byte("type");
-        module.udsCodes.push_back({number, type, code.byte("status")});
-    });
-    table.table("refusals", [&](TableReader& refusals) {
-        refusals.entries([&](Bytes const& request, std::vector<Bytes> const& codes) {
-            if (codes.size() != 1 || codes[0].size() != 1) {
-                refusals.fail(hexText(request), "a refusal is one response code");
-            }
-            module.refusals[request] = codes[0][0];
         });
     });
 }

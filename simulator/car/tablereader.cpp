@@ -98,15 +98,7 @@ std::uint8_t TableReader::byte(std::string_view key)
 std::vector<std::string> TableReader::texts(std::string_view key)
 {
     std::vector<std::string> result;
-    toml::node const* node = find(key);
-    if (node == nullptr) {
-        return result;
-    }
-    toml::array const* array = node->as_array();
-    if (array == nullptr) {
-        failAt(*node, quoted(key) + " must be an array of texts");
-    }
-    for (auto const& element : *array) {
+    for (auto const& element : array(key, "texts")) {
         result.push_back(string(element, key));
     }
     return result;
@@ -115,15 +107,7 @@ std::vector<std::string> TableReader::texts(std::string_view key)
 std::vector<std::uint16_t> TableReader::words(std::string_view key)
 {
     std::vector<std::uint16_t> result;
-    toml::node const* node = find(key);
-    if (node == nullptr) {
-        return result;
-    }
-    toml::array const* array = node->as_array();
-    if (array == nullptr) {
-        failAt(*node, quoted(key) + " must be an array of numbers");
-    }
-    for (auto const& element : *array) {
+    for (auto const& element : array(key, "numbers")) {
         auto const value = element.is_integer() ? element.value<std::int64_t>() : std::nullopt;
         if (!value || *value < 0 || *value > 0xFFFF) {
             failAt(element, quoted(key) + " must hold whole numbers from 0 to 65535");
@@ -149,14 +133,7 @@ void TableReader::table(std::string_view key, std::function<void(TableReader&)> 
 
 void TableReader::tables(std::string_view key, std::function<void(TableReader&)> const& read)
 {
-    toml::node const* node = find(key);
-    if (node == nullptr) {
-        return;
-    }
-    if (!node->is_array()) {
-        failAt(*node, quoted(key) + " must be an array of tables");
-    }
-    for (auto const& element : *node->as_array()) {
+    for (auto const& element : array(key, "tables")) {
         if (!element.is_table()) {
             failAt(element, quoted(key) + " must be an array of tables");
         }
@@ -222,6 +199,17 @@ toml::node const& TableReader::need(std::string_view key)
         failAt(m_table, m_title + " needs " + quoted(key));
     }
     return *node;
+}
+
+/// The array at `key`, an empty one if the key is missing.
+toml::array const& TableReader::array(std::string_view key, std::string const& ofWhat)
+{
+    static const toml::array none;
+    toml::node const* node = find(key);
+    if (node != nullptr && !node->is_array()) {
+        failAt(*node, quoted(key) + " must be an array of " + ofWhat);
+    }
+    return node == nullptr ? none : *node->as_array();
 }
 
 Bytes TableReader::keyBytes(toml::key const& key)

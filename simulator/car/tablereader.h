@@ -55,6 +55,7 @@ public:
 private:
     toml::node const* find(std::string_view key);
     toml::node const& need(std::string_view key);
+    toml::array const& array(std::string_view key, std::string const& ofWhat);
     Bytes keyBytes(toml::key const& key);
     Bytes hex(toml::node const& node) const;
     std::string string(toml::node const& node, std::string_view key) const;
