@@ -1,7 +1,5 @@
 #include "bindings/python/nativecar.h"
 
-#include "bindings/python/threads.h"
-
 #include <pybind11/stl.h>
 
 namespace py = pybind11;

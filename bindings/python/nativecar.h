@@ -44,6 +44,7 @@ private:
     std::shared_ptr<Car> open() const;
 
     std::shared_ptr<Car> m_car;
+    ClosedAtExit m_atExit{[this] { close(); }};
 };
 
 // A car with the program's settings and the given ones; None for what is not given.

@@ -1,7 +1,5 @@
 #include "bindings/python/nativewatch.h"
 
-#include "bindings/python/threads.h"
-
 #include <algorithm>
 #include <chrono>
 

@@ -1,5 +1,7 @@
 #pragma once
 
+#include "bindings/python/threads.h"
+
 #include <velmora/car.h>
 
 #include <pybind11/pybind11.h>
@@ -55,6 +57,7 @@ private:
     std::shared_ptr<Car> m_car; // stands for as long as it is watched
     std::shared_ptr<ReadingQueue> m_queue;
     Watch m_watch;
+    ClosedAtExit m_atExit{[this] { stop(); }};
 };
 
 } // namespace velmora::python

@@ -7,6 +7,7 @@
 #include <ctime>
 #include <list>
 #include <mutex>
+#include <set>
 #include <thread>
 
 namespace py = pybind11;
@@ -49,6 +50,12 @@ std::list<std::thread>& leftThreads()
 {
     static std::list<std::thread> threads; // under Python's lock
     return threads;
+}
+
+std::set<ClosedAtExit*>& openOnes()
+{
+    static std::set<ClosedAtExit*> open; // under Python's lock
+    return open;
 }
 
 bool inMainThread()
@@ -145,8 +152,24 @@ void runInterruptibly(std::function<void()> function)
     }
 }
 
+ClosedAtExit::ClosedAtExit(std::function<void()> close) : m_close(std::move(close))
+{
+    openOnes().insert(this);
+}
+
+ClosedAtExit::~ClosedAtExit()
+{
+    openOnes().erase(this);
+}
+
 void finishThreads()
 {
+    while (!openOnes().empty()) {
+        ClosedAtExit* const one = *openOnes().begin();
+        openOnes().erase(one);
+        auto const close = one->m_close; // what it belongs to may be dropped by another thread meanwhile
+        close();
+    }
     std::list<std::thread> threads = std::move(leftThreads());
     leftThreads().clear();
     py::gil_scoped_release const free;

@@ -44,7 +44,24 @@ auto interruptibly(Function function) -> std::invoke_result_t<Function&>
     return std::move(**result);
 }
 
-// Waits for what interrupted calls have left behind. With Python's lock, which it lets go.
+// Closes what is still open when Python exits, before the interpreter goes that the library's threads call into. Made,
+// dropped and run under Python's lock.
+class ClosedAtExit
+{
+public:
+    explicit ClosedAtExit(std::function<void()> close);
+    ~ClosedAtExit();
+    ClosedAtExit(ClosedAtExit const&) = delete;
+    ClosedAtExit& operator=(ClosedAtExit const&) = delete;
+
+private:
+    friend void finishThreads();
+
+    std::function<void()> m_close;
+};
+
+// Ends the library's threads: of what is still open, and those that interrupted calls have left behind. With Python's
+// lock, which it lets go.
 void finishThreads();
 
 // Processor seconds that a thread of the library takes for so many calls of a callable: what a callback costs.
