@@ -67,6 +67,7 @@ footer { color: var(--soft); font-size: .85rem; margin-top: 1.5rem; }
   section.level2 { padding: .8rem .7rem .4rem; }
   main > section.level3 { margin-left: .1rem; padding-left: .6rem; }
   table.facts th { width: 42%; }
+  table.facts td:last-child { overflow-wrap: anywhere; }
   th, td { padding-right: .4rem; }
   td:last-child { overflow-wrap: break-word; }
   .wide thead { clip-path: inset(50%); height: 1px; overflow: hidden; position: absolute; width: 1px; }
