@@ -3,6 +3,10 @@
 if(VELMORA_SANITIZE)
     add_compile_options(-fsanitize=${VELMORA_SANITIZE} -fno-sanitize-recover=all)
     add_link_options(-fsanitize=${VELMORA_SANITIZE})
+    find_program(VELMORA_MOLD mold) # links the large test programs four times as fast
+    if(VELMORA_MOLD)
+        add_link_options(-fuse-ld=mold)
+    endif()
 endif()
 
 # Source names in log calls and reports are paths from the root of the tree.

@@ -2,7 +2,8 @@
 
 cd "$(dirname "${BASH_SOURCE[0]}")/.."
 
-say() { printf '\n== %s\n' "$*"; }
+# With the minutes since the script began.
+say() { printf '\n== %s (%d:%02d)\n' "$*" $((SECONDS / 60)) $((SECONDS % 60)); }
 
 as_root() {
     if [[ $EUID -eq 0 ]]; then "$@"; else sudo "$@"; fi
@@ -26,7 +27,7 @@ build_packages+=(libsqlite3-dev libboost-dev libmosquitto-dev)
 build_packages+=(libjs-chart.js libqrcodegencpp-dev) # of the page in the browser
 build_packages+=(libsystemd-dev) # Bluetooth's service
 build_packages+=(pybind11-dev libpython3-dev python3-dev)
-test_packages=(libgtest-dev libgmock-dev libbenchmark-dev strace)
+test_packages=(libgtest-dev libgmock-dev libbenchmark-dev strace mold)
 test_packages+=(tmux zbar-tools) # what the screen is read by
 test_packages+=(clang libclang-rt-14-dev clang-format clang-tidy)
 test_packages+=(python3-jsonschema pkgconf)
