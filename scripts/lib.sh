@@ -40,7 +40,7 @@ test_packages+=(python3-dbusmock)                                           # pl
 # Some have a newer Node with an npm of its own, which Debian's package would collide with.
 command -v npm >/dev/null || test_packages+=(nodejs npm)
 
-package_packages=(debhelper dh-python dpkg-dev fakeroot lintian libjs-chart.js libqrcodegencpp-dev) # Debian's packages
+package_packages=(debhelper dh-python dpkg-dev fakeroot lintian mmdebstrap libjs-chart.js libqrcodegencpp-dev) # Debian's packages
 package_packages+=(doxygen abigail-tools xz-utils)
 
 # build PRESET [TARGET...]: configures and builds.

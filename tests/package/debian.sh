@@ -33,25 +33,43 @@ holds velmora-doc 'companion\.md'
 
 installed=(libobd0 libvelmora0 velmora obdsim python3-velmora)
 mapfile -t files < <(for name in "${installed[@]}"; do ls "$packages/$name"_*.deb; done)
+suite=$(. /etc/os-release && echo "$VERSION_CODENAME")
+# "none" for a machine that has one but is not to use it.
+mirror=${VELMORA_MIRROR:-$(apt-get indextargets --format '$(SITE)' 'Created-By: Packages' "Codename: $suite" 2>/dev/null |
+    head -n 1 || true)}
 
+# A whole system of Debian's packages and ours, which asks a mirror for what ours depend on.
 with_mmdebstrap() {
-    command -v mmdebstrap >/dev/null && [[ -n ${VELMORA_MIRROR:-} ]] &&
-        mmdebstrap --quiet --mode=auto --variant=apt --hook-dir=/usr/share/mmdebstrap/hooks/file-mirror-automount \
-            --include="$(IFS=,; echo "${files[*]}")" bookworm "$root" "$VELMORA_MIRROR"
+    [[ $EUID -eq 0 && -n $mirror && $mirror != none ]] && command -v mmdebstrap >/dev/null || return 1
+    timeout 600 mmdebstrap --quiet --mode=root --variant=apt --hook-dir=/usr/share/mmdebstrap/hooks/file-mirror-automount \
+        "${files[@]/#/--include=}" "$suite" "$root/system" "$mirror" >"$root/said" 2>&1 || { tail -n 3 "$root/said"; return 1; }
+    system=$root/system
+    enter=(chroot "$system")
 }
+# A root with nothing but ours. Maintainer scripts want more than that, so what has some is unpacked there.
 with_dpkg() {
-    mkdir -p "$root/var/lib/dpkg/updates" "$root/var/lib/dpkg/info"
-    : >"$root/var/lib/dpkg/status"
-    dpkg --root="$root" --force-depends --force-not-root --force-script-chrootless --log=/dev/null \
-        -i "${files[@]}" >/dev/null 2>&1
+    local file plain=()
+    system=$root/dpkg
+    mkdir -p "$system/var/lib/dpkg/updates" "$system/var/lib/dpkg/info"
+    : >"$system/var/lib/dpkg/status"
+    for file in "${files[@]}"; do
+        if dpkg-deb --ctrl-tarfile "$file" | tar -t | grep -E '/(pre|post)(inst|rm)$' >/dev/null; then
+            dpkg-deb -x "$file" "$system"
+        else
+            plain+=("$file")
+        fi
+    done
+    dpkg --root="$system" --force-depends --force-not-root --log=/dev/null -i "${plain[@]}" >"$root/said" 2>&1
 }
 with_unpacking() {
-    rm -rf "${root:?}"/*
+    local file
+    system=$root/unpacked
     for file in "${files[@]}"; do
-        dpkg-deb -x "$file" "$root"
+        dpkg-deb -x "$file" "$system"
     done
 }
 
+enter=()
 for way in with_mmdebstrap with_dpkg with_unpacking; do
     if "$way"; then
         echo "installed ${way//_/ }"
@@ -59,14 +77,29 @@ for way in with_mmdebstrap with_dpkg with_unpacking; do
     fi
 done
 
-export LD_LIBRARY_PATH=$root/usr/lib/$multiarch XDG_CONFIG_HOME=/proc/nonexistent
-said=$("$root/usr/bin/velmora" -q -p 'sim:petrol-can11?instant' info)
+# run PROGRAM ARGUMENT...: in the system itself where that is one to enter, else beside this one's libraries.
+run() {
+    if [[ ${#enter[@]} -gt 0 ]]; then
+        "${enter[@]}" env PATH=/usr/bin:/bin XDG_CONFIG_HOME=/proc/nonexistent "$@"
+    else
+        env PATH="$system/usr/bin:/usr/bin:/bin" LD_LIBRARY_PATH="$system/usr/lib/$multiarch" \
+            PYTHONPATH="$system/usr/lib/python3/dist-packages" XDG_CONFIG_HOME=/proc/nonexistent "$@"
+    fi
+}
+said=$(run velmora -q -p 'sim:petrol-can11?instant' info)
 [[ $said == *VIN* ]] || fail "velmora says: $said"
-"$root/usr/bin/obdsim" --list | grep -q petrol-can11 || fail "obdsim lists no vehicle"
-said=$(PYTHONPATH=$root/usr/lib/python3/dist-packages /usr/bin/python3 -c 'import velmora
+run obdsim --list | grep petrol-can11 >/dev/null || fail "obdsim lists no vehicle"
+said=$(run python3 -c 'import velmora
 with velmora.Car("sim:petrol-can11?instant") as car: print(car.read("RPM")[0])')
 [[ $said == Engine\ RPM:* ]] || fail "Python says: $said"
-for file in "$root"/usr/bin/* "$LD_LIBRARY_PATH"/lib*.so.0.*; do
+for file in "$system"/usr/bin/{velmora,obdsim} "$system/usr/lib/$multiarch"/lib{obd,velmora}.so.0.* \
+    "$system"/usr/lib/python3/dist-packages/velmora/*.so; do
     ! readelf -d "$file" | grep -E 'R(UN)?PATH' || fail "$file has a run path"
 done
+
+if [[ ${#enter[@]} -gt 0 ]]; then
+    "${enter[@]}" dpkg --purge "${installed[@]}" >"$root/said" 2>&1 || fail "not to be removed: $(<"$root/said")"
+    left=$(find "$system"/{etc,lib,usr,var/lib} -path '*/dpkg/info' -prune -o -iname '*velmora*' -print -o -name '*obdsim*' -print)
+    [[ -z $left ]] || fail "removing the packages leaves $left"
+fi
 echo "the packages are whole"
