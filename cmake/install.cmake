@@ -1,14 +1,18 @@
-# The package: libraries with their headers, the program, and what find_package needs.
+# The package: libraries with their headers, the program, and what find_package needs. The components of an installation:
+# Runtime, what programs need to run; Development, what they are built with; Program; Sim; Python.
 include(CMakePackageConfigHelpers)
 set(package_folder ${CMAKE_INSTALL_LIBDIR}/cmake/velmora)
 
-install(TARGETS obd EXPORT velmoraObdTargets)
+# install(TARGETS) of a library in its two components: the link that linkers take is of no use at run time.
+set(library_components LIBRARY COMPONENT Runtime NAMELINK_COMPONENT Development ARCHIVE COMPONENT Development)
+install(TARGETS obd EXPORT velmoraObdTargets ${library_components})
 install(
     DIRECTORY libobd/include/obd libobd/include/tervex
     DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/velmora
+    COMPONENT Development
     FILES_MATCHING PATTERN "*.h"
 )
-install(EXPORT velmoraObdTargets NAMESPACE velmora:: DESTINATION ${package_folder})
+install(EXPORT velmoraObdTargets NAMESPACE velmora:: DESTINATION ${package_folder} COMPONENT Development)
 
 # What a static companion's users must link to as well: the compiled libraries of its parts, which an application finds
 # anew. Each is named as its package and its target.
@@ -32,28 +36,33 @@ if(TARGET velmoraLibrary)
             endif()
         endforeach()
     endif()
-    install(TARGETS velmoraLibrary EXPORT velmoraCompanionTargets)
+    install(TARGETS velmoraLibrary EXPORT velmoraCompanionTargets ${library_components})
     install(
         DIRECTORY libvelmora/include/velmora bindings/c/include/velmora
         DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/velmora
+        COMPONENT Development
         FILES_MATCHING PATTERN "*.h"
     )
-    install(FILES ${PROJECT_BINARY_DIR}/generated/velmora/version.h DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/velmora/velmora)
-    install(EXPORT velmoraCompanionTargets NAMESPACE velmora:: DESTINATION ${package_folder})
+    install(
+        FILES ${PROJECT_BINARY_DIR}/generated/velmora/version.h
+        DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/velmora/velmora
+        COMPONENT Development
+    )
+    install(EXPORT velmoraCompanionTargets NAMESPACE velmora:: DESTINATION ${package_folder} COMPONENT Development)
 endif()
 # The simulator for the tests of programs: always static, for it has no stable face but its one header.
 if(TARGET obdsim)
-    install(TARGETS obdsim EXPORT velmoraSimTargets COMPONENT sim)
+    install(TARGETS obdsim EXPORT velmoraSimTargets COMPONENT Sim)
     install(
         DIRECTORY simulator/include/obdsim
         DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/velmora
-        COMPONENT sim
+        COMPONENT Sim
         FILES_MATCHING PATTERN "*.h"
     )
-    install(EXPORT velmoraSimTargets NAMESPACE velmora:: DESTINATION ${package_folder} COMPONENT sim)
+    install(EXPORT velmoraSimTargets NAMESPACE velmora:: DESTINATION ${package_folder} COMPONENT Sim)
 endif()
 if(TARGET velmora)
-    install(TARGETS velmora)
+    install(TARGETS velmora COMPONENT Program)
 endif()
 
 list(TRANSFORM companion_packages PREPEND "    find_dependency(" OUTPUT_VARIABLE companion_dependencies)
@@ -67,6 +76,7 @@ write_basic_package_version_file(${PROJECT_BINARY_DIR}/velmoraConfigVersion.cmak
 install(
     FILES ${PROJECT_BINARY_DIR}/velmoraConfig.cmake ${PROJECT_BINARY_DIR}/velmoraConfigVersion.cmake
     DESTINATION ${package_folder}
+    COMPONENT Development
 )
-install(FILES LICENSE THIRD-PARTY-NOTICES DESTINATION ${CMAKE_INSTALL_DOCDIR})
+install(FILES LICENSE THIRD-PARTY-NOTICES DESTINATION ${CMAKE_INSTALL_DOCDIR} COMPONENT Runtime)
 include(cmake/pkgconfig.cmake)
