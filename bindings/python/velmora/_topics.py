@@ -6,6 +6,21 @@ from typing import Any
 
 
 @dataclasses.dataclass(frozen=True)
+class OfModule:
+    """What belongs to one control module, by its id and name."""
+
+    module: int
+    name: str
+
+
+@dataclasses.dataclass(frozen=True)
+class Answered(OfModule):
+    """What one control module was asked; answer tells how that went."""
+
+    answer: str
+
+
+@dataclasses.dataclass(frozen=True)
 class Module:
     """A control module that answers."""
 
@@ -65,11 +80,9 @@ class CodeList:
 
 
 @dataclasses.dataclass(frozen=True)
-class ModuleCodes:
+class ModuleCodes(OfModule):
     """Lamp and trouble codes of one control module; lamp is None if it was not told."""
 
-    module: int
-    name: str
     lamp: bool | None
     lists: tuple[CodeList, ...]
 
@@ -84,12 +97,9 @@ class FrozenReading:
 
 
 @dataclasses.dataclass(frozen=True)
-class FreezeFrame:
+class FreezeFrame(Answered):
     """What a control module froze when a code was set; code is None if it froze nothing, if answer is "read"."""
 
-    module: int
-    name: str
-    answer: str
     number: int
     code: TroubleCode | None
     readings: tuple[FrozenReading, ...]
@@ -105,12 +115,9 @@ class ReadinessMonitor:
 
 
 @dataclasses.dataclass(frozen=True)
-class Readiness:
+class Readiness(Answered):
     """The monitors of one control module, as an emissions test asks for them."""
 
-    module: int
-    name: str
-    answer: str
     lamp: bool | None
     monitors: tuple[ReadinessMonitor, ...]
 
@@ -138,12 +145,9 @@ class Monitor:
 
 
 @dataclasses.dataclass(frozen=True)
-class Monitors:
+class Monitors(Answered):
     """The results of on-board tests of one control module."""
 
-    module: int
-    name: str
-    answer: str
     monitors: tuple[Monitor, ...]
 
 
@@ -156,11 +160,9 @@ class Calibration:
 
 
 @dataclasses.dataclass(frozen=True)
-class Info:
+class Info(OfModule):
     """What one control module says of itself and the vehicle; None is what was not told."""
 
-    module: int
-    name: str
     vin: str | None
     description: str | None
     standard: str | None
@@ -183,21 +185,16 @@ class Counter:
 
 
 @dataclasses.dataclass(frozen=True)
-class Counters:
+class Counters(Answered):
     """The in-use counters of one control module that are not 0."""
 
-    module: int
-    name: str
-    answer: str
     counters: tuple[Counter, ...]
 
 
 @dataclasses.dataclass(frozen=True)
-class Cleared:
+class Cleared(OfModule):
     """What one control module said to clearing: "cleared", "refused", "no answer" or "unreadable"."""
 
-    module: int
-    name: str
     result: str
     reason: str | None
 
