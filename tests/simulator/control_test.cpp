@@ -199,6 +199,19 @@ TEST(Control, helpTellsEveryFormAndSoDoesTheGuide)
     }
 }
 
+TEST(Control, carIsReachedWhileItIsServed)
+{
+    Simulator car;
+    EXPECT_EQ(car.serveTcp().substr(0, 10), "127.0.0.1:");
+    car.control("voltage 11.8");
+    EXPECT_THROW(car.control("voltage much"), velmora::sim::Error);
+    EXPECT_EQ(car.ask("ATRV"), "ATRV\r11.8V\r\r>");
+    EXPECT_EQ(car.count("ATRV"), 1U);
+    car.stop();
+    EXPECT_EQ(car.servePseudoTerminal().substr(0, 5), "/dev/");
+    EXPECT_EQ(car.scenario().find("voltage 11.8"), car.scenario().find("voltage"));
+}
+
 TEST(Scenario, linesAreReadAndMistakesNameTheirPlace)
 {
     auto const lines = obdsim::parseScenario("# a drive\n0.5 ignition off\n\n 2\tvoltage 11.8 \n", "x");

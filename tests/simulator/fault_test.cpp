@@ -114,7 +114,11 @@ TEST(FaultyPeer, errorWordTakesThePlaceOfAReply)
     auto host = faulty({"error:BUS BUSY@3"});
     host.ask("ATE0");
     EXPECT_EQ(host.ask("0100").substr(0, 13), "SEARCHING...\r");
-    EXPECT_EQ(host.ask("0100"), "BUS BUSY\r\r>");
+    const Time start = host.peer().now();
+    host.peer().receive("0100\r");
+    EXPECT_EQ(host.peer().advanceTo(start + Ms(19)), "");
+    EXPECT_EQ(host.peer().advanceTo(start + Ms(20)), "BUS BUSY\r\r>");
+    host.listen();
     EXPECT_EQ(host.ask("0100").substr(0, 5), "41 00");
 }
 
@@ -146,6 +150,7 @@ TEST(FaultyPeer, adapterFallsSilentAndSpeaksAgainToANewClient)
     EXPECT_EQ(host.ask("ATI"), "");
     host.peer().connect();
     EXPECT_EQ(host.ask("ATI"), "ELM327 v1.5\r\r>");
+    EXPECT_EQ(faulty({"silent@1"}).ask("ATI"), "ATI") << "what was echoed before";
 }
 
 TEST(FaultyPeer, adapterStartsAnewInPlaceOfAReply)

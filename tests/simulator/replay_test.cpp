@@ -108,6 +108,23 @@ TEST(Replay, repeatedReplyHasNoSearchNotice)
     EXPECT_EQ(host.ask("0100"), "86F1124100983B2013D0\r\r>");
 }
 
+TEST(Replay, noticeIsTakenOutOfTheMiddleToo)
+{
+    auto host = replaying(kwp, "-> 0100\n<- \\rBUS INIT: ...OK\\r\\n86F1124100983B2013D0\\r\\r>\n");
+    host.ask("ATE0");
+    EXPECT_EQ(host.ask("0100"), "\rBUS INIT: ...OK\r\n86F1124100983B2013D0\r\r>");
+    EXPECT_EQ(host.ask("0100"), "\r86F1124100983B2013D0\r\r>");
+}
+
+TEST(Replay, protocolNotToldInTheHeaderIsThatOfTheRecordedAnswer)
+{
+    auto host = replaying("adapter: ELM327 v2.2\nprotocol: 0\nheaders: off\n",
+                          "-> 0100\n<- 4100BE3EA813\\r\\r>\n-> ATDPN\n<- A6\\r\\r>\n-> ATDPN\n<- A7\\r\\r>\n");
+    host.ask("ATE0");
+    EXPECT_EQ(host.ask({"ATSP3", "0100"}), "BUS INIT: ...ERROR\r\r>");
+    EXPECT_EQ(host.ask({"ATSP6", "0100"}), "4100BE3EA813\r\r>");
+}
+
 TEST(Replay, lateHeadersShowOnlyWhatWasRecordedWithThem)
 {
     auto host = recorded("can11-a180d-three-modules");

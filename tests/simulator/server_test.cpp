@@ -1,3 +1,4 @@
+#include "simulator/peerplayer.h"
 #include "simulator/server.h"
 #include "simulator/simulation.h"
 #include "simulator/unsenttext.h"
@@ -153,6 +154,20 @@ TEST(TcpServer, lostLinkClosesTheConnectionAndTheNextOneIsServed)
     }
     Line next(connectTo(server->address()));
     EXPECT_EQ(next.ask("ATE0"), "OK\r\r>");
+}
+
+TEST(PeerPlayer, whatIsDueIsSaidBeforeMoreIsHeard)
+{
+    asio::io_context context;
+    obdsim::PeerPlayer player(context, obdsim::simulate({}), 1e6);
+    std::string said;
+    player.connect([&said](std::string const& bytes) { said += bytes; }, [] {});
+    player.receive("ATI\r");
+    auto const end = steady_clock::now() + std::chrono::seconds(5);
+    while (said.find('>') == std::string::npos && steady_clock::now() < end) {
+        player.catchUp();
+    }
+    EXPECT_EQ(said, "ATI\rELM327 v1.5\r\r>");
 }
 
 TEST(UnsentText, holdsWhatFitsAndTakesMoreWhenItIsRead)

@@ -226,6 +226,14 @@ TEST(ProtocolSearch, findsEachOfTheNine)
     }
 }
 
+TEST(BusRequest, receiverAddressOfALineIsChosenAndLeftToTheAdapterAgain)
+{
+    auto host = simulated("petrol-iso9141");
+    host.ask({"ATE0", "ATS0", "ATSP3", "0100"});
+    EXPECT_EQ(host.ask({"ATSR99", "0100"}), "NO DATA\r\r>");
+    EXPECT_EQ(host.ask({"ATAR", "0100"}), "4100BE3EB811\r\r>");
+}
+
 TEST(ProtocolSearch, startsTheBusOfAChosenProtocol)
 {
     EXPECT_EQ(simulated("petrol-iso9141").ask({"ATE0", "ATS0", "ATSP3", "0100"}), "BUS INIT: ...OK\r4100BE3EB811\r\r>");

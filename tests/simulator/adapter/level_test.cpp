@@ -18,10 +18,14 @@ struct LevelCase
 TEST(Level, commandsAreKnownFromTheirVersionOn)
 {
     const LevelCase cases[] = {
-        {"KW1", 120},  {"IFR2", 120}, {"D0", 130},   {"CRA7E8", 130}, {"JE", 130},         {"FE", 131},
-        {"SS", 140},   {"RD", 140},   {"SD12", 140}, {"IB48", 140},   {"CSM1", 142},       {"JHF0", 142},
-        {"CRA", 142},  {"JTM1", 142}, {"AMC", 200},  {"AMT20", 200},  {"SH18DA10F1", 200}, {"CRA7XX", 200},
-        {"CTM1", 210}, {"IFR5", 220}, {"IB12", 220}, {"CER01", 220},  {"FT", 220},         {"C1", 230},
+        {"KW1", 120},          {"IFR2", 120},       {"D0", 130},          {"CRA7E8", 130}, {"JE", 130},
+        {"FE", 131},           {"SS", 140},         {"RD", 140},          {"SD12", 140},   {"IB48", 140},
+        {"CSM1", 142},         {"JHF0", 142},       {"CRA", 142},         {"JTM1", 142},   {"AMC", 200},
+        {"AMT20", 200},        {"SH18DA10F1", 200}, {"CRA7XX", 200},      {"CTM1", 210},   {"IFR5", 220},
+        {"IB12", 220},         {"CER01", 220},      {"FT", 220},          {"C1", 230},     {"CF18DAF110", 100},
+        {"CM1FFFFFFF", 100},   {"SP00", 100},       {"ST6", 100},         {"SW9", 100},    {"@2", 100},
+        {"FCSH18DA10F1", 110}, {"PP0CON", 110},     {"PP0COFF", 110},     {"IFRS", 120},   {"MP00FECA", 120},
+        {"CRA18DAF110", 130},  {"JTM5", 142},       {"CRA18DAF1XX", 200}, {"FT10", 220},
     };
     obdsim::AdapterProfile profile = *obdsim::findProfile("elm327-v2.3");
     for (auto const& row : cases) {

@@ -224,4 +224,13 @@ TEST(Rates, areThoseOfBusModuleAndLine)
     }
 }
 
+TEST(LineRate, whatWasUnderWayIsLostWithTheConnection)
+{
+    auto host = simulated("petrol-can11", "elm327-v1.5", {"baud=9600"});
+    host.ask("ATE0");
+    host.peer().receive("AT@1\r");
+    host.peer().connect();
+    EXPECT_EQ(host.ask("ATI"), "ELM327 v1.5\r\r>");
+}
+
 } // namespace

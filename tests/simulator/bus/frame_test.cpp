@@ -130,6 +130,9 @@ const TargetCase targetCases[] = {
     {5, "82 13 F0", false, 0x13},
     {3, "68 6A F1", true, 0},
     {2, "6C 10 F1", false, 0x10},
+    {2, "68 10 F1", false, 0x10},
+    {2, "6C 6A F1", false, 0x6A},
+    {5, "BF 33 F1", false, 0x33},
     {1, "61 6A F1", true, 0},
     {1, "C4 10 F1", false, 0x10},
 };

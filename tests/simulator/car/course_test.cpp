@@ -64,6 +64,15 @@ TEST(Course, columnsGoBeforeTheModel)
     EXPECT_NE(talk.ask("0105").find("41 05 78"), std::string::npos) << "80 degrees";
 }
 
+TEST(Course, builtInWeatherGoesBeforeTheCars)
+{
+    obdsim::SimulationOptions options;
+    options.drive = "cold-start";
+    Conversation talk(obdsim::simulate(options));
+    EXPECT_EQ(talk.ask({"ATE0", "ATS0", "ATSP6", "0105"}).substr(0, 6), "410521") << "-7 degrees";
+    EXPECT_EQ(talk.ask("0146").substr(0, 6), "414621");
+}
+
 TEST(Course, mistakesNameFileAndLine)
 {
     std::pair<char const*, char const*> const cases[] = {

@@ -31,6 +31,7 @@ TEST(Service22, tellsIdentifiersTogetherAndRefusesByCode)
     EXPECT_EQ(host.ask("22F4001"), "7E9037F223100000000\r\r>") << "no PID of service 01";
     host.ask("ATSH7E0");
     EXPECT_EQ(host.ask("22F41C1"), "7E80462F41C06000000\r\r>") << "F4xx is PID xx";
+    EXPECT_EQ(host.ask("22F190AA1"), "7E8037F221300000000\r\r>") << "half an identifier";
     EXPECT_EQ(host.ask("22F190").substr(0, 19), "7E8101462F19056454C");
     EXPECT_EQ(host.ask("3E001"), "7E8027E000000000000\r\r>");
     EXPECT_EQ(host.ask("3E80"), "NO DATA\r\r>");
@@ -44,6 +45,22 @@ TEST(Service22, answersAreLateOrAnnouncedTwice)
     EXPECT_EQ(host.ask("221E21"), "NO DATA\r\r>");
     host.pass(Ms(500));
     EXPECT_EQ(host.ask("221E1C2").substr(0, 20), "7E904621E2102000000\r") << "the late answer comes first";
+}
+
+TEST(Service21, numbersBeyondAFieldAreCutToIt)
+{
+    auto host = withVehicle(R"(
+name = "Car"
+protocol = 6
+[[module]]
+id = "7E8"
+[[module.signals]]
+request = "2101"
+data = "AA 00 00 00 00 AA"
+fields = [{ at = 1, bytes = 2, value = "speed", offset = -100000 }, { at = 3, value = "speed", offset = 300 },
+          { at = 4, value = "speed", offset = -1 }]
+)");
+    EXPECT_EQ(host.ask({"ATE0", "ATS0", "ATSP6", "ATSH7E0", "2101"}), "008\r0:6101AA8000FF\r1:FFAA0000000000\r\r>");
 }
 
 TEST(Services21And1A, tellLocalIdentifiers)

@@ -58,12 +58,115 @@ TEST(VehicleFile, errorsNameFileAndLine)
         {head + "[module.delays]\n\"0902\" = 5\n", "car.toml:6: \"0902\" must be a table"},
         {"name = \"Car\"\nprotocol = 6\n[[module]]\nid = \"10\"\n",
          "car.toml:4: \"id\" must have 3 hexadecimal digits on this bus"},
+        {"name = \"Car\"\nprotocol = 6\nvolts = \"12\"\n", "car.toml:3: \"volts\" must be a number"},
+        {"name = \"Car\"\nprotocol = 6\nw4 = 51\n", "car.toml:3: \"w4\" must be a whole number from 25 to 50"},
+        {"name = \"Car\"\nprotocol = 6\npadding = \"0000\"\n",
+         "car.toml:3: \"padding\" must be one byte of two hexadecimal digits"},
+        {"name = \"Car\"\nprotocol = 6\nengine = 1\n", "car.toml:3: \"engine\" must be a table"},
+        {"name = \"Car\"\nprotocol = 6\nmodule = 1\n", "car.toml:3: \"module\" must be an array of tables"},
+        {"name = \"Car\"\nprotocol = 6\nmodule = [1]\n", "car.toml:3: \"module\" must be an array of tables"},
+        {"name = \"Car\"\nprotocol = 7\n[[module]]\nid = \"7E8\"\n",
+         "car.toml:4: \"id\" must have 8 hexadecimal digits on this bus"},
+        {"name = \"Car\"\nprotocol = 5\n[[module]]\nid = \"7E8\"\n",
+         "car.toml:4: \"id\" must have 2 hexadecimal digits on this bus"},
+        {"name = \"Car\"\nprotocol = 6\n[[module]]\nid = \"7X8\"\n",
+         "car.toml:4: \"id\" must have 3 hexadecimal digits on this bus"},
+        {head + "stored = \"P0133\"\n", "car.toml:5: \"stored\" must be an array of texts"},
+        {head + "stored = [5]\n", "car.toml:5: \"stored\" must be a text"},
+        {head + "fixed = { \"1C1D\" = \"06\" }\n", "car.toml:5: a row is one byte and its data"},
+        {head + "fixed = { \"1C\" = [\"06\", \"07\"] }\n", "car.toml:5: a row is one byte and its data"},
+        {head + "most_pids = 7\n", "car.toml:5: \"most_pids\" must be a whole number from 1 to 6"},
+        {head + "more_pids = \"all\"\n", "car.toml:5: \"more_pids\" must be \"silence\", \"refuse\" or \"first\""},
+        {head + "[module.info]\nserial = \"123456789012345678\"\n",
+         "car.toml:6: \"serial\" is longer than 17 characters"},
+        {head + "[module.info]\ntype_approval = \"123456789012345678\"\n",
+         "car.toml:6: \"type_approval\" is longer than 17 characters"},
+        {head + "[module.info]\necu_name = \"ECM-EngineControlModules\"\n",
+         "car.toml:6: \"ecu_name\" is longer than 20 characters"},
+        {head + "[module.info]\ncalibrations = [\"12345678901234567\"]\n",
+         "car.toml:6: \"calibrations\" is longer than 16 characters"},
+        {head + "[module.info]\nspark_counters = 5\n", "car.toml:6: \"spark_counters\" must be an array of numbers"},
+        {head + "[module.info]\nspark_counters = [65536]\n",
+         "car.toml:6: \"spark_counters\" must hold whole numbers from 0 to 65535"},
+        {head + "[module.info]\nspark_counters = [-1]\n",
+         "car.toml:6: \"spark_counters\" must hold whole numbers from 0 to 65535"},
+        {head + "[[module.frames]]\nnumber = 256\ncode = \"P0100\"\n",
+         "car.toml:6: \"number\" must be a whole number from 0 to 255"},
+        {head + "[module.refusals]\n\"22F190\" = \"3131\"\n", "car.toml:6: a refusal is one response code"},
+        {head + "[module.refusals]\n\"22F190\" = [\"31\", \"31\"]\n", "car.toml:6: a refusal is one response code"},
+        {head + "[[module.signals]]\nrequest = \"2201\"\n",
+         "car.toml:6: a signal is asked by 22 and two bytes, or by 21 or 1A and one"},
+        {head + "[[module.signals]]\nrequest = \"210101\"\n", "car.toml:6: a signal is asked by 22"},
+        {head + "[[module.signals]]\nrequest = \"2101\"\ndata = \"0000\"\nfields = [{ at = 1, bytes = 2, value = "
+                "\"rpm\" }]\n",
+         "car.toml:8: the field ends behind the data"},
+        {head + "[[module.signals]]\nrequest = \"2101\"\ndata = \"00\"\nfields = [{ at = 0, value = \"colour\" }]\n",
+         "car.toml:8: the drive has no \"colour\""},
         {"name = \"Car\"\nprotocol = 6\n[engine]\nfuel = \"coal\"\n",
          "car.toml:4: \"fuel\" must be \"petrol\" or \"diesel\""},
     };
     for (auto const& row : cases) {
         EXPECT_EQ(errorOf(row.text).substr(0, row.error.size()), row.error) << row.text;
     }
+}
+
+TEST(VehicleFile, limitsThemselvesAreTaken)
+{
+    const std::string full(17, 'A');
+    auto const car =
+        parseVehicle("w4 = 25\nvolts = 12.5\npadding = \"none\"\n" + head +
+                         "latency = 60000\nmost_pids = 6\nframe_gap = 5\nmore_pids = \"refuse\"\n[module.info]\n"
+                         "vin = \"" +
+                         full + "\"\nserial = \"" + full +
+                         "\"\nverifications = [\"AABBCCDD\"]\n"
+                         "ecu_name = \"ECM-EngineControl12\"\ncalibrations = [\"1234567890123456\"]\n"
+                         "spark_counters = [0, 65535]\n"
+                         "[[module.signals]]\nrequest = \"2101\"\ndata = \"000000\"\n"
+                         "fields = [{ at = 1, bytes = 2, value = \"rpm\" }]\n",
+                     "car.toml");
+    EXPECT_EQ(car.volts, 12.5);
+    EXPECT_FALSE(car.padding);
+    EXPECT_EQ(car.addressPause, obdsim::Ms(25));
+    ASSERT_EQ(car.modules.size(), 1U);
+    auto const& module = car.modules[0];
+    EXPECT_EQ(module.latency, obdsim::Ms(60000));
+    EXPECT_EQ(module.frameGap, obdsim::Ms(5));
+    EXPECT_EQ(module.morePids, obdsim::MorePids::Refuse);
+    EXPECT_EQ(module.mostPids, 6);
+    EXPECT_EQ(module.info.sparkCounters, (std::vector<std::uint16_t>{0, 65535}));
+    EXPECT_EQ(module.info.ecuName, std::string("ECM\0-EngineControl12", 20)) << "the acronym fills four bytes";
+    auto const& field = module.signals.begin()->second.fields.at(0);
+    EXPECT_EQ(field.at, 1U);
+    EXPECT_EQ(field.scale, 1);
+    EXPECT_EQ(field.offset, 0);
+}
+
+TEST(VehicleFile, plainCarIsWhatMostCarsAre)
+{
+    auto const car = parseVehicle(head, "car.toml");
+    EXPECT_EQ(car.padding, 0);
+    EXPECT_FALSE(car.volts);
+    auto const& module = car.modules.at(0);
+    EXPECT_EQ(module.latency, obdsim::Ms(15));
+    EXPECT_EQ(module.mostPids, 6);
+    EXPECT_EQ(module.morePids, obdsim::MorePids::First);
+    EXPECT_TRUE(module.functional);
+    EXPECT_TRUE(module.clearsWhileRunning);
+    EXPECT_FALSE(module.uds);
+    EXPECT_FALSE(module.refuses);
+    EXPECT_FALSE(module.lamp);
+    EXPECT_FALSE(module.hasStored || module.hasPending || module.hasPermanent);
+    auto const old = parseVehicle("name = \"Car\"\nprotocol = 5\n[[module]]\nid = \"10\"\n", "car.toml");
+    EXPECT_EQ(old.modules.at(0).mostPids, 1);
+    EXPECT_EQ(old.modules.at(0).morePids, obdsim::MorePids::Silence);
+    auto const diesel = parseVehicle("name = \"Car\"\nprotocol = 6\n[engine]\nfuel = \"diesel\"\n", "car.toml");
+    EXPECT_TRUE(diesel.engine.compression && diesel.engine.boosted);
+    EXPECT_EQ(diesel.engine.topSpeedKmh, 92);
+    EXPECT_EQ(diesel.engine.startFuelPercent, 63);
+    EXPECT_EQ(diesel.engine.startCoolantCelsius, 62);
+    EXPECT_EQ(diesel.engine.idleRpm, 780);
+    EXPECT_EQ(diesel.engine.litres, 1.6);
+    EXPECT_EQ(diesel.engine.ambientCelsius, 18);
 }
 
 TEST(VehicleFile, codesAreTwoBytes)
