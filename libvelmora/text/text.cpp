@@ -14,19 +14,6 @@ bool isContinuation(char byte)
     return (static_cast<unsigned char>(byte) & 0xC0) == 0x80;
 }
 
-// The first characters of a UTF-8 text.
-std::string firstCharacters(std::string const& text, std::size_t count)
-{
-    std::size_t end = 0;
-    while (end < text.size() && (count > 0 || isContinuation(text[end]))) {
-        if (!isContinuation(text[end])) {
-            --count;
-        }
-        ++end;
-    }
-    return text.substr(0, end);
-}
-
 // How many bytes the UTF-8 character at the place has; 0 if there is none that may be shown.
 std::size_t characterLength(std::string const& text, std::size_t at)
 {
@@ -105,22 +92,6 @@ std::vector<std::string> splitWords(std::string const& text)
         begin = text.find_first_not_of(separators, end);
     }
     return words;
-}
-
-std::size_t displayWidth(std::string const& text)
-{
-    return static_cast<std::size_t>(
-        std::count_if(text.begin(), text.end(), [](char byte) { return !isContinuation(byte); }));
-}
-
-std::string fitted(std::string const& text, std::size_t width, bool rightAligned)
-{
-    std::size_t const shown = displayWidth(text);
-    if (shown > width) {
-        return width == 0 ? std::string() : firstCharacters(text, width - 1) + "…";
-    }
-    std::string const blanks(width - shown, ' ');
-    return rightAligned ? blanks + text : text + blanks;
 }
 
 std::size_t editDistance(std::string const& left, std::string const& right)

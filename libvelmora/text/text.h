@@ -3,6 +3,7 @@
 #include <cstddef>
 #include <optional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 namespace velmora {
@@ -23,8 +24,12 @@ std::vector<std::string> splitWords(std::string const& text);
 // U+FFFD.
 std::string readable(std::string const& text);
 
-// How many characters a UTF-8 text shows.
-std::size_t displayWidth(std::string const& text);
+// How many columns of a terminal a UTF-8 text takes: two for wide characters, none for those that join the one before.
+// The same in every locale.
+std::size_t displayWidth(std::string_view text);
+
+// How many bytes of it fill that many columns at most; what joins the last character goes with it.
+std::size_t bytesOfWidth(std::string_view text, std::size_t width);
 
 // The text in exactly that many columns: filled with blanks, at the left for rightAligned, or cut with an ellipsis.
 std::string fitted(std::string const& text, std::size_t width, bool rightAligned = false);

@@ -51,12 +51,17 @@ std::size_t bytesOfColumns(std::string_view text, std::size_t columns)
 {
     std::size_t at = 0;
     while (at < text.size()) {
-        std::size_t const sequence = sequenceLength(text.substr(at));
-        bool const continues = (static_cast<unsigned char>(text[at]) & 0xC0) == 0x80;
-        if (sequence == 0 && !continues && columns-- == 0) {
-            return at;
+        if (std::size_t const sequence = sequenceLength(text.substr(at)); sequence != 0) {
+            at += sequence;
+            continue;
         }
-        at += std::max<std::size_t>(sequence, 1);
+        std::string_view const plain = text.substr(at, std::max<std::size_t>(text.find('\033', at + 1) - at, 1));
+        std::size_t const fits = bytesOfWidth(plain, columns);
+        if (fits < plain.size()) {
+            return at + fits;
+        }
+        columns -= displayWidth(plain);
+        at += plain.size();
     }
     return at;
 }
@@ -67,7 +72,7 @@ std::size_t hangOf(std::string_view line, std::size_t columns)
     std::size_t const indent = std::min(line.find_first_not_of(' '), line.size());
     std::size_t const gap = line.rfind("  ");
     if (gap != std::string_view::npos && gap >= indent) {
-        std::size_t const column = displayWidth(std::string(line.substr(0, gap + 2)));
+        std::size_t const column = displayWidth(line.substr(0, gap + 2));
         if (column <= columns / 2 && line.substr(0, gap).find('\033') == std::string_view::npos) {
             return column;
         }

@@ -27,4 +27,26 @@ TEST(Text, ReadableShowsNoiseAsReplacementCharacters)
                                                 "b");
 }
 
+TEST(Text, WidthsAreThoseOfATerminal)
+{
+    using velmora::displayWidth;
+    EXPECT_EQ(displayWidth("abc"), 3U);
+    EXPECT_EQ(displayWidth("21 \u00B0C \u2588"), 7U);
+    EXPECT_EQ(displayWidth("\u65E5\u672C"), 4U) << "wide characters";
+    EXPECT_EQ(displayWidth("e\u0301"), 1U) << "an accent joins its letter";
+    EXPECT_EQ(displayWidth("a\xFF\xE2\x82"), 4U) << "bytes that are no characters";
+    EXPECT_EQ(velmora::bytesOfWidth("\u65E5\u672C", 3), 3U);
+    EXPECT_EQ(velmora::bytesOfWidth("e\u0301x", 1), 3U);
+}
+
+TEST(Text, FittedFillsTheWidthExactly)
+{
+    using velmora::fitted;
+    EXPECT_EQ(fitted("ab", 4), "ab  ");
+    EXPECT_EQ(fitted("ab", 4, true), "  ab");
+    EXPECT_EQ(fitted("abcdef", 4), "abc\u2026");
+    EXPECT_EQ(fitted("\u65E5\u672C\u65E5", 4), "\u65E5\u2026 ") << "half of a wide character can't be shown";
+    EXPECT_EQ(fitted("ab", 0), "");
+}
+
 } // namespace
