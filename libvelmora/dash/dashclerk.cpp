@@ -9,12 +9,11 @@
 #include "libvelmora/read/makerreader.h"
 #include "libvelmora/report/clearreport.h"
 #include "libvelmora/text/text.h"
+#include "libvelmora/vehicle/vehiclekey.h"
 #include "libvelmora/vehicle/vin.h"
 #include "libvelmora/watch/watchsources.h"
 
 #include <velmora/error.h>
-
-#include <fmt/format.h>
 
 #include <algorithm>
 #include <sstream>
@@ -25,16 +24,6 @@ namespace velmora {
 namespace {
 
 constexpr unsigned int consoleLimitMs = 5000;
-
-// The page needs to know the vehicle again, nobody needs to read its number in a file of layouts.
-std::string keyOfVin(std::string const& vin)
-{
-    std::uint64_t hash = 0xCBF29CE484222325;
-    for (char const each : vin) {
-        hash = (hash ^ static_cast<unsigned char>(each)) * 0x100000001B3;
-    }
-    return fmt::format("vehicle-{:016x}", hash);
-}
 
 Json moduleHead(obd::IEcu& ecu)
 {
@@ -110,7 +99,7 @@ void DashClerk::introduce()
     Session& session = *m_car.session();
     DashVehicle vehicle{m_name, {}};
     if (isVin(m_car.vin())) {
-        vehicle.key = keyOfVin(m_car.vin());
+        vehicle.key = vehicleKey(m_car.vin());
     }
     vehicle.offered = m_offered = offeredEntries(session);
     m_desk.tell(vehicle);

@@ -1,6 +1,7 @@
 #include "libvelmora/history/history.h"
 
 #include "libvelmora/history/scanjson.h"
+#include "libvelmora/session/userfolders.h"
 
 #include <velmora/error.h>
 
@@ -190,17 +191,8 @@ History::Imported History::importFrom(std::istream& in)
 
 std::filesystem::path History::defaultFile()
 {
-    auto const variable = [](char const* name) {
-        char const* const text = std::getenv(name);
-        return std::string(text != nullptr ? text : "");
-    };
-    if (std::string const file = variable("VELMORA_HISTORY"); !file.empty()) {
-        return file;
-    }
-    std::string const data = variable("XDG_DATA_HOME");
-    std::filesystem::path const home = variable("HOME");
-    std::filesystem::path const folder = data.empty() ? home / ".local" / "share" : std::filesystem::path(data);
-    return folder / "velmora" / "history.db";
+    char const* const file = std::getenv("VELMORA_HISTORY");
+    return file != nullptr && *file != '\0' ? std::filesystem::path(file) : userDataFolder() / "history.db";
 }
 
 } // namespace velmora
