@@ -175,6 +175,17 @@ bool SettingsStore::getString(std::string const& key, std::string& value)
     return get(key, value);
 }
 
+std::vector<std::string> SettingsStore::keysBelow(std::string const& beginning)
+{
+    std::lock_guard const lock(m_mutex);
+    std::vector<std::string> keys;
+    for (auto each = m_values.lower_bound(beginning); each != m_values.end() && each->first.starts_with(beginning);
+         ++each) {
+        keys.push_back(each->first.substr(beginning.size()));
+    }
+    return keys;
+}
+
 std::string SettingsStore::toToml() const
 {
     toml::table root;

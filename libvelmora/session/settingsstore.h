@@ -7,6 +7,7 @@
 #include <mutex>
 #include <string>
 #include <variant>
+#include <vector>
 
 namespace velmora {
 
@@ -25,6 +26,8 @@ public:
     bool getString(std::string const& key, std::string& value) override;
     // As if the key had never been set.
     void remove(std::string const& key);
+    // What stands behind that beginning in the keys that have it.
+    std::vector<std::string> keysBelow(std::string const& beginning);
     // Writes the file. Throws Error if it can't.
     void sync() override;
 

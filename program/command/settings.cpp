@@ -1,3 +1,4 @@
+#include "libvelmora/read/sensorlimits.h"
 #include "libvelmora/report/json.h"
 #include "libvelmora/session/settingsstore.h"
 #include "libvelmora/session/vehiclesettings.h"
@@ -38,6 +39,38 @@ Json toJson(VehicleSetting const& setting, SettingsStore& store)
             {"key", setting.key}};
 }
 
+constexpr char const* limitPrefix = "limit.";
+
+Json limitJson(std::string const& sensor, SettingsStore& store)
+{
+    return {{"name", limitPrefix + sensor},
+            {"title", "Limit of " + sensor},
+            {"value", textOrNull(limitText(limitOf(store, sensor)))},
+            {"unit", nullptr},
+            {"range", "highest, or lowest..highest"},
+            {"default", nullptr},
+            {"key", "limit/" + sensor}};
+}
+
+// A value of "none" takes the limit away.
+void explainLimit(SettingsOptions const& chosen, SettingsStore& store, GlobalOptions const& options)
+{
+    std::string const sensor = limitKey(chosen.name.substr(std::string(limitPrefix).size()));
+    if (!chosen.value.empty()) {
+        setLimit(store, sensor, chosen.value == "none" ? SensorLimit() : parseLimit(chosen.value));
+        store.sync();
+    }
+    if (options.json) {
+        fmt::print("{}", printed(limitJson(sensor, store)));
+        return;
+    }
+    printText(fmt::format("Limit of {}\n{}{}", sensor,
+                          wrapped("In the sensor's metric unit: the highest value, such as 6000, or a range such as "
+                                  "11.8..14.8, or none. live marks values outside.",
+                                  76, "  "),
+                          labelledLine("Value", limitText(limitOf(store, sensor)))));
+}
+
 std::string withUnit(VehicleSetting const& setting, std::string const& value)
 {
     return *setting.unit != '\0' ? value + " " + setting.unit : value;
@@ -50,12 +83,18 @@ void list(SettingsStore& store, GlobalOptions const& options)
         for (VehicleSetting const& setting : vehicleSettings()) {
             document.push_back(toJson(setting, store));
         }
+        for (std::string const& sensor : limitedSensors(store)) {
+            document.push_back(limitJson(sensor, store));
+        }
         fmt::print("{}", printed(document));
         return;
     }
     std::vector<std::vector<Cell>> rows;
     for (VehicleSetting const& setting : vehicleSettings()) {
         rows.push_back({{setting.name}, {withUnit(setting, shownSetting(setting, store))}, {shownRange(setting)}});
+    }
+    for (std::string const& sensor : limitedSensors(store)) {
+        rows.push_back({{limitPrefix + sensor}, {limitText(limitOf(store, sensor))}, {}});
     }
     printText(fmt::format("{}\n{}\n  velmora settings NAME explains one, velmora settings NAME VALUE sets it\n",
                           store.file().string(), drawColumns(rows, "  ", outputStyle(options))));
@@ -80,6 +119,10 @@ ExitCode settings(SettingsOptions const& chosen, GlobalOptions const& options)
         list(store, options);
         return ExitCode::Done;
     }
+    if (chosen.name.starts_with(limitPrefix)) {
+        explainLimit(chosen, store, options);
+        return ExitCode::Done;
+    }
     VehicleSetting const& setting = findSetting(chosen.name);
     if (!chosen.value.empty()) {
         setSetting(setting, chosen.value, store);
@@ -97,7 +140,9 @@ void addSettingsCommand(CommandLine& commandLine)
     CLI::App* const command =
         commandLine.addCommand("settings", "List, explain and set the settings of the vehicle",
                                [chosen](GlobalOptions const& options) { return settings(*chosen, options); });
-    command->add_option("NAME", chosen->name, "Setting to explain, such as displacement; without, all are listed")
+    command
+        ->add_option("NAME", chosen->name,
+                     "Setting to explain, such as displacement, or limit.SENSOR; without, all are listed")
         ->type_name("");
     command->add_option("VALUE", chosen->value, "What to set it to, in the unit of the list, such as 1.6")
         ->type_name("");

@@ -1,0 +1,55 @@
+#include "libvelmora/read/sensorlimits.h"
+#include "libvelmora/session/settingsstore.h"
+
+#include <velmora/error.h>
+
+#include <gtest/gtest.h>
+
+#include <filesystem>
+#include <fstream>
+
+namespace {
+
+using namespace velmora;
+
+TEST(SensorLimits, AreANumberOrARange)
+{
+    EXPECT_EQ(parseLimit("6000"), (SensorLimit{{}, 6000.0}));
+    EXPECT_EQ(parseLimit("11.8.."), (SensorLimit{11.8, {}}));
+    EXPECT_EQ(parseLimit("-40..120"), (SensorLimit{-40.0, 120.0}));
+    for (char const* const text : {"6000", "11.8..", "11.8..14.8", "..5"}) {
+        EXPECT_EQ(parseLimit(limitText(parseLimit(text))), parseLimit(text)) << text;
+    }
+    for (char const* const text : {"", "..", "a", "1..b", "nan", "inf", "5..4", "1...2", "1 "}) {
+        EXPECT_THROW(parseLimit(text), Error) << text;
+    }
+}
+
+TEST(SensorLimits, TheirSensorHasManyNames)
+{
+    for (char const* const name : {"RPM", "rpm", "0C", "010C", "0x0C", "$0C"}) {
+        EXPECT_EQ(limitKey(name), "RPM") << name;
+    }
+    EXPECT_EQ(limitKey("BATTERY_PACK"), "BATTERY_PACK") << "a signal's id";
+    EXPECT_THROW(limitKey("a/b"), Error);
+    EXPECT_THROW(limitKey(""), Error);
+}
+
+TEST(SensorLimits, AreKeptInTheSettings)
+{
+    std::filesystem::path const file = testing::TempDir() + "velmora-limits.toml";
+    std::ofstream(file) << "[limit]\nSPEED = 130\nMAF = \"nonsense\"\n";
+    SettingsStore store(file);
+    setLimit(store, "RPM", parseLimit("800..6000"));
+    store.sync();
+    SettingsStore again(file);
+    EXPECT_EQ(limitOf(again, "RPM"), (SensorLimit{800.0, 6000.0}));
+    EXPECT_EQ(limitOf(again, "SPEED"), (SensorLimit{{}, 130.0})) << "as a person writes it";
+    EXPECT_EQ(limitOf(again, "MAF"), SensorLimit());
+    EXPECT_EQ(limitedSensors(again), (std::vector<std::string>{"MAF", "RPM", "SPEED"}));
+    setLimit(again, "RPM", {});
+    EXPECT_EQ(limitOf(again, "RPM"), SensorLimit());
+    std::filesystem::remove(file);
+}
+
+} // namespace
