@@ -1,0 +1,58 @@
+#include "libvelmora/replay/recordingfile.h"
+
+#include "libvelmora/replay/readdatabase.h"
+
+#include <velmora/error.h>
+
+#include <cerrno>
+#include <cstring>
+#include <fstream>
+
+namespace velmora {
+
+namespace {
+
+std::ifstream opened(std::filesystem::path const& file)
+{
+    std::error_code error;
+    if (std::filesystem::is_directory(file, error)) {
+        throw Error(ErrorKind::WrongUse, file.string() + " is a folder", {"name a recording in it"});
+    }
+    std::ifstream in(file, std::ios::binary);
+    if (!in) {
+        throw Error(ErrorKind::Failed, "Could not read " + file.string() + ": " + std::strerror(errno),
+                    {"is the name right, and may you read it?"});
+    }
+    return in;
+}
+
+} // namespace
+
+RecordingForm formOf(std::filesystem::path const& file)
+{
+    std::ifstream in = opened(file);
+    std::string start(16, '\0');
+    in.read(start.data(), static_cast<std::streamsize>(start.size()));
+    start.resize(static_cast<std::size_t>(in.gcount()));
+    if (start == std::string("SQLite format 3\0", 16)) {
+        return RecordingForm::Database;
+    }
+    return start.starts_with("time,") ? RecordingForm::Csv
+           : start.starts_with("{")   ? RecordingForm::Ndjson
+                                      : RecordingForm::Dialogue;
+}
+
+Recording readRecording(std::filesystem::path const& file)
+{
+    RecordingForm const form = formOf(file);
+    std::ifstream in = opened(file);
+    Recording recording = form == RecordingForm::Database ? readDatabase(file)
+                          : form == RecordingForm::Csv    ? readCsv(in)
+                                                          : readNdjson(in);
+    if (recording.sensors.empty()) {
+        throw Error(ErrorKind::Failed, file.string() + " holds no readings");
+    }
+    return recording;
+}
+
+} // namespace velmora
