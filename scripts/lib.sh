@@ -25,6 +25,7 @@ build_packages=(g++ cmake ninja-build)
 build_packages+=(libasio-dev libcli11-dev nlohmann-json3-dev libfmt-dev libtomlplusplus-dev)
 build_packages+=(libsqlite3-dev libboost-dev libmosquitto-dev)
 build_packages+=(libjs-chart.js libqrcodegencpp-dev) # of the page in the browser
+build_packages+=(libncurses-dev) # the live view in a terminal
 build_packages+=(libsystemd-dev) # Bluetooth's service
 build_packages+=(pybind11-dev libpython3-dev python3-dev)
 test_packages=(libgtest-dev libgmock-dev libbenchmark-dev strace mold)

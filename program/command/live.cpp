@@ -1,8 +1,10 @@
 #include "libvelmora/poll/sensorwish.h"
+#include "libvelmora/replay/recordingfile.h"
 #include "program/command/commands.h"
 #include "program/command/commandsession.h"
-#include "program/command/liverun.h"
 #include "program/commandline.h"
+#include "program/live/liverun.h"
+#include "program/live/playrun.h"
 #include "program/terminal/output.h"
 
 #include <velmora/error.h>
@@ -28,7 +30,14 @@ void judgeSilence(Session const& session, LiveRun const& run, LiveOptions const&
     }
 }
 
-ExitCode live(GlobalOptions const& global, LiveOptions const& given)
+ExitCode playRecording(GlobalOptions const& global, LiveOptions const& options)
+{
+    PlayRun run(global, options.play, options.sensors, options.speed);
+    run.run();
+    return ExitCode::Done;
+}
+
+ExitCode readVehicle(GlobalOptions const& global, LiveOptions const& given)
 {
     LiveOptions options = given;
     if (!options.rate.empty()) {
@@ -45,6 +54,20 @@ ExitCode live(GlobalOptions const& global, LiveOptions const& given)
     }
     judgeSilence(session, run, options, global.quiet);
     return ExitCode::Done;
+}
+
+// A dialogue is a vehicle that is read as any other.
+ExitCode live(GlobalOptions const& global, LiveOptions const& options)
+{
+    if (options.play.empty()) {
+        return readVehicle(global, options);
+    }
+    if (formOf(options.play) != RecordingForm::Dialogue) {
+        return playRecording(global, options);
+    }
+    GlobalOptions replayed = global;
+    replayed.port = "replay:" + options.play;
+    return readVehicle(replayed, options);
 }
 
 } // namespace
@@ -72,6 +95,16 @@ void addLiveCommand(CommandLine& commandLine)
     command->add_option("--pids", options->will.pidsPerRequest, "PIDs in one request at most, with --fast")
         ->type_name("N")
         ->check(CLI::Range(1, 6));
+    CLI::Option* const play = command
+                                  ->add_option("--play", options->play,
+                                               "Play a recording in the place of a vehicle: a database of watch, CSV,\n"
+                                               "NDJSON, or a dialogue of record")
+                                  ->type_name("FILE")
+                                  ->excludes("--csv");
+    command->add_option("--speed", options->speed, "How fast to play it, 1 is as it was")
+        ->type_name("X")
+        ->needs(play)
+        ->check(CLI::Range(RecordingPlayer::slowest, RecordingPlayer::fastest));
     command->add_flag("--force", options->force, "Let --csv replace a file that has other columns");
     command->add_option("-n,--count", options->count, "Stop after N readings of every sensor")
         ->type_name("N")

@@ -14,7 +14,7 @@ constexpr int fatalSignals[] = {SIGQUIT, SIGSEGV, SIGABRT, SIGBUS, SIGILL, SIGFP
 // What a handler may use: set before it is installed, and left alone as long as it is.
 struct Kept
 {
-    std::array<char, 64> text{};
+    std::array<char, 128> text{};
     std::size_t length = 0;
     termios before{};
     bool hasBefore = false;
@@ -23,12 +23,17 @@ struct Kept
 
 Kept kept;
 
-void restoreAndEnd(int number)
+void bringBack()
 {
     [[maybe_unused]] ssize_t const ignored = ::write(STDOUT_FILENO, kept.text.data(), kept.length);
     if (kept.hasBefore) {
-        ::tcsetattr(STDIN_FILENO, TCSANOW, &kept.before);
+        ::tcsetattr(STDOUT_FILENO, TCSANOW, &kept.before);
     }
+}
+
+void restoreAndEnd(int number)
+{
+    bringBack();
     std::signal(number, SIG_DFL);
     std::raise(number);
 }
@@ -49,6 +54,11 @@ FatalRestore::FatalRestore(std::string const& text, termios const* before)
     for (std::size_t i = 0; i < std::size(fatalSignals); ++i) {
         ::sigaction(fatalSignals[i], &action, &kept.actions[i]);
     }
+}
+
+void FatalRestore::restore() const
+{
+    bringBack();
 }
 
 FatalRestore::~FatalRestore()

@@ -10,11 +10,14 @@ namespace velmora::cli {
 class FatalRestore
 {
 public:
-    // text: what brings the screen back. before: the state of standard input, or null.
+    // text: what brings the screen back. before: the state of the terminal at standard output, or null.
     FatalRestore(std::string const& text, termios const* before);
     ~FatalRestore();
     FatalRestore(FatalRestore const&) = delete;
     FatalRestore& operator=(FatalRestore const&) = delete;
+
+    // Does it now, and may be called on any thread.
+    void restore() const;
 };
 
 } // namespace velmora::cli

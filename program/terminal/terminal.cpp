@@ -1,33 +1,18 @@
 #include "program/terminal/terminal.h"
 
 #include "program/terminal/interrupt.h"
+#include "program/terminal/screen.h"
 
+#include <array>
+#include <clocale>
 #include <cstdlib>
 #include <cstring>
+#include <string_view>
 #include <sys/ioctl.h>
 #include <unistd.h>
+#include <utility>
 
 namespace velmora::cli {
-
-namespace {
-
-// A page of its own without cursor, and back.
-constexpr char const* enterPage = "\033[?1049h\033[?25l\033[2J";
-constexpr char const* leavePage = "\033[0m\033[?25h\033[?1049l";
-
-void writeAll(std::string const& text)
-{
-    std::size_t written = 0;
-    while (written < text.size()) {
-        ssize_t const count = ::write(STDOUT_FILENO, text.data() + written, text.size() - written);
-        if (count <= 0) {
-            return; // a terminal that has gone shows nothing more
-        }
-        written += static_cast<std::size_t>(count);
-    }
-}
-
-} // namespace
 
 bool Terminal::isUsable()
 {
@@ -46,58 +31,73 @@ bool Terminal::speaksUtf8()
     return false;
 }
 
+// A locale that came along by SSH need not exist on this machine; its characters do.
+void Terminal::useCharacters()
+{
+    if (speaksUtf8() && std::setlocale(LC_CTYPE, "") == nullptr) {
+        std::setlocale(LC_CTYPE, "C.UTF-8");
+    }
+}
+
 std::size_t Terminal::columnsOf(int descriptor)
 {
     winsize window{};
     return ::isatty(descriptor) != 0 && ::ioctl(descriptor, TIOCGWINSZ, &window) == 0 ? window.ws_col : 0;
 }
 
-Terminal::Terminal() : m_restore(leavePage, m_keys.before())
+std::vector<std::string> terminalKinds(std::string const& named)
 {
-    Interrupt::instance().setLastAct([this] { leave(); });
-    m_inside = true;
-    writeAll(enterPage);
+    // Known to users of newer systems, and described in packages that a Debian need not have.
+    static constexpr std::array<std::string_view, 8> newer = {"xterm-",  "alacritty", "foot",    "kitty",
+                                                              "wezterm", "ghostty",   "contour", "rio"};
+    std::vector<std::string> kinds = {named};
+    for (std::string_view const each : newer) {
+        if (named.starts_with(each)) {
+            kinds.insert(kinds.end(), {"xterm-256color", "xterm"});
+            break;
+        }
+    }
+    return kinds;
+}
+
+std::unique_ptr<Terminal> Terminal::open(bool coloured)
+{
+    char const* const named = std::getenv("TERM");
+    for (std::string const& kind : terminalKinds(named != nullptr ? named : "")) {
+        auto screen = std::make_unique<TerminalScreen>(kind, coloured);
+        if (screen->isOpen()) {
+            return std::unique_ptr<Terminal>(new Terminal(std::move(screen)));
+        }
+    }
+    return nullptr;
+}
+
+// Whoever ends the program at once is another thread, which may write but not touch the screen itself.
+Terminal::Terminal(std::unique_ptr<TerminalScreen> screen)
+    : m_screen(std::move(screen)), m_restore(m_screen->leaveText(), m_screen->before())
+{
+    Interrupt::instance().setLastAct([this] { m_restore.restore(); });
 }
 
 Terminal::~Terminal()
 {
     Interrupt::instance().setLastAct(nullptr);
-    leave();
-}
-
-void Terminal::leave()
-{
-    if (m_inside) {
-        writeAll(leavePage);
-    }
-    m_keys.restore();
-    m_inside = false;
 }
 
 Terminal::Size Terminal::size() const
 {
-    winsize window{};
-    if (::ioctl(STDOUT_FILENO, TIOCGWINSZ, &window) != 0 || window.ws_col == 0 || window.ws_row == 0) {
-        return {80, 24};
-    }
-    return {window.ws_col, window.ws_row};
+    auto const [columns, rows] = m_screen->size();
+    return {columns, rows};
 }
 
 void Terminal::draw(std::string const& frame)
 {
-    std::string text = "\033[H";
-    std::size_t begin = 0;
-    while (begin < frame.size()) {
-        std::size_t const end = std::min(frame.find('\n', begin), frame.size());
-        text += (begin == 0 ? "" : "\r\n") + frame.substr(begin, end - begin) + "\033[K";
-        begin = end + 1;
-    }
-    writeAll(text + "\033[J");
+    m_screen->draw(frame);
 }
 
 std::optional<Key> Terminal::readKey()
 {
-    return m_keys.read(std::chrono::milliseconds(0));
+    return m_screen->readKey();
 }
 
 } // namespace velmora::cli

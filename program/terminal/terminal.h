@@ -4,14 +4,18 @@
 #include "program/terminal/keyinput.h"
 
 #include <cstddef>
+#include <memory>
 #include <optional>
 #include <string>
+#include <vector>
 
 namespace velmora::cli {
 
+class TerminalScreen;
+
 // The screen of a terminal for as long as the object lives: keys come singly and are not shown, frames replace each
 // other on a page of their own. However the program ends short of being killed, the terminal is as before. Ctrl-C goes
-// on to interrupt; Ctrl-Z does nothing.
+// on to interrupt; Ctrl-Z does nothing. One at a time, for one thread.
 class Terminal
 {
 public:
@@ -27,26 +31,34 @@ public:
     // Whether the user's locale is one of UTF-8; ASCII alone is shown elsewhere.
     static bool speaksUtf8();
 
+    // Takes over the user's characters, and nothing else of the locale: numbers keep their point. Before there are
+    // other threads.
+    static void useCharacters();
+
     // How many columns a line has on that end of the program; 0 if it is no terminal.
     static std::size_t columnsOf(int descriptor);
 
-    Terminal();
+    // Null where nothing is known of the terminal's kind. coloured: frames may have colours.
+    static std::unique_ptr<Terminal> open(bool coloured);
+
     ~Terminal();
     Terminal(Terminal const&) = delete;
     Terminal& operator=(Terminal const&) = delete;
 
     Size size() const;
-    // Shows lines from the top; none may be wider than the screen.
+    // Shows lines from the top; none may be wider than the screen. Sequences that switch a text's look are understood.
     void draw(std::string const& frame);
     // The next key that was pressed, if any.
     std::optional<Key> readKey();
 
 private:
-    void leave();
+    explicit Terminal(std::unique_ptr<TerminalScreen> screen);
 
-    KeyInput m_keys;
+    std::unique_ptr<TerminalScreen> m_screen;
     FatalRestore m_restore;
-    bool m_inside = false;
 };
+
+// The kinds of terminals to try in turn: the one that is named, then such as understand the same.
+std::vector<std::string> terminalKinds(std::string const& named);
 
 } // namespace velmora::cli

@@ -2,12 +2,10 @@
 
 #include "libvelmora/text/text.h"
 #include "program/view/bigdigits.h"
+#include "program/view/trendline.h"
 
 #include <algorithm>
-#include <charconv>
 #include <cmath>
-#include <optional>
-#include <string_view>
 
 namespace velmora::cli {
 
@@ -16,13 +14,11 @@ namespace {
 constexpr std::size_t mostBig = 6;
 constexpr std::size_t narrowestCard = 26;
 constexpr std::size_t tableLines = 12; // that the table keeps
+constexpr std::size_t tallScreen = 40; // lines
 
-std::optional<double> bigNumber(std::string const& text)
+bool isTall(FrameStyle const& style)
 {
-    double number = 0.0;
-    auto const [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
-    bool const whole = !text.empty() && error == std::errc() && end == text.data() + text.size();
-    return whole && std::isfinite(number) ? std::optional(number) : std::nullopt;
+    return style.rows >= tallScreen;
 }
 
 std::string repeated(char const* text, std::size_t count)
@@ -36,9 +32,9 @@ std::string repeated(char const* text, std::size_t count)
 
 std::string barLine(LiveRow const& row, std::size_t width, bool ascii)
 {
-    auto const value = bigNumber(row.value);
-    auto const low = bigNumber(row.minimum);
-    auto const high = bigNumber(row.maximum);
+    auto const value = numberIn(row.value);
+    auto const low = numberIn(row.minimum);
+    auto const high = numberIn(row.maximum);
     if (!value || !low || !high) {
         return std::string(width, ' ');
     }
@@ -50,23 +46,38 @@ std::string barLine(LiveRow const& row, std::size_t width, bool ascii)
            row.maximum;
 }
 
-// Name, digits, bar: lines of that width.
-std::vector<std::string> card(LiveRow const& row, std::size_t width, bool ascii)
+// What stands below the digits: the bar, or how old the value is that stood there.
+std::string footLine(LiveRow const& row, std::size_t width, FrameStyle const& style)
+{
+    if (row.value.empty() && !row.last.empty()) {
+        return "was " + row.last + ", " + ageText(style.now - row.updated);
+    }
+    return barLine(row, width, style.ascii);
+}
+
+// Lines of that width: name, digits, bar, and on a tall screen the trend.
+std::vector<std::string> card(LiveRow const& row, std::size_t width, FrameStyle const& style)
 {
     std::size_t const inner = width - 2;
-    std::vector<std::string> result = {fitted(row.name, inner)};
+    std::string const mark = row.isOutside() ? "! " : "";
+    std::vector<std::string> lines = {mark + row.name};
     std::string const shown = row.value.empty() ? "-" : row.value;
-    std::vector<std::string> digits = bigText(shown, ascii);
+    std::vector<std::string> digits = bigText(shown, style.ascii);
     if (digits.empty() || bigWidth(shown) + 1 + displayWidth(row.unit) > inner) {
-        digits.assign(bigLines(ascii), "");
+        digits.assign(bigLines(style.ascii), "");
         digits[digits.size() / 2] = orDash(row.value);
     }
     digits.back() += " " + row.unit;
-    for (std::string const& each : digits) {
-        result.push_back(fitted(each, inner));
+    lines.insert(lines.end(), digits.begin(), digits.end());
+    lines.push_back(footLine(row, inner, style));
+    if (isTall(style)) {
+        lines.push_back(trendLine(row.trend, std::min(inner, LiveTable::trendLength), style.ascii));
     }
-    result.push_back(fitted(barLine(row, inner, ascii), inner));
-    return result;
+    Look const look = row.isOutside() ? Look::Outside : row.value.empty() ? Look::Stale : Look::Plain;
+    for (std::string& each : lines) {
+        each = looking(look, fitted(each, inner), style);
+    }
+    return lines;
 }
 
 } // namespace
@@ -80,7 +91,7 @@ std::string drawBig(std::vector<LiveRow> const& rows, FrameStyle const& style)
         }
     }
     std::size_t const across = std::max<std::size_t>(1, std::min(mostBig, style.columns / narrowestCard));
-    std::size_t const height = bigLines(style.ascii) + 3; // name, digits, bar, an empty line
+    std::size_t const height = bigLines(style.ascii) + (isTall(style) ? 4 : 3); // name, bar, trend, an empty line
     std::size_t const room = style.rows > tableLines ? (style.rows - tableLines) / height : 0;
     shown.resize(std::min(shown.size(), across * room));
     std::size_t const width = shown.empty() ? 0 : style.columns / std::min(across, shown.size());
@@ -91,7 +102,7 @@ std::string drawBig(std::vector<LiveRow> const& rows, FrameStyle const& style)
     for (std::size_t first = 0; first < shown.size(); first += across) {
         std::vector<std::string> lines(height - 1);
         for (std::size_t i = first; i < std::min(first + across, shown.size()); ++i) {
-            std::vector<std::string> const part = card(*shown[i], width, style.ascii);
+            std::vector<std::string> const part = card(*shown[i], width, style);
             for (std::size_t line = 0; line < part.size(); ++line) {
                 lines[line] += part[line] + "  ";
             }
@@ -102,27 +113,6 @@ std::string drawBig(std::vector<LiveRow> const& rows, FrameStyle const& style)
         text += "\n";
     }
     return text;
-}
-
-std::string toAscii(std::string const& text)
-{
-    static constexpr std::pair<std::string_view, char> known[] = {{"…", '.'}, {"°", 'o'}, {"²", '2'}, {"µ", 'u'}};
-    std::string result;
-    for (std::size_t i = 0; i < text.size();) {
-        auto const byte = static_cast<unsigned char>(text[i]);
-        if (byte < 0x80) {
-            result += text[i++];
-            continue;
-        }
-        std::string_view const rest = std::string_view(text).substr(i);
-        auto const* const found =
-            std::ranges::find_if(known, [&](auto const& each) { return rest.starts_with(each.first); });
-        result += found == std::end(known) ? '?' : found->second;
-        for (++i; i < text.size() && (static_cast<unsigned char>(text[i]) & 0xC0) == 0x80; ++i) {
-            // what belongs to the same character
-        }
-    }
-    return result;
 }
 
 } // namespace velmora::cli

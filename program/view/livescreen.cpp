@@ -1,17 +1,18 @@
 #include "program/view/livescreen.h"
 
 #include "libvelmora/text/text.h"
+#include "program/view/trendline.h"
 
 #include <fmt/format.h>
 
 #include <algorithm>
-#include <cmath>
 
 namespace velmora::cli {
 
 namespace {
 
 constexpr std::size_t shortestName = 18;
+constexpr std::size_t shortestTrend = 16;
 constexpr std::size_t frameLines = 4; // title, heading, an empty line, status
 
 // Widths, and what stands beside name, value and unit, depending on the room there is.
@@ -21,7 +22,7 @@ struct Columns
     std::size_t value = displayWidth("Minimum");
     std::size_t unit = displayWidth("Unit");
     bool statistics = false;
-    bool trend = false;
+    std::size_t trend = 0; // 0: none
 };
 
 void widen(std::size_t& width, std::string const& text)
@@ -29,7 +30,14 @@ void widen(std::size_t& width, std::string const& text)
     width = std::max(width, displayWidth(text));
 }
 
-// Numbers get all the room they need, for one that is cut would be another number; the name gets what is left.
+// A mark that needs no colour.
+std::string markedValue(LiveRow const& row)
+{
+    return (row.isOutside() ? "!" : "") + row.value;
+}
+
+// Numbers get all the room they need, for one that is cut would be another number; the name gets what is left, and the
+// trend what the names leave.
 Columns layOut(std::vector<LiveRow> const& rows, std::size_t width)
 {
     Columns columns;
@@ -37,18 +45,20 @@ Columns layOut(std::vector<LiveRow> const& rows, std::size_t width)
         widen(columns.name, row.name);
         widen(columns.unit, row.unit);
         if (row.numeric) {
-            for (std::string const* const text : {&row.value, &row.minimum, &row.mean, &row.maximum}) {
-                widen(columns.value, *text);
+            for (std::string const& text : {markedValue(row), row.last, row.minimum, row.mean, row.maximum}) {
+                widen(columns.value, text);
             }
         }
     }
     std::size_t used = (columns.value + 1) + (columns.unit + 1);
     std::size_t const statistics = 3 * (columns.value + 1);
-    std::size_t const trend = LiveTable::trendLength + 1;
     columns.statistics = width >= shortestName + used + statistics;
     used += columns.statistics ? statistics : 0;
-    columns.trend = columns.statistics && width >= shortestName + used + trend;
-    used += columns.trend ? trend : 0;
+    if (columns.statistics && width >= shortestName + used + 1 + shortestTrend) {
+        std::size_t const beside = columns.name + used + 1;
+        columns.trend = std::clamp(width > beside ? width - beside : 0, shortestTrend, LiveTable::trendLength);
+        used += columns.trend + 1;
+    }
     columns.name = std::min(columns.name, width > used ? width - used : shortestName);
     return columns;
 }
@@ -64,54 +74,47 @@ std::string heading(Columns const& columns)
     if (columns.statistics) {
         text += right("Minimum", columns) + right("Mean", columns) + right("Maximum", columns);
     }
-    return text + (columns.trend ? " Trend" : "");
+    return columns.trend > 0
+               ? text + fmt::format(" Trend of {} s",
+                                    columns.trend * static_cast<std::size_t>(LiveTable::trendStep.count()))
+               : text;
 }
 
-std::string line(LiveRow const& row, Columns const& columns, bool ascii)
+// The last value of a sensor that tells none now, if its age can be told as well.
+bool showsLast(LiveRow const& row, Columns const& columns)
 {
+    return row.value.empty() && !row.last.empty() && (columns.trend > 0 || !row.numeric);
+}
+
+std::string line(LiveRow const& row, Columns const& columns, FrameStyle const& style)
+{
+    std::string const age = ageText(style.now - row.updated);
+    bool const last = showsLast(row, columns);
     std::string text = fitted(row.name, columns.name);
     if (!row.numeric) {
         // A text has neither unit nor statistics, so it may take their place.
-        return text + " " + orDash(row.value);
+        return text + " " + (last ? row.last + ", " + age : orDash(row.value));
     }
-    text += right(orDash(row.value), columns) + " " + fitted(row.unit, columns.unit);
+    text += right(last ? row.last : orDash(markedValue(row)), columns) + " " + fitted(row.unit, columns.unit);
     if (columns.statistics) {
         text += right(orDash(row.minimum), columns) + right(orDash(row.mean), columns) +
                 right(orDash(row.maximum), columns);
     }
-    return text + (columns.trend ? " " + trendLine(row.trend, LiveTable::trendLength, ascii) : "");
+    if (columns.trend == 0) {
+        return text;
+    }
+    return text + " " + (last ? fitted(age, columns.trend, true) : trendLine(row.trend, columns.trend, style.ascii));
 }
 
-std::string emphasised(std::string const& text, FrameStyle const& style)
+Look lookOf(LiveRow const& row)
 {
-    return style.bold ? "\033[1m" + text + "\033[0m" : text;
-}
-
-std::string cut(std::string const& text, std::size_t width)
-{
-    return displayWidth(text) > width ? fitted(text, width) : text;
+    if (row.value.empty() && !row.last.empty()) {
+        return Look::Stale;
+    }
+    return row.isOutside() ? Look::Outside : Look::Plain;
 }
 
 } // namespace
-
-std::string trendLine(std::deque<double> const& numbers, std::size_t width, bool ascii)
-{
-    static constexpr char const* blocks[] = {"▁", "▂", "▃", "▄", "▅", "▆", "▇", "█"};
-    static constexpr char const* signs[] = {".", ":", "-", "=", "+", "*", "%", "#"};
-    std::size_t const count = std::min(width, numbers.size());
-    std::string text(width - count, ' ');
-    if (count == 0) {
-        return text;
-    }
-    auto const first = numbers.end() - static_cast<std::ptrdiff_t>(count);
-    double const low = *std::min_element(first, numbers.end());
-    double const range = *std::max_element(first, numbers.end()) - low;
-    for (auto number = first; number != numbers.end(); ++number) {
-        double const part = range > 0.0 ? (*number - low) / range : 0.0;
-        text += (ascii ? signs : blocks)[static_cast<std::size_t>(std::lround(part * 7.0))];
-    }
-    return text;
-}
 
 std::size_t roomForRows(FrameStyle const& style)
 {
@@ -122,65 +125,15 @@ std::string drawTable(std::vector<LiveRow> const& rows, std::size_t first, std::
                       std::string const& status, FrameStyle const& style)
 {
     Columns const columns = layOut(rows, style.columns);
-    std::string text = cut(title, style.columns) + "\n";
-    text += emphasised(cut(heading(columns), style.columns), style) + "\n";
+    std::string text = cutTo(title, style.columns) + "\n";
+    text += looking(Look::Heading, cutTo(heading(columns), style.columns), style) + "\n";
     std::size_t const end = std::min(rows.size(), first + roomForRows(style));
     for (std::size_t i = first; i < end; ++i) {
-        text += cut(line(rows[i], columns, style.ascii), style.columns) + "\n";
+        text += looking(lookOf(rows[i]), cutTo(line(rows[i], columns, style), style.columns), style) + "\n";
     }
     std::size_t const hidden = rows.size() - (end - std::min(first, end));
     std::string const more = hidden > 0 ? fmt::format("({} more: up and down) ", hidden) : "";
-    return status.empty() ? text : text + "\n" + cut(more + status, style.columns) + "\n";
-}
-
-SensorPicker::SensorPicker(std::vector<OfferedSensor> offered, SensorIds const& chosen)
-    : m_offered(std::move(offered)), m_before(chosen), m_marked(chosen.begin(), chosen.end())
-{}
-
-void SensorPicker::move(int lines)
-{
-    std::ptrdiff_t const last = static_cast<std::ptrdiff_t>(m_offered.size()) - 1;
-    std::ptrdiff_t const wanted = static_cast<std::ptrdiff_t>(m_cursor) + lines;
-    m_cursor = static_cast<std::size_t>(std::clamp(wanted, std::ptrdiff_t{0}, std::max(last, std::ptrdiff_t{0})));
-}
-
-void SensorPicker::toggle()
-{
-    if (m_cursor < m_offered.size()) {
-        obd::ParameterIdentifier::Id const id = m_offered[m_cursor].id;
-        if (m_marked.erase(id) == 0) {
-            m_marked.insert(id);
-        }
-    }
-}
-
-SensorIds SensorPicker::chosen() const
-{
-    SensorIds ids;
-    auto const isMarked = [this](obd::ParameterIdentifier::Id id) { return m_marked.contains(id); };
-    std::copy_if(m_before.begin(), m_before.end(), std::back_inserter(ids), isMarked);
-    for (OfferedSensor const& each : m_offered) {
-        if (isMarked(each.id) && std::find(ids.begin(), ids.end(), each.id) == ids.end()) {
-            ids.push_back(each.id);
-        }
-    }
-    return ids;
-}
-
-std::string SensorPicker::draw(FrameStyle const& style) const
-{
-    std::size_t const room = style.rows > 3 ? style.rows - 3 : 1;
-    std::size_t const first = m_cursor >= room ? m_cursor - room + 1 : 0;
-    std::string text = emphasised(cut("Which sensors?", style.columns), style) + "\n";
-    for (std::size_t i = first; i < std::min(m_offered.size(), first + room); ++i) {
-        OfferedSensor const& each = m_offered[i];
-        text += cut(fmt::format("{} [{}] {:02X} {}", i == m_cursor ? ">" : " ", m_marked.contains(each.id) ? "x" : " ",
-                                static_cast<int>(each.id), each.title),
-                    style.columns) +
-                "\n";
-    }
-    return text + "\n" + cut("up, down move   space marks   enter shows   esc leaves all as it was", style.columns) +
-           "\n";
+    return status.empty() ? text : text + "\n" + cutTo(more + status, style.columns) + "\n";
 }
 
 } // namespace velmora::cli

@@ -1,5 +1,6 @@
 #include "program/view/livetable.h"
 
+#include "libvelmora/read/sensornames.h"
 #include "libvelmora/report/unitlabel.h"
 
 #include <fmt/format.h>
@@ -7,12 +8,12 @@
 #include <algorithm>
 #include <charconv>
 #include <cmath>
+#include <limits>
 
 namespace velmora::cli {
 
 namespace {
 
-constexpr std::chrono::milliseconds trendStep{250};
 constexpr std::chrono::seconds patience{2};
 constexpr int patienceRounds = 3;
 
@@ -25,8 +26,11 @@ LiveRow makeRow(LiveParameter const& chosen, obd::SensorDescriptor const& sensor
     if (chosen.hertz) {
         row.period = std::chrono::duration_cast<LiveTime::duration>(std::chrono::duration<double>(1.0 / *chosen.hertz));
     }
+    row.alone = alone;
     row.name = alone ? parameter.description() : parameter.description() + ": " + sensor.description();
     row.unit = unitLabel(sensor.uid(), sensor.unit());
+    auto const metric = chosen.metricUnits.find(row.uid);
+    row.metricUnit = metric != chosen.metricUnits.end() ? metric->second : row.unit;
     // What has a unit is a number, though the library gives some, such as distances, as plain digits.
     row.numeric = sensor.isNumeric() || !row.unit.empty();
     return row;
@@ -41,38 +45,54 @@ LiveRow makeRow(LiveParameter const& chosen)
         row.period = std::chrono::duration_cast<LiveTime::duration>(std::chrono::duration<double>(1.0 / *chosen.hertz));
     }
     row.name = chosen.signal->name;
-    row.unit = chosen.signal->unit;
+    row.unit = row.metricUnit = chosen.signal->unit;
     row.sensor = chosen.signal->sensor;
     row.request = chosen.signal->request;
     row.numeric = chosen.signal->numeric;
     return row;
 }
 
-void addTrend(LiveRow& row, LiveTime now)
+// Begins the means up to that of now; those between have no readings.
+void beginMeans(LiveRow& row, LiveTime now)
 {
-    double number = 0.0;
-    std::from_chars(row.value.data(), row.value.data() + row.value.size(), number);
-    if (!std::isfinite(number)) {
-        return; // such as the fuel consumption of air with a lambda of 0
+    if (row.trend.empty() || now - row.trendTime >= LiveTable::trendStep * static_cast<int>(LiveTable::trendLength)) {
+        row.trend.assign(1, std::numeric_limits<double>::quiet_NaN());
+        row.trendTime = now;
+        row.trendCount = 0;
     }
-    if (!row.trend.empty() && now - row.trendTime < trendStep) {
-        return;
+    while (now - row.trendTime >= LiveTable::trendStep) {
+        row.trend.push_back(std::numeric_limits<double>::quiet_NaN());
+        row.trendTime += LiveTable::trendStep;
+        row.trendCount = 0;
     }
-    row.trend.push_back(number);
-    row.trendTime = now;
-    if (row.trend.size() > LiveTable::trendLength) {
+    while (row.trend.size() > LiveTable::trendLength) {
         row.trend.pop_front();
     }
 }
 
+void addTrend(LiveRow& row, LiveTime now)
+{
+    std::optional<double> const number = numberIn(row.value);
+    if (!number) {
+        return; // such as the fuel consumption of air with a lambda of 0
+    }
+    beginMeans(row, now);
+    double& mean = row.trend.back();
+    mean = row.trendCount == 0 ? *number : mean + (*number - mean) / (row.trendCount + 1.0);
+    ++row.trendCount;
+}
+
 void forget(LiveRow& row)
 {
-    row.value.clear();
+    if (!row.value.empty()) {
+        row.last = std::exchange(row.value, {});
+    }
 }
 
 void take(LiveRow& row, obd::SensorValueDataModel const& value, LiveTime now)
 {
     row.value = value.value;
+    row.last.clear();
     row.minimum = value.minimum;
     row.mean = value.mean;
     row.maximum = value.maximum;
@@ -83,6 +103,36 @@ void take(LiveRow& row, obd::SensorValueDataModel const& value, LiveTime now)
 }
 
 } // namespace
+
+std::optional<double> numberIn(std::string const& text)
+{
+    double number = 0.0;
+    auto const [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
+    bool const whole = !text.empty() && error == std::errc() && end == text.data() + text.size();
+    return whole && std::isfinite(number) ? std::optional(number) : std::nullopt;
+}
+
+bool LiveRow::isOutside() const
+{
+    std::optional<double> const number = numeric ? numberIn(value) : std::nullopt;
+    return number && limit.isOutside(*number);
+}
+
+std::string keyOf(LiveRow const& row)
+{
+    if (!row.sensor.empty()) {
+        return row.sensor;
+    }
+    std::string const key = sensorKey(obd::Uid2Pid(row.uid));
+    return row.alone ? key : fmt::format("{}_{}", key, row.uid % 10 + 1);
+}
+
+void LiveTable::setLimits(std::function<SensorLimit(LiveRow const& row)> const& limitOf)
+{
+    for (LiveRow& row : m_rows) {
+        row.limit = limitOf(row);
+    }
+}
 
 void LiveTable::select(Parameters const& parameters)
 {

@@ -1,12 +1,16 @@
 #pragma once
 
+#include "libvelmora/read/sensorlimits.h"
 #include "libvelmora/uds/signalrow.h"
+#include "program/view/framestyle.h"
 
 #include <obd/parameterdescriptor.h>
 #include <obd/sensordatamodels.h>
 
 #include <chrono>
 #include <deque>
+#include <functional>
+#include <map>
 #include <memory>
 #include <optional>
 #include <set>
@@ -15,8 +19,6 @@
 #include <vector>
 
 namespace velmora::cli {
-
-using LiveTime = std::chrono::steady_clock::time_point;
 
 // A parameter to be shown.
 struct LiveParameter
@@ -32,6 +34,7 @@ struct LiveParameter
     unsigned int module;                                  // id of the control module; 0: any
     std::optional<double> hertz;                          // how often it is to come
     std::optional<SignalRow> signal{};
+    std::map<int, std::string> metricUnits{}; // by the sensors' uids, where other units are shown
 };
 
 // One sensor with what is known of it. Texts are empty where nothing is known, for a sensor that the vehicle no longer
@@ -42,30 +45,47 @@ struct LiveRow
     unsigned int module;
     std::string name; // with the module's id in front where there are several
     std::string unit;
+    std::string metricUnit;
     std::string sensor;  // key of a signal; empty for a standard sensor
     std::string request; // of a signal, hexadecimal
     bool numeric;
+    bool alone; // the only sensor of its parameter
     std::string value;
     std::string minimum;
     std::string mean;
     std::string maximum;
-    std::deque<double> trend; // oldest first
-    LiveTime updated;
-    LiveTime trendTime;
+    std::string last;          // the value before it was gone; empty while there is one
+    std::deque<double> trend;  // means of LiveTable::trendStep, oldest first; NaN for one without readings
+    LiveTime updated;          // when a value came last
+    LiveTime trendTime;        // when the newest mean began
+    unsigned int trendCount;   // readings in it
     LiveTime::duration period; // how far apart its readings are to be; 0 for as close as can be
+    SensorLimit limit;         // in the row's unit
+
+    bool isOutside() const;
 };
+
+// The key of a row's sensor for settings and recordings: "RPM", "LAMBDA_2", or a signal's own.
+std::string keyOf(LiveRow const& row);
+
+// The whole text as a finite number.
+std::optional<double> numberIn(std::string const& text);
 
 // The live values of the selected parameters, in the order of their selection.
 class LiveTable
 {
 public:
-    static constexpr std::size_t trendLength = 16;
+    static constexpr std::size_t trendLength = 60;
+    static constexpr std::chrono::seconds trendStep{5};
 
     using Parameters = std::vector<LiveParameter>;
     using Values = std::vector<std::shared_ptr<obd::SensorValueDataModel>>;
 
     // Starts anew, with other parameters or other units.
     void select(Parameters const& parameters);
+
+    // From now on, until others are selected.
+    void setLimits(std::function<SensorLimit(LiveRow const& row)> const& limitOf);
 
     // Takes a reading of a parameter; a sensor that is not among the values has none any more. Of a parameter that was
     // not selected nothing is taken.

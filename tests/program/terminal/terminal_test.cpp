@@ -1,3 +1,4 @@
+#include "program/terminal/spans.h"
 #include "program/terminal/terminal.h"
 
 #include <gtest/gtest.h>
@@ -62,6 +63,29 @@ TEST(Keys, UnknownSequencesAreSkippedWhole)
     EXPECT_EQ(keys("\033[1;5Cq"), std::vector<int>{'q'});
     EXPECT_EQ(keys("\033["), std::vector<int>{});
     EXPECT_EQ(keys(""), std::vector<int>{});
+}
+
+TEST(Spans, PartsOfALineHaveTheirLook)
+{
+    using velmora::cli::Span;
+    using velmora::cli::spansOf;
+    velmora::cli::SpanLook bold;
+    bold.bold = true;
+    velmora::cli::SpanLook red = bold;
+    red.color = 1;
+    EXPECT_EQ(spansOf("a\033[1mb\033[31mc\033[0md"),
+              (std::vector<Span>{{"a", {}}, {"b", bold}, {"c", red}, {"d", {}}}));
+    EXPECT_EQ(spansOf("\033[1;31mc\033[m"), (std::vector<Span>{{"c", red}}));
+    EXPECT_EQ(spansOf("x\033[2Jy\033["), (std::vector<Span>{{"x", {}}, {"y", {}}})) << "nothing else gets through";
+    EXPECT_TRUE(spansOf("").empty());
+}
+
+TEST(TerminalKinds, NewerOnesStandForWhatTheyUnderstand)
+{
+    using velmora::cli::terminalKinds;
+    EXPECT_EQ(terminalKinds("xterm-kitty"), (std::vector<std::string>{"xterm-kitty", "xterm-256color", "xterm"}));
+    EXPECT_EQ(terminalKinds("alacritty").size(), 3U);
+    EXPECT_EQ(terminalKinds("vt52"), std::vector<std::string>{"vt52"});
 }
 
 } // namespace

@@ -79,10 +79,26 @@ TEST(LiveBig, AValueThatIsGoneIsADash)
     EXPECT_THAT(drawBig(rows, style), HasSubstr("\n###"));
 }
 
+TEST(LiveBig, TellsWhatAValueWasAndMarksOneBeyondItsLimit)
+{
+    std::vector<LiveRow> rows = bigRows(2);
+    rows[0].last = std::exchange(rows[0].value, "");
+    rows[0].updated = LiveTime() + std::chrono::seconds(1);
+    rows[1].limit.lowest = 2000;
+    FrameStyle style;
+    style.now = LiveTime() + std::chrono::seconds(31);
+    std::string const text = drawBig(rows, style);
+    EXPECT_THAT(text, HasSubstr("was 1726, 30 s ago"));
+    EXPECT_THAT(text, HasSubstr("! Sensor 1"));
+    style.rows = 60;
+    std::string const tall = drawBig(rows, style);
+    EXPECT_EQ(std::count(tall.begin(), tall.end(), '\n'), 7) << "a line for the trend";
+}
+
 TEST(LiveBig, AsciiKeepsTheWidth)
 {
     EXPECT_EQ(toAscii("21 °C, 3 µA, name…"), "21 oC, 3 uA, name.");
-    EXPECT_EQ(toAscii("日本"), "??");
+    EXPECT_EQ(toAscii("日本"), "????");
 }
 
 } // namespace

@@ -3,6 +3,8 @@
 
 #include <gtest/gtest.h>
 
+#include <cmath>
+
 namespace {
 
 using std::chrono::milliseconds;
@@ -111,6 +113,9 @@ TEST_F(Live, OldValuesAreForgotten)
     table.expire(now);
     EXPECT_EQ(table.rows()[0].value, "");
     EXPECT_EQ(table.rows()[0].maximum, "701");
+    EXPECT_EQ(table.rows()[0].last, "701") << "what it was can still be told";
+    rpm("702");
+    EXPECT_EQ(table.rows()[0].last, "");
 }
 
 TEST_F(Live, ValuesOfASlowBusAreNot)
@@ -130,20 +135,47 @@ TEST_F(Live, TheTrendHasFiniteNumbersOnly)
         EXPECT_EQ(table.rows()[0].value, text);
         now += seconds(1);
     }
-    EXPECT_EQ(table.rows()[0].trend, (std::deque<double>{7.5, 8.5}));
+    EXPECT_EQ(table.rows()[0].trend, (std::deque<double>{8.0})) << "one mean of five seconds";
 }
 
-TEST_F(Live, TheTrendIsShortAndTakesFourValuesASecond)
+TEST_F(Live, TheTrendHasAMeanForEachFiveSecondsOfTheLastMinutes)
 {
-    for (int i = 0; i < 100; ++i) {
+    for (int i = 0; i < 20; ++i) {
         rpm(std::to_string(i));
-        now += milliseconds(50);
+        now += milliseconds(500);
+    }
+    EXPECT_EQ(table.rows()[0].trend, (std::deque<double>{4.5, 14.5}));
+    now += seconds(7);
+    rpm("1");
+    ASSERT_EQ(table.rows()[0].trend.size(), 4U);
+    EXPECT_TRUE(std::isnan(table.rows()[0].trend[2])) << "nothing came";
+    for (int i = 0; i < 200; ++i) {
+        now += seconds(5);
+        rpm(std::to_string(i));
     }
     EXPECT_EQ(table.rows()[0].trend.size(), LiveTable::trendLength);
-    EXPECT_EQ(table.rows()[0].trend.back(), 95.0);
-    EXPECT_EQ(table.rows()[0].trend.front(), 20.0);
+    EXPECT_EQ(table.rows()[0].trend.back(), 199.0);
+    now += std::chrono::hours(1);
+    rpm("3");
+    EXPECT_EQ(table.rows()[0].trend, (std::deque<double>{3.0})) << "older than all of it";
     fuel();
     EXPECT_TRUE(table.rows()[3].trend.empty());
+}
+
+TEST_F(Live, ALimitIsFoundByTheSensorsKey)
+{
+    std::vector<std::string> asked;
+    table.setLimits([&asked](LiveRow const& row) {
+        asked.push_back(keyOf(row));
+        return velmora::SensorLimit{{}, 6000.0};
+    });
+    EXPECT_EQ(asked, (std::vector<std::string>{"RPM", "SHORT_FUEL_TRIM_1_1", "SHORT_FUEL_TRIM_1_2", "FUEL_STATUS"}));
+    rpm("6000");
+    EXPECT_FALSE(table.rows()[0].isOutside());
+    rpm("6001");
+    EXPECT_TRUE(table.rows()[0].isOutside());
+    fuel();
+    EXPECT_FALSE(table.rows()[3].isOutside());
 }
 
 TEST_F(Live, AParameterThatIsNotSelectedIsNotTaken)

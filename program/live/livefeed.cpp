@@ -1,4 +1,4 @@
-#include "program/command/livefeed.h"
+#include "program/live/livefeed.h"
 
 #include <utility>
 
