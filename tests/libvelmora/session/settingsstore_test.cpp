@@ -151,19 +151,26 @@ TEST_F(Settings, SurviveBeingKilledWhole)
 {
     std::string const longText(50000, 'x');
     for (int round = 0; round < 5; ++round) {
+        int ends[2];
+        ASSERT_EQ(::pipe(ends), 0);
         pid_t const child = ::fork();
         if (child == 0) {
             SettingsStore store(m_file);
             for (int i = 0;; ++i) {
                 store.setString("velmora/name", longText + std::to_string(i));
                 store.sync();
+                if (::write(ends[1], "x", 1) != 1) {
+                    ::_exit(1);
+                }
             }
         }
-        while (!std::filesystem::exists(m_file)) {
-            ::usleep(100);
+        ::close(ends[1]);
+        char written = 0;
+        for (int i = 0; i <= round; ++i) {
+            EXPECT_EQ(::read(ends[0], &written, 1), 1);
         }
-        ::usleep(2000);
         ::kill(child, SIGKILL);
+        ::close(ends[0]);
         ::waitpid(child, nullptr, 0);
         SettingsStore store(m_file);
         std::string text;

@@ -7,9 +7,9 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include <atomic>
 #include <chrono>
-#include <thread>
+#include <condition_variable>
+#include <mutex>
 
 namespace {
 
@@ -222,17 +222,20 @@ request = "220100"
 formula = "A/2-40"
 unit = "°C"
 )toml"));
-    std::atomic<int> speed{0};
-    std::atomic<int> volts{0};
-    std::atomic<int> outside{0};
+    std::mutex mutex;
+    std::condition_variable changed;
+    int speed = 0; // protected by mutex, as are the next two
+    int volts = 0;
+    int outside = 0;
     {
         velmora::Watch const watch = car.watch({"SPEED", "BATTERY_VOLTS", "OUTSIDE"}, [&](Reading const& reading) {
             EXPECT_TRUE(number(reading)) << reading.sensor;
+            std::lock_guard const lock(mutex);
             ++(reading.sensor == "SPEED" ? speed : reading.sensor == "BATTERY_VOLTS" ? volts : outside);
+            changed.notify_all();
         });
-        for (int i = 0; i < 500 && (speed < 5 || volts < 5 || outside < 1); ++i) {
-            std::this_thread::sleep_for(std::chrono::milliseconds(10)); // an end, not a measure
-        }
+        std::unique_lock lock(mutex);
+        changed.wait_for(lock, std::chrono::seconds(20), [&] { return speed >= 5 && volts >= 5 && outside >= 1; });
     }
     EXPECT_GE(speed, 5);
     EXPECT_GE(volts, 5);
