@@ -97,6 +97,14 @@ for file in "$system"/usr/bin/{velmora,obdsim} "$system/usr/lib/$multiarch"/lib{
     ! readelf -d "$file" | grep -E 'R(UN)?PATH' || fail "$file has a run path"
 done
 
+# The service manager's judgement of the unit, beside the units and the kill that each system has.
+unit=$(find "$system" -type f -name velmora-watch.service)
+find /usr/lib/systemd/system -maxdepth 1 -type f -name '*.*' -exec cp -n -t "${unit%/*}" {} +
+[[ -x $system/bin/kill ]] || install -D /bin/kill "$system/bin/kill"
+said=$(systemd-analyze verify --root="$system" velmora-watch.service 2>&1) || fail "systemd-analyze verify: $said"
+[[ -z $said ]] || fail "systemd-analyze verify says: $said"
+said=$(systemd-analyze security --offline=true --threshold=25 --root="$system" velmora-watch.service) || fail "$said"
+
 if [[ ${#enter[@]} -gt 0 ]]; then
     "${enter[@]}" dpkg --purge "${installed[@]}" >"$root/said" 2>&1 || fail "not to be removed: $(<"$root/said")"
     left=$(find "$system"/{etc,lib,usr,var/lib} -path '*/dpkg/info' -prune -o -iname '*velmora*' -print -o -name '*obdsim*' -print)
