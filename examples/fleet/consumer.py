@@ -1,16 +1,19 @@
 #!/usr/bin/python3
-"""Stores what cars publish: consumer.py HOST:PORT DATABASE [--topic FILTER] [--name NAME].
+"""Stores what cars publish: consumer.py HOST:PORT[,HOST:PORT...] DATABASE [--topic FILTER] [--name NAME].
 
 One message is one transaction, which is committed before the broker is told that the message has come. Then the car is told
 up to which number all of it is stored, and forgets that. A message that comes twice changes nothing.
 
-User and password of the broker come from FLEET_USER and FLEET_CONSUMER_PASSWORD. DATABASE is a connection string. Whoever
-starts this has to start it again when it ends: it ends when the database fails, so that nothing is acknowledged."""
+Several places are the nodes of a cluster: when one is gone, the session goes on with the next. User and password of the
+broker come from FLEET_USER and FLEET_CONSUMER_PASSWORD. DATABASE is a connection string. Whoever starts this has to start it
+again when it ends: it ends when the database fails, so that nothing is acknowledged."""
 
 import argparse
+import itertools
 import json
 import os
 import sys
+import time
 
 import paho.mqtt.client as mqtt
 import psycopg
@@ -90,12 +93,17 @@ class Consumer:
         self.client.on_connect = self.on_connect
         self.client.on_subscribe = lambda *_: print("ready", flush=True)
         self.client.on_message = self.on_message
-        self.client.reconnect_delay_set(1, 10)
 
     def run(self):
-        host, _, port = self.arguments.broker.rpartition(":")
-        self.client.connect_async(host, int(port), keepalive=30)
-        self.client.loop_forever(retry_first_connection=True)
+        for place in itertools.cycle(self.arguments.broker.split(",")):
+            host, _, port = place.rpartition(":")
+            try:
+                self.client.connect(host, int(port), keepalive=30)
+                while self.client.loop() == mqtt.MQTT_ERR_SUCCESS:
+                    pass
+            except OSError as error:
+                print(f"{place}: {error}", file=sys.stderr, flush=True)
+            time.sleep(1)
 
     def on_connect(self, client, _userdata, _flags, result):
         if result == 0:
@@ -126,7 +134,7 @@ class Consumer:
 
 def main():
     parser = argparse.ArgumentParser(description=__doc__)
-    parser.add_argument("broker", metavar="HOST:PORT")
+    parser.add_argument("broker", metavar="HOST:PORT[,HOST:PORT...]")
     parser.add_argument("database")
     parser.add_argument("--topic", default="fleet/+/readings")
     parser.add_argument("--name", default="fleet-consumer")

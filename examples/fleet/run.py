@@ -159,8 +159,8 @@ class Fleet:
         for index, _ in enumerate(self.nodes):
             wait_for("NATS", lambda port=self.port(21931 + index): listens(port))
 
-    def start_consumer(self, name, port):
-        self.start(name, [sys.executable, HERE / "consumer.py", f"127.0.0.1:{port}", self.database(), "--name", name])
+    def start_consumer(self, name, places):
+        self.start(name, [sys.executable, HERE / "consumer.py", places, self.database(), "--name", name])
         wait_for(f"{name} (see {self.folder}/{name}.log)", lambda: self.is_ready(name))
 
     def is_ready(self, name):
@@ -178,20 +178,25 @@ class Fleet:
                 if i % 2 == mine]
 
     def broker_of(self, name):
+        """Where it goes, and as which user: of a cluster to any node, and the cars begin with different ones."""
         index = int(re.sub(r"\D", "", name))
         if name in self.names("m"):
-            return self.port(21941), name
-        return self.port(21931 + index // 2 % len(self.nodes)), "car"
+            return f"127.0.0.1:{self.port(21941)}", name
+        return self.cluster(index // 2), "car"
 
-    def output(self, name, port):
-        return (f"mqtt://127.0.0.1:{port}/fleet?ack_topic=fleet/{name}/stored&discovery=off"
+    def cluster(self, first):
+        count = len(self.nodes)
+        return ",".join(f"127.0.0.1:{self.port(21931 + (first + node) % count)}" for node in range(count))
+
+    def output(self, name, places):
+        return (f"mqtt://{places}/fleet?ack_topic=fleet/{name}/stored&discovery=off"
                 f"&spool={self.folder}/{name}.spool")
 
     def start_car(self, name, adapter="sim:petrol-can11?instant"):
-        port, user = self.broker_of(name)
+        places, user = self.broker_of(name)
         self.start(name, [self.arguments.velmora, "watch", "--port", adapter, "--vehicle", name,
                           "--settings", self.folder / "settings.toml",
-                          "--output", self.output(name, port), "--output", f"ndjson:{self.folder}/{name}.ndjson"],
+                          "--output", self.output(name, places), "--output", f"ndjson:{self.folder}/{name}.ndjson"],
                    VELMORA_MQTT_USER=user)
 
     def start_senders(self):
@@ -200,9 +205,9 @@ class Fleet:
             words = []
             for name in self.names(broker):
                 if name.startswith("sender"):
-                    port, user = self.broker_of(name)
+                    places, user = self.broker_of(name)
                     (self.folder / f"{name}.user").write_text(user + "\n")
-                    words += [name, f"{self.output(name, port)}&user_file={self.folder}/{name}.user"]
+                    words += [name, f"{self.output(name, places)}&user_file={self.folder}/{name}.user"]
             if words:
                 self.start(f"senders-{broker}", [self.arguments.sender, self.folder / "car0.ndjson", "5", *words])
 
@@ -301,8 +306,8 @@ def run(arguments, folder):
         fleet.start_mosquitto()
         fleet.start_nats()
         # Their sessions have to be there before the first car: what nobody has subscribed to, a broker throws away.
-        fleet.start_consumer("consumer-m", fleet.port(21941))
-        fleet.start_consumer("consumer-n", fleet.port(21931 + len(fleet.nodes) - 1))
+        fleet.start_consumer("consumer-m", f"127.0.0.1:{fleet.port(21941)}")
+        fleet.start_consumer("consumer-n", fleet.cluster(len(fleet.nodes) - 1))
         say("the engines run")
         for name in [each for each in fleet.names("m") + fleet.names("n") if each.startswith("car")]:
             fleet.start_car(name)
