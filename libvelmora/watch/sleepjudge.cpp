@@ -23,6 +23,7 @@ void SleepJudge::enter(State state, SteadyTime now)
     m_state = state;
     m_since = now;
     m_lastSign = now;
+    m_lastVolts = now;
     if (state != State::Asking) {
         m_running = m_engineTurns = m_moves = m_charges = false;
     }
@@ -71,6 +72,7 @@ void SleepJudge::onVolts(double volts, SteadyTime now)
         m_system = 1.0;
     }
     m_low = volts < scale(m_settings.lowVolts);
+    m_lastVolts = now;
     if (m_state == State::Asking) {
         judgeAwake(volts, now);
     } else if (m_state == State::Parked) {
@@ -81,8 +83,7 @@ void SleepJudge::onVolts(double volts, SteadyTime now)
 // The voltage of an alternator or a converter is a sign where the engine's speed is none.
 void SleepJudge::judgeAwake(double volts, SteadyTime now)
 {
-    bool const counts = m_settings.electric || !m_engineKnown;
-    m_charges = counts && volts >= scale(m_settings.runningVolts) && now - m_lastMove < m_settings.stillLimit;
+    m_charges = goesByVolts() && volts >= scale(m_settings.runningVolts) && now - m_lastMove < m_settings.stillLimit;
     sign(m_charges, now);
     if (m_low && !m_running) {
         enter(State::Settling, now);
@@ -94,7 +95,6 @@ void SleepJudge::judgeParked(double volts, SteadyTime now)
 {
     std::optional<double> const before = m_volts;
     m_volts = volts;
-    m_lastVolts = now;
     if (!before || m_low) {
         return;
     }
@@ -136,7 +136,8 @@ void SleepJudge::sleep(SteadyTime now)
 
 bool SleepJudge::wantsVolts(SteadyTime now) const
 {
-    return m_state == State::Parked && now - m_lastVolts >= m_settings.voltageEvery;
+    bool const looks = m_state == State::Parked || (m_state == State::Asking && goesByVolts());
+    return looks && now - m_lastVolts >= m_settings.voltageEvery;
 }
 
 bool SleepJudge::wantsProbe(SteadyTime now) const

@@ -57,13 +57,16 @@ public:
     // Goes to sleep at once: the car is silent, as sleeping cars are.
     void sleep(SteadyTime now);
 
-    // While parked: whether the voltage is due, and whether one request is allowed by wakeEvery.
+    // Whether the adapter should be asked for the voltage: while parked, and where it is the sign that the car runs and
+    // no control module tells it.
     bool wantsVolts(SteadyTime now) const;
+    // While parked: whether one request is allowed by wakeEvery.
     bool wantsProbe(SteadyTime now) const;
 
 private:
     void enter(State state, SteadyTime now);
     void sign(bool positive, SteadyTime now);
+    bool goesByVolts() const { return m_settings.electric || !m_engineKnown; }
     void judgeAwake(double volts, SteadyTime now);
     void judgeParked(double volts, SteadyTime now);
     double scale(double volts) const { return volts * m_system; }
@@ -73,7 +76,7 @@ private:
     SteadyTime m_since;     // of the state
     SteadyTime m_lastSign;  // that it runs
     SteadyTime m_lastMove;  // of the vehicle
-    SteadyTime m_lastVolts; // asked while parked
+    SteadyTime m_lastVolts; // told or asked for
     SteadyTime m_lastProbe;
     std::optional<double> m_volts; // the last while parked
     bool m_running = false;

@@ -17,9 +17,9 @@ struct Judged
 
     explicit Judged(BatterySettings const& settings = {}) : judge(settings, time.steady()) {}
 
-    void pass(std::chrono::seconds seconds)
+    void pass(std::chrono::milliseconds duration)
     {
-        time.pass(seconds);
+        time.pass(duration);
         judge.onTime(time.steady());
     }
     void volts(double value) { judge.onVolts(value, time.steady()); }
@@ -157,6 +157,97 @@ TEST(SleepJudge, AnElectricCarRunsByItsConverterForHalfAnHourWithoutMovement)
         petrol.pass(60s);
     }
     EXPECT_EQ(minutes, 31);
+}
+
+// Where no control module tells the voltage, the adapter has to.
+TEST(SleepJudge, AsksTheAdapterForTheVoltageThatTellsWhetherTheCarRuns)
+{
+    BatterySettings settings;
+    settings.electric = true;
+    Judged electric(settings);
+    Judged unknown;
+    Judged petrol;
+    petrol.judge.onEngineSpeed(800.0, petrol.time.steady());
+    for (Judged* const car : {&electric, &unknown, &petrol}) {
+        car->pass(59s);
+        EXPECT_FALSE(car->judge.wantsVolts(car->time.steady()));
+        car->pass(1s);
+    }
+    EXPECT_TRUE(electric.judge.wantsVolts(electric.time.steady()));
+    EXPECT_TRUE(unknown.judge.wantsVolts(unknown.time.steady()));
+    EXPECT_FALSE(petrol.judge.wantsVolts(petrol.time.steady()));
+    electric.volts(14.0);
+    EXPECT_TRUE(electric.judge.running());
+    EXPECT_FALSE(electric.judge.wantsVolts(electric.time.steady()));
+    unknown.judge.onNoVolts(unknown.time.steady());
+    EXPECT_FALSE(unknown.judge.wantsVolts(unknown.time.steady()));
+    EXPECT_FALSE(unknown.judge.running());
+}
+
+TEST(SleepJudge, EachThresholdIsTheLastValueOnItsSide)
+{
+    Judged low;
+    low.volts(12.1);
+    EXPECT_FALSE(low.judge.low());
+    low.volts(12.0);
+    EXPECT_TRUE(low.judge.low());
+
+    Judged running;
+    running.volts(13.1);
+    EXPECT_FALSE(running.judge.running());
+    running.volts(13.2);
+    EXPECT_TRUE(running.judge.running());
+
+    Judged system;
+    system.volts(18.0); // an alternator gone mad
+    system.volts(12.2);
+    EXPECT_FALSE(system.judge.low());
+    system.volts(18.1);
+    system.volts(24.2);
+    EXPECT_FALSE(system.judge.low());
+    system.volts(24.1);
+    EXPECT_TRUE(system.judge.low());
+
+    Judged change;
+    change.park(12.8);
+    EXPECT_EQ(change.after(60s, 12.7), State::Parked);
+    EXPECT_EQ(change.after(60s, 12.5), State::Asking);
+}
+
+TEST(SleepJudge, EachThresholdIsASetting)
+{
+    BatterySettings settings;
+    settings.stopAfter = 10s;
+    settings.settle = 20s;
+    settings.voltageEvery = 30s;
+    settings.runningVolts = 14.0;
+    settings.lowVolts = 11.0;
+    settings.wakeChange = 0.5;
+    settings.stillLimit = 2min;
+    Judged car(settings);
+    car.volts(11.1);
+    EXPECT_FALSE(car.judge.low());
+    car.pass(9s);
+    EXPECT_EQ(car.judge.state(), State::Asking);
+    car.pass(1s);
+    EXPECT_EQ(car.judge.state(), State::Settling);
+    car.pass(20s);
+    ASSERT_EQ(car.judge.state(), State::Parked);
+    car.volts(12.6);
+    car.pass(29s);
+    EXPECT_FALSE(car.judge.wantsVolts(car.time.steady()));
+    car.pass(1s);
+    EXPECT_TRUE(car.judge.wantsVolts(car.time.steady()));
+    EXPECT_EQ(car.after(0s, 12.2), State::Parked);
+    EXPECT_EQ(car.after(30s, 12.7), State::Asking);
+    for (int i = 0; i < 12; ++i) { // by its voltage, two minutes without movement
+        car.volts(14.0);
+        EXPECT_TRUE(car.judge.running()) << i;
+        car.pass(10s - 1ms);
+    }
+    car.pass(1s);
+    car.volts(14.0);
+    EXPECT_FALSE(car.judge.running());
 }
 
 TEST(SleepJudge, AsksAParkedCarOnlyIfTold)
