@@ -40,7 +40,8 @@ void address(std::string const& text)
         if (read.kind.starts_with("mqtt")) {
             OutputContext context;
             MqttSettings const broker = mqttSettings(read, context);
-            if (broker.topic.find("//") != std::string::npos || broker.port < 1) {
+            if (broker.topic.find("//") != std::string::npos || broker.brokers.empty() ||
+                broker.brokers.front().port < 1) {
                 std::abort();
             }
         }

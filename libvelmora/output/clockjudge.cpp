@@ -42,13 +42,22 @@ ClockLook lookAtClocks()
     return {millisOf(CLOCK_REALTIME), millisOf(CLOCK_BOOTTIME), knowsTimeServer(), id};
 }
 
+ClockStamp stampOf(ClockLook const& look)
+{
+    return {look.bootId, look.wall - look.boot};
+}
+
+std::int64_t stepBetween(std::int64_t offsetBefore, std::int64_t offset)
+{
+    std::int64_t const step = offset - offsetBefore;
+    return std::llabs(step) < smallestStep ? 0 : step;
+}
+
 std::int64_t ClockJudge::look(ClockLook const& now)
 {
     std::int64_t const offset = now.wall - now.boot;
-    std::int64_t step = m_known ? offset - m_offset : 0;
-    if (std::llabs(step) < smallestStep) {
-        step = 0;
-    } else {
+    std::int64_t const step = m_known ? stepBetween(m_offset, offset) : 0;
+    if (step != 0) {
         m_lastSet = now.boot;
     }
     m_known = true;

@@ -19,6 +19,17 @@ struct ClockLook
 
 using ClockSource = std::function<ClockLook()>;
 
+// By which clock something was dated: the machine's start, and how far the wall clock was ahead of the time since then.
+struct ClockStamp
+{
+    std::string bootId;
+    std::int64_t offset = 0; // ms
+};
+ClockStamp stampOf(ClockLook const& look);
+
+// By how many milliseconds the clock was set between two offsets; 0 for what a time server slews.
+std::int64_t stepBetween(std::int64_t offsetBefore, std::int64_t offset);
+
 // The machine's own.
 ClockLook lookAtClocks();
 

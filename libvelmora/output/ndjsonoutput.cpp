@@ -1,6 +1,7 @@
 #include "libvelmora/output/ndjsonoutput.h"
 
 #include "libvelmora/output/recordjson.h"
+#include "libvelmora/output/recordtime.h"
 #include "libvelmora/output/valuetext.h"
 
 #include <nlohmann/json.hpp>
@@ -9,7 +10,7 @@ namespace velmora {
 
 namespace {
 
-// What a record looks like in the stream; lists of modules and sensors are not part of it.
+// What a record looks like in the stream; lists of modules and sensors and a lamp as it was are no part of it.
 struct JsonLine
 {
     std::string operator()(Reading const& reading) const { return toLine(toJsonValue(reading)) + "\n"; }
@@ -22,6 +23,7 @@ struct JsonLine
     }
     std::string operator()(ModuleInfo const& /*info*/) const { return {}; }
     std::string operator()(SensorList const& /*list*/) const { return {}; }
+    std::string operator()(LampState const& /*lamp*/) const { return {}; }
     std::string operator()(CodeChange const& code) const
     {
         nlohmann::ordered_json const value = {{"time", utcTime(code.time)},
@@ -35,12 +37,6 @@ struct JsonLine
     }
 };
 
-struct RecordTime
-{
-    WallTime operator()(Trip const& trip) const { return trip.end; }
-    WallTime operator()(auto const& record) const { return record.time; }
-};
-
 } // namespace
 
 void NdjsonOutput::write(Records records)
@@ -50,7 +46,7 @@ void NdjsonOutput::write(Records records)
         lines += std::visit(JsonLine(), *record);
     }
     if (!lines.empty()) {
-        m_file.add(lines, std::visit(RecordTime(), *records.back()));
+        m_file.add(lines, timeOf(*records.back()));
     }
 }
 

@@ -20,8 +20,8 @@ struct KnownKind
 
 std::vector<KnownKind> const& knownKinds()
 {
-    static std::vector<std::string_view> const broker = {"qos",       "ca",    "user_file", "password_file",
-                                                         "ack_topic", "spool", "spool_max", "discovery"};
+    static std::vector<std::string_view> const broker = {
+        "qos", "ca", "user_file", "password_file", "ack_topic", "spool", "spool_max", "discovery", "keep_alive"};
     static std::vector<KnownKind> const kinds = {
         {"csv", false, {"rotate"}},
         {"csv-long", false, {"rotate"}},

@@ -15,7 +15,7 @@ namespace velmora {
 
 using WallTime = std::chrono::system_clock::time_point;
 
-// Something that happened: "lamp_on", "code_new", "link_lost", "engine_start", ...
+// Something that happened, of a kind that eventkinds.h names.
 struct Event
 {
     WallTime time;
@@ -63,6 +63,7 @@ struct SensorEntry
     std::string pid;
     std::string name;
     std::string unit;
+    double hertz = 0.0; // how often it will be read; 0 for as often as there is time
 };
 
 // All sensors that will be read from now on; replaces the list before.
@@ -85,7 +86,16 @@ struct CodeChange
     bool present = true; // false: it has gone
 };
 
-using Record = std::variant<Reading, Event, Trip, ModuleInfo, SensorList, CodeChange>;
+// How the malfunction lamp of a module was at a look; told at each of them, also if it is as before.
+struct LampState
+{
+    WallTime time;
+    std::string vehicle;
+    unsigned int module = 0;
+    bool on = false;
+};
+
+using Record = std::variant<Reading, Event, Trip, ModuleInfo, SensorList, CodeChange, LampState>;
 // Outputs share what they are given, so that one that stands still costs no copies.
 using SharedRecord = std::shared_ptr<Record const>;
 using Records = std::span<SharedRecord const>;

@@ -4,10 +4,9 @@
 #include "libvelmora/output/database.h"
 #include "libvelmora/output/ioutput.h"
 #include "libvelmora/output/outputaddress.h"
+#include "libvelmora/output/sqliterows.h"
 
-#include <map>
 #include <memory>
-#include <tuple>
 
 namespace velmora {
 
@@ -15,7 +14,7 @@ namespace velmora {
 class SqliteOutput : public IOutput
 {
 public:
-    explicit SqliteOutput(OutputAddress const& address);
+    explicit SqliteOutput(OutputAddress const& address, ClockSource clocks = lookAtClocks);
     ~SqliteOutput() override;
 
     void open() override;
@@ -27,21 +26,23 @@ public:
     Database& database() { return *m_database; }
 
 private:
-    struct Statements;
-    struct Inserter;
-    using SensorKey = std::tuple<std::string, unsigned int, std::string, std::string>; // vehicle, module, key, unit
+    struct Tables
+    {
+        explicit Tables(Database& database) : undated(database), rows(database, undated) {}
+
+        SqliteUndated undated;
+        SqliteRows rows;
+    };
 
     void insertAll(Records records);
-    std::int64_t sensorId(std::string const& vehicle, SensorEntry const& sensor);
-    void insert(Reading const& reading);
     void onFailure();
     void idle();
 
     std::string const m_file;
     Ballast m_ballast;
     std::unique_ptr<Database> m_database;
-    std::unique_ptr<Statements> m_statements;
-    std::map<SensorKey, std::int64_t> m_sensors;
+    std::unique_ptr<Tables> m_tables;
+    ClockKeeper m_keeper;
     unsigned int m_idleCalls = 0;
 };
 

@@ -2,7 +2,7 @@
 
 namespace velmora {
 
-inline constexpr int sqliteSchemaVersion = 1;
+inline constexpr int sqliteSchemaVersion = 2;
 inline constexpr int sqliteApplicationId = 0x766C6D72; // "vlmr"
 
 // Times are milliseconds since 1970, UTC. The readings lie in the order of time: that writes a small part of what the
@@ -67,6 +67,21 @@ CREATE TABLE trip (
     max_kmh       REAL,
     max_rpm       REAL,
     max_coolant_c REAL
+) STRICT;
+)";
+
+// What version 2 has beside those: rows that were dated by a clock that nobody had set yet, and which clock that is
+// now.
+inline constexpr char const* sqliteSchemaSince2 = R"(
+CREATE TABLE undated (
+    place  TEXT NOT NULL,
+    time   INTEGER NOT NULL,
+    number INTEGER NOT NULL,
+    boot   TEXT NOT NULL
+) STRICT;
+CREATE TABLE clock (
+    boot   TEXT NOT NULL,
+    offset INTEGER NOT NULL
 ) STRICT;
 )";
 

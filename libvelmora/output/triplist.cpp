@@ -30,7 +30,8 @@ std::vector<Trip> readTrips(std::string const& file)
         throw Error(ErrorKind::WrongUse, "There is no file " + file, {"name the FILE of watch's output sqlite:FILE"});
     }
     Database database(file, Database::Access::ReadOnly);
-    if (database.number("PRAGMA user_version") != sqliteSchemaVersion ||
+    std::int64_t const version = database.number("PRAGMA user_version");
+    if (version < 1 || version > sqliteSchemaVersion ||
         database.number("PRAGMA application_id") != sqliteApplicationId) {
         throw Error(ErrorKind::WrongUse, file + " is no database of watch, or one of another version");
     }

@@ -13,6 +13,9 @@ std::vector<Record> CodeWatch::take(CodeLook const& look, WallTime now)
 {
     m_news.clear();
     Known& known = m_modules[look.module];
+    if (look.lamp) {
+        m_news.emplace_back(LampState{now, m_vehicle, look.module, *look.lamp});
+    }
     if (look.lamp && known.lamp != look.lamp) {
         if (known.lamp || *look.lamp) { // a lamp that is off at the first look is no news
             tell(*look.lamp ? "lamp_on" : "lamp_off", look.module,

@@ -34,8 +34,8 @@ class CodeWatch
 public:
     explicit CodeWatch(std::string vehicle) : m_vehicle(std::move(vehicle)) {}
 
-    // Changes of codes, each with its event, and events of the lamp and of readiness. The first look at a module
-    // tells its codes without events: they are no news.
+    // The lamp as it is, changes of codes, each with its event, and events of the lamp and of readiness. The first look
+    // at a module tells its codes without events: they are no news.
     std::vector<Record> take(CodeLook const& look, WallTime now);
 
 private:

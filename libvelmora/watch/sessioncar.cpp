@@ -103,7 +103,7 @@ SensorList SessionCar::sensors()
 {
     SensorList list = sensorList(m_options.vehicle, m_sources);
     for (SignalRow const& row : m_signals->rows()) {
-        list.sensors.push_back({row.module, row.sensor, row.request, row.name, row.unit});
+        list.sensors.push_back({row.module, row.sensor, row.request, row.name, row.unit, row.hertz.value_or(0.0)});
     }
     return list;
 }
@@ -189,10 +189,9 @@ std::optional<double> SessionCar::volts()
     if (!m_up) {
         return probeVoltage(openBarePort(), voltageLimit);
     }
-    float volts = 0.0F;
-    bool const told = m_session->adapter()->batteryVoltage(volts);
+    float const volts = m_session->proxy()->batteryVoltage(); // between two requests, while values are read
     m_session->check();
-    return told && volts > 0.0F ? std::optional<double>(volts) : std::nullopt;
+    return volts > 0.0F ? std::optional<double>(volts) : std::nullopt;
 }
 
 bool SessionCar::probe()

@@ -107,6 +107,13 @@ void TripMeter::onOdometer(double km)
     m_trip->odometerKm = km - *m_odometerBegin;
 }
 
+void TripMeter::onClockSet(std::chrono::milliseconds step)
+{
+    if (m_trip) {
+        m_trip->begin += step;
+    }
+}
+
 std::optional<Trip> TripMeter::onTime(WatchTime const& now)
 {
     return m_trip && now.steady - m_lastSign >= m_settings.endAfter ? finish() : std::nullopt;

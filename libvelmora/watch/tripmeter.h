@@ -29,6 +29,8 @@ public:
     void onFuelRate(double litresPerHour, WatchTime const& now);
     void onCoolant(double celsius);
     void onOdometer(double km);
+    // The wall clock was set by so much: the trip under way began at another time than it told.
+    void onClockSet(std::chrono::milliseconds step);
 
     // Whether a trip is under way.
     bool underway() const { return m_trip.has_value(); }

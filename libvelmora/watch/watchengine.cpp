@@ -4,6 +4,7 @@
 
 #include <fmt/format.h>
 
+#include <cmath>
 #include <utility>
 
 namespace velmora {
@@ -31,6 +32,7 @@ std::chrono::milliseconds WatchEngine::step(WatchTime const& now)
     if (m_metStranger) {
         return restingStep;
     }
+    watchClock(now);
     // Without a link nobody knows whether the car still runs.
     if (m_connected || m_judge.state() != SleepJudge::State::Asking) {
         m_judge.onTime(now.steady);
@@ -50,6 +52,27 @@ std::chrono::milliseconds WatchEngine::step(WatchTime const& now)
     }
     tellTrip(m_trips.onTime(now));
     return m_asking ? askingStep : restingStep;
+}
+
+// What is written from now on has other times, and what was written before may be wrong.
+void WatchEngine::watchClock(WatchTime const& now)
+{
+    if (now.steady < m_nextClockLook) {
+        return;
+    }
+    m_nextClockLook = now.steady + restingStep;
+    std::int64_t const step = m_clock.look(m_rules.clocks());
+    if (step != 0) {
+        m_trips.onClockSet(std::chrono::milliseconds(step));
+        tell("clock_set",
+             fmt::format("The clock was set {} by {:.1f} s", step > 0 ? "forward" : "back",
+                         std::abs(static_cast<double>(step)) / 1000.0),
+             now);
+    }
+    bool const never = m_clock.trust() == ClockJudge::Trust::Never;
+    if (std::exchange(m_unsureTold, never) != never && never) {
+        tell("clock_unsure", "The clock was not set since the machine's start, and can't be right", now);
+    }
 }
 
 void WatchEngine::connect(WatchTime const& now)
@@ -126,149 +149,6 @@ void WatchEngine::work(WatchTime const& now)
     } else {
         stopAsking(now);
         park(now);
-    }
-}
-
-void WatchEngine::ask(WatchTime const& now)
-{
-    if (!std::exchange(m_asking, true)) {
-        m_lastReading = now.steady;
-        m_car.startAsking();
-    }
-    for (Reading const& each : m_car.readings()) {
-        take(each, now);
-    }
-    watchSilence(now);
-    followJudge(now);
-    if (m_asking && m_nextCodes && now.steady >= *m_nextCodes) {
-        lookAtCodes(now);
-    }
-    m_state = m_running ? "running" : "asking";
-}
-
-void WatchEngine::take(Reading const& reading, WatchTime const& now)
-{
-    m_lastReading = now.steady;
-    setIgnition(true, now);
-    double const* const number = std::get_if<double>(&reading.value);
-    if (number != nullptr) {
-        std::string const& sensor = reading.sensor;
-        if (sensor == "RPM") {
-            m_judge.onEngineSpeed(*number, now.steady);
-            m_trips.onEngineSpeed(*number, now);
-        } else if (sensor == "SPEED") {
-            m_judge.onVehicleSpeed(*number, now.steady);
-            m_trips.onVehicleSpeed(*number, now);
-        } else if (sensor == "MODULE_VOLTAGE") {
-            m_judge.onVolts(*number, now.steady);
-        } else if (reading.unit == "l/h") {
-            m_trips.onFuelRate(*number, now);
-        } else if (sensor == "COOLANT_TEMP") {
-            m_trips.onCoolant(*number);
-        } else if (sensor == "CLEAR_DISTANCE") {
-            m_trips.onOdometer(*number);
-        }
-    }
-    m_sink(reading);
-}
-
-void WatchEngine::watchSilence(WatchTime const& now)
-{
-    if (now.steady - m_lastReading < m_rules.silence || now.steady - m_lastCheck < m_rules.silence) {
-        return;
-    }
-    m_lastCheck = now.steady;
-    m_car.check();
-    setIgnition(false, now);
-    if (now.steady - m_lastReading >= m_rules.silentCar) {
-        m_judge.sleep(now.steady);
-    }
-}
-
-void WatchEngine::setIgnition(bool on, WatchTime const& now)
-{
-    if (std::exchange(m_ignition, on) != on) {
-        tell(on ? "ignition_on" : "ignition_off", on ? "The car answers" : "The car no longer answers", now);
-    }
-}
-
-void WatchEngine::lookAtCodes(WatchTime const& now)
-{
-    m_nextCodes = now.steady + m_rules.codesEvery;
-    for (CodeLook const& look : m_car.lookAtCodes()) {
-        for (Record& each : m_codes.take(look, now.wall)) {
-            m_sink(std::move(each));
-        }
-    }
-}
-
-void WatchEngine::followJudge(WatchTime const& now)
-{
-    if (std::exchange(m_running, m_judge.running()) != m_judge.running()) {
-        tell(m_running ? "engine_start" : "engine_stop", m_running ? "The engine runs" : "The engine stands", now);
-        if (m_running) {
-            m_nextCodes = now.steady;
-        }
-    }
-    if (std::exchange(m_lowTold, m_judge.low()) != m_judge.low()) {
-        tell(m_lowTold ? "voltage_low" : "voltage_good", m_lowTold ? "The battery is low" : "The battery has recovered",
-             now);
-    }
-}
-
-void WatchEngine::stopAsking(WatchTime const& now)
-{
-    if (std::exchange(m_asking, false)) {
-        m_car.stopAsking();
-        setIgnition(false, now);
-        tell("asleep", "The car is parked: nothing is asked of it any more", now);
-    }
-}
-
-void WatchEngine::park(WatchTime const& now)
-{
-    bool const settling = m_judge.state() == SleepJudge::State::Settling;
-    m_state = settling ? "settling" : "parked";
-    if (settling) {
-        return;
-    }
-    if (m_rules.battery.adapterSleep && !m_sleepless) {
-        nap(now);
-    } else {
-        lookAtVoltage(now);
-    }
-    followJudge(now);
-    if (m_judge.state() == SleepJudge::State::Asking) {
-        tell("awake", "The car seems to wake up", now);
-    }
-}
-
-void WatchEngine::lookAtVoltage(WatchTime const& now)
-{
-    if (m_judge.wantsVolts(now.steady)) {
-        std::optional<double> const volts = m_car.volts();
-        onLinkBack(now);
-        volts ? m_judge.onVolts(*volts, now.steady) : m_judge.onNoVolts(now.steady);
-    }
-    if (m_judge.wantsProbe(now.steady)) {
-        ++m_probes;
-        m_judge.onProbe(m_car.probe(), now.steady);
-    }
-}
-
-// An adapter that sleeps tells no voltage; one that does not know how to goes on telling it.
-void WatchEngine::nap(WatchTime const& now)
-{
-    if (!m_napping) {
-        m_connected = false;
-        m_napping = m_car.startNap();
-        m_sleepless = !m_napping;
-        onLinkBack(now);
-        m_napping ? tell("adapter_asleep", "The adapter sleeps until its own triggers wake it", now)
-                  : tell("adapter_awake", "The adapter knows no sleep: it is asked for the voltage", now);
-    } else if (m_car.napIsOver()) {
-        m_napping = false;
-        m_judge.wake(now.steady);
     }
 }
 

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "libvelmora/output/backoff.h"
+#include "libvelmora/output/clockjudge.h"
 #include "libvelmora/output/health.h"
 #include "libvelmora/watch/iwatchedcar.h"
 #include "libvelmora/watch/sleepjudge.h"
@@ -26,6 +27,7 @@ struct WatchRules
     // Whether a vehicle identification number is that of another vehicle than the one to be watched.
     std::function<bool(std::string const& vin)> isStranger = [](std::string const& /*vin*/) { return false; };
     unsigned int seed = 1; // of the jitter of pauses
+    ClockSource clocks = lookAtClocks;
 };
 
 // The watch without its clock and its loop: connects, asks, judges, tells. Call step as often as it says.
@@ -53,6 +55,7 @@ public:
     std::string const& trouble() const { return m_trouble; }
 
 private:
+    void watchClock(WatchTime const& now);
     void connect(WatchTime const& now);
     void onConnected(WatchTime const& now);
     void onLinkBack(WatchTime const& now);
@@ -78,6 +81,7 @@ private:
     TripMeter m_trips;
     CodeWatch m_codes;
     Backoff m_backoff;
+    ClockJudge m_clock;
     std::string m_state = "connecting";
     std::string m_trouble;
     bool m_connected = false; // adapter and vehicle were brought up
@@ -90,7 +94,9 @@ private:
     bool m_ignition = false;
     bool m_running = false;
     bool m_lowTold = false;
+    bool m_unsureTold = false;
     SteadyTime m_nextAttempt;
+    SteadyTime m_nextClockLook;
     SteadyTime m_lastReading;
     SteadyTime m_lastCheck;
     std::optional<SteadyTime> m_nextCodes;

@@ -79,7 +79,8 @@ std::vector<PollSource> sourcesFor(Session& session, std::string const& text, bo
     return sources;
 }
 
-void addEntries(std::vector<SensorEntry>& entries, obd::IEcu& ecu, obd::PowertrainParameter& parameter)
+void addEntries(std::vector<SensorEntry>& entries, obd::IEcu& ecu, obd::PowertrainParameter& parameter,
+                double hertz = 0.0)
 {
     auto const infos = parameter.sensorInfo(ecu);
     int const pid = parameter.pid();
@@ -89,7 +90,7 @@ void addEntries(std::vector<SensorEntry>& entries, obd::IEcu& ecu, obd::Powertra
         std::string const key = alone ? sensorKey(pid) : fmt::format("{}_{}", sensorKey(pid), info->uid() % 10 + 1);
         entries.push_back({ecu.id(), key, fmt::format("01{:02X}", pid),
                            alone ? title : title + ": " + info->description(),
-                           unitLabel(info->unit(obd::UnitSystem::Metric))});
+                           unitLabel(info->unit(obd::UnitSystem::Metric)), hertz});
     }
 }
 
@@ -167,7 +168,7 @@ SensorList sensorList(std::string const& vehicle, std::vector<PollSource> const&
 {
     SensorList list{std::chrono::system_clock::now(), vehicle, {}};
     for (PollSource const& each : sources) {
-        addEntries(list.sensors, *each.ecu, *each.parameter);
+        addEntries(list.sensors, *each.ecu, *each.parameter, each.hertz.value_or(0.0));
     }
     return list;
 }

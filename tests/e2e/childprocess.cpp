@@ -187,6 +187,11 @@ void ChildProcess::interrupt() const
     ::kill(m_pid, SIGINT);
 }
 
+void ChildProcess::hangUp() const
+{
+    ::kill(m_pid, SIGHUP);
+}
+
 int ChildProcess::wait()
 {
     int status = 0;

@@ -33,6 +33,7 @@ public:
     // The next line of its standard output, without the line feed.
     std::string readLine();
     void interrupt() const;
+    void hangUp() const;
     // Waits for the end and tells the exit code.
     int wait();
 

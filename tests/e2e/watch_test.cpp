@@ -5,8 +5,13 @@
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
 
+#include <algorithm>
 #include <chrono>
+#include <cstdio>
 #include <cstdlib>
+#include <filesystem>
+#include <fstream>
+#include <iterator>
 #include <sys/socket.h>
 #include <sys/un.h>
 #include <unistd.h>
@@ -93,6 +98,79 @@ TEST(Watch, RunsAsAServiceWritesAndEndsWithinTwoSecondsWithAllOnTheDisk)
     auto const trips = nlohmann::json::parse(runVelmora({"trips", "--json", folder.file("a.db")}).out);
     EXPECT_EQ(trips["trips"].size(), 1U);
     EXPECT_EQ(trips["trips"][0]["kind"], "engine run");
+}
+
+// What stands in all files of a folder, their names with it.
+std::string everythingIn(TemporaryFolder const& folder)
+{
+    std::string all;
+    for (auto const& each : std::filesystem::recursive_directory_iterator(folder.path())) {
+        all += each.path().string() + "\n";
+        if (each.is_regular_file()) {
+            std::ifstream in(each.path(), std::ios::binary);
+            all.append(std::istreambuf_iterator<char>(in), {});
+        }
+    }
+    return all;
+}
+
+TEST(Watch, OutputsHoldTheVinOnlyIfToldTo)
+{
+    for (std::string const vin : {"none", "full"}) {
+        TemporaryFolder const state; // where the names of vehicles are kept, by their numbers
+        TemporaryFolder const folder;
+        ::setenv("STATE_DIRECTORY", state.path().c_str(), 1);
+        ChildProcess watch({"watch", "--port", "sim:petrol-can11?instant", "--vin", vin, "--output", "ndjson:-",
+                            "--output", "sqlite:" + folder.file("a.db"), "--output", "csv:" + folder.file("a.csv"),
+                            "--output", "csv-long:" + folder.file("b.csv"), "--output", "influx:" + folder.file("c"),
+                            "--output", "mqtt://127.0.0.1:1/cars?spool=" + folder.file("spool")});
+        std::string lines;
+        for (int i = 0; i < 30; ++i) {
+            lines += watch.readLine();
+        }
+        watch.interrupt();
+        EXPECT_EQ(watch.wait(), 0);
+        EXPECT_THAT(lines, HasSubstr("\"RPM\""));
+        bool const found = (lines + everythingIn(folder)).find("VELMRAS1MM0000001") != std::string::npos;
+        EXPECT_EQ(found, vin == "full");
+        for (auto const& each : std::filesystem::recursive_directory_iterator(folder.path())) {
+            EXPECT_EQ(each.status().permissions() & std::filesystem::perms::mask, std::filesystem::perms(0600))
+                << each.path();
+        }
+        ::unsetenv("STATE_DIRECTORY");
+    }
+}
+
+TEST(Watch, ReadsItsSettingsAgainAndKeepsThemIfTheNewOnesMakeNoSense)
+{
+    TemporaryFolder const folder;
+    ::setenv("STATE_DIRECTORY", folder.file("state").c_str(), 1);
+    std::string const file = folder.file("w.toml");
+    std::string const port = "port = \"sim:petrol-can11?instant\"\n";
+    std::ofstream(file) << port << "vehicle = \"first\"\n";
+    ChildProcess watch({"watch", "--config", file, "--output", "ndjson:-", "--quiet"});
+    auto const readUntil = [&watch](std::string const& part) {
+        std::string line = watch.readLine();
+        while (!line.empty() &&
+               (line.find(part) == std::string::npos || line.find("\"sensor\"") == std::string::npos)) {
+            line = watch.readLine();
+        }
+        return !line.empty();
+    };
+    EXPECT_TRUE(readUntil("\"first\""));
+    std::ofstream(file) << port << "vehicle = \"second\"\n";
+    watch.hangUp();
+    EXPECT_TRUE(readUntil("\"second\""));
+    std::ofstream(file) << port << "vehicle = \"not a name\"\n";
+    watch.hangUp();
+    std::string line = watch.readLine();
+    while (!line.empty() && line.find("\"engine_start\"") == std::string::npos) { // it has begun anew
+        line = watch.readLine();
+    }
+    EXPECT_THAT(line, HasSubstr("\"second\""));
+    watch.interrupt();
+    EXPECT_EQ(watch.wait(), 0);
+    ::unsetenv("STATE_DIRECTORY");
 }
 
 // Reads from a vehicle until it is known by which name, and tells that.
@@ -184,6 +262,62 @@ TEST(Watch, EndsInTimeWhileNobodyReadsAnOutput)
 TEST(Watch, EndsInTimeWhileAnAdapterIsCalledThatDoesNotAnswer)
 {
     expectEnding("adapter");
+}
+
+// The network goes, and no connection is closed.
+TEST(Watch, NoticesABrokerThatIsOutOfReachAndLosesNothing)
+{
+    std::string const script = VELMORA_SOURCE_DIR "/tests/e2e/swallow.py";
+    EXPECT_EQ(std::system(("/usr/bin/python3 " + script + " " VELMORA_PROGRAM).c_str()), 0);
+}
+
+// Milliseconds from each request for a value to the next, by the adapter's traffic while values are read.
+std::vector<int> pausesOn(std::string const& vehicle)
+{
+    TemporaryFolder const folder;
+    ChildProcess watch({"watch", "--port", "sim:" + vehicle + "?instant", "--vehicle", "van", "--settings",
+                        folder.file("settings"), "--trace", folder.file("trace"), "--output", "ndjson:-", "--quiet"});
+    for (int values = 0; values < 25;) {
+        std::string const line = watch.readLine();
+        values += line.find("\"sensor\"") != std::string::npos ? 1 : 0;
+        if (line.empty()) {
+            ADD_FAILURE() << "the watch ended";
+            return {};
+        }
+    }
+    watch.interrupt();
+    EXPECT_EQ(watch.wait(), 0);
+    std::ifstream in(folder.file("trace"));
+    std::vector<int> pauses;
+    int before = -1;
+    for (std::string line; std::getline(in, line);) { // "08:15:00.250 >> 010C1\r"
+        int hour = 0;
+        int minute = 0;
+        int second = 0;
+        int milli = 0;
+        char request[8] = "";
+        if (std::sscanf(line.c_str(), "%d:%d:%d.%d >> %7s", &hour, &minute, &second, &milli, request) != 5) {
+            continue;
+        }
+        bool const live = std::string(request).starts_with("010") && request[3] > '3';
+        int const now = ((hour * 60 + minute) * 60 + second) * 1000 + milli;
+        if (live && before >= 0) {
+            pauses.push_back((now - before + 86400000) % 86400000);
+        }
+        before = live ? now : -1;
+    }
+    return pauses;
+}
+
+// SAE J1850: a module may be asked each 100 ms; from the model year 2003 on, as soon as it has answered.
+TEST(Watch, SparesTheModulesOfAnOldCar)
+{
+    std::vector<int> const old = pausesOn("petrol-pwm");   // of 2001
+    std::vector<int> const later = pausesOn("petrol-vpw"); // of 2003
+    ASSERT_GE(old.size(), 10U);
+    ASSERT_GE(later.size(), 10U);
+    EXPECT_GE(*std::ranges::min_element(old), 99); // the times are cut to milliseconds
+    EXPECT_LT(*std::ranges::min_element(later), 90);
 }
 
 TEST(Watch, ASecondSignalEndsItAtOnce)

@@ -42,8 +42,8 @@ class Subscriber
 {
 public:
     Subscriber(unsigned short port, std::string const& topics, int count, std::string const& options = "")
-        : m_pipe(::popen(("mosquitto_sub -h 127.0.0.1 -V mqttv311 -p " + std::to_string(port) + " " + topics + " -C " +
-                          std::to_string(count) + " -W 20 -q 1 -F '%t %p' " + options)
+        : m_pipe(::popen(("stdbuf -oL mosquitto_sub -h 127.0.0.1 -V mqttv311 -p " + std::to_string(port) + " " +
+                          topics + " -C " + std::to_string(count) + " -W 20 -q 1 -F '%t %p' " + options)
                              .c_str(),
                          "r"))
     {}
@@ -56,6 +56,16 @@ public:
     Subscriber(Subscriber const&) = delete;
     Subscriber& operator=(Subscriber const&) = delete;
 
+    // The next message; empty if none comes.
+    std::string readLine()
+    {
+        std::string line;
+        for (int each = std::fgetc(m_pipe); each != EOF && each != '\n'; each = std::fgetc(m_pipe)) {
+            line += static_cast<char>(each);
+        }
+        return line;
+    }
+    // All that have not been read.
     std::vector<std::string> lines()
     {
         std::string all;

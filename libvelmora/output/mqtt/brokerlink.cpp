@@ -12,11 +12,11 @@ namespace velmora {
 
 namespace {
 
-constexpr int keepAliveSeconds = 30;
 constexpr int withoutMqtt5 = 0x84;               // what a broker answers that has no MQTT 5
 constexpr int refusals = 0x80;                   // reasons from here on
 constexpr std::chrono::seconds connackLimit{15}; // a cluster that has lost a node takes 4 s and more
 constexpr int loopMillis = 100;
+constexpr std::chrono::milliseconds betweenNodes{1000}; // of a cluster; the pauses grow once all have failed
 
 struct Mosquitto
 {
@@ -111,8 +111,10 @@ void BrokerLink::run()
         }
         if (!m_atOnce) {
             m_listener.onDown(m_why);
+            m_turn = (m_turn + 1) % m_settings.brokers.size();
+            auto const pause = m_turn == 0 ? backoff.next() : betweenNodes;
             std::unique_lock lock(m_mutex);
-            m_wake.wait_for(lock, backoff.next(), [this] { return m_stop.load(); });
+            m_wake.wait_for(lock, pause, [this] { return m_stop.load(); });
         }
     }
 }
@@ -131,7 +133,9 @@ void BrokerLink::attempt()
         return;
     }
     // Waits for the name to be resolved, without a limit.
-    int const result = ::mosquitto_connect_async(client, m_settings.host.c_str(), m_settings.port, keepAliveSeconds);
+    BrokerPlace const& place = m_settings.brokers[m_turn];
+    int const result = ::mosquitto_connect_async(client, place.host.c_str(), place.port,
+                                                 static_cast<int>(m_settings.keepAlive.count()));
     if (result != MOSQ_ERR_SUCCESS) {
         fail(::mosquitto_strerror(result));
         return;

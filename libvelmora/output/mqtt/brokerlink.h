@@ -15,8 +15,9 @@ struct mosquitto;
 
 namespace velmora {
 
-// Keeps a connection to a broker, on a thread of its own: tries again at growing pauses, and with the older protocol
-// where the broker has no MQTT 5. Each connection begins with nothing under way.
+// Keeps a connection to a broker, on a thread of its own: tries again at growing pauses, with the next node
+// of a cluster, and with the older protocol where the broker has no MQTT 5. Each connection begins with nothing under
+// way.
 class BrokerLink
 {
 public:
@@ -77,8 +78,9 @@ private:
     std::thread m_thread;
     std::atomic<bool> m_stop{false};
     std::atomic<bool> m_again{false};
-    bool m_oldProtocol = false; // the link's thread alone, as are the next two
+    bool m_oldProtocol = false; // the link's thread alone, as are the next three
     bool m_atOnce = false;      // no pause before the next attempt
+    std::size_t m_turn = 0;     // which of the brokers
     std::string m_why;
     std::mutex m_mutex;
     std::condition_variable m_wake;

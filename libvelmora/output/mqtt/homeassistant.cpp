@@ -1,10 +1,12 @@
 #include "libvelmora/output/mqtt/homeassistant.h"
 
+#include "libvelmora/output/eventkinds.h"
 #include "libvelmora/output/valuetext.h"
 
 #include <velmora/version.h>
 
 #include <algorithm>
+#include <cmath>
 #include <iterator>
 #include <string_view>
 
@@ -54,31 +56,73 @@ bool isCounter(SensorEntry const& sensor)
     return sensor.unit == "km" || sensor.unit == "mi" || sensor.pid == runTime;
 }
 
+// What a module tells of the tank and of the traction battery.
+bool isLevel(SensorEntry const& sensor)
+{
+    return sensor.pid == "012F" || sensor.pid == "015B";
+}
+
 nlohmann::ordered_json device(HomeAssistantPlace const& place)
 {
     return {{"identifiers", {"velmora_" + place.vehicle}}, {"name", place.vehicle}, {"sw_version", versionText}};
 }
 
-nlohmann::ordered_json component(HomeAssistantPlace const& place, SensorEntry const& sensor)
+nlohmann::ordered_json entity(HomeAssistantPlace const& place, std::string const& platform, std::string const& key,
+                              std::string const& name)
+{
+    return {{"platform", platform}, {"unique_id", "velmora_" + place.vehicle + "_" + key}, {"name", name}};
+}
+
+nlohmann::ordered_json sensorEntity(HomeAssistantPlace const& place, SensorEntry const& sensor)
 {
     std::string const key = stateKey(sensor.module, sensor.sensor);
-    nlohmann::ordered_json entity = {{"platform", "sensor"},
-                                     {"unique_id", "velmora_" + place.vehicle + "_" + key},
-                                     {"name", sensor.name + " (" + moduleText(sensor.module) + ")"},
-                                     {"state_topic", place.stateTopic},
-                                     {"value_template", "{{ value_json['" + key + "'] }}"}};
+    nlohmann::ordered_json result = entity(place, "sensor", key, sensor.name + " (" + moduleText(sensor.module) + ")");
+    result["state_topic"] = place.stateTopic;
+    result["value_template"] = "{{ value_json['" + key + "'] }}";
+    if (std::optional<int> const expiry = expirySeconds(sensor)) {
+        result["expire_after"] = *expiry;
+    }
     if (!sensor.unit.empty()) {
         auto const* const row = std::ranges::find(unitRows, sensor.unit, &UnitRow::ours);
         bool const known = row != std::end(unitRows);
         if (!known || row->theirs != nullptr) {
-            entity["unit_of_measurement"] = known ? row->theirs : sensor.unit;
+            result["unit_of_measurement"] = known ? row->theirs : sensor.unit;
         }
-        entity["state_class"] = isCounter(sensor) ? "total_increasing" : "measurement";
+        result["state_class"] = isCounter(sensor) ? "total_increasing" : "measurement";
         if (known && row->deviceClass != nullptr) {
-            entity["device_class"] = sensor.pid == barometer ? "atmospheric_pressure" : row->deviceClass;
+            result["device_class"] = sensor.pid == barometer ? "atmospheric_pressure" : row->deviceClass;
         }
     }
-    return entity;
+    return result;
+}
+
+nlohmann::ordered_json lampEntity(HomeAssistantPlace const& place)
+{
+    nlohmann::ordered_json result = entity(place, "binary_sensor", lampKey, "Malfunction lamp");
+    result["state_topic"] = place.stateTopic;
+    result["value_template"] = std::string("{{ value_json['") + lampKey + "'] }}";
+    result["device_class"] = "problem";
+    return result;
+}
+
+nlohmann::ordered_json eventEntity(HomeAssistantPlace const& place)
+{
+    nlohmann::ordered_json result = entity(place, "event", "event", "Last event");
+    result["state_topic"] = place.eventTopic;
+    result["event_types"] = eventKinds;
+    return result;
+}
+
+// By their keys.
+nlohmann::ordered_json entities(HomeAssistantPlace const& place, std::vector<SensorEntry> const& sensors)
+{
+    nlohmann::ordered_json result;
+    for (SensorEntry const& each : sensors) {
+        result[stateKey(each.module, each.sensor)] = sensorEntity(place, each);
+    }
+    result[lampKey] = lampEntity(place);
+    result["event"] = eventEntity(place);
+    return result;
 }
 
 } // namespace
@@ -94,32 +138,44 @@ std::string stateKey(unsigned int module, std::string const& sensor)
     return key;
 }
 
+std::optional<int> expirySeconds(SensorEntry const& sensor)
+{
+    constexpr double periods = 3.0;
+    constexpr double shortest = 60.0;
+    if (isCounter(sensor) || isLevel(sensor)) {
+        return std::nullopt;
+    }
+    double const seconds = sensor.hertz > 0.0 ? std::ceil(periods / sensor.hertz) : shortest;
+    return static_cast<int>(std::clamp(seconds, shortest, 1e6));
+}
+
 std::vector<std::pair<std::string, std::string>> discoveryMessages(Discovery discovery, HomeAssistantPlace const& place,
                                                                    std::vector<SensorEntry> const& sensors)
 {
     std::vector<std::pair<std::string, std::string>> messages;
-    nlohmann::ordered_json const origin = {{"name", "velmora"}, {"sw_version", versionText}};
-    nlohmann::ordered_json components;
-    for (SensorEntry const& each : sensors) {
-        std::string const key = stateKey(each.module, each.sensor);
-        nlohmann::ordered_json entity = component(place, each);
-        components[key] = entity;
-        if (discovery == Discovery::Entity) {
-            entity.erase("platform");
-            entity["availability_topic"] = place.statusTopic;
-            entity["device"] = device(place);
-            entity["origin"] = origin;
-            messages.emplace_back("homeassistant/sensor/velmora_" + place.vehicle + "/" + key + "/config",
-                                  entity.dump());
-        }
+    if (discovery == Discovery::Off || sensors.empty()) {
+        return messages;
     }
-    if (discovery == Discovery::Device && !components.empty()) {
+    nlohmann::ordered_json const origin = {{"name", "velmora"}, {"sw_version", versionText}};
+    nlohmann::ordered_json const all = entities(place, sensors);
+    if (discovery == Discovery::Device) {
         nlohmann::ordered_json const config = {{"device", device(place)},
                                                {"origin", origin},
                                                {"availability_topic", place.statusTopic},
                                                {"qos", 1},
-                                               {"components", components}};
+                                               {"components", all}};
         messages.emplace_back("homeassistant/device/velmora_" + place.vehicle + "/config", config.dump());
+        return messages;
+    }
+    for (auto const& [key, component] : all.items()) {
+        nlohmann::ordered_json single = component;
+        std::string const platform = single["platform"];
+        single.erase("platform");
+        single["availability_topic"] = place.statusTopic;
+        single["device"] = device(place);
+        single["origin"] = origin;
+        messages.emplace_back("homeassistant/" + platform + "/velmora_" + place.vehicle + "/" + key + "/config",
+                              single.dump());
     }
     return messages;
 }

@@ -2,11 +2,9 @@
 
 #include "libvelmora/output/mqtt/spooltext.h"
 #include "libvelmora/output/recordjson.h"
-#include "libvelmora/output/valuetext.h"
 
 #include <velmora/error.h>
 
-#include <cstdlib>
 #include <thread>
 
 namespace velmora {
@@ -14,7 +12,6 @@ namespace velmora {
 namespace {
 
 constexpr std::chrono::milliseconds lastWords{500};
-constexpr std::chrono::milliseconds statePause{1000};
 constexpr char const* homeAssistantStatus = "homeassistant/status";
 
 SpoolSender::Time steadyNow()
@@ -22,35 +19,16 @@ SpoolSender::Time steadyNow()
     return std::chrono::steady_clock::now();
 }
 
-Spool::Time timeOf(ClockJudge::Trust trust)
-{
-    return trust == ClockJudge::Trust::Sure   ? Spool::Time::Sure
-           : trust == ClockJudge::Trust::Wait ? Spool::Time::Held
-                                              : Spool::Time::Unsure;
-}
-
-Spool::Stamp stampOf(ClockLook const& look)
-{
-    return {look.bootId, look.wall - look.boot};
-}
-
-// Whether a record was stamped before the clock was set by that step: then it lies nearer to where the clock would be
-// without.
-bool isFromBefore(Record const& record, std::int64_t step, ClockLook const& look)
-{
-    std::int64_t time = look.wall;
-    if (auto const* const reading = std::get_if<Reading>(&record)) {
-        time = toMillis(reading->time);
-    } else if (auto const* const event = std::get_if<Event>(&record)) {
-        time = toMillis(event->time);
-    }
-    return std::llabs(time - (look.wall - step)) < std::llabs(time - look.wall);
-}
-
 } // namespace
 
 MqttOutput::MqttOutput(OutputAddress const& address, OutputContext const& context)
-    : m_settings(mqttSettings(address, context)), m_tell(context.tell), m_clocks(context.clocks)
+    : m_settings(mqttSettings(address, context)), m_tell(context.tell), m_keeper(context.clocks),
+      m_home(m_settings.discovery, m_settings.place,
+             [this](std::string const& topic, std::string const& payload, bool retain) {
+                 if (m_link != nullptr) {
+                     m_link->publish(topic, payload, 1, retain);
+                 }
+             })
 {}
 
 MqttOutput::~MqttOutput()
@@ -68,43 +46,18 @@ void MqttOutput::open()
             return m_link->publish(m_settings.topic + "/readings", payload, m_settings.qos, false);
         },
         [this](std::string const& text) { tellOnce(text); });
-    resumeHeld(m_clocks());
+    m_keeper.resume(*m_spool);
     m_link = std::make_unique<BrokerLink>(
         m_settings, "velmora-" + m_settings.place.vehicle + "-" + m_spool->id().substr(0, 8),
         BrokerLink::Will{m_settings.place.statusTopic, "offline"}, static_cast<BrokerLink::Listener&>(*this));
     m_link->start();
 }
 
-// What was held when the watch ended still is, if the machine has not been started anew. Else nobody knows any more
-// how wrong its clock was.
-void MqttOutput::resumeHeld(ClockLook const& look)
-{
-    m_judge = ClockJudge();
-    m_judge.look(look);
-    std::optional<Spool::Stamp> const stamp = m_spool->heldStamp();
-    if (stamp && stamp->bootId != look.bootId) {
-        m_spool->release(Spool::Time::Unsure);
-        return;
-    }
-    if (stamp) {
-        ClockLook before = look;
-        before.wall = look.boot + stamp->offset;
-        ClockJudge judge;
-        judge.look(before);
-        if (std::int64_t const step = judge.look(look); step != 0) {
-            m_spool->shiftHeld(step, stampOf(look));
-        }
-    }
-    if (m_judge.trust() != ClockJudge::Trust::Wait) {
-        m_spool->release(timeOf(m_judge.trust()));
-    }
-}
-
 void MqttOutput::tellOnce(std::string const& text)
 {
     if (text != m_lastTold) {
         m_lastTold = text;
-        m_tell("mqtt " + m_settings.host + ": " + text);
+        m_tell("mqtt " + m_settings.brokers.front().host + ": " + text);
     }
 }
 
@@ -120,8 +73,8 @@ void MqttOutput::onUp()
     if (m_settings.discovery != Discovery::Off) {
         m_link->subscribe(homeAssistantStatus, 0);
     }
-    publishRetained(m_settings.place.statusTopic, "online");
-    publishDiscovery();
+    m_link->publish(m_settings.place.statusTopic, "online", 1, true);
+    m_home.publishDiscovery();
     m_sender->pump();
 }
 
@@ -150,7 +103,7 @@ void MqttOutput::onMessage(std::string const& topic, std::string const& payload)
     std::lock_guard const lock(m_mutex);
     if (topic == homeAssistantStatus) {
         if (payload == "online") {
-            publishDiscovery();
+            m_home.publishDiscovery();
         }
     } else if (std::optional<std::int64_t> const mark = storedMark(payload, m_spool->id())) {
         m_sender->onMark(*mark, steadyNow());
@@ -160,11 +113,13 @@ void MqttOutput::onMessage(std::string const& topic, std::string const& payload)
 void MqttOutput::write(Records records)
 {
     std::lock_guard const lock(m_mutex);
-    watchClock(records);
+    spoolRecords(records);
     for (SharedRecord const& record : records) {
-        takeForHome(*record);
+        m_home.take(*record, steadyNow());
     }
-    publishState();
+    if (m_sender->isUp()) {
+        m_home.publishState(steadyNow());
+    }
     if (m_sender->isStuck(steadyNow())) {
         m_link->reconnect();
     }
@@ -172,87 +127,37 @@ void MqttOutput::write(Records records)
 }
 
 // Times are repaired before they are sent and never after: a consumer may know a reading by its time, too.
-void MqttOutput::watchClock(Records records)
+void MqttOutput::spoolRecords(Records records)
 {
-    ClockLook const look = m_clocks();
-    bool const held = m_judge.trust() == ClockJudge::Trust::Wait;
-    std::int64_t const step = m_judge.look(look);
-    Spool::Time const time = timeOf(m_judge.trust());
-    if (held && step != 0) {
-        m_spool->shiftHeld(step, stampOf(look));
-    } else if (time == Spool::Time::Held && !m_spool->heldStamp()) {
-        m_spool->keepStamp(stampOf(look));
-    }
-    spoolRecords(records, held ? step : 0, look);
-    if (held && time != Spool::Time::Held) {
-        m_spool->release(time);
-    }
-    makeRoom(look);
-}
-
-void MqttOutput::spoolRecords(Records records, std::int64_t step, ClockLook const& look)
-{
+    m_keeper.begin(*m_spool);
     std::vector<std::string> texts;
     for (SharedRecord const& record : records) {
-        std::string text = spoolText(*record);
-        if (text.empty()) {
-            continue;
+        std::string text = spoolText(*m_keeper.dated(record));
+        if (!text.empty()) {
+            texts.push_back(std::move(text));
         }
-        bool const shifts = step != 0 && isFromBefore(*record, step, look);
-        texts.push_back(shifts ? shiftedText(text, step) : std::move(text));
     }
+    makeRoom(texts);
     if (!texts.empty()) {
-        m_spool->add(texts, timeOf(m_judge.trust()));
+        m_spool->add(texts, Spool::timeBy(m_keeper.trust()));
     }
+    m_keeper.done();
+    m_gap = {};
 }
 
-void MqttOutput::makeRoom(ClockLook const& look)
+// What is lost is told in the stream itself.
+void MqttOutput::makeRoom(std::vector<std::string>& texts)
 {
     Spool::Gap const gap = m_spool->makeRoom();
     if (gap.last > 0) {
+        m_gap = {m_gap.last > 0 ? m_gap.first : gap.first, gap.last};
+    }
+    if (m_gap.last > 0) {
         nlohmann::ordered_json const event = {
-            {"time", look.wall}, {"event", "gap"}, {"from", gap.first}, {"to", gap.last}};
-        m_spool->add({toLine(event)}, timeOf(m_judge.trust()));
+            {"time", m_keeper.look().wall}, {"event", "gap"}, {"from", m_gap.first}, {"to", m_gap.last}};
+        texts.push_back(toLine(event));
         tellOnce("the spool is full: its oldest readings were dropped");
     }
-}
-
-void MqttOutput::takeForHome(Record const& record)
-{
-    if (auto const* const reading = std::get_if<Reading>(&record)) {
-        nlohmann::ordered_json const value = valueJson(*reading);
-        m_state[stateKey(reading->module, reading->sensor)] = value.is_null() ? nlohmann::ordered_json("None") : value;
-        m_stateChanged = true;
-    } else if (auto const* const list = std::get_if<SensorList>(&record)) {
-        m_sensors = list->sensors;
-        publishDiscovery();
-    }
-}
-
-void MqttOutput::publishState()
-{
-    auto const now = steadyNow();
-    // A little less than a second: writes come once a second, give or take.
-    if (m_sender->isUp() && m_stateChanged && now - m_stateTime >= statePause - statePause / 10) {
-        m_stateChanged = false;
-        m_stateTime = now;
-        publishRetained(m_settings.place.stateTopic, toLine(m_state));
-    }
-}
-
-void MqttOutput::publishDiscovery()
-{
-    if (!m_sender->isUp()) {
-        return;
-    }
-    for (auto const& [topic, payload] : discoveryMessages(m_settings.discovery, m_settings.place, m_sensors)) {
-        publishRetained(topic, payload);
-    }
-}
-
-void MqttOutput::publishRetained(std::string const& topic, std::string const& payload)
-{
-    m_link->publish(topic, payload, 1, true);
 }
 
 OutputState MqttOutput::state()

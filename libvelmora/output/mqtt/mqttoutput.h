@@ -2,9 +2,8 @@
 
 #include "libvelmora/output/ioutput.h"
 #include "libvelmora/output/mqtt/brokerlink.h"
+#include "libvelmora/output/mqtt/homestate.h"
 #include "libvelmora/output/mqtt/spoolsender.h"
-
-#include <nlohmann/json.hpp>
 
 #include <chrono>
 #include <memory>
@@ -27,36 +26,25 @@ public:
     OutputState state() override;
 
 private:
-    using Time = std::chrono::steady_clock::time_point;
-
     void onUp() override;
     void onDown(std::string const& why) override;
     void onDelivered(int message) override;
     void onRefused(int message, std::string const& why) override;
     void onMessage(std::string const& topic, std::string const& payload) override;
 
-    void watchClock(Records records);
-    void resumeHeld(ClockLook const& look);
-    void spoolRecords(Records records, std::int64_t step, ClockLook const& look);
-    void makeRoom(ClockLook const& look);
-    void takeForHome(Record const& record);
-    void publishState();
-    void publishDiscovery();
-    void publishRetained(std::string const& topic, std::string const& payload);
+    void spoolRecords(Records records);
+    void makeRoom(std::vector<std::string>& texts);
     void tellOnce(std::string const& text);
     bool underway();
 
     MqttSettings const m_settings;
     OutputRunner::Tell const m_tell;
-    ClockSource const m_clocks;
     std::mutex m_mutex; // all below
     std::unique_ptr<Spool> m_spool;
     std::unique_ptr<SpoolSender> m_sender;
-    ClockJudge m_judge;
-    std::vector<SensorEntry> m_sensors;
-    nlohmann::ordered_json m_state;
-    bool m_stateChanged = false;
-    Time m_stateTime;
+    ClockKeeper m_keeper;
+    HomeState m_home;
+    Spool::Gap m_gap; // dropped, and not told yet
     std::string m_lastTold;
     std::unique_ptr<BrokerLink> m_link; // ends before all above; set by open and close
 };

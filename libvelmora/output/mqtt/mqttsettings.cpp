@@ -64,16 +64,25 @@ Discovery discoveryOf(OutputAddress const& address)
     return text == "device" ? Discovery::Device : text == "entity" ? Discovery::Entity : Discovery::Off;
 }
 
-void takePlace(OutputAddress const& address, MqttSettings& settings)
+std::chrono::seconds keepAliveOf(OutputAddress const& address)
 {
-    std::size_t const slash = address.target.find('/');
-    std::string host = address.target.substr(0, slash);
-    settings.topic = slash == std::string::npos ? "velmora" : address.target.substr(slash + 1);
+    std::string const text = address.option("keep_alive", "30");
+    int seconds = 0;
+    auto const [stop, error] = std::from_chars(text.data(), text.data() + text.size(), seconds);
+    if (error != std::errc() || stop != text.data() + text.size() || seconds < 5 || seconds > 65535) {
+        rejectBroker(address, "keep_alive is a number of seconds, from 5 to 65535");
+    }
+    return std::chrono::seconds(seconds);
+}
+
+BrokerPlace brokerPlace(OutputAddress const& address, std::string host, int port)
+{
+    BrokerPlace place{{}, port};
     std::size_t const colon = host.rfind(':');
     if (colon != std::string::npos && host.back() != ']') {
         char const* const end = host.data() + host.size();
-        auto const [stop, error] = std::from_chars(host.data() + colon + 1, end, settings.port);
-        if (error != std::errc() || stop != end || settings.port < 1 || settings.port > 65535) {
+        auto const [stop, error] = std::from_chars(host.data() + colon + 1, end, place.port);
+        if (error != std::errc() || stop != end || place.port < 1 || place.port > 65535) {
             rejectBroker(address, "the port must be from 1 to 65535");
         }
         host.resize(colon);
@@ -81,12 +90,24 @@ void takePlace(OutputAddress const& address, MqttSettings& settings)
     if (host.size() > 2 && host.front() == '[' && host.back() == ']') {
         host = host.substr(1, host.size() - 2);
     }
-    settings.host = host;
+    place.host = host;
     if (host.empty() || host.find('@') != std::string::npos) {
         rejectBroker(address, "the host is missing, or a user stands before it: name that in user_file");
     }
+    return place;
+}
+
+void takePlaces(OutputAddress const& address, MqttSettings& settings)
+{
+    std::size_t const slash = address.target.find('/');
+    settings.topic = slash == std::string::npos ? "velmora" : address.target.substr(slash + 1);
     if (!isTopic(settings.topic)) {
         rejectBroker(address, "\"" + settings.topic + "\" is no topic");
+    }
+    std::string hosts = address.target.substr(0, slash) + ",";
+    for (std::size_t comma = hosts.find(','); comma != std::string::npos; comma = hosts.find(',')) {
+        settings.brokers.push_back(brokerPlace(address, hosts.substr(0, comma), settings.tls ? tlsPort : plainPort));
+        hosts.erase(0, comma + 1);
     }
 }
 
@@ -96,8 +117,7 @@ MqttSettings mqttSettings(OutputAddress const& address, OutputContext const& con
 {
     MqttSettings settings;
     settings.tls = address.kind == "mqtts";
-    settings.port = settings.tls ? tlsPort : plainPort;
-    takePlace(address, settings);
+    takePlaces(address, settings);
     settings.topic += "/" + context.vehicle;
     settings.ca = address.option("ca");
     std::string const qos = address.option("qos", "1");
@@ -105,6 +125,7 @@ MqttSettings mqttSettings(OutputAddress const& address, OutputContext const& con
         rejectBroker(address, "qos is 0 or 1");
     }
     settings.qos = qos == "0" ? 0 : 1;
+    settings.keepAlive = keepAliveOf(address);
     settings.user = secret(address, "user_file", "VELMORA_MQTT_USER");
     settings.password = secret(address, "password_file", "VELMORA_MQTT_PASSWORD");
     settings.ackTopic = address.option("ack_topic");
@@ -114,7 +135,8 @@ MqttSettings mqttSettings(OutputAddress const& address, OutputContext const& con
     settings.spool = address.option("spool", (context.stateFolder / ("spool-" + context.vehicle + ".db")).string());
     settings.spoolMax = parseSize(address.option("spool_max", "256M"));
     settings.discovery = discoveryOf(address);
-    settings.place = {context.vehicle, settings.topic + "/status", settings.topic + "/state"};
+    settings.place = {context.vehicle, settings.topic + "/status", settings.topic + "/state",
+                      settings.topic + "/event"};
     return settings;
 }
 

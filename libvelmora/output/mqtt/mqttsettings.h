@@ -4,19 +4,27 @@
 #include "libvelmora/output/outputaddress.h"
 #include "libvelmora/output/outputcontext.h"
 
+#include <chrono>
 #include <string>
+#include <vector>
 
 namespace velmora {
+
+struct BrokerPlace
+{
+    std::string host;
+    int port = 1883;
+};
 
 // Where and how an MQTT output sends.
 struct MqttSettings
 {
-    std::string host;
-    int port = 1883;
-    std::string topic; // with the vehicle: "cars/van"
+    std::vector<BrokerPlace> brokers; // one, or the nodes of a cluster: any of them will do
+    std::string topic;                // with the vehicle: "cars/van"
     bool tls = false;
     std::string ca; // file; empty: those of the system
     int qos = 1;
+    std::chrono::seconds keepAlive{30}; // so long without a word from the broker, twice, and the connection is given up
     std::string user;
     std::string password;
     std::string ackTopic; // empty: the broker's word is enough

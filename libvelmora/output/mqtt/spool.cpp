@@ -148,18 +148,18 @@ Spool::Gap Spool::makeRoom()
     return gap;
 }
 
-std::optional<Spool::Stamp> Spool::heldStamp()
+std::optional<ClockStamp> Spool::heldStamp()
 {
     Statement select(m_database, "SELECT boot, offset FROM meta WHERE boot IS NOT NULL");
-    return select.next() ? std::optional<Stamp>({select.text(0), select.number(1)}) : std::nullopt;
+    return select.next() ? std::optional<ClockStamp>({select.text(0), select.number(1)}) : std::nullopt;
 }
 
-void Spool::keepStamp(Stamp const& stamp)
+void Spool::keepStamp(ClockStamp const& stamp)
 {
     change([&] { writeStamp(stamp); });
 }
 
-void Spool::writeStamp(Stamp const& stamp)
+void Spool::writeStamp(ClockStamp const& stamp)
 {
     Statement update(m_database, "UPDATE meta SET boot = ?, offset = ?");
     update.bind(1, stamp.bootId);
@@ -167,7 +167,7 @@ void Spool::writeStamp(Stamp const& stamp)
     update.run();
 }
 
-void Spool::shiftHeld(std::int64_t millis, Stamp const& stamp)
+void Spool::shiftHeld(std::int64_t millis, ClockStamp const& stamp)
 {
     change([&] {
         Statement select(m_database, "SELECT seq, text FROM row WHERE time = 0 ORDER BY seq");
@@ -185,11 +185,16 @@ void Spool::shiftHeld(std::int64_t millis, Stamp const& stamp)
     });
 }
 
-void Spool::release(Time time)
+Spool::Time Spool::timeBy(ClockJudge::Trust trust)
+{
+    return trust == ClockJudge::Trust::Sure ? Time::Sure : trust == ClockJudge::Trust::Wait ? Time::Held : Time::Unsure;
+}
+
+void Spool::release(ClockJudge::Trust trust)
 {
     change([&] {
         Statement update(m_database, "UPDATE row SET time = ? WHERE time = 0");
-        update.bind(1, static_cast<std::int64_t>(time));
+        update.bind(1, static_cast<std::int64_t>(timeBy(trust)));
         update.run();
         m_database.execute("UPDATE meta SET boot = NULL");
     });

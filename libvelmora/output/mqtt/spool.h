@@ -1,6 +1,7 @@
 #pragma once
 
 #include "libvelmora/output/ballast.h"
+#include "libvelmora/output/clockkeeper.h"
 #include "libvelmora/output/database.h"
 
 #include <cstdint>
@@ -12,7 +13,7 @@ namespace velmora {
 
 // What waits to be sent, on the disk. A row is known by the spool's random id and its number, never by its time:
 // numbers rise and are never used again, also after all rows are gone. For one thread at a time.
-class Spool
+class Spool final : public IHeldRows
 {
 public:
     // What is known of the time in a row. It may change while the row is held, and never after that.
@@ -22,6 +23,7 @@ public:
         Sure = 1,
         Unsure = 2, // as the clock was, which nobody has set
     };
+    static Time timeBy(ClockJudge::Trust trust);
 
     struct Row
     {
@@ -53,19 +55,11 @@ public:
     };
     Gap makeRoom();
 
-    // By which clock held rows were stamped: the machine's start, and how far the wall clock was ahead of the time
-    // since then.
-    struct Stamp
-    {
-        std::string bootId;
-        std::int64_t offset = 0; // ms
-    };
-    std::optional<Stamp> heldStamp();
-    void keepStamp(Stamp const& stamp);
-    // Moves the times in all held rows, which are stamped like that from now on.
-    void shiftHeld(std::int64_t millis, Stamp const& stamp);
-    // No row is held any more.
-    void release(Time time);
+    // Held rows.
+    std::optional<ClockStamp> heldStamp() override;
+    void keepStamp(ClockStamp const& stamp) override;
+    void shiftHeld(std::int64_t millis, ClockStamp const& stamp) override;
+    void release(ClockJudge::Trust trust) override;
 
     std::int64_t rows() { return m_database.number("SELECT count(*) FROM row"); }
     // How many there are at most, without counting them.
@@ -76,7 +70,7 @@ public:
 private:
     void prepare();
     std::int64_t usedBytes();
-    void writeStamp(Stamp const& stamp);
+    void writeStamp(ClockStamp const& stamp);
     template <typename Work>
     void change(Work const& work);
 

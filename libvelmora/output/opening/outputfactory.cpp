@@ -1,6 +1,7 @@
 #include "libvelmora/output/opening/outputfactory.h"
 
 #include "libvelmora/output/csvoutput.h"
+#include "libvelmora/output/holdingoutput.h"
 #include "libvelmora/output/influxoutput.h"
 #include "libvelmora/output/mqtt/mqttoutput.h"
 #include "libvelmora/output/ndjsonoutput.h"
@@ -19,11 +20,25 @@ struct Maker
     std::unique_ptr<IOutput> (*make)(OutputAddress const&, OutputContext const&);
 };
 
-template <typename Output>
-std::unique_ptr<IOutput> makeOf(OutputAddress const& address, OutputContext const& /*context*/)
+// A line that was written keeps its time, so it waits until the clock is right.
+[[maybe_unused]] std::unique_ptr<IOutput> held(std::unique_ptr<IOutput> output, OutputAddress const& address,
+                                               OutputContext const& context)
 {
-    return std::make_unique<Output>(address);
+    return std::make_unique<HoldingOutput>(std::move(output), address, context);
 }
+
+template <typename Output>
+std::unique_ptr<IOutput> makeHeld(OutputAddress const& address, OutputContext const& context)
+{
+    return held(std::make_unique<Output>(address), address, context);
+}
+
+#ifdef VELMORA_OUTPUT_INFLUX
+std::unique_ptr<IOutput> makeInflux(OutputAddress const& address, OutputContext const& context)
+{
+    return held(makeInfluxOutput(address), address, context);
+}
+#endif
 
 #ifdef VELMORA_OUTPUT_MQTT
 std::unique_ptr<IOutput> makeMqtt(OutputAddress const& address, OutputContext const& context)
@@ -36,17 +51,20 @@ std::vector<Maker> const& makers()
 {
     static std::vector<Maker> const list = {
 #ifdef VELMORA_OUTPUT_CSV
-        {"csv", makeOf<CsvOutput>},
-        {"csv-long", makeOf<CsvLongOutput>},
+        {"csv", makeHeld<CsvOutput>},
+        {"csv-long", makeHeld<CsvLongOutput>},
 #endif
 #ifdef VELMORA_OUTPUT_NDJSON
-        {"ndjson", makeOf<NdjsonOutput>},
+        {"ndjson", makeHeld<NdjsonOutput>},
 #endif
 #ifdef VELMORA_OUTPUT_INFLUX
-        {"influx", [](OutputAddress const& address, OutputContext const&) { return makeInfluxOutput(address); }},
+        {"influx", makeInflux},
 #endif
 #ifdef VELMORA_OUTPUT_SQLITE
-        {"sqlite", makeOf<SqliteOutput>},
+        {"sqlite",
+         [](OutputAddress const& address, OutputContext const& context) -> std::unique_ptr<IOutput> {
+             return std::make_unique<SqliteOutput>(address, context.clocks);
+         }},
 #endif
 #ifdef VELMORA_OUTPUT_PROMETHEUS
         {"prometheus",

@@ -1,4 +1,5 @@
 #include "tests/support/broker.h"
+#include "tests/support/discoveryschema.h"
 
 #include <velmora/error.h>
 
@@ -9,6 +10,7 @@ namespace {
 
 using testsupport::brokerContext;
 using testsupport::brokerText;
+using testsupport::discoveryComplaint;
 using testsupport::isEmptied;
 using testsupport::mosquittoCommand;
 using testsupport::reading;
@@ -18,17 +20,6 @@ using testsupport::ServerProcess;
 using testsupport::Subscriber;
 using testsupport::TemporaryFolder;
 using velmora::MqttOutput;
-
-// 0 if the message is as Home Assistant's discovery wants it.
-int discoveryComplaint(TemporaryFolder const& folder, std::string const& message)
-{
-    std::ofstream(folder.file("message")) << message;
-    std::string const program = "import json,sys,jsonschema; a=[json.load(open(f)) for f in sys.argv[1:]]; "
-                                "jsonschema.Draft202012Validator(a[0]).validate(a[1])";
-    return std::system(("python3 -c '" + program + "' " VELMORA_SOURCE_DIR "/tests/support/homeassistant.schema.json " +
-                        folder.file("message") + " 2>/dev/null")
-                           .c_str());
-}
 
 TEST(MqttOutput, WhatWasWrittenWithoutABrokerArrivesOnceOneIsThere)
 {
@@ -48,6 +39,21 @@ TEST(MqttOutput, WhatWasWrittenWithoutABrokerArrivesOnceOneIsThere)
     EXPECT_EQ(batch["vehicle"], "van");
     ASSERT_FALSE(batch["readings"].empty());
     EXPECT_EQ(batch["readings"].back().at(0), batch["last"]);
+    EXPECT_TRUE(isEmptied(folder));
+    output.close();
+}
+
+TEST(MqttOutput, GoesToTheNextNodeWhenOneIsGone)
+{
+    TemporaryFolder const folder;
+    unsigned short const gone = testsupport::freePort();
+    unsigned short const port = testsupport::freePort();
+    ServerProcess const broker(mosquittoCommand(folder, port), port);
+    auto const address = velmora::parseOutputAddress("mqtt://127.0.0.1:" + std::to_string(gone) +
+                                                     ",127.0.0.1:" + std::to_string(port) + "/cars?discovery=off");
+    MqttOutput output(address, brokerContext(folder));
+    output.open();
+    output.write(records(reading("RPM", 800.0)));
     EXPECT_TRUE(isEmptied(folder));
     output.close();
 }
@@ -152,13 +158,16 @@ TEST(MqttOutput, TimesOfAClockThatWasWrongAtBootAreRepairedBeforeTheyAreSent)
     look = {1002000, 22000, false, "boot-1"};
     output.write(records(reading("RPM", 2.0, 1001000)));
     EXPECT_EQ(rowsLeft(folder), 2);
-    Subscriber subscriber(port, "-t cars/van/readings", 1);
-    ::usleep(300000); // the subscription is there
+    std::string const publish = "mosquitto_pub -h 127.0.0.1 -p " + std::to_string(port);
+    ASSERT_EQ(std::system((publish + " -r -t here -m 1").c_str()), 0);
+    Subscriber subscriber(port, "-t cars/van/readings -t here", 2);
+    EXPECT_EQ(subscriber.readLine(), "here 1"); // so the broker has the subscription
     std::int64_t const set = testsupport::march;
     look = {set + 24000, 24000, true, "boot-1"};
     output.write(records(reading("RPM", 3.0, 1003000), reading("RPM", 4.0, set + 23900)));
     std::vector<std::string> const lines = subscriber.lines();
     ASSERT_EQ(lines.size(), 1U);
+    ASSERT_TRUE(lines[0].starts_with("cars/van/readings "));
     nlohmann::json const batch = nlohmann::json::parse(lines[0].substr(lines[0].find(' ')));
     std::vector<std::int64_t> times;
     for (auto const& each : batch["readings"]) {

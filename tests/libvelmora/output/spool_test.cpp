@@ -3,6 +3,7 @@
 #include "libvelmora/output/mqtt/spoolsender.h"
 #include "libvelmora/output/mqtt/spooltext.h"
 #include "tests/support/broker.h"
+#include "tests/support/smalldisk.h"
 
 #include <velmora/error.h>
 
@@ -54,21 +55,91 @@ TEST(MqttSpool, ACapDropsTheOldestAndTellsWhich)
     EXPECT_EQ(spool.after(0, 1).at(0).seq, 202);
 }
 
+// In a process of its own, on a small disk. Tells how it went by its exit code.
+enum SpoolDisk : int
+{
+    SpoolFine = 0,
+    SpoolNoDisk = 20,
+    SpoolNoBallast,
+    SpoolNeverFull,
+    SpoolBallastKept,
+    SpoolLost,
+    SpoolNotRecovered
+};
+
+int fillSpool(std::string const& folder)
+{
+    if (!testsupport::mountSmallDisk(folder, 8)) {
+        return SpoolNoDisk;
+    }
+    Spool spool(folder + "/s", 1 << 30);
+    if (!std::filesystem::exists(folder + "/s-ballast")) {
+        return SpoolNoBallast;
+    }
+    std::vector<std::string> const batch(33, std::string(100, 'x'));
+    std::int64_t added = 0;
+    try {
+        for (; added < 100000; added += 33) {
+            spool.add(batch);
+        }
+        return SpoolNeverFull;
+    } catch (velmora::Error const&) {
+        if (std::filesystem::exists(folder + "/s-ballast")) {
+            return SpoolBallastKept;
+        }
+    }
+    if (spool.rows() != added || spool.newest() != added) {
+        return SpoolLost;
+    }
+    try {
+        spool.forget(1000); // which writes, too
+        spool.add(batch);
+    } catch (velmora::Error const&) {
+        return SpoolNotRecovered;
+    }
+    return spool.rows() == added - 1000 + 33 ? SpoolFine : SpoolLost;
+}
+
+TEST(MqttSpool, AFullDiskGivesTheBallastSoThatWhatWasSentCanBeForgotten)
+{
+    TemporaryFolder const folder;
+    pid_t const child = ::fork();
+    if (child == 0) {
+        ::_exit(fillSpool(folder.path().string()));
+    }
+    int status = 0;
+    ::waitpid(child, &status, 0);
+    ASSERT_TRUE(WIFEXITED(status));
+    if (WEXITSTATUS(status) == SpoolNoDisk) {
+        GTEST_SKIP() << "a disk of its own can't be mounted here";
+    }
+    EXPECT_EQ(WEXITSTATUS(status), SpoolFine);
+}
+
 TEST(MqttSettings, RefusesWhatBrokersWouldNotTakeAndSecretsInTheOpen)
 {
     TemporaryFolder const folder;
     for (char const* const wrong :
-         {"mqtt://b/a.b", "mqtt://b/a b", "mqtt://b/a//b", "mqtt://b/", "mqtt://b:0/a", "mqtt://b:x/a",
-          "mqtt://me:pw@b/a", "mqtt://b/a?qos=2", "mqtt://b/a?password_file=/nowhere", "mqtt://b/a?discovery=yes"}) {
+         {"mqtt://b/a.b", "mqtt://b/a b", "mqtt://b/a//b", "mqtt://b/", "mqtt://b:0/a", "mqtt://b:x/a", "mqtt://b,/a",
+          "mqtt://b,c:0/a", "mqtt://me:pw@b/a", "mqtt://b/a?qos=2", "mqtt://b/a?password_file=/nowhere",
+          "mqtt://b/a?discovery=yes", "mqtt://b/a?keep_alive=4", "mqtt://b/a?keep_alive=1h"}) {
         EXPECT_THROW(velmora::mqttSettings(velmora::parseOutputAddress(wrong), brokerContext(folder)), velmora::Error)
             << wrong;
     }
     std::ofstream(folder.file("pw")) << "secret\n";
     auto const settings = velmora::mqttSettings(
-        velmora::parseOutputAddress("mqtts://b/a/c?password_file=" + folder.file("pw")), brokerContext(folder));
-    EXPECT_EQ(settings.port, 8883);
+        velmora::parseOutputAddress("mqtts://b/a/c?keep_alive=300&password_file=" + folder.file("pw")),
+        brokerContext(folder));
+    EXPECT_EQ(settings.brokers.at(0).port, 8883);
+    EXPECT_EQ(settings.keepAlive, 300s);
     EXPECT_EQ(settings.topic, "a/c/van");
     EXPECT_EQ(settings.password, "secret");
+    auto const cluster =
+        velmora::mqttSettings(velmora::parseOutputAddress("mqtt://n1:1,n2,[::1]:3/a"), brokerContext(folder)).brokers;
+    ASSERT_EQ(cluster.size(), 3U);
+    EXPECT_EQ(cluster[0].host + std::to_string(cluster[0].port), "n11");
+    EXPECT_EQ(cluster[1].host + std::to_string(cluster[1].port), "n21883");
+    EXPECT_EQ(cluster[2].host + std::to_string(cluster[2].port), "::13");
     EXPECT_EQ(velmora::storedMark(R"({"spool":"ab","seq":7})", "ab"), 7);
     for (char const* const wrong : {"", "7", "{}", R"({"spool":"x","seq":7})", R"({"spool":"ab","seq":"7"})", "[1"}) {
         EXPECT_FALSE(velmora::storedMark(wrong, "ab")) << wrong;
@@ -193,7 +264,7 @@ TEST(SpoolSender, HoldsWhatIsNotDatedYetAndMarksWhatNeverWas)
     EXPECT_TRUE(sent.batches.empty());
     sent.spool.shiftHeld(1000, {"boot", 1000});
     EXPECT_EQ(sent.spool.heldStamp()->offset, 1000);
-    sent.spool.release(Spool::Time::Unsure);
+    sent.spool.release(velmora::ClockJudge::Trust::Never);
     sent.add(1);
     sent.sender.pump();
     ASSERT_EQ(sent.batches.size(), 2U); // one clock a batch

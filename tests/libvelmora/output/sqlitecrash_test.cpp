@@ -1,5 +1,6 @@
 #include "libvelmora/output/sqliteoutput.h"
 #include "tests/support/records.h"
+#include "tests/support/smalldisk.h"
 #include "tests/support/temporaryfolder.h"
 
 #include <velmora/error.h>
@@ -9,8 +10,6 @@
 #include <csignal>
 #include <fcntl.h>
 #include <random>
-#include <sched.h>
-#include <sys/mount.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -105,16 +104,9 @@ enum DiskResult : int
     BallastKept
 };
 
-bool mountSmallDisk(std::string const& folder)
-{
-    return (::unshare(CLONE_NEWNS) == 0 || ::unshare(CLONE_NEWUSER | CLONE_NEWNS) == 0) &&
-           ::mount(nullptr, "/", nullptr, MS_REC | MS_PRIVATE, nullptr) == 0 &&
-           ::mount("none", folder.c_str(), "tmpfs", 0, "size=2M") == 0;
-}
-
 int fillDisk(std::string const& folder)
 {
-    if (!mountSmallDisk(folder)) {
+    if (!testsupport::mountSmallDisk(folder, 2)) {
         return NoMount;
     }
     SqliteOutput output(velmora::parseOutputAddress("sqlite:" + folder + "/a.db?ballast=256k"));

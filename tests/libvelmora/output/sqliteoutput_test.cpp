@@ -97,7 +97,7 @@ TEST(SqliteOutput, EachCommitReachesTheDiskAndOthersCannotRead)
     Fixture fixture;
     EXPECT_EQ(fixture.output.database().number("PRAGMA synchronous"), 2); // FULL
     EXPECT_THAT(fixture.rows("journal_mode", "pragma_journal_mode"), ElementsAre("wal"));
-    EXPECT_EQ(fixture.output.database().number("PRAGMA user_version"), 1);
+    EXPECT_EQ(fixture.output.database().number("PRAGMA user_version"), 2);
     fixture.output.write(records(reading("RPM", 1.0)));
     for (char const* const name : {"a.db", "a.db-wal", "a.db-shm", "a.db-ballast"}) {
         struct stat facts = {};

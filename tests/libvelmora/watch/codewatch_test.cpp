@@ -54,6 +54,22 @@ TEST(CodeWatch, ALampThatIsOnAtFirstIsTold)
     EXPECT_THAT(news(watch, lookAt(true, {})), ElementsAre("lamp_on"));
 }
 
+TEST(CodeWatch, TellsTheLampAtEachLookThatKnowsIt)
+{
+    CodeWatch watch("van");
+    std::vector<bool> lamps;
+    for (std::optional<bool> const lamp :
+         {std::optional(false), std::optional<bool>(), std::optional(true), std::optional(true)}) {
+        for (velmora::Record const& each : watch.take(lookAt(lamp, {}), {})) {
+            if (auto const* const state = std::get_if<velmora::LampState>(&each)) {
+                EXPECT_EQ(state->module, 0x7E8U);
+                lamps.push_back(state->on);
+            }
+        }
+    }
+    EXPECT_THAT(lamps, ElementsAre(false, true, true));
+}
+
 TEST(CodeWatch, TellsWhenAllMonitorsHaveRunAndWhenNotAnyMore)
 {
     CodeWatch watch("van");

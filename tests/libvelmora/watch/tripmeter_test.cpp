@@ -104,6 +104,21 @@ TEST(TripMeter, AShortOneIsAnEngineRun)
     EXPECT_FALSE(car.stop().engineRun);
 }
 
+TEST(TripMeter, AClockThatIsSetOnTheWayMovesTheBeginToo)
+{
+    Driven car;
+    car.meter.onClockSet(1h); // no trip yet
+    car.drive(60, 2000, 72);
+    car.time.now.wall += 100h;
+    car.meter.onClockSet(100h);
+    car.drive(60, 2000, 72);
+    velmora::WallTime const end = car.time.now.wall;
+    Trip const trip = car.stop();
+    EXPECT_EQ(trip.end, end);
+    EXPECT_EQ(trip.begin, end - 118s);
+    EXPECT_NEAR(trip.durationS, 118, 0.01);
+}
+
 TEST(TripMeter, WhatWasNotToldStaysEmpty)
 {
     Driven car;

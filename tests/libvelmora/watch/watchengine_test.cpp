@@ -1,3 +1,4 @@
+#include "libvelmora/output/eventkinds.h"
 #include "libvelmora/watch/watchengine.h"
 #include "tests/support/driventime.h"
 
@@ -24,6 +25,7 @@ public:
 
     bool plugged = true;
     bool answers = true;
+    bool engineless = false; // tells no engine speed
     double rpm = 0.0;
     double kmh = 0.0;
     double battery = 12.6;
@@ -67,7 +69,9 @@ public:
         for (; m_asking && plugged && m_next <= m_time.steady(); m_next += 1s) {
             asked += 2;
             if (answers) {
-                result.push_back(reading("RPM", rpm));
+                if (!engineless) {
+                    result.push_back(reading("RPM", rpm));
+                }
                 result.push_back(reading("SPEED", kmh));
             }
         }
@@ -147,6 +151,7 @@ struct Watch
     void take(Record const& record)
     {
         if (auto const* const event = std::get_if<velmora::Event>(&record)) {
+            EXPECT_THAT(velmora::eventKinds, Contains(event->kind));
             events.push_back(event->kind);
         } else if (auto const* const trip = std::get_if<velmora::Trip>(&record)) {
             trips.push_back(*trip);
@@ -299,6 +304,35 @@ TEST(WatchEngine, ALinkLostWhileParkedComesBackWithoutARequest)
     EXPECT_EQ(watch.car.connects, 1);
 }
 
+TEST(WatchEngine, ALowBatteryIsToldAndThatItHasRecovered)
+{
+    Watch watch;
+    watch.drive(2min);
+    watch.run(5min);
+    watch.events.clear();
+    watch.car.answers = false;
+    watch.car.battery = 12.0;
+    watch.run(5min);
+    EXPECT_THAT(watch.events, ElementsAre("voltage_low"));
+    watch.car.battery = 12.3;
+    watch.run(65s);
+    EXPECT_THAT(watch.events, Contains("voltage_good"));
+}
+
+// A car that tells no engine speed and no voltage runs by what the adapter measures.
+TEST(WatchEngine, ACarThatTellsNeitherEngineNorVoltageIsJudgedByTheAdapters)
+{
+    Watch watch;
+    watch.car.engineless = true;
+    watch.car.battery = 14.1;
+    watch.run(10min);
+    EXPECT_EQ(watch.engine.state(), "running");
+    EXPECT_NEAR(watch.car.voltLooks, 9, 1);
+    watch.car.battery = 12.7;
+    watch.run(10min);
+    EXPECT_EQ(watch.engine.state(), "parked");
+}
+
 TEST(WatchEngine, AProbeIsMadeOnlyIfToldAndIsCounted)
 {
     velmora::WatchRules rules;
@@ -352,6 +386,28 @@ TEST(WatchEngine, DoesNothingWithAnotherVehicle)
     watch.drive(2min);
     EXPECT_TRUE(watch.engine.metStranger());
     EXPECT_LE(watch.readings, before + 2);
+}
+
+TEST(WatchEngine, TellsThatTheClockWasSetAndDatesTheTripByIt)
+{
+    velmora::ClockLook look{0, 0, false, "boot-1"};
+    velmora::WatchRules rules;
+    rules.clocks = [&look] { return look; };
+    Watch watch(rules);
+    watch.drive(5min);
+    EXPECT_THAT(watch.events, testing::Not(Contains("clock_set")));
+    look = {1772353200250, 300000, true, "boot-1"};
+    watch.time.now.wall += 100h;
+    watch.drive(5min);
+    EXPECT_THAT(watch.events, Contains("clock_set"));
+    watch.engine.finish(watch.time.now);
+    ASSERT_EQ(watch.trips.size(), 1U);
+    EXPECT_NEAR(std::chrono::duration<double>(watch.trips[0].end - watch.trips[0].begin).count(), 600, 3);
+
+    look = {0, 300000, false, "boot-1"}; // five minutes, and nobody has set it
+    Watch other(rules);
+    other.run(2s);
+    EXPECT_EQ(std::ranges::count(other.events, "clock_unsure"), 1);
 }
 
 TEST(WatchEngine, AnEndKeepsTheTripUnderWay)
