@@ -7,7 +7,7 @@ namespace velmora {
 namespace {
 
 // Parameters: milliseconds, and the machine's start.
-constexpr char const* shifts[] = {
+constexpr char const* undatedShifts[] = {
     "UPDATE event SET time = time + ?1 WHERE (time, ifnull(module, 0)) IN "
     "(SELECT time, number FROM undated WHERE place = 'event' AND boot = ?2)",
     "UPDATE trip SET begin = begin + ?1, end = end + ?1 WHERE end IN "
@@ -60,7 +60,7 @@ void SqliteUndated::keepStamp(ClockStamp const& stamp)
 void SqliteUndated::shiftHeld(std::int64_t millis, ClockStamp const& stamp)
 {
     shiftReadings(millis, stamp.bootId);
-    for (char const* const sql : shifts) {
+    for (char const* const sql : undatedShifts) {
         Statement shift(m_database, sql);
         shift.bind(1, millis);
         shift.bind(2, stamp.bootId);
