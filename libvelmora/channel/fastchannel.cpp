@@ -44,7 +44,8 @@ bool FastChannel::receive(std::vector<unsigned char>& out, int timeoutMs)
     }
     // With nothing outstanding nothing can come, but for an adapter that is just starting.
     bool const idle = !m_pending && m_begun && !m_starting;
-    WireTime const end = m_wire->now() + (idle ? std::min(timeout, grace) : timeout);
+    WireTime const latency = m_pending ? std::exchange(m_pending->latency, WireTime(0)) : WireTime(0);
+    WireTime const end = m_wire->now() + (idle ? std::min(timeout, grace) : timeout + latency);
     takeReplies();
     while (m_ready.empty() && isValid()) {
         std::string const bytes = m_wire->read(m_pending ? std::min(end, remedyTime()) : end);

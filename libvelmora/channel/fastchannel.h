@@ -31,6 +31,7 @@ struct ChannelOptions
     bool counting = true;            // requests may get an expected count
     bool shortWait = true;           // the adapter's wait for more replies may be shortened
     std::filesystem::path returns{}; // file of what adapters were not given back; empty: kept in this process only
+    WireTime latency{0};             // of the way to the adapter and back, on top of all limits of time
 };
 
 // The channel between the core's driver, which is slow and careful, and an adapter, which may be odd: fast and
@@ -84,6 +85,7 @@ private:
         WireTime sentAt{0};
         WireTime heardAt{0};                // the last byte
         WireTime dataAt{0};                 // the last digit of a reply
+        WireTime latency{0};                // not given yet to who waits for it
         std::optional<unsigned int> module; // whose reply is waited for, where only one is
         std::optional<unsigned int> count;
         bool addressed = false; // sent to somebody rather than to all

@@ -50,6 +50,7 @@ void FastChannel::begin(std::string const& text)
     }
     pending.key = pending.command.text();
     pending.asker = std::this_thread::get_id();
+    pending.latency = m_options.latency;
     m_starting = pending.command.resets();
     bool const reachesBus = pending.command.isRequest() || pending.command.monitors();
     if (!reachesBus && !pending.command.onlyAsks()) {
@@ -276,7 +277,7 @@ void FastChannel::endExchange()
 std::optional<std::string> FastChannel::ask(std::string const& text, WireTime limit)
 {
     write(text);
-    return awaitReply(m_wire->now() + limit);
+    return awaitReply(m_wire->now() + limit + m_options.latency);
 }
 
 std::optional<std::string> FastChannel::awaitReply(WireTime until)

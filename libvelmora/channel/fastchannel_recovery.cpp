@@ -49,7 +49,7 @@ WireTime FastChannel::remedyTime() const
         return never;
     }
     if (!pending.command.isRequest()) {
-        return pending.heard ? pending.heardAt + commandQuiet : pending.sentAt + commandSilence;
+        return m_options.latency + (pending.heard ? pending.heardAt + commandQuiet : pending.sentAt + commandSilence);
     }
     std::string const text = compactText(m_buffer);
     std::size_t const digits = text.find_last_of('.');
@@ -59,7 +59,7 @@ WireTime FastChannel::remedyTime() const
         return never;
     }
     bool const patience = text.find("7F") != std::string::npos && text.find("78") != std::string::npos;
-    return pending.heardAt +
+    return pending.heardAt + m_options.latency +
            (patience ? pendingQuiet : std::min(waitOf(m_state.setting("ATST")), longestWait) + requestQuiet);
 }
 
@@ -129,7 +129,7 @@ bool FastChannel::wake(std::string& before)
         ++m_working.exchanges;
         m_wire->write("ATI\r");
         tellSent("ATI\r");
-        WireTime until = m_wire->now() + wakeLimit;
+        WireTime until = m_wire->now() + wakeLimit + m_options.latency;
         while (std::optional<std::string> const reply = awaitReply(until)) {
             if (isIdentity(*reply)) {
                 tellReceived(before);
@@ -141,7 +141,8 @@ bool FastChannel::wake(std::string& before)
                 break; // the rest of a command that was cut
             }
             if (compactText(*reply).ends_with("STOPPED")) {
-                until = std::min(until, m_wire->now() + stoppedLimit); // it may have swallowed all of it
+                until = std::min(until,
+                                 m_wire->now() + stoppedLimit + m_options.latency); // it may have swallowed all of it
             }
         }
     }

@@ -28,6 +28,8 @@ namespace velmora {
 namespace {
 
 constexpr std::chrono::milliseconds phaseStep{250};
+// A request and its reply take some of the radio's intervals, of up to 50 ms each.
+constexpr WireTime lowEnergyLatency{200};
 
 std::string portKey()
 {
@@ -224,6 +226,9 @@ void Session::openLink()
     bool const recorded = m_recorder != nullptr || replayed;
     options.counting = !recorded;
     options.shortWait = !recorded;
+    if (m_address && std::holds_alternative<BleAddress>(*m_address)) {
+        options.latency = lowEnergyLatency;
+    }
     // What is simulated in this process is no adapter that somebody comes back to.
     if (inProcess) {
         options.returns.clear();

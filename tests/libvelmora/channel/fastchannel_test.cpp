@@ -37,6 +37,28 @@ TEST(FastChannel, WaitsForAReplyAsLongAsItIsTold)
     EXPECT_EQ(rig.met(Habit::LostPrompt), 0U);
 }
 
+// The way by a radio takes longer than the adapter does: neither the core's limit nor the channel's own counts it.
+TEST(FastChannel, TheWayToTheAdapterComesOnTopOfAllLimits)
+{
+    ScriptedReply const late{{"OK\r\r>", WireTime(720)}};
+    ChannelRig near;
+    near.wire->on("ATE0", late);
+    WireTime const begin = near.wire->now();
+    EXPECT_EQ(near.ask("ATE0", 250), std::nullopt);
+    EXPECT_EQ(near.wire->now() - begin, WireTime(250));
+    EXPECT_THAT(near.ask("ATL0"), Optional(std::string("OK")));
+    EXPECT_EQ(near.met(Habit::LostPrompt), 1U);
+
+    ChannelRig far(nullptr, {.port = {}, .latency = WireTime(200)});
+    far.wire->on("ATE0", late);
+    EXPECT_EQ(far.ask("ATE0", 500), std::nullopt);
+    EXPECT_EQ(far.wire->now() - begin, WireTime(700)) << "in its slices once, not each time";
+    EXPECT_THAT(far.ask("ATL0"), Optional(std::string("OK")));
+    EXPECT_EQ(far.met(Habit::LostPrompt), 0U) << "it was on its way";
+    far.wire->on("ATS0", ScriptedReply{{"OK\r\r>", WireTime(400)}});
+    EXPECT_THAT(far.ask("ATS0", 250), Optional(std::string("OK")));
+}
+
 TEST(FastChannel, ALatePromptIsWaitedOutAndItsReplyIsNobodyElses)
 {
     ChannelRig rig;
