@@ -1,6 +1,7 @@
 #include "libvelmora/port/bluetooth/bleport.h"
 
 #include "libvelmora/port/bluetooth/blelink.h"
+#include "libvelmora/port/bluetooth/blewriter.h"
 #include "libvelmora/port/bluetooth/bluetootherror.h"
 #include "libvelmora/port/bluetooth/busloop.h"
 #include "libvelmora/port/bluetooth/propertychange.h"
@@ -24,20 +25,15 @@ using asio::generic::seq_packet_protocol;
 constexpr char const* propertiesInterface = "org.freedesktop.DBus.Properties";
 constexpr char const* characteristicFace = "org.bluez.GattCharacteristic1";
 
-// Pieces that come within one connection event cost some adapters bytes.
-constexpr std::chrono::milliseconds betweenPieces{15};
-
 class BlePort : public IPort
 {
 public:
     explicit BlePort(BleLink link)
-        : m_link(std::move(link)), m_busLoop(m_context, *m_link.bus, [this] { lose(); }), m_pause(m_context)
+        : m_link(std::move(link)), m_busLoop(m_context, *m_link.bus, [this] { lose(); }),
+          m_writer(m_context, m_link, m_busLoop, [this] { lose(); })
     {
         if (m_link.notifySocket >= 0) {
             m_notify.emplace(m_context, seq_packet_protocol(AF_UNIX, 0), m_link.notifySocket);
-        }
-        if (m_link.writeSocket >= 0) {
-            m_write.emplace(m_context, seq_packet_protocol(AF_UNIX, 0), m_link.writeSocket);
         }
         watchDevice();
         if (!m_notify) {
@@ -63,10 +59,7 @@ public:
 
     void write(std::string_view bytes) override
     {
-        asio::post(m_context, [this, text = std::string(bytes)] {
-            m_outgoing += text;
-            writeNext();
-        });
+        asio::post(m_context, [this, text = std::string(bytes)] { m_writer.write(text); });
     }
 
     void close() override
@@ -91,60 +84,6 @@ private:
                                     m_onBytes(std::string_view(m_buffer.data(), count));
                                     read();
                                 });
-    }
-
-    // One piece at a time.
-    void writeNext()
-    {
-        if (m_writing || m_outgoing.empty() || m_closed) {
-            return;
-        }
-        m_writing = true;
-        m_piece = m_outgoing.substr(0, m_link.piece);
-        m_outgoing.erase(0, m_piece.size());
-        if (m_write) {
-            m_write->async_send(asio::buffer(m_piece), 0,
-                                [this](asio::error_code const& error, std::size_t) { onWritten(!error); });
-            return;
-        }
-        try {
-            writeValue();
-        } catch (BusError const&) {
-            lose();
-        }
-    }
-
-    void writeValue()
-    {
-        BusMessage const request =
-            m_link.bus->makeCall(m_link.characteristics.write.path, characteristicFace, "WriteValue");
-        checked(sd_bus_message_append_array(request.get(), 'y', m_piece.data(), m_piece.size()));
-        checked(sd_bus_message_append(request.get(), "a{sv}", 1, "type", "s", "request"));
-        auto const answered = [](sd_bus_message* answer, void* port, sd_bus_error*) {
-            static_cast<BlePort*>(port)->onWritten(sd_bus_message_is_method_error(answer, nullptr) == 0);
-            return 0;
-        };
-        sd_bus_slot* slot = nullptr;
-        checked(sd_bus_call_async(m_link.bus->raw(), &slot, request.get(), answered, this, 0));
-        m_writeCall.reset(slot);
-        asio::post(m_context, [this] { m_busLoop.pump(); });
-    }
-
-    void onWritten(bool good)
-    {
-        if (!good) {
-            lose();
-        } else if (m_outgoing.empty()) {
-            m_writing = false;
-        } else {
-            m_pause.expires_after(betweenPieces);
-            m_pause.async_wait([this](asio::error_code const& error) {
-                m_writing = false;
-                if (!error) {
-                    writeNext();
-                }
-            });
-        }
     }
 
     void watchDevice()
@@ -202,14 +141,11 @@ private:
     void end()
     {
         m_closed = true;
-        m_pause.cancel();
+        m_writer.end();
         m_busLoop.stop();
         asio::error_code ignored;
         if (m_notify) {
             m_notify->close(ignored);
-        }
-        if (m_write) {
-            m_write->close(ignored);
         }
     }
 
@@ -228,19 +164,14 @@ private:
     asio::io_context m_context;
     BleLink m_link;
     BusLoop m_busLoop;
+    BleWriter m_writer;
     BusSlot m_deviceWatch;
     BusSlot m_valueWatch;
-    BusSlot m_writeCall;
     std::optional<seq_packet_protocol::socket> m_notify;
-    std::optional<seq_packet_protocol::socket> m_write;
-    asio::steady_timer m_pause;
     Receiver m_onBytes;
     LossHandler m_onLost;
     std::array<char, 1024> m_buffer{};
     asio::socket_base::message_flags m_flags = 0;
-    std::string m_outgoing;
-    std::string m_piece;
-    bool m_writing = false;
     bool m_closed = false;
     std::thread m_thread;
 };
