@@ -76,6 +76,10 @@ Error bluezError(std::string const& doing, std::string const& name, std::string 
         return Error(ErrorKind::PortFailed, what + "the Bluetooth service (bluetoothd) is not running",
                      {"start it: systemctl start bluetooth", "is the package bluez installed?"});
     }
+    if (holds(text, {"no controller"})) {
+        return Error(ErrorKind::PortFailed, what + "this computer has no Bluetooth controller",
+                     {"plug one in; is it blocked? rfkill list", "`bluetoothctl list` shows those that are there"});
+    }
     if (holds(name, {"NotReady"}) || holds(text, {"not-powered", "Not Ready", "Not Powered"})) {
         return Error(ErrorKind::PortFailed, what + "Bluetooth is off",
                      {"switch it on: bluetoothctl power on, rfkill unblock"});

@@ -92,6 +92,20 @@ class Bluetooth(unittest.TestCase):
         self.control.LoseAfter(path, 25)
         self.expect(['-p', f'ble://{BLE}', 'scan'], 8)
 
+    def test_loss_in_the_midst_of_a_reply_is_told_as_a_lost_link(self):
+        ble, classic = self.add_ble(), self.add_classic()
+        for sockets in (True, False):
+            self.control.GiveSockets(ble, sockets)
+            self.control.LoseInReply(ble, 30)
+            self.expect(['-p', f'ble://{BLE}', 'scan'], 8, f'The link to the adapter on ble://{BLE} broke', 'in reach?')
+        self.control.LoseInReply(classic, 30)
+        self.expect(['-p', f'bt://{CLASSIC}', 'scan'], 8, f'bt://{CLASSIC}', 'in reach?')
+
+    def test_device_without_a_serial_service_and_absent_one_are_told(self):
+        self.add_ble(flags=('read',))
+        self.expect(['-p', f'ble://{BLE}', 'info'], 3, 'no serial service', 'ports')
+        self.expect(['-p', f'ble://{OTHER}', 'info'], 3, f'No Bluetooth device {OTHER} is in reach', 'ignition')
+
     def test_errors_of_low_energy_name_what_to_do(self):
         path = self.add_ble()
         rows = [('NotReady:Resource Not Ready', 'Bluetooth is off'),

@@ -77,11 +77,18 @@ def _notify(device, data):
         return
     for start in range(0, len(data), device.mtu - 3):
         piece = data[start:start + device.mtu - 3]
+        if device.loses_in_reply:
+            device.loses_in_reply -= 1
+            if device.loses_in_reply == 0:
+                GLib.idle_add(lose, device)
+                piece = piece[:1]  # the link goes behind the first byte of it
         if device.notify_socket is not None:
             device.notify_socket.send(piece)
         elif chrc.props[CHRC]['Notifying']:
             chrc.EmitSignal(dbus.PROPERTIES_IFACE, 'PropertiesChanged', 'sa{sv}as', [
                 CHRC, {'Value': dbus.Array([dbus.Byte(b) for b in piece], signature='y', variant_level=1)}, []])
+        if len(piece) == 1 and len(data) - start > 1:
+            return
 
 
 def _written(device, data):
@@ -231,7 +238,7 @@ def _prepare(device, port):
     device.connected = False
     device.bridge = device.write_socket = device.notify_socket = device.classic_socket = None
     device.gives_sockets = True
-    device.loses_after = device.dropped = 0
+    device.loses_after = device.loses_in_reply = device.dropped = 0
     device.failures = []
     device.sizes = []
     device.watches = []
@@ -277,7 +284,18 @@ def ConnectProfileSerial(device, uuid):
     ours.setblocking(False)
     device.classic_socket = ours
     device.bridge = _simulator(device)
-    _forward(device, device.bridge, lambda data: ours.sendall(data) if data else lose(device))
+
+    def received(data):
+        if not data:
+            lose(device)
+        elif device.loses_in_reply:
+            device.loses_in_reply -= 1
+            ours.sendall(data if device.loses_in_reply else data[:1])
+            if not device.loses_in_reply:
+                GLib.idle_add(lose, device)
+        else:
+            ours.sendall(data)
+    _forward(device, device.bridge, received)
 
     def sent(data):
         device.sizes.append(len(data))
@@ -345,6 +363,12 @@ def Fail(self, path, errors):
 def LoseAfter(self, path, writes):
     mockobject.objects[path].loses_after = int(writes)
     mockobject.objects[path].sizes = []
+
+
+@dbus.service.method(MOCK, in_signature='oi', out_signature='')
+def LoseInReply(self, path, pieces):
+    """The link goes in the midst of a reply: behind the first byte of its so-many-th piece."""
+    mockobject.objects[path].loses_in_reply = int(pieces)
 
 
 @dbus.service.method(MOCK, in_signature='ob', out_signature='')

@@ -128,6 +128,43 @@ TEST(Rfcomm, EachErrorNamesItsCauseAndWhatToTry)
     }
 }
 
+// The service's words differ from version to version, so some are told by the error's name and some by its text.
+TEST(BluetoothService, EachErrorNamesItsCauseAndWhatToTry)
+{
+    struct Row
+    {
+        char const* name;
+        char const* text;
+        char const* words;
+        char const* hint;
+    };
+    Row const rows[] = {
+        {"org.freedesktop.DBus.Error.ServiceUnknown", "", "bluetoothd) is not running", "systemctl start"},
+        {"org.freedesktop.DBus.Error.NameHasNoOwner", "", "bluetoothd) is not running", "systemctl start"},
+        {"org.bluez.Error.NotReady", "no controller", "no Bluetooth controller", "rfkill list"},
+        {"org.bluez.Error.NotReady", "Resource Not Ready", "Bluetooth is off", "power on"},
+        {"org.bluez.Error.Failed", "br-connection-adapter-not-powered", "Bluetooth is off", "power on"},
+        {"org.freedesktop.DBus.Error.AccessDenied", "", "may not use Bluetooth", "group bluetooth"},
+        {"org.bluez.Error.AuthenticationRejected", "x", "demands pairing", "ports pair"},
+        {"org.bluez.Error.NotAuthorized", "x", "demands pairing", "ports pair"},
+        {"org.bluez.Error.NotPermitted", "x", "demands pairing", "ports pair"},
+        {"org.freedesktop.DBus.Error.NoReply", "", "out of reach", "plugged in"},
+        {"org.bluez.Error.Failed", "br-connection-page-timeout", "out of reach", "plugged in"},
+        {"org.bluez.Error.Failed", "le-connection-abort-by-local", "out of reach", "plugged in"},
+        {"org.bluez.Error.InProgress", "", "another program", "close"},
+        {"org.bluez.Error.Failed", "br-connection-busy", "another program", "close"},
+        {"org.bluez.Error.Failed", "br-connection-unknown", "br-connection-unknown (org.bluez", "velmora ports"},
+    };
+    for (Row const& row : rows) {
+        Error const told = velmora::bluezError("Could not connect", row.name, row.text);
+        std::string const what = told.what();
+        EXPECT_EQ(what.find("Could not connect: "), 0U) << what;
+        EXPECT_NE(what.find(row.words), std::string::npos) << row.name << " " << what;
+        ASSERT_FALSE(told.hints().empty()) << row.name;
+        EXPECT_NE(told.hints().front().find(row.hint), std::string::npos) << told.hints().front();
+    }
+}
+
 TEST(Rfcomm, SocketAddressIsAsTheKernelReadsIt)
 {
     velmora::RfcommSocketAddress const address = velmora::makeRfcommAddress("AA:BB:CC:DD:EE:01", 3);
