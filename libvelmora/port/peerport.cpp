@@ -90,14 +90,18 @@ void PeerPort::run()
 std::unique_ptr<IPort> openSimulatorPort(SimulatorAddress const& address)
 {
     obdsim::SimulationOptions options;
-    if (!address.vehicle.empty()) {
-        options.vehicle = address.vehicle;
-    }
+    options.vehicle = address.vehicle.empty() ? options.vehicle : address.vehicle;
+    options.adapter = address.adapter.empty() ? options.adapter : address.adapter;
+    options.drive = address.drive;
+    options.scenario = address.scenario;
+    options.faults = address.faults;
     try {
         return std::make_unique<PeerPort>(obdsim::simulate(options), address.instant);
     } catch (obdsim::SimulatorError const& error) {
-        throw Error(ErrorKind::PortFailed, std::string("Could not start the simulated car: ") + error.what(),
-                    {"sim:NAME takes a built-in car or a vehicle file; `velmora simulate --list` lists the cars"});
+        throw Error(
+            ErrorKind::PortFailed, std::string("Could not start the simulated car: ") + error.what(),
+            {"sim:NAME takes a built-in car or a vehicle file, sim:NAME?drive=town a drive, adapter= and fault= "
+             "others; `velmora simulate --list` lists them all"});
     }
 }
 

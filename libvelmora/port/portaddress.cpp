@@ -57,13 +57,43 @@ SerialAddress parseSerial(std::string const& whole, std::string_view rest, unsig
     return address;
 }
 
+// Where an option of a simulated car is kept; null for a word that is none.
+std::string* optionOf(SimulatorAddress& address, std::string_view name)
+{
+    if (name == "fault") {
+        return &address.faults.emplace_back();
+    }
+    return name == "adapter"    ? &address.adapter
+           : name == "drive"    ? &address.drive
+           : name == "scenario" ? &address.scenario
+                                : nullptr;
+}
+
+void takeSimulatorOption(std::string const& whole, SimulatorAddress& address, std::string_view option)
+{
+    if (option == "instant") {
+        address.instant = true;
+        return;
+    }
+    std::size_t const equals = option.find('=');
+    std::string* const place = optionOf(address, option.substr(0, equals));
+    if (place == nullptr || equals == std::string_view::npos || equals + 1 == option.size()) {
+        reject(whole, "after ? only instant, adapter=NAME, drive=NAME, scenario=FILE and fault=FAULT are understood, "
+                      "with & between");
+    }
+    *place = option.substr(equals + 1);
+}
+
 SimulatorAddress parseSimulator(std::string const& whole, std::string_view rest)
 {
-    std::size_t const query = rest.find('?');
-    if (query != std::string_view::npos && rest.substr(query) != "?instant") {
-        reject(whole, "after ? only instant is understood");
+    std::size_t query = rest.find('?');
+    SimulatorAddress address{std::string(rest.substr(0, query))};
+    while (query != std::string_view::npos) {
+        rest.remove_prefix(query + 1);
+        query = rest.find('&');
+        takeSimulatorOption(whole, address, rest.substr(0, query));
     }
-    return {std::string(rest.substr(0, query)), query != std::string_view::npos};
+    return address;
 }
 
 constexpr unsigned int lastChannel = 30; // of RFCOMM
@@ -134,7 +164,17 @@ struct Printer
     }
     std::string operator()(SimulatorAddress const& address) const
     {
-        return "sim:" + address.vehicle + (address.instant ? "?instant" : "");
+        std::string options = address.instant ? "&instant" : "";
+        auto const add = [&options](char const* name, std::string const& value) {
+            options += value.empty() ? "" : std::string("&") + name + "=" + value;
+        };
+        add("adapter", address.adapter);
+        add("drive", address.drive);
+        add("scenario", address.scenario);
+        for (std::string const& fault : address.faults) {
+            add("fault", fault);
+        }
+        return "sim:" + address.vehicle + (options.empty() ? "" : "?" + options.substr(1));
     }
     std::string operator()(ReplayAddress const& address) const { return "replay:" + address.file; }
     std::string operator()(BluetoothAddress const& address) const

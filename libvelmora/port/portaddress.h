@@ -3,6 +3,7 @@
 #include <optional>
 #include <string>
 #include <variant>
+#include <vector>
 
 namespace velmora {
 
@@ -22,11 +23,15 @@ struct TcpAddress
     bool operator==(TcpAddress const&) const = default;
 };
 
-// A vehicle of the simulator, by name or file.
+// A vehicle of the simulator, by name or file. What is empty is the simulator's own choice.
 struct SimulatorAddress
 {
     std::string vehicle;
     bool instant = false; // the adapter answers at once, in place of the time that adapters and cars take
+    std::string adapter = {};
+    std::string drive = {};    // by name or file
+    std::string scenario = {}; // a file
+    std::vector<std::string> faults = {};
 
     bool operator==(SimulatorAddress const&) const = default;
 };

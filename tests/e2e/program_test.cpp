@@ -7,7 +7,9 @@
 #include <nlohmann/json.hpp>
 
 #include <chrono>
+#include <cstdio>
 #include <cstdlib>
+#include <fstream>
 #include <sys/wait.h>
 #include <thread>
 
@@ -205,6 +207,24 @@ TEST(Program, LinkThatBreaksWhileConnectingIsExitCodeEight)
     ChildProcess simulator({"simulate", "--listen", "tcp://127.0.0.1:0", "--fault", "loss@60"});
     Outcome const outcome = runVelmora({"-q", "-p", simulator.readLine(), "scan"});
     EXPECT_EQ(outcome.exitCode, 8) << outcome.err;
+}
+
+// The port takes what simulate takes.
+TEST(Program, SimulatedPortHasTheSimulatorsOptions)
+{
+    std::string const scenario = testing::TempDir() + "velmora-port.scenario";
+    std::ofstream(scenario) << "0 voltage 11.8\n";
+    Outcome const outcome = runVelmora(
+        {"-q", "-p", "sim:petrol-can11?instant&adapter=stn2120&fault=error:BUS BUSY@4&scenario=" + scenario, "console"},
+        "ATE0\nSTI\nATRV\nATI\n");
+    EXPECT_EQ(outcome.out, "OK\nSTN2120 v5.8.1\n11.8V\nBUS BUSY\n") << outcome.err;
+    std::remove(scenario.c_str());
+    for (char const* wrong : {"drive=uphill", "adapter=none", "scenario=/no/such/file", "fault=fire@3"}) {
+        Outcome const refused = runVelmora({"-p", std::string("sim:petrol-can11?") + wrong, "info"});
+        EXPECT_EQ(refused.exitCode, 3) << wrong << refused.err;
+        EXPECT_TRUE(holds(refused.err, "simulate --list")) << refused.err;
+    }
+    EXPECT_EQ(runVelmora({"-p", "sim:petrol-can11?speed=3", "info"}).exitCode, 2);
 }
 
 TEST(Program, WrongSimulatorOptionsAreExitCodeTwo)

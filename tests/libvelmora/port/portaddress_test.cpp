@@ -31,6 +31,8 @@ TEST(PortAddress, UnderstandsEveryForm)
         {"sim:petrol-can11", SimulatorAddress{"petrol-can11"}},
         {"sim:", SimulatorAddress{""}},
         {"sim:petrol-can11?instant", SimulatorAddress{"petrol-can11", true}},
+        {"sim:a.toml?drive=town&adapter=stn2120&scenario=s.txt&fault=garbage=0.01&fault=error:BUS BUSY@2&instant",
+         SimulatorAddress{"a.toml", true, "stn2120", "town", "s.txt", {"garbage=0.01", "error:BUS BUSY@2"}}},
         {"replay:car.dialogue", ReplayAddress{"car.dialogue"}},
         {"bt://00:1d:a5:68:98:8b", velmora::BluetoothAddress{"00:1D:A5:68:98:8B", {}}},
         {"bt://00:1D:A5:68:98:8B?channel=2", velmora::BluetoothAddress{"00:1D:A5:68:98:8B", 2}},
@@ -67,6 +69,10 @@ TEST(PortAddress, RefusesWhatIsNoAddressAndTellsTheForms)
                              "/dev/ttyUSB0?baud=x",
                              "sim:x?",
                              "sim:x?fast",
+                             "sim:x?drive=",
+                             "sim:x?adapter",
+                             "sim:x?instant&",
+                             "sim:x?speed=3",
                              "two words",
                              "bt://",
                              "bt://00:1D:A5:68:98",
@@ -92,6 +98,8 @@ TEST(PortAddress, PrintsItselfForMessages)
     EXPECT_EQ(toString(parsePortAddress("[::1]:1")), "[::1]:1");
     EXPECT_EQ(toString(parsePortAddress("sim:x")), "sim:x");
     EXPECT_EQ(toString(parsePortAddress("sim:x?instant")), "sim:x?instant");
+    char const* const all = "sim:x?instant&adapter=stn2120&drive=town&scenario=s&fault=seed=7&fault=echo";
+    EXPECT_EQ(toString(parsePortAddress(all)), all);
 }
 
 TEST(PortAddress, DeviceWithoutItsPathIsNoHost)
