@@ -16,6 +16,13 @@ std::size_t longestRequest(Settings const& settings)
     return settings.longMessages || !settings.formatting ? 8 : 7;
 }
 
+/// The digit behind a request that tells how many responses to wait for came with v1.3.
+bool knowsCount(AdapterProfile const& profile)
+{
+    constexpr int since = 130;
+    return profile.family != AdapterFamily::Elm || profile.level >= since;
+}
+
 std::string chipCommand(std::string const& line)
 {
     return line.substr(0, 2);
@@ -220,7 +227,7 @@ void Adapter::executeRequest(std::string const& request)
     }
     bool const counted = request.size() % 2 != 0;
     auto const data = parseHex(counted ? request.substr(0, request.size() - 1) : request);
-    bool const countRefused = counted && has(Quirk::NoCountDigit);
+    bool const countRefused = counted && (has(Quirk::NoCountDigit) || !knowsCount(m_profile));
     if (!data || data->empty() || data->size() > longestRequest(m_settings) || countRefused) {
         answer(refused());
         return;

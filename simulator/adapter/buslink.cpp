@@ -114,7 +114,9 @@ BusReply BusLink::request(BusRequest const& request, Settings const& settings, T
     if (woken && m_quirks.has(Quirk::BusInitSplit)) {
         return reply;
     }
-    return m_wire.exchange(request, settings, std::move(reply), now);
+    reply = m_wire.exchange(request, settings, std::move(reply), now);
+    m_lastTraffic = now + reply.end;
+    return reply;
 }
 
 bool BusLink::establish(BusReply& reply)

@@ -2,6 +2,8 @@
 
 #include "simulator/adapter/buswire.h"
 
+#include <algorithm>
+
 namespace obdsim {
 
 /// The bus side of an adapter: the chosen protocol, the search, the wake-up of the
@@ -50,6 +52,9 @@ public:
 
     double volts(Time now) const;
 
+    /// How long nothing has been said on the bus.
+    Time quietFor(Time now) const { return std::max(now - m_lastTraffic, Time(0)); }
+
     /// The byte of ATSD, which outlasts a reset.
     std::uint8_t savedByte() const { return m_savedByte; }
     void saveByte(std::uint8_t byte) { m_savedByte = byte; }
@@ -72,6 +77,7 @@ private:
     int m_storedNumber = 0;
     bool m_storedAutomatic = true;
     std::uint8_t m_savedByte = 0;
+    Time m_lastTraffic{};
     bool m_open = false;
     bool m_asked = false; ///< a request has been sent since the protocol was chosen
 };

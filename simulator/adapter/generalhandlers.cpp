@@ -1,5 +1,6 @@
 #include "simulator/adapter/handlers.h"
 
+#include <algorithm>
 #include <cmath>
 #include <iterator>
 
@@ -87,15 +88,20 @@ CommandReply voltage(CommandContext& context, std::string const& /*argument*/)
     return line(std::to_string(tenths / 10) + "." + std::to_string(tenths % 10) + "V");
 }
 
-/// Steps of 0.65536 s without a byte on the bus (ELM327 data sheet v2.1, "AMC"); ours always tells a quiet bus.
-CommandReply activityCount(CommandContext& /*context*/, std::string const& /*argument*/)
+/// Steps of 0.65536 s without a byte on the bus, of which it counts 255 (ELM327 data sheet v2.1, "AMC"). Nothing moves
+/// on our buses but what the adapter asks for.
+CommandReply activityCount(CommandContext& context, std::string const& /*argument*/)
 {
-    return line("FF");
+    constexpr Time step(655360);
+    constexpr Time::rep most = 0xFF;
+    auto const steps = std::min(context.bus.quietFor(context.now) / step, most);
+    return line(hexByte(static_cast<std::uint8_t>(steps)));
 }
 
-CommandReply activity(CommandContext& /*context*/, std::string const& /*argument*/)
+/// Whether the protocol is active.
+CommandReply activity(CommandContext& context, std::string const& /*argument*/)
 {
-    return line("N");
+    return line(context.bus.isOpen() ? "Y" : "N");
 }
 
 CommandReply savedByte(CommandContext& context, std::string const& /*argument*/)

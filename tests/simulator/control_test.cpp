@@ -9,6 +9,7 @@
 
 #include <cstdio>
 #include <fstream>
+#include <set>
 
 namespace {
 
@@ -287,6 +288,45 @@ TEST(Scenario, whatWasTypedRunsAgainBitForBit)
         ADD_FAILURE();
     } catch (velmora::sim::Error const& error) {
         EXPECT_EQ(std::string(error.what()), wrong.path() + ":1: word 2 is \"999\"; here belongs a module: 7E8, 7E9");
+    }
+}
+
+/// Each control line that changes something, and what a host gets meanwhile.
+TEST(Scenario, everyControlLineRepeatsBitForBit)
+{
+    const std::vector<std::string> lines = {
+        "set P0420 pending",  "hold speed 90", "voltage 11.8",      "value 7E8 0C 3000", "engine stop", "engine start",
+        "ignition off",       "ignition on",   "module 7E9 silent", "fault prompt@next", "clear",       "fault none",
+        "fault garbage=0.05", "loss"};
+    std::set<std::string> untried;
+    for (auto const& form : obdsim::Control::forms()) {
+        untried.insert(obdsim::controlWords(form.form)[0]);
+    }
+    auto const run = [&](Simulator& car, bool typing) {
+        std::string said;
+        for (std::size_t i = 0; i < lines.size(); ++i) {
+            if (typing) {
+                car.control(lines[i]);
+                untried.erase(obdsim::controlWords(lines[i])[0]);
+            }
+            for (char const* const request : {"ATSP6", "010C1", "010D1", "07", "03", "ATRV"}) {
+                car.send(std::string(request) + "\r");
+                said += car.advance(std::chrono::milliseconds(700)) + "|";
+            }
+        }
+        return said + (car.linkIsUp() ? "up" : "lost");
+    };
+    Simulator typed({.vehicle = "petrol-can11", .adapter = "elm327-v1.5", .faults = {"seed=3"}});
+    const std::string first = run(typed, true);
+    EXPECT_EQ(untried, (std::set<std::string>{"help", "requests"})) << "these change nothing";
+    for (char const* part : {"47 02 03 00 04 20", "41 0D 5A", "11.8V", "41 0C 30 00", "CAN ERROR", "lost"}) {
+        EXPECT_NE(first.find(part), std::string::npos) << part;
+    }
+    const ScenarioFile file(typed.scenario());
+    for (int i = 0; i < 2; ++i) {
+        Simulator again(Options{
+            .vehicle = "petrol-can11", .adapter = "elm327-v1.5", .faults = {"seed=3"}, .scenario = file.path()});
+        EXPECT_EQ(run(again, false), first);
     }
 }
 

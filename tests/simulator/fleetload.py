@@ -1,8 +1,8 @@
 #!/usr/bin/env python3
-"""Asks each car of a fleet ten times a second: fleetload.py PROGRAM CARS SECONDS
+"""Asks each car of a fleet ten times a second: fleetload.py PROGRAM CARS SECONDS [CORES MEGABYTES]
 
 Starts PROGRAM (obdsim) with that many cars, sends 010C to each every 100 ms, and prints what came back in time, the
-processor time and the memory of the simulator. Fails if answers are missing.
+processor time and the memory of the simulator. Fails if answers are missing, or if it takes more than that.
 """
 import asyncio
 import os
@@ -37,7 +37,7 @@ async def drive(address, rounds, start, counts):
     writer.close()
 
 
-async def main(program, cars, seconds):
+async def main(program, cars, seconds, cores=None, megabytes=None):
     server = subprocess.Popen(
         [program, "--fleet", str(cars), "--listen", "tcp://127.0.0.1:0", "--vehicle", "bench-can11"],
         stdin=subprocess.DEVNULL, stdout=subprocess.PIPE, text=True)
@@ -56,10 +56,11 @@ async def main(program, cars, seconds):
         after, memory = usage(server.pid)
         print(f"{cars} cars, {counts['good']} answers in {wall:.1f} s ({counts['good'] / wall:.0f} a second), "
               f"{counts['bad']} bad, {after - before:.2f} s of processor, {memory:.0f} MB")
-        return 0 if counts["bad"] == 0 and counts["good"] == cars * rounds else 1
+        spared = cores is None or (after - before <= cores * wall and memory <= megabytes)
+        return 0 if counts["bad"] == 0 and counts["good"] == cars * rounds and spared else 1
     finally:
         server.terminate()
         server.wait(10)
 
 
-sys.exit(asyncio.run(main(sys.argv[1], int(sys.argv[2]), int(sys.argv[3]))))
+sys.exit(asyncio.run(main(sys.argv[1], *(int(each) for each in sys.argv[2:]))))

@@ -2,8 +2,9 @@
 """A client that talks the way the well-known Python libraries do, over pseudo-terminals: outsideclient.py PROGRAM
 
 Starts PROGRAM (obdsim) once for each of its vehicles, at the same time, and fails for each with which it cannot get on:
-a probe of the line rate, ATZ, ATE0, ATH1, ATL0, AT RV with its blank, ATSP0, 0100, ATDPN, the lists of what is supported,
-requests with the number of frames to expect, an empty line to repeat the last command, and ATZ at the end.
+a probe at each line rate, ATZ, ATE0, ATH1, ATL0, AT RV with its blank, ATSP0, 0100, ATDPN (then the same by ATTPn, as where
+a search fails), all lists of what is supported, requests with the number of frames to expect, an empty line to repeat the
+last command, and ATZ at the end.
 """
 import concurrent.futures
 import os
@@ -11,14 +12,23 @@ import re
 import select
 import subprocess
 import sys
+import termios
 import time
 import tty
+
+RATES = (38400, 9600, 230400, 115200, 57600, 19200)
 
 
 class Line:
     def __init__(self, path):
         self.port = os.open(path, os.O_RDWR | os.O_NOCTTY)
         tty.setraw(self.port)
+
+    def set_rate(self, rate):
+        attributes = termios.tcgetattr(self.port)
+        attributes[4] = attributes[5] = getattr(termios, f"B{rate}")
+        termios.tcsetattr(self.port, termios.TCSANOW, attributes)
+        termios.tcflush(self.port, termios.TCIFLUSH)
 
     def read(self, limit):
         text = b""
@@ -56,8 +66,10 @@ def supported(lines, base):
 
 def talk(path):
     line = Line(path)
-    os.write(line.port, b"\x7F\x7F\r")
-    check(line.read(5).endswith(b">"), "the line rate")
+    for rate in RATES:
+        line.set_rate(rate)
+        os.write(line.port, b"\x7F\x7F\r")
+        check(line.read(5).endswith(b">"), f"the line rate {rate}")
     check(any("ELM" in each for each in line.ask("ATZ")), "ATZ")
     check(line.ask("ATE0")[-1] == "OK", "ATE0")
     check(line.ask("ATH1") == ["OK"], "ATH1")
@@ -66,10 +78,16 @@ def talk(path):
     check(line.ask("ATSP0") == ["OK"], "ATSP0")
     reply = line.ask("0100", 25)
     check(frames(reply), f"0100: {reply}")
-    check(re.fullmatch(r"A[1-9]", line.ask("ATDPN")[0]), "ATDPN")
+    number = line.ask("ATDPN")[0]
+    check(re.fullmatch(r"A[1-9]", number), "ATDPN")
+    check(line.ask(f"ATTP{number[1]}") == ["OK"], "ATTP")
+    reply = line.ask("0100", 25)
+    check(frames(reply), f"0100 behind ATTP{number[1]}: {reply}")
+    check(line.ask("ATDPN")[0] == number[1], "ATDPN behind ATTP")
     pids = supported(reply, 0)
-    if 0x20 in pids:
-        pids |= supported(line.ask("0120"), 0x20)
+    for base in range(0x20, 0x100, 0x20):
+        if base in pids:
+            pids |= supported(line.ask(f"01{base:02X}"), base)
     told = 0
     for pid in (0x0C, 0x0D, 0x05):
         if pid not in pids:

@@ -87,7 +87,7 @@ TEST(Adapter, olderVersionsKnowLess)
     EXPECT_EQ(newer.ask("ATIGN"), "?\r\r>");
     auto newest = unplugged("elm327-v2.3");
     newest.ask("ATE0");
-    EXPECT_EQ(newest.ask("ATAMC"), "FF\r\r>");
+    EXPECT_EQ(newest.ask("ATAMC"), "00\r\r>");
     EXPECT_EQ(newest.ask("ATSH18DB33F1"), "OK\r\r>");
 }
 

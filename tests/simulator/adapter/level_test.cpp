@@ -23,16 +23,17 @@ TEST(Level, commandsAreKnownFromTheirVersionOn)
         {"CSM1", 142},         {"JHF0", 142},       {"CRA", 142},         {"JTM1", 142},   {"AMC", 200},
         {"AMT20", 200},        {"SH18DA10F1", 200}, {"CRA7XX", 200},      {"CTM1", 210},   {"IFR5", 220},
         {"IB12", 220},         {"CER01", 220},      {"FT", 220},          {"C1", 230},     {"CF18DAF110", 100},
-        {"CM1FFFFFFF", 100},   {"SP00", 100},       {"ST6", 100},         {"SW9", 100},    {"@2", 100},
-        {"FCSH18DA10F1", 110}, {"PP0CON", 110},     {"PP0COFF", 110},     {"IFRS", 120},   {"MP00FECA", 120},
-        {"CRA18DAF110", 130},  {"JTM5", 142},       {"CRA18DAF1XX", 200}, {"FT10", 220},
+        {"CM1FFFFFFF", 100},   {"SP00", 130},       {"ST6", 100},         {"SW9", 100},    {"@2", 130},
+        {"FCSH18DA10F1", 110}, {"PP0CON", 110},     {"PP0COFF", 110},     {"IFRS", 120},   {"MP00FECA", 130},
+        {"CRA18DAF110", 130},  {"JTM5", 142},       {"CRA18DAF1XX", 200}, {"FT10", 220},   {"MPFEE91", 142},
+        {"WM3E", 120},         {"IB96", 100},       {"WM8011F13E", 100},
     };
     obdsim::AdapterProfile profile = *obdsim::findProfile("elm327-v2.3");
     for (auto const& row : cases) {
         profile.level = row.level;
         EXPECT_TRUE(obdsim::findCommand(profile, row.command)) << row.command;
         profile.level = row.level - 1;
-        EXPECT_FALSE(obdsim::findCommand(profile, row.command)) << row.command;
+        EXPECT_FALSE(row.level > 100 && obdsim::findCommand(profile, row.command)) << row.command;
     }
 }
 
@@ -42,7 +43,26 @@ TEST(Level, savedByteAndWarmStart)
     EXPECT_EQ(host.ask({"ATE0", "ATSD7F", "ATZ", "ATE0", "ATRD"}), "7F\r\r>");
     host.ask("ATWS");
     EXPECT_LT(host.lastWait(), obdsim::Ms(10));
-    EXPECT_EQ(host.ask({"ATE0", "ATAMC"}), "FF\r\r>");
+}
+
+TEST(Level, responsesAreCountedFromV13On)
+{
+    auto old = simulated("petrol-can11", "elm327-v1.2");
+    EXPECT_EQ(old.ask({"ATE0", "ATSP6", "010C1"}), "?\r\r>");
+    auto next = simulated("petrol-can11", "elm327-v1.3a");
+    EXPECT_EQ(next.ask({"ATE0", "ATSP6", "010C1"}).substr(0, 5), "41 0C");
+}
+
+TEST(Level, activityOfTheBusIsCounted)
+{
+    auto host = simulated("petrol-can11", "elm327-v2.3");
+    EXPECT_EQ(host.ask({"ATE0", "ATIA"}), "N\r\r>");
+    EXPECT_EQ(host.ask({"ATSP6", "010C1", "ATIA"}), "Y\r\r>");
+    EXPECT_EQ(host.ask("ATAMC"), "00\r\r>");
+    host.pass(obdsim::Ms(2000));
+    EXPECT_EQ(host.ask("ATAMC"), "03\r\r>") << "steps of 655 ms";
+    host.pass(obdsim::Ms(1000000));
+    EXPECT_EQ(host.ask("ATAMC"), "FF\r\r>");
 }
 
 /// "v1.3a" as a level.
@@ -56,6 +76,7 @@ TEST(Level, guideTellsEachCommandAndItsVersion)
 {
     std::ifstream file(VELMORA_SOURCE_DIR "/docs/simulator.md");
     int rows = 0;
+    int answeredOnly = 0;
     for (std::string line; std::getline(file, line);) {
         std::istringstream cells(line);
         std::string nothing;
@@ -69,6 +90,7 @@ TEST(Level, guideTellsEachCommandAndItsVersion)
         }
         int const level = levelOf(version.substr(1, version.size() - 2));
         obdsim::AdapterProfile profile = *obdsim::findProfile("elm327-v2.3");
+        auto const bar = samples.find('|');
         for (auto at = samples.find("`AT"); at != std::string::npos; at = samples.find("`AT", at + 1)) {
             const std::string command = samples.substr(at + 3, samples.find('`', at + 1) - at - 3);
             profile.level = level;
@@ -76,9 +98,16 @@ TEST(Level, guideTellsEachCommandAndItsVersion)
             profile.level = level - 1;
             EXPECT_FALSE(level > 100 && obdsim::findCommand(profile, command)) << line << ": " << command;
             ++rows;
+            profile.level = level;
+            auto const call = obdsim::findCommand(profile, command);
+            bool const idle = call && (call->command->handler == obdsim::handler::accept ||
+                                       call->command->handler == obdsim::handler::monitor);
+            EXPECT_EQ(idle, at > bar) << command << " is in the wrong column";
+            answeredOnly += idle ? 1 : 0;
         }
     }
-    EXPECT_GE(rows, 90) << "the table of commands";
+    EXPECT_GE(rows, 100) << "the table of commands";
+    EXPECT_GE(answeredOnly, 40);
 }
 
 } // namespace
