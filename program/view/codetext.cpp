@@ -1,3 +1,5 @@
+#include "libvelmora/report/texts/labels.h"
+#include "libvelmora/report/texts/plaintexts.h"
 #include "program/view/layout.h"
 #include "program/view/reporttext.h"
 
@@ -9,7 +11,7 @@ namespace {
 
 char const* title(CodeKind kind)
 {
-    static constexpr char const* all[] = {"Confirmed", "Pending", "Permanent"};
+    static constexpr char const* all[] = {texts::confirmed, texts::pending, texts::permanent};
     return all[static_cast<int>(kind)];
 }
 
@@ -17,18 +19,18 @@ std::string summary(CodeList const& list)
 {
     switch (list.answer) {
     case CodeList::Answer::Refused:
-        return "refused: " + list.reason;
+        return fmt::format(texts::plain::refusedBecause, list.reason);
     case CodeList::Answer::Silent:
-        return "no answer";
+        return texts::noAnswer;
     case CodeList::Answer::Unreadable:
-        return "the reply can't be read";
+        return texts::cantBeRead;
     case CodeList::Answer::Read:
         break;
     }
     if (list.codes.empty()) {
-        return "none stored";
+        return texts::noneStored;
     }
-    return counted(list.codes.size(), "code");
+    return counted(list.codes.size(), texts::plain::codeNoun);
 }
 
 Mark mark(CodeList const& list)
@@ -46,22 +48,22 @@ std::string makerText(MakerChoice const& choice)
 {
     switch (choice.by) {
     case MakerChoice::By::Option:
-        return choice.maker + "'s";
+        return fmt::format(texts::plain::listOf, choice.maker);
     case MakerChoice::By::Vin:
-        return choice.maker + "'s, by the VIN";
+        return fmt::format(texts::plain::listByVin, choice.maker);
     case MakerChoice::By::Guess:
-        return fmt::format("not known; perhaps {0}'s: --make \"{0}\"", choice.maker);
+        return fmt::format(texts::plain::listByGuess, choice.maker);
     case MakerChoice::By::Nothing:
         break;
     }
-    return "not known; --make MAKER names the maker, -v lists all";
+    return texts::plain::noList;
 }
 
 } // namespace
 
 std::string lampText(std::optional<bool> const& lamp, Style const& style)
 {
-    return !lamp ? "-" : *lamp ? style.paint(Mark::Bad, "on") : style.paint(Mark::Good, "off");
+    return !lamp ? "-" : *lamp ? style.paint(Mark::Bad, texts::on) : style.paint(Mark::Good, texts::off);
 }
 
 std::string toText(TroubleCode const& code, std::string const& indent, bool all)
@@ -82,14 +84,14 @@ std::string toText(TroubleCode const& code, std::string const& indent, bool all)
 
 std::string toText(CodeReport const& report, Style const& style)
 {
-    std::string text = labelledLine("Lamp", lampText(report.lamp, style));
+    std::string text = labelledLine(texts::lampShort, lampText(report.lamp, style));
     for (CodeList const& list : report.lists) {
         text += labelledLine(title(list.kind), style.paint(mark(list), summary(list)));
         for (TroubleCode const& code : list.codes) {
             text += toText(code, "    ", style.isDetailed());
         }
     }
-    return text + (hasMakersCodes(report) ? labelledLine("Meanings", makerText(report.maker)) : "");
+    return text + (hasMakersCodes(report) ? labelledLine(texts::plain::meanings, makerText(report.maker)) : "");
 }
 
 } // namespace velmora::cli

@@ -1,5 +1,7 @@
 #include "libvelmora/report/texts/findingtexts.h"
 #include "libvelmora/report/texts/inspectiontexts.h"
+#include "libvelmora/report/texts/labels.h"
+#include "libvelmora/report/texts/plaintexts.h"
 #include "program/view/layout.h"
 #include "program/view/reporttext.h"
 
@@ -55,12 +57,12 @@ std::string suggestionText(Finding const& finding, Style const& style)
 std::string toText(std::vector<Finding> const& findings, Style const& style)
 {
     std::string const told = toldText(findings, style);
-    std::string text =
-        "Findings\n" + (told.empty() ? "  " + style.paint(Mark::Good, "none in what the vehicle told") + "\n" : told);
+    std::string text = std::string(texts::findings) + "\n" +
+                       (told.empty() ? "  " + style.paint(Mark::Good, texts::plain::noFindings) + "\n" : told);
     bool first = true;
     for (Finding const& finding : findings) {
         if (isSuggestion(finding)) {
-            text += (first ? "\nWhat the data suggests\n" : "") + suggestionText(finding, style);
+            text += (first ? std::string("\n") + texts::suggested + "\n" : "") + suggestionText(finding, style);
             first = false;
         }
     }

@@ -1,3 +1,4 @@
+#include "libvelmora/report/texts/labels.h"
 #include "program/view/layout.h"
 #include "program/view/reporttext.h"
 
@@ -21,10 +22,10 @@ std::string toText(FreezeReport const& report, Style const& style)
 {
     std::string const number = std::to_string(report.number);
     if (report.frame) {
-        return labelledLine("Freeze frame", number) + frameText(*report.frame, style);
+        return labelledLine(texts::freezeFrame, number) + frameText(*report.frame, style);
     }
-    return labelledLine("Freeze frame",
-                        number + ": " + (hasAnswer(report) ? "none stored" : answerWord(report.answer)));
+    return labelledLine(texts::freezeFrame,
+                        number + ": " + (hasAnswer(report) ? texts::noneStored : answerWord(report.answer)));
 }
 
 } // namespace velmora::cli

@@ -2,6 +2,7 @@
 
 #include "libvelmora/history/scanjson.h"
 #include "libvelmora/report/texts/changetexts.h"
+#include "libvelmora/report/texts/plaintexts.h"
 #include "program/view/layout.h"
 
 #include <fmt/format.h>
@@ -31,11 +32,11 @@ std::vector<Cell> scanRow(KeptScan const& scan)
     bool const on = lamp.is_boolean() && lamp.get<bool>();
     return {{std::to_string(scan.number), Mark::None, true},
             {localTime(scan)},
-            {lamp.is_null() ? "lamp -"
-             : on           ? "lamp on"
-                            : "lamp off",
+            {lamp.is_null() ? texts::plain::lampUnknown
+             : on           ? texts::plain::lampOn
+                            : texts::plain::lampOff,
              on ? Mark::Bad : Mark::None},
-            {codes.empty() ? "no codes" : fmt::format("{}", fmt::join(codes, " ")),
+            {codes.empty() ? texts::plain::noCodes : fmt::format("{}", fmt::join(codes, " ")),
              codes.empty() ? Mark::None : Mark::Bad}};
 }
 
@@ -47,7 +48,7 @@ Mark changeMark(ChangeWeight weight)
 
 std::vector<Cell> changeRow(Change const& change)
 {
-    static constexpr char const* words[] = {"", "better", "worse"};
+    static constexpr char const* words[] = {"", texts::plain::better, texts::plain::worse};
     std::string const values =
         change.before.empty() && change.after.empty() ? std::string() : change.before + " -> " + change.after;
     std::string const item = change.name.empty() ? values : values.empty() ? change.name : change.name + ": " + values;
@@ -62,7 +63,7 @@ std::vector<Cell> changeRow(Change const& change)
 std::string historyText(std::vector<KeptScan> const& scans, Style const& style)
 {
     if (scans.empty()) {
-        return "Nothing is kept yet; velmora scan --history keeps a scan\n";
+        return std::string(texts::plain::nothingKept) + "\n";
     }
     std::vector<std::string> vehicles;
     for (KeptScan const& scan : scans) {
@@ -86,8 +87,9 @@ std::string historyText(std::vector<KeptScan> const& scans, Style const& style)
 std::string diffText(KeptScan const& older, KeptScan const& newer, std::vector<Change> const& changes,
                      Style const& style)
 {
-    std::string const text = fmt::format("{}\n  scan {} of {}\n  scan {} of {}\n\n{}\n", newer.vehicle, older.number,
-                                         localTime(older), newer.number, localTime(newer), texts::change::title);
+    std::string const text = fmt::format(
+        "{}\n  {}\n  {}\n\n{}\n", newer.vehicle, fmt::format(texts::plain::scanOf, older.number, localTime(older)),
+        fmt::format(texts::plain::scanOf, newer.number, localTime(newer)), texts::change::title);
     if (changes.empty()) {
         return text + "  " + style.paint(Mark::Good, texts::change::none) + "\n";
     }

@@ -1,5 +1,9 @@
+#include "libvelmora/report/texts/labels.h"
+#include "libvelmora/report/texts/plaintexts.h"
 #include "program/view/layout.h"
 #include "program/view/reporttext.h"
+
+#include <fmt/format.h>
 
 namespace velmora::cli {
 
@@ -14,24 +18,25 @@ std::string travelText(InfoReport::Travel const& travel)
 {
     std::string const distance = readingText(travel.distance);
     std::string const time = readingText(travel.runTime);
-    std::string const engine = time.empty() ? "" : "engine ran " + time;
+    std::string const engine = time.empty() ? "" : fmt::format(texts::plain::engineRan, time);
     return distance + (distance.empty() || engine.empty() ? "" : ", ") + engine;
 }
 
 std::string calibrationText(InfoReport::Calibration const& calibration)
 {
     std::string const id = calibration.id.empty() ? "-" : calibration.id;
-    return calibration.verification.empty() ? id : id + "  verification " + calibration.verification;
+    return calibration.verification.empty() ? id
+                                            : fmt::format(texts::plain::verification, id, calibration.verification);
 }
 
 std::string calibrationLines(std::vector<InfoReport::Calibration> const& calibrations)
 {
     if (calibrations.empty()) {
-        return labelledLine("Calibration", {});
+        return labelledLine(texts::calibration, {});
     }
     std::string text;
     for (InfoReport::Calibration const& calibration : calibrations) {
-        text += labelledLine(text.empty() ? "Calibration" : "", calibrationText(calibration));
+        text += labelledLine(text.empty() ? texts::calibration : "", calibrationText(calibration));
     }
     return text;
 }
@@ -40,11 +45,12 @@ std::string calibrationLines(std::vector<InfoReport::Calibration> const& calibra
 
 std::string toText(InfoReport const& report, Style const& /*style*/)
 {
-    return labelledLine("Description", report.description) + labelledLine("Standard", report.standard) +
-           labelledLine("Protocol", report.protocol) + labelledLine("VIN", report.vin) +
-           calibrationLines(report.calibrations) + labelledLine("Engine number", report.engineSerialNumber) +
-           labelledLine("Type approval", report.erotan) + labelledLine("With lamp on", travelText(report.withLamp)) +
-           labelledLine("Since cleared", travelText(report.sinceCleared));
+    return labelledLine(texts::description, report.description) + labelledLine(texts::standard, report.standard) +
+           labelledLine(texts::protocol, report.protocol) + labelledLine(texts::vin, report.vin) +
+           calibrationLines(report.calibrations) + labelledLine(texts::plain::engineNumber, report.engineSerialNumber) +
+           labelledLine(texts::plain::typeApproval, report.erotan) +
+           labelledLine(texts::plain::withLamp, travelText(report.withLamp)) +
+           labelledLine(texts::plain::sinceCleared, travelText(report.sinceCleared));
 }
 
 } // namespace velmora::cli

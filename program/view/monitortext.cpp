@@ -1,3 +1,5 @@
+#include "libvelmora/report/texts/labels.h"
+#include "libvelmora/report/texts/plaintexts.h"
 #include "program/view/layout.h"
 #include "program/view/reporttext.h"
 
@@ -25,13 +27,13 @@ Cell number(std::string const& text)
 // Descriptions may be longer than a line is wide, so they stand last.
 std::vector<Cell> limitTestHeads()
 {
-    return {{"  Result"},
-            {"Test"},
-            {"Value", Mark::None, true},
-            {"Minimum", Mark::None, true},
-            {"Maximum", Mark::None, true},
-            {"Unit"},
-            {"Description"}};
+    return {{std::string("  ") + texts::result},
+            {texts::test},
+            {texts::value, Mark::None, true},
+            {texts::minimum, Mark::None, true},
+            {texts::maximum, Mark::None, true},
+            {texts::unit},
+            {texts::description}};
 }
 
 std::vector<Cell> limitTestRow(LimitTest const& test)
@@ -64,9 +66,9 @@ std::string summary(MonitorsReport const& report, Style const& style)
     }
     std::size_t const failed = count(report, Verdict::Failed);
     std::size_t const without = count(report, Verdict::NoResult);
-    std::string text = failed > 0 ? style.paint(Mark::Bad, fmt::format("{} failed", failed)) + ", " : "";
-    text += fmt::format("{} passed", count(report, Verdict::Passed));
-    return text + (without > 0 ? fmt::format(", {} without result", without) : "");
+    std::string text = failed > 0 ? style.paint(Mark::Bad, fmt::format(texts::plain::testsFailed, failed)) + ", " : "";
+    text += fmt::format(texts::plain::testsPassed, count(report, Verdict::Passed));
+    return text + (without > 0 ? ", " + fmt::format(texts::plain::testsWithout, without) : "");
 }
 
 std::string monitorText(OxygenReport const& report, Style const& style)
@@ -77,8 +79,8 @@ std::string monitorText(OxygenReport const& report, Style const& style)
     if (!report.complete) {
         return {};
     }
-    return *report.complete ? style.paint(Mark::Good, "complete")
-                            : style.paint(Mark::Warning, "not complete, so results don't count yet");
+    return *report.complete ? style.paint(Mark::Good, texts::plain::oxygenComplete)
+                            : style.paint(Mark::Warning, texts::plain::oxygenNotComplete);
 }
 
 std::string sensorList(OxygenReport const& report)
@@ -94,7 +96,8 @@ std::string drawTests(std::vector<OxygenSensor> const& sensors, Style const& sty
 {
     std::vector<std::vector<Cell>> rows = {limitTestHeads()};
     for (OxygenSensor const& sensor : sensors) {
-        rows.push_back({{locationName(sensor.location) + (sensor.tests.empty() ? ": no tests" : "")}});
+        rows.push_back({{sensor.tests.empty() ? fmt::format(texts::plain::noTests, locationName(sensor.location))
+                                              : locationName(sensor.location)}});
         for (LimitTest const& test : failedFirst(sensor.tests)) {
             rows.push_back(limitTestRow(test));
         }
@@ -106,7 +109,7 @@ std::string drawTests(std::vector<OxygenSensor> const& sensors, Style const& sty
 
 std::string toText(MonitorsReport const& report, Style const& style)
 {
-    std::string text = labelledLine("Monitor tests", summary(report, style));
+    std::string text = labelledLine(texts::plain::monitorTests, summary(report, style));
     if (report.monitors.empty()) {
         return text;
     }
@@ -122,12 +125,12 @@ std::string toText(MonitorsReport const& report, Style const& style)
 
 std::string toText(OxygenReport const& report, Style const& style)
 {
-    std::string text = labelledLine("Oxygen monitor", monitorText(report, style));
+    std::string text = labelledLine(texts::plain::oxygenMonitor, monitorText(report, style));
     if (report.answer != TopicAnswer::Read) {
         return text;
     }
-    text += labelledLine("O2 sensors", sensorList(report));
-    return text + (report.onCan ? labelledLine("O2 tests", "among those of the monitors (velmora monitors)")
+    text += labelledLine(texts::plain::oxygenSensors, sensorList(report));
+    return text + (report.onCan ? labelledLine(texts::plain::oxygenTests, texts::plain::oxygenElsewhere)
                                 : drawTests(report.sensors, style));
 }
 

@@ -1,5 +1,9 @@
+#include "libvelmora/report/texts/labels.h"
+#include "libvelmora/report/texts/plaintexts.h"
 #include "program/view/layout.h"
 #include "program/view/reporttext.h"
+
+#include <fmt/format.h>
 
 namespace velmora::cli {
 
@@ -18,10 +22,12 @@ std::string verdict(ReadinessReport const& report, Style const& style)
     }
     std::optional<bool> const ready = isReady(report);
     if (!ready) {
-        return "no monitors in this module";
+        return texts::plain::noMonitors;
     }
-    return *ready ? style.paint(Mark::Good, "ready")
-                  : style.paint(Mark::Warning, counted(countNotComplete(report), "monitor") + " not complete");
+    return *ready
+               ? style.paint(Mark::Good, texts::plain::ready)
+               : style.paint(Mark::Warning, fmt::format(texts::plain::notComplete,
+                                                        counted(countNotComplete(report), texts::plain::monitorNoun)));
 }
 
 Cell cell(std::optional<ReadinessStatus> const& status)
@@ -31,11 +37,11 @@ Cell cell(std::optional<ReadinessStatus> const& status)
 
 std::string drawMonitors(std::vector<ReadinessMonitor> const& monitors, Style const& style)
 {
-    std::vector<std::vector<Cell>> rows = {{{"Monitor"}, {"Since cleared"}, {"This driving cycle"}}};
+    std::vector<std::vector<Cell>> rows = {{{texts::monitor}, {texts::plain::sinceCleared}, {texts::thisCycle}}};
     std::string missing;
     for (ReadinessMonitor const& monitor : monitors) {
         if (monitor.sinceCleared == ReadinessStatus::NotAvailable) {
-            missing += (missing.empty() ? "Not available: " : ", ") + monitor.name;
+            missing += (missing.empty() ? texts::plain::notAvailable : ", ") + monitor.name;
         } else {
             rows.push_back({{monitor.name}, cell(monitor.sinceCleared), cell(monitor.thisCycle)});
         }
@@ -47,8 +53,8 @@ std::string drawMonitors(std::vector<ReadinessMonitor> const& monitors, Style co
 
 std::string toText(ReadinessReport const& report, Style const& style)
 {
-    std::string text = report.lamp ? labelledLine("Lamp", lampText(report.lamp, style)) : std::string();
-    text += labelledLine("Readiness", verdict(report, style));
+    std::string text = report.lamp ? labelledLine(texts::lampShort, lampText(report.lamp, style)) : std::string();
+    text += labelledLine(texts::readiness, verdict(report, style));
     if (!isReady(report)) {
         return text;
     }

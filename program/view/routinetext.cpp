@@ -1,5 +1,9 @@
+#include "libvelmora/report/texts/labels.h"
+#include "libvelmora/report/texts/plaintexts.h"
 #include "program/view/layout.h"
 #include "program/view/reporttext.h"
+
+#include <fmt/format.h>
 
 namespace velmora::cli {
 
@@ -16,11 +20,11 @@ Mark mark(RoutineRun::Result result)
 std::string toText(RoutinesReport const& report, Style const& style)
 {
     if (report.answer != TopicAnswer::Read) {
-        return labelledLine("Routines", style.paint(Mark::Faint, answerWord(report.answer)));
+        return labelledLine(texts::plain::routines, style.paint(Mark::Faint, answerWord(report.answer)));
     }
     std::string text;
     for (Routine const& routine : report.routines) {
-        text += labelledLine("Routine " + routineId(routine.id), routine.name);
+        text += labelledLine(fmt::format(texts::plain::routine, routineId(routine.id)), routine.name);
         text += wrapped(routine.description, 72, "    ");
     }
     return text;
@@ -29,8 +33,8 @@ std::string toText(RoutinesReport const& report, Style const& style)
 std::string toText(RoutineRun const& run, Style const& style)
 {
     std::string const result = style.paint(mark(run.result), resultWord(run.result));
-    return labelledLine("Routine " + routineId(run.routine.id), run.routine.name) +
-           labelledLine("Result", result + (run.reason.empty() ? "" : ": " + run.reason));
+    return labelledLine(fmt::format(texts::plain::routine, routineId(run.routine.id)), run.routine.name) +
+           labelledLine(texts::result, result + (run.reason.empty() ? "" : ": " + run.reason));
 }
 
 } // namespace velmora::cli

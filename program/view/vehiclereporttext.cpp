@@ -1,4 +1,5 @@
 #include "libvelmora/report/texts/labels.h"
+#include "libvelmora/report/texts/plaintexts.h"
 #include "program/view/layout.h"
 #include "program/view/reporttext.h"
 
@@ -17,18 +18,18 @@ void addLine(std::string& text, char const* label, std::string const& value)
 
 std::string adapterText(AdapterReport const& adapter)
 {
-    std::string text = "Adapter\n";
-    addLine(text, "Device", adapter.device);
-    addLine(text, "Description", adapter.description);
-    addLine(text, "Identifier", adapter.identification);
-    return text + labelledLine("Voltage", adapter.volts ? fmt::format("{:.1f} V", *adapter.volts) : "");
+    std::string text = std::string(texts::adapter) + "\n";
+    addLine(text, texts::device, adapter.device);
+    addLine(text, texts::description, adapter.description);
+    addLine(text, texts::identifier, adapter.identification);
+    return text + labelledLine(texts::plain::volts, adapter.volts ? fmt::format("{:.1f} V", *adapter.volts) : "");
 }
 
 std::string protocolText(ProtocolReport const& protocol)
 {
-    std::string text = "Protocol\n";
-    text += labelledLine("Number", protocol.number ? std::to_string(*protocol.number) : "");
-    addLine(text, "Name", protocol.name);
+    std::string text = std::string(texts::protocol) + "\n";
+    text += labelledLine(texts::plain::number, protocol.number ? std::to_string(*protocol.number) : "");
+    addLine(text, texts::name, protocol.name);
     return text;
 }
 
@@ -61,7 +62,7 @@ std::string valuesText(std::vector<LiveValue> const& values, Style const& style)
 std::string moduleText(ModuleReport const& module, Style const& style)
 {
     std::string text = moduleHeading(module.id, module.name) + "\n" + toText(module.info, style) +
-                       labelledLine("Live sensors", std::to_string(module.supported.size()));
+                       labelledLine(texts::sensors, std::to_string(module.supported.size()));
     for (std::string const& topic :
          {toText(module.codes, style), hasAnswer(module.freeze) ? toText(module.freeze, style) : std::string(),
           readinessText(module.readiness, style), topicText(module.monitors, style), topicText(module.oxygen, style),
@@ -75,7 +76,7 @@ std::string moduleText(ModuleReport const& module, Style const& style)
 
 std::string moduleHeading(unsigned int id, std::string const& name)
 {
-    return fmt::format("Control module {:X}{}{}", id, name.empty() ? "" : ": ", name);
+    return fmt::format("{} {:X}{}{}", texts::module, id, name.empty() ? "" : ": ", name);
 }
 
 std::string toText(VehicleReport const& report, Style const& style, std::optional<InspectionReport> const& inspection)

@@ -1,5 +1,7 @@
 #include "program/view/vintext.h"
 
+#include "libvelmora/report/texts/labels.h"
+#include "libvelmora/report/texts/plaintexts.h"
 #include "libvelmora/report/vinreport.h"
 #include "program/view/layout.h"
 
@@ -12,49 +14,50 @@ namespace {
 std::string yearText(VinFacts const& facts)
 {
     if (facts.years.empty()) {
-        return fmt::format("none coded in position 10 ({})", facts.vin[9]);
+        return fmt::format(texts::plain::noYear, facts.vin[9]);
     }
-    std::string const years = fmt::format("{}", fmt::join(facts.years, " or "));
+    std::string const years = fmt::format("{}", fmt::join(facts.years, texts::orYear));
     if (facts.yearBasis == VinFacts::YearBasis::Position) {
-        return fmt::format("{} (position 10 is {}, position 7 says which cycle of 30 years)", years, facts.vin[9]);
+        return fmt::format(texts::plain::yearByPosition, years, facts.vin[9]);
     }
-    return fmt::format("{}, if this maker codes it (position 10 is {})", years, facts.vin[9]);
+    return fmt::format(texts::plain::yearPerhaps, years, facts.vin[9]);
 }
 
 std::string checkText(VinFacts const& facts, Style const& style)
 {
     switch (facts.checkDigit) {
     case VinFacts::CheckDigit::Right:
-        return style.paint(Mark::Good, "right");
+        return style.paint(Mark::Good, texts::plain::checkRight);
     case VinFacts::CheckDigit::Wrong:
-        return style.paint(Mark::Bad, fmt::format("wrong: {} would fit; mistyped or altered", facts.computedCheck));
+        return style.paint(Mark::Bad, fmt::format(texts::plain::checkWrong, facts.computedCheck));
     case VinFacts::CheckDigit::NotJudged:
         break;
     }
-    return "not used by this maker or market";
+    return texts::plain::checkUnused;
 }
 
 std::string codesText(VinFacts const& facts)
 {
     switch (facts.basis) {
     case WmiRow::Basis::Fact:
-        return facts.codes + "'s meanings, used by default";
+        return fmt::format(texts::plain::codesByDefault, facts.codes);
     case WmiRow::Basis::Guess:
-        return fmt::format("perhaps {}'s meanings: --make \"{}\"", facts.codes, facts.codes);
+        return fmt::format(texts::plain::codesPerhaps, facts.codes);
     case WmiRow::Basis::None:
         break;
     }
-    return facts.maker.empty() ? "" : "no list for this maker";
+    return facts.maker.empty() ? "" : texts::plain::codesUnknown;
 }
 
 } // namespace
 
 std::string toText(VinFacts const& facts, Style const& style)
 {
-    return labelledLine("VIN", facts.vin) + labelledLine("Region", facts.region) +
-           labelledLine("Country", facts.country) + labelledLine("Maker", makerText(facts)) +
-           labelledLine("Model year", yearText(facts)) + labelledLine("Check digit", checkText(facts, style)) +
-           labelledLine("Trouble codes", codesText(facts));
+    return labelledLine(texts::vin, facts.vin) + labelledLine(texts::plain::region, facts.region) +
+           labelledLine(texts::plain::country, facts.country) + labelledLine(texts::maker, makerText(facts)) +
+           labelledLine(texts::modelYear, yearText(facts)) +
+           labelledLine(texts::plain::checkDigit, checkText(facts, style)) +
+           labelledLine(texts::codes, codesText(facts));
 }
 
 } // namespace velmora::cli
