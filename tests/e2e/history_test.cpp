@@ -88,6 +88,33 @@ TEST_F(HistoryRun, ComparesShowsCarriesAndForgets)
     EXPECT_EQ(list().size(), 1U);
 }
 
+// Asked once, on a terminal: yes keeps this scan and those to come, no keeps none, and neither is asked again.
+TEST_F(HistoryRun, AsksOnceOnATerminalAndRemembersTheAnswer)
+{
+    std::string const question = "Keep this scan and those to come? [y/N]";
+    auto const scanOnTerminal = [&](char const* settings, char const* answer) {
+        return e2e::runOnTerminal({"--settings", m_folder.file(settings), "-p", "sim:petrol-can11?instant", "scan"}, {},
+                                  question, answer);
+    };
+    Outcome const yes = scanOnTerminal("yes.toml", "y\n");
+    EXPECT_EQ(yes.exitCode, 0) << yes.out;
+    EXPECT_NE(yes.out.find(m_folder.file("history.db")), std::string::npos) << "told where: " << yes.out;
+    EXPECT_NE(yes.out.find("Kept as scan 1 of VELMRAS1MM0000001"), std::string::npos) << yes.out;
+    Outcome const again = scanOnTerminal("yes.toml", "n\n");
+    EXPECT_EQ(again.out.find(question), std::string::npos) << again.out;
+    EXPECT_EQ(list().size(), 2U);
+    EXPECT_EQ(std::filesystem::status(m_folder.file("history.db")).permissions(),
+              std::filesystem::perms::owner_read | std::filesystem::perms::owner_write);
+
+    use("none.db");
+    Outcome const no = scanOnTerminal("no.toml", "n\n");
+    EXPECT_EQ(no.exitCode, 0) << no.out;
+    EXPECT_NE(no.out.find("Nothing is kept"), std::string::npos) << no.out;
+    Outcome const still = scanOnTerminal("no.toml", "y\n");
+    EXPECT_EQ(still.out.find(question), std::string::npos) << still.out;
+    EXPECT_FALSE(std::filesystem::exists(m_folder.file("none.db")));
+}
+
 // A car that tells no VIN is known by its name, and what got worse with it by the exit code.
 TEST_F(HistoryRun, TellsByItsExitCodeThatSomethingGotWorse)
 {

@@ -12,31 +12,15 @@ const { pathToFileURL } = require('node:url');
 const { HtmlValidate } = require('html-validate');
 const vnuJar = require('vnu-jar');
 const puppeteer = require('puppeteer-core');
+const { carsIn, expectRows } = require('./reportrows.js');
 
 const [program, pictures] = process.argv.slice(2);
 const axeSource = fs.readFileSync(require.resolve('axe-core/axe.min.js'), 'utf8');
 const folder = fs.mkdtempSync(path.join(os.tmpdir(), 'velmora-report-'));
 
-// Cars with much and with little to tell; the last says what HTML would take for a mark.
-const cars = {
-  petrol: 'sim:petrol-can11?instant',
-  diesel: 'sim:diesel-can29?instant',
-  legacy: 'sim:petrol-iso9141?instant',
-  two: 'sim:two-can29-250?instant',
-  recorded: `replay:${farAway('can11-jaguar-2014-two-modules-come-and-go.dialogue')}`,
-};
-
-// A recording whose path is one long word, as some are: it must not make the page wider than a phone.
-function farAway(name) {
-  const far = path.join(folder, 'a'.repeat(100));
-  fs.mkdirSync(far);
-  fs.copyFileSync(path.join(__dirname, '..', 'dialogues', name), path.join(far, name));
-  return path.join(far, name);
-}
-
 function makeReports() {
   const reports = {};
-  for (const [name, port] of Object.entries(cars)) {
+  for (const [name, port] of Object.entries(carsIn(folder))) {
     const html = path.join(folder, `${name}.html`);
     const json = path.join(folder, `${name}.json`);
     execFileSync(program, ['-q', '-p', port, 'scan', '--inspection', 'us-california', '--model-year', '2015', '--vehicle',
@@ -113,6 +97,19 @@ const tablesOf = (page) => page.evaluate(() => [...document.querySelectorAll('ta
   rows: [...table.tBodies[0].rows].map((row) => [...row.cells].map((cell) => cell.innerText)),
 })));
 
+// The same by control module: the sections of one follow its own.
+const rowsByModule = (page) => page.evaluate(() => {
+  const all = [['', []]];
+  let current = all[0];
+  for (const section of document.querySelectorAll('section')) {
+    if (section.id.startsWith('info-')) all.push(current = [section.id.slice('info-'.length), []]);
+    else if (section.id === 'adapter') current = all[0];
+    const rows = [...section.querySelectorAll('tr')];
+    current[1].push(...rows.map((row) => [...row.cells].map((cell) => cell.textContent.replace(/\s+/g, ' ').trim())));
+  }
+  return all;
+});
+
 async function checkPaper(page, report, name, format) {
   const file = path.join(folder, `${name}-${format}.pdf`);
   await page.pdf({ path: file, format, printBackground: false, preferCSSPageSize: true });
@@ -161,6 +158,7 @@ async function checkInBrowser(reports) {
       const text = joined(await page.evaluate('document.body.textContent'));
       for (const wanted of wantedTexts(report.json)) assert.ok(text.includes(joined(wanted)), `${name}: "${wanted}"`);
       assert.ok(text.includes(joined('<script>alert(1)</script> & "co"')), 'the name stays text');
+      assert.ok(expectRows(report.json, new Map(await rowsByModule(page)), name) > 5, `${name} tells something`);
       await checkScreen(page, name);
       await page.emulateMediaType('print');
       for (const [format, width] of [['A4', 703], ['Letter', 725]]) {
