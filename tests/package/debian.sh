@@ -92,6 +92,10 @@ run obdsim --list | grep petrol-can11 >/dev/null || fail "obdsim lists no vehicl
 said=$(run python3 -c 'import velmora
 with velmora.Car("sim:petrol-can11?instant") as car: print(car.read("RPM")[0])')
 [[ $said == Engine\ RPM:* ]] || fail "Python says: $said"
+run python3 -c 'from velmora import _velmora
+seconds = _velmora.callback_seconds(lambda reading: None, 100000)
+print(f"100000 callbacks take {seconds:.2f} s of processor time")
+assert seconds < 1' || fail "callbacks to Python are slow"
 for file in "$system"/usr/bin/{velmora,obdsim} "$system/usr/lib/$multiarch"/lib{obd,velmora}.so.0.* \
     "$system"/usr/lib/python3/dist-packages/velmora/*.so; do
     ! readelf -d "$file" | grep -E 'R(UN)?PATH' || fail "$file has a run path"
