@@ -217,6 +217,7 @@ static void check_readings(velmora_car* car)
     struct seen seen = {0};
     char const* const names[] = {"RPM", "coolant", "7E9:05"};
     char const* const wrong[] = {"no such sensor"};
+    char const* const other[] = {"AMBIANT_AIR_TEMP"}; /* as other programs name it */
     velmora_error* error = NULL;
 
     pthread_mutex_init(&seen.mutex, NULL);
@@ -225,6 +226,7 @@ static void check_readings(velmora_car* car)
     CHECK(velmora_car_read(car, names, 2, on_reading, &seen, &error) == VELMORA_OK && error == NULL);
     CHECK(seen.count == 2 && seen.with_value == 2);
     CHECK(velmora_car_read(car, wrong, 1, on_reading, &seen, NULL) == VELMORA_WRONG_USE && seen.count == 2);
+    CHECK(velmora_car_read(car, other, 1, on_reading, &seen, NULL) == VELMORA_OK && seen.with_value == 3);
 
     for (seen.stop_inside = 0; seen.stop_inside < 2; ++seen.stop_inside) {
         velmora_watch* watch = NULL;

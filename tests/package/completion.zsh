@@ -35,6 +35,7 @@ offers scan 'velmora '
 offers sim:petrol-can11 'velmora -p sim:p'
 offers RPM 'velmora live R'
 offers imperial 'velmora --units '
+offers petrol-can11 'obdsim --vehicle p'
 offers share 'velmora --settings s'
 rm -rf $home
 exit $wrong

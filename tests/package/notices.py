@@ -36,6 +36,15 @@ for folder in ("common", "libobd", "libvelmora", "program", "simulator", "bindin
 roots = {re.sub(r"\.hpp$", "", name) for name in included}
 wrong += [f"<{name}> is included, but no notice names it" for name in roots if name not in told("Headers")]
 
+# Files of others that are embedded: CMake finds them where their packages have put them.
+embedded = set()
+for file in [*source.glob("*/CMakeLists.txt"), *source.glob("*/*/CMakeLists.txt"), *source.glob("*/*/*/CMakeLists.txt")]:
+    embedded |= set(re.findall(r"^find_file\(\w+ (\S+) PATHS (/usr/\S+) REQUIRED\)", file.read_text(), re.M))
+for name, folder in embedded:
+    owner = subprocess.run(["dpkg", "-S", f"{folder}/{name}"], capture_output=True, text=True).stdout.split(":")[0]
+    if owner not in told("Debian"):
+        wrong.append(f"{folder}/{name} of the package \"{owner}\" is embedded, but no notice names it")
+
 # The packages that the build wants, but for tools.
 lists = re.findall(r"^build_packages\+?=\(([^)]*)\)", (source / "scripts/lib.sh").read_text(), re.M)
 packages = set(" ".join(lists).split()) - {"g++", "cmake", "ninja-build", "libpython3-dev", "python3-dev"}
@@ -45,5 +54,5 @@ depends = set(re.findall(r"[a-z0-9][a-z0-9.+-]+", control[control.index("Build-D
 wrong += [f"debian/control does not build with {name}" for name in told("Debian") | packages if name not in depends]
 
 print("\n".join(wrong))
-print(f"{len(linked)} libraries, {len(roots)} headers and {len(packages)} packages looked at")
-sys.exit(1 if wrong or len(linked) < 4 or len(roots) < 6 else 0)
+print(f"{len(linked)} libraries, {len(roots)} headers, {len(embedded)} embedded files and {len(packages)} packages looked at")
+sys.exit(1 if wrong or len(linked) < 4 or len(roots) < 6 or not embedded else 0)
