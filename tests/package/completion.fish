@@ -15,6 +15,7 @@ end
 
 offers scan 'velmora '
 offers sim:petrol-can11 'velmora -p sim:pe'
+offers auto 'velmora -p a'
 offers RPM 'velmora live R'
 offers --units=imperial 'velmora --units=i'
 offers --fast 'velmora live --f'

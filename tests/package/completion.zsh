@@ -33,6 +33,7 @@ offers() { # offers EXPECTED LINE
 
 offers scan 'velmora '
 offers sim:petrol-can11 'velmora -p sim:p'
+offers auto 'velmora -p a'
 offers RPM 'velmora live R'
 offers imperial 'velmora --units '
 offers petrol-can11 'obdsim --vehicle p'
