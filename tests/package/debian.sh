@@ -29,7 +29,7 @@ holds velmora 'man1/velmora-scan\.1\.gz$' 'man5/velmora-signals\.5\.gz$' 'comple
     'rules\.d/60-velmora\.rules$' 'velmora-watch\.service$'
 holds obdsim 'bin/obdsim$' 'man1/obdsim\.1\.gz$'
 holds python3-velmora 'velmora/__init__\.py$' '_velmora\..*\.so$' 'py\.typed$'
-holds velmora-doc 'companion\.md'
+holds velmora-doc 'companion\.md' 'html/index\.html$' 'html/group__cface\.html$' 'examples/car/read\.cpp$'
 
 installed=(libobd0 libvelmora0 velmora obdsim python3-velmora)
 mapfile -t files < <(for name in "${installed[@]}"; do ls "$packages/$name"_*.deb; done)
