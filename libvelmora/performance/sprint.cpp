@@ -98,6 +98,13 @@ std::optional<SprintTime> timeOf(SprintGoal const& goal, std::vector<SpeedPoint>
     return SprintTime{seconds, (1.0 + acceleration * interval) / acceleration, end->kmh};
 }
 
+std::vector<SprintGoal> allSprintGoals()
+{
+    std::vector<SprintGoal> goals = sprintGoals(false);
+    goals.insert(goals.begin() + 1, sprintGoals(true).front());
+    return goals;
+}
+
 double distanceOf(std::vector<SpeedPoint> const& run)
 {
     double metres = 0.0;

@@ -24,6 +24,8 @@ struct SprintGoal
 
 // The usual ones: 0 to 100 km/h, or 0 to 60 mph for imperial units; 80 to 120 km/h; a quarter mile.
 std::vector<SprintGoal> sprintGoals(bool imperial);
+// Those of both.
+std::vector<SprintGoal> allSprintGoals();
 
 struct SprintTime
 {

@@ -49,14 +49,29 @@ void SessionCar::connect()
 std::vector<PollSource> SessionCar::chooseSources()
 {
     m_signals = std::make_unique<SignalChoice>(*m_session);
-    std::vector<PollSource> sources = watchSources(*m_session, m_options.sensors, *m_signals);
-    addSources(*m_session, m_further, sources);
+    std::vector<PollSource> sources;
+    addSources(*m_session, m_only, sources);
+    if (sources.empty()) {
+        sources = watchSources(*m_session, m_options.sensors, *m_signals);
+        addSources(*m_session, m_further, sources);
+    }
     return sources;
 }
 
 void SessionCar::readAlso(std::vector<std::string> const& wishes)
 {
     m_further = wishes;
+    changeSources();
+}
+
+void SessionCar::readOnly(std::vector<std::string> const& wishes)
+{
+    m_only = wishes;
+    changeSources();
+}
+
+void SessionCar::changeSources()
+{
     if (!m_up) {
         return;
     }

@@ -57,6 +57,8 @@ public:
     unsigned int visits() const { return m_visits; }
     // Reads these wishes beside the others from now on, as far as they are offered.
     void readAlso(std::vector<std::string> const& wishes);
+    // Reads these in the place of all others from now on; none at all gives the others back.
+    void readOnly(std::vector<std::string> const& wishes);
 
     // Dispatches what the library asks for until the time has come or interrupt was called.
     void wait(std::chrono::milliseconds time);
@@ -65,6 +67,7 @@ public:
 
 private:
     std::unique_ptr<IPort> openBarePort();
+    void changeSources();
     std::vector<PollSource> chooseSources();
 
     SessionCarOptions const m_options;
@@ -74,6 +77,7 @@ private:
     bool m_up = false;
     unsigned int m_visits = 0;
     std::vector<std::string> m_further; // wishes beside those of the options
+    std::vector<std::string> m_only;    // wishes in the place of all others; empty: none are
     bool m_interrupted = false;         // protected by m_mutex, as is the pointer above
     std::vector<Reading> m_readings;    // protected by m_mutex
     std::vector<PollSource> m_sources;
