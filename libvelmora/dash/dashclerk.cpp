@@ -68,6 +68,9 @@ DashClerk::Outcome DashClerk::serve()
     Outcome outcome;
     if (m_car.session() == nullptr) {
         while (auto const ask = m_desk.next()) {
+            if (ask->topic == "performance" && ask->text == "end") {
+                timeRuns(ask->text);
+            }
             m_desk.tell(DashAnswer{ask->topic, false, "There is no link to the car now"});
         }
         return outcome;
@@ -113,6 +116,11 @@ void DashClerk::serveOne(DashAsk const& ask, Outcome& outcome)
     }
     if (ask.topic == "sensors") {
         chooseSensors(ask.text);
+        outcome.sensors = true;
+        return;
+    }
+    if (ask.topic == "performance") {
+        m_desk.tell(DashAnswer{"performance", true, timeRuns(ask.text)});
         outcome.sensors = true;
         return;
     }
@@ -178,6 +186,30 @@ Json DashClerk::talk(std::string const& command)
     obd::IDevice::Status const status = m_car.session()->proxy()->execute(command, reply, consoleLimitMs);
     bool const answered = status == obd::IDevice::Status::Ok || !reply.empty();
     return {{"command", command}, {"answered", answered}, {"reply", readable(reply)}};
+}
+
+// Speed and engine speed alone are read for as long, so that they come as often as they can.
+Json DashClerk::timeRuns(std::string const& wish)
+{
+    if (wish != "begin") {
+        m_desk.runs().end();
+        m_car.readOnly({});
+        return "ended";
+    }
+    Session& session = *m_car.session();
+    for (std::shared_ptr<obd::IEcu> const& ecu : session.selectedModules()) {
+        auto const offers = [&](char const* sensor) {
+            return std::ranges::any_of(
+                m_offered, [&](SensorEntry const& each) { return each.module == ecu->id() && each.sensor == sensor; });
+        };
+        if (offers("SPEED") && offers("RPM")) {
+            m_desk.runs().begin(ecu, *session.obd().getSettings());
+            std::string const module = moduleText(ecu->id());
+            m_car.readOnly({module + ":SPEED", module + ":RPM"});
+            return "begun";
+        }
+    }
+    throw Error(ErrorKind::NotSupported, "No module tells both speed and engine speed");
 }
 
 void DashClerk::chooseSensors(std::string const& ids)

@@ -29,6 +29,7 @@ private:
     Json clear();
     Json talk(std::string const& command);
     void chooseSensors(std::string const& ids);
+    Json timeRuns(std::string const& wish);
 
     SessionCar& m_car;
     DashDesk& m_desk;

@@ -69,6 +69,7 @@ void DashDesk::hand(Member member, Value const& value)
 
 void DashDesk::tell(Reading const& reading)
 {
+    m_runs.take(reading);
     hand(&Listener::reading, reading);
 }
 

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "libvelmora/output/record.h"
+#include "libvelmora/performance/runboard.h"
 #include "libvelmora/report/json.h"
 
 #include <deque>
@@ -16,8 +17,9 @@ namespace velmora {
 // Something that a browser wants of the car.
 struct DashAsk
 {
-    std::string topic; // "codes", "readiness", "monitors", "info", "clear", "console", "sensors"
-    std::string text;  // of console the command, of sensors the wishes, a line each
+    std::string topic; // "codes", "readiness", "monitors", "info", "clear", "console", "sensors", "performance", "play"
+    std::string text;  // of console the command, of sensors the wishes, a line each, of performance "begin" or "end",
+                       // of play what PlayDesk::parse gives
 };
 
 // What came of it.
@@ -63,6 +65,9 @@ public:
     // False if too many wishes wait already. One that waits in the same words is not taken twice.
     bool ask(DashAsk ask);
     std::optional<DashAsk> next();
+    // The runs that are timed. They are fed by tell.
+    RunBoard& runs() { return m_runs; }
+
     // No wish is of use any more, as the vehicle is gone.
     void drop();
 
@@ -75,6 +80,7 @@ private:
     template <typename Member, typename Value>
     void hand(Member member, Value const& value);
 
+    RunBoard m_runs;
     std::mutex m_asksMutex;
     std::deque<DashAsk> m_asks; // protected by m_asksMutex
     std::mutex m_listenersMutex;

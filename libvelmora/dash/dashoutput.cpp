@@ -1,25 +1,22 @@
 #include "libvelmora/dash/dashoutput.h"
 
 #include "libvelmora/dash/dashpage.h"
+#include "libvelmora/dash/dashplace.h"
 
 #include <velmora/error.h>
 #include <velmora/version.h>
 
 #include <algorithm>
-#include <arpa/inet.h>
-#include <ifaddrs.h>
-#include <net/if.h>
 
 namespace velmora {
 
 namespace {
 
-constexpr char const* streamPath = "/events";
 constexpr char const* trafficPath = "/traffic";
 constexpr std::chrono::milliseconds beat{1000};
-constexpr std::size_t historyPoints = 600;
+constexpr std::chrono::seconds unseenLimit{30};
+constexpr std::chrono::milliseconds runsStep{250};
 constexpr std::size_t chartAtFirst = 6; // sensors whose history comes without being asked for
-constexpr std::size_t longestCommand = 200;
 
 HttpLimits dashLimits()
 {
@@ -29,83 +26,18 @@ HttpLimits dashLimits()
     return limits;
 }
 
-bool isSet(OutputAddress const& address, std::string const& key)
-{
-    std::string const value = address.option(key, "no");
-    if (value != "yes" && value != "no") {
-        throw Error(ErrorKind::WrongUse, key + ": \"" + value + "\" is neither yes nor no");
-    }
-    return value == "yes";
-}
-
-std::set<std::string> namesOf(std::string_view list)
-{
-    std::set<std::string> names;
-    while (!list.empty()) {
-        std::string_view const part = list.substr(0, list.find(','));
-        list.remove_prefix(std::min(part.size() + 1, list.size()));
-        std::optional<std::string> const name = hostNameIn(part);
-        if (!name || part.find(':') != std::string_view::npos) {
-            throw Error(ErrorKind::WrongUse, "\"" + std::string(part) + "\" is no name of a host");
-        }
-        names.insert(*name);
-    }
-    return names;
-}
-
-// An address by which others reach this machine, for a server that listens on all of them.
-std::string ownAddress()
-{
-    std::string result = "127.0.0.1";
-    ifaddrs* all = nullptr;
-    if (::getifaddrs(&all) != 0) {
-        return result;
-    }
-    for (ifaddrs const* each = all; each != nullptr; each = each->ifa_next) {
-        bool const usable = each->ifa_addr != nullptr && each->ifa_addr->sa_family == AF_INET &&
-                            (each->ifa_flags & IFF_LOOPBACK) == 0 && (each->ifa_flags & IFF_UP) != 0;
-        if (usable) {
-            char text[INET_ADDRSTRLEN] = {};
-            ::inet_ntop(AF_INET, &reinterpret_cast<sockaddr_in const*>(each->ifa_addr)->sin_addr, text, sizeof(text));
-            result = text;
-            break;
-        }
-    }
-    ::freeifaddrs(all);
-    return result;
-}
-
-std::string dumpedJson(Json const& value)
-{
-    return value.dump(-1, ' ', false, Json::error_handler_t::replace);
-}
-
-HttpResponse jsonResponse(Json const& value)
-{
-    HttpResponse response;
-    response.contentType = "application/json";
-    response.body = dumpedJson(value);
-    return response;
-}
-
 std::string tokenOf(DashContext const& context)
 {
     return context.token.empty() ? makeToken() : context.token;
-}
-
-bool isCommand(std::string const& text)
-{
-    return !text.empty() && text.size() <= longestCommand &&
-           std::ranges::all_of(text, [](unsigned char c) { return c >= ' ' && c < 0x7F; });
 }
 
 } // namespace
 
 DashOutput::DashOutput(OutputAddress const& address, DashContext context)
     : m_place(parseHttpPlace(address.target)), m_context(std::move(context)),
-      m_allowClear(isSet(address, "allow_clear")), m_allowConsole(isSet(address, "allow_console")),
+      m_allowClear(isAllowed(address, "allow_clear")), m_allowConsole(isAllowed(address, "allow_console")),
       m_access(isLoopback(m_place.host) && !m_allowClear && !m_allowConsole ? std::string() : tokenOf(m_context),
-               namesOf(address.option("name"))),
+               hostNamesOf(address.option("name"))),
       m_layouts(m_context.layouts), m_server(dashLimits())
 {
     addRoutes();
@@ -134,10 +66,14 @@ void DashOutput::addRoutes()
     addHandler("POST", "/login", [this](HttpRequest const& request) { return m_access.login(request); });
     addHandler("POST", "/ask", [this](HttpRequest const& request) { return takeAsk(request); });
     addHandler("POST", "/layout", [this](HttpRequest const& request) { return takeLayout(request); });
+    addHandler("GET", "/performance.json", [this](HttpRequest const& /*request*/) { return tellRuns(); });
     addHandler("GET", "/history", [this](HttpRequest const& request) { return tellHistory(request); });
     m_server.addStream(
         streamPath, [this](HttpRequest const& /*request*/) { return greeting(); },
-        [this](HttpRequest const& /*request*/) { return HttpServer::event("values", m_state.allValues()); });
+        [this](HttpRequest const& /*request*/) {
+            return HttpServer::event("values", m_state.allValues()) +
+                   HttpServer::event("performance", dumpedJson(m_context.desk->runs().state(false)));
+        });
     m_server.addStream(
         trafficPath, [this](HttpRequest const& /*request*/) { return HttpServer::event("lines", m_state.allLines()); });
 }
@@ -191,65 +127,29 @@ void DashOutput::write(Records records)
     if (std::string const lines = m_state.takeLines(); !lines.empty()) {
         m_server.publishLatest(trafficPath, HttpServer::event("lines", lines));
     }
+    publishRuns();
     auto const now = std::chrono::steady_clock::now();
     if (now - m_lastBeat >= beat) {
         m_lastBeat = now;
-        Json const text = beatJson(m_context.health(), std::chrono::system_clock::now());
-        m_server.publish(streamPath, HttpServer::event("beat", dumpedJson(text)));
+        m_server.publish(streamPath, HttpServer::event("beat", dumpedJson(beatNow())));
     }
 }
 
-HttpResponse DashOutput::takeAsk(HttpRequest const& request)
+// What nobody looks at any more is not worth reading two sensors only for.
+void DashOutput::publishRuns()
 {
-    static std::set<std::string> const topics = {"codes", "readiness", "monitors", "info", "clear", "console"};
-    Json const wish = Json::parse(request.body, nullptr, false);
-    bool const object = wish.is_object() && wish.contains("topic") && wish["topic"].is_string();
-    std::string const topic = object ? wish["topic"].get<std::string>() : "";
-    if (!topics.contains(topic)) {
-        return plainResponse(400, "This can't be asked");
+    RunBoard& runs = m_context.desk->runs();
+    auto const now = std::chrono::steady_clock::now();
+    if (now - m_lastRuns >= runsStep && runs.takeChange()) {
+        m_lastRuns = now;
+        m_server.publishLatest(streamPath, HttpServer::event("performance", dumpedJson(runs.state(false))));
     }
-    bool const clear = topic == "clear";
-    bool const console = topic == "console";
-    if ((clear && !m_allowClear) || (console && !m_allowConsole)) {
-        return plainResponse(403, "The program was started without leave for this");
+    if (m_server.readers() > 0 || !runs.isActive()) {
+        m_lastSeen = now;
+    } else if (now - m_lastSeen.load() > unseenLimit) {
+        m_lastSeen = now;
+        m_context.desk->ask({"performance", "end"});
     }
-    std::string const text =
-        console && wish.contains("text") && wish["text"].is_string() ? wish["text"].get<std::string>() : "";
-    bool const sure = wish.contains("sure") && wish["sure"] == true;
-    if ((console && !isCommand(text)) || (clear && !sure)) {
-        return plainResponse(400, console ? "This is no command" : "Clearing needs a yes");
-    }
-    HttpResponse accepted = plainResponse(202, "Asked");
-    return m_context.desk->ask({topic, text}) ? accepted : plainResponse(503, "Too much is being asked; try again");
-}
-
-HttpResponse DashOutput::takeLayout(HttpRequest const& request)
-{
-    std::string const vehicle = m_state.vehicleKey();
-    if (vehicle.empty()) {
-        return plainResponse(409, "No vehicle is known yet");
-    }
-    Json layout;
-    try {
-        layout = DashLayouts::parse(request.body);
-    } catch (Error const& error) {
-        return plainResponse(400, error.what());
-    }
-    m_layouts.save(vehicle, layout);
-    {
-        std::lock_guard const lock(m_layoutMutex);
-        m_layout = layout;
-    }
-    m_server.publish(streamPath, HttpServer::event("layout", dumpedJson(layout)));
-    wishSensors(layout);
-    HttpResponse done;
-    done.status = 204;
-    return done;
-}
-
-HttpResponse DashOutput::tellHistory(HttpRequest const& request) const
-{
-    return jsonResponse(m_state.history(request.query, historyPoints));
 }
 
 void DashOutput::wishSensors(Json const& layout)
@@ -287,6 +187,13 @@ void DashOutput::takeAnswer(DashAnswer const& answer)
     m_server.publish(streamPath, HttpServer::event("answer", dumpedJson(event)));
 }
 
+Json DashOutput::beatNow() const
+{
+    Json text = beatJson(m_context.health(), std::chrono::system_clock::now());
+    text["play"] = m_context.playState ? m_context.playState() : Json();
+    return text;
+}
+
 Json DashOutput::layout() const
 {
     std::lock_guard const lock(m_layoutMutex);
@@ -315,7 +222,8 @@ std::string DashOutput::greeting() const
                         {"history", histories},
                         {"news", m_state.news()},
                         {"answers", m_state.answers()},
-                        {"beat", beatJson(m_context.health(), std::chrono::system_clock::now())}};
+                        {"performance", m_context.desk->runs().state(false)},
+                        {"beat", beatNow()}};
     return "retry: 1000\n" + HttpServer::event("hello", dumpedJson(hello));
 }
 

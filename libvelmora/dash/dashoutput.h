@@ -8,6 +8,9 @@
 #include "libvelmora/output/ioutput.h"
 #include "libvelmora/output/outputaddress.h"
 
+#include <atomic>
+#include <chrono>
+
 namespace velmora {
 
 // What the page knows of the one that feeds it.
@@ -16,8 +19,9 @@ struct DashContext
     std::shared_ptr<DashDesk> desk;
     HealthSource health = [] { return Health(); };
     std::filesystem::path layouts;
-    std::string token;       // where one is needed; empty: made up
-    bool mustListen = false; // a port that can't be had ends all, rather than being tried again
+    std::function<Json()> playState; // where a recording is played; empty for a vehicle
+    std::string token;               // where one is needed; empty: made up
+    bool mustListen = false;         // a port that can't be had ends all, rather than being tried again
     // Where the page is, and what to know about it. Called by open.
     std::function<void(std::string const& link, std::string const& remark)> onLink = [](auto const&, auto const&) {};
 };
@@ -40,10 +44,18 @@ public:
     std::string link() const;
 
 private:
+    static constexpr std::size_t historyPoints = 600;
+    static constexpr char const* streamPath = "/events";
+
     void addRoutes();
     void addHandler(std::string const& method, std::string const& path, HttpHandler handler);
     void listen();
     HttpResponse takeAsk(HttpRequest const& request);
+    HttpResponse takePlay(Json const& wish);
+    Json beatNow() const;
+    HttpResponse takeRuns(Json const& wish);
+    HttpResponse tellRuns() const;
+    void publishRuns();
     HttpResponse takeLayout(HttpRequest const& request);
     HttpResponse tellHistory(HttpRequest const& request) const;
     void takeVehicle(DashVehicle const& vehicle);
@@ -62,6 +74,8 @@ private:
     mutable std::mutex m_layoutMutex;
     Json m_layout; // protected by m_layoutMutex
     std::chrono::steady_clock::time_point m_lastBeat;
+    std::chrono::steady_clock::time_point m_lastRuns;
+    std::atomic<std::chrono::steady_clock::time_point> m_lastSeen{}; // a reader, or the wish to time runs
     HttpServer m_server;
     std::shared_ptr<void> m_listening;
 };

@@ -1,5 +1,8 @@
 #include "libvelmora/http/httpserver.h"
+#include "libvelmora/replay/player.h"
+#include "libvelmora/replay/recordingfile.h"
 #include "program/command/commands.h"
+#include "program/command/dashplay.h"
 #include "program/command/watchcommand.h"
 #include "program/commandline.h"
 
@@ -15,18 +18,27 @@ struct DashOptions
     bool allowClear = false;
     bool allowConsole = false;
     std::vector<std::string> names;
+    std::string play; // a recording in the place of a vehicle
+    double speed = 1.0;
     WatchOptions watch;
 };
 
 // A watch with the page as its output. Whoever looks at the page wants to see a car with its engine off, too.
-ExitCode dash(GlobalOptions const& global, DashOptions const& chosen)
+ExitCode dash(GlobalOptions const& given, DashOptions const& chosen)
 {
+    GlobalOptions global = given;
     parseHttpPlace(chosen.listen);
     WatchOptions watch = chosen.watch;
     std::string address = fmt::format("dash:{}?allow_clear={}&allow_console={}", chosen.listen,
                                       chosen.allowClear ? "yes" : "no", chosen.allowConsole ? "yes" : "no");
     if (!chosen.names.empty()) {
         address += fmt::format("&name={}", fmt::join(chosen.names, ","));
+    }
+    if (!chosen.play.empty()) {
+        if (formOf(chosen.play) != RecordingForm::Dialogue) {
+            return playOnPage(global, parseOutputAddress(address), chosen.play, chosen.speed);
+        }
+        global.port = "replay:" + chosen.play; // a dialogue is a vehicle that is read as any other
     }
     watch.outputs.insert(watch.outputs.begin(), address);
     watch.page = true;
@@ -54,6 +66,15 @@ void addDashCommand(CommandLine& commandLine)
                      "0.0.0.0:8722, a browser needs the link with the token that is told; whoever is\n"
                      "in the network can read along, and a phone's screen can't be kept on")
         ->type_name("HOST:PORT");
+    CLI::Option* const play = command
+                                  ->add_option("--play", chosen->play,
+                                               "Play a recording in the place of a vehicle: a database of watch, CSV,\n"
+                                               "NDJSON, or a dialogue of record")
+                                  ->type_name("FILE");
+    command->add_option("--speed", chosen->speed, "How fast to play it, 1 is as it was")
+        ->type_name("X")
+        ->needs(play)
+        ->check(CLI::Range(RecordingPlayer::slowest, RecordingPlayer::fastest));
     command->add_flag("--allow-clear", chosen->allowClear, "Let the page clear trouble codes; needs the token");
     command->add_flag("--allow-console", chosen->allowConsole,
                       "Let the page talk to the adapter, which may upset the dialogue; needs the token");

@@ -52,4 +52,23 @@ TEST(Live, EndsQuietlyWhenItsReaderHasGone)
     EXPECT_EQ(told, "exit code 0\n");
 }
 
+// What live and watch have written, live reads again.
+TEST(Live, PlaysItsOwnRecordings)
+{
+    std::string const csv = testing::TempDir() + "velmora-live-play.csv";
+    Outcome const recorded =
+        runVelmora({"-q", "-p", "sim:petrol-can11?instant", "live", "RPM", "13", "--csv", csv, "-n", "3"});
+    ASSERT_EQ(recorded.exitCode, 0) << recorded.err;
+    Outcome const played = runVelmora({"live", "--play", csv});
+    EXPECT_EQ(played.exitCode, 0) << played.err;
+    EXPECT_EQ(played.out.substr(0, 12), "Engine RPM: ") << played.out;
+    EXPECT_NE(played.out.find("Location of Oxygen Sensors: B1S1, B1S2\n"), std::string::npos) << played.out;
+    Outcome const chosen = runVelmora({"--json", "live", "--play", csv, "rpm"});
+    EXPECT_EQ(chosen.out.find("Oxygen"), std::string::npos) << chosen.out;
+    EXPECT_GE(std::count(chosen.out.begin(), chosen.out.end(), '\n'), 3);
+    EXPECT_EQ(runVelmora({"live", "--play", csv, "nothing"}).exitCode, 6);
+    EXPECT_EQ(runVelmora({"live", "--play", "/nowhere/at/all"}).exitCode, 1);
+    std::remove(csv.c_str());
+}
+
 } // namespace

@@ -96,6 +96,18 @@ async function testViews(browser, link) {
   await waitFor(page, "document.getElementById('info').textContent.includes('VELMRAS1MM0000001')");
   await show(page, 'traffic');
   await waitFor(page, "/> 01 ?0C/.test(document.getElementById('trafficLines').textContent)");
+  await show(page, 'performance');
+  await page.click('#runs');
+  await waitFor(page, "/^[0-9]+ km.h, (standing|running|stand still)/.test(document.getElementById('runState').textContent)");
+  await waitFor(page, "/0 to 100 km.h/.test(document.getElementById('runResults').textContent)");
+  const run = await page.evaluate("fetch(document.getElementById('runExport').href).then((each) => each.json())");
+  assert.equal(run.weight_kg, 1500);
+  assert.ok(Array.isArray(run.speed) && run.active);
+  await show(page, 'traffic'); // nothing but the two is asked meanwhile
+  await waitFor(page, "(() => { const lines = document.getElementById('trafficLines').textContent.split('\\n').filter((line) => /> 01/.test(line)).slice(-12); return lines.length === 12 && lines.every((line) => /> 01 ?0[CD]/.test(line)); })()");
+  await show(page, 'performance');
+  await page.click('#runs');
+  await waitFor(page, "document.getElementById('runs').textContent === 'Time runs'");
   await show(page, 'chart');
   await waitFor(page, `document.getElementById('canvas').width > 300 && ${drawn} > 2000`);
   await waitFor(page, "document.getElementById('figures').rows.length === 4");
@@ -145,7 +157,7 @@ async function testLooks(page) {
     await page.setViewport(size);
     for (const scheme of ['light', 'dark']) {
       await page.emulateMediaFeatures([{ name: 'prefers-color-scheme', value: scheme }]);
-      for (const view of ['gauges', 'numbers', 'chart', 'codes', 'readiness', 'monitors', 'info', 'help']) {
+      for (const view of ['gauges', 'numbers', 'chart', 'codes', 'readiness', 'monitors', 'info', 'performance', 'help']) {
         if (name === 'screen' && view !== 'gauges' && view !== 'chart') continue;
         await show(page, view);
         await waitFor(page, status('Live'));
@@ -201,6 +213,33 @@ async function testCarStops(browser) {
   dash.child.kill('SIGTERM');
   car.kill('SIGTERM');
   await Promise.all([ended(dash.child), ended(car)]);
+}
+
+// A recording is played, held, and entered elsewhere.
+async function testPlay(browser) {
+  const file = path.join(folder, 'drive.csv');
+  const row = (_, i) => `2024-03-07T09:${String(Math.floor(i / 60)).padStart(2, '0')}:${String(i % 60).padStart(2, '0')}.000Z,${800 + i},${i % 120}`;
+  fs.writeFileSync(file, ['time,7E8 RPM (rpm),7E8 SPEED (km/h)', ...Array.from({ length: 600 }, row), ''].join('\n'));
+  const child = start(['dash', '--play', file, '--speed', '4', '--listen', '127.0.0.1:0']);
+  const page = await openPage(browser, await firstLine(child));
+  await waitFor(page, status('Live'));
+  await waitFor(page, "/^[0-9]+:[0-9]{2} of 9:59$/.test(document.getElementById('playTime').textContent)");
+  const number = "Number(document.querySelector('[data-id=\"7E8/RPM\"] .number').textContent)";
+  await waitFor(page, `${number} > 804`);
+  await page.click('#playPause');
+  await waitFor(page, status('The recording is paused'));
+  await page.evaluate(() => {
+    const place = document.getElementById('playPlace');
+    place.value = '300000';
+    place.dispatchEvent(new Event('change'));
+  });
+  await waitFor(page, `${number} === 1100`);
+  await page.screenshot({ path: path.join(pictures, 'gauges-play.png') });
+  await check(page, 'a recording');
+  assert.deepEqual(page.problems, []);
+  await page.close();
+  child.kill('SIGTERM');
+  await ended(child);
 }
 
 async function testDoors(browser) {
@@ -273,6 +312,7 @@ async function main() {
     await step('tells within 2 s that the program is gone', () => testProgramStops(page, dash));
   }
   await step('tells within 2 s that the car does not answer', () => testCarStops(browsers[0]));
+  await step('plays a recording', () => testPlay(browsers[0]));
   await step('lets in nobody without the token', () => testDoors(browsers[1]));
   clearTimeout(timer);
   for (const child of running) child.kill('SIGKILL');

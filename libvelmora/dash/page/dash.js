@@ -10,6 +10,8 @@ import * as codes from './codes.js';
 import * as topics from './topics.js';
 import * as traffic from './traffic.js';
 import * as picker from './picker.js';
+import * as player from './player.js';
+import * as performanceRuns from './performance.js';
 
 const textMs = 100; // between two redraws of texts
 const chartMs = 250; // and of the chart
@@ -49,6 +51,8 @@ function status() {
   if (program === 'gone') return ['bad', 'No connection to the program'];
   if (!beat) return ['wait', 'Connecting to the program'];
   if (beat.state === 'parked' || beat.state === 'settling') return ['warn', 'The car is parked: nothing is asked of it'];
+  if (player.isPaused()) return ['warn', 'The recording is paused'];
+  if (player.isOver()) return ['warn', 'The recording has ended'];
   if (!beat.link) return ['bad', `No link to the car${beat.trouble ? `: ${beat.trouble}` : ''}`];
   if (lastReading && performance.now() - lastReading > Math.max(1500, Math.min(6000, 5 * usualGap))) {
     return ['bad', 'The car does not answer'];
@@ -96,7 +100,9 @@ function takeHello(hello) {
   hello.history.forEach(store.takeHistory);
   codes.takeNews(hello.news);
   for (const answer of Object.values(hello.answers)) takeAnswer(answer);
+  if (hello.performance) performanceRuns.take(hello.performance);
   beat = hello.beat;
+  player.take(beat.play);
   layout.take(hello.layout);
   showView();
 }
@@ -105,6 +111,7 @@ function takeAnswer(answer) {
   if (answer.topic === 'codes') codes.takeAnswer(answer);
   else if (answer.topic === 'console') traffic.takeReply(answer);
   else if (answer.topic === 'clear') say(`Clearing: ${codes.takeCleared(answer)}`);
+  else if (answer.topic === 'performance') performanceRuns.takeAnswer(answer);
   else if (topics.isTopic(answer.topic)) topics.take(answer);
 }
 
@@ -157,10 +164,13 @@ async function start() {
   chart.start();
   codes.start();
   traffic.start();
+  performanceRuns.start();
+  player.start();
   layout.onLayout(() => {
     gauges.rebuild();
     numbers.rebuild();
     chart.rebuild();
+    performanceRuns.draw();
     drawTexts();
   });
   link.on('hello', takeHello);
@@ -168,12 +178,14 @@ async function start() {
   link.on('beat', (data) => {
     const up = !beat?.link && data.link;
     beat = data;
+    player.take(data.play);
     if (!data.link) lastReading = 0;
     if (up) showView();
   });
   link.on('news', codes.takeNews);
   link.on('layout', layout.take);
   link.on('answer', takeAnswer);
+  link.on('performance', performanceRuns.take);
   link.on('trouble', drawStatus);
   await link.login();
   link.open();

@@ -54,7 +54,7 @@ export function open() {
   refused = false;
   lastEvent = performance.now();
   source = new EventSource('/events');
-  for (const name of ['hello', 'values', 'beat', 'news', 'layout', 'answer']) {
+  for (const name of ['hello', 'values', 'beat', 'news', 'layout', 'answer', 'performance']) {
     source.addEventListener(name, (event) => take(name, event));
   }
   source.onerror = () => {

@@ -1,9 +1,16 @@
+#include "libobd/connection/velmorasettings.h"
 #include "libvelmora/dash/dashoutput.h"
+#include "libvelmora/dash/playdesk.h"
+#include "libvelmora/replay/recordingfile.h"
+#include "tests/support/fakeecu.h"
 #include "tests/support/httpclient.h"
+#include "tests/support/memorysettings.h"
 #include "tests/support/temporaryfolder.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
+
+#include <sstream>
 
 namespace {
 
@@ -283,6 +290,79 @@ TEST(DashState, ThinsAHistoryAndKeepsItsPeaks)
     EXPECT_THAT(history["v"], testing::Contains(9999.0));
     EXPECT_EQ(history["t"].back(), 299900);
     EXPECT_EQ(state.history("none", 200)["t"], Json::array());
+}
+
+TEST(DashOutput, TellsOfTimedRunsAndGivesThemAway)
+{
+    Page const page;
+    EXPECT_THAT(page.post("/ask", R"({"topic":"performance","text":"begin"})"), StartsWith("HTTP/1.1 202"));
+    EXPECT_THAT(page.post("/ask", R"({"topic":"performance","text":"sideways"})"), StartsWith("HTTP/1.1 400"));
+    EXPECT_EQ(page.desk->next()->text, "begin");
+    EXPECT_EQ(httpBody(page.get("/performance.json")), "null") << "nothing was timed";
+
+    auto const ecu = std::make_shared<support::FakeEcu>(0x7E8);
+    ecu->setSupported(obd::ObdMode::CurrentData, {0x0C, 0x0D});
+    obd::VelmoraSettings const settings(std::make_shared<support::MemorySettings>());
+    page.desk->runs().begin(ecu, settings);
+    HttpClient stream(page.output->port());
+    stream.send("GET /events HTTP/1.1\r\nHost: localhost\r\n\r\n");
+    EXPECT_EQ(nextEvent(stream, "hello")["performance"]["active"], true);
+    page.get("/");
+    for (unsigned char kmh = 0; kmh <= 130; ++kmh) {
+        Reading reading = dashReading("SPEED", kmh, 1000 + kmh * 100);
+        reading.raw = {0x41, 0x0D, kmh};
+        page.desk->tell(reading);
+        reading.module = 0x7E9; // another one's is not timed
+        page.desk->tell(reading);
+    }
+    page.output->write({});
+    Json const event = nextEvent(stream, "performance");
+    EXPECT_EQ(event["kmh"], 130);
+    EXPECT_EQ(event["goals"][0]["seconds"], 10.0);
+    EXPECT_EQ(event["goals"][1]["name"], "0 to 60 mph");
+    EXPECT_FALSE(event.contains("speed")) << "what nobody looks at is not sent each time";
+    std::string const file = page.get("/performance.json");
+    EXPECT_THAT(file, HasSubstr("Content-Disposition: attachment"));
+    EXPECT_EQ(Json::parse(httpBody(file))["speed"].size(), 131U);
+    page.desk->runs().end();
+    EXPECT_EQ(page.desk->runs().state(false)["active"], false);
+    EXPECT_EQ(page.desk->runs().state(false)["goals"][0]["seconds"], 10.0) << "it stays to be looked at";
+}
+
+TEST(DashPlay, TellsARecordingAsIfItCameNow)
+{
+    std::istringstream in("time,7E8 RPM (rpm),7E8 MAP (kPa)\n2024-03-07T09:05:00.000Z,800,30.5\n"
+                          "2024-03-07T09:05:01.000Z,900,31\n2024-03-07T09:05:09.000Z,1700,\n");
+    velmora::Recording const recording = velmora::readCsv(in);
+    velmora::PlayDesk play(recording, 2.0);
+    std::vector<std::string> told;
+    DashDesk::Listener listener;
+    listener.reading = [&told](Reading const& each) { told.push_back(each.sensor + " " + valueText(each)); };
+    listener.line = [](velmora::DashLine const&) {};
+    listener.answer = [&told](velmora::DashAnswer const& each) { told.push_back(each.topic); };
+    listener.vehicle = [&](velmora::DashVehicle const& each) {
+        told.push_back(each.offered.at(1).sensor + " " + play.state()["speed"].dump());
+    };
+    auto const listening = play.desk()->listen(listener);
+    auto const step = [&](double seconds) {
+        told.clear();
+        play.step(seconds);
+        return told;
+    };
+    play.introduce();
+    EXPECT_EQ(told, std::vector<std::string>{"MAP 2.0"});
+    EXPECT_EQ(step(0.1), (std::vector<std::string>{"RPM 800", "MAP 30.5"}));
+    EXPECT_EQ(step(0.5), (std::vector<std::string>{"RPM 900", "MAP 31.0"}));
+    play.desk()->ask({"play", velmora::PlayDesk::parse({{"paused", true}, {"other", 1}}).dump()});
+    EXPECT_TRUE(step(100.0).empty());
+    EXPECT_EQ(play.state()["paused"], true);
+    play.desk()->ask({"play", velmora::PlayDesk::parse({{"position", 1e300}}).dump()});
+    EXPECT_EQ(step(0.0), (std::vector<std::string>{"RPM 1700", "MAP 31.0"})) << "what stands there";
+    EXPECT_EQ(play.state()["position"], recording.end);
+    play.desk()->ask({"codes", ""});
+    EXPECT_EQ(step(0.0), std::vector<std::string>{"codes"}) << "there is no vehicle to ask";
+    EXPECT_TRUE(velmora::PlayDesk::parse({{"speed", "fast"}}).is_null());
+    EXPECT_THAT(Page().post("/ask", R"({"topic":"play","paused":true})"), StartsWith("HTTP/1.1 400"));
 }
 
 } // namespace
