@@ -1,4 +1,4 @@
-// Reading a signal file of 10,000 signals, as `velmora signals check` does, and evaluating one formula.
+// Reading signal files of 10,000 signals, as `velmora signals check` does, and evaluating one formula.
 
 #include "libvelmora/signal/formulaparser.h"
 #include "libvelmora/signal/signalfile.h"
@@ -21,9 +21,21 @@ std::string signalText(int count)
     return text;
 }
 
-void checkFile(benchmark::State& state)
+// Each reads the two before it.
+std::string referringText(int count)
 {
-    std::string const text = signalText(static_cast<int>(state.range(0)));
+    std::string text = signalText(2);
+    for (int i = 2; i < count; ++i) {
+        std::string const number = std::to_string(i);
+        text += "[[signal]]\nid = \"CELL_" + number + "\"\nname = \"Sum up to cell " + number +
+                "\"\nformula = \"value(\\\"CELL_" + std::to_string(i - 1) + "\\\") + value(\\\"CELL_" +
+                std::to_string(i - 2) + "\\\")\"\nunit = \"V\"\n\n";
+    }
+    return text;
+}
+
+void check(benchmark::State& state, std::string const& text)
+{
     for (auto _ : state) {
         velmora::SignalFileReading const reading = velmora::readSignals(text, "cells.toml");
         if (reading.file.signals.size() != static_cast<std::size_t>(state.range(0))) {
@@ -31,6 +43,16 @@ void checkFile(benchmark::State& state)
         }
     }
 }
+void checkFile(benchmark::State& state)
+{
+    check(state, signalText(static_cast<int>(state.range(0))));
+}
+
+void checkReferringFile(benchmark::State& state)
+{
+    check(state, referringText(static_cast<int>(state.range(0))));
+}
+BENCHMARK(checkReferringFile)->Arg(10000)->Unit(benchmark::kMillisecond);
 BENCHMARK(checkFile)->Arg(10000)->Unit(benchmark::kMillisecond);
 
 void evaluateFormula(benchmark::State& state)

@@ -3,26 +3,32 @@
 #include "libvelmora/signal/jsonsource.h"
 #include "libvelmora/signal/signalhex.h"
 
-#include <algorithm>
-
 namespace velmora {
 
 namespace {
 
 using nlohmann::json;
 
-// Commands that leave the adapter printing whole frames, so that equations count other bytes.
-bool printsWholeFrames(json const& document)
+// What the adapter is told before and between the requests, as far as it matters here.
+struct AbrpSetup
 {
+    bool wholeFrames = false; // it is left printing whole frames, so that equations count other bytes
+    std::string session;      // that is opened
+};
+
+AbrpSetup setupOf(json const& document)
+{
+    AbrpSetup setup;
     for (char const* const group : {"init_commands", "data_commands"}) {
         json const& commands = memberOf(memberOf(document, group), "command");
         for (json const& command : commands) {
-            if (command.is_string() && command.get<std::string>().find("CAF0") != std::string::npos) {
-                return true;
-            }
+            std::string const text = command.is_string() ? command.get<std::string>() : std::string();
+            std::string const digits = hexDigits(text).value_or(std::string());
+            setup.wholeFrames = setup.wholeFrames || text.find("CAF0") != std::string::npos;
+            setup.session = digits.size() == 4 && digits.starts_with("10") ? digits : setup.session;
         }
     }
-    return false;
+    return setup;
 }
 
 class AbrpImporter
@@ -32,13 +38,13 @@ public:
 
     SignalImport import(json const& document)
     {
-        bool const wholeFrames = printsWholeFrames(document);
+        m_setup = setupOf(document);
         for (auto const& [name, entry] : document.items()) {
             ++m_number;
             if (memberOf(entry, "equation").is_null()) {
                 continue;
             }
-            if (wholeFrames) {
+            if (m_setup.wholeFrames) {
                 m_collector.refuse(m_number, name, "its file asks with whole frames (CAF0), which count other bytes");
             } else {
                 read(name, entry);
@@ -69,6 +75,10 @@ private:
             return m_collector.refuse(m_number, name, std::string("equation: ") + error.what());
         }
         readRange(signal, entry);
+        if (!m_setup.session.empty()) {
+            signal.enabled = false;
+            signal.reason = "needs session " + m_setup.session + ", which is not opened";
+        }
         signal.id = m_collector.newId(name);
         if (!signal.reason.empty()) {
             m_collector.note(m_number, name, signal.reason);
@@ -90,6 +100,7 @@ private:
     }
 
     ImportCollector m_collector;
+    AbrpSetup m_setup;
     std::size_t m_number = 0; // of the key, in the place of a line
 };
 

@@ -1,3 +1,4 @@
+#include "libvelmora/signal/csvcolumns.h"
 #include "libvelmora/signal/csvtable.h"
 #include "libvelmora/signal/formulaparser.h"
 #include "libvelmora/signal/importedrow.h"
@@ -9,113 +10,28 @@
 
 #include <algorithm>
 #include <array>
-#include <cctype>
-#include <charconv>
 
 namespace velmora {
 
 namespace {
-
-enum Column : std::size_t
-{
-    Name,
-    ShortName,
-    Request,
-    Equation,
-    Min,
-    Max,
-    Unit,
-    Header,
-    StartDiagnostic,
-    StopDiagnostic,
-    Scale,
-    RefreshDelay,
-    ColumnCount,
-};
-
-// By their names without blanks, in lower case.
-std::optional<std::size_t> columnOf(std::string name)
-{
-    static constexpr std::pair<std::string_view, Column> names[] = {
-        {"name", Name},
-        {"shortname", ShortName},
-        {"modeandpid", Request},
-        {"equation", Equation},
-        {"minvalue", Min},
-        {"maxvalue", Max},
-        {"units", Unit},
-        {"header", Header},
-        {"obdheader", Header},
-        {"startdiagnostic", StartDiagnostic},
-        {"stopdiagnostic", StopDiagnostic},
-        {"scale", Scale},
-        {"minimumrefreshdelaymillis", RefreshDelay},
-    };
-    std::erase(name, ' ');
-    std::transform(name.begin(), name.end(), name.begin(),
-                   [](unsigned char each) { return static_cast<char>(std::tolower(each)); });
-    for (auto const& [known, column] : names) {
-        if (name == known) {
-            return column;
-        }
-    }
-    return std::nullopt;
-}
-
-std::string trimmed(std::string const& text)
-{
-    constexpr char const* blanks = " \t";
-    std::size_t const first = text.find_first_not_of(blanks);
-    return first == std::string::npos ? "" : text.substr(first, text.find_last_not_of(blanks) - first + 1);
-}
-
-bool isHeading(CsvRecord const& record)
-{
-    return record.cells.size() >= 3 && columnOf(trimmed(record.cells[0])) == Name &&
-           std::any_of(record.cells.begin(), record.cells.end(),
-                       [](std::string const& cell) { return columnOf(trimmed(cell)) == Request; });
-}
-
-bool isComment(CsvRecord const& record)
-{
-    std::string const first = trimmed(record.cells.front());
-    return first.starts_with('~') || first.starts_with('#');
-}
-
-// Without 0x and blanks, in capitals; nothing if it is not hexadecimal.
-std::optional<std::string> requestDigits(std::string const& cell)
-{
-    std::string text = trimmed(cell);
-    if (text.starts_with("0x") || text.starts_with("0X")) {
-        text = text.substr(2);
-    }
-    return hexDigits(text);
-}
-
-std::optional<double> numberIn(std::string const& cell)
-{
-    double number = 0.0;
-    auto const [end, error] = std::from_chars(cell.data(), cell.data() + cell.size(), number);
-    return error == std::errc() && end == cell.data() + cell.size() ? std::optional(number) : std::nullopt;
-}
 
 class CsvImporter
 {
 public:
     explicit CsvImporter(std::string const& path) : m_collector(path)
     {
-        for (std::size_t i = 0; i < Header + 1; ++i) {
-            m_order.push_back(static_cast<Column>(i));
+        for (std::size_t i = 0; i <= CsvColumn::Header; ++i) {
+            m_order.push_back(i);
         }
     }
 
     SignalImport import(std::vector<CsvRecord> const& records)
     {
         for (CsvRecord const& record : records) {
-            if (isComment(record)) {
+            if (isCsvComment(record)) {
                 continue;
             }
-            if (isHeading(record)) {
+            if (isCsvHeading(record)) {
                 readHeading(record);
             } else {
                 readRow(record);
@@ -127,15 +43,15 @@ public:
     void noteEncoding() { m_collector.note(1, {}, "is no UTF-8; it was read as ISO 8859-1"); }
 
 private:
-    using Cells = std::array<std::string, ColumnCount>;
+    using Cells = std::array<std::string, CsvColumnCount>;
 
     void readHeading(CsvRecord const& record)
     {
         m_order.clear();
         for (std::string const& cell : record.cells) {
-            auto const column = columnOf(trimmed(cell));
-            if (!column && !trimmed(cell).empty()) {
-                m_collector.note(record.line, "column " + trimmed(cell), "is not known and was left out");
+            auto const column = csvColumn(trimmedCell(cell));
+            if (!column && !trimmedCell(cell).empty()) {
+                m_collector.note(record.line, "column " + trimmedCell(cell), "is not known and was left out");
             }
             m_order.push_back(column);
         }
@@ -146,14 +62,14 @@ private:
         Cells cells;
         for (std::size_t i = 0; i < std::min(m_order.size(), record.cells.size()); ++i) {
             if (m_order[i]) {
-                cells[*m_order[i]] = trimmed(record.cells[i]);
+                cells[*m_order[i]] = trimmedCell(record.cells[i]);
             }
         }
         if (std::all_of(cells.begin(), cells.end(), [](std::string const& cell) { return cell.empty(); })) {
             return;
         }
         m_line = record.line;
-        m_name = cells[Name];
+        m_name = cells[CsvColumn::Name];
         if (auto signal = read(cells)) {
             m_collector.add(m_line, std::move(*signal));
         }
@@ -172,19 +88,19 @@ private:
         }
         Signal signal;
         signal.name = m_name;
-        if (!readRequest(signal, cells[Request]) || !readEquation(signal, cells)) {
+        if (!readRequest(signal, cells[CsvColumn::Request]) || !readEquation(signal, cells)) {
             return std::nullopt;
         }
-        if (!fillAddresses(signal, cells[Header])) {
-            return refuse("header \"" + cells[Header] + "\" is none whose reply could be told");
+        if (!fillAddresses(signal, cells[CsvColumn::Header])) {
+            return refuse("header \"" + cells[CsvColumn::Header] + "\" is none whose reply could be told");
         }
         readRange(signal, cells);
-        signal.unit = knownUnit(cells[Unit]);
-        if (!cells[StartDiagnostic].empty()) {
+        signal.unit = knownUnit(cells[CsvColumn::Unit]);
+        if (!cells[CsvColumn::StartDiagnostic].empty()) {
             signal.enabled = false;
-            signal.reason = "needs session " + cells[StartDiagnostic] + ", which is not opened";
+            signal.reason = "needs session " + cells[CsvColumn::StartDiagnostic] + ", which is not opened";
         }
-        if (auto const delay = numberIn(cells[RefreshDelay]); delay && *delay > 0.0) {
+        if (auto const delay = numberCell(cells[CsvColumn::RefreshDelay]); delay && *delay > 0.0) {
             signal.rate = 1000.0 / *delay;
         }
         if (!signal.reason.empty()) {
@@ -196,7 +112,7 @@ private:
 
     bool readRequest(Signal& signal, std::string const& cell)
     {
-        auto digits = requestDigits(cell);
+        auto digits = requestCell(cell);
         if (!digits) {
             refuse("request \"" + cell + "\" is not hexadecimal");
             return false;
@@ -218,14 +134,14 @@ private:
     bool readEquation(Signal& signal, Cells const& cells)
     {
         try {
-            readLookup(signal, cells[Equation]);
+            readLookup(signal, cells[CsvColumn::Equation]);
             if (signal.request.empty() && bytesReadBy(*signal.formula) > 0) {
                 refuse("it reads bytes, but has no request");
                 return false;
             }
-            return readOthers(signal, cells[Equation]) && scale(signal, cells[Scale]);
+            return readOthers(signal, cells[CsvColumn::Equation]) && scale(signal, cells[CsvColumn::Scale]);
         } catch (FormulaError const& error) {
-            refuse("equation \"" + cells[Equation] + "\": " + error.what() + " (at character " +
+            refuse("equation \"" + cells[CsvColumn::Equation] + "\": " + error.what() + " (at character " +
                    std::to_string(error.position() + 1) + ")");
             return false;
         }
@@ -268,7 +184,7 @@ private:
         if (cell.empty() || cell == "1") {
             return true;
         }
-        auto const factor = numberIn(cell);
+        auto const factor = numberCell(cell);
         if (!factor) {
             refuse("scale \"" + cell + "\" is no number");
             return false;
@@ -281,8 +197,8 @@ private:
     // Such files often have them swapped, or the same number twice.
     void readRange(Signal& signal, Cells const& cells)
     {
-        auto const min = numberIn(cells[Min]);
-        auto const max = numberIn(cells[Max]);
+        auto const min = numberCell(cells[CsvColumn::Min]);
+        auto const max = numberCell(cells[CsvColumn::Max]);
         if (!min || !max || *min == *max) {
             return;
         }
@@ -299,13 +215,6 @@ private:
     std::string m_name;
 };
 
-// A spreadsheet in a country of decimal commas writes another form, in which A*0,5 can't be told from two cells.
-bool looksLikeSemicolons(std::string_view text)
-{
-    std::string_view const first = text.substr(0, text.find('\n'));
-    return std::count(first.begin(), first.end(), ';') >= 3 && std::count(first.begin(), first.end(), ',') < 3;
-}
-
 } // namespace
 
 SignalImport importSignalCsv(std::string_view text, std::string const& path)
@@ -313,7 +222,7 @@ SignalImport importSignalCsv(std::string_view text, std::string const& path)
     if (text.starts_with("\xEF\xBB\xBF")) {
         text.remove_prefix(3);
     }
-    if (looksLikeSemicolons(text)) {
+    if (isSemicolonTable(text)) {
         throw Error(ErrorKind::WrongUse, path + " is separated by semicolons, as spreadsheets write it",
                     {"save it separated by commas and with decimal points"});
     }

@@ -1,6 +1,6 @@
 #include "libvelmora/signal/formulaparser.h"
 
-#include "libvelmora/signal/formulalexer.h"
+#include "libvelmora/signal/formulacursor.h"
 #include "libvelmora/signal/formulawords.h"
 
 #include <algorithm>
@@ -21,70 +21,35 @@ std::string inCase(std::string text, int (*convert)(int))
     return text;
 }
 
-// The index of a byte's name in capitals, or nothing.
-std::optional<double> byteIndex(std::string const& name)
-{
-    auto const isCapital = [](char each) { return each >= 'A' && each <= 'Z'; };
-    if (name.empty() || name.size() > 2 || !std::all_of(name.begin(), name.end(), isCapital)) {
-        return std::nullopt;
-    }
-    int const last = name.back() - 'A';
-    return name.size() == 1 ? last : (name.front() - 'A' + 1) * 26 + last;
-}
-
 FormulaNode numberNode(double number)
 {
     return {FormulaStep::Number, number, {}, {}};
 }
 
-class FormulaReader
+class FormulaReader : private FormulaCursor
 {
 public:
     FormulaReader(std::string_view text, FormulaDialect dialect)
-        : m_lexer(text), m_phone(dialect == FormulaDialect::Phone)
-    {
-        advance();
-    }
+        : FormulaCursor(text), m_phone(dialect == FormulaDialect::Phone)
+    {}
 
     FormulaNode read()
     {
         FormulaNode formula = binary(lowestLevel, 0);
-        if (m_token.kind != FormulaToken::Kind::End) {
-            fail("\"" + m_token.text + "\" is left over");
+        if (token().kind != FormulaToken::Kind::End) {
+            fail("\"" + token().text + "\" is left over");
         }
         return formula;
     }
 
 private:
-    [[noreturn]] void fail(std::string const& why) const { throw FormulaError(why, m_token.position); }
-
-    void advance() { m_token = m_lexer.next(); }
-
-    bool at(std::string_view sign) const { return m_token.kind == FormulaToken::Kind::Sign && m_token.text == sign; }
-
-    bool pass(std::string_view sign)
-    {
-        bool const here = at(sign);
-        if (here) {
-            advance();
-        }
-        return here;
-    }
-
-    void demand(std::string_view sign)
-    {
-        if (!pass(sign)) {
-            fail("a \"" + std::string(sign) + "\" is missing here");
-        }
-    }
-
     // The operator at hand, in the meaning of the dialect; null if there is none.
     FormulaOperator const* operatorHere() const
     {
-        if (m_token.kind != FormulaToken::Kind::Sign) {
+        if (token().kind != FormulaToken::Kind::Sign) {
             return nullptr;
         }
-        FormulaOperator const* const found = findOperator(m_token.text);
+        FormulaOperator const* const found = findOperator(token().text);
         if (!m_phone || found == nullptr) {
             return found;
         }
@@ -103,8 +68,8 @@ private:
         if (!m_shiftByLess) {
             return;
         }
-        bool const places = m_token.kind == FormulaToken::Kind::Number &&
-                            (m_token.number == 8 || m_token.number == 16 || m_token.number == 24);
+        bool const places = token().kind == FormulaToken::Kind::Number &&
+                            (token().number == 8 || token().number == 16 || token().number == 24);
         if (!places || (left.step != FormulaStep::Byte && !m_bracketed)) {
             fail("\"<\" is read as a shift only of a byte or a bracket, by 8, 16 or 24");
         }
@@ -175,12 +140,12 @@ private:
     FormulaNode primary(std::size_t depth)
     {
         m_bracketed = false;
-        if (m_token.kind == FormulaToken::Kind::Number) {
-            FormulaNode const node = numberNode(m_token.number);
+        if (token().kind == FormulaToken::Kind::Number) {
+            FormulaNode const node = numberNode(token().number);
             advance();
             return node;
         }
-        if (m_token.kind == FormulaToken::Kind::Word) {
+        if (token().kind == FormulaToken::Kind::Word) {
             return word(depth);
         }
         if (pass("(")) {
@@ -194,18 +159,18 @@ private:
             return checkedCount(std::move(bit), 2, 2);
         }
         if (m_phone && at("[")) {
-            return otherPid();
+            return readOtherPid(*this);
         }
-        fail(m_token.kind == FormulaToken::Kind::End ? "the formula ends too early"
-                                                     : "\"" + m_token.text + "\" stands in the wrong place");
+        fail(token().kind == FormulaToken::Kind::End ? "the formula ends too early"
+                                                     : "\"" + token().text + "\" stands in the wrong place");
     }
 
     FormulaNode word(std::size_t depth)
     {
-        FormulaToken const name = m_token;
+        FormulaToken const name = token();
         std::string const lower = inCase(name.text, std::tolower);
         if (lower == (m_phone ? "val" : "value")) {
-            return value();
+            return readValue(*this, m_phone);
         }
         advance();
         if (at("(")) {
@@ -215,50 +180,7 @@ private:
         if (!index) {
             throw FormulaError("\"" + name.text + "\" is no byte (A to ZZ) and no function", name.position);
         }
-        return {FormulaStep::Byte, *index, {}, {}};
-    }
-
-    // value("NAME") in our grammar, val{Name} in the phones'.
-    FormulaNode value()
-    {
-        advance();
-        FormulaToken name;
-        if (m_phone) {
-            name = named("{", '}');
-        } else {
-            if (!at("(")) {
-                fail("value wants a name: value(\"NAME\")");
-            }
-            advance();
-            name = named("\"", '"');
-            demand(")");
-        }
-        return {FormulaStep::Value, 0.0, name.text, {}};
-    }
-
-    // [0d]: the value of a standard PID. From ff upward they are sensors of the phone itself.
-    FormulaNode otherPid()
-    {
-        FormulaToken const name = named("[", ']');
-        std::string const digits = inCase(name.text, std::toupper);
-        bool const hexadecimal = digits.find_first_not_of("0123456789ABCDEF") == std::string::npos;
-        if (!hexadecimal || digits.size() != 2 || digits == "FF") {
-            throw FormulaError("[" + name.text + "] is no standard PID", name.position);
-        }
-        return {FormulaStep::Value, 0.0, "[" + digits + "]", {}};
-    }
-
-    FormulaToken named(std::string_view opening, char closing)
-    {
-        if (!at(opening)) {
-            fail("a name behind \"" + std::string(opening) + "\" is missing here");
-        }
-        FormulaToken const name = m_lexer.nameUntil(closing);
-        if (name.text.empty()) {
-            fail("the name is empty");
-        }
-        advance();
-        return name;
+        return {FormulaStep::Byte, static_cast<double>(*index), {}, {}};
     }
 
     FormulaNode call(FormulaToken const& name, std::string const& function, std::size_t depth)
@@ -303,9 +225,7 @@ private:
         return list;
     }
 
-    FormulaLexer m_lexer;
     bool m_phone;
-    FormulaToken m_token;
     bool m_bracketed = false;   // the last operand stood in brackets
     bool m_shiftByLess = false; // the operator just passed was a single '<'
     std::size_t m_steps = 0;

@@ -20,6 +20,7 @@ constexpr FormulaOperator operators[] = {
 };
 
 constexpr std::size_t many = 8;
+constexpr std::size_t lettersOfBytes = 26;
 
 constexpr FormulaFunction functions[] = {
     {"bit", FormulaStep::Bit, 2, 2},
@@ -81,9 +82,18 @@ FormulaFunction const* findFunction(std::string_view name)
 
 std::string byteName(std::size_t index)
 {
-    constexpr std::size_t letters = 26;
-    std::string const last(1, static_cast<char>('A' + index % letters));
-    return index < letters ? last : static_cast<char>('A' + index / letters - 1) + last;
+    std::string const last(1, static_cast<char>('A' + index % lettersOfBytes));
+    return index < lettersOfBytes ? last : static_cast<char>('A' + index / lettersOfBytes - 1) + last;
+}
+
+std::optional<std::size_t> byteIndex(std::string_view name)
+{
+    auto const isCapital = [](char each) { return each >= 'A' && each <= 'Z'; };
+    if (name.empty() || name.size() > 2 || !std::all_of(name.begin(), name.end(), isCapital)) {
+        return std::nullopt;
+    }
+    auto const last = static_cast<std::size_t>(name.back() - 'A');
+    return name.size() == 1 ? last : static_cast<std::size_t>(name.front() - 'A' + 1) * lettersOfBytes + last;
 }
 
 } // namespace velmora

@@ -3,6 +3,7 @@
 #include "libvelmora/signal/formula.h"
 
 #include <cstddef>
+#include <optional>
 #include <span>
 #include <string>
 #include <string_view>
@@ -44,5 +45,7 @@ FormulaFunction const* findFunction(std::string_view name);
 
 // "A" is 0, "Z" 25, "AA" 26, "ZZ" 701: the name of a byte of the reply.
 std::string byteName(std::size_t index);
+// Back again; nothing if it is no such name.
+std::optional<std::size_t> byteIndex(std::string_view name);
 
 } // namespace velmora

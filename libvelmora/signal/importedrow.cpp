@@ -1,9 +1,11 @@
 #include "libvelmora/signal/importedrow.h"
 
 #include "libvelmora/signal/signalhex.h"
+#include "libvelmora/signal/signalreferences.h"
 
 #include <algorithm>
 #include <cctype>
+#include <utility>
 
 namespace velmora {
 
@@ -77,28 +79,22 @@ void ImportCollector::add(std::size_t line, Signal signal)
     m_import.file.signals.push_back(std::move(signal));
 }
 
-// One that goes may take those with it that read it; true if any went.
-bool ImportCollector::dropUnresolved()
+// One that goes takes those with it that read it.
+void ImportCollector::dropUnresolved()
 {
-    std::set<std::string> here;
-    for (Signal const& signal : m_import.file.signals) {
-        here.insert(signal.id);
-    }
     std::vector<Signal>& signals = m_import.file.signals;
+    std::vector<Signal> kept;
+    std::vector<std::size_t> const broken = brokenReferences(signals);
+    auto next = broken.begin();
     for (std::size_t i = 0; i < signals.size(); ++i) {
-        std::vector<std::string> const names =
-            signals[i].formula ? valuesReadBy(*signals[i].formula) : std::vector<std::string>();
-        bool const whole = std::all_of(names.begin(), names.end(), [&](std::string const& name) {
-            return here.contains(name) && name != signals[i].id;
-        });
-        if (!whole) {
-            refuse(m_lines[i], signals[i].name, "its formula reads a value that is not in this file");
-            signals.erase(signals.begin() + static_cast<std::ptrdiff_t>(i));
-            m_lines.erase(m_lines.begin() + static_cast<std::ptrdiff_t>(i));
-            return true;
+        if (next != broken.end() && *next == i) {
+            refuse(m_lines[i], signals[i].name, "its formula reads a value that is not in this file, or its own");
+            ++next;
+        } else {
+            kept.push_back(std::move(signals[i]));
         }
     }
-    return false;
+    signals = std::move(kept);
 }
 
 SignalImport ImportCollector::finish()
@@ -108,8 +104,7 @@ SignalImport ImportCollector::finish()
             renameValues(*signal.formula, m_idOf);
         }
     }
-    while (dropUnresolved()) {
-    }
+    dropUnresolved();
     auto const byLine = [](SignalMistake const& left, SignalMistake const& right) { return left.line < right.line; };
     std::stable_sort(m_import.refused.begin(), m_import.refused.end(), byLine);
     return std::move(m_import);
@@ -122,14 +117,14 @@ bool fillAddresses(Signal& signal, std::string const& header)
         return false;
     }
     signal.header = *digits;
-    if (digits->empty() || standardReply(*digits)) {
+    if (digits->empty() || isFunctionalHeader(*digits) || standardReply(*digits)) {
         return true;
     }
     if (digits->size() == 3) {
         auto const reply = eightAbove(*digits);
         signal.reply = reply.value_or("");
-    } else if (digits->size() == 6 && digits->ends_with("F1")) {
-        signal.reply = digits->substr(0, 2) + "F1" + digits->substr(2, 2); // receiver and sender change places
+    } else {
+        signal.reply = swappedReply(*digits).value_or("");
     }
     signal.reason = assumedReply;
     return !signal.reply.empty();

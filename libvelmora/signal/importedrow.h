@@ -28,7 +28,7 @@ public:
     SignalImport finish();
 
 private:
-    bool dropUnresolved();
+    void dropUnresolved();
 
     SignalImport m_import;
     std::vector<std::size_t> m_lines;          // of the signals

@@ -1,8 +1,7 @@
+#include "libvelmora/signal/bitfield.h"
 #include "libvelmora/signal/importedrow.h"
 #include "libvelmora/signal/jsonsource.h"
 #include "libvelmora/signal/signalhex.h"
-
-#include <fmt/format.h>
 
 #include <cmath>
 
@@ -11,70 +10,6 @@ namespace velmora {
 namespace {
 
 using nlohmann::json;
-
-FormulaNode leafNumber(double number)
-{
-    return {FormulaStep::Number, number, {}, {}};
-}
-
-FormulaNode combine(FormulaStep step, FormulaNode left, FormulaNode right)
-{
-    return {step, 0.0, {}, {std::move(left), std::move(right)}};
-}
-
-constexpr std::size_t mostBits = 48; // beyond, a double does not hold each whole number
-
-// Where the raw value stands among the bits of the data, 0 being the highest of its first byte.
-struct BitField
-{
-    std::size_t first = 0;
-    std::size_t length = 0;
-    bool littleEndian = false;
-    bool isSigned = false;
-};
-
-// The whole bytes that hold the field, as one number.
-FormulaNode bytesOf(BitField const& field)
-{
-    std::size_t const begin = field.first / 8;
-    std::size_t const end = (field.first + field.length + 7) / 8;
-    FormulaNode number;
-    for (std::size_t i = 0; i < end - begin; ++i) {
-        std::size_t const byte = field.littleEndian ? end - 1 - i : begin + i;
-        FormulaNode next{FormulaStep::Byte, static_cast<double>(byte), {}, {}};
-        number = i == 0 ? next
-                        : combine(FormulaStep::Add, combine(FormulaStep::Multiply, std::move(number), leafNumber(256)),
-                                  std::move(next));
-    }
-    return number;
-}
-
-FormulaNode rawOf(BitField const& field)
-{
-    FormulaNode raw = bytesOf(field);
-    std::size_t const behind = (8 - (field.first + field.length) % 8) % 8;
-    if (behind != 0) {
-        raw = combine(FormulaStep::ShiftRight, std::move(raw), leafNumber(static_cast<double>(behind)));
-    }
-    if (field.length % 8 != 0 || field.first % 8 != 0) {
-        raw =
-            combine(FormulaStep::And, std::move(raw), leafNumber(std::ldexp(1.0, static_cast<int>(field.length)) - 1));
-    }
-    return field.isSigned ? combine(FormulaStep::Signed, std::move(raw), leafNumber(static_cast<double>(field.length)))
-                          : raw;
-}
-
-// Why the field can't be read, or nothing.
-std::optional<std::string> wrongField(BitField const& field)
-{
-    if (field.length == 0 || field.length > mostBits || (field.isSigned && field.length > 32)) {
-        return fmt::format("a field of {} bits has no form here", field.length);
-    }
-    if (field.littleEndian && (field.first % 8 != 0 || field.length % 8 != 0)) {
-        return std::string("a field with its lowest byte first must consist of whole bytes");
-    }
-    return std::nullopt;
-}
 
 class ObdbImporter
 {
@@ -170,8 +105,10 @@ private:
             signal.rate = 1.0 / *pause;
         }
         if (!memberOf(command, "din").is_null()) {
+            std::string const session = textOf(command, "din");
             signal.enabled = false;
-            signal.reason = "needs a session of its own, which is not opened";
+            signal.reason =
+                "needs " + (session.empty() ? "a session of its own" : "session " + session) + ", which is not opened";
         }
         return {};
     }

@@ -4,6 +4,8 @@
 #include "libvelmora/signal/signalhex.h"
 
 #include <algorithm>
+#include <iterator>
+#include <string_view>
 
 namespace velmora {
 
@@ -65,6 +67,20 @@ std::optional<std::string> standardReply(std::string const& header)
         return "18DAF1" + full.substr(4, 2);
     }
     return std::nullopt;
+}
+
+std::optional<std::string> swappedReply(std::string const& header)
+{
+    bool const legacy = header.size() == 6 && header.ends_with("F1") && !header.starts_with("DA");
+    return legacy ? std::optional(header.substr(0, 2) + "F1" + header.substr(2, 2)) : std::nullopt;
+}
+
+// Of ISO 14230-4 the low bits of the first byte are a length.
+bool isFunctionalHeader(std::string const& header)
+{
+    constexpr std::string_view headers[] = {"7DF", "18DB33F1", "DB33F1", "686AF1", "616AF1"};
+    bool const kwp = header.size() == 6 && header.front() == 'C' && header.ends_with("33F1");
+    return kwp || std::find(std::begin(headers), std::end(headers), header) != std::end(headers);
 }
 
 std::string toText(SignalMistake const& mistake, std::string const& path)

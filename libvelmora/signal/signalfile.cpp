@@ -1,5 +1,6 @@
 #include "libvelmora/signal/signalfile.h"
 
+#include "libvelmora/signal/signalreferences.h"
 #include "libvelmora/signal/signaltable.h"
 #include "libvelmora/text/toml.h"
 
@@ -93,43 +94,10 @@ private:
     // A formula may read other signals of its file, by their ids, in no circle.
     void checkNames()
     {
-        std::vector<Signal> const& signals = m_reading.file.signals;
-        for (std::size_t i = 0; i < signals.size(); ++i) {
-            std::set<std::string> path;
-            if (signals[i].formula && !reaches(signals[i], path)) {
-                m_reading.mistakes.push_back({m_lines[i], signals[i].id + ", formula",
-                                              "it reads a signal that is not in this file, or itself in a circle"});
-            }
+        for (std::size_t const index : brokenReferences(m_reading.file.signals)) {
+            m_reading.mistakes.push_back({m_lines[index], m_reading.file.signals[index].id + ", formula",
+                                          "it reads a signal that is not in this file, or itself in a circle"});
         }
-    }
-
-    bool reaches(Signal const& signal, std::set<std::string>& path) const
-    {
-        std::vector<std::string> const names = valuesReadBy(*signal.formula);
-        if (names.empty()) {
-            return true;
-        }
-        if (!path.insert(signal.id).second) {
-            return false;
-        }
-        for (std::string const& name : names) {
-            Signal const* const other = find(name);
-            if (other == nullptr || !other->formula || !reaches(*other, path)) {
-                return false;
-            }
-        }
-        path.erase(signal.id);
-        return true;
-    }
-
-    Signal const* find(std::string const& id) const
-    {
-        for (Signal const& each : m_reading.file.signals) {
-            if (each.id == id) {
-                return &each;
-            }
-        }
-        return nullptr;
     }
 
     SignalFileReading m_reading;

@@ -83,8 +83,10 @@ TEST(CsvImport, ReadsTwelveColumns)
 TEST(CsvImport, FillsInRepliesAndSaysThatTheyAreAssumed)
 {
     SignalImport const import = importOf(heading + "A,a,22D100,A,0,1,,726\nB,b,22D100,A,0,1,,DA10F1\n"
-                                                   "C,c,2101,A,0,1,,6C10F1\n");
-    ASSERT_EQ(import.file.signals.size(), 3U);
+                                                   "C,c,2101,A,0,1,,6C10F1\nD,d,0105,A,0,1,,7DF\n");
+    ASSERT_EQ(import.file.signals.size(), 4U);
+    EXPECT_EQ(import.file.signals[3].header, "7DF");
+    EXPECT_EQ(import.file.signals[3].reply, "") << "it asks all";
     EXPECT_EQ(import.file.signals[0].reply, "72E");
     EXPECT_NE(import.file.signals[0].reason.find("assumed"), std::string::npos);
     EXPECT_TRUE(import.file.signals[1].reply.empty());
@@ -117,6 +119,11 @@ TEST(CsvImport, ListsWhatItDoesNotUnderstand)
     EXPECT_NE(refusal("A,a,,A,0,1,,7E4\n").find("no request"), std::string::npos);
     EXPECT_NE(refusal("A,a,220101,val{B},0,1,,7E4\n").find("not in this file"), std::string::npos);
     EXPECT_NE(refusal(",a,220101,A,0,1,,7E4\n").find("no name"), std::string::npos);
+    SignalImport const circle = importOf(heading + "A,a,,val{B},0,1,,\nB,b,,val{A}+1,0,1,,\nC,c,,val{A},0,1,,\n"
+                                                   "D,d,2101,A,0,1,,7E0\nE,e,,val{D},0,nan,,\n");
+    EXPECT_EQ(circle.refused.size(), 3U) << "two that read each other, and one that reads them";
+    ASSERT_EQ(circle.file.signals.size(), 2U);
+    EXPECT_FALSE(circle.file.signals[1].max) << "not a number";
 }
 
 TEST(CsvImport, RefusesWhatIsNoSuchTable)

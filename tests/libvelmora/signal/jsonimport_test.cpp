@@ -84,6 +84,7 @@ TEST(ObdbImport, ReadsAddressesTimesAndMeanings)
     EXPECT_EQ(mode.flowControl->header, "17FC007B");
     EXPECT_EQ(mode.timeout, 410U);
     EXPECT_FALSE(mode.enabled);
+    EXPECT_EQ(mode.reason, "needs session 03, which is not opened");
     EXPECT_EQ(mode.values.at(1), "On");
     EXPECT_EQ(mode.values.at(2), "OFF");
     EXPECT_EQ(import.file.signals[1].extendedAddress, 0x07);
@@ -152,6 +153,12 @@ TEST(AbrpImport, ReadsRequestsByKey)
                          "f")
                   .refused.size(),
               1U);
+    SignalImport const session = importAbrp(R"({"data_commands": {"command": ["ATSH7E0", "10C0"]},
+                                                "a": {"equation": "A", "command": "2101", "ecu": "7E0"}})",
+                                            "f");
+    ASSERT_EQ(session.file.signals.size(), 1U);
+    EXPECT_FALSE(session.file.signals[0].enabled);
+    EXPECT_EQ(session.file.signals[0].reason, "needs session 10C0, which is not opened");
 }
 
 TEST(SignalImport, TellsTheFormsApart)

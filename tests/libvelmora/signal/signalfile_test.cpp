@@ -182,6 +182,30 @@ TEST(SignalFile, ChecksWhatNoKeyAloneTells)
         << "an id twice";
 }
 
+TEST(SignalFile, WantsNoReplyOfAHeaderThatAsksAll)
+{
+    EXPECT_EQ(mistakesIn(withSignal("header = \"7DF\"\nrequest = \"0105\"\nformula = \"A\"\n")).size(), 0U);
+    EXPECT_EQ(mistakesIn(withSignal("header = \"C033F1\"\nrequest = \"0105\"\nformula = \"A\"\n")).size(), 0U);
+    EXPECT_EQ(mistakesIn(withSignal("header = \"8011F1\"\nrequest = \"2101\"\nformula = \"A\"\n")).size(), 1U);
+}
+
+// Each reads the two before it: who follows every way through them takes years.
+TEST(SignalFile, ChecksReferencesHoweverTheyBranch)
+{
+    constexpr int many = 400;
+    std::string text = "[[signal]]\nid = \"S0\"\nname = \"x\"\nrequest = \"2101\"\nformula = \"A\"\n"
+                       "[[signal]]\nid = \"S1\"\nname = \"x\"\nformula = \"value(\\\"S0\\\")\"\n";
+    for (int i = 2; i < many; ++i) {
+        text += "[[signal]]\nid = \"S" + std::to_string(i) + "\"\nname = \"x\"\nformula = \"value(\\\"S" +
+                std::to_string(i - 1) + "\\\")+value(\\\"S" + std::to_string(i - 2) + "\\\")\"\n";
+    }
+    EXPECT_EQ(mistakesIn(text).size(), 0U);
+    std::string const circle = "[[signal]]\nid = \"T\"\nname = \"x\"\nformula = \"value(\\\"U\\\")\"\n"
+                               "[[signal]]\nid = \"U\"\nname = \"x\"\nformula = \"value(\\\"T\\\")\"\n"
+                               "[[signal]]\nid = \"V\"\nname = \"x\"\nformula = \"value(\\\"U\\\")\"\n";
+    EXPECT_EQ(mistakesIn(text + circle).size(), 3U) << "the circle, and who reads it";
+}
+
 TEST(SignalFile, PairsRepliesAsIso15765Does)
 {
     EXPECT_EQ(standardReply("7E0"), "7E8");
