@@ -86,12 +86,23 @@ std::optional<BusLine> parseCanLine(BusKind bus, std::string_view digits, bool e
     }
 }
 
-// The format byte of ISO 14230 holds the length in its low bits. Some adapters print no check byte.
-std::optional<std::size_t> kwpDataLength(FrameBytes const& bytes)
+// How a legacy frame divides.
+struct LegacyShape
 {
-    std::size_t const length = bytes[0] & 0x3FU;
-    std::size_t const rest = bytes.size() - legacyHeaderBytes;
-    return length != 0 && (rest == length || rest == length + 1) ? std::optional(length) : std::nullopt;
+    std::size_t header = legacyHeaderBytes;
+    std::size_t data = 0;
+};
+
+// The format byte of ISO 14230 holds the length in its low bits; for more than 63 bytes they are 0, and a byte of its
+// own stands behind the addresses. Some adapters print no check byte.
+std::optional<LegacyShape> kwpShape(FrameBytes const& bytes)
+{
+    LegacyShape shape{legacyHeaderBytes, bytes[0] & 0x3FU};
+    if (shape.data == 0) {
+        shape = {legacyHeaderBytes + 1, bytes[legacyHeaderBytes]};
+    }
+    std::size_t const rest = bytes.size() - shape.header;
+    return shape.data != 0 && (rest == shape.data || rest == shape.data + 1) ? std::optional(shape) : std::nullopt;
 }
 
 std::optional<BusLine> parseLegacyLine(BusKind bus, std::string_view digits)
@@ -100,19 +111,19 @@ std::optional<BusLine> parseLegacyLine(BusKind bus, std::string_view digits)
     if (digits.size() % 2 != 0 || bytes.size() < legacyHeaderBytes + 2) {
         return std::nullopt;
     }
-    std::size_t dataLength = bytes.size() - legacyHeaderBytes - 1;
+    LegacyShape shape{legacyHeaderBytes, bytes.size() - legacyHeaderBytes - 1};
     if (bus == BusKind::Kwp) {
-        std::optional<std::size_t> const told = kwpDataLength(bytes);
+        std::optional<LegacyShape> const told = kwpShape(bytes);
         if (!told) {
             return std::nullopt;
         }
-        dataLength = *told;
+        shape = *told;
     }
     BusLine line;
-    line.header = std::string(digits.substr(0, 2 * legacyHeaderBytes));
+    line.header = std::string(digits.substr(0, 2 * shape.header));
     line.module = bytes[2];
-    line.bytes.assign(bytes.begin() + legacyHeaderBytes, bytes.end());
-    line.payload.assign(line.bytes.begin(), line.bytes.begin() + static_cast<std::ptrdiff_t>(dataLength));
+    line.bytes.assign(bytes.begin() + static_cast<std::ptrdiff_t>(shape.header), bytes.end());
+    line.payload.assign(line.bytes.begin(), line.bytes.begin() + static_cast<std::ptrdiff_t>(shape.data));
     return line;
 }
 

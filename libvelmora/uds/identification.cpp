@@ -101,13 +101,22 @@ std::vector<IdentifierRow> const& standardIdentifiers()
     return rows;
 }
 
+namespace {
+
+// Null for any other identifier.
+IdentifierRow const* rowOfIdentifier(unsigned int did)
+{
+    auto const found = std::ranges::find(standardIdentifiers(), did, &IdentifierRow::did);
+    return found != standardIdentifiers().end() ? &*found : nullptr;
+}
+
+} // namespace
+
 std::string identifierText(unsigned int did, std::vector<unsigned char> const& data)
 {
-    std::vector<IdentifierRow> const& rows = standardIdentifiers();
-    auto const row =
-        std::find_if(rows.begin(), rows.end(), [did](IdentifierRow const& each) { return each.did == did; });
+    IdentifierRow const* const row = rowOfIdentifier(did);
     std::optional<std::string> text;
-    switch (row != rows.end() ? row->kind : IdentifierKind::Bytes) {
+    switch (row != nullptr ? row->kind : IdentifierKind::Bytes) {
     case IdentifierKind::CountedText:
         if (data.size() > 1 && data.front() > 0 && data.front() < ' ') {
             text = plainText({data.begin() + 1, data.end()});
@@ -129,6 +138,17 @@ std::string identifierText(unsigned int did, std::vector<unsigned char> const& d
         break;
     }
     return text ? *text : hexText(data);
+}
+
+std::string localIdentifierText(std::vector<unsigned char> const& data)
+{
+    return plainText(data).value_or(hexText(data));
+}
+
+std::string identifierName(unsigned int did)
+{
+    IdentifierRow const* const row = rowOfIdentifier(did);
+    return row != nullptr ? row->name : fmt::format("Identification {:02X} by service {:02X}", did & 0xFFU, did >> 8U);
 }
 
 } // namespace velmora

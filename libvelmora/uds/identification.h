@@ -30,4 +30,10 @@ std::vector<IdentifierRow> const& standardIdentifiers();
 // as what it should be. Empty for data that is filling only.
 std::string identifierText(unsigned int did, std::vector<unsigned char> const& data);
 
+// The data of a local identifier of service 1A: text, or hexadecimal where it is none.
+std::string localIdentifierText(std::vector<unsigned char> const& data);
+
+// The name of F180 to F19F; for 1A80 and other local identifiers what service tells them.
+std::string identifierName(unsigned int did);
+
 } // namespace velmora

@@ -24,6 +24,7 @@ constexpr unsigned int saveEvery = 16;
 constexpr unsigned int firstOnes = 4; // that tell whether the module has the service at all
 constexpr unsigned char serviceMissing = 0x11;
 constexpr unsigned char wrongLength = 0x13;
+constexpr char const* probeText = "the requests of a probe";
 
 std::vector<unsigned char> requestFor(ProbeTask const& task, unsigned int id)
 {
@@ -116,13 +117,14 @@ ModuleAnswer::Kind IdentifierProbe::ask(ProbeState& state, RequestAddress const&
     return answer.kind;
 }
 
-void IdentifierProbe::lookAgain(ProbeState& state, RequestAddress const& address)
+void IdentifierProbe::lookAgain(ProbeState& state, RequestAddress const& address, StandingGuard& guard)
 {
     for (auto const& [id, data] : state.told) {
         if (state.second.contains(id)) {
             continue;
         }
         m_check();
+        guard.check();
         pace();
         std::vector<unsigned char> const request = requestFor(state.task, id);
         ModuleAnswer const answer = m_asker.ask(address, request);
@@ -130,6 +132,7 @@ void IdentifierProbe::lookAgain(ProbeState& state, RequestAddress const& address
             state.second[id] = {answer.payload.begin() + static_cast<std::ptrdiff_t>(request.size()),
                                 answer.payload.end()};
         }
+        guard.countTrouble(answer.kind == ModuleAnswer::Kind::BusTrouble, probeText);
     }
 }
 
@@ -147,8 +150,7 @@ void IdentifierProbe::run(ProbeState& state)
         for (; state.next <= state.task.to; ++state.next) {
             m_check();
             guard.check();
-            guard.countTrouble(ask(state, *reached.address, state.next) == ModuleAnswer::Kind::BusTrouble,
-                               "the requests of a probe");
+            guard.countTrouble(ask(state, *reached.address, state.next) == ModuleAnswer::Kind::BusTrouble, probeText);
             m_progress(state);
             if ((state.next - state.task.from) % saveEvery == saveEvery - 1) {
                 ProbeState saved = state;
@@ -156,8 +158,7 @@ void IdentifierProbe::run(ProbeState& state)
                 m_save(saved);
             }
         }
-        guard.check();
-        lookAgain(state, *reached.address);
+        lookAgain(state, *reached.address, guard);
     } catch (...) {
         m_save(state);
         throw;

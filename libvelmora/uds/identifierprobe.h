@@ -2,6 +2,7 @@
 
 #include "libvelmora/signal/signal.h"
 #include "libvelmora/uds/moduleasker.h"
+#include "libvelmora/uds/standingguard.h"
 
 #include <nlohmann/json_fwd.hpp>
 
@@ -72,7 +73,7 @@ public:
 
 private:
     ModuleAnswer::Kind ask(ProbeState& state, RequestAddress const& address, unsigned int id);
-    void lookAgain(ProbeState& state, RequestAddress const& address);
+    void lookAgain(ProbeState& state, RequestAddress const& address, StandingGuard& guard);
     void pace();
 
     ModuleAsker& m_asker;

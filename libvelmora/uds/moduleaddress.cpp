@@ -1,5 +1,7 @@
 #include "libvelmora/uds/moduleaddress.h"
 
+#include "libvelmora/text/text.h"
+
 #include <fmt/format.h>
 
 #include <algorithm>
@@ -15,6 +17,7 @@ constexpr std::size_t longHeader = 8;
 constexpr unsigned int extendedWaitMs = 500;
 constexpr char const* usualTester = "F1";
 constexpr unsigned int longestIdentifier11 = 0x7FF;
+constexpr std::size_t legacyHeader = 6;
 
 // Six digits leave the priority of ISO 15765-4 away.
 std::string wholeIdentifier(std::string const& text)
@@ -35,7 +38,61 @@ void addFlowControl(RequestAddress& address, std::string const& header)
     address.flowData = address.extended + "300000";
 }
 
+unsigned int byteOf(std::string const& header, std::size_t place)
+{
+    return parseHex(header.substr(2 * place, 2), 0xFF).value_or(0);
+}
+
+// ISO 14230-2: two bits of the format byte say that one module is meant. SAE J1850: one bit of the priority byte does.
+bool isPhysical(std::string const& header, obd::ObdProtocol protocol)
+{
+    unsigned int const first = byteOf(header, 0);
+    return protocol == obd::ObdProtocolIso14230 ? (first & 0xC0U) == 0x80U : (first & 0x04U) != 0;
+}
+
+// Format or priority, receiver and sender. The adapter fills in the length, and takes what is sent to the tester.
+AddressOrReason legacyAddress(std::string const& header, std::string const& reply, bool extended,
+                              obd::ObdProtocol protocol)
+{
+    if (protocol == obd::ObdProtocolIso9141) {
+        return refused("ISO 9141-2 has no header for a single module");
+    }
+    if (header.size() != legacyHeader) {
+        return refused(
+            fmt::format("the header {} is none of this bus, whose headers have {} digits", header, legacyHeader));
+    }
+    if (!isPhysical(header, protocol)) {
+        return refused(fmt::format("the header {} does not mean one module", header));
+    }
+    if (extended) {
+        return refused("only CAN has an address byte beside the header");
+    }
+    if (!reply.empty() && (reply.size() != legacyHeader || reply.substr(4, 2) != header.substr(2, 2))) {
+        return refused(
+            fmt::format("the reply {} is not one of the module {}, which is asked", reply, header.substr(2, 2)));
+    }
+    RequestAddress address;
+    address.header = header;
+    address.stays = true;
+    return {address, {}};
+}
+
 } // namespace
+
+bool isLegacyHeader(std::string const& header)
+{
+    return header.size() == legacyHeader;
+}
+
+unsigned int answeringModule(RequestAddress const& address)
+{
+    return isLegacyHeader(address.header) ? byteOf(address.header, 1) : parseHex(address.reply, 0x1FFFFFFF).value_or(0);
+}
+
+std::string shownModule(std::string const& reply)
+{
+    return isLegacyHeader(reply) ? reply.substr(4) : reply;
+}
 
 bool isCanBus(obd::ObdProtocol protocol)
 {
@@ -44,14 +101,14 @@ bool isCanBus(obd::ObdProtocol protocol)
 
 bool isBroadcast(Signal const& signal)
 {
-    return signal.header.empty() || signal.header == "7DF" || wholeIdentifier(signal.header) == "18DB33F1";
+    return signal.header.empty() || isFunctionalHeader(signal.header);
 }
 
 AddressOrReason addressOf(std::string const& header, std::string const& reply, std::optional<unsigned char> ext,
                           obd::ObdProtocol protocol)
 {
     if (!isCanBus(protocol)) {
-        return refused("the bus is no CAN; only there modules are asked by a header of their own");
+        return legacyAddress(header, reply, ext.has_value(), protocol);
     }
     RequestAddress address;
     address.header = wholeIdentifier(header);
@@ -88,6 +145,12 @@ AddressOrReason addressOf(Signal const& signal, obd::ObdProtocol protocol)
         return result;
     }
     RequestAddress& address = *result.address;
+    if (signal.timeout) {
+        address.waitMs = std::max(address.waitMs, *signal.timeout);
+    }
+    if (isLegacyHeader(address.header)) {
+        return result;
+    }
     if (signal.tester) {
         address.tester = frameDigits({*signal.tester});
     }
@@ -95,14 +158,14 @@ AddressOrReason addressOf(Signal const& signal, obd::ObdProtocol protocol)
         address.flowHeader = wholeIdentifier(signal.flowControl->header);
         address.flowData = frameDigits(signal.flowControl->data);
     }
-    if (signal.timeout) {
-        address.waitMs = std::max(address.waitMs, *signal.timeout);
-    }
     return result;
 }
 
-std::optional<std::string> standardRequest(unsigned int reply)
+std::optional<std::string> standardRequest(unsigned int reply, obd::ObdProtocol protocol)
 {
+    if (protocol == obd::ObdProtocolIso14230 && reply <= 0xFF) {
+        return fmt::format("80{:02X}F1", reply);
+    }
     if (reply >= 0x7E8 && reply <= 0x7EF) {
         return fmt::format("{:03X}", reply - 8);
     }

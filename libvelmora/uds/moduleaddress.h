@@ -20,6 +20,12 @@ struct AddressOrReason
 // Whether a signal goes to all modules, by the bus's standard request.
 bool isBroadcast(Signal const& signal);
 
+// Whether a header is one of the buses before CAN, whose modules are told apart by a byte of it.
+bool isLegacyHeader(std::string const& header);
+
+// Who answers a request to this address, by the identifier or byte that replies carry.
+unsigned int answeringModule(RequestAddress const& address);
+
 AddressOrReason addressOf(Signal const& signal, obd::ObdProtocol protocol);
 
 // Of a module by its identifiers alone: request and reply in hexadecimal, the reply empty where it follows from the
@@ -29,10 +35,14 @@ AddressOrReason addressOf(std::string const& header, std::string const& reply, s
 
 bool isCanBus(obd::ObdProtocol protocol);
 
-// Where a module of ISO 15765-4 listens, by the identifier of its replies: "7E0" for 7E8. Nothing for others.
-std::optional<std::string> standardRequest(unsigned int reply);
+// Where a module that answers standard requests listens alone, by the identifier of its replies: "7E0" for 7E8
+// (ISO 15765-4), "8011F1" for 11 (ISO 14230-4). Nothing for others.
+std::optional<std::string> standardRequest(unsigned int reply, obd::ObdProtocol protocol);
 
 // "7E0", "18DA10F1".
 std::string identifierText(unsigned int id);
+
+// The module of a reply's identifier or header as people are told it: "7E8", and "11" of 80F111.
+std::string shownModule(std::string const& reply);
 
 } // namespace velmora

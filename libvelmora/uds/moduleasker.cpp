@@ -2,6 +2,7 @@
 
 #include "libvelmora/signal/signal.h"
 #include "libvelmora/signal/signalhex.h"
+#include "libvelmora/uds/moduleaddress.h"
 #include "libvelmora/uds/refusalcode.h"
 
 #include <algorithm>
@@ -22,6 +23,22 @@ std::string moduleKey(RequestAddress const& address)
     return address.header + "/" + address.extended;
 }
 
+BusKind busOf(obd::ObdProtocol protocol)
+{
+    switch (protocol) {
+    case obd::ObdProtocolIso9141:
+        return BusKind::Iso9141;
+    case obd::ObdProtocolIso14230:
+        return BusKind::Kwp;
+    case obd::ObdProtocolJ1850:
+        return BusKind::J1850;
+    case obd::ObdProtocolCan29:
+        return BusKind::Can29;
+    default:
+        return BusKind::Can11;
+    }
+}
+
 // Of several identifiers in one request the module leaves those out that it has not.
 bool isEchoed(std::vector<unsigned char> const& request, std::vector<unsigned char> const& payload)
 {
@@ -38,6 +55,13 @@ bool isEchoed(std::vector<unsigned char> const& request, std::vector<unsigned ch
     std::size_t const echo = bare ? 1 : uds ? std::min<std::size_t>(request.size(), 2) : echoLength(request);
     return payload.size() >= echo &&
            std::equal(request.begin() + 1, request.begin() + static_cast<std::ptrdiff_t>(echo), payload.begin() + 1);
+}
+
+// On SAE J1850 the request's own bytes stand between its service and the code.
+unsigned char refusalIn(std::vector<unsigned char> const& request, std::vector<unsigned char> const& payload)
+{
+    bool const repeats = payload.size() > 3 && request.size() > 1 && payload[2] == request[1];
+    return repeats ? payload.back() : payload[2];
 }
 
 bool asksForTime(ModuleAnswer const& answer)
@@ -81,7 +105,7 @@ ModuleAnswer judgeReply(std::vector<unsigned char> const& request, ReplyContent 
         bool const refusal = each.payload.size() > 2 && each.payload[0] == udsRefusal && each.payload[1] == request[0];
         // Behind a "response pending" may come another refusal, which is the answer.
         if (refusal && (answer.kind != ModuleAnswer::Kind::Refused || asksForTime(answer))) {
-            answer = {ModuleAnswer::Kind::Refused, each.id, {}, each.payload[2], {}};
+            answer = {ModuleAnswer::Kind::Refused, each.id, {}, refusalIn(request, each.payload), {}};
         }
     }
     if (answer.kind == ModuleAnswer::Kind::Refused) {
@@ -112,7 +136,13 @@ ReplyContent ModuleAsker::exchange(RequestAddress const& address, std::vector<un
     } else if (!reply.answered) {
         trouble = {ModuleAnswer::Kind::BusTrouble, 0, {}, 0, "the adapter does not answer"};
     }
-    return readReply(reply, m_proxy.protocol() == obd::ObdProtocolCan29 ? BusKind::Can29 : BusKind::Can11);
+    ReplyContent content = readReply(reply, busOf(m_proxy.protocol()));
+    if (isLegacyHeader(address.header)) {
+        // There the adapter hears whoever speaks to the tester.
+        std::erase_if(content.messages,
+                      [module = answeringModule(address)](ModuleReply const& each) { return each.id != module; });
+    }
+    return content;
 }
 
 ModuleAnswer ModuleAsker::ask(RequestAddress const& address, std::vector<unsigned char> const& request,

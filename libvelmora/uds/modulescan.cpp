@@ -1,13 +1,11 @@
 #include "libvelmora/uds/modulescan.h"
 
 #include "libvelmora/text/text.h"
-#include "libvelmora/uds/identification.h"
 #include "libvelmora/uds/moduleaddress.h"
 #include "libvelmora/uds/standingguard.h"
 
 #include <velmora/error.h>
 
-#include <algorithm>
 #include <utility>
 
 namespace velmora {
@@ -49,13 +47,7 @@ ModuleScan::ModuleScan(ModuleAsker& asker, std::function<void()> check,
                        std::function<void(ScanProgress const&)> progress)
     : m_asker(asker), m_check(std::move(check)), m_progress(std::move(progress)),
       m_long(asker.proxy().protocol() == obd::ObdProtocolCan29)
-{
-    if (!isCanBus(asker.proxy().protocol())) {
-        throw Error(ErrorKind::NotSupported,
-                    "The bus of this vehicle is no CAN: modules beyond OBD can't be looked for",
-                    {"on older buses each module needs a start of its own, which would end the connection"});
-    }
-}
+{}
 
 std::set<unsigned int> ModuleScan::listen()
 {
@@ -110,6 +102,11 @@ std::optional<FoundModule> ModuleScan::ask(unsigned int id, ModuleAnswer::Kind& 
 
 std::vector<FoundModule> ModuleScan::find()
 {
+    if (!isCanBus(m_asker.proxy().protocol())) {
+        throw Error(ErrorKind::NotSupported,
+                    "The bus of this vehicle is no CAN: modules beyond OBD can't be looked for",
+                    {"on older buses each module needs a start of its own, which would end the connection"});
+    }
     StandingGuard guard(m_asker.proxy());
     guard.check();
     std::set<unsigned int> used = listen();
@@ -135,49 +132,6 @@ std::vector<FoundModule> ModuleScan::find()
         }
     }
     return found;
-}
-
-std::string ModuleScan::text(RequestAddress const& address, unsigned int did)
-{
-    m_check();
-    std::vector<unsigned char> const request{0x22, static_cast<unsigned char>(did >> 8U),
-                                             static_cast<unsigned char>(did & 0xFFU)};
-    ModuleAnswer const answer = m_asker.ask(address, request);
-    if (answer.kind != ModuleAnswer::Kind::Positive || answer.payload.size() <= request.size()) {
-        return {};
-    }
-    return identifierText(did, {answer.payload.begin() + 3, answer.payload.end()});
-}
-
-void ModuleScan::identify(FoundModule& module)
-{
-    AddressOrReason const reached = addressOf(module.request, module.reply, {}, m_asker.proxy().protocol());
-    if (!reached.address) {
-        return;
-    }
-    module.name = text(*reached.address, 0xF197);
-    module.part = text(*reached.address, 0xF187);
-    module.software = text(*reached.address, 0xF189);
-    if (module.software.empty()) {
-        module.software = text(*reached.address, 0xF195);
-    }
-    UdsCodeReport const codes = readUdsCodes(m_asker, *reached.address);
-    if (codes.answer == TopicAnswer::Read) {
-        module.codes = static_cast<unsigned int>(codes.codes.size());
-    }
-}
-
-void ModuleScan::readIdentifiers(FoundModule& module)
-{
-    AddressOrReason const reached = addressOf(module.request, module.reply, {}, m_asker.proxy().protocol());
-    if (!reached.address) {
-        return;
-    }
-    for (IdentifierRow const& row : standardIdentifiers()) {
-        if (std::string const told = text(*reached.address, row.did); !told.empty()) {
-            module.identifiers[row.did] = told;
-        }
-    }
 }
 
 } // namespace velmora

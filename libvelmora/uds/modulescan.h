@@ -1,28 +1,15 @@
 #pragma once
 
+#include "libvelmora/uds/foundmodule.h"
 #include "libvelmora/uds/moduleasker.h"
-#include "libvelmora/uds/udscodes.h"
 
 #include <functional>
-#include <map>
 #include <optional>
 #include <set>
 #include <string>
 #include <vector>
 
 namespace velmora {
-
-// A control module as it was found, and what it tells of itself. Texts are empty where it told none.
-struct FoundModule
-{
-    std::string request; // identifier, hexadecimal
-    std::string reply;
-    std::string name;                                     // F197
-    std::string part;                                     // F187
-    std::string software;                                 // F189, else F195
-    std::optional<unsigned int> codes;                    // how many trouble codes matter; nothing if it does not tell
-    std::map<unsigned int, std::string> identifiers = {}; // F180 to F19F, where they were asked for: those it told
-};
 
 // How a scan goes.
 struct ScanProgress
@@ -43,16 +30,11 @@ public:
     // In rising order of the request's identifier. Throws Error if the bus is no CAN, the vehicle moves, or the bus is
     // in trouble.
     std::vector<FoundModule> find();
-    // Asks a module what it is and how many codes it has.
-    void identify(FoundModule& module);
-    // Asks for all standard identifiers.
-    void readIdentifiers(FoundModule& module);
 
 private:
     std::set<unsigned int> listen();
     std::vector<unsigned int> candidates(std::set<unsigned int> const& heard) const;
     std::optional<FoundModule> ask(unsigned int id, ModuleAnswer::Kind& kind);
-    std::string text(RequestAddress const& address, unsigned int did);
 
     ModuleAsker& m_asker;
     std::function<void()> const m_check;

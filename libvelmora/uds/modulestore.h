@@ -1,6 +1,6 @@
 #pragma once
 
-#include "libvelmora/uds/modulescan.h"
+#include "libvelmora/uds/foundmodule.h"
 
 #include <nlohmann/json_fwd.hpp>
 

@@ -48,32 +48,46 @@ std::optional<std::string> textOf(SignalText const& text, std::vector<unsigned c
     return readable(std::string(first, last));
 }
 
-std::optional<double> SignalBoard::valueOf(std::size_t index, std::string const& id, Time now, int depth) const
+std::optional<double> SignalBoard::lastOf(std::size_t index, Time now) const
 {
-    std::optional<std::size_t> const other = m_set->sibling(index, id);
-    if (!other || depth > deepestReference) {
-        return std::nullopt;
-    }
-    SignalEntry const& entry = (*m_set)[*other];
-    if (entry.signal.request.empty() && entry.signal.formula) {
-        return evaluate(*entry.signal.formula,
-                        {{}, [&](std::string const& name) { return valueOf(*other, name, now, depth + 1); }});
-    }
-    auto const found = m_last.find(*other);
+    auto const found = m_last.find(index);
     if (found == m_last.end()) {
         return std::nullopt;
     }
+    SignalEntry const& entry = (*m_set)[index];
     std::chrono::duration<double> const age = now - found->second.time;
     double const oldest = std::max(std::chrono::duration<double>(oldestValue).count(),
                                    entry.signal.rate ? 3.0 / *entry.signal.rate : 0.0);
     return age.count() <= oldest ? std::optional(found->second.number) : std::nullopt;
 }
 
+std::optional<double> SignalBoard::valueOf(std::size_t index, std::string const& id, Time now, WorkedOut& known,
+                                           int depth) const
+{
+    std::optional<std::size_t> const other = m_set->sibling(index, id);
+    if (!other || depth > deepestReference) {
+        return std::nullopt;
+    }
+    SignalEntry const& entry = (*m_set)[*other];
+    if (!entry.signal.request.empty() || !entry.signal.formula) {
+        return lastOf(*other, now);
+    }
+    if (auto const found = known.find(*other); found != known.end()) {
+        return found->second;
+    }
+    std::optional<double> const value =
+        evaluate(*entry.signal.formula,
+                 {{}, [&](std::string const& name) { return valueOf(*other, name, now, known, depth + 1); }});
+    known.emplace(*other, value);
+    return value;
+}
+
 std::optional<double> SignalBoard::evaluateEntry(std::size_t index, std::vector<unsigned char> const& data,
                                                  Time now) const
 {
     SignalEntry const& entry = (*m_set)[index];
-    FormulaInput const input{data, [&](std::string const& id) { return valueOf(index, id, now, 0); }};
+    WorkedOut known;
+    FormulaInput const input{data, [&](std::string const& id) { return valueOf(index, id, now, known, 0); }};
     if (!entry.signal.formula || (entry.supported && evaluate(*entry.supported, input) != 1.0)) {
         return std::nullopt;
     }
@@ -154,6 +168,13 @@ PollResult SignalBoard::take(ChosenSignal const& signal, unsigned int module, un
         countMissing(signal.index);
     }
     return result(signal, module, std::move(reading));
+}
+
+PollResult SignalBoard::takeNothing(ChosenSignal const& signal, unsigned int module)
+{
+    m_last.erase(signal.index);
+    countMissing(signal.index);
+    return result(signal, module, reading(signal.index, module));
 }
 
 std::optional<PollResult> SignalBoard::workOut(ChosenSignal const& signal, Time now)

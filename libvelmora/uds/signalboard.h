@@ -26,7 +26,7 @@ struct ChosenSignal
 struct SignalTrouble
 {
     std::string id;
-    unsigned int withoutValue = 0; // replies that gave none: a division by zero, a byte behind the end, another length
+    unsigned int withoutValue = 0; // replies that gave none: a division by zero, another length, another identifier
     std::string reason;            // why it is not asked, or not answered of late
 };
 
@@ -44,6 +44,8 @@ public:
     // Takes a positive reply, from the service on. module is the signal's own as wishes name it, answered who spoke.
     PollResult take(ChosenSignal const& signal, unsigned int module, unsigned int answered,
                     std::vector<unsigned char> const& payload, Time now);
+    // A reply that is none to its request, or can't be read: no value, which is counted.
+    PollResult takeNothing(ChosenSignal const& signal, unsigned int module);
     // A signal that is worked out of others; nothing as long as they are not known.
     std::optional<PollResult> workOut(ChosenSignal const& signal, Time now);
 
@@ -67,8 +69,13 @@ private:
         unsigned int count = 0;
     };
 
+    // What was worked out for one result already, so that no signal is worked out twice for it.
+    using WorkedOut = std::map<std::size_t, std::optional<double>>;
+
     std::optional<double> evaluateEntry(std::size_t index, std::vector<unsigned char> const& data, Time now) const;
-    std::optional<double> valueOf(std::size_t index, std::string const& id, Time now, int depth) const;
+    std::optional<double> valueOf(std::size_t index, std::string const& id, Time now, WorkedOut& known,
+                                  int depth) const;
+    std::optional<double> lastOf(std::size_t index, Time now) const;
     Reading reading(std::size_t index, unsigned int module) const;
     PollResult result(ChosenSignal const& signal, unsigned int module, Reading reading);
     void countMissing(std::size_t index);

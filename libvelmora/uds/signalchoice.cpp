@@ -2,40 +2,23 @@
 
 #include "libvelmora/read/sensornames.h"
 #include "libvelmora/signal/signalhex.h"
-#include "libvelmora/text/text.h"
 #include "libvelmora/uds/moduleaddress.h"
-#include "libvelmora/uds/signalgroup.h"
+#include "libvelmora/uds/signalsources.h"
+#include "libvelmora/uds/vehiclevin.h"
 
 #include <velmora/error.h>
 
 #include <fmt/format.h>
 
 #include <algorithm>
-#include <map>
-#include <tuple>
-#include <utility>
 
 namespace velmora {
 
 namespace {
 
-constexpr unsigned int vinLimitMs = 3000;
-constexpr std::size_t mostRequests = 8; // of a turn, so that other sensors do not wait long
-constexpr double usualRate = 1.0;       // of a module that others share the bus with: setting the adapter up takes time
-
 bool isSwitchedOff(SignalEntry const& entry)
 {
     return !entry.signal.enabled;
-}
-
-// Where a group stands among the others: one for each module and rate.
-std::string groupKey(std::optional<RequestAddress> const& address, std::optional<double> hertz)
-{
-    std::string const where = address
-                                  ? fmt::format("{}/{}/{}/{}/{}/{}", address->header, address->reply, address->extended,
-                                                address->tester, address->flowHeader, address->waitMs)
-                                  : std::string();
-    return fmt::format("{}@{}", where, hertz.value_or(0.0));
 }
 
 std::string standingNote(SignalEntry const& entry)
@@ -45,23 +28,6 @@ std::string standingNote(SignalEntry const& entry)
 }
 
 } // namespace
-
-std::string vehicleVin(obd::IObdProxy& proxy)
-{
-    constexpr std::size_t vinLength = 17;
-    constexpr std::size_t lead = 3; // 49, 02, and the count of items
-    obd::ResponseMap replies;
-    proxy.execute(std::vector<unsigned char>{0x09, 0x02}, replies, vinLimitMs);
-    for (auto const& [module, bytes] : replies) {
-        if (bytes.size() >= lead + vinLength && bytes[0] == 0x49 && bytes[1] == 0x02) {
-            std::string const vin(bytes.end() - static_cast<std::ptrdiff_t>(vinLength), bytes.end());
-            if (std::all_of(vin.begin(), vin.end(), [](char each) { return each > ' ' && each < 0x7F; })) {
-                return vin;
-            }
-        }
-    }
-    return {};
-}
 
 bool SignalChoice::choose(SensorWish const& wish, std::vector<unsigned int> const& meant)
 {
@@ -211,14 +177,14 @@ unsigned int SignalChoice::moduleOf(ChosenSignal const& signal) const
         return 0;
     }
     AddressOrReason const reached = addressOf(own, m_session.proxy()->protocol());
-    return reached.address ? parseHex(reached.address->reply, 0x1FFFFFFF).value_or(0) : 0;
+    return reached.address ? answeringModule(*reached.address) : 0;
 }
 
 std::optional<double> SignalChoice::rateOf(ChosenSignal const& signal, bool alone) const
 {
     Signal const& own = set()[signal.index].signal;
     bool const foreign = !own.request.empty() && !isBroadcast(own);
-    return signal.hertz || alone || !foreign ? signal.hertz : std::optional(usualRate);
+    return signal.hertz || alone || !foreign ? signal.hertz : std::optional(usualSignalRate);
 }
 
 std::vector<SignalRow> SignalChoice::rows() const
@@ -236,52 +202,19 @@ std::vector<SignalRow> SignalChoice::rows() const
 
 std::vector<PollSource> SignalChoice::sources(bool alone)
 {
-    struct Group
-    {
-        std::shared_ptr<SignalGroup> guest;
-        std::optional<double> hertz;
-        std::vector<std::vector<unsigned char>> requests;
-    };
-    std::vector<Group> groups;
-    std::map<std::string, std::size_t> open; // by key: the group that takes more
     m_board = std::make_shared<SignalBoard>(m_session.signals());
-    auto const asker = std::make_shared<ModuleAsker>(*m_session.proxy(), m_session.channel());
-    std::vector<ChosenSignal> workedOut;
+    SignalSources sources(m_board, std::make_shared<ModuleAsker>(*m_session.proxy(), m_session.channel()));
     for (ChosenSignal const& each : m_chosen) {
         Signal const& signal = set()[each.index].signal;
         if (signal.request.empty()) {
-            workedOut.push_back(each);
+            sources.addWorkedOut(each);
             continue;
         }
         std::optional<RequestAddress> const address =
             isBroadcast(signal) ? std::nullopt : addressOf(signal, m_session.proxy()->protocol()).address;
-        std::optional<double> const hertz = rateOf(each, alone);
-        std::string const key = groupKey(address, hertz);
-        auto found = open.find(key);
-        bool const full =
-            found != open.end() && groups[found->second].requests.size() >= mostRequests &&
-            std::ranges::find(groups[found->second].requests, signal.request) == groups[found->second].requests.end();
-        if (found == open.end() || full) {
-            groups.push_back({std::make_shared<SignalGroup>(m_board, asker, address), hertz, {}});
-            found = open.insert_or_assign(key, groups.size() - 1).first;
-        }
-        Group& group = groups[found->second];
-        if (std::ranges::find(group.requests, signal.request) == group.requests.end()) {
-            group.requests.push_back(signal.request);
-        }
-        group.guest->add(each, moduleOf(each));
+        sources.add(each, moduleOf(each), address, rateOf(each, alone));
     }
-    if (groups.empty() && !workedOut.empty()) {
-        groups.push_back({std::make_shared<SignalGroup>(m_board, asker, std::nullopt), usualRate, {}});
-    }
-    for (ChosenSignal const& each : workedOut) {
-        groups.back().guest->addWorkedOut(each);
-    }
-    std::vector<PollSource> sources;
-    for (Group const& group : groups) {
-        sources.push_back({nullptr, nullptr, group.hertz, group.guest});
-    }
-    return sources;
+    return sources.take();
 }
 
 } // namespace velmora

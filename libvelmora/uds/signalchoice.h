@@ -50,7 +50,4 @@ private:
     std::optional<std::string> m_vin;
 };
 
-// The VIN by service 09, of the first module that tells one; empty if none does.
-std::string vehicleVin(obd::IObdProxy& proxy);
-
 } // namespace velmora

@@ -1,6 +1,8 @@
 #include "libvelmora/uds/signalgroup.h"
 
 #include "libvelmora/poll/pollwire.h"
+#include "libvelmora/uds/combinedreply.h"
+#include "libvelmora/uds/moduleaddress.h"
 
 #include <algorithm>
 #include <utility>
@@ -13,31 +15,6 @@ constexpr unsigned char readByIdentifier = 0x22;
 constexpr unsigned int broadcastLimitMs = 1500;
 constexpr std::size_t mostTogether = 3;         // identifiers that fit in a frame
 constexpr std::size_t mostTogetherExtended = 2; // behind an address byte
-
-// The reply to several identifiers (ISO 14229-1): 62, then identifier and data of each, in any order. Nothing if it
-// does not divide exactly.
-std::optional<std::map<unsigned int, std::vector<unsigned char>>>
-divideReply(std::vector<unsigned char> const& payload, std::map<unsigned int, std::size_t> const& lengths)
-{
-    std::map<unsigned int, std::vector<unsigned char>> parts;
-    std::size_t at = 1;
-    while (at < payload.size()) {
-        if (at + 2 > payload.size()) {
-            return std::nullopt;
-        }
-        unsigned int const id = static_cast<unsigned int>(payload[at]) << 8U | payload[at + 1];
-        auto const length = lengths.find(id);
-        if (length == lengths.end() || parts.contains(id) || at + 2 + length->second > payload.size()) {
-            return std::nullopt;
-        }
-        std::vector<unsigned char> part{payload.front()};
-        auto const first = payload.begin() + static_cast<std::ptrdiff_t>(at);
-        part.insert(part.end(), first, first + 2 + static_cast<std::ptrdiff_t>(length->second));
-        parts[id] = std::move(part);
-        at += 2 + length->second;
-    }
-    return parts;
-}
 
 unsigned int identifierOf(std::vector<unsigned char> const& request)
 {
@@ -126,14 +103,15 @@ std::vector<PollResult> SignalGroup::turn(PollWire& wire)
 }
 
 // What may be asked for in one request: identifiers whose length is known, and was right when they were asked for
-// alone.
+// alone. Before CAN a request has one identifier (ISO 14230-3).
 std::vector<SignalGroup::Request*> SignalGroup::together(std::vector<Request*> const& due) const
 {
     std::vector<Request*> chosen;
     std::size_t const most = m_address && !m_address->extended.empty() ? mostTogetherExtended : mostTogether;
     for (Request* const request : due) {
-        bool const fits = m_address && !m_severalFail && request->bytes.front() == readByIdentifier &&
-                          request->provedLength && !request->state.wantsSplit();
+        bool const fits = m_address && !isLegacyHeader(m_address->header) && !m_severalFail &&
+                          request->bytes.front() == readByIdentifier && request->provedLength &&
+                          !request->state.wantsSplit();
         if (fits && chosen.size() < most) {
             chosen.push_back(request);
         }
@@ -212,12 +190,26 @@ void SignalGroup::give(Request& request, ModuleAnswer const& answer, PollWire& w
 {
     request.state.take(answer, wire.now());
     m_board->setReason(signalsOf(request), request.state.reason());
+    if (answer.kind == ModuleAnswer::Kind::Foreign || answer.kind == ModuleAnswer::Kind::Unreadable) {
+        giveNothing(request, results);
+    }
     if (answer.kind != ModuleAnswer::Kind::Positive) {
         return;
     }
     request.provedLength = request.length && answer.payload.size() == echoLength(request.bytes) + *request.length;
     for (Member const& member : request.members) {
         PollResult result = m_board->take(member.signal, member.module, answer.module, answer.payload, wire.now());
+        if (member.signal.told) {
+            results.push_back(std::move(result));
+        }
+    }
+}
+
+// What was answered by something else is shown as no value, rather than as the one of before.
+void SignalGroup::giveNothing(Request const& request, std::vector<PollResult>& results)
+{
+    for (Member const& member : request.members) {
+        PollResult result = m_board->takeNothing(member.signal, member.module);
         if (member.signal.told) {
             results.push_back(std::move(result));
         }

@@ -51,6 +51,7 @@ private:
     bool askTogether(PollWire& wire, std::vector<Request*> const& requests, std::vector<PollResult>& results);
     std::vector<Request*> together(std::vector<Request*> const& due) const;
     void give(Request& request, ModuleAnswer const& answer, PollWire& wire, std::vector<PollResult>& results);
+    void giveNothing(Request const& request, std::vector<PollResult>& results);
     std::vector<ChosenSignal> signalsOf(Request const& request) const;
 
     std::shared_ptr<SignalBoard> const m_board;

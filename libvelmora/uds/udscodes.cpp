@@ -8,7 +8,6 @@ namespace velmora {
 
 namespace {
 
-constexpr unsigned char mattersMask = 0x8D; // failed, pending, confirmed, warning lamp
 constexpr unsigned char formatJ2012 = 0x00;
 constexpr unsigned char formatJ2012Wwh = 0x04;
 
@@ -16,6 +15,8 @@ constexpr unsigned char failedBit = 0x01;
 constexpr unsigned char pendingBit = 0x04;
 constexpr unsigned char confirmedBit = 0x08;
 constexpr unsigned char lampBit = 0x80;
+
+} // namespace
 
 TopicAnswer topicAnswer(ModuleAnswer const& answer)
 {
@@ -31,8 +32,6 @@ TopicAnswer topicAnswer(ModuleAnswer const& answer)
         return TopicAnswer::Silent;
     }
 }
-
-} // namespace
 
 std::string UdsCode::code() const
 {
@@ -61,6 +60,9 @@ UdsCodeReport readUdsCodes(ModuleAsker& asker, RequestAddress const& address)
     ModuleAnswer const listed = asker.ask(address, {0x19, 0x02, mattersMask}, RequestPurpose::Codes);
     report.answer = topicAnswer(listed);
     report.reason = describe(listed);
+    if (listed.kind == ModuleAnswer::Kind::Refused) {
+        report.refusal = listed.code;
+    }
     if (listed.kind != ModuleAnswer::Kind::Positive) {
         return report;
     }

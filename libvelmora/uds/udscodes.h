@@ -26,15 +26,22 @@ struct UdsCodeReport
 {
     TopicAnswer answer = TopicAnswer::Silent;
     std::string reason;                     // why not, in words
+    std::optional<unsigned char> refusal;   // the code, where it was refused
     std::optional<unsigned char> format;    // of the codes; nothing if the module does not tell it
     std::optional<unsigned int> count;      // as it counts them itself
     std::optional<unsigned char> available; // the status bits that it knows
     std::vector<UdsCode> codes;
 };
 
+// Of the status: failed now, pending, confirmed, or with the warning lamp on.
+inline constexpr unsigned char mattersMask = 0x8D;
+
 // The codes that matter: failed now, pending, confirmed, or with the lamp on (mask 8D). Asks for their number first, by
 // which the module tells how it writes them.
 UdsCodeReport readUdsCodes(ModuleAsker& asker, RequestAddress const& address);
+
+// What an answer is to a reader of codes.
+TopicAnswer topicAnswer(ModuleAnswer const& answer);
 
 // Whether the first two bytes are a code of SAE J2012, with a failure type.
 bool isStandardFormat(UdsCodeReport const& report);

@@ -99,8 +99,8 @@ void addCodesCommand(CommandLine& commandLine)
     command->add_flag("--permanent", chosen->permanent, "Codes that only the vehicle itself erases");
     command
         ->add_flag("--uds", chosen->uds,
-                   "By service 19 of ISO 14229, with failure types and states; also of the\n"
-                   "modules that `modules` has found. CAN only")
+                   "By service 19 of ISO 14229, with failure types and states, or service 18 of\n"
+                   "ISO 14230; also of the modules that `modules` has found")
         ->excludes("--confirmed")
         ->excludes("--pending")
         ->excludes("--permanent");

@@ -5,10 +5,10 @@
 #include "libvelmora/report/json.h"
 #include "libvelmora/report/troublecode.h"
 #include "libvelmora/uds/failuretype.h"
+#include "libvelmora/uds/kwpcodes.h"
 #include "libvelmora/uds/moduleaddress.h"
 #include "libvelmora/uds/modulestore.h"
-#include "libvelmora/uds/signalchoice.h"
-#include "libvelmora/uds/udscodes.h"
+#include "libvelmora/uds/vehiclevin.h"
 #include "program/command/commandsession.h"
 #include "program/terminal/output.h"
 #include "program/view/layout.h"
@@ -30,15 +30,15 @@ struct AskedModule
     std::string request;
     std::string reply;
     std::string name;
-    UdsCodeReport report;
+    CodesByService codes;
 };
 
 std::vector<AskedModule> modulesOf(CommandSession& session)
 {
     std::vector<AskedModule> modules;
     for (std::shared_ptr<obd::IEcu> const& ecu : session.selectedModules()) {
-        if (std::optional<std::string> const request = standardRequest(ecu->id())) {
-            modules.push_back({*request, identifierText(ecu->id()), ecu->name(), {}});
+        if (std::optional<std::string> const request = standardRequest(ecu->id(), session.proxy()->protocol())) {
+            modules.push_back({*request, swappedReply(*request).value_or(identifierText(ecu->id())), ecu->name(), {}});
         }
     }
     if (session.options().ecu) {
@@ -84,24 +84,47 @@ std::vector<Cell> row(UdsCodeReport const& report, UdsCode const& code, MakerCho
     std::string const hex = isStandardFormat(report) ? std::string() : " (" + code.hex() + ")";
     std::string const states =
         fmt::format("{}", fmt::join(statusWords(code.status, report.available.value_or(0)), ", "));
+    bool const told = (report.available.value_or(0) & mattersMask) != 0;
     std::string const text = meaning + (meaning.empty() || type.empty() ? "" : "; ") + type;
-    return {
-        {fmt::format("{}-{:02X}{}", code.code(), code.failureType(), hex)}, {states.empty() ? "-" : states}, {text}};
+    return {{fmt::format("{}-{:02X}{}", code.code(), code.failureType(), hex)},
+            {!states.empty() ? states
+             : told          ? "-"
+                             : "not told"},
+            {text}};
+}
+
+// Numbers and states as the module writes them: neither is settled by ISO 14230-3.
+std::string kwpText(KwpCodeReport const& report, GlobalOptions const& options)
+{
+    if (report.answer != TopicAnswer::Read) {
+        return fmt::format("  service 18 {}\n", report.reason);
+    }
+    std::vector<std::vector<Cell>> rows;
+    for (KwpCode const& code : report.codes) {
+        rows.push_back({{code.hex()}, {fmt::format("status {:02X}", code.status)}});
+    }
+    return rows.empty() ? "  no codes\n"
+                        : "  by service 18, in numbers that may be the maker's own:\n" +
+                              drawColumns(rows, "  ", outputStyle(options));
 }
 
 std::string udsModuleText(AskedModule const& module, MakerChoice const& maker, GlobalOptions const& options)
 {
     std::string text =
-        fmt::format("Control module {}{}\n", module.reply, module.name.empty() ? "" : ": " + module.name);
-    if (module.report.answer != TopicAnswer::Read) {
-        return text + fmt::format("  service 19 {}\n", module.report.reason);
+        fmt::format("Control module {}{}\n", shownModule(module.reply), module.name.empty() ? "" : ": " + module.name);
+    if (module.codes.kwp) {
+        return text + kwpText(*module.codes.kwp, options);
     }
-    if (module.report.codes.empty()) {
+    UdsCodeReport const& report = module.codes.uds;
+    if (report.answer != TopicAnswer::Read) {
+        return text + fmt::format("  service 19 {}\n", report.reason);
+    }
+    if (report.codes.empty()) {
         return text + "  no codes\n";
     }
     std::vector<std::vector<Cell>> rows;
-    for (UdsCode const& code : module.report.codes) {
-        rows.push_back(row(module.report, code, maker));
+    for (UdsCode const& code : report.codes) {
+        rows.push_back(row(report, code, maker));
     }
     return text + drawColumns(rows, "  ", outputStyle(options));
 }
@@ -117,48 +140,40 @@ Json codeJson(UdsCodeReport const& report, UdsCode const& code, MakerChoice cons
             {"failure", textOrNull(typeText(report, code))}};
 }
 
-Json moduleJson(AskedModule const& module, MakerChoice const& maker)
+Json kwpJson(KwpCodeReport const& report)
 {
-    Json codes = nullptr;
-    if (module.report.answer == TopicAnswer::Read) {
-        codes = Json::array();
-        for (UdsCode const& code : module.report.codes) {
-            codes.push_back(codeJson(module.report, code, maker));
-        }
+    Json codes = Json::array();
+    for (KwpCode const& code : report.codes) {
+        codes.push_back({{"hex", code.hex()}, {"status", fmt::format("{:02X}", code.status)}});
     }
-    UdsCodeReport const& report = module.report;
-    return {{"module", module.reply},
-            {"name", textOrNull(module.name)},
-            {"reason", textOrNull(report.reason)},
-            {"format", report.format ? Json(fmt::format("{:02X}", *report.format)) : Json(nullptr)},
-            {"available", report.available ? Json(fmt::format("{:02X}", *report.available)) : Json(nullptr)},
-            {"codes", codes}};
+    return codes;
 }
 
-} // namespace
-
-ExitCode udsCodes(std::string const& named, GlobalOptions const& options)
+Json moduleJson(AskedModule const& module, MakerChoice const& maker)
 {
-    CommandSession session(options);
-    session.connect();
-    if (!isCanBus(session.proxy()->protocol())) {
-        throw Error(ErrorKind::NotSupported, "Service 19 is asked on CAN only",
-                    {"`velmora codes` reads this vehicle's codes"});
-    }
-    std::vector<AskedModule> modules = modulesOf(session);
-    ModuleAsker asker(*session.proxy(), session.channel());
-    bool read = false;
-    bool refused = false;
-    for (AskedModule& module : modules) {
-        AddressOrReason const reached = addressOf(module.request, module.reply, {}, session.proxy()->protocol());
-        if (reached.address) {
-            module.report = readUdsCodes(asker, *reached.address);
+    UdsCodeReport const& report = module.codes.uds;
+    std::optional<KwpCodeReport> const& kwp = module.codes.kwp;
+    Json codes = nullptr;
+    if (!kwp && report.answer == TopicAnswer::Read) {
+        codes = Json::array();
+        for (UdsCode const& code : report.codes) {
+            codes.push_back(codeJson(report, code, maker));
         }
-        session.checkAdapter();
-        read = read || module.report.answer == TopicAnswer::Read;
-        refused = refused || module.report.answer == TopicAnswer::Refused;
     }
-    MakerChoice const maker = readMaker(session, named);
+    Json json = {{"module", shownModule(module.reply)},
+                 {"name", textOrNull(module.name)},
+                 {"reason", textOrNull(kwp ? kwp->reason : report.reason)},
+                 {"format", report.format ? Json(fmt::format("{:02X}", *report.format)) : Json(nullptr)},
+                 {"available", report.available ? Json(fmt::format("{:02X}", *report.available)) : Json(nullptr)},
+                 {"codes", codes}};
+    if (kwp && kwp->answer == TopicAnswer::Read) {
+        json["byService18"] = kwpJson(*kwp);
+    }
+    return json;
+}
+
+void printUdsCodes(std::vector<AskedModule> const& modules, MakerChoice const& maker, GlobalOptions const& options)
+{
     Json document = Json::array();
     for (AskedModule const& module : modules) {
         if (options.json) {
@@ -171,13 +186,46 @@ ExitCode udsCodes(std::string const& named, GlobalOptions const& options)
         fmt::print("{}", printed(document));
     }
     flushOutput();
-    if (!read) {
-        std::vector<std::string> const hints = {"`velmora codes` asks the way that every OBD vehicle knows"};
-        if (refused) {
-            throw Error(ErrorKind::NotSupported, "No control module tells its codes by service 19", hints);
-        }
-        throw silentVehicle(session, "No control module answered service 19", hints);
+}
+
+void requireCodes(CommandSession& session, std::vector<AskedModule> const& modules)
+{
+    auto const any = [&modules](TopicAnswer answer) {
+        return std::any_of(modules.begin(), modules.end(),
+                           [answer](AskedModule const& module) { return module.codes.answer() == answer; });
+    };
+    if (any(TopicAnswer::Read)) {
+        return;
     }
+    std::vector<std::string> const hints = {"`velmora codes` asks the way that every OBD vehicle knows"};
+    if (any(TopicAnswer::Refused)) {
+        throw Error(ErrorKind::NotSupported, "No control module tells its codes by service 19 or 18", hints);
+    }
+    throw silentVehicle(session, "No control module answered service 19 or 18", hints);
+}
+
+} // namespace
+
+ExitCode udsCodes(std::string const& named, GlobalOptions const& options)
+{
+    CommandSession session(options);
+    session.connect();
+    obd::ObdProtocol const protocol = session.proxy()->protocol();
+    if (!isCanBus(protocol) && protocol != obd::ObdProtocolIso14230) {
+        throw Error(ErrorKind::NotSupported, "Services 19 and 18 are asked on CAN and ISO 14230 only",
+                    {"`velmora codes` reads this vehicle's codes"});
+    }
+    std::vector<AskedModule> modules = modulesOf(session);
+    ModuleAsker asker(*session.proxy(), session.channel());
+    for (AskedModule& module : modules) {
+        AddressOrReason const reached = addressOf(module.request, module.reply, {}, protocol);
+        if (reached.address) {
+            module.codes = readModuleCodes(asker, *reached.address);
+        }
+        session.checkAdapter();
+    }
+    printUdsCodes(modules, readMaker(session, named), options);
+    requireCodes(session, modules);
     return ExitCode::Done;
 }
 

@@ -1,8 +1,11 @@
 #include "libvelmora/read/diagnosticreaders.h"
 #include "program/command/commands.h"
 #include "program/command/commandsession.h"
+#include "program/command/infouds.h"
 #include "program/command/modulecommand.h"
 #include "program/commandline.h"
+
+#include <memory>
 
 namespace velmora::cli {
 
@@ -20,7 +23,13 @@ ExitCode info(GlobalOptions const& options)
 
 void addInfoCommand(CommandLine& commandLine)
 {
-    commandLine.addCommand("info", "Show what the control modules report about themselves and the vehicle", info);
+    auto const uds = std::make_shared<bool>(false);
+    CLI::App* const command =
+        commandLine.addCommand("info", "Show what the control modules report about themselves and the vehicle",
+                               [uds](GlobalOptions const& options) { return *uds ? udsInfo(options) : info(options); });
+    command->add_flag("--uds", *uds,
+                      "Also the identifiers of ISO 14229 or ISO 14230, such as part numbers and\n"
+                      "software versions, as far as the modules tell them");
 }
 
 } // namespace velmora::cli

@@ -1,8 +1,10 @@
 #include "libvelmora/report/json.h"
 #include "libvelmora/uds/identification.h"
+#include "libvelmora/uds/moduleaddress.h"
+#include "libvelmora/uds/moduleidentity.h"
 #include "libvelmora/uds/modulescan.h"
 #include "libvelmora/uds/modulestore.h"
-#include "libvelmora/uds/signalchoice.h"
+#include "libvelmora/uds/vehiclevin.h"
 #include "program/command/commands.h"
 #include "program/command/commandsession.h"
 #include "program/commandline.h"
@@ -49,7 +51,7 @@ std::string modulesText(std::vector<FoundModule> const& modules, GlobalOptions c
     std::vector<std::vector<Cell>> rows{{{"asked"}, {"answers"}, {"name"}, {"part"}, {"software"}, {"codes"}}};
     for (FoundModule const& each : modules) {
         rows.push_back({{each.request},
-                        {each.reply},
+                        {shownModule(each.reply)},
                         {shown(each.name)},
                         {shown(each.part)},
                         {shown(each.software)},
@@ -60,14 +62,24 @@ std::string modulesText(std::vector<FoundModule> const& modules, GlobalOptions c
         if (each.identifiers.empty()) {
             continue;
         }
-        text += fmt::format("\nControl module {}\n", each.reply);
-        for (IdentifierRow const& row : standardIdentifiers()) {
-            if (auto const told = each.identifiers.find(row.did); told != each.identifiers.end()) {
-                text += fmt::format("  {:04X}  {:<58}  {}\n", row.did, row.name, told->second);
-            }
+        text += fmt::format("\nControl module {}\n", shownModule(each.reply));
+        for (auto const& [did, told] : each.identifiers) {
+            text += fmt::format("  {:04X}  {:<58}  {}\n", did, identifierName(did), told);
         }
     }
     return text;
+}
+
+// Before CAN, modules beyond those that the connection has started each need a start of their own, which would end it.
+std::vector<FoundModule> modulesOfConnection(CommandSession& session)
+{
+    std::vector<FoundModule> modules;
+    for (std::shared_ptr<obd::IEcu> const& ecu : session.proxy()->ecus()) {
+        if (std::optional<std::string> const request = standardRequest(ecu->id(), session.proxy()->protocol())) {
+            modules.push_back({*request, swappedReply(*request).value_or(std::string()), ecu->name(), {}, {}, {}});
+        }
+    }
+    return modules;
 }
 
 void keep(ModuleStore const& store, std::string const& vin, std::vector<FoundModule> const& modules, bool quiet)
@@ -77,6 +89,25 @@ void keep(ModuleStore const& store, std::string const& vin, std::vector<FoundMod
     } else if (!quiet) {
         tell("The vehicle tells no VIN, so the modules are not remembered\n");
     }
+}
+
+std::vector<FoundModule> foundModules(CommandSession& session, std::optional<std::vector<FoundModule>> known, bool anew,
+                                      ModuleScan& finder)
+{
+    GlobalOptions const& options = session.options();
+    if (session.proxy()->protocol() == obd::ObdProtocolIso14230) {
+        if (!options.quiet) {
+            tell("On this bus those that the connection has started; others would need a start of their own\n");
+        }
+        return modulesOfConnection(session);
+    }
+    if (anew || !known) {
+        return scan(finder, options);
+    }
+    if (!options.quiet) {
+        tell("These are remembered of this vehicle; --scan looks anew\n");
+    }
+    return std::move(*known);
 }
 
 ExitCode modules(ModulesOptions const& chosen, GlobalOptions const& options)
@@ -90,15 +121,12 @@ ExitCode modules(ModulesOptions const& chosen, GlobalOptions const& options)
     ModuleScan finder(
         asker, [&session] { session.check(); },
         drawn ? std::function<void(ScanProgress const&)>(tellScan) : std::function<void(ScanProgress const&)>());
-    std::optional<std::vector<FoundModule>> known = chosen.scan ? std::nullopt : store.find(vin);
-    if (known && !options.quiet) {
-        tell("These are remembered of this vehicle; --scan looks anew\n");
-    }
-    std::vector<FoundModule> found = known ? std::move(*known) : scan(finder, options);
+    ModuleIdentity identity(asker, [&session] { session.check(); });
+    std::vector<FoundModule> found = foundModules(session, store.find(vin), chosen.scan, finder);
     for (FoundModule& each : found) {
-        finder.identify(each);
+        identity.identify(each);
         if (chosen.all) {
-            finder.readIdentifiers(each);
+            identity.readIdentifiers(each);
         }
     }
     session.checkAdapter();

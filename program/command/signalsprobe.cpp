@@ -7,7 +7,7 @@
 #include "libvelmora/uds/identification.h"
 #include "libvelmora/uds/identifierprobe.h"
 #include "libvelmora/uds/refusalcode.h"
-#include "libvelmora/uds/signalchoice.h"
+#include "libvelmora/uds/vehiclevin.h"
 #include "program/command/commandsession.h"
 #include "program/terminal/output.h"
 #include "program/terminal/promptreader.h"
@@ -46,11 +46,12 @@ ProbeTask taskOf(ProbeOptions const& options)
     task.reply = hexDigits(options.reply).value_or(std::string());
     if (task.reply.empty()) {
         std::optional<std::string> const standard = standardReply(task.header);
-        if (!standard) {
+        std::optional<std::string> const swapped = standard ? standard : swappedReply(task.header);
+        if (!swapped) {
             throw Error(ErrorKind::WrongUse, "The identifier of this module's replies has to be told, with --reply",
                         {"`velmora modules` finds it"});
         }
-        task.reply = *standard;
+        task.reply = *swapped;
     }
     if (!options.extended.empty()) {
         task.extended = static_cast<unsigned char>(hexadecimal(options.extended, "--ext", 0xFF));

@@ -155,6 +155,7 @@ void Module::clear(Time now)
     m_data.stored.clear();
     m_data.pending.clear();
     m_data.udsCodes.clear();
+    m_data.kwpCodes.clear();
     for (auto& frame : m_data.frames) {
         frame.code = 0;
     }

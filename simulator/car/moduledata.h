@@ -116,6 +116,13 @@ struct UdsCode
     std::uint8_t status = 0;
 };
 
+/// A trouble code of service 18 (ISO 14230-3): two bytes and a status of the maker's.
+struct KwpCode
+{
+    std::uint16_t code = 0;
+    std::uint8_t status = 0;
+};
+
 /// All that a vehicle file says of one control module.
 struct ModuleData
 {
@@ -153,6 +160,8 @@ struct ModuleData
     std::map<Bytes, SignalData> signals;    ///< by request: service 22 with identifier, 21 or 1A with local identifier
     bool uds = false;                       ///< answers services 3E and 19
     std::vector<UdsCode> udsCodes;
+    bool hasKwpCodes = false; ///< answers service 18
+    std::vector<KwpCode> kwpCodes;
 };
 
 /// The least that ISO 9141-2 has for its W4.

@@ -27,6 +27,7 @@ const Service services[] = {
     {0x08, runRoutine, [](ModuleData const& d) { return !d.routines.empty(); }},
     {0x09, vehicleInformation, hasVehicleInformation},
     {0x0A, permanentCodes, [](ModuleData const& d) { return d.hasPermanent; }},
+    {0x18, kwpCodes, [](ModuleData const& d) { return d.hasKwpCodes; }},
     {0x19, udsCodes, [](ModuleData const& d) { return d.uds; }},
     {0x1A, localData, hasSignals<0x1A>},
     {0x21, localData, hasSignals<0x21>},

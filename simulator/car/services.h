@@ -81,5 +81,6 @@ Answer identifiedData(ServiceCall const& call);
 Answer localData(ServiceCall const& call);
 Answer testerPresent(ServiceCall const& call);
 Answer udsCodes(ServiceCall const& call);
+Answer kwpCodes(ServiceCall const& call);
 
 } // namespace obdsim

@@ -89,6 +89,23 @@ Answer testerPresent(ServiceCall const& call)
                                          : Answer{refusal::subfunctionNotSupported, {}};
 }
 
+/// Service 18: the stored codes of all groups, in one of the two forms that testers ask for.
+Answer kwpCodes(ServiceCall const& call)
+{
+    constexpr std::size_t length = 4;
+    bool const stored = call.at(1) == std::uint8_t{0x00} || call.at(1) == std::uint8_t{0x02};
+    if (call.request.size() != length || !stored) {
+        return {refusal::subfunctionNotSupported, {}};
+    }
+    auto const& codes = call.module.data().kwpCodes;
+    Bytes message = {call.positiveService(), static_cast<std::uint8_t>(codes.size())};
+    for (auto const& code : codes) {
+        appendWord(message, code.code);
+        message.push_back(code.status);
+    }
+    return {0, {message}};
+}
+
 /// Service 19: 01 counts, 02 lists the codes whose status has a bit of the mask, 0A all.
 Answer udsCodes(ServiceCall const& call)
 {

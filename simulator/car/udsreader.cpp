@@ -53,6 +53,11 @@ void readUdsOf(ModuleData& module, TableReader& table)
         const std::uint8_t type = code.byte("type");
         module.udsCodes.push_back({number, type, code.byte("status")});
     });
+    module.hasKwpCodes = table.has("kwp_codes");
+    table.tables("kwp_codes", [&](TableReader& code) {
+        const std::uint16_t number = readCode(code, "code", code.text("code"));
+        module.kwpCodes.push_back({number, code.byte("status")});
+    });
     table.table("refusals", [&](TableReader& refusals) {
         refusals.entries([&](Bytes const& request, std::vector<Bytes> const& codes) {
             if (codes.size() != 1 || codes[0].size() != 1) {

@@ -8,6 +8,8 @@
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
 
+#include <fstream>
+
 namespace {
 
 using e2e::Outcome;
@@ -15,6 +17,7 @@ using e2e::runVelmora;
 using nlohmann::json;
 using support::expectValid;
 using testing::HasSubstr;
+using testing::Not;
 
 class Signals : public testing::Test
 {
@@ -45,7 +48,8 @@ TEST_F(Signals, ModulesAreFoundRememberedAndTellTheirCodes)
     EXPECT_EQ(byRequest["743"]["software"], "BCM-0023");
     ASSERT_TRUE(byRequest.contains("7E0"));
     EXPECT_EQ(byRequest["7E0"]["codes"], 1);
-    EXPECT_TRUE(byRequest.contains("7D6")) << "an old one that refuses the question";
+    ASSERT_TRUE(byRequest.contains("7D6")) << "an old one that refuses the question";
+    EXPECT_EQ(byRequest["7D6"]["identifiers"]["1A90"], "S1M60000022");
     EXPECT_FALSE(byRequest.contains("7DF"));
     Outcome const again = run({"--json", "modules", "--all"});
     EXPECT_EQ(again.exitCode, 0);
@@ -65,6 +69,45 @@ TEST_F(Signals, ModulesAreFoundRememberedAndTellTheirCodes)
     EXPECT_EQ(code["states"], json::parse(R"(["present", "confirmed", "lamp"])"));
     EXPECT_THAT(code["meaning"].get<std::string>(), HasSubstr("O2 Sensor"));
     EXPECT_TRUE(byModule.contains("763")) << "the modules that were found are asked, too";
+    EXPECT_EQ(byModule["7DE"]["byService18"], json::parse(R"([{"hex": "4155", "status": "60"}])")) << codes.out;
+    EXPECT_EQ(byModule["7DE"]["codes"], nullptr);
+}
+
+TEST_F(Signals, ModulesOfAKLineTellWhatIso14230Has)
+{
+    Outcome const found = run({"--json", "modules"}, "petrol-kwp-fast");
+    ASSERT_EQ(found.exitCode, 0) << found.err;
+    expectValid(found.out, "modules");
+    json const modules = json::parse(found.out);
+    ASSERT_EQ(modules.size(), 2U) << found.out;
+    EXPECT_EQ(modules[0]["request"], "8011F1");
+    EXPECT_EQ(modules[0]["codes"], 1);
+    EXPECT_EQ(modules[0]["identifiers"]["1A90"], "VELMRAK1M70000004");
+    EXPECT_EQ(modules[1]["codes"], nullptr) << "it is silent";
+    Outcome const codes = run({"codes", "--uds"}, "petrol-kwp-fast");
+    EXPECT_EQ(codes.exitCode, 0) << codes.err;
+    EXPECT_THAT(codes.out, HasSubstr("0420  status E8"));
+    EXPECT_THAT(codes.out, Not(HasSubstr("Catalyst"))) << "nobody says that the number is one of SAE J2012";
+    Outcome const info = run({"--json", "info", "--uds"}, "electric-can11");
+    EXPECT_EQ(info.exitCode, 0) << info.err;
+    expectValid(info.out, "info");
+    EXPECT_THAT(info.out, HasSubstr("\"F195\": \"BC-0412\""));
+    EXPECT_EQ(run({"modules"}, "petrol-vpw").exitCode, 6);
+}
+
+TEST_F(Signals, AWatchChecksTheFilesThatItsSettingsName)
+{
+    std::ofstream(m_folder.file("mine.toml")) << "[[signal]]\nid = \"X\"\nname = \"X\"\nrequest = \"2E01\"\n"
+                                                 "formula = \"A+\"\n";
+    std::ofstream(m_folder.file("watch.toml")) << "signals = [\"mine.toml\"]\n";
+    Outcome const wrong = run({"watch", "--config", m_folder.file("watch.toml"), "--check-config"});
+    EXPECT_EQ(wrong.exitCode, 2);
+    EXPECT_THAT(wrong.err, HasSubstr("mine.toml:4: signal 1, request: service 2E writes"));
+    EXPECT_THAT(wrong.err, HasSubstr("mine.toml:5: signal 1, formula"));
+    std::ofstream(m_folder.file("mine.toml")) << "[[signal]]\nid = \"X\"\nname = \"X\"\nrequest = \"2101\"\n"
+                                                 "formula = \"A\"\n";
+    Outcome const right = run({"watch", "--config", m_folder.file("watch.toml"), "--check-config"});
+    EXPECT_EQ(right.exitCode, 0) << right.err;
 }
 
 TEST_F(Signals, AProbeWritesAFileToStartFrom)

@@ -37,6 +37,9 @@ protected:
         IdentifierProbe probe(
             m_asker,
             [this] {
+                if (m_checksLeft == m_movesAt) {
+                    m_bench.answer("01 0D", "41 0D 07");
+                }
                 if (m_checksLeft-- == 0) {
                     throw Error(ErrorKind::Interrupted, "Interrupted");
                 }
@@ -60,6 +63,7 @@ protected:
     ProbeState m_state;
     std::optional<ProbeState> m_saved;
     int m_checksLeft = 1000;
+    int m_movesAt = -1; // how many checks are left then
 };
 
 TEST_F(IdentifierProbeTest, ListsWhatAnswersWhatIsLockedAndWhatChanges)
@@ -133,6 +137,19 @@ TEST_F(IdentifierProbeTest, StopsOnTrouble)
     EXPECT_THAT(failure(), HasSubstr("writes into a module"));
     m_state.task.service = 0x21;
     EXPECT_THAT(failure(), HasSubstr("no range of identifiers"));
+}
+
+// The second look at many identifiers takes as long as the first.
+TEST_F(IdentifierProbeTest, WatchesTheSpeedDuringTheSecondLook)
+{
+    m_state.task.from = m_state.task.to = m_state.next = 0xF190;
+    for (unsigned int id = 0xF100; id < 0xF180; ++id) {
+        m_state.told[id] = {0x01};
+    }
+    m_movesAt = m_checksLeft - 20;
+    EXPECT_THAT(failure(), HasSubstr("moves (7 km/h)"));
+    EXPECT_EQ(m_state.next, 0xF191U) << "the first look was over";
+    ASSERT_TRUE(m_saved);
 }
 
 TEST(ModuleStore, RemembersByVin)

@@ -130,6 +130,20 @@ TEST_F(SignalGroupTest, LeavesAloneWhatWasRefused)
     EXPECT_THAT(m_bench->takeAsked(), IsEmpty()) << "who stops does not wait for requests";
 }
 
+TEST_F(SignalGroupTest, CountsAWrongEchoAndShowsNoValue)
+{
+    SignalGroup group(m_board, m_asker, addressOf("7E4", {}, {}, obd::ObdProtocolCan11).address);
+    group.add(chosen("ONE"), 0x7EC);
+    group.addWorkedOut(chosen("SUM"));
+    m_bench->module("7E4", "220101", {"7EC0462010105"}).module("7E4", "220101", {"7EC0462010205"});
+    EXPECT_EQ(turn(group), "ONE=5.00");
+    EXPECT_EQ(turn(group), "ONE=-") << "the value of before is not shown on";
+    auto const troubles = m_board->troubles();
+    ASSERT_EQ(troubles.size(), 1U);
+    EXPECT_EQ(troubles.front().withoutValue, 1U);
+    EXPECT_EQ(troubles.front().reason, "is answered by something else");
+}
+
 TEST_F(SignalGroupTest, TakesABroadcastFromWhoeverAnswersItRightly)
 {
     SignalGroup group(m_board, m_asker, std::nullopt);

@@ -80,6 +80,29 @@ TEST(Service19, countsAndListsCodes)
     EXPECT_EQ(host.ask("1903"), "7F1912\r\r>");
 }
 
+TEST(Service18, listsCodesOfModulesBeforeService19)
+{
+    auto host = reached("petrol-can11-modules", {"ATSH7D6", "ATCRA7DE"});
+    EXPECT_EQ(host.ask("1800FF00"), "5801415560\r\r>");
+    EXPECT_EQ(host.ask("1802FF00"), "5801415560\r\r>");
+    EXPECT_EQ(host.ask("1801FF00"), "7F1812\r\r>");
+    EXPECT_EQ(host.ask("19028D"), "7F1911\r\r>");
+}
+
+TEST(OwnHeaders, ofALegacyBusReachOneModule)
+{
+    auto host = simulated("petrol-kwp-fast", "elm327-v1.5");
+    host.ask({"ATE0", "ATS0", "ATH1", "ATSP5", "0100", "ATSH8018F1"});
+    EXPECT_EQ(host.ask("2101"), "83F11861013C2A\r\r>");
+    host.ask("ATSH8011F1");
+    EXPECT_EQ(host.ask("1800FF00"), "85F11158010420E8EC\r\r>");
+    std::string const longReply = host.ask("2102");
+    EXPECT_EQ(longReply.substr(0, 12), "80F111426102") << "66 bytes are more than the format byte tells";
+    EXPECT_EQ(longReply.size(), 2 * (4 + 66 + 1) + 3U);
+    host.ask("ATSH8040F1");
+    EXPECT_EQ(host.ask("2101"), "NO DATA\r\r>");
+}
+
 TEST(ReceiveFilter, takesObdModulesOnlyUntilTold)
 {
     auto host = reached("electric-can11", {"ATSH7B3"});
