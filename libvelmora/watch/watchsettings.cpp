@@ -9,7 +9,7 @@
 #include <fmt/format.h>
 
 #include <algorithm>
-#include <charconv>
+#include <filesystem>
 #include <fstream>
 #include <iterator>
 
@@ -34,6 +34,7 @@ private:
     void readOutputs(toml::node const& node, std::string const& key);
     void readOutput(toml::node const& node);
     void readSensors(toml::node const& node);
+    void readSignals(toml::node const& node, std::string const& key);
     void readBattery(toml::node const& node, std::string const& key);
     void readVehicle(toml::node const& node, std::string const& key);
     void readVin(toml::node const& node, std::string const& key);
@@ -90,6 +91,23 @@ void WatchSettingsReader::readSensors(toml::node const& node)
             m_settings.sensors.push_back(text);
         } catch (Error const& error) {
             m_table.mistake(each, "sensors", error.what());
+        }
+    }
+}
+
+void WatchSettingsReader::readSignals(toml::node const& node, std::string const& key)
+{
+    toml::array const* const list = node.as_array();
+    if (list == nullptr) {
+        m_table.mistake(node, key, "must be a list of files, such as [\"gearbox.toml\"]");
+        return;
+    }
+    for (toml::node const& each : *list) {
+        std::string const file = each.value_exact<std::string>().value_or("");
+        if (file.empty()) {
+            m_table.mistake(each, key, "must be the name of a file");
+        } else {
+            m_settings.signals.push_back(file);
         }
     }
 }
@@ -167,6 +185,7 @@ WatchSettings WatchSettingsReader::read(toml::table const& root)
                   {"fast", m_table.into(m_settings.fast, "true or false")},
                   {"codes_every", m_table.duration(m_settings.codesEvery)},
                   {"sensors", [this](toml::node const& node, std::string const&) { readSensors(node); }},
+                  {"signals", by(&WatchSettingsReader::readSignals)},
                   {"output", by(&WatchSettingsReader::readOutputs)},
                   {"battery", by(&WatchSettingsReader::readBattery)}});
     return m_settings;
@@ -202,49 +221,11 @@ WatchSettings readWatchSettings(std::string const& file)
     if (!in) {
         throw Error(ErrorKind::WrongUse, "Could not read " + file, {"does the file exist, and may you read it?"});
     }
-    return parseWatchSettings(text, file);
-}
-
-std::optional<std::chrono::milliseconds> parseDuration(std::string_view text)
-{
-    struct Unit
-    {
-        std::string_view name;
-        std::int64_t millis;
-    };
-    static constexpr Unit units[] = {{"ms", 1}, {"s", 1000}, {"min", 60000}, {"h", 3600000}};
-    constexpr std::int64_t highest = 1000000;
-    std::int64_t value = 0;
-    char const* const end = text.data() + text.size();
-    auto const [stop, error] = std::from_chars(text.data(), end, value);
-    auto const* const unit = std::ranges::find(units, std::string_view(stop, end), &Unit::name);
-    if (error != std::errc() || value <= 0 || value > highest || unit == std::end(units)) {
-        return std::nullopt;
+    WatchSettings settings = parseWatchSettings(text, file);
+    for (std::string& each : settings.signals) {
+        each = (std::filesystem::path(file).parent_path() / each).string(); // an absolute one stays
     }
-    return std::chrono::milliseconds(value * unit->millis);
-}
-
-bool parseWake(std::string_view text, BatterySettings& settings)
-{
-    if (text == "voltage") {
-        settings.wakeEvery.reset();
-        return true;
-    }
-    std::string_view const every = "every ";
-    auto const pause = text.starts_with(every) ? parseDuration(text.substr(every.size())) : std::nullopt;
-    if (!pause || *pause < std::chrono::minutes(1)) {
-        return false;
-    }
-    settings.wakeEvery = std::chrono::floor<std::chrono::minutes>(*pause);
-    return true;
-}
-
-bool isVehicleName(std::string_view text)
-{
-    return !text.empty() && text.size() <= 64 && std::ranges::all_of(text, [](char each) {
-        return (each >= 'a' && each <= 'z') || (each >= 'A' && each <= 'Z') || (each >= '0' && each <= '9') ||
-               each == '-' || each == '_';
-    });
+    return settings;
 }
 
 } // namespace velmora

@@ -18,6 +18,7 @@ struct WatchSettings
     bool fullVin = false;
     bool fast = false;
     std::vector<std::string> sensors; // as sensor wishes: "RPM@10hz"
+    std::vector<std::string> signals; // files of signals of one's own
     std::vector<OutputAddress> outputs;
     BatterySettings battery;
     std::chrono::minutes codesEvery{10};
@@ -27,7 +28,7 @@ struct WatchSettings
 // the file is called in it.
 WatchSettings parseWatchSettings(std::string_view text, std::string const& name);
 
-// Throws Error if the file can't be read, and as parseWatchSettings.
+// Throws Error if the file can't be read, and as parseWatchSettings. Signal files are named from its folder.
 WatchSettings readWatchSettings(std::string const& file);
 
 // "90s", "2min", "1h", "250ms"; nothing for any other text and for none at all.

@@ -1,4 +1,5 @@
 #include "libvelmora/poll/sensorwish.h"
+#include "libvelmora/signal/signalfile.h"
 #include "program/command/commands.h"
 #include "program/command/lastresort.h"
 #include "program/command/watchcommand.h"
@@ -8,6 +9,8 @@
 #include "program/terminal/output.h"
 
 #include <velmora/error.h>
+
+#include <fmt/format.h>
 
 #include <unistd.h>
 
@@ -20,10 +23,26 @@ namespace {
     throw Error(ErrorKind::WrongUse, option + ": \"" + text + "\" is not " + expected);
 }
 
+// A watch that runs for months had better not begin, nor go on, with files that it can't read.
+void checkSignalFiles(std::vector<std::string> const& files)
+{
+    std::vector<std::string> mistakes;
+    for (std::string const& file : files) {
+        for (SignalMistake const& each : checkSignalFile(file).mistakes) {
+            mistakes.push_back(toText(each, file));
+        }
+    }
+    if (!mistakes.empty()) {
+        throw Error(ErrorKind::WrongUse, fmt::format("{}", fmt::join(mistakes, "\n")));
+    }
+}
+
 // What the command line says stands above what the file says; outputs come on top.
-WatchSettings settingsOf(WatchOptions const& chosen)
+WatchSettings settingsOf(GlobalOptions const& global, WatchOptions const& chosen)
 {
     WatchSettings settings = chosen.config.empty() ? WatchSettings() : readWatchSettings(chosen.config);
+    checkSignalFiles(settings.signals);
+    checkSignalFiles(global.signalFiles);
     if (!chosen.sensors.empty()) {
         settings.sensors = chosen.sensors;
         for (std::string const& each : chosen.sensors) {
@@ -64,7 +83,7 @@ class WatchCommand
 {
 public:
     WatchCommand(GlobalOptions const& global, WatchOptions const& chosen)
-        : m_global(global), m_chosen(chosen), m_settings(settingsOf(chosen))
+        : m_global(global), m_chosen(chosen), m_settings(settingsOf(global, chosen))
     {
         Interrupt::instance().setHandler([this] {
             end();
@@ -149,7 +168,7 @@ private:
     {
         m_notify.tell("RELOADING=1");
         try {
-            m_settings = settingsOf(m_chosen);
+            m_settings = settingsOf(m_global, m_chosen);
             tell("The settings were read again\n");
         } catch (Error const& error) {
             tell(std::string("The settings stay as they were: ") + error.what() + "\n");
@@ -171,7 +190,7 @@ private:
 ExitCode runWatch(GlobalOptions const& global, WatchOptions const& chosen)
 {
     if (chosen.checkConfig) {
-        settingsOf(chosen);
+        settingsOf(global, chosen);
         tell("The settings make sense\n");
         return ExitCode::Done;
     }

@@ -39,6 +39,8 @@ SessionCarOptions carOptions(GlobalOptions const& options, WatchSettings const& 
     result.session.traceFile = options.traceFile;
     result.session.settingsFile = options.settingsFile;
     result.session.signalFiles = options.signalFiles;
+    result.session.signalFiles.insert(result.session.signalFiles.end(), settings.signals.begin(),
+                                      settings.signals.end());
     if (result.session.settingsFile.empty() && runsAsService()) {
         result.session.settingsFile = stateFolder() / "settings.toml";
     }

@@ -1,9 +1,12 @@
 #include "libvelmora/watch/watchsettings.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <velmora/error.h>
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
+
+#include <fstream>
 
 namespace {
 
@@ -104,6 +107,17 @@ qos = 1
     EXPECT_THAT(settingsComplaint("output = 3\nbattery = 4"),
                 AllOf(HasSubstr("w.toml:1: output: must"), HasSubstr("w.toml:2: battery: must")));
     EXPECT_EQ(settingsComplaint(""), "");
+    EXPECT_THAT(settingsComplaint("signals = \"mine.toml\""), HasSubstr("w.toml:1: signals: must be a list of files"));
+    EXPECT_THAT(settingsComplaint("signals = [\n3]"), HasSubstr("w.toml:2: signals: must be the name of a file"));
+}
+
+TEST(WatchSettings, NamesSignalFilesFromItsOwnFolder)
+{
+    testsupport::TemporaryFolder folder;
+    std::string const file = folder.file("watch.toml");
+    std::ofstream(file) << "signals = [\"mine.toml\", \"/etc/theirs.toml\"]\n";
+    EXPECT_THAT(velmora::readWatchSettings(file).signals, ElementsAre(folder.file("mine.toml"), "/etc/theirs.toml"));
+    EXPECT_THAT(parseWatchSettings("signals = [\"mine.toml\"]", "w").signals, ElementsAre("mine.toml"));
 }
 
 TEST(WatchSettings, TimesHaveUnits)
