@@ -2,6 +2,7 @@
 
 #include "libvelmora/read/sensorlimits.h"
 #include "libvelmora/session/settingsstore.h"
+#include "libvelmora/uds/vehiclevin.h"
 #include "libvelmora/vehicle/vehiclekey.h"
 #include "program/terminal/output.h"
 #include "program/view/livelines.h"
