@@ -246,6 +246,24 @@ TEST(LegacyModules, OfASimulatedCarAreReadBesideStandardSensors)
     EXPECT_TRUE(number(*bySensor.at("SPEED")));
 }
 
+TEST(LegacyModules, OfAJ1850CarAnswerAtTheirOwnHeader)
+{
+    testsupport::TemporaryFolder folder;
+    CarOptions options;
+    options.port = "sim:petrol-vpw?instant";
+    options.settingsFile = folder.file("settings.toml");
+    options.signalFiles = {folder.file("vpw.toml")};
+    std::ofstream(folder.file("vpw.toml")) << "[[signal]]\nid = \"OIL\"\nname = \"Oil\"\nheader = \"6C18F1\"\n"
+                                              "reply = \"6CF118\"\nrequest = \"220102\"\nformula = \"A-40\"\n";
+    Car car(options);
+    std::vector<Reading> const readings = car.read({"OIL", "RPM"});
+    ASSERT_EQ(readings.size(), 2U);
+    for (Reading const& each : readings) {
+        EXPECT_TRUE(number(each)) << each.sensor;
+        EXPECT_EQ(each.module, each.sensor == "OIL" ? 0x18U : 0x10U);
+    }
+}
+
 } // namespace
 
 } // namespace velmora
