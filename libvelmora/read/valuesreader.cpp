@@ -29,7 +29,9 @@ public:
                                                               obd::ParameterIdentifier(pid).id()))
     {
         if (m_parameter != nullptr) {
-            m_told = m_parameter->update(session.proxy()) == obd::IQuery::UpdateStatus::UpdateOk;
+            // An update is well where any module answered; the values of one that did not would be fallbacks.
+            m_told = m_parameter->update(session.proxy()) == obd::IQuery::UpdateStatus::UpdateOk &&
+                     m_parameter->delivered(ecu);
             session.check();
         }
     }

@@ -1,4 +1,5 @@
 #include "libvelmora/port/opening/openport.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <obd/iconnectionmanager.h>
 #include <obd/iecumanager.h>
@@ -10,6 +11,7 @@
 
 #include <atomic>
 #include <condition_variable>
+#include <fstream>
 #include <mutex>
 #include <sstream>
 #include <thread>
@@ -221,6 +223,34 @@ TEST(CarLife, ClearsCodesOfAllModules)
     for (velmora::StoredCode const& code : car.codes()) {
         EXPECT_EQ(code.kind, velmora::CodeKind::Permanent) << code;
     }
+}
+
+TEST(CarLife, AModuleThatIsSilentWhereAnotherAnswersHasNoValuesInTheReport)
+{
+    testsupport::TemporaryFolder const folder;
+    std::string const file = folder.file("silent.toml");
+    std::ofstream(file) << R"(name = "two modules, of which one does not tell what it claims"
+protocol = 6
+[[module]]
+id = "7E8"
+[module.raw]
+"0100" = "41 00 08 00 00 01"
+"0120" = "41 20 00 01 00 00"
+[[module]]
+id = "7E9"
+[module.raw]
+"0100" = "41 00 08 00 00 01"
+"0120" = "41 20 00 01 00 00"
+"0105" = "41 05 82"
+"0130" = "41 30 07"
+)";
+    Car car(simulated(file));
+    velmora::VehicleReport const report = car.report();
+    ASSERT_EQ(report.modules.size(), 2U);
+    EXPECT_TRUE(report.modules[0].values.empty()) << report.modules[0].values.front().value;
+    ASSERT_EQ(report.modules[1].values.size(), 2U);
+    EXPECT_EQ(report.modules[1].values[0].value, "90");
+    EXPECT_EQ(report.modules[1].values[1].value, "7");
 }
 
 TEST(CarLife, KeepsToOneModuleAndToTheUnitsOfItsOptions)
