@@ -160,7 +160,7 @@ void values(benchmark::State& state, Way way, Row const& row)
         std::atomic<unsigned int> count{0};
         auto const choices = choosePolled(sensors, moduleOffers(session.obd(), {}), std::nullopt);
         auto const poller = pollVehicle(
-            session.obd(), choices, will,
+            session.obd(), choices, will, Units::Metric,
             [&](PollResult const& result) { count += static_cast<unsigned int>(result.readings.size()); },
             way == Way::FastBroadcast ? nullptr : &session.channel());
         std::this_thread::sleep_for(settling);

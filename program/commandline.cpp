@@ -79,10 +79,10 @@ std::optional<Value> parseWord(std::map<std::string, Value> const& words, std::s
     return found != words.end() ? std::optional(found->second) : std::nullopt;
 }
 
-std::optional<obd::UnitSystem> parseUnits(std::string const& text)
+std::optional<Units> parseUnits(std::string const& text)
 {
-    return parseWord<obd::UnitSystem>({{"metric", obd::UnitSystem::Metric}, {"imperial", obd::UnitSystem::Imperial}},
-                                      text);
+    return parseWord<Units>(
+        {{"metric", Units::Metric}, {"imperial", Units::Imperial}, {"imperial-uk", Units::ImperialUk}}, text);
 }
 
 std::optional<ColorMode> parseColor(std::string const& text)
@@ -131,8 +131,8 @@ void CommandLine::addGlobalOptions()
     addParsed(m_app, "-P,--protocol", m_options.protocol, parseProtocol, "auto or a number from 1 to 9",
               "Bus protocol: auto or 1 to 9")
         ->type_name("N");
-    addParsed(m_app, "-u,--units", m_options.units, parseUnits, "metric or imperial",
-              "Unit system for this run: metric or imperial")
+    addParsed(m_app, "-u,--units", m_options.units, parseUnits, "metric, imperial or imperial-uk",
+              "Unit system for this run: metric, imperial (gallons of the US) or imperial-uk")
         ->type_name("SYSTEM");
     m_app
         .add_option_function<std::string>(

@@ -1,6 +1,7 @@
 #pragma once
 
-#include <obd/unitsystem.h>
+#include "libvelmora/vehicle/units.h"
+
 #include <obd/vehicleprotocol.h>
 
 #include <optional>
@@ -22,7 +23,7 @@ struct GlobalOptions
     std::string port;
     std::optional<unsigned int> baud;
     std::optional<obd::VehicleProtocol> protocol;
-    std::optional<obd::UnitSystem> units;
+    std::optional<Units> units;
     std::optional<unsigned int> ecu; // control module id
     bool allEcus = false;            // all of them, where one is the usual
     bool json = false;

@@ -99,7 +99,7 @@ manual::Sources sources()
             {"SENSOR", sensors},
             {"CODE", troubleCodes},
             {"MAKER", makers},
-            {"SYSTEM", fixed({"metric", "imperial"})},
+            {"SYSTEM", fixed({"metric", "imperial", "imperial-uk"})},
             {"WHEN", fixed({"auto", "always", "never"})},
             {"KIND:TARGET", fixed({"csv:", "csv-long:", "ndjson:", "sqlite:", "influx:", "prometheus:", "mqtt://"})},
             {"--listen", fixed({"pty", "tcp://127.0.0.1:0"})},

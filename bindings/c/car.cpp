@@ -42,12 +42,18 @@ public:
     Calling& operator=(Calling const&) = delete;
 };
 
-obd::UnitSystem unitSystem(uint32_t number)
+Units toUnits(uint32_t number)
 {
-    if (number != VELMORA_UNITS_METRIC && number != VELMORA_UNITS_IMPERIAL) {
+    switch (number) {
+    case VELMORA_UNITS_METRIC:
+        return Units::Metric;
+    case VELMORA_UNITS_IMPERIAL:
+        return Units::Imperial;
+    case VELMORA_UNITS_IMPERIAL_UK:
+        return Units::ImperialUk;
+    default:
         throw Error(ErrorKind::WrongUse, "velmora_options.units is one of VELMORA_UNITS_...");
     }
-    return number == VELMORA_UNITS_METRIC ? obd::UnitSystem::Metric : obd::UnitSystem::Imperial;
 }
 
 CarOptions carOptions(velmora_car const* car, char const* port, velmora_options const& given)
@@ -68,7 +74,7 @@ CarOptions carOptions(velmora_car const* car, char const* port, velmora_options 
         options.module = given.module;
     }
     if (given.units != VELMORA_UNITS_BY_SETTINGS) {
-        options.units = unitSystem(given.units);
+        options.units = toUnits(given.units);
     }
     options.sleep = given.sleep != 0;
     if (given.on_progress != nullptr) {

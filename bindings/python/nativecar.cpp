@@ -24,6 +24,20 @@ void take(py::dict const& options, char const* name, std::optional<Value>& targe
     }
 }
 
+Units toUnits(std::string const& text)
+{
+    if (text == "metric") {
+        return Units::Metric;
+    }
+    if (text == "imperial") {
+        return Units::Imperial;
+    }
+    if (text == "imperial-uk") {
+        return Units::ImperialUk;
+    }
+    throw Error(ErrorKind::WrongUse, "units is metric, imperial or imperial-uk, not \"" + text + "\"");
+}
+
 } // namespace
 
 NativeCar::NativeCar(CarOptions const& options)
@@ -93,8 +107,8 @@ std::unique_ptr<NativeCar> openCar(std::string const& port, py::dict const& give
     take(given, "reset", options.reset);
     take(given, "module", options.module);
     take(given, "sleep", options.sleep);
-    if (given.contains("imperial") && !given["imperial"].is_none()) {
-        options.units = given["imperial"].cast<bool>() ? obd::UnitSystem::Imperial : obd::UnitSystem::Metric;
+    if (given.contains("units") && !given["units"].is_none()) {
+        options.units = toUnits(given["units"].cast<std::string>());
     }
     take(given, "log_file", options.logFile);
     take(given, "trace_file", options.traceFile);

@@ -155,8 +155,7 @@ void CarCore::startWatch(std::shared_ptr<WatchState> const& state)
         post([this, state, readings = result.readings] { deliver(state, readings); });
     };
     state->setPoller(std::make_unique<Poller>(m_session->proxy(), pollSources(*m_session, state->sensors()),
-                                              carefulPace(m_session->proxy()->protocol()),
-                                              m_session->obd().getSettings()->unitSystem(), sink));
+                                              carefulPace(m_session->proxy()->protocol()), m_session->units(), sink));
 }
 
 void CarCore::deliver(std::shared_ptr<WatchState> const& state, std::vector<Reading> const& readings)

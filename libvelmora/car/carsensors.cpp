@@ -147,7 +147,7 @@ std::vector<Reading> readOnce(Session& session, std::vector<PollSource> const& s
     PollCycle cycle(
         session.proxy(), sources, carefulPace(session.proxy()->protocol()),
         [](unsigned char pid) { return obd::ParameterFactory::dataLength(obd::ParameterIdentifier(pid).id()); },
-        session.obd().getSettings()->unitSystem(), [&results](PollResult const& result) { results.push_back(result); });
+        session.units(), [&results](PollResult const& result) { results.push_back(result); });
     auto const told = [&results](PollRate const& rate) {
         return std::any_of(results.begin(), results.end(),
                            [&rate](PollResult const& each) { return isOf(each, rate); });

@@ -25,7 +25,7 @@ std::set<unsigned int> modulesOf(std::vector<std::size_t> const& members, std::v
 } // namespace
 
 PollCycle::PollCycle(std::shared_ptr<obd::IObdProxy> const& proxy, std::vector<PollSource> const& sources,
-                     PollPace const& pace, PidLength length, obd::UnitSystem units, Sink sink, IChannelControl* channel)
+                     PollPace const& pace, PidLength length, Units units, Sink sink, IChannelControl* channel)
     : m_wire(proxy, pace.gap, channel), m_pace(pace), m_length(std::move(length)), m_sink(std::move(sink))
 {
     for (PollSource const& source : sources) {

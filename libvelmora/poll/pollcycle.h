@@ -46,8 +46,7 @@ public:
     using Sink = std::function<void(PollResult const& result)>;
 
     PollCycle(std::shared_ptr<obd::IObdProxy> const& proxy, std::vector<PollSource> const& sources,
-              PollPace const& pace, PidLength length, obd::UnitSystem units, Sink sink,
-              IChannelControl* channel = nullptr);
+              PollPace const& pace, PidLength length, Units units, Sink sink, IChannelControl* channel = nullptr);
 
     // How long nothing is to be done yet.
     std::chrono::milliseconds wait();

@@ -35,7 +35,7 @@ bool hasNoRequest(obd::PowertrainParameter const& parameter)
 } // namespace
 
 PolledParameter::PolledParameter(PollWire& wire, std::shared_ptr<obd::IEcu> ecu,
-                                 std::shared_ptr<obd::PowertrainParameter> parameter, obd::UnitSystem units)
+                                 std::shared_ptr<obd::PowertrainParameter> parameter, Units units)
     : m_wire(wire), m_ecu(std::move(ecu)), m_parameter(std::move(parameter)), m_units(units),
       m_lent(std::make_shared<LentProxy>(wire, m_ecu)), m_proxy(*m_lent), m_derived(hasNoRequest(*m_parameter))
 {
@@ -80,7 +80,8 @@ Reading PolledParameter::reading(obd::SensorInfo const& info, bool alone) const
     reading.sensor = alone ? sensorKey(pid) : fmt::format("{}_{}", sensorKey(pid), info.uid() % 10 + 1);
     reading.pid = m_derived ? std::string() : fmt::format("01{:02X}", pid);
     reading.name = alone ? title : title + ": " + info.description();
-    reading.unit = unitLabel(info.uid(), info.unit(m_units));
+    MeasurementUnit const unit = info.unit(librarySystem(m_units));
+    reading.unit = labelInUnits(unitLabel(info.uid(), unit), unit, m_units);
     reading.raw = m_derived ? std::vector<unsigned char>() : m_raw;
     return reading;
 }
@@ -89,7 +90,7 @@ PollResult PolledParameter::result()
 {
     PollResult result{m_ecu->id(), m_parameter->pid(), {}, {}};
     auto const infos = m_parameter->sensorInfo(*m_ecu);
-    for (std::shared_ptr<obd::SensorValue> const& value : m_parameter->values(*m_ecu, m_units)) {
+    for (std::shared_ptr<obd::SensorValue> const& value : m_parameter->values(*m_ecu, librarySystem(m_units))) {
         auto const info =
             std::find_if(infos.begin(), infos.end(), [&](auto const& each) { return each->uid() == value->uid(); });
         if (info == infos.end()) {
@@ -97,7 +98,8 @@ PollResult PolledParameter::result()
         }
         Reading reading = this->reading(**info, infos.size() == 1);
         if (auto const number = std::dynamic_pointer_cast<obd::NumericSensorValue>(value)) {
-            double const shown = shownNumber(value->uid(), number->numericValue());
+            double const shown = inUnits(shownNumber(value->uid(), number->numericValue()),
+                                         (*info)->unit(librarySystem(m_units)), m_units);
             SensorStatistics& statistics = m_statistics[value->uid()];
             statistics.add(shown);
             reading.value = shown;

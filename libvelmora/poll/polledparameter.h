@@ -5,6 +5,7 @@
 #include "libvelmora/poll/pollresult.h"
 #include "libvelmora/poll/ratemeter.h"
 #include "libvelmora/poll/sensorstatistics.h"
+#include "libvelmora/vehicle/units.h"
 
 #include <obd/powertrainparameter.h>
 
@@ -21,7 +22,7 @@ class PolledParameter
 {
 public:
     PolledParameter(PollWire& wire, std::shared_ptr<obd::IEcu> ecu, std::shared_ptr<obd::PowertrainParameter> parameter,
-                    obd::UnitSystem units);
+                    Units units);
 
     // Begins a turn. What is lent after it is used up by run.
     void begin() { m_proxy.begin(); }
@@ -47,7 +48,7 @@ private:
     PollWire& m_wire;
     std::shared_ptr<obd::IEcu> m_ecu;
     std::shared_ptr<obd::PowertrainParameter> m_parameter;
-    obd::UnitSystem m_units;
+    Units m_units;
     std::shared_ptr<LentProxy> m_lent;
     LentProxy& m_proxy;
     bool m_derived;

@@ -31,7 +31,7 @@ PidLength lengths(std::vector<PollSource> const& sources)
 } // namespace
 
 Poller::Poller(std::shared_ptr<obd::IObdProxy> const& proxy, std::vector<PollSource> const& sources,
-               PollPace const& pace, obd::UnitSystem units, PollCycle::Sink sink, IChannelControl* channel)
+               PollPace const& pace, Units units, PollCycle::Sink sink, IChannelControl* channel)
     : m_cycle(proxy, sources, pace, lengths(sources), units, std::move(sink), channel), m_thread([this] { run(); })
 {}
 

@@ -15,7 +15,7 @@ public:
     // sink is called on the poller's thread for everything that was read; it must not destroy the poller. channel, by
     // which one module can be asked alone, must outlive it; null where there is none.
     Poller(std::shared_ptr<obd::IObdProxy> const& proxy, std::vector<PollSource> const& sources, PollPace const& pace,
-           obd::UnitSystem units, PollCycle::Sink sink, IChannelControl* channel = nullptr);
+           Units units, PollCycle::Sink sink, IChannelControl* channel = nullptr);
     // Ends the thread; a request that is on its way is waited for.
     ~Poller();
     Poller(Poller const&) = delete;

@@ -55,7 +55,7 @@ std::vector<ModuleOffer> moduleOffers(obd::IObdVelmora const& obd, std::vector<u
 }
 
 std::unique_ptr<Poller> pollVehicle(obd::IObdVelmora const& obd, std::vector<PollChoice> const& choices,
-                                    PollWill const& will, PollCycle::Sink sink, IChannelControl* channel,
+                                    PollWill const& will, Units units, PollCycle::Sink sink, IChannelControl* channel,
                                     std::vector<PollSource> const& guests)
 {
     std::shared_ptr<obd::IObdProxy> const proxy = obd.getConnectionManager()->getProxy();
@@ -64,7 +64,7 @@ std::unique_ptr<Poller> pollVehicle(obd::IObdVelmora const& obd, std::vector<Pol
     PollPace const pace = choosePace(will, protocol, protocol == obd::ObdProtocolJ1850 ? modelYear() : 0);
     std::vector<PollSource> sources = makeSources(choices, settings);
     sources.insert(sources.end(), guests.begin(), guests.end());
-    return std::make_unique<Poller>(proxy, sources, pace, settings.unitSystem(), std::move(sink), channel);
+    return std::make_unique<Poller>(proxy, sources, pace, units, std::move(sink), channel);
 }
 
 } // namespace velmora

@@ -68,7 +68,7 @@ Session::Session(SessionOptions options)
 {
     m_obd = obd::ObdVelmoraBuilder::createObdVelmora(0, 0, 0, m_settings);
     if (m_options.units) {
-        m_obd->getSettings()->setUnitSystem(*m_options.units);
+        m_obd->getSettings()->setUnitSystem(librarySystem(*m_options.units));
     }
     if (!m_options.traceFile.empty()) {
         m_trace = std::make_unique<TrafficTrace>(m_options.traceFile);
@@ -122,6 +122,17 @@ std::shared_ptr<SignalSet const> Session::signals()
     return m_signals;
 }
 
+Units Session::units() const
+{
+    return m_obd->getSettings()->unitSystem() == obd::UnitSystem::Metric ? Units::Metric : imperialUnits();
+}
+
+Units Session::imperialUnits() const
+{
+    bool const chosen = m_options.units && *m_options.units != Units::Metric;
+    return chosen ? *m_options.units : storedUnits(obd::UnitSystem::Imperial, *m_settings);
+}
+
 PortAddress Session::findPort()
 {
     if (!m_address) {
@@ -156,8 +167,10 @@ PortAddress Session::searchPort()
 void Session::rememberPort(PortAddress const& address)
 {
     try {
-        m_settings->setString(foundPortKey(), toAddressText(address));
-        m_settings->sync();
+        // Alone: what was chosen for this run stays out of the file.
+        SettingsStore kept(m_settings->file());
+        kept.setString(foundPortKey(), toAddressText(address));
+        kept.sync();
     } catch (Error const& error) {
         tellProgress(std::string("The port is not remembered: ") + error.what() + "\n");
     }

@@ -66,6 +66,10 @@ public:
     // The port's address, for messages and reports.
     std::string port() const;
     std::filesystem::path const& settingsFile() const;
+    // The units that values are to be shown in.
+    Units units() const;
+    // Those that are not metric, of the two kinds.
+    Units imperialUnits() const;
     // What the channel to the adapter is told, and tells. After connect only.
     IChannelControl& channel() const { return m_link->control(); }
     // Signals of one's own and built-in ones. Reads their files the first time: throws Error for one that was named and

@@ -1,6 +1,7 @@
 #pragma once
 
-#include <obd/unitsystem.h>
+#include "libvelmora/vehicle/units.h"
+
 #include <obd/vehicleprotocol.h>
 #include <velmora/iport.h>
 
@@ -24,7 +25,7 @@ struct SessionOptions
     std::string port;
     std::optional<unsigned int> baud;
     std::optional<obd::VehicleProtocol> protocol;
-    std::optional<obd::UnitSystem> units;
+    std::optional<Units> units;
     std::optional<unsigned int> ecu; // control module id
     bool reset = false;              // restore and reset the adapter before use
     bool sleep = false;              // send the adapter to sleep at the end, which costs the next visit time

@@ -19,12 +19,16 @@ namespace {
 constexpr int hundredths = 2; // decimals
 
 constexpr char const* unitWords[] = {"metric", "imperial"};
+constexpr char const* gallonWords[] = {"us", "uk"};
 constexpr char const* fuelWords[] = {"reported", "override"};
 constexpr char const* ignitionWords[] = {"spark", "compression"};
 
 constexpr VehicleSetting allSettings[] = {
     {"units", "Unit system", "", settings::unitSystem, 0, 0, 1, true, 0, unitWords,
-     "The units that values are shown in; imperial has gallons of the US. --units chooses for one run."},
+     "The units that values are shown in. --units chooses for one run."},
+    {"gallon", "Gallon", "", settings::gallon, 0, 0, 1, true, 0, gallonWords,
+     "The gallon of the imperial units: of the US, 3.785 l, or of the United Kingdom, 4.546 l. --units imperial-uk "
+     "chooses the latter for one run."},
     {"displacement",
      "Engine displacement",
      "l",

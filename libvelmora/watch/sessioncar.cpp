@@ -132,7 +132,7 @@ void SessionCar::startAsking()
         sources.push_back(std::move(each));
     }
     m_poller = std::make_unique<Poller>(
-        proxy, sources, pace, obd::UnitSystem::Metric,
+        proxy, sources, pace, Units::Metric,
         [this](PollResult const& result) {
             if (m_options.onReading) {
                 for (Reading const& each : result.readings) {

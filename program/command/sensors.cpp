@@ -2,22 +2,22 @@
 #include "libvelmora/read/topicanswer.h"
 #include "libvelmora/report/json.h"
 #include "libvelmora/report/unitlabel.h"
-#include "libvelmora/signal/builtinpids.h"
 #include "libvelmora/text/text.h"
 #include "libvelmora/vehicle/pidtitles.h"
+#include "libvelmora/vehicle/units.h"
 #include "program/command/commands.h"
 #include "program/command/commandsession.h"
+#include "program/command/sensoroffers.h"
 #include "program/commandline.h"
+#include "program/view/layout.h"
 #include "program/view/printtext.h"
 
 #include <obd/iecu.h>
-#include <obd/iecuservice.h>
 #include <obd/sensorpids.h>
 
 #include <fmt/format.h>
 
-#include <algorithm>
-#include <iterator>
+#include <cmath>
 
 namespace velmora::cli {
 
@@ -53,47 +53,58 @@ struct SensorsOptions
     bool all = false;
 };
 
-struct Offer
+// How the list is to be shown.
+struct ListStyle
 {
-    std::shared_ptr<obd::ParameterDataModel> parameter;
-    bool offered;
+    bool all;
+    Units units;
+    Style text;
 };
 
-// What the library can show of the selected module; all of it, or what the module offers.
-std::vector<Offer> offers(bool all)
+char const* label(obd::SensorDataModel const& sensor, Units units)
 {
-    std::vector<Offer> list;
-    auto const service = obd::EcuServiceBuilder::createEcuService();
-    auto parameters = service->supportedParameters();
-    auto const further = service->furtherParameters();
-    parameters.insert(parameters.end(), further.begin(), further.end());
-    for (auto const& parameter : parameters) {
-        bool const offered = service->isParameterSupported(parameter);
-        if (offered || all) {
-            list.push_back({parameter, offered});
-        }
-    }
-    return list;
+    return labelInUnits(unitLabel(sensor.uid, sensor.unit), sensor.unit, units);
 }
 
-std::string range(obd::SensorDataModel const& sensor)
+// An end of the sensor's range, in whole numbers as the library gives it.
+int limit(obd::SensorDataModel const& sensor, int number, Units units)
 {
-    return sensor.numeric != nullptr ? fmt::format("{} to {}", shownNumber(sensor.uid, sensor.numeric->minimum),
-                                                   shownNumber(sensor.uid, sensor.numeric->maximum))
+    return static_cast<int>(std::lround(inUnits(shownNumber(sensor.uid, number), sensor.unit, units)));
+}
+
+std::string range(obd::SensorDataModel const& sensor, Units units)
+{
+    return sensor.numeric != nullptr ? fmt::format("{} to {}", limit(sensor, sensor.numeric->minimum, units),
+                                                   limit(sensor, sensor.numeric->maximum, units))
                                      : "text";
 }
 
-std::string offerText(Offer const& offer, bool all)
+using Rows = std::vector<std::vector<Cell>>;
+
+void addOffer(Rows& rows, Offer const& offer, ListStyle const& style)
 {
-    std::string text;
     std::string lead = fmt::format("{:02X}", static_cast<int>(offer.parameter->id));
     for (auto const& sensor : offer.parameter->sensors) {
-        std::string const line = fmt::format("  {:<2}  {:<58}  {:<8}  {}", lead, sensor->name,
-                                             unitLabel(sensor->uid, sensor->unit), range(*sensor));
-        text += all ? fmt::format("{:<92}{}\n", line, offer.offered ? "offered" : "-") : line + "\n";
+        rows.push_back({{lead}, {sensor->name}, {label(*sensor, style.units)}, {range(*sensor, style.units)}});
+        if (style.all) {
+            rows.back().push_back({offer.offered ? "offered" : "-"});
+        }
         lead.clear();
     }
-    return text;
+}
+
+void addLater(Rows& rows, unsigned char pid)
+{
+    std::vector<BuiltinPid> const values = laterValues(pid);
+    std::string lead = fmt::format("{:02X}", pid);
+    if (values.empty()) {
+        rows.push_back({{lead}, {std::string(pidTitle(pid)) + " (not decoded)"}});
+    }
+    for (BuiltinPid const& each : values) {
+        std::string const how = fmt::format("{} ({})", each.signal.id, standingWord(each.standing));
+        rows.push_back({{lead}, {each.signal.name}, {each.signal.unit}, {how}});
+        lead.clear();
+    }
 }
 
 // Why a set may lack what the module has; empty if it was read.
@@ -105,49 +116,7 @@ std::string whyUnknown(obd::IEcu const& ecu, obd::ObdMode mode)
                : std::string();
 }
 
-// Up to it the library knows all PIDs, some of which are no parameters of their own.
-constexpr unsigned char lastWellKnownPid = 0x7F;
-
-// What the module offers and the library does not decode.
-std::vector<unsigned char> undecoded(obd::IEcu const& ecu)
-{
-    std::vector<Offer> const known = offers(true);
-    std::vector<unsigned char> pids = ecu.supportedIds(obd::ObdMode::CurrentData, 0);
-    std::erase_if(pids, [&known](unsigned char pid) {
-        bool const isLater = pid > lastWellKnownPid && !obd::isSupportMask(pid);
-        return !isLater || std::any_of(known.begin(), known.end(), [pid](Offer const& offer) {
-            return static_cast<int>(offer.parameter->id) == pid;
-        });
-    });
-    return pids;
-}
-
-// The values of a PID that the library does not decode, as far as their layout is known, and how well it is.
-std::vector<BuiltinPid> laterValues(unsigned char pid)
-{
-    std::vector<BuiltinPid> values;
-    std::ranges::copy_if(builtinPids(), std::back_inserter(values),
-                         [pid](BuiltinPid const& each) { return each.pid == pid && isDecoded(each); });
-    return values;
-}
-
-std::string laterText(unsigned char pid)
-{
-    std::vector<BuiltinPid> const values = laterValues(pid);
-    if (values.empty()) {
-        return fmt::format("  {:02X}  {} (not decoded)\n", pid, pidTitle(pid));
-    }
-    std::string text;
-    std::string lead = fmt::format("{:02X}", pid);
-    for (BuiltinPid const& each : values) {
-        text += fmt::format("  {:<2}  {:<58}  {:<8}  {} ({})\n", lead, each.signal.name, each.signal.unit,
-                            each.signal.id, standingWord(each.standing));
-        lead.clear();
-    }
-    return text;
-}
-
-std::string offerText(obd::IEcu const& ecu, bool all)
+std::string offerText(obd::IEcu const& ecu, ListStyle const& style)
 {
     std::string text =
         fmt::format("Control module {:X}: {} ({})\n", ecu.id(), readable(ecu.name()), readable(ecu.description()));
@@ -156,37 +125,37 @@ std::string offerText(obd::IEcu const& ecu, bool all)
         text += fmt::format("  {:<24} {}{}\n", service.title,
                             ids.empty() ? "-" : fmt::format("{}", fmt::join(ids, " ")), whyUnknown(ecu, service.mode));
     }
-    text += "\n";
-    for (Offer const& offer : offers(all)) {
-        text += offerText(offer, all);
+    Rows rows;
+    for (Offer const& offer : offers(style.all)) {
+        addOffer(rows, offer, style);
     }
     for (unsigned char const pid : undecoded(ecu)) {
-        text += laterText(pid);
+        addLater(rows, pid);
     }
-    return text + "\n";
+    return text + "\n" + drawColumns(rows, "  ", style.text) + "\n";
 }
 
-Json sensorJson(obd::SensorDataModel const& sensor)
+Json sensorJson(obd::SensorDataModel const& sensor, Units units)
 {
-    Json json = {{"uid", sensor.uid}, {"name", sensor.name}, {"unit", textOrNull(unitLabel(sensor.uid, sensor.unit))}};
-    json["minimum"] =
-        sensor.numeric != nullptr ? Json(shownNumber(sensor.uid, sensor.numeric->minimum)) : Json(nullptr);
-    json["maximum"] =
-        sensor.numeric != nullptr ? Json(shownNumber(sensor.uid, sensor.numeric->maximum)) : Json(nullptr);
-    return json;
+    bool const ranged = sensor.numeric != nullptr;
+    return {{"uid", sensor.uid},
+            {"name", sensor.name},
+            {"unit", textOrNull(label(sensor, units))},
+            {"minimum", ranged ? Json(limit(sensor, sensor.numeric->minimum, units)) : Json(nullptr)},
+            {"maximum", ranged ? Json(limit(sensor, sensor.numeric->maximum, units)) : Json(nullptr)}};
 }
 
-Json toJson(obd::IEcu const& ecu, bool all)
+Json toJson(obd::IEcu const& ecu, ListStyle const& style)
 {
     Json supported;
     for (Service const& service : services) {
         supported[std::string(service.title, 2)] = identifiers(ecu, service.mode);
     }
     Json parameters = Json::array();
-    for (Offer const& offer : offers(all)) {
+    for (Offer const& offer : offers(style.all)) {
         Json sensorList = Json::array();
         for (auto const& sensor : offer.parameter->sensors) {
-            sensorList.push_back(sensorJson(*sensor));
+            sensorList.push_back(sensorJson(*sensor, style.units));
         }
         parameters.push_back({{"id", fmt::format("{:02X}", static_cast<int>(offer.parameter->id))},
                               {"name", offer.parameter->name},
@@ -217,13 +186,14 @@ ExitCode sensors(GlobalOptions const& options, bool all)
     CommandSession session(options);
     session.connect();
     session.checkAdapter();
+    ListStyle const style{all, session.units(), outputStyle(options)};
     Json modules = Json::array();
     for (std::shared_ptr<obd::IEcu> const& ecu : session.selectedModules()) {
         session.select(*ecu);
         if (options.json) {
-            modules.push_back(toJson(*ecu, all));
+            modules.push_back(toJson(*ecu, style));
         } else {
-            printText(offerText(*ecu, all));
+            printText(offerText(*ecu, style));
         }
     }
     if (options.json) {

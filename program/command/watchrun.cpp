@@ -32,7 +32,7 @@ SessionCarOptions carOptions(GlobalOptions const& options, WatchSettings const& 
     result.session.port = options.port.empty() ? settings.port : options.port;
     result.session.baud = options.baud;
     result.session.protocol = options.protocol;
-    result.session.units = obd::UnitSystem::Metric;
+    result.session.units = Units::Metric;
     result.session.ecu = options.ecu;
     result.session.reset = options.reset;
     result.session.logFile = options.logFile;

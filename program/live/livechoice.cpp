@@ -150,9 +150,9 @@ LiveTable::Parameters LiveChoice::parameters() const
 
 std::unique_ptr<LiveFeed> LiveChoice::feed(PollWill const& will)
 {
-    return std::make_unique<LiveFeed>(m_session.obd(), m_session.loop(), polled(), will, m_session.channel(),
-                                      m_replaced.empty() ? m_signals.sources(m_choices.empty())
-                                                         : std::vector<PollSource>());
+    return std::make_unique<LiveFeed>(
+        m_session.obd(), m_session.loop(), polled(), will, m_session.units(), m_session.channel(),
+        m_replaced.empty() ? m_signals.sources(m_choices.empty()) : std::vector<PollSource>());
 }
 
 std::string LiveChoice::modulesText() const

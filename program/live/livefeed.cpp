@@ -5,9 +5,9 @@
 namespace velmora::cli {
 
 LiveFeed::LiveFeed(obd::IObdVelmora const& obd, DispatchLoop& loop, std::vector<PollChoice> const& choices,
-                   PollWill const& will, IChannelControl& channel, std::vector<PollSource> const& guests)
+                   PollWill const& will, Units units, IChannelControl& channel, std::vector<PollSource> const& guests)
     : m_poller(pollVehicle(
-          obd, choices, will,
+          obd, choices, will, units,
           [this, &loop](PollResult const& result) {
               {
                   std::lock_guard const lock(m_mutex);

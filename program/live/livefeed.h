@@ -15,7 +15,7 @@ class LiveFeed
 public:
     // Polls from here on; library, loop and channel must outlive it.
     LiveFeed(obd::IObdVelmora const& obd, DispatchLoop& loop, std::vector<PollChoice> const& choices,
-             PollWill const& will, IChannelControl& channel, std::vector<PollSource> const& guests);
+             PollWill const& will, Units units, IChannelControl& channel, std::vector<PollSource> const& guests);
 
     bool hasNew() const;
     std::vector<PollResult> take();

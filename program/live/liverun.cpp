@@ -86,7 +86,7 @@ std::string const& LiveRun::vehicle()
 
 void LiveRun::select()
 {
-    m_table.select(m_choice->parameters());
+    m_table.select(m_choice->parameters(), m_session.units());
     SettingsStore store(m_session.settingsFile());
     m_table.setLimits([&store](LiveRow const& row) { return limitOfRow(store, row); });
     if (m_panel != nullptr) {

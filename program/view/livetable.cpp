@@ -17,7 +17,7 @@ namespace {
 constexpr std::chrono::seconds patience{2};
 constexpr int patienceRounds = 3;
 
-LiveRow makeRow(LiveParameter const& chosen, obd::SensorDescriptor const& sensor, bool alone)
+LiveRow makeRow(LiveParameter const& chosen, obd::SensorDescriptor const& sensor, bool alone, Units units)
 {
     obd::ParameterDescriptor const& parameter = *chosen.descriptor;
     LiveRow row{};
@@ -28,7 +28,7 @@ LiveRow makeRow(LiveParameter const& chosen, obd::SensorDescriptor const& sensor
     }
     row.alone = alone;
     row.name = alone ? parameter.description() : parameter.description() + ": " + sensor.description();
-    row.unit = unitLabel(sensor.uid(), sensor.unit());
+    row.unit = labelInUnits(unitLabel(sensor.uid(), sensor.unit()), sensor.unit(), units);
     auto const metric = chosen.metricUnits.find(row.uid);
     row.metricUnit = metric != chosen.metricUnits.end() ? metric->second : row.unit;
     // What has a unit is a number, though the library gives some, such as distances, as plain digits.
@@ -134,7 +134,7 @@ void LiveTable::setLimits(std::function<SensorLimit(LiveRow const& row)> const& 
     }
 }
 
-void LiveTable::select(Parameters const& parameters)
+void LiveTable::select(Parameters const& parameters, Units units)
 {
     m_rows.clear();
     m_selected.clear();
@@ -154,7 +154,7 @@ void LiveTable::select(Parameters const& parameters)
         }
         auto const sensors = parameter.descriptor->sensors();
         for (auto const& sensor : sensors) {
-            m_rows.push_back(makeRow(parameter, *sensor, sensors.size() == 1));
+            m_rows.push_back(makeRow(parameter, *sensor, sensors.size() == 1, units));
             if (several) {
                 m_rows.back().name.insert(0, fmt::format("{:X} ", parameter.module));
             }

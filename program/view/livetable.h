@@ -2,6 +2,7 @@
 
 #include "libvelmora/read/sensorlimits.h"
 #include "libvelmora/uds/signalrow.h"
+#include "libvelmora/vehicle/units.h"
 #include "program/view/framestyle.h"
 
 #include <obd/parameterdescriptor.h>
@@ -82,7 +83,7 @@ public:
     using Values = std::vector<std::shared_ptr<obd::SensorValueDataModel>>;
 
     // Starts anew, with other parameters or other units.
-    void select(Parameters const& parameters);
+    void select(Parameters const& parameters, Units units = Units::Metric);
 
     // From now on, until others are selected.
     void setLimits(std::function<SensorLimit(LiveRow const& row)> const& limitOf);

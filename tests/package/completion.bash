@@ -19,7 +19,7 @@ offers ' --imperial-not-there ' 'velmora --units=imp' velmora --units = imp >/de
 [[ $wrong -eq 1 ]] || { echo "differences are not seen"; exit 1; }
 wrong=0
 offers '* scan live *' 'velmora ' velmora ''
-offers ' imperial ' 'velmora --units=imp' velmora --units = imp
+offers ' imperial imperial-uk ' 'velmora --units=imp' velmora --units = imp
 offers '* petrol-can11 *' 'velmora -p sim:pe' velmora -p sim : pe
 offers ' auto ' 'velmora -p au' velmora -p au
 offers '* RPM *' 'velmora live R' velmora live R

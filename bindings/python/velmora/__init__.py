@@ -16,7 +16,7 @@ import json
 import os
 import types
 from collections.abc import AsyncIterator, Callable, Iterator
-from typing import Any
+from typing import Any, Literal
 
 from . import _topics, _velmora
 from ._topics import (Calibration, Cleared, CodeList, Counter, Counters, FreezeFrame, FrozenReading, Info, Meaning, Module, ModuleCodes, Monitor,
@@ -28,9 +28,11 @@ __all__ = [
     "AdapterSilentError", "Calibration", "Car", "Cleared", "CodeList", "Counter", "Counters", "Error", "FreezeFrame", "FrozenReading", "Info",
     "InterruptedByUserError", "LinkLostError", "Meaning", "Module", "ModuleCodes", "Monitor", "Monitors",
     "NotSupportedError", "PortError", "Reading", "Readiness", "ReadinessMonitor", "RefusedError", "Sensor", "Test",
-    "TroubleCode", "VehicleSilentError", "Watch", "WrongUseError", "explain",
+    "TroubleCode", "Units", "VehicleSilentError", "Watch", "WrongUseError", "explain",
 ]
 __version__ = _velmora.version
+
+Units = Literal["metric", "imperial", "imperial-uk"]
 
 
 @dataclasses.dataclass(frozen=True, slots=True)
@@ -121,7 +123,7 @@ class Car:
     """
 
     def __init__(self, port: str = "auto", *, baud: int | None = None, protocol: int | None = None,
-                 reset: bool = False, module: int | None = None, imperial: bool | None = None, sleep: bool = False,
+                 reset: bool = False, module: int | None = None, units: Units | None = None, sleep: bool = False,
                  log_file: str | os.PathLike[str] | None = None,
                  trace_file: str | os.PathLike[str] | None = None,
                  settings_file: str | os.PathLike[str] | None = None,
@@ -130,7 +132,7 @@ class Car:
             return None if file is None else os.fspath(file)
 
         self._native = _velmora.Car(port, {
-            "baud": baud, "protocol": protocol, "reset": reset, "module": module, "imperial": imperial,
+            "baud": baud, "protocol": protocol, "reset": reset, "module": module, "units": units,
             "sleep": sleep, "log_file": path(log_file),
             "trace_file": path(trace_file), "settings_file": path(settings_file), "progress": progress})
 

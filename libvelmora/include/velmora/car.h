@@ -1,12 +1,12 @@
 #pragma once
 
-#include <obd/unitsystem.h>
 #include <velmora/actions.h>
 #include <velmora/error.h>
 #include <velmora/export.h>
 #include <velmora/iport.h>
 #include <velmora/reading.h>
 #include <velmora/report.h>
+#include <velmora/units.h>
 
 #include <functional>
 #include <memory>
@@ -31,7 +31,7 @@ struct CarOptions
     std::string port = {}; ///< as the program's --port takes it: "192.168.0.10:35000", "sim:petrol-can11"
     std::optional<unsigned int> baud = {}; ///< line rate of a serial port
     std::optional<int> protocol = {};      ///< the adapter's number of the bus, 1 to 9; searched for if empty
-    std::optional<obd::UnitSystem> units = {};
+    std::optional<Units> units = {};
     std::optional<unsigned int> module = {}; ///< id of the one control module to ask; all of them if empty
     bool reset = false;                      ///< restore and reset the adapter before use
     bool sleep = false;                      ///< send the adapter to sleep at the end, which costs the next visit time

@@ -5,6 +5,9 @@
 namespace velmora::settings {
 
 inline constexpr char const* unitSystem = "common/unitsystem"; ///< 0 metric, 1 imperial; default 0
+/// Of imperial units, which the companion and its program see to: 0 gallons of the US, 1 of the United Kingdom;
+/// default 0.
+inline constexpr char const* gallon = "velmora/gallon";
 
 inline constexpr char const* engineDisplacement = "common/enginedisplacement"; ///< hundredths of a litre, default 200
 inline constexpr char const* volumetricEfficiency = "common/volumetricefficiency"; ///< percent, 0 to 100, default 85

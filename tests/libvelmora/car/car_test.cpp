@@ -257,7 +257,7 @@ TEST(CarLife, KeepsToOneModuleAndToTheUnitsOfItsOptions)
 {
     CarOptions options = simulated("petrol-can11");
     options.module = 0x7E9;
-    options.units = obd::UnitSystem::Imperial;
+    options.units = velmora::Units::Imperial;
     Car car(options);
     ASSERT_EQ(car.modules().size(), 1U);
     EXPECT_EQ(car.modules()[0].id, 0x7E9U);

@@ -61,7 +61,7 @@ protected:
             m_cycle = std::make_unique<PollCycle>(
                 m_proxy, m_sources, pace,
                 [](unsigned char pid) { return obd::ParameterFactory::dataLength(obd::ParameterIdentifier(pid).id()); },
-                obd::UnitSystem::Metric, [this](PollResult const& result) { m_results.push_back(result); }, &m_channel);
+                m_units, [this](PollResult const& result) { m_results.push_back(result); }, &m_channel);
         }
         unsigned int const end = m_clock.millis() + ms;
         while (m_clock.millis() < end) {
@@ -114,6 +114,7 @@ protected:
     std::vector<velmora::PollSource> m_sources;
     std::unique_ptr<PollCycle> m_cycle;
     std::vector<PollResult> m_results;
+    velmora::Units m_units = velmora::Units::Metric;
 };
 
 TEST_F(PollCycleTest, ReadsAsTheLibraryDoesAndKeepsTheFloor)
@@ -302,6 +303,28 @@ TEST_F(PollCycleTest, ADerivedValueNeedsFreshInputsOfItsOwnModule)
     EXPECT_GT(stale, told + 60U);
     run(careful, 6000);
     EXPECT_EQ(count(0x7E8, id), stale);
+}
+
+// 20 g/s of air burn 1.36 g/s of petrol (14.7 to 1), 6.57 l/h at 745 g/l: at 80 km/h 8.22 l/100 km, 28.6 miles on 3.785
+// l and 34.4 miles on 4.546 l.
+TEST_F(PollCycleTest, ConsumptionIsInTheGallonsOfTheUnits)
+{
+    for (auto const& [units, unit, number] : {std::tuple(velmora::Units::Metric, "l/100 km", 8.22),
+                                              {velmora::Units::Imperial, "mpg", 28.62},
+                                              {velmora::Units::ImperialUk, "mpg (UK)", 34.37}}) {
+        auto const obd = obd::ObdVelmoraBuilder::createObdVelmora(0, 0, 0, std::make_shared<support::MemorySettings>());
+        auto const id = obd::ParameterIdentifier::FuelConsumption;
+        m_units = units;
+        m_cycle = nullptr;
+        m_sources = {{m_engine, obd::ParameterFactory().createParameter(*m_engine, *obd->getSettings(), id), {}}};
+        m_proxy->answer("01 0D", "41 0D 50");
+        m_proxy->answer("01 10", "41 10 07 D0");
+        run(careful, 500);
+        velmora::Reading const& reading = m_results.back().readings.front();
+        EXPECT_EQ(reading.unit, unit);
+        EXPECT_NEAR(std::get<double>(reading.value), number, 0.06) << unit;
+        EXPECT_NEAR(std::stod(m_results.back().values.front()->mean), number, 0.06) << unit;
+    }
 }
 
 TEST_F(PollCycleTest, InputsOfADerivedValueAreFetchedTogether)

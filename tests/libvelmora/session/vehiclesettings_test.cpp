@@ -1,5 +1,6 @@
 #include "libvelmora/session/libraryuse.h"
 #include "libvelmora/session/vehiclesettings.h"
+#include "libvelmora/vehicle/units.h"
 #include "tests/support/memorysettings.h"
 
 #include <obd/iobdvelmora.h>
@@ -32,6 +33,8 @@ TEST_F(VehicleSettings, ReachTheLibrary)
 {
     set("units", "imperial");
     EXPECT_EQ(m_library.unitSystem(), obd::UnitSystem::Imperial);
+    set("gallon", "uk");
+    EXPECT_EQ(storedUnits(m_library.unitSystem(), *m_store), Units::ImperialUk);
     set("displacement", "1.6");
     EXPECT_FLOAT_EQ(m_library.engineDisplacement(), 1.6F);
     set("efficiency", "90");
@@ -48,8 +51,9 @@ TEST_F(VehicleSettings, ReachTheLibrary)
 
 TEST_F(VehicleSettings, DefaultsAreTheLibrarys)
 {
-    std::set<std::string> const shownDefaults = {"units metric",    "displacement 2.00", "efficiency 85", "weight 1500",
-                                                 "correction 1.00", "fuel reported",     "ignition spark"};
+    std::set<std::string> const shownDefaults = {"units metric",  "gallon us",     "displacement 2.00",
+                                                 "efficiency 85", "weight 1500",   "correction 1.00",
+                                                 "fuel reported", "ignition spark"};
     std::set<std::string> found;
     for (VehicleSetting const& setting : vehicleSettings()) {
         EXPECT_EQ(shownSetting(setting, *m_store), shownDefault(setting));
@@ -81,6 +85,7 @@ TEST_F(VehicleSettings, WhatIsNoValueIsToldWithTheRange)
           {"efficiency", "-1", "0 to 100 %"},
           {"weight", "1e99", "1 to 60000 kg"},
           {"units", "Imperial", "metric or imperial"},
+          {"gallon", "imperial", "us or uk"},
           {"ignition", "0", "spark or compression"}}) {
         try {
             set(name, text);

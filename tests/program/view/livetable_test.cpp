@@ -59,6 +59,14 @@ TEST_F(Live, GivesDigitsWithAUnitAndAnglesTheirSign)
     EXPECT_EQ(table.rows()[3].unit, "");
 }
 
+TEST_F(Live, TellsTheGallonsApart)
+{
+    table.select({liveParameter(0xF4, "Consumption", {""}, true, UnitConsumptionImperial)}, velmora::Units::ImperialUk);
+    EXPECT_EQ(table.rows()[0].unit, "mpg (UK)");
+    table.select({liveParameter(0xF4, "Consumption", {""}, true, UnitConsumptionImperial)}, velmora::Units::Imperial);
+    EXPECT_EQ(table.rows()[0].unit, "mpg");
+}
+
 TEST_F(Live, KeepsTheReadingAndItsStatistics)
 {
     table.update(0x0C, {std::make_shared<obd::SensorValueDataModel>(120, "800", "700", "900", "850")}, now);

@@ -107,7 +107,8 @@ enum
 {
     VELMORA_UNITS_BY_SETTINGS = 0, /**< as the settings file says */
     VELMORA_UNITS_METRIC = 1,      /**< km/h, Celsius, kPa */
-    VELMORA_UNITS_IMPERIAL = 2     /**< mph, Fahrenheit, psi */
+    VELMORA_UNITS_IMPERIAL = 2,    /**< mph, Fahrenheit, psi, gallons of the US */
+    VELMORA_UNITS_IMPERIAL_UK = 3  /**< the same with gallons of the United Kingdom */
 };
 
 /** How a car is to be reached. What is NULL or 0 comes from the settings file, or is the default. */
