@@ -54,7 +54,7 @@ std::string healthText(Health const& health)
             fmt::format("velmora_state_info{{state=\"{}\"}} 1\n", escapedLabel(health.state));
     text += single("velmora_link_up", "gauge", "Whether adapter and vehicle answer.", health.linkUp ? 1 : 0);
     text += single("velmora_requests_total", "counter", "Requests to control modules.", health.requests);
-    text += single("velmora_errors_total", "counter", "Requests that nobody answered.", health.errors);
+    text += single("velmora_errors_total", "counter", "Requests without an answer.", health.errors);
     text += single("velmora_link_losses_total", "counter", "How often the link broke.", health.linkLosses);
     text += single("velmora_wake_requests_total", "counter", "Requests to a parked car.", health.wakeRequests);
     text += overOutputs(health, "velmora_output_queue_records", "gauge", "Records that wait.", &OutputCounts::queued);

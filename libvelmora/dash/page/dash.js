@@ -47,7 +47,7 @@ function showView() {
 // The one line that tells how all stands; a reader of the screen hears it when it changes.
 function status() {
   const program = link.programState();
-  if (program === 'refused') return ['bad', 'Not let in: open the page by the link that the program told'];
+  if (program === 'refused') return ['bad', 'Not let in: open the page with the link that the program printed'];
   if (program === 'gone') return ['bad', 'No connection to the program'];
   if (!beat) return ['wait', 'Connecting to the program'];
   if (beat.state === 'parked' || beat.state === 'settling') return ['warn', 'The car is parked: nothing is asked of it'];

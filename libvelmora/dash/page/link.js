@@ -22,7 +22,7 @@ export async function post(path, body) {
     const response = await fetch(path, { method: 'POST', body: typeof body === 'string' ? body : JSON.stringify(body) });
     return { ok: response.ok, status: response.status, text: (await response.text()).trim() };
   } catch {
-    return { ok: false, status: 0, text: 'The program can not be reached' };
+    return { ok: false, status: 0, text: 'The program cannot be reached' };
   }
 }
 
