@@ -5,8 +5,7 @@
 #include "program/licencetext.h"
 #include "program/selfdescription.h"
 #include "program/terminal/output.h"
-#include "program/terminal/terminal.h"
-#include "program/view/layout.h"
+#include "program/view/printtext.h"
 #include "velmora/version.h"
 
 #include <obd/version.h>
@@ -23,7 +22,6 @@
 #include <map>
 #include <sstream>
 #include <system_error>
-#include <unistd.h>
 #include <utility>
 
 namespace velmora::cli {
@@ -41,7 +39,7 @@ void report(Error const& failure)
     for (std::string const& hint : failure.hints()) {
         text += fmt::format("  - {}\n", hint);
     }
-    tell(folded(text, Terminal::columnsOf(STDERR_FILENO)));
+    tellText(text);
 }
 
 // A reader of standard output that has gone, such as head, has read enough and needs no message.
@@ -198,8 +196,8 @@ ExitCode CommandLine::run(int argc, char const* const* argv)
         return runAction();
     } catch (CLI::ParseError const& error) {
         std::vector<std::string> const unknown = m_app.remaining();
-        tell(fmt::format("velmora: {}\n  - velmora --help lists the options and commands\n",
-                         unknown.empty() ? error.what() : "\"" + unknown.front() + "\" is no command or option"));
+        tellText(fmt::format("velmora: {}\n  - velmora --help lists the options and commands\n",
+                             unknown.empty() ? error.what() : "\"" + unknown.front() + "\" is no command or option"));
         return ExitCode::WrongUse;
     } catch (Error const& wrong) {
         report(wrong);

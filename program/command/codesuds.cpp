@@ -12,6 +12,7 @@
 #include "program/command/commandsession.h"
 #include "program/terminal/output.h"
 #include "program/view/layout.h"
+#include "program/view/printtext.h"
 
 #include <obd/troublecodecatalogue.h>
 #include <velmora/error.h>
@@ -179,7 +180,7 @@ void printUdsCodes(std::vector<AskedModule> const& modules, MakerChoice const& m
         if (options.json) {
             document.push_back(moduleJson(module, maker));
         } else {
-            fmt::print("{}", udsModuleText(module, maker, options));
+            printText(udsModuleText(module, maker, options));
         }
     }
     if (options.json) {

@@ -3,6 +3,7 @@
 #include "program/terminal/interrupt.h"
 #include "program/terminal/output.h"
 #include "program/terminal/promptreader.h"
+#include "program/view/printtext.h"
 
 #include <obd/library.h>
 
@@ -34,13 +35,13 @@ SessionOptions sessionOptions(GlobalOptions const& options)
     result.settingsFile = options.settingsFile;
     result.signalFiles = options.signalFiles;
     if (!options.quiet) {
-        result.onProgress = tell;
+        result.onProgress = tellText;
         if (PromptReader::canRedraw()) {
             result.onPhase = tellPhase;
         }
     }
     if (options.verbose) {
-        result.onDetail = tell;
+        result.onDetail = tellText;
     }
     return result;
 }

@@ -2,7 +2,7 @@
 
 #include "program/terminal/interrupt.h"
 #include "program/terminal/linereader.h"
-#include "program/terminal/output.h"
+#include "program/view/printtext.h"
 
 #include <velmora/error.h>
 
@@ -56,7 +56,7 @@ bool confirmed(CommandSession const& session, std::string const& warning, std::s
         return true;
     }
     dropTypedAhead();
-    tell(fmt::format("{}{} [y/N] ", warning, question));
+    tellText(fmt::format("{}{} [y/N] ", warning, question));
     std::string answer;
     return LineReader(session).read(answer) && isYes(answer);
 }
@@ -67,7 +67,7 @@ bool confirmed(GlobalOptions const& options, std::string const& warning, std::st
         return true;
     }
     dropTypedAhead();
-    tell(fmt::format("{}{} [y/N] ", warning, question));
+    tellText(fmt::format("{}{} [y/N] ", warning, question));
     return isYes(readAnswer());
 }
 

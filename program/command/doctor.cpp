@@ -6,6 +6,7 @@
 #include "program/command/commandsession.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
+#include "program/view/printtext.h"
 
 #include <velmora/error.h>
 
@@ -56,7 +57,12 @@ ExitCode examineChain(DoctorOptions const& chosen, GlobalOptions const& options)
     CommandSession session(options);
     DialogueRecorder recorder;
     DoctorReport const report = examine(session, recorder);
-    writeOutput(options.json ? printed(toJson(report)) : toText(report));
+    if (options.json) {
+        writeOutput(printed(toJson(report)));
+    } else {
+        printText(toText(report));
+        flushOutput();
+    }
     if (!chosen.bundle.empty()) {
         save(chosen.bundle, makeBundle(report, session, recorder, chosen.keepVin));
     }

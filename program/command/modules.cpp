@@ -11,6 +11,7 @@
 #include "program/terminal/output.h"
 #include "program/terminal/promptreader.h"
 #include "program/view/layout.h"
+#include "program/view/printtext.h"
 
 #include <velmora/error.h>
 
@@ -138,7 +139,7 @@ ExitCode modules(ModulesOptions const& chosen, GlobalOptions const& options)
         }
         fmt::print("{}", printed(document));
     } else {
-        fmt::print("{}", modulesText(found, options));
+        printText(modulesText(found, options));
     }
     flushOutput();
     if (found.empty()) {

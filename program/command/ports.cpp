@@ -7,6 +7,7 @@
 #include "program/commandline.h"
 #include "program/terminal/interrupt.h"
 #include "program/terminal/output.h"
+#include "program/view/printtext.h"
 
 #include <velmora/error.h>
 
@@ -47,7 +48,7 @@ std::vector<BluetoothEntry> bluetoothAdapters(bool known)
         if (error.kind() == ErrorKind::Interrupted) {
             throw;
         }
-        tell(std::string("No Bluetooth: ") + error.what() + "\n");
+        tellText(std::string("No Bluetooth: ") + error.what() + "\n");
         return {};
     }
 }
@@ -91,13 +92,13 @@ ExitCode listPorts(PortsOptions const& options, bool json)
         return ExitCode::Done;
     }
     for (SerialPortEntry const& port : ports) {
-        fmt::print("{}{}{}\n", port.device, port.description.empty() ? "" : "  ", port.description);
+        printText(fmt::format("{}{}{}\n", port.device, port.description.empty() ? "" : "  ", port.description));
     }
     for (BluetoothEntry const& entry : adapters) {
-        fmt::print("{}  {}\n", entry.address, describe(entry));
+        printText(fmt::format("{}  {}\n", entry.address, describe(entry)));
     }
     if (ports.empty() && adapters.empty()) {
-        tell("No port that looks like an adapter. A network adapter needs none: --port HOST:PORT\n");
+        tellText("No port that looks like an adapter. A network adapter needs none: --port HOST:PORT\n");
     }
     return ExitCode::Done;
 }

@@ -32,13 +32,13 @@ ExitCode list(GlobalOptions const& options)
                       {"many vehicles have none"}});
 }
 
-std::string routineWarning(RoutineChoice const& choice)
+std::string routineWarning(RoutineChoice const& choice, GlobalOptions const& options)
 {
     return fmt::format(
         "This asks control module {:X} {} to run routine {}: {}\n{}"
         "The routine acts on the vehicle. Have it parked safely, with nobody near moving or hot parts.\n",
         choice.ecu->id(), choice.ecu->name(), routineId(choice.routine.id), choice.routine.name,
-        wrapped(choice.routine.description, 76, "  "));
+        wrapped(choice.routine.description, 76, "  ", outputStyle(options)));
 }
 
 ExitCode run(std::string const& text, GlobalOptions const& options)
@@ -48,7 +48,7 @@ ExitCode run(std::string const& text, GlobalOptions const& options)
     CommandSession session(options);
     session.connect();
     RoutineChoice const choice = findRoutine(session, id);
-    if (!confirmed(session, routineWarning(choice), "Run now?")) {
+    if (!confirmed(session, routineWarning(choice, options), "Run now?")) {
         tell("Nothing was run.\n");
         return ExitCode::Failed;
     }

@@ -106,7 +106,7 @@ void explain(VehicleSetting const& setting, SettingsStore& store, GlobalOptions 
         fmt::print("{}", printed(toJson(setting, store)));
         return;
     }
-    printText(fmt::format("{}\n{}{}{}{}", setting.title, wrapped(setting.explanation, 76, "  "),
+    printText(fmt::format("{}\n{}{}{}{}", setting.title, wrapped(setting.explanation, 76, "  ", outputStyle(options)),
                           labelledLine("Value", withUnit(setting, shownSetting(setting, store))),
                           labelledLine("Range", withUnit(setting, shownRange(setting))),
                           labelledLine("Default", withUnit(setting, shownDefault(setting)))));

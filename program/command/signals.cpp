@@ -7,6 +7,7 @@
 #include "program/commandline.h"
 #include "program/terminal/output.h"
 #include "program/view/layout.h"
+#include "program/view/printtext.h"
 
 #include <velmora/error.h>
 
@@ -92,7 +93,7 @@ ExitCode listFiles(SignalOptions const& options, GlobalOptions const& global)
         for (Signal const& signal : file.signals) {
             rows.push_back(row(signal));
         }
-        fmt::print("{}\n{}", path, drawColumns(rows, "  ", outputStyle(global)));
+        printText(fmt::format("{}\n{}", path, drawColumns(rows, "  ", outputStyle(global))));
     }
     if (global.json) {
         fmt::print("{}", printed(document));

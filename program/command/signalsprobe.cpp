@@ -1,5 +1,6 @@
 #include "program/command/signalsprobe.h"
 
+#include "libvelmora/record/checkedfile.h"
 #include "libvelmora/report/json.h"
 #include "libvelmora/signal/signalfile.h"
 #include "libvelmora/signal/signalhex.h"
@@ -12,6 +13,7 @@
 #include "program/terminal/output.h"
 #include "program/terminal/promptreader.h"
 #include "program/view/layout.h"
+#include "program/view/printtext.h"
 
 #include <velmora/error.h>
 
@@ -66,9 +68,12 @@ ProbeTask taskOf(ProbeOptions const& options)
 std::string outputOf(ProbeOptions const& options, ProbeTask const& task)
 {
     std::string const file = options.output.empty() ? fmt::format("signals-{}.toml", task.header) : options.output;
-    if (!options.force && std::filesystem::exists(file)) {
-        throw Error(ErrorKind::WrongUse, file + " is there already",
-                    {"--output names another file, --force replaces it"});
+    if (std::filesystem::exists(file)) {
+        if (!options.force) {
+            throw Error(ErrorKind::WrongUse, file + " is there already",
+                        {"--output names another file, --force replaces it"});
+        }
+        requireWritable(file, "signal file");
     }
     return file;
 }
@@ -185,7 +190,7 @@ ExitCode probe(ProbeOptions const& given, GlobalOptions const& options)
     if (options.json) {
         fmt::print("{}", printed(toJsonValue(state)));
     } else {
-        fmt::print("{}", resultText(state, options));
+        printText(resultText(state, options));
     }
     flushOutput();
     write(output, state);

@@ -41,8 +41,15 @@ void Terminal::useCharacters()
 
 std::size_t Terminal::columnsOf(int descriptor)
 {
+    if (::isatty(descriptor) == 0) {
+        return 0;
+    }
+    char const* const wish = std::getenv("COLUMNS");
+    if (int const columns = wish != nullptr ? std::atoi(wish) : 0; columns > 0) {
+        return static_cast<std::size_t>(columns);
+    }
     winsize window{};
-    return ::isatty(descriptor) != 0 && ::ioctl(descriptor, TIOCGWINSZ, &window) == 0 ? window.ws_col : 0;
+    return ::ioctl(descriptor, TIOCGWINSZ, &window) == 0 ? window.ws_col : 0;
 }
 
 std::vector<std::string> terminalKinds(std::string const& named)

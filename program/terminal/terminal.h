@@ -35,7 +35,8 @@ public:
     // other threads.
     static void useCharacters();
 
-    // How many columns a line has on that end of the program; 0 if it is no terminal.
+    // How many columns a line has on that end of the program, by the variable COLUMNS or the terminal's size; 0 if it
+    // is no terminal.
     static std::size_t columnsOf(int descriptor);
 
     // Null where nothing is known of the terminal's kind. coloured: frames may have colours.

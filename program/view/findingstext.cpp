@@ -30,9 +30,9 @@ std::string toldText(std::vector<Finding> const& findings, Style const& style)
     return rows.empty() ? std::string() : drawColumns(rows, "  ", style);
 }
 
-std::string pointText(std::string const& text)
+std::string pointText(std::string const& text, Style const& style)
 {
-    std::string lines = wrapped(text, textColumns, "      ");
+    std::string lines = wrapped(text, textColumns, "      ", style);
     lines[4] = '-';
     return lines;
 }
@@ -40,13 +40,13 @@ std::string pointText(std::string const& text)
 std::string suggestionText(Finding const& finding, Style const& style)
 {
     std::string text = "  " + finding.module + "  " + style.paint(findingMark(finding.severity), finding.what) + "\n" +
-                       wrapped(finding.text, textColumns, "    ") + "    " + texts::finding::because + "\n";
+                       wrapped(finding.text, textColumns, "    ", style) + "    " + texts::finding::because + "\n";
     for (Evidence const& each : finding.evidence) {
-        text += pointText(each.text);
+        text += pointText(each.text, style);
     }
     text += std::string("    ") + texts::finding::orElse + "\n";
     for (std::string const& each : finding.otherwise) {
-        text += pointText(each);
+        text += pointText(each, style);
     }
     return text;
 }

@@ -5,6 +5,7 @@
 #include <fmt/format.h>
 
 #include <algorithm>
+#include <numeric>
 #include <sstream>
 #include <string_view>
 
@@ -27,17 +28,87 @@ std::vector<std::size_t> columnWidths(std::vector<std::vector<Cell>> const& rows
     return widths;
 }
 
-// Nothing is drawn behind the last text of a line.
-std::size_t lengthOf(std::vector<Cell> const& row)
+constexpr std::size_t narrowest = 20; // columns that text can be folded to
+
+// The words of the text on lines of at most that many characters, where they allow it.
+std::vector<std::string> wordLines(std::string const& text, std::size_t width)
 {
-    std::size_t length = row.size();
-    while (length > 0 && row[length - 1].text.empty()) {
-        --length;
+    std::istringstream words(text);
+    std::vector<std::string> lines;
+    for (std::string word; words >> word;) {
+        if (lines.empty() || displayWidth(lines.back()) + 1 + displayWidth(word) > width) {
+            lines.push_back(word);
+        } else {
+            lines.back() += " " + word;
+        }
     }
-    return length;
+    return lines;
 }
 
-constexpr std::size_t narrowest = 20; // columns that text can be folded to
+std::vector<std::size_t> longestWords(std::vector<std::vector<Cell>> const& rows, std::size_t columns)
+{
+    std::vector<std::size_t> widths(columns, 0);
+    for (std::vector<Cell> const& row : rows) {
+        for (std::size_t i = 0; row.size() != 1 && i < row.size(); ++i) {
+            std::vector<std::string> const words = wordLines(row[i].text, 0);
+            for (std::string const& word : words) {
+                widths[i] = std::max(widths[i], displayWidth(word));
+            }
+        }
+    }
+    return widths;
+}
+
+// Takes from the widest columns until their sum fits into the room, and no column narrower than its longest word.
+// Columns that can't be made to fit stay as they are.
+void narrow(std::vector<std::size_t>& widths, std::vector<std::size_t> const& least, std::size_t room)
+{
+    std::vector<std::size_t> fitting = widths;
+    for (std::size_t sum = std::accumulate(widths.begin(), widths.end(), std::size_t{0}); sum > room; --sum) {
+        std::size_t widest = fitting.size();
+        for (std::size_t i = 0; i < fitting.size(); ++i) {
+            if (fitting[i] > least[i] && (widest == fitting.size() || fitting[i] > fitting[widest])) {
+                widest = i;
+            }
+        }
+        if (widest == fitting.size()) {
+            return;
+        }
+        --fitting[widest];
+    }
+    widths = fitting;
+}
+
+// A row in as many lines as its cells need. Nothing is drawn behind the last text of a line.
+std::string drawRow(std::vector<Cell> const& row, std::vector<std::size_t> const& widths, std::string const& indent,
+                    Style const& style)
+{
+    std::vector<std::vector<std::string>> cells;
+    std::size_t height = 1;
+    for (std::size_t i = 0; i < row.size(); ++i) {
+        bool const fits = displayWidth(row[i].text) <= widths[i];
+        cells.push_back(fits ? std::vector<std::string>{row[i].text} : wordLines(row[i].text, widths[i]));
+        height = std::max(height, cells.back().size());
+    }
+    std::string text;
+    for (std::size_t line = 0; line < height; ++line) {
+        text += indent;
+        std::size_t gap = 0;
+        for (std::size_t i = 0; i < row.size(); ++i) {
+            std::string const part = line < cells[i].size() ? cells[i][line] : std::string();
+            std::size_t const used = displayWidth(part);
+            std::size_t const blanks = widths[i] > used ? widths[i] - used : 0;
+            gap += (i == 0 ? 0 : 2) + (row[i].rightAligned ? blanks : 0);
+            if (!part.empty()) {
+                text += std::string(gap, ' ') + style.paint(row[i].mark, part);
+                gap = 0;
+            }
+            gap += row[i].rightAligned ? 0 : blanks;
+        }
+        text += "\n";
+    }
+    return text;
+}
 
 // The length of a sequence that switches colours, at its start; 0 for anything else.
 std::size_t sequenceLength(std::string_view text)
@@ -66,14 +137,16 @@ std::size_t bytesOfColumns(std::string_view text, std::size_t columns)
     return at;
 }
 
-// Where the lines that follow begin: below the last column, else two behind the line's own indent.
+// Where the lines that follow begin: below the last column that leaves them room, else two behind the line's own
+// indent.
 std::size_t hangOf(std::string_view line, std::size_t columns)
 {
     std::size_t const indent = std::min(line.find_first_not_of(' '), line.size());
-    std::size_t const gap = line.rfind("  ");
-    if (gap != std::string_view::npos && gap >= indent) {
+    std::string_view const plain = line.substr(0, line.find('\033'));
+    for (std::size_t gap = plain.rfind("  "); gap != std::string_view::npos && gap > indent; --gap) {
         std::size_t const column = displayWidth(line.substr(0, gap + 2));
-        if (column <= columns / 2 && line.substr(0, gap).find('\033') == std::string_view::npos) {
+        bool const ends = gap + 2 < plain.size() && plain.substr(gap, 2) == "  " && plain[gap + 2] != ' ';
+        if (ends && column <= columns / 2) {
             return column;
         }
     }
@@ -114,39 +187,29 @@ std::string labelledLine(std::string const& label, std::string const& value)
 
 std::string drawColumns(std::vector<std::vector<Cell>> const& rows, std::string const& indent, Style const& style)
 {
-    std::vector<std::size_t> const widths = columnWidths(rows);
+    std::vector<std::size_t> widths = columnWidths(rows);
+    if (style.columns() >= narrowest && !widths.empty()) {
+        std::size_t const between = indent.size() + 2 * (widths.size() - 1);
+        narrow(widths, longestWords(rows, widths.size()), style.columns() - std::min(style.columns(), between));
+    }
     std::string text;
     for (std::vector<Cell> const& row : rows) {
-        std::size_t const length = lengthOf(row);
-        text += indent;
-        if (row.size() == 1) {
-            text += style.paint(row[0].mark, row[0].text) + "\n";
-            continue;
-        }
-        for (std::size_t i = 0; i < length; ++i) {
-            std::string const blanks(widths[i] - displayWidth(row[i].text), ' ');
-            std::string const painted = style.paint(row[i].mark, row[i].text);
-            text += i == 0 ? "" : "  ";
-            text += row[i].rightAligned ? blanks + painted : i + 1 == length ? painted : painted + blanks;
-        }
-        text += "\n";
+        text += row.size() == 1 ? indent + style.paint(row[0].mark, row[0].text) + "\n"
+                                : drawRow(row, widths, indent, style);
     }
     return text;
 }
 
-std::string wrapped(std::string const& text, std::size_t width, std::string const& indent)
+std::string wrapped(std::string const& text, std::size_t width, std::string const& indent, Style const& style)
 {
-    std::istringstream words(text);
-    std::string lines;
-    std::string line;
-    for (std::string word; words >> word;) {
-        if (!line.empty() && displayWidth(line) + 1 + displayWidth(word) > width) {
-            lines += indent + line + "\n";
-            line.clear();
-        }
-        line += (line.empty() ? "" : " ") + word;
+    if (style.columns() >= narrowest) {
+        width = std::min(width, style.columns() - std::min(style.columns(), indent.size()));
     }
-    return line.empty() ? lines : lines + indent + line + "\n";
+    std::string lines;
+    for (std::string const& line : wordLines(text, width)) {
+        lines += indent + line + "\n";
+    }
+    return lines;
 }
 
 std::string folded(std::string const& text, std::size_t columns)

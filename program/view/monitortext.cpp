@@ -36,10 +36,15 @@ std::vector<Cell> limitTestHeads()
             {texts::description}};
 }
 
-std::vector<Cell> limitTestRow(LimitTest const& test)
+std::string shownVerdict(LimitTest const& test)
 {
     char const* const verdict = verdictWord(test.verdict);
-    return {{std::string("  ") + (*verdict == '\0' ? "-" : verdict), mark(test.verdict)},
+    return *verdict == '\0' ? "-" : verdict;
+}
+
+std::vector<Cell> limitTestRow(LimitTest const& test)
+{
+    return {{"  " + shownVerdict(test), mark(test.verdict)},
             {testId(test.id)},
             number(test.value),
             number(test.minimum),
@@ -47,6 +52,46 @@ std::vector<Cell> limitTestRow(LimitTest const& test)
             {test.unit},
             {test.description}};
 }
+
+constexpr std::size_t columnsOfTests = 72; // that six columns of figures and some words of a description need
+
+// A test on a line that is too narrow for columns, its description below.
+std::string narrowTest(LimitTest const& test, Style const& style)
+{
+    auto const shown = [](std::string const& text) { return text.empty() ? "-" : text; };
+    std::string const unit = test.unit.empty() ? "" : " " + test.unit;
+    std::string const range = fmt::format(texts::plain::range, shown(test.minimum), shown(test.maximum));
+    return fmt::format("      {}  {}: {}{} {}\n{}", style.paint(mark(test.verdict), shownVerdict(test)),
+                       testId(test.id), shown(test.value), unit, range,
+                       wrapped(test.description, columnsOfTests, "        ", style));
+}
+
+// Tests of several things, each of them below its title.
+class TestTable
+{
+public:
+    explicit TestTable(Style const& style)
+        : m_style(style), m_narrow(style.columns() != 0 && style.columns() < columnsOfTests), m_rows{limitTestHeads()}
+    {}
+
+    void add(std::string const& title, std::vector<LimitTest> const& tests)
+    {
+        m_lines += "    " + title + "\n";
+        m_rows.push_back({{title}});
+        for (LimitTest const& test : tests) {
+            m_lines += narrowTest(test, m_style);
+            m_rows.push_back(limitTestRow(test));
+        }
+    }
+
+    std::string draw() const { return m_narrow ? m_lines : drawColumns(m_rows, "    ", m_style); }
+
+private:
+    Style const& m_style;
+    bool const m_narrow;
+    std::vector<std::vector<Cell>> m_rows;
+    std::string m_lines;
+};
 
 std::size_t count(MonitorsReport const& report, Verdict verdict)
 {
@@ -94,15 +139,13 @@ std::string sensorList(OxygenReport const& report)
 
 std::string drawTests(std::vector<OxygenSensor> const& sensors, Style const& style)
 {
-    std::vector<std::vector<Cell>> rows = {limitTestHeads()};
+    TestTable table(style);
     for (OxygenSensor const& sensor : sensors) {
-        rows.push_back({{sensor.tests.empty() ? fmt::format(texts::plain::noTests, locationName(sensor.location))
-                                              : locationName(sensor.location)}});
-        for (LimitTest const& test : failedFirst(sensor.tests)) {
-            rows.push_back(limitTestRow(test));
-        }
+        table.add(sensor.tests.empty() ? fmt::format(texts::plain::noTests, locationName(sensor.location))
+                                       : locationName(sensor.location),
+                  failedFirst(sensor.tests));
     }
-    return drawColumns(rows, "    ", style);
+    return table.draw();
 }
 
 } // namespace
@@ -113,14 +156,11 @@ std::string toText(MonitorsReport const& report, Style const& style)
     if (report.monitors.empty()) {
         return text;
     }
-    std::vector<std::vector<Cell>> rows = {limitTestHeads()};
+    TestTable table(style);
     for (OnBoardMonitor const& monitor : failedFirst(report.monitors)) {
-        rows.push_back({{fmt::format("{:02X} {}", monitor.id, monitor.description)}});
-        for (LimitTest const& test : monitor.tests) {
-            rows.push_back(limitTestRow(test));
-        }
+        table.add(fmt::format("{:02X} {}", monitor.id, monitor.description), monitor.tests);
     }
-    return text + drawColumns(rows, "    ", style);
+    return text + table.draw();
 }
 
 std::string toText(OxygenReport const& report, Style const& style)

@@ -1,5 +1,6 @@
 #include "program/view/printtext.h"
 
+#include "program/terminal/output.h"
 #include "program/terminal/terminal.h"
 #include "program/view/layout.h"
 
@@ -12,6 +13,11 @@ namespace velmora::cli {
 void printText(std::string const& text)
 {
     fmt::print("{}", folded(text, Terminal::columnsOf(STDOUT_FILENO)));
+}
+
+void tellText(std::string const& text)
+{
+    tell(folded(text, Terminal::columnsOf(STDERR_FILENO)));
 }
 
 } // namespace velmora::cli

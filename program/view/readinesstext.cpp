@@ -46,7 +46,7 @@ std::string drawMonitors(std::vector<ReadinessMonitor> const& monitors, Style co
             rows.push_back({{monitor.name}, cell(monitor.sinceCleared), cell(monitor.thisCycle)});
         }
     }
-    return drawColumns(rows, "    ", style) + wrapped(missing, 76, "    ");
+    return drawColumns(rows, "    ", style) + wrapped(missing, 76, "    ", style);
 }
 
 } // namespace

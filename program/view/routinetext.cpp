@@ -25,7 +25,7 @@ std::string toText(RoutinesReport const& report, Style const& style)
     std::string text;
     for (Routine const& routine : report.routines) {
         text += labelledLine(fmt::format(texts::plain::routine, routineId(routine.id)), routine.name);
-        text += wrapped(routine.description, 72, "    ");
+        text += wrapped(routine.description, 72, "    ", style);
     }
     return text;
 }

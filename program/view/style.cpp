@@ -3,6 +3,7 @@
 #include "program/terminal/terminal.h"
 
 #include <cstdlib>
+#include <unistd.h>
 
 namespace velmora::cli {
 
@@ -38,7 +39,7 @@ Style outputStyle(GlobalOptions const& options)
 {
     char const* const noColor = std::getenv("NO_COLOR");
     return Style(wantsColor(options.color, noColor != nullptr && *noColor != '\0', Terminal::isUsable()),
-                 options.verbose);
+                 options.verbose, Terminal::columnsOf(STDOUT_FILENO));
 }
 
 } // namespace velmora::cli

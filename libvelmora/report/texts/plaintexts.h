@@ -76,4 +76,7 @@ inline constexpr char const* noCodes = "no codes";
 inline constexpr char const* better = "better";
 inline constexpr char const* worse = "worse";
 
+// A test's limits, behind its value.
+inline constexpr char const* range = "({} to {})";
+
 } // namespace velmora::texts::plain

@@ -38,6 +38,19 @@ TEST(MonitorsReportView, HeadingsOfNumbersStandOverTheirEnds)
                                      "      passed  81    1.00000000  2.00000000  3.00000000  V     B\n");
 }
 
+TEST(MonitorsReportView, IsNoTableWhereLinesAreNarrow)
+{
+    EXPECT_EQ(toText(report, Style(false, false, 40)), "  Monitor tests  1 failed, 1 passed, 1 without result\n"
+                                                       "    A2 Misfire\n"
+                                                       "      failed  0C: 900 (0 to 80)\n"
+                                                       "        Count\n"
+                                                       "      no result  0B: 0 (- to -)\n"
+                                                       "        Average\n"
+                                                       "    01 Sensor 1\n"
+                                                       "      passed  81: 0.450 V (0.400 to -)\n"
+                                                       "        Amplitude\n");
+}
+
 TEST(MonitorsReportView, ColoursFailures)
 {
     std::string const text = toText(report, Style(true));

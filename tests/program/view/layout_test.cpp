@@ -45,6 +45,36 @@ TEST(Layout, TextIsWrappedBetweenWords)
     EXPECT_EQ(wrapped("", 8, "> "), "");
 }
 
+TEST(Layout, ColumnsThatAreTooWideTakeSeveralLines)
+{
+    std::vector<std::vector<Cell>> const rows = {{{"Short Term Trim", Mark::Bad}, {"0.8", Mark::None, true}, {"%"}},
+                                                 {{"one heading across all of them"}},
+                                                 {{"RPM"}, {"772", Mark::None, true}, {"rpm"}}};
+    EXPECT_EQ(drawColumns(rows, "  ", Style(false, false, 24)), "  Short Term    0.8  %\n"
+                                                                "  Trim\n"
+                                                                "  one heading across all of them\n"
+                                                                "  RPM           772  rpm\n");
+    EXPECT_EQ(drawColumns(rows, "  ", Style(false, false, 27)), drawColumns(rows, "  ", Style())) << "as wide as it is";
+    EXPECT_TRUE(drawColumns(rows, "  ", Style(true, false, 24))
+                    .starts_with("  \033[31mShort Term\033[0m    0.8  %\n  \033[31mTrim\033[0m\n"));
+}
+
+TEST(Layout, NoColumnIsNarrowerThanItsLongestWord)
+{
+    std::vector<std::vector<Cell>> const rows = {{{"an unbreakable word"}, {"another long one"}}};
+    EXPECT_EQ(drawColumns(rows, "", Style(false, false, 20)), "an           another\n"
+                                                              "unbreakable  long\n"
+                                                              "word         one\n");
+    std::vector<std::vector<Cell>> const wide = {{{"an unbreakable word"}, {"unbreakable too"}}};
+    EXPECT_EQ(drawColumns(wide, "", Style(false, false, 20)), "an unbreakable word  unbreakable too\n");
+}
+
+TEST(Layout, TextIsWrappedToTheColumnsThatThereAre)
+{
+    EXPECT_EQ(wrapped("one two three four", 76, "    ", Style(false, false, 20)), "    one two three\n    four\n");
+    EXPECT_EQ(wrapped("one two three four", 7, "    ", Style(false, false, 20)), "    one two\n    three\n    four\n");
+}
+
 TEST(Layout, CountsOneAndMany)
 {
     EXPECT_EQ(counted(0, "code"), "0 codes");
@@ -64,6 +94,8 @@ TEST(Layout, FoldsLinesBetweenWordsBelowTheLastColumn)
                                                                                    "    eight");
     EXPECT_EQ(folded("  a very late column is of  no use to hang below", 30), "  a very late column is of  no\n"
                                                                               "      use to hang below");
+    EXPECT_EQ(folded("  Calibration   VS16-MT-0420  verification 17", 34), "  Calibration   VS16-MT-0420\n"
+                                                                           "                verification 17");
     EXPECT_EQ(folded("exactly twenty wide.\n", 20), "exactly twenty wide.\n");
     EXPECT_EQ(folded("anExtremelyLongWordStandsWhole and more", 20), "anExtremelyLongWordStandsWhole\n  and more");
     EXPECT_EQ(folded("twenty-one are äöüß €€ ok", 22), "twenty-one are äöüß €€\n  ok") << "characters, not bytes";
