@@ -1,6 +1,7 @@
 #include "libvelmora/history/history.h"
 
 #include "libvelmora/history/scanjson.h"
+#include "libvelmora/record/checkedfile.h"
 #include "libvelmora/text/text.h"
 #include "program/command/commands.h"
 #include "program/command/confirm.h"
@@ -25,6 +26,8 @@
 namespace velmora::cli {
 
 namespace {
+
+constexpr std::uintmax_t largestImport = 1'000'000'000; // bytes, of some hundred thousand scans
 
 struct HistoryOptions
 {
@@ -120,9 +123,15 @@ ExitCode exportScans(HistoryOptions const& options, GlobalOptions const& global)
 
 ExitCode importScans(HistoryOptions const& options, GlobalOptions const& global)
 {
-    std::ifstream in(options.file, std::ios::binary);
-    if (!in || !std::filesystem::is_regular_file(options.file)) {
-        throw Error(ErrorKind::WrongUse, "Could not read " + options.file, {"velmora history export FILE writes one"});
+    std::string why = whyUnreadable(options.file, largestImport);
+    std::ifstream in;
+    if (why.empty()) {
+        in.open(options.file, std::ios::binary);
+        why = in ? "" : std::strerror(errno);
+    }
+    if (!why.empty()) {
+        throw Error(ErrorKind::WrongUse, "Could not read " + options.file + ": " + why,
+                    {"velmora history export FILE writes one"});
     }
     History::Imported const result = History(History::defaultFile(), History::Access::Keep).importFrom(in);
     fmt::print("{}", global.json ? printed(Json{{"added", result.added}, {"known", result.known}})

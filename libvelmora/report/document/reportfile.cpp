@@ -1,5 +1,7 @@
 #include "libvelmora/report/document/reportfile.h"
 
+#include "libvelmora/record/checkedfile.h"
+
 #include <velmora/error.h>
 
 #include <array>
@@ -47,9 +49,13 @@ ReportForm reportFormOf(std::string const& path)
 void checkReportPath(std::string const& path, bool replace)
 {
     reportFormOf(path);
-    if (!replace && std::filesystem::exists(path)) {
+    if (!std::filesystem::exists(path)) {
+        return;
+    }
+    if (!replace) {
         throw Error(ErrorKind::Failed, "The report " + path + " exists already", {"--force replaces it"});
     }
+    requireWritable(path, "report");
 }
 
 VehicleReport withShownVins(VehicleReport report, ReportFacts const& facts)
