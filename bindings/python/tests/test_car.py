@@ -64,6 +64,25 @@ def test_any_thread_may_ask(car: velmora.Car) -> None:
     assert len(seen) == 4
 
 
+def test_other_threads_run_while_a_call_waits(car: velmora.Car) -> None:
+    ticks = 0
+    done = threading.Event()
+
+    def tick() -> None:
+        nonlocal ticks
+        while not done.wait(0.001):
+            ticks += 1
+
+    thread = threading.Thread(target=tick)
+    thread.start()
+    before = ticks
+    car.monitors()
+    meanwhile = ticks - before
+    done.set()
+    thread.join()
+    assert meanwhile > 10
+
+
 def test_readings_make_a_table(car: velmora.Car) -> None:
     pandas = pytest.importorskip("pandas")
     table = pandas.DataFrame([reading.to_dict() for reading in car.read("RPM", "SPEED")])
