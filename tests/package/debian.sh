@@ -105,7 +105,7 @@ done
 unit=$(find "$system" -type f -name velmora-watch.service)
 find /usr/lib/systemd/system -maxdepth 1 -type f -name '*.*' -exec cp -n -t "${unit%/*}" {} +
 [[ -x $system/bin/kill ]] || install -D /bin/kill "$system/bin/kill"
-said=$(systemd-analyze verify --root="$system" velmora-watch.service 2>&1) || fail "systemd-analyze verify: $said"
+said=$(systemd-analyze verify --man=no --root="$system" velmora-watch.service 2>&1) || fail "systemd-analyze verify: $said"
 [[ -z $said ]] || fail "systemd-analyze verify says: $said"
 said=$(systemd-analyze security --offline=true --threshold=25 --root="$system" velmora-watch.service) || fail "$said"
 
