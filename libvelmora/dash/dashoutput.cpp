@@ -26,6 +26,13 @@ HttpLimits dashLimits()
     return limits;
 }
 
+// Browsers tell it when they connect again by themselves; the page does it where it makes a stream anew.
+std::string lastIdOf(HttpRequest const& request)
+{
+    std::string const told = request.header("last-event-id");
+    return told.empty() && request.query.starts_with("last=") ? request.query.substr(5) : told;
+}
+
 std::string tokenOf(DashContext const& context)
 {
     return context.token.empty() ? makeToken() : context.token;
@@ -69,7 +76,7 @@ void DashOutput::addRoutes()
     addHandler("GET", "/performance.json", [this](HttpRequest const& /*request*/) { return tellRuns(); });
     addHandler("GET", "/history", [this](HttpRequest const& request) { return tellHistory(request); });
     m_server.addStream(
-        streamPath, [this](HttpRequest const& /*request*/) { return greeting(); },
+        streamPath, [this](HttpRequest const& request) { return greeting(lastIdOf(request)); },
         [this](HttpRequest const& /*request*/) {
             return HttpServer::event("values", m_state.allValues()) +
                    HttpServer::event("performance", dumpedJson(m_context.desk->runs().state(false)));
@@ -119,7 +126,7 @@ void DashOutput::write(Records records)
         m_state.take(*record);
     }
     if (std::string const values = m_state.takeValues(); !values.empty()) {
-        m_server.publishLatest(streamPath, HttpServer::event("values", values));
+        m_server.publishLatest(streamPath, HttpServer::event("values", values, m_log.add(values)));
     }
     if (m_state.takeNews()) {
         m_server.publish(streamPath, HttpServer::event("news", dumpedJson(m_state.news())));
@@ -169,7 +176,7 @@ void DashOutput::takeVehicle(DashVehicle const& vehicle)
         std::lock_guard const lock(m_layoutMutex);
         m_layout = layout;
     }
-    m_server.publish(streamPath, greeting());
+    m_server.publish(streamPath, greeting({}));
     if (!layout.is_null()) {
         wishSensors(layout);
     }
@@ -200,8 +207,11 @@ Json DashOutput::layout() const
     return m_layout;
 }
 
-std::string DashOutput::greeting() const
+// A browser whose stream broke gets what it missed in the place of the history, and first: values of now would make
+// those look old.
+std::string DashOutput::greeting(std::string const& lastId) const
 {
+    std::optional<std::string> const missed = m_log.since(lastId);
     Json const chosen = layout();
     Json histories = Json::array();
     std::vector<std::string> ids = DashLayouts::sensorsOf(chosen);
@@ -211,12 +221,13 @@ std::string DashOutput::greeting() const
     if (chosen.is_object() && chosen.contains("chart")) {
         ids = chosen["chart"].get<std::vector<std::string>>();
     }
-    for (std::string const& id : ids) {
+    for (std::string const& id : missed ? std::vector<std::string>() : ids) {
         histories.push_back(m_state.history(id, historyPoints));
     }
     Json const hello = {{"version", versionText},
                         {"allow", {{"clear", m_allowClear}, {"console", m_allowConsole}}},
                         {"vehicle", m_state.vehicle()},
+                        {"resumed", missed.has_value()},
                         {"layout", chosen},
                         {"values", Json::parse(m_state.allValues())},
                         {"history", histories},
@@ -224,7 +235,7 @@ std::string DashOutput::greeting() const
                         {"answers", m_state.answers()},
                         {"performance", m_context.desk->runs().state(false)},
                         {"beat", beatNow()}};
-    return "retry: 1000\n" + HttpServer::event("hello", dumpedJson(hello));
+    return "retry: 1000\n" + missed.value_or("") + HttpServer::event("hello", dumpedJson(hello), m_log.last());
 }
 
 } // namespace velmora

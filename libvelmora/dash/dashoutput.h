@@ -3,6 +3,7 @@
 #include "libvelmora/dash/dashaccess.h"
 #include "libvelmora/dash/dashlayouts.h"
 #include "libvelmora/dash/dashstate.h"
+#include "libvelmora/dash/eventlog.h"
 #include "libvelmora/http/httpserver.h"
 #include "libvelmora/output/health.h"
 #include "libvelmora/output/ioutput.h"
@@ -62,7 +63,7 @@ private:
     void takeAnswer(DashAnswer const& answer);
     void wishSensors(Json const& layout);
     Json layout() const;
-    std::string greeting() const;
+    std::string greeting(std::string const& lastId) const;
 
     HttpPlace const m_place;
     DashContext const m_context;
@@ -71,6 +72,7 @@ private:
     DashAccess m_access;
     DashLayouts const m_layouts;
     DashState m_state;
+    DashEventLog m_log;
     mutable std::mutex m_layoutMutex;
     Json m_layout; // protected by m_layoutMutex
     std::chrono::steady_clock::time_point m_lastBeat;

@@ -62,8 +62,9 @@ public:
     std::size_t readers() const;
     void stop();
 
-    // A server-sent event of that name, empty for none, with data of any number of lines.
-    static std::string event(std::string const& name, std::string const& data);
+    // A server-sent event of that name, empty for none, with data of any number of lines; with an id, browsers tell it
+    // when they connect again.
+    static std::string event(std::string const& name, std::string const& data, std::string const& id = {});
 
 private:
     struct Core;

@@ -62,7 +62,7 @@ HttpResponse plainResponse(unsigned int status, std::string const& text)
     return response;
 }
 
-std::string HttpServer::event(std::string const& name, std::string const& data)
+std::string HttpServer::event(std::string const& name, std::string const& data, std::string const& id)
 {
     std::string text = name.empty() ? "" : "event: " + name + "\n";
     std::size_t begin = 0;
@@ -71,7 +71,7 @@ std::string HttpServer::event(std::string const& name, std::string const& data)
         text += "data: " + data.substr(begin, end - begin) + "\n";
         begin = end + 1;
     }
-    return text + "\n";
+    return text + (id.empty() ? "\n" : "id: " + id + "\n\n");
 }
 
 } // namespace velmora

@@ -75,7 +75,9 @@ std::string drawPerformance(PerformanceView const& view, FrameStyle const& style
         lines.push_back(goalLine(goal, run, view));
     }
     lines.emplace_back("  The start is reckoned back from the first readings that rise.");
-    lines.push_back(fmt::format("  Speed comes in whole km/h each {:.0f} ms.", view.meter.interval() * 1000.0));
+    double const interval = view.meter.interval();
+    lines.push_back("  Speed comes in whole km/h" +
+                    (interval > 0.0 ? fmt::format(" each {:.0f} ms.", interval * 1000.0) : std::string(".")));
     lines.emplace_back();
     lines.push_back(
         fmt::format("Highest power and torque by engine speed, for {} kg (settings weight)", view.kilograms));

@@ -234,7 +234,13 @@ async function testPlay(browser) {
     place.dispatchEvent(new Event('change'));
   });
   await waitFor(page, `${number} === 1100`);
-  await page.screenshot({ path: path.join(pictures, 'gauges-play.png') });
+  for (const [name, width] of [['laptop', 1280], ['phone', 390], ['small', 320]]) {
+    await page.setViewport({ width, height: 800 });
+    await page.screenshot({ path: path.join(pictures, `gauges-play-${name}.png`) });
+    assert.ok(await page.evaluate('document.documentElement.scrollWidth <= innerWidth'), `the player is too wide on a ${name}`);
+    const height = await page.$eval('header', (each) => each.offsetHeight);
+    assert.ok(height < 300, `the player takes ${height} px on a ${name}`);
+  }
   await check(page, 'a recording');
   assert.deepEqual(page.problems, []);
   await page.close();

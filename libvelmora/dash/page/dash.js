@@ -94,7 +94,7 @@ function takeHello(hello) {
   setText(byId('version'), hello.version);
   byId('clear').hidden = !hello.allow.clear;
   byId('consoleLink').hidden = !hello.allow.console;
-  store.takeOffered(hello.vehicle.offered);
+  store.takeOffered(hello.vehicle.offered, hello.resumed);
   layout.take(hello.layout);
   store.takeValues(hello.values);
   hello.history.forEach(store.takeHistory);

@@ -5,6 +5,7 @@ const silentMs = 1500; // the program sends something each second
 const handlers = new Map();
 let source = null;
 let lastEvent = 0;
+let lastId = ''; // of the events that came
 let refused = false;
 let clockOffset = 0; // of the program's clock against this one
 
@@ -43,6 +44,7 @@ export async function login() {
 
 function take(name, event) {
   lastEvent = performance.now();
+  if (event.lastEventId) lastId = event.lastEventId;
   const data = JSON.parse(event.data);
   const now = data.now ?? data.beat?.now;
   if (now) clockOffset = now - Date.now();
@@ -53,7 +55,7 @@ export function open() {
   close();
   refused = false;
   lastEvent = performance.now();
-  source = new EventSource('/events');
+  source = new EventSource(lastId ? `/events?last=${lastId}` : '/events');
   for (const name of ['hello', 'values', 'beat', 'news', 'layout', 'answer', 'performance']) {
     source.addEventListener(name, (event) => take(name, event));
   }

@@ -44,7 +44,7 @@ function parts() {
   const goals = runs.goals.filter((goal) => goal.name !== wanted).map(goalRow);
   const highest = Math.max(...runs.power.map((point) => point.kw), 1);
   const list = [table(['Run', ['Time', 'right'], ['Error', 'right'], 'Speed at the end'], goals, 'Times'),
-    element('p', { class: 'faint' }, `The start is reckoned back from the first readings that rise. Speed comes in whole km/h each ${Math.round(runs.interval_s * 1000)} ms.`)];
+    element('p', { class: 'faint' }, `The start is reckoned back from the first readings that rise. Speed comes in whole km/h${runs.interval_s ? ` each ${Math.round(runs.interval_s * 1000)} ms` : ''}.`)];
   if (runs.power.length) {
     list.push(element('h3', {}, `Highest power and torque by engine speed, for ${runs.weight_kg} kg`),
       table(['Engine speed', ['Power', 'right'], ['Torque', 'right'], ''], runs.power.map((point) => powerRow(point, highest)), 'Power and torque'));

@@ -34,9 +34,9 @@ export function resetStatistics() {
   for (const sensor of sensors.values()) sensor.stats = fresh();
 }
 
-export function takeOffered(list) {
+export function takeOffered(list, resumed) {
   offered = list;
-  for (const sensor of sensors.values()) sensor.hasHistory = false; // a broken stream leaves gaps
+  if (!resumed) for (const sensor of sensors.values()) sensor.hasHistory = false; // a broken stream leaves gaps
   for (const about of list) Object.assign(known(about.id), about, { precision: known(about.id).precision });
 }
 

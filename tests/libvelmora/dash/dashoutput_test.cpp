@@ -365,4 +365,52 @@ TEST(DashPlay, TellsARecordingAsIfItCameNow)
     EXPECT_THAT(Page().post("/ask", R"({"topic":"play","paused":true})"), StartsWith("HTTP/1.1 400"));
 }
 
+TEST(DashOutput, AStreamThatBrokeBringsWhatWasMissed)
+{
+    Page const page;
+    std::string id;
+    {
+        HttpClient stream(page.output->port());
+        stream.send("GET /events HTTP/1.1\r\nHost: localhost\r\n\r\n");
+        EXPECT_EQ(nextEvent(stream, "hello")["resumed"], false);
+        page.get("/");
+        page.desk->tell(dashReading("RPM", 800.0, 1000));
+        page.output->write({});
+        EXPECT_EQ(nextEvent(stream, "values")["v"][0][2], 800);
+        stream.readUntil("id: ");
+        id = stream.readUntil("\n");
+        id = id.substr(0, id.find('\n'));
+    }
+    for (int i = 1; i <= 3; ++i) {
+        page.desk->tell(dashReading("RPM", 800.0 + i, 1000 + i * 100));
+        page.output->write({});
+    }
+    for (std::string const& way :
+         {"GET /events HTTP/1.1\r\nLast-Event-ID: " + id, "GET /events?last=" + id + " HTTP/1.1"}) {
+        HttpClient again(page.output->port());
+        again.send(way + "\r\nHost: localhost\r\n\r\n");
+        for (int i = 1; i <= 3; ++i) {
+            EXPECT_EQ(nextEvent(again, "values")["v"][0][2], 800 + i) << way;
+        }
+        EXPECT_EQ(nextEvent(again, "hello")["resumed"], true);
+    }
+    for (std::string const& other : std::vector<std::string>{"1-1", "x", id + "0", id + "x", "-"}) {
+        HttpClient again(page.output->port());
+        again.send("GET /events HTTP/1.1\r\nHost: localhost\r\nLast-Event-ID: " + other + "\r\n\r\n");
+        EXPECT_EQ(nextEvent(again, "hello")["resumed"], false) << other;
+    }
+}
+
+TEST(DashEventLog, KeepsNoMoreThanItsBytes)
+{
+    velmora::DashEventLog log;
+    std::string const first = log.add("a");
+    EXPECT_EQ(log.since(log.last()), "");
+    std::string const second = log.add(std::string(velmora::DashEventLog::mostBytes - 1, 'b'));
+    EXPECT_TRUE(log.since(first));
+    log.add("cc");
+    EXPECT_EQ(log.since(first), std::nullopt) << "the event behind it was dropped";
+    EXPECT_THAT(log.since(second).value_or(""), HasSubstr("data: cc\n"));
+}
+
 } // namespace
