@@ -61,8 +61,16 @@ bool ModuleMessages::addConsecutive(BusLine const& line, std::string const& digi
         note(Habit::OrphanFrame);
         return false;
     }
+    // A number that this message does not reach is of another one.
+    std::size_t const told = line.bytes[0] & 0x0FU;
+    std::size_t const frames = message->length / m_carried;
+    if (frames < sequenceNumbers - 1 && (told == 0 || told > frames)) {
+        ++m_orphans[line.module];
+        note(Habit::OrphanFrame);
+        return false;
+    }
     std::size_t const number = message->lines.size();
-    if ((line.bytes[0] & 0x0FU) != number % sequenceNumbers) {
+    if (told != number % sequenceNumbers) {
         message->inOrder = false;
     }
     std::size_t const missing = message->length - (m_carried - 1) - m_carried * (number - 1);

@@ -41,7 +41,7 @@ public:
     bool add(BusLine const& line, std::string const& digits, std::size_t place);
 
     std::vector<ModuleMessage>& all() { return m_messages; }
-    // How many consecutive frames of a module came in front of its first frame.
+    // How many consecutive frames of a module came that belong to no message of it here.
     std::size_t orphans(unsigned int module) const
     {
         auto const found = m_orphans.find(module);

@@ -1,14 +1,17 @@
 #include "libvelmora/channel/fastchannel.h"
 
 #include <algorithm>
+#include <limits>
 #include <utility>
 
 namespace velmora {
 
 namespace {
 
-// For a second piece behind a prompt, which some adapters send; at 9600 baud it is one character's time.
+// For a second piece behind a prompt, which some adapters send; at 9600 baud it is one character's time. Those that do
+// show it soon.
 constexpr WireTime grace{1};
+constexpr int enoughGraces = 4;
 // A sender waits for the exchange of another thread no longer than for a late prompt.
 constexpr WireTime longestTurn{6000};
 constexpr WireTime turnSlice{100};
@@ -44,25 +47,32 @@ bool FastChannel::receive(std::vector<unsigned char>& out, int timeoutMs)
     }
     // With nothing outstanding nothing can come, but for an adapter that is just starting.
     bool const idle = !m_pending && m_begun && !m_starting;
+    bool const prepared = !m_ready.empty();
+    bool const hurries = m_vainGraces >= enoughGraces && m_habits[static_cast<std::size_t>(Habit::StaleReply)] == 0;
     WireTime const latency = m_pending ? std::exchange(m_pending->latency, WireTime(0)) : WireTime(0);
-    WireTime const end = m_wire->now() + (idle ? std::min(timeout, grace) : timeout + latency);
+    WireTime const patience = !idle ? timeout + latency : hurries ? WireTime(0) : std::min(timeout, grace);
+    WireTime const end = m_wire->now() + patience;
     takeReplies();
     while (m_ready.empty() && isValid()) {
-        std::string const bytes = m_wire->read(m_pending ? std::min(end, remedyTime()) : end);
+        std::string const bytes = m_wire->read(m_pending ? std::min({end, remedyTime(), cutTime()}) : end);
         hear(bytes);
         if (!bytes.empty()) {
             continue;
         }
         if (m_pending && m_wire->now() >= remedyTime()) {
             remedy();
+        } else if (m_pending && m_wire->now() >= cutTime()) {
+            cutWait();
         } else if (m_wire->now() >= end) {
             break;
         }
     }
     publish();
     if (m_ready.empty()) {
+        m_vainGraces += idle && patience > WireTime(0) ? 1 : 0;
         return false;
     }
+    m_vainGraces = idle && !prepared ? std::numeric_limits<int>::min() : m_vainGraces;
     out.assign(m_ready.front().begin(), m_ready.front().end());
     m_ready.pop_front();
     return true;

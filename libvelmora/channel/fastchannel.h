@@ -8,6 +8,7 @@
 #include "libvelmora/channel/replyhealer.h"
 #include "libvelmora/channel/returnnote.h"
 #include "libvelmora/channel/turn.h"
+#include "libvelmora/channel/waitcutter.h"
 #include "libvelmora/channel/wire.h"
 
 #include <obd/idataconnection.h>
@@ -43,8 +44,9 @@ struct ChannelOptions
 //                    |  the host has given up: the next send waits for the late prompt, or wakes the adapter
 //
 // All work is done on the threads that send and receive. The members stand in several files: fastchannel.cpp (the
-// interface), fastchannel_exchange.cpp (one exchange), fastchannel_recovery.cpp (prompts lost, adapters reset),
-// fastchannel_haste.cpp (counts, waits, memory), fastchannel_address.cpp (requests to one module),
+// interface), fastchannel_exchange.cpp (one exchange), fastchannel_reply.cpp (what becomes of a reply),
+// fastchannel_recovery.cpp (prompts lost, adapters reset), fastchannel_haste.cpp (counts, waits, memory),
+// fastchannel_cut.cpp (waits that adapters do not shorten), fastchannel_address.cpp (requests to one module),
 // fastchannel_stay.cpp (several of them, and what a broken link leaves behind).
 class FastChannel : public obd::IDataConnection, public IChannelControl
 {
@@ -95,6 +97,8 @@ private:
         bool woken = false;
         bool verifying = false; // asked once more with the full wait
         bool setUpAgain = false;
+        bool cutTried = false;           // its wait is not cut (again)
+        std::optional<WireTime> cutAt{}; // when its wait was cut
         std::thread::id asker{};
     };
 
@@ -159,11 +163,19 @@ private:
     bool needsFullWait(HealedReply const& reply) const;
     void adaptWait(HealedReply const& reply);
     static std::string waitCommand(unsigned int steps);
+    static WireTime waitTime(unsigned int steps);
     void setWait(unsigned int steps);
     void giveWaitBack();
     void learnVehicle(HealedReply const& reply);
     std::string adapterKey() const;
     void keepLearnt();
+
+    // Waits that the adapter does not shorten.
+    bool mayCut() const;
+    WireTime cutTime() const;
+    void cutWait();
+    std::string withoutOwnStop(std::string const& raw) const;
+    bool takeCut(HealedReply const& reply);
 
     void note(Habit habit) { ++m_habits[static_cast<std::size_t>(habit)]; }
     void publish();
@@ -190,6 +202,7 @@ private:
     ReplyHealer m_healer{m_habits};
     CountLearner m_learner;
     BringUpMemory m_memory;
+    WaitCutter m_cutter;
     ChannelStatistics m_working;
     bool m_echoChecked = false;
     bool m_echoStuck = false;
@@ -199,6 +212,7 @@ private:
     bool m_busSpoke = false; // a request has brought data
     bool m_begun = false;    // something was sent
     bool m_starting = false; // a reset was the last command
+    int m_vainGraces = 0;    // receives that could bring nothing, and brought nothing
     int m_protocolsChosen = 0;
     std::optional<WireTime> m_resetAt; // the last reset of the adapter
     int m_triedProtocol = 0;           // sent in the place of a search; 0 for none

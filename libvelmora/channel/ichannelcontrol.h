@@ -23,6 +23,7 @@ struct ChannelStatistics
     bool countingWorks = false;         // a counted reply was taken
     bool countingOff = false;           // the adapter made three mistakes by it, or refuses it
     std::optional<unsigned int> waitMs; // how long the adapter waits, where the channel has shortened it
+    unsigned int waitsCut = 0;          // waits that the adapter would not shorten, and the channel ended
     unsigned int slowestReplyMs = 0;    // of the vehicle
 };
 

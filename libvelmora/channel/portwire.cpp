@@ -15,12 +15,14 @@ PortWire::PortWire(std::unique_ptr<IPort> port) : m_port(std::move(port))
 {
     m_port->start(
         [this](std::string_view bytes) {
-            std::lock_guard const lock(m_mutex);
-            if (m_open) { // a port that floods goes on until it is closed
-                m_incoming += bytes;
-                m_open = m_incoming.size() <= mostUnread;
+            {
+                std::lock_guard const lock(m_mutex);
+                if (m_open) { // a port that floods goes on until it is closed
+                    m_incoming += bytes;
+                    m_open = m_incoming.size() <= mostUnread;
+                }
             }
-            m_wake.notify_one();
+            m_wake.notify_one(); // with the mutex free, so that who reads is not woken to wait for it
         },
         [this] {
             std::lock_guard const lock(m_mutex);
@@ -44,7 +46,10 @@ std::string PortWire::read(WireTime until)
 {
     std::unique_lock lock(m_mutex);
     std::chrono::steady_clock::time_point const limit{until};
-    m_wake.wait_until(lock, limit, [this] { return !m_incoming.empty() || !m_open || m_givenUp; });
+    auto const done = [this] { return !m_incoming.empty() || !m_open || m_givenUp; };
+    if (!done() && limit > std::chrono::steady_clock::now()) { // most reads only look
+        m_wake.wait_until(lock, limit, done);
+    }
     return std::exchange(m_incoming, {});
 }
 

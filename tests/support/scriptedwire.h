@@ -39,10 +39,21 @@ public:
     // While it is silent nothing is answered, whatever was told.
     void setSilent(bool silent) { m_silent = silent; }
 
-    // The commands that came, in their order; forgets them.
+    // What a blank brings that interrupts; without it a blank is passed over.
+    void onInterrupt(Reply reply) { m_onInterrupt = std::move(reply); }
+
+    // The commands that came, and blanks that interrupted, in their order; forgets them.
     std::vector<std::string> takeCommands() { return std::exchange(m_commands, {}); }
 
 private:
+    void interrupt() override
+    {
+        m_commands.emplace_back(" ");
+        if (!m_onInterrupt.empty()) {
+            silence();
+            sayAll(m_onInterrupt);
+        }
+    }
     void answer(std::string const& command) override
     {
         m_commands.push_back(command);
@@ -56,6 +67,10 @@ private:
                 known->second.pop_front();
             }
         }
+        sayAll(reply);
+    }
+    void sayAll(Reply const& reply)
+    {
         velmora::WireTime delay{0};
         for (Piece const& piece : reply) {
             delay += piece.delay;
@@ -65,6 +80,7 @@ private:
 
     std::map<std::string, std::deque<Reply>> m_replies;
     std::vector<std::string> m_commands;
+    Reply m_onInterrupt;
     bool m_silent = false;
 };
 

@@ -33,13 +33,17 @@ public:
     // Said so long from now.
     void say(std::string const& bytes, velmora::WireTime delay) { m_output.emplace(m_now + delay, bytes); }
 
+    // Takes back what was to come.
+    void silence() { m_output.clear(); }
+    bool isTalking() const { return !m_output.empty(); }
+
 private:
     std::multimap<velmora::WireTime, std::string> m_output;
     velmora::WireTime m_now{1000};
     bool m_up = true;
 };
 
-// The same with an adapter that answers line by line.
+// The same with an adapter that answers line by line. Blanks mean nothing in a line; while it talks they interrupt it.
 class LineWire : public TimedWire
 {
 public:
@@ -48,13 +52,16 @@ public:
         for (char const character : bytes) {
             if (character == '\r') {
                 answer(std::exchange(m_line, {}));
-            } else {
+            } else if (character != ' ') {
                 m_line += character;
+            } else if (isTalking()) {
+                interrupt();
             }
         }
     }
 
 private:
+    virtual void interrupt() {}
     // A command without its line end.
     virtual void answer(std::string const& command) = 0;
 

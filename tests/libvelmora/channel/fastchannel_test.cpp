@@ -27,6 +27,25 @@ TEST(FastChannel, AReceiveThatCanBringNothingEndsAfterAShortGrace)
     EXPECT_LE(rig.wire->now() - before, WireTime(5));
     rig.wire->say("more\r>", WireTime(1)); // a second piece
     EXPECT_TRUE(rig.channel.receive(bytes, 200));
+    for (int i = 0; i < 10; ++i) {
+        EXPECT_FALSE(rig.channel.receive(bytes, 200));
+    }
+    rig.wire->say("more\r>", WireTime(1));
+    EXPECT_TRUE(rig.channel.receive(bytes, 200)) << "an adapter that does so is always waited for";
+}
+
+TEST(FastChannel, AnAdapterThatSendsNoSecondPiecesIsNotWaitedForAgainAndAgain)
+{
+    ChannelRig rig;
+    rig.ask("ATE0");
+    std::vector<unsigned char> bytes;
+    WireTime before = rig.wire->now();
+    for (int i = 0; i < 10; ++i) {
+        EXPECT_FALSE(rig.channel.receive(bytes, 200));
+    }
+    EXPECT_LE(rig.wire->now() - before, WireTime(4));
+    rig.wire->say("more\r>", WireTime(0));
+    EXPECT_TRUE(rig.channel.receive(bytes, 200)) << "what is there is taken all the same";
 }
 
 TEST(FastChannel, WaitsForAReplyAsLongAsItIsTold)

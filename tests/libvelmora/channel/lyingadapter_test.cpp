@@ -1,5 +1,6 @@
 // An adapter that lies: it cuts replies at another count than it was told, brings a reply with the next request,
-// forgets every fiftieth prompt and loses characters. No value may ever stand under the wrong sensor.
+// forgets every fiftieth prompt, loses characters, and stops at an interruption or not. No value may ever stand under
+// the wrong sensor.
 
 #include "libobd/message/messageparser.h"
 #include "libvelmora/channel/fastchannel.h"
@@ -33,8 +34,9 @@ std::size_t dataBytes(unsigned int pid)
 class LyingWire : public support::LineWire
 {
 public:
-    // severity: how many times as often as it should be.
-    LyingWire(unsigned int seed, unsigned int severity) : m_random(seed), m_severity(severity) {}
+    // severity: how many times as often as it should be. wait: behind each reply, whatever ATST says.
+    LyingWire(unsigned int seed, unsigned int severity, int wait) : m_random(seed), m_severity(severity), m_wait(wait)
+    {}
 
     int faults = 0;
 
@@ -62,6 +64,14 @@ private:
             frames.push_back(id + "2" + std::to_string(frames.size()) + frameDigits({begin, begin + 7}));
         }
         return frames;
+    }
+
+    void interrupt() override
+    {
+        if (!happens(10)) {
+            silence();
+            say("STOPPED\r\r>", WireTime(m_random() % 8));
+        }
     }
 
     void answer(std::string const& command) override
@@ -114,12 +124,13 @@ private:
         }
         say(text, WireTime(15));
         if (!happens(50)) {
-            say("\r>", WireTime(told != 0 ? 16 : 80));
+            say("\r>", WireTime(told != 0 ? 16 : m_wait));
         }
     }
 
     std::mt19937 m_random;
     unsigned int const m_severity;
+    int const m_wait;
     std::vector<std::string> m_held;
 };
 
@@ -150,10 +161,12 @@ TEST(LyingAdapter, NoValueEverStandsUnderTheWrongSensorInAHundredThousandFaults)
     long answered = 0;
     long values = 0;
     unsigned int counted = 0;
+    unsigned int cut = 0;
     for (unsigned int seed = 1; faults < faultsInAll; ++seed) {
-        auto const wire = std::make_shared<LyingWire>(seed, severities[seed % std::size(severities)]);
+        int const wait = seed % 2 == 0 ? 80 : 400;
+        auto const wire = std::make_shared<LyingWire>(seed, severities[seed % std::size(severities)], wait);
         FastChannel channel(wire, {});
-        for (char const* command : {"ATI", "ATE0", "ATST64", "ATTP0", "ATDPN", "ATH1"}) {
+        for (char const* command : {"ATI", "ATE0", "ATST64", "ATTP0", "ATDPN", "ATH1", "0100"}) {
             test::speak(channel, command, 700);
         }
         channel.onConnected();
@@ -174,10 +187,12 @@ TEST(LyingAdapter, NoValueEverStandsUnderTheWrongSensorInAHundredThousandFaults)
         }
         faults += wire->faults;
         counted += channel.statistics().counted;
+        cut += channel.statistics().waitsCut;
     }
     EXPECT_GT(answered, faultsInAll / 2);
     EXPECT_GT(values, faultsInAll / 2);
     EXPECT_GT(counted, static_cast<unsigned int>(faultsInAll) / 100) << "the counting was on trial, too";
+    EXPECT_GT(cut, static_cast<unsigned int>(faultsInAll) / 1000) << "and so were the waits that are cut";
     RecordProperty("faults", faults);
     RecordProperty("values", std::to_string(values));
 }

@@ -55,6 +55,7 @@ protected:
             session.connect();
             Json report = Json::parse(readVehicle(session).toJson());
             m_counted += session.channel().statistics().counted;
+            m_cut += session.channel().statistics().waitsCut;
             return report;
         } catch (Error const&) {
             return {};
@@ -77,25 +78,49 @@ protected:
     support::WorkerClock m_clock;
     testsupport::TemporaryFolder const m_folder;
     unsigned int m_counted = 0;
+    unsigned int m_cut = 0;
 };
 
 // With the engine standing, so that a value does not depend on when it was asked.
 TEST_F(ReportEquality, EverySimulatedCar)
 {
     for (std::string const& vehicle : obdsim::simulatedVehicles()) {
-        auto const stand = [&vehicle] {
-            auto car = obdsim::simulateCar({vehicle, "elm327-v1.5", {}});
+        auto const stand = [&vehicle](std::vector<std::string> const& faults = {}) {
+            auto car = obdsim::simulateCar({vehicle, "elm327-v1.5", faults});
             car->control("engine stop");
             car->control("voltage 12.4");
             return car;
         };
         Json const plain = read(stand(), true, {});
-        Json const fast = read(stand(), false, {});
         EXPECT_TRUE(plain.contains("modules")) << vehicle;
-        for (auto const& [field, values] : differences(plain, fast)) {
-            ADD_FAILURE() << vehicle << " " << field << ": " << values;
+        // The second adapter listens that long whatever it agrees to.
+        for (auto const& faults : {std::vector<std::string>{}, {"wait=400"}}) {
+            Json const fast = read(stand(faults), false, {});
+            for (auto const& [field, values] : differences(plain, fast)) {
+                ADD_FAILURE() << vehicle << " " << field << ": " << values;
+            }
         }
     }
+    EXPECT_GT(m_counted, 0U);
+    EXPECT_GT(m_cut, 0U);
+}
+
+// On a slow adapter each of them would cost half a second.
+TEST_F(ReportEquality, AReportAsksForNoValueTwiceThatItHas)
+{
+    auto const car = obdsim::simulateCar({"bench-can11", "elm327-v1.5", {}});
+    ASSERT_FALSE(read(car, false, {}).is_null());
+    auto const asked = [&car](std::string const& request) {
+        auto const counts = car->requests().counts();
+        auto const found = counts.find(request);
+        return found != counts.end() ? found->second : std::uint64_t{0};
+    };
+    EXPECT_EQ(asked("01030506070C42"), 2U) << "at the start and at the end, in one request each";
+    EXPECT_EQ(asked("010F1F2131"), 1U);
+    for (char const* single : {"0103", "010C", "0142", "0121", "0131"}) {
+        EXPECT_EQ(asked(single), 0U) << single;
+    }
+    EXPECT_EQ(asked("0101") + asked("01011"), 4U) << "discovery, codes, and two kinds of readiness";
 }
 
 // Without a first request there is no bring-up.

@@ -1,0 +1,33 @@
+#include "libvelmora/channel/waitcutter.h"
+
+namespace velmora {
+
+namespace {
+
+constexpr WireTime noticeable{100}; // beyond what a slow line and a slow adapter explain
+constexpr WireTime soon{150};       // slow adapters take 90 ms for a command
+constexpr int enoughLate = 2;
+constexpr int mostFailures = 2;
+
+} // namespace
+
+void WaitCutter::saw(WireTime waited, WireTime agreed)
+{
+    m_late = waited > agreed + noticeable ? m_late + 1 : 0;
+}
+
+void WaitCutter::cut(WireTime took, bool whole)
+{
+    if (!whole) {
+        m_failures = mostFailures; // it may do worse than lose a reply, such as start anew
+    } else if (took > soon) {
+        ++m_failures;
+    }
+}
+
+bool WaitCutter::pays() const
+{
+    return m_late >= enoughLate && m_failures < mostFailures;
+}
+
+} // namespace velmora
