@@ -34,9 +34,11 @@ void DispatchLoop::setListener(std::function<void()> listener)
 
 void DispatchLoop::wake()
 {
-    std::lock_guard const lock(m_mutex);
-    m_woken = true;
-    m_wake.notify_one();
+    {
+        std::lock_guard const lock(m_mutex);
+        m_woken = true;
+    }
+    m_wake.notify_one(); // with the mutex free, so that who waits is not woken to wait for it
 }
 
 bool DispatchLoop::runUntil(std::function<bool()> const& condition, std::chrono::steady_clock::time_point limit)

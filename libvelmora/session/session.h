@@ -1,15 +1,16 @@
 #pragma once
 
+#include "libvelmora/channel/ichannelcontrol.h"
 #include "libvelmora/port/portaddress.h"
 #include "libvelmora/session/deadline.h"
 #include "libvelmora/session/dispatchloop.h"
 #include "libvelmora/session/libraryuse.h"
-#include "libvelmora/session/link.h"
 #include "libvelmora/session/openingwatch.h"
 #include "libvelmora/session/sessionoptions.h"
 #include "libvelmora/signal/signalset.h"
 
 #include <obd/iadapter.h>
+#include <obd/idataconnection.h>
 #include <obd/iecumanager.h>
 #include <obd/iobdproxy.h>
 #include <obd/iobdvelmora.h>
@@ -26,6 +27,7 @@
 namespace velmora {
 
 class DialogueRecorder;
+class Link;
 class SettingsStore;
 class TrafficTrace;
 
@@ -71,7 +73,7 @@ public:
     // Those that are not metric, of the two kinds.
     Units imperialUnits() const;
     // What the channel to the adapter is told, and tells. After connect only.
-    IChannelControl& channel() const { return m_link->control(); }
+    IChannelControl& channel() const;
     // Signals of one's own and built-in ones. Reads their files the first time: throws Error for one that was named and
     // holds mistakes.
     std::shared_ptr<SignalSet const> signals();
@@ -95,9 +97,9 @@ public:
     void interrupt();
     bool interrupted() const { return m_interrupted; }
     // Whether the link has broken.
-    bool lost() const { return m_link != nullptr && m_link->lost(); }
+    bool lost() const;
     // Whether the adapter has said nothing for seconds, though it was woken.
-    bool adapterSilent() const { return m_link != nullptr && channel().statistics().adapterSilent; }
+    bool adapterSilent() const;
 
 private:
     enum class Phase
