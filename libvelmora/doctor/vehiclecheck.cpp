@@ -1,6 +1,7 @@
 #include "libvelmora/doctor/vehiclecheck.h"
 
-#include "libvelmora/poll/multireply.h"
+#include "libvelmora/channel/busline.h"
+#include "libvelmora/read/multireply.h"
 #include "libvelmora/text/text.h"
 
 #include <obd/iecu.h>

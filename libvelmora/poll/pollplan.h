@@ -1,7 +1,7 @@
 #pragma once
 
 #include "libvelmora/poll/multilimit.h"
-#include "libvelmora/poll/multireply.h"
+#include "libvelmora/read/multireply.h"
 
 #include <map>
 #include <optional>

@@ -19,14 +19,35 @@ std::optional<InfoReport::Reading> toReading(std::shared_ptr<obd::SensorDataMode
     return InfoReport::Reading{sensor->value->value, unitLabel(sensor->unit)};
 }
 
-InfoReport::Travel readTravel(Session& session, bool sinceMil)
+// PIDs of service 01 that tell how far and how long.
+struct TravelPids
 {
+    unsigned int distance;
+    unsigned int runTime;
+};
+constexpr TravelPids withLamp{0x21, 0x4D};
+constexpr TravelPids sinceCleared{0x31, 0x4E};
+
+std::optional<InfoReport::Reading> findReading(std::vector<LiveValue> const& values, unsigned int pid)
+{
+    auto const found =
+        std::find_if(values.begin(), values.end(), [pid](LiveValue const& value) { return value.pid == pid; });
+    return found != values.end() ? std::optional(InfoReport::Reading{found->value, found->unit}) : std::nullopt;
+}
+
+InfoReport::Travel readTravel(Session& session, TravelPids const& pids, std::vector<LiveValue> const& values)
+{
+    bool const sinceMil = pids.distance == withLamp.distance;
     auto const service = obd::TroubleCodeServiceBuilder::createTroubleCodeService();
-    InfoReport::Travel travel;
-    travel.distance = toReading(service->askDistance(sinceMil).value);
-    session.check();
-    travel.runTime = toReading(service->askRuntime(sinceMil).value);
-    session.check();
+    InfoReport::Travel travel{findReading(values, pids.distance), findReading(values, pids.runTime)};
+    if (!travel.distance) {
+        travel.distance = toReading(service->askDistance(sinceMil).value);
+        session.check();
+    }
+    if (!travel.runTime) {
+        travel.runTime = toReading(service->askRuntime(sinceMil).value);
+        session.check();
+    }
     return travel;
 }
 
@@ -61,6 +82,11 @@ std::string readVin(Session& session, obd::IEcu const& ecu)
 
 InfoReport readInfo(Session& session, obd::IEcu const& ecu)
 {
+    return readInfoBeside(session, ecu, {});
+}
+
+InfoReport readInfoBeside(Session& session, obd::IEcu const& ecu, std::vector<LiveValue> const& values)
+{
     using Service = obd::IEcuService;
     session.select(ecu);
     InfoReport report;
@@ -74,8 +100,8 @@ InfoReport readInfo(Session& session, obd::IEcu const& ecu)
     report.calibrations = pairCalibrations(ids, numbers);
     report.engineSerialNumber = askFor(session, &Service::askEngineSerialNumber);
     report.erotan = askFor(session, &Service::askErotan);
-    report.withLamp = readTravel(session, true);
-    report.sinceCleared = readTravel(session, false);
+    report.withLamp = readTravel(session, withLamp, values);
+    report.sinceCleared = readTravel(session, sinceCleared, values);
     return report;
 }
 

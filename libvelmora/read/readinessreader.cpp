@@ -29,6 +29,11 @@ std::optional<bool> readLamp()
 
 ReadinessReport readReadiness(Session& session, obd::IEcu const& ecu)
 {
+    return readReadinessBeside(session, ecu, std::nullopt);
+}
+
+ReadinessReport readReadinessBeside(Session& session, obd::IEcu const& ecu, std::optional<bool> lamp)
+{
     session.select(ecu);
     auto const service = obd::DiagnosticsServiceBuilder::create();
     auto const sinceCleared = service->askReadinessMonitors();
@@ -36,7 +41,7 @@ ReadinessReport readReadiness(Session& session, obd::IEcu const& ecu)
     if (!sinceCleared.isTold()) {
         return {toAnswer(sinceCleared), {}, {}};
     }
-    ReadinessReport report{TopicAnswer::Read, readLamp(), {}};
+    ReadinessReport report{TopicAnswer::Read, lamp ? lamp : readLamp(), {}};
     session.check();
     Monitors const thisCycle = service->askReadinessMonitorsThisCycle().value;
     session.check();

@@ -9,7 +9,9 @@
 #include <obd/sensorvalue.h>
 
 #include <algorithm>
+#include <iterator>
 #include <span>
+#include <utility>
 
 namespace velmora {
 
@@ -23,15 +25,14 @@ constexpr unsigned char movingPids[] = {0x03, 0x05, 0x06, 0x07, 0x08, 0x09, 0x0C
 class ValueReading
 {
 public:
-    ValueReading(Session& session, obd::IEcu const& ecu, unsigned char pid)
+    ValueReading(Session& session, obd::IEcu const& ecu, std::shared_ptr<obd::IObdProxy> const& bus, unsigned char pid)
         : m_ecu(ecu), m_units(session.obd().getSettings()->unitSystem()),
           m_parameter(obd::ParameterFactory().createParameter(ecu, *session.obd().getSettings(),
                                                               obd::ParameterIdentifier(pid).id()))
     {
         if (m_parameter != nullptr) {
             // An update is well where any module answered; the values of one that did not would be fallbacks.
-            m_told = m_parameter->update(session.proxy()) == obd::IQuery::UpdateStatus::UpdateOk &&
-                     m_parameter->delivered(ecu);
+            m_told = m_parameter->update(bus) == obd::IQuery::UpdateStatus::UpdateOk && m_parameter->delivered(ecu);
             session.check();
         }
     }
@@ -81,29 +82,52 @@ private:
     bool m_told = false;
 };
 
-std::vector<LiveValue> readPids(Session& session, obd::IEcu const& ecu, std::span<unsigned char const> pids)
+std::vector<LiveValue> readPids(Session& session, obd::IEcu const& ecu, std::shared_ptr<GroupedPids> const& bus,
+                                std::vector<unsigned char> const& pids)
 {
     session.select(ecu);
     std::vector<LiveValue> list;
     for (unsigned char const pid : pids) {
-        if (ecu.isSupported(obd::ObdMode::CurrentData, pid, 0)) {
-            std::vector<LiveValue> const values = ValueReading(session, ecu, pid).values(pid);
-            list.insert(list.end(), values.begin(), values.end());
-        }
+        std::vector<LiveValue> const values = ValueReading(session, ecu, bus, pid).values(pid);
+        list.insert(list.end(), values.begin(), values.end());
     }
     return list;
 }
 
-} // namespace
-
-std::vector<LiveValue> readValues(Session& session, obd::IEcu const& ecu)
+std::vector<unsigned char> supported(obd::IEcu const& ecu, std::span<unsigned char const> pids)
 {
-    return readPids(session, ecu, wantedPids);
+    std::vector<unsigned char> list;
+    std::copy_if(pids.begin(), pids.end(), std::back_inserter(list),
+                 [&ecu](unsigned char pid) { return ecu.isSupported(obd::ObdMode::CurrentData, pid, 0); });
+    return list;
 }
 
-void readValuesAgain(Session& session, obd::IEcu const& ecu, std::vector<LiveValue>& values)
+// First those that are asked for again later, so that one request stands for both times.
+std::vector<unsigned char> movingFirst(std::vector<unsigned char> pids)
 {
-    for (LiveValue& later : readPids(session, ecu, movingPids)) {
+    std::stable_partition(pids.begin(), pids.end(), [](unsigned char pid) {
+        return std::find(std::begin(movingPids), std::end(movingPids), pid) != std::end(movingPids);
+    });
+    return pids;
+}
+
+} // namespace
+
+std::vector<LiveValue> readValues(Session& session, obd::IEcu const& ecu, std::shared_ptr<GroupedPids> const& bus)
+{
+    std::vector<unsigned char> const pids = supported(ecu, wantedPids);
+    bus->fetch(movingFirst(pids));
+    session.check();
+    return readPids(session, ecu, bus, pids);
+}
+
+void readValuesAgain(Session& session, obd::IEcu const& ecu, std::shared_ptr<GroupedPids> const& bus,
+                     std::vector<LiveValue>& values)
+{
+    std::vector<unsigned char> const pids = supported(ecu, movingPids);
+    bus->fetch(pids);
+    session.check();
+    for (LiveValue& later : readPids(session, ecu, bus, pids)) {
         auto const known = std::find_if(values.begin(), values.end(), [&later](LiveValue const& each) {
             return each.pid == later.pid && each.part == later.part;
         });

@@ -27,24 +27,29 @@ std::vector<unsigned int> sensorsOf(obd::IEcu const& ecu)
     return sensors;
 }
 
+// What one topic has told is not asked for again by the next.
 ModuleReport readModule(Session& session, obd::IEcu const& ecu, CodeReader& reader)
 {
     constexpr unsigned char newestFrame = 0;
     // Between the two readings of the values lies all else, which takes seconds: what is the same in both lasts.
-    std::vector<LiveValue> values = readValues(session, ecu);
+    auto const bus = std::make_shared<GroupedPids>(session.proxy(), ecu.id());
+    std::vector<LiveValue> values = readValues(session, ecu, bus);
+    InfoReport info = readInfoBeside(session, ecu, values);
+    CodeReport codes = reader.read(ecu, {CodeKind::Confirmed, CodeKind::Pending, CodeKind::Permanent});
+    std::optional<bool> const lamp = codes.lamp;
     ModuleReport report{ecu.id(),
                         readable(ecu.name()),
                         sensorsOf(ecu),
-                        readInfo(session, ecu),
-                        reader.read(ecu, {CodeKind::Confirmed, CodeKind::Pending, CodeKind::Permanent}),
+                        std::move(info),
+                        std::move(codes),
                         readFreeze(session, ecu, newestFrame),
-                        readReadiness(session, ecu),
+                        readReadinessBeside(session, ecu, lamp),
                         readMonitors(session, ecu),
                         readOxygen(session, ecu),
                         readCounters(session, ecu),
                         toAnswer(ecu.detection(obd::ObdMode::CurrentData, 0)),
                         {}};
-    readValuesAgain(session, ecu, values);
+    readValuesAgain(session, ecu, bus, values);
     report.values = std::move(values);
     return report;
 }

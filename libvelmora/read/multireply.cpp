@@ -1,4 +1,4 @@
-#include "libvelmora/poll/multireply.h"
+#include "libvelmora/read/multireply.h"
 
 #include <algorithm>
 

@@ -1,5 +1,5 @@
 #include "libvelmora/poll/multilimit.h"
-#include "libvelmora/poll/multireply.h"
+#include "libvelmora/read/multireply.h"
 #include "tests/support/hexbytes.h"
 
 #include <obd/parameterfactory.h>
