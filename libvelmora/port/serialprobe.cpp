@@ -123,16 +123,24 @@ std::string cleaned(std::string answer)
     return text;
 }
 
+// An adapter's prompt stands in a line of its own, alone; a console's stands behind a name.
+bool hasPrompt(std::string const& answer)
+{
+    std::size_t const prompt = answer.find('>');
+    constexpr std::string_view lineEnds("\r\n\0", 3);
+    return prompt != std::string::npos && prompt != 0 && lineEnds.find(answer[prompt - 1]) != std::string_view::npos;
+}
+
 // A prompt is what no modem and no printer sends. What stood in the adapter's line before makes the first question an
 // unknown command, so that one is asked again.
 SerialProbe askAt(BorrowedLine const& line, unsigned int baud)
 {
     std::string answer = line.ask();
-    if (answer.find('>') != std::string::npos && cleaned(answer).ends_with('?')) {
+    if (hasPrompt(answer) && cleaned(answer).ends_with('?')) {
         answer = line.ask();
     }
     std::string const text = cleaned(answer);
-    if (answer.find('>') != std::string::npos && !text.empty()) {
+    if (hasPrompt(answer) && !text.empty()) {
         return {Outcome::Adapter, baud, text};
     }
     return {text.empty() ? Outcome::Silent : Outcome::OtherThing, 0, text};

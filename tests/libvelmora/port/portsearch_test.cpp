@@ -7,6 +7,7 @@
 #include <fmt/format.h>
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <atomic>
 #include <cstdlib>
 #include <fcntl.h>
@@ -14,6 +15,7 @@
 #include <fstream>
 #include <mutex>
 #include <poll.h>
+#include <sys/file.h>
 #include <termios.h>
 #include <thread>
 #include <unistd.h>
@@ -123,6 +125,8 @@ TEST(SerialProbe, AModemSurvivesAndItsLineIsLeftAsItWas)
     EXPECT_EQ(before.c_iflag, after.c_iflag);
     EXPECT_EQ(before.c_oflag, after.c_oflag);
     EXPECT_EQ(::cfgetospeed(&before), ::cfgetospeed(&after));
+    EXPECT_EQ(::cfgetispeed(&before), ::cfgetispeed(&after));
+    EXPECT_TRUE(std::equal(std::begin(before.c_cc), std::end(before.c_cc), std::begin(after.c_cc)));
 }
 
 std::string plainFile()
@@ -136,6 +140,39 @@ TEST(SerialProbe, WhatIsNoPortIsTold)
 {
     EXPECT_EQ(velmora::probeSerialPort("/dev/velmora-none", {38400}).outcome, Outcome::Missing);
     EXPECT_EQ(velmora::probeSerialPort(plainFile(), {38400}).outcome, Outcome::NoPort);
+}
+
+TEST(SerialProbe, AConsoleWithAPromptOfItsOwnIsNoAdapter)
+{
+    ScriptedDevice const console("ATI\r\n% Unknown command\r\nswitch>", B38400);
+    SerialProbe const probe = velmora::probeSerialPort(console.path(), {38400});
+    EXPECT_EQ(probe.outcome, Outcome::OtherThing);
+    EXPECT_EQ(console.received(), "ATI\r");
+}
+
+// A printer that prints whatever it is sent answers nothing at all.
+TEST(SerialProbe, WhatSaysNothingIsAskedOnceARateAndLeftAsItWas)
+{
+    ScriptedDevice const printer("", B9600);
+    termios const before = printer.settings();
+    EXPECT_EQ(velmora::probeSerialPort(printer.path(), {38400, 9600}).outcome, Outcome::Silent);
+    EXPECT_EQ(printer.received(), "ATI\rATI\r");
+    termios const after = printer.settings();
+    EXPECT_EQ(before.c_lflag, after.c_lflag);
+    EXPECT_EQ(::cfgetospeed(&before), ::cfgetospeed(&after));
+}
+
+// Another open file of the same line stands for another program: its lock tells, though /proc doesn't.
+TEST(SerialProbe, WhatAnotherProgramHoldsIsNotAsked)
+{
+    ScriptedDevice const modem("OK\r\n", B38400);
+    int const other = ::open(modem.path().c_str(), O_RDWR | O_NOCTTY | O_CLOEXEC);
+    ASSERT_EQ(::flock(other, LOCK_EX | LOCK_NB), 0);
+    SerialProbe const probe = velmora::probeSerialPort(modem.path(), {38400});
+    ::close(other);
+    EXPECT_EQ(probe.outcome, Outcome::Held);
+    EXPECT_EQ(probe.text, "") << "by whom is not readable";
+    EXPECT_EQ(modem.received(), "");
 }
 
 // A folder that stands for /run/lock, /proc and a device.
@@ -197,6 +234,26 @@ TEST(PortSearch, TriesTheLastGoodOneFirstAndPassesOthersBy)
     search.last = SerialAddress{server->address(), 38400};
     velmora::findAdapter(search);
     EXPECT_EQ(told, fmt::format("Trying {} at 38400 baud ...\n", server->address()));
+}
+
+// Neither is opened, and each is named with the program that holds it.
+TEST_F(PortHolderTest, ASearchPassesHeldPortsByAndNamesTheirHolders)
+{
+    ScriptedDevice const modem("ELM327 v1.5\r\r>", B38400);
+    std::ofstream(m_root / ("locks/LCK.." + fs::path(modem.path()).filename().string())) << "      4711\n";
+    fs::create_symlink(m_root / "ttyUSB0", m_root / "proc/4711/fd/3");
+    PortSearch search;
+    search.ports = {{m_root / "ttyUSB0", ""}, {modem.path(), ""}};
+    search.baud = 38400;
+    search.places = {{m_root / "locks"}, m_root / "proc"};
+    try {
+        velmora::findAdapter(search);
+        FAIL();
+    } catch (velmora::Error const& error) {
+        EXPECT_EQ(error.hints()[0], (m_root / "ttyUSB0").string() + " is held by minicom (process 4711)");
+        EXPECT_EQ(error.hints()[1], modem.path() + " is held by minicom (process 4711)");
+    }
+    EXPECT_EQ(modem.received(), "");
 }
 
 TEST(PortSearch, TellsOfEachPortWhatWasFound)
