@@ -40,6 +40,7 @@ CommandReply setProtocol(CommandContext& context, std::string const& argument)
 {
     CommandReply reply = tryProtocol(context, argument);
     context.bus.store();
+    reply.delay = stored().delay;
     return reply;
 }
 

@@ -28,7 +28,7 @@ const Command commands[] = {
     {"@1", "", 100, notDiamex, description},
     {"@2", "", 100, notDiamex & ~elm, identifier},
     {"@2", "", 130, elm, identifier},
-    {"@3", "*", 130, elm, accept},
+    {"@3", "*", 130, elm, keep},
     {"!00", "", 100, diamex, identifier},
     {"!01", "", 100, diamex, description},
     {"!10", "", 100, diamex, voltage},
@@ -55,7 +55,7 @@ const Command commands[] = {
     {"CS", "", 100, all, canStatus},
     {"CSM", "f", 142, all, accept},
     {"CTM", "1|5", 210, elm, accept},
-    {"CV", "hhhh", 100, all, accept},
+    {"CV", "hhhh", 100, all, keep},
     {"D", "", 100, all, defaults},
     {"D", "f", 130, all, onOff<&Settings::lengths>},
     {"DM1", "", 120, all, monitor},
@@ -99,7 +99,7 @@ const Command commands[] = {
     {"PA", "h", 100, diamex, diamexTryProtocol},
     {"PB", "hhhh", 140, all, accept},
     {"PC", "", 100, all, closeProtocol},
-    {"PP", "hhON|hhOFF|hhSVhh", 110, all, accept},
+    {"PP", "hhON|hhOFF|hhSVhh", 110, all, keep},
     {"PPS", "", 110, all, parameters},
     {"R", "f", 100, all, onOff<&Settings::responses>},
     {"RA", "hh", 130, all, receiveAddress},
@@ -208,6 +208,11 @@ Settings factorySettings(AdapterProfile const& profile)
 CommandReply ok()
 {
     return line("OK");
+}
+
+CommandReply stored()
+{
+    return {{"OK"}, After::Nothing, Ms(30)};
 }
 
 CommandReply refused()

@@ -61,6 +61,8 @@ Settings factorySettings(AdapterProfile const& profile);
 std::optional<CommandCall> findCommand(AdapterProfile const& profile, std::string const& text);
 
 CommandReply ok();
+/// OK of a command that writes to the EEPROM first: some 30 ms (ELM327 data sheet v1.4b, page 24).
+CommandReply stored();
 CommandReply refused();
 CommandReply line(std::string text);
 

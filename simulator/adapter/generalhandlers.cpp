@@ -31,6 +31,11 @@ CommandReply accept(CommandContext& /*context*/, std::string const& /*argument*/
     return ok();
 }
 
+CommandReply keep(CommandContext& /*context*/, std::string const& /*argument*/)
+{
+    return stored();
+}
+
 CommandReply reset(CommandContext& context, std::string const& /*argument*/)
 {
     context.settings = factorySettings(context.profile);
@@ -112,7 +117,7 @@ CommandReply savedByte(CommandContext& context, std::string const& /*argument*/)
 CommandReply saveByte(CommandContext& context, std::string const& argument)
 {
     context.bus.saveByte(static_cast<std::uint8_t>(hexValue(argument)));
-    return ok();
+    return stored();
 }
 
 CommandReply ignition(CommandContext& context, std::string const& /*argument*/)

@@ -6,6 +6,7 @@
 namespace obdsim::handler {
 
 CommandReply accept(CommandContext& context, std::string const& argument);
+CommandReply keep(CommandContext& context, std::string const& argument);
 CommandReply reset(CommandContext& context, std::string const& argument);
 CommandReply warmStart(CommandContext& context, std::string const& argument);
 CommandReply defaults(CommandContext& context, std::string const& argument);

@@ -50,6 +50,19 @@ TEST(ReplyTimer, waitsHalfAsLongAgainAsTheSlowestReply)
     EXPECT_NEAR(waitAfter(host, "0100"), 4.2 + 58 + 0.3 + 16 * 4.096, 1) << "never above ATST";
 }
 
+TEST(CommandTimes, resetsAndWhatIsStoredTakeLonger)
+{
+    auto host = quiet(fastAndSlow);
+    for (char const* command : {"ATSP6", "ATSD7F", "ATPP0CSV23", "ATPP0CON", "ATCV1234", "AT@3123456789012"}) {
+        EXPECT_NEAR(waitAfter(host, command), 34, 1) << command;
+    }
+    for (char const* command : {"ATTP6", "ATST64", "ATRV", "ATRD"}) {
+        EXPECT_NEAR(waitAfter(host, command), 4, 1) << command;
+    }
+    EXPECT_NEAR(waitAfter(host, "ATWS"), 6, 1);
+    EXPECT_NEAR(waitAfter(host, "ATZ"), 804, 1);
+}
+
 TEST(ReplyTimer, firstReplyHasAllTheTime)
 {
     auto host = quiet(fastAndSlow);
