@@ -37,6 +37,22 @@ TEST(Live, LinkThatBreaksIsExitCodeEightAndKeepsTheRecording)
     std::remove(file.c_str());
 }
 
+TEST(Live, WhoAsksWithoutThePauseIsToldSoOnce)
+{
+    std::vector<std::string> const live{"-p", "sim:petrol-can11?instant", "live", "RPM", "--count", "20"};
+    auto const toldTimes = [&live](std::vector<std::string> const& options) {
+        std::vector<std::string> arguments = live;
+        arguments.insert(arguments.end(), options.begin(), options.end());
+        Outcome const outcome = runVelmora(arguments);
+        EXPECT_EQ(outcome.exitCode, 0) << outcome.err;
+        std::string const words = "Asking without the pause that spares the vehicle";
+        std::size_t const first = outcome.err.find(words);
+        return first == std::string::npos ? 0 : outcome.err.find(words, first + 1) == std::string::npos ? 1 : 2;
+    };
+    EXPECT_EQ(toldTimes({"--fast"}), 1);
+    EXPECT_EQ(toldTimes({}), 0) << "the pause is kept by default";
+}
+
 // What `velmora ... | head -1` needs: a reader that has gone ends it without a complaint.
 TEST(Live, EndsQuietlyWhenItsReaderHasGone)
 {

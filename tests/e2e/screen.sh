@@ -137,6 +137,12 @@ stays '^Coolant +69 °C +20 ' "the values of then"
 tmux -L "$name" send-keys q
 until_seen 'ended with 0' "q ends a recording"
 
+begin 80 24 C.UTF-8 "$live --fast"
+until_seen 'Asking without the pause that spares the vehicle' "the warning of --fast"
+stays 'q quit|RPM' "the table beside the warning"
+tmux -L "$name" send-keys q
+until_seen 'ended with 0' "q ends the fast view"
+
 begin 100 50 C.UTF-8 "$velmora --port 'sim:petrol-can11?instant' --quiet dash --listen 127.0.0.1:0 --allow-clear"
 until_seen 'http://127[.]0[.]0[.]1:[0-9]+/#t=' "the link of the page"
 until_seen '[▀▄█]{5}' "the QR code"
