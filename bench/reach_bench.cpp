@@ -6,13 +6,12 @@
 // without the simulated car, which is a process of its own. Bring-up and scan: seconds. The adapter's own time for a
 // command is 0.
 
+#include "bench/carprocess.h"
 #include "libvelmora/channel/portwire.h"
 #include "libvelmora/poll/vehiclepoll.h"
-#include "libvelmora/port/openport.h"
+#include "libvelmora/port/opening/openport.h"
 #include "libvelmora/read/vehiclereader.h"
 #include "libvelmora/session/session.h"
-#include "simulator/server.h"
-#include "simulator/simulation.h"
 #include "tests/support/plainchannel.h"
 
 #include <benchmark/benchmark.h>
@@ -21,9 +20,7 @@
 #include <chrono>
 #include <filesystem>
 #include <string>
-#include <sys/prctl.h>
 #include <sys/resource.h>
-#include <sys/wait.h>
 #include <thread>
 #include <unistd.h>
 
@@ -34,47 +31,6 @@ using Clock = std::chrono::steady_clock;
 
 constexpr std::chrono::seconds settling{6}; // habits of adapter and modules are learnt by then
 constexpr std::chrono::seconds measured{5};
-
-// A simulated car in a process of its own, so that its work is not counted.
-class CarProcess
-{
-public:
-    explicit CarProcess(obdsim::SimulationOptions const& car)
-    {
-        int ends[2] = {-1, -1};
-        if (::pipe(ends) != 0) {
-            throw std::runtime_error("no pipe");
-        }
-        m_process = ::fork();
-        if (m_process == 0) {
-            ::prctl(PR_SET_PDEATHSIG, SIGKILL);
-            auto const server = obdsim::serveTcp(obdsim::simulate(car), "127.0.0.1", 0);
-            std::string const address = server->address() + "\n";
-            if (::write(ends[1], address.data(), address.size()) > 0) {
-                server->run();
-            }
-            ::_exit(0);
-        }
-        for (char each = 0; ::read(ends[0], &each, 1) == 1 && each != '\n';) {
-            m_address += each;
-        }
-        ::close(ends[0]);
-        ::close(ends[1]);
-    }
-    ~CarProcess()
-    {
-        ::kill(m_process, SIGKILL);
-        ::waitpid(m_process, nullptr, 0);
-    }
-    CarProcess(CarProcess const&) = delete;
-    CarProcess& operator=(CarProcess const&) = delete;
-
-    std::string const& address() const { return m_address; }
-
-private:
-    pid_t m_process = -1;
-    std::string m_address;
-};
 
 // A folder for what is learnt, empty at the start.
 class Visits
