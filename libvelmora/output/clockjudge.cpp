@@ -2,6 +2,7 @@
 
 #include <cstdlib>
 #include <ctime>
+#include <filesystem>
 #include <fstream>
 #include <sys/timex.h>
 
@@ -26,6 +27,18 @@ bool knowsTimeServer()
     return ::adjtimex(&state) != -1 && (state.status & STA_UNSYNC) == 0;
 }
 
+bool hasBattery()
+{
+    std::error_code error;
+    for (auto const& each : std::filesystem::directory_iterator("/sys/class/rtc", error)) {
+        std::ifstream in(each.path() / "hctosys");
+        if (in.get() == '1') {
+            return true;
+        }
+    }
+    return false;
+}
+
 std::string bootId()
 {
     std::ifstream in("/proc/sys/kernel/random/boot_id");
@@ -39,7 +52,8 @@ std::string bootId()
 ClockLook lookAtClocks()
 {
     static std::string const id = bootId();
-    return {millisOf(CLOCK_REALTIME), millisOf(CLOCK_BOOTTIME), knowsTimeServer(), id};
+    static bool const battery = hasBattery();
+    return {millisOf(CLOCK_REALTIME), millisOf(CLOCK_BOOTTIME), knowsTimeServer(), id, battery};
 }
 
 ClockStamp stampOf(ClockLook const& look)
@@ -63,7 +77,7 @@ std::int64_t ClockJudge::look(ClockLook const& now)
     m_known = true;
     m_offset = offset;
     bool const stable = now.boot - m_lastSet >= untilBelieved;
-    if (now.synced || (stable && now.wall >= earliest)) {
+    if (now.synced || ((stable || now.battery) && now.wall >= earliest)) {
         m_trust = Trust::Sure;
     } else {
         m_trust = stable ? Trust::Never : Trust::Wait;

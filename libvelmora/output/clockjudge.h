@@ -15,6 +15,7 @@ struct ClockLook
     std::int64_t boot = 0; // ms since the machine's start
     bool synced = false;   // the kernel knows of a time server
     std::string bootId;    // new with each start of the machine
+    bool battery = false;  // at that start it was set by a clock that runs on without power
 };
 
 using ClockSource = std::function<ClockLook()>;

@@ -67,7 +67,8 @@ std::string healthText(Health const& health)
                         &OutputCounts::failing);
     text += overOutputs(health, "velmora_output_up", "gauge", "Whether the output's connection stands.",
                         [](OutputCounts const& counts) { return counts.state.up; });
-    text += overOutputs(health, "velmora_output_spool_records", "gauge", "Records that wait on the disk.",
+    text += overOutputs(health, "velmora_output_spool_records", "gauge",
+                        "Records that the output holds back itself, on the disk or until the clock is right.",
                         [](OutputCounts const& counts) { return counts.state.waiting; });
     return text;
 }

@@ -232,7 +232,9 @@ bool SessionCar::probe()
 void SessionCar::wait(std::chrono::milliseconds time)
 {
     auto const limit = std::chrono::steady_clock::now() + time;
-    if (m_session != nullptr) {
+    // The library keeps an idle connection alive by a request, and makes it where it is dispatched: a parked car gets
+    // none.
+    if (m_poller != nullptr) {
         m_session->loop().runUntil(
             [this, limit] { return m_session->interrupted() || std::chrono::steady_clock::now() >= limit; }, limit);
         return;

@@ -33,9 +33,16 @@ std::chrono::milliseconds WatchEngine::step(WatchTime const& now)
         return restingStep;
     }
     watchClock(now);
-    // Without a link nobody knows whether the car still runs.
-    if (m_connected || m_judge.state() != SleepJudge::State::Asking) {
+    if (std::optional<std::chrono::milliseconds> const pause = std::exchange(m_pause, std::nullopt)) {
+        m_nextAttempt = now.steady + *pause; // the attempt took its time, too
+    }
+    if (std::exchange(m_looked, false)) {
+        m_lastReading = now.steady;
+    }
+    if (m_judge.state() != SleepJudge::State::Asking) {
         m_judge.onTime(now.steady);
+    } else if (std::exchange(m_fresh, false)) {
+        m_judge.wake(now.steady); // on a slow bus it took minutes to get here
     }
     try {
         if (now.steady >= m_nextAttempt) {
@@ -51,6 +58,9 @@ std::chrono::milliseconds WatchEngine::step(WatchTime const& now)
         onLost(error, now);
     }
     tellTrip(m_trips.onTime(now));
+    if (m_pause) {
+        return std::chrono::milliseconds(0);
+    }
     return m_asking ? askingStep : restingStep;
 }
 
@@ -111,6 +121,7 @@ void WatchEngine::onConnected(WatchTime const& now)
     m_everConnected = true;
     m_sink(m_car.sensors());
     m_judge.wake(now.steady);
+    m_fresh = true;
     m_lastReading = now.steady;
     lookAtCodes(now);
 }
@@ -135,18 +146,17 @@ void WatchEngine::onLost(Error const& error, WatchTime const& now)
     m_connected = false;
     m_napping = false;
     m_car.disconnect();
-    m_nextAttempt = now.steady + m_backoff.next();
+    m_pause = m_backoff.next();
     m_state = "no link";
 }
 
 void WatchEngine::work(WatchTime const& now)
 {
     followJudge(now);
-    if (m_judge.state() == SleepJudge::State::Asking) {
-        if (m_connected) {
-            ask(now);
-        }
-    } else {
+    if (m_judge.state() == SleepJudge::State::Asking && m_connected) {
+        ask(now);
+    }
+    if (m_judge.state() != SleepJudge::State::Asking) {
         stopAsking(now);
         park(now);
     }

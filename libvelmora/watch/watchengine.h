@@ -8,6 +8,7 @@
 #include "libvelmora/watch/tripmeter.h"
 
 #include <functional>
+#include <optional>
 #include <string>
 
 namespace velmora {
@@ -85,6 +86,8 @@ private:
     std::string m_state = "connecting";
     std::string m_trouble;
     bool m_connected = false; // adapter and vehicle were brought up
+    bool m_fresh = false;     // with the last step
+    bool m_looked = false;    // at codes with the last step, which takes its time
     bool m_asking = false;
     bool m_everConnected = false;
     bool m_metStranger = false;
@@ -96,6 +99,7 @@ private:
     bool m_lowTold = false;
     bool m_unsureTold = false;
     SteadyTime m_nextAttempt;
+    std::optional<std::chrono::milliseconds> m_pause; // from the next step on, until the next attempt
     SteadyTime m_nextClockLook;
     SteadyTime m_lastReading;
     SteadyTime m_lastCheck;

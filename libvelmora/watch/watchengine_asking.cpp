@@ -15,6 +15,9 @@ void WatchEngine::ask(WatchTime const& now)
     }
     watchSilence(now);
     lookAtVoltage(now);
+    // Not before what was read meanwhile: a look at the codes takes its time. Without a link nobody knows whether the
+    // car still runs, so this is no matter of time alone.
+    m_judge.onTime(now.steady);
     followJudge(now);
     if (m_asking && m_nextCodes && now.steady >= *m_nextCodes) {
         lookAtCodes(now);
@@ -71,6 +74,7 @@ void WatchEngine::setIgnition(bool on, WatchTime const& now)
 void WatchEngine::lookAtCodes(WatchTime const& now)
 {
     m_nextCodes = now.steady + m_rules.codesEvery;
+    m_looked = true;
     for (CodeLook const& look : m_car.lookAtCodes()) {
         for (Record& each : m_codes.take(look, now.wall)) {
             m_sink(std::move(each));

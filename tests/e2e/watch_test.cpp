@@ -265,6 +265,12 @@ TEST(Watch, EndsInTimeWhileAnAdapterIsCalledThatDoesNotAnswer)
     expectEnding("adapter");
 }
 
+TEST(Watch, SendsNoRequestToAParkedCar)
+{
+    std::string const script = VELMORA_SOURCE_DIR "/tests/e2e/parked.py";
+    EXPECT_EQ(std::system(("/usr/bin/python3 " + script + " " VELMORA_PROGRAM).c_str()), 0);
+}
+
 // The network goes, and no connection is closed.
 TEST(Watch, NoticesABrokerThatIsOutOfReachAndLosesNothing)
 {

@@ -1,3 +1,4 @@
+#include "libvelmora/output/holdingoutput.h"
 #include "libvelmora/output/opening/outputfactory.h"
 #include "libvelmora/output/sqliteoutput.h"
 #include "tests/support/records.h"
@@ -6,6 +7,7 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <sstream>
 
 namespace {
@@ -224,6 +226,24 @@ TEST(ClockRepair, LinesThatNobodyCanDateAreWrittenAsTheyAreAndThatIsTold)
     other->close();
     EXPECT_THAT(folder.read("b"), HasSubstr("1970-01-01T00:00:00.000Z,van"));
     EXPECT_THAT(hasty.told, ElementsAre(HasSubstr("the clock was not set")));
+}
+
+TEST(ClockRepair, OnlySoManyLinesWait)
+{
+    TemporaryFolder const folder;
+    YoungMachine machine;
+    auto const output =
+        velmora::makeOutput(velmora::parseOutputAddress("csv-long:" + folder.file("a")), machine.context());
+    output->open();
+    std::vector<velmora::SharedRecord> const many(velmora::HoldingOutput::most, records(machine.rpm(1.0, 0))[0]);
+    output->write(many);
+    std::uintmax_t const header = std::filesystem::file_size(folder.file("a"));
+    EXPECT_THAT(machine.told, IsEmpty());
+    output->write(records(machine.rpm(1.0, 0)));
+    std::string const text = folder.read("a").substr(header);
+    EXPECT_EQ(std::ranges::count(text, '\n'), velmora::HoldingOutput::most + 1);
+    EXPECT_THAT(machine.told, ElementsAre(HasSubstr("the clock was not set")));
+    output->close();
 }
 
 // What can't be written is given again, and repaired no second time.

@@ -294,6 +294,13 @@ TEST(ClockJudge, TellsAWrongClockByItsWay)
     alone.look({sane + 1, 300000, false, ""});
     EXPECT_EQ(alone.trust(), ClockJudge::Trust::Sure);
 
+    ClockJudge kept; // a laptop, far from any network
+    kept.look({sane, 1000, false, "", true});
+    EXPECT_EQ(kept.trust(), ClockJudge::Trust::Sure);
+    ClockJudge empty; // its battery has gone flat
+    empty.look({1000000, 1000, false, "", true});
+    EXPECT_EQ(empty.trust(), ClockJudge::Trust::Wait);
+
     ClockJudge lost;
     lost.look({1000000, 300000, false, ""});
     EXPECT_EQ(lost.trust(), ClockJudge::Trust::Never);

@@ -7,6 +7,8 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <functional>
+
 namespace {
 
 using namespace std::chrono_literals;
@@ -38,15 +40,20 @@ public:
     bool woken = false;
     int naps = 0;
     int given = 0; // readings
+    std::function<void()> onAttempt = [] {};
+    std::function<void()> onConnect = [] {};
+    std::function<void()> onCodes = [] {};
 
     void connect() override
     {
         ++connects;
+        onAttempt();
         needLink();
         asked += 10;
         if (!answers) {
             throw Error(ErrorKind::VehicleSilent, "no module answers");
         }
+        onConnect();
         m_up = true;
     }
     void disconnect() override
@@ -83,6 +90,7 @@ public:
         needLink();
         asked += 3;
         ++codeLooks;
+        onCodes();
         return {{0x7E8, lamp, {}, {}}};
     }
     void check() override { needLink(); }
@@ -163,10 +171,17 @@ struct Watch
     {
         velmora::SteadyTime const end = time.steady() + duration;
         while (time.steady() < end) {
-            time.pass(std::min<std::chrono::milliseconds>(
-                engine.step(time.now), std::chrono::ceil<std::chrono::milliseconds>(end - time.steady())));
+            std::chrono::milliseconds const pause = step();
+            auto const left = std::chrono::ceil<std::chrono::milliseconds>(end - time.steady());
+            time.pass(std::clamp(pause, std::chrono::milliseconds(0), std::max(left, std::chrono::milliseconds(0))));
         }
-        engine.step(time.now);
+        step();
+    }
+    // What it does may take time, of which it does not know.
+    std::chrono::milliseconds step()
+    {
+        velmora::WatchTime const now = time.now;
+        return engine.step(now);
     }
     void drive(std::chrono::milliseconds duration)
     {
@@ -249,6 +264,16 @@ TEST(WatchEngine, TriesAMissingAdapterAtGrowingPauses)
     EXPECT_EQ(watch.engine.trouble(), "");
 }
 
+TEST(WatchEngine, PausesBeginWhenAnAttemptHasEnded)
+{
+    Watch watch;
+    watch.car.plugged = false;
+    watch.car.onAttempt = [&watch] { watch.time.pass(20s); }; // an adapter out of reach, by its operating system
+    watch.run(1h);
+    EXPECT_GE(watch.car.connects, 3600 / 80);
+    EXPECT_LE(watch.car.connects, 3600 / 50 + 6);
+}
+
 TEST(WatchEngine, ALinkThatComesBackInADriveIsUsedAtOnce)
 {
     Watch watch;
@@ -259,6 +284,24 @@ TEST(WatchEngine, ALinkThatComesBackInADriveIsUsedAtOnce)
     int const before = watch.readings;
     watch.drive(2min);
     EXPECT_GT(watch.readings, before + 100);
+}
+
+// A K line takes minutes to be brought up and to tell its codes.
+TEST(WatchEngine, TimeThatASlowBusTakesIsNoSilenceOfTheCar)
+{
+    Watch watch;
+    watch.car.onConnect = [&watch] { watch.time.pass(3min); };
+    watch.run(4min); // the ignition is on, the engine stands
+    EXPECT_EQ(watch.engine.state(), "asking");
+    watch.run(90s);
+    EXPECT_THAT(watch.events, Contains("asleep"));
+
+    Watch driving;
+    driving.drive(1min);
+    driving.car.onCodes = [&driving] { driving.time.pass(3min); };
+    driving.drive(30min);
+    EXPECT_THAT(driving.events, testing::Not(Contains("asleep")));
+    EXPECT_EQ(driving.engine.state(), "running");
 }
 
 TEST(WatchEngine, ASleepingCarIsNoError)
