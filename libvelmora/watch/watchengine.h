@@ -102,7 +102,6 @@ private:
     std::optional<std::chrono::milliseconds> m_pause; // from the next step on, until the next attempt
     SteadyTime m_nextClockLook;
     SteadyTime m_lastReading;
-    SteadyTime m_lastCheck;
     std::optional<SteadyTime> m_nextCodes;
     std::uint64_t m_losses = 0;
     std::uint64_t m_probes = 0;

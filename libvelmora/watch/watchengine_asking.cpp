@@ -13,6 +13,7 @@ void WatchEngine::ask(WatchTime const& now)
     for (Reading const& each : m_car.readings()) {
         take(each, now);
     }
+    m_car.check(); // a link that broke brings no readings, which a silent car does neither
     watchSilence(now);
     lookAtVoltage(now);
     // Not before what was read meanwhile: a look at the codes takes its time. Without a link nobody knows whether the
@@ -53,11 +54,9 @@ void WatchEngine::take(Reading const& reading, WatchTime const& now)
 
 void WatchEngine::watchSilence(WatchTime const& now)
 {
-    if (now.steady - m_lastReading < m_rules.silence || now.steady - m_lastCheck < m_rules.silence) {
+    if (now.steady - m_lastReading < m_rules.silence) {
         return;
     }
-    m_lastCheck = now.steady;
-    m_car.check();
     setIgnition(false, now);
     if (now.steady - m_lastReading >= m_rules.silentCar) {
         m_judge.sleep(now.steady);

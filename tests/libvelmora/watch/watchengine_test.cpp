@@ -243,6 +243,18 @@ TEST(WatchEngine, SurvivesALinkLossAMinuteForADay)
     EXPECT_GT(watch.readings, 1440 * 2 * 30);
 }
 
+TEST(WatchEngine, TellsABrokenLinkAtOnceAndTriesAgain)
+{
+    Watch watch;
+    watch.drive(1min);
+    watch.car.plugged = false;
+    watch.run(500ms);
+    EXPECT_THAT(watch.events, Contains("link_lost")) << "not after the silence that a car may keep";
+    watch.car.plugged = true;
+    watch.run(2s);
+    EXPECT_THAT(watch.events, Contains("link_back"));
+}
+
 TEST(WatchEngine, TriesAMissingAdapterAtGrowingPauses)
 {
     Watch watch;
