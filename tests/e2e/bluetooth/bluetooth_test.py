@@ -7,6 +7,7 @@ import os
 import signal
 import subprocess
 import sys
+import threading
 import time
 import unittest
 
@@ -91,6 +92,34 @@ class Bluetooth(unittest.TestCase):
         path = self.add_ble()
         self.control.LoseAfter(path, 25)
         self.expect(['-p', f'ble://{BLE}', 'scan'], 8)
+
+    def test_watch_comes_back_after_a_loss(self):
+        for path, port in ((self.add_ble(), f'ble://{BLE}'), (self.add_classic(), f'bt://{CLASSIC}')):
+            watch = subprocess.Popen([PROGRAM, '--settings', os.path.join(FOLDER, 'settings'), '-q', '-p', port, 'watch', 'RPM',
+                                      '--output', 'ndjson:-'], stdout=subprocess.PIPE, stderr=subprocess.PIPE, text=True,
+                                     env={**os.environ, 'STATE_DIRECTORY': FOLDER})
+            limit = threading.Timer(60, watch.kill)
+            limit.start()
+            try:
+                self.values(watch, 3)
+                self.control.LoseAfter(path, 1)
+                seen = self.values(watch, 3, behind='link_lost')
+                self.assertIn('link_back', seen)
+            finally:
+                limit.cancel()
+                watch.send_signal(signal.SIGINT)
+                watch.communicate(timeout=20)
+
+    def values(self, watch, count, behind=''):
+        """Reads lines until so many values have come, behind an event if it is told."""
+        text = ''
+        for line in watch.stdout:
+            text += line
+            if behind in text and '"RPM"' in line:
+                count -= 1
+            if not count:
+                return text
+        self.fail(f'the watch ended: {text}{watch.stderr.read()}')
 
     def test_loss_in_the_midst_of_a_reply_is_told_as_a_lost_link(self):
         ble, classic = self.add_ble(), self.add_classic()

@@ -98,6 +98,7 @@ def _written(device, data):
         return
     device.sizes.append(len(data))
     if device.loses_after and len(device.sizes) >= device.loses_after:
+        device.loses_after = 0
         lose(device)
         return
     device.bridge.sendall(data)
@@ -300,6 +301,7 @@ def ConnectProfileSerial(device, uuid):
     def sent(data):
         device.sizes.append(len(data))
         if not data or (device.loses_after and len(device.sizes) >= device.loses_after):
+            device.loses_after = 0
             lose(device)
         else:
             device.bridge.sendall(data)
