@@ -8,7 +8,6 @@ namespace velmora {
 
 namespace {
 
-constexpr WireTime never = WireTime::max();
 constexpr std::string_view stopped = "STOPPED";
 
 // The word for it stands behind all else.
@@ -34,7 +33,7 @@ bool FastChannel::mayCut() const
 // When the wait that the adapter agreed to is over.
 WireTime FastChannel::cutTime() const
 {
-    return m_pending && mayCut() ? m_pending->dataAt + waitTime(m_waitSteps) : never;
+    return m_pending && mayCut() ? m_pending->dataAt + waitTime(m_waitSteps) : WireTime::max();
 }
 
 // Every module that was discovered must have spoken, each message whole: then the wait is for nobody who is known. A

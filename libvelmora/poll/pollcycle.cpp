@@ -7,7 +7,7 @@ namespace velmora {
 
 namespace {
 
-constexpr int mostFailures = 3;                 // failed turns in a row
+constexpr int mostFailedTurns = 3;              // failed turns in a row
 constexpr std::chrono::seconds silencePause{2}; // so that what stays silent does not hold up the rest
 
 } // namespace
@@ -73,7 +73,7 @@ void PollCycle::step()
     if (isGuest ? runGuest(m_guests[task - m_tasks.size()]) : run(m_tasks[task])) {
         m_failures[task] = 0;
         m_notBefore = start + m_pace.floor;
-    } else if (++m_failures[task] >= mostFailures) {
+    } else if (++m_failures[task] >= mostFailedTurns) {
         m_scheduler.postpone(task, m_wire.now() + silencePause);
     }
     if (std::exchange(m_limitsChanged, false)) {

@@ -10,7 +10,7 @@ namespace {
 
 constexpr unsigned char currentData = 0x01;
 constexpr unsigned char negativeReply = 0x7F;
-constexpr unsigned int replyLimitMs = 1500;
+constexpr unsigned int pollReplyLimitMs = 1500;
 
 std::set<unsigned int> modulesOf(std::vector<std::size_t> const& members, std::vector<PollWish> const& wishes)
 {
@@ -28,13 +28,13 @@ obd::IDevice::Status PollCycle::ask(std::vector<unsigned char> const& request, s
                                     obd::ResponseMap& responses)
 {
     if (!m_mayAddress || modules.size() != 1) {
-        return m_wire.execute(request, responses, replyLimitMs);
+        return m_wire.execute(request, responses, pollReplyLimitMs);
     }
     unsigned int const module = *modules.begin();
     AddressTrial& trial = m_trials[{module, request}];
     PollTime const start = m_wire.now();
-    obd::IDevice::Status const status =
-        m_wire.execute(request, responses, replyLimitMs, trial.isAddressed() ? std::optional(module) : std::nullopt);
+    obd::IDevice::Status const status = m_wire.execute(request, responses, pollReplyLimitMs,
+                                                       trial.isAddressed() ? std::optional(module) : std::nullopt);
     if (responses.contains(module)) {
         trial.answered(std::chrono::duration_cast<std::chrono::milliseconds>(m_wire.now() - start));
     } else {

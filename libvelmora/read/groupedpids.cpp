@@ -11,11 +11,11 @@ namespace {
 
 using Status = obd::IDevice::Status;
 
-constexpr unsigned char liveService = 0x01;
-constexpr std::size_t mostTogether = 6;
+constexpr unsigned char groupService = 0x01;
+constexpr std::size_t mostInGroup = 6;
 constexpr unsigned int groupLimitMs = 1500;
 
-std::optional<std::size_t> lengthOf(unsigned char pid)
+std::optional<std::size_t> groupedLength(unsigned char pid)
 {
     return obd::ParameterFactory::dataLength(obd::ParameterIdentifier(pid).id());
 }
@@ -29,10 +29,10 @@ void GroupedPids::fetch(std::span<unsigned char const> pids)
     m_alone = m_alone || (bus != obd::ObdProtocolCan11 && bus != obd::ObdProtocolCan29);
     std::vector<unsigned char> group;
     for (std::size_t i = 0; i < pids.size() && !m_alone; ++i) {
-        if (lengthOf(pids[i])) {
+        if (groupedLength(pids[i])) {
             group.push_back(pids[i]);
         }
-        if (group.size() == mostTogether || i + 1 == pids.size()) {
+        if (group.size() == mostInGroup || i + 1 == pids.size()) {
             m_alone = group.size() > 1 && !fetchGroup(group);
             group.clear();
         }
@@ -42,14 +42,14 @@ void GroupedPids::fetch(std::span<unsigned char const> pids)
 // False if the module did not tell all of them. What came whole is kept even so.
 bool GroupedPids::fetchGroup(std::vector<unsigned char> const& pids)
 {
-    std::vector<unsigned char> request{liveService};
+    std::vector<unsigned char> request{groupService};
     request.insert(request.end(), pids.begin(), pids.end());
     obd::ResponseMap responses;
     if (m_proxy->execute(request, responses, groupLimitMs) != Status::Ok) {
         return false;
     }
     auto const own = responses.find(m_module);
-    auto const parts = own != responses.end() ? splitMultiReply(own->second, pids, lengthOf) : std::nullopt;
+    auto const parts = own != responses.end() ? splitMultiReply(own->second, pids, groupedLength) : std::nullopt;
     if (!parts) {
         return false;
     }
@@ -59,7 +59,7 @@ bool GroupedPids::fetchGroup(std::vector<unsigned char> const& pids)
 
 std::vector<unsigned char> const* GroupedPids::known(std::vector<unsigned char> const& request) const
 {
-    bool const isSingle = request.size() == 2 && request[0] == liveService;
+    bool const isSingle = request.size() == 2 && request[0] == groupService;
     auto const found = isSingle ? m_replies.find(request[1]) : m_replies.end();
     return found != m_replies.end() ? &found->second : nullptr;
 }
