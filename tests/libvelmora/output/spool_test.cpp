@@ -1,5 +1,3 @@
-#include "libvelmora/output/clockjudge.h"
-#include "libvelmora/output/mqtt/mqttsettings.h"
 #include "libvelmora/output/mqtt/spoolsender.h"
 #include "libvelmora/output/mqtt/spooltext.h"
 #include "tests/support/broker.h"
@@ -16,9 +14,7 @@ namespace {
 using namespace std::chrono_literals;
 using testing::ElementsAre;
 using testing::HasSubstr;
-using testsupport::brokerContext;
 using testsupport::TemporaryFolder;
-using velmora::ClockJudge;
 using velmora::Spool;
 using velmora::SpoolSender;
 
@@ -114,36 +110,6 @@ TEST(MqttSpool, AFullDiskGivesTheBallastSoThatWhatWasSentCanBeForgotten)
         GTEST_SKIP() << "a disk of its own can't be mounted here";
     }
     EXPECT_EQ(WEXITSTATUS(status), SpoolFine);
-}
-
-TEST(MqttSettings, RefusesWhatBrokersWouldNotTakeAndSecretsInTheOpen)
-{
-    TemporaryFolder const folder;
-    for (char const* const wrong :
-         {"mqtt://b/a.b", "mqtt://b/a b", "mqtt://b/a//b", "mqtt://b/", "mqtt://b:0/a", "mqtt://b:x/a", "mqtt://b,/a",
-          "mqtt://b,c:0/a", "mqtt://me:pw@b/a", "mqtt://b/a?qos=2", "mqtt://b/a?password_file=/nowhere",
-          "mqtt://b/a?discovery=yes", "mqtt://b/a?keep_alive=4", "mqtt://b/a?keep_alive=1h"}) {
-        EXPECT_THROW(velmora::mqttSettings(velmora::parseOutputAddress(wrong), brokerContext(folder)), velmora::Error)
-            << wrong;
-    }
-    std::ofstream(folder.file("pw")) << "secret\n";
-    auto const settings = velmora::mqttSettings(
-        velmora::parseOutputAddress("mqtts://b/a/c?keep_alive=300&password_file=" + folder.file("pw")),
-        brokerContext(folder));
-    EXPECT_EQ(settings.brokers.at(0).port, 8883);
-    EXPECT_EQ(settings.keepAlive, 300s);
-    EXPECT_EQ(settings.topic, "a/c/van");
-    EXPECT_EQ(settings.password, "secret");
-    auto const cluster =
-        velmora::mqttSettings(velmora::parseOutputAddress("mqtt://n1:1,n2,[::1]:3/a"), brokerContext(folder)).brokers;
-    ASSERT_EQ(cluster.size(), 3U);
-    EXPECT_EQ(cluster[0].host + std::to_string(cluster[0].port), "n11");
-    EXPECT_EQ(cluster[1].host + std::to_string(cluster[1].port), "n21883");
-    EXPECT_EQ(cluster[2].host + std::to_string(cluster[2].port), "::13");
-    EXPECT_EQ(velmora::storedMark(R"({"spool":"ab","seq":7})", "ab"), 7);
-    for (char const* const wrong : {"", "7", "{}", R"({"spool":"x","seq":7})", R"({"spool":"ab","seq":"7"})", "[1"}) {
-        EXPECT_FALSE(velmora::storedMark(wrong, "ab")) << wrong;
-    }
 }
 
 // Takes what a sender hands over, and numbers it.
@@ -274,38 +240,6 @@ TEST(SpoolSender, HoldsWhatIsNotDatedYetAndMarksWhatNeverWas)
     EXPECT_EQ(sent.batches[0]["events"][1]["end"], 1008);
     EXPECT_EQ(sent.batches[1]["clock"], true);
     EXPECT_FALSE(sent.spool.heldStamp());
-}
-
-TEST(ClockJudge, TellsAWrongClockByItsWay)
-{
-    std::int64_t const sane = testsupport::march;
-    ClockJudge fresh; // a machine without a clock battery
-    EXPECT_EQ(fresh.look({1000, 10000, false, ""}), 0);
-    EXPECT_EQ(fresh.trust(), ClockJudge::Trust::Wait);
-    EXPECT_EQ(fresh.look({3000, 11000, false, ""}), 0); // a second is slewed, not set
-    EXPECT_EQ(fresh.look({sane, 12000, false, ""}), sane - 12000 - (3000 - 11000));
-    EXPECT_EQ(fresh.trust(), ClockJudge::Trust::Wait); // set, but by whom?
-    fresh.look({sane + 1, 12001, true, ""});
-    EXPECT_EQ(fresh.trust(), ClockJudge::Trust::Sure);
-
-    ClockJudge alone; // no time server ever
-    alone.look({sane, 299999, false, ""});
-    EXPECT_EQ(alone.trust(), ClockJudge::Trust::Wait);
-    alone.look({sane + 1, 300000, false, ""});
-    EXPECT_EQ(alone.trust(), ClockJudge::Trust::Sure);
-
-    ClockJudge kept; // a laptop, far from any network
-    kept.look({sane, 1000, false, "", true});
-    EXPECT_EQ(kept.trust(), ClockJudge::Trust::Sure);
-    ClockJudge empty; // its battery has gone flat
-    empty.look({1000000, 1000, false, "", true});
-    EXPECT_EQ(empty.trust(), ClockJudge::Trust::Wait);
-
-    ClockJudge lost;
-    lost.look({1000000, 300000, false, ""});
-    EXPECT_EQ(lost.trust(), ClockJudge::Trust::Never);
-    EXPECT_GT(velmora::lookAtClocks().boot, 0);
-    EXPECT_EQ(velmora::lookAtClocks().bootId.size(), 36U);
 }
 
 } // namespace
