@@ -19,7 +19,8 @@ TEST_PROGRAMS = {
 }
 WAITING = {"e2e/e2e_test"}  # in real time: their cases run side by side, and only if the others notice nothing
 SCRIPTS = {  # tests that are no test program, and what they are given
-    "program": [("bash", "tests/e2e/screen.sh", "program/velmora")],
+    "program": [("python3", "tests/e2e/commandline.py", "program/velmora"),
+                ("bash", "tests/e2e/screen.sh", "program/velmora")],
     "simulator": [("python3", f"tests/simulator/{name}.py", "simulator/program/obdsim")
                   for name in ("commandline", "outsideclient")],
 }

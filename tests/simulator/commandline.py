@@ -3,6 +3,7 @@
 
 Serves a fleet with all that can be asked for, a recorded dialogue, and refuses what can't be served.
 """
+import os
 import pathlib
 import re
 import signal
@@ -153,10 +154,11 @@ def serves_the_rest(folder):
     check(code == 2 and "the scenario cannot be written" in told and "the trace cannot be written" in told, f"{code}: {told}")
     full = Served(1, "--listen", "pty", "--trace", "/dev/full")
     check(full.lines[0].startswith("/dev/pts/"), f"a device: {full.lines}")
-    with open(full.lines[0], "r+b", buffering=0) as device:
-        device.write(b"ATI\r")
-        while b">" not in device.read(64):
-            pass
+    device = os.open(full.lines[0], os.O_RDWR | os.O_NOCTTY)
+    os.write(device, b"ATI\r")
+    while b">" not in os.read(device, 64):
+        pass
+    os.close(device)
     code, told = full.end()
     check(code == 1 and told.count("the trace cannot be written") == 1, f"a full disk: {code}, {told}")
 

@@ -65,6 +65,8 @@ TEST(Control, engineStopsAndBeginsAnewWithWhatItHasReached)
     EXPECT_EQ(car.ask("010C1").substr(0, 8), "410C0000");
     EXPECT_EQ(car.ask("010D1").substr(0, 6), "410D00");
     EXPECT_EQ(car.ask("ATRV"), "12.4V\r\r>");
+    EXPECT_EQ(car.ask("010B1").substr(0, 6), "410B64") << "the manifold has the pressure of the air";
+    EXPECT_EQ(car.ask("01041").substr(0, 6), "410400");
     car.advance(std::chrono::seconds(600));
     EXPECT_EQ(car.ask("01A61"), odometer);
     car.control("engine start");
@@ -209,6 +211,10 @@ TEST(Control, carIsReachedWhileItIsServed)
     EXPECT_EQ(car.ask("ATRV"), "ATRV\r11.8V\r\r>");
     EXPECT_EQ(car.count("ATRV"), 1U);
     car.stop();
+    velmora::sim::Time const stopped = car.now();
+    for (int i = 0; i < 10; ++i) {
+        EXPECT_EQ(car.now(), stopped) << "the clock of a car that nobody serves stands";
+    }
     EXPECT_EQ(car.servePseudoTerminal().substr(0, 5), "/dev/");
     EXPECT_EQ(car.scenario().find("voltage 11.8"), car.scenario().find("voltage"));
 }
@@ -217,10 +223,12 @@ TEST(Scenario, linesAreReadAndMistakesNameTheirPlace)
 {
     auto const lines = obdsim::parseScenario("# a drive\n0.5 ignition off\n\n 2\tvoltage 11.8 \n", "x");
     ASSERT_EQ(lines.size(), 2U);
+    EXPECT_EQ(obdsim::parseScenario("0 clear\n10000000 clear\n", "x").size(), 2U);
     EXPECT_EQ(lines[1].time, Ms(2000));
     EXPECT_EQ(obdsim::formatScenario(lines), "0.500000 ignition off\n2.000000 voltage 11.8 \n");
     const MistakeCase cases[] = {
         {"soon clear", "x:1: word 1 is \"soon\"; here belongs the seconds since the beginning"},
+        {"10000000.1 clear", "x:1: word 1 is \"10000000.1\"; here belongs the seconds since the beginning"},
         {"-1 clear", "x:1: word 1 is \"-1\"; here belongs the seconds since the beginning"},
         {"5 clear\n4 clear", "x:2: word 1 is \"4\"; here belongs a time that is not before that of the line above"},
         {"5", "x:1: word 2 is missing; here belongs a control command"},

@@ -149,6 +149,9 @@ TEST(Replay, expectedCountMakesNoDifference)
     host.ask("ATE0");
     EXPECT_EQ(host.ask("0123"), "84F112412300412C\r\r>");
     EXPECT_EQ(host.ask("01232"), "84F112412300412C\r\r>");
+    auto codes = replaying(kwp, "-> 03\n<- 87F11843000000000000D3\\r\\r>\n");
+    codes.ask("ATE0");
+    EXPECT_EQ(codes.ask("031"), "87F11843000000000000D3\r\r>");
 }
 
 TEST(Replay, settingsOfRecordedCommandsTakeEffect)

@@ -123,7 +123,9 @@ TEST(Quirk, piecesOfAReplyComeApart)
     host.ask("ATE0");
     host.peer().receive("ATI\r");
     std::vector<std::string> pieces;
+    Time due = host.peer().now() + Ms(4);
     while (auto const next = host.peer().nextOutput()) {
+        EXPECT_EQ(*next, due += Ms(15));
         pieces.push_back(host.peer().advanceTo(*next));
     }
     EXPECT_EQ(pieces, (std::vector<std::string>{"ELM32", "7 v1.", "5\r", "\r", ">"}));

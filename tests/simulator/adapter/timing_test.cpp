@@ -237,6 +237,17 @@ TEST(Rates, areThoseOfBusModuleAndLine)
     }
 }
 
+TEST(Timing, lineIsLeftAloneBehindARequestThatNobodyAnswers)
+{
+    auto host = simulated("petrol-iso9141");
+    host.ask({"ATE0", "ATSP3", "0100", "ATAT0", "ATST01"});
+    host.pass(Ms(1000));
+    EXPECT_EQ(host.ask("01AA"), "NO DATA\r\r>");
+    Time const alone = host.lastWait();
+    EXPECT_EQ(host.ask("01AA"), "NO DATA\r\r>");
+    EXPECT_GT(host.lastWait(), alone + Ms(40)) << "P3";
+}
+
 TEST(LineRate, whatWasUnderWayIsLostWithTheConnection)
 {
     auto host = simulated("petrol-can11", "elm327-v1.5", {"baud=9600"});

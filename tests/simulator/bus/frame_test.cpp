@@ -168,6 +168,9 @@ TEST(Frame, requestWithoutPciByteIsNoFrame)
 {
     EXPECT_EQ(obdsim::unwrapSingleFrame(bytes("02 09 02")), bytes("09 02"));
     EXPECT_EQ(obdsim::unwrapSingleFrame(bytes("02 01 0C 00 00 00 00 00")), bytes("01 0C"));
+    EXPECT_EQ(obdsim::unwrapSingleFrame(bytes("01 03")), bytes("03"));
+    EXPECT_EQ(obdsim::unwrapSingleFrame(bytes("07 01 02 03 04 05 06 07")), bytes("01 02 03 04 05 06 07"));
+    EXPECT_FALSE(obdsim::unwrapSingleFrame(bytes("00 01 02")));
     EXPECT_FALSE(obdsim::unwrapSingleFrame(bytes("09 02")));
     EXPECT_FALSE(obdsim::unwrapSingleFrame(bytes("10 14 49 02 01 31 4E 34")));
     EXPECT_FALSE(obdsim::unwrapSingleFrame({}));

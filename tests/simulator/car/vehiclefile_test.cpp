@@ -75,6 +75,7 @@ TEST(VehicleFile, errorsNameFileAndLine)
         {head + "stored = [5]\n", "car.toml:5: \"stored\" must be a text"},
         {head + "fixed = { \"1C1D\" = \"06\" }\n", "car.toml:5: a row is one byte and its data"},
         {head + "fixed = { \"1C\" = [\"06\", \"07\"] }\n", "car.toml:5: a row is one byte and its data"},
+        {head + "warm_ups = 256\n", "car.toml:5: \"warm_ups\" must be a whole number from 0 to 255"},
         {head + "most_pids = 7\n", "car.toml:5: \"most_pids\" must be a whole number from 1 to 6"},
         {head + "more_pids = \"all\"\n", "car.toml:5: \"more_pids\" must be \"silence\", \"refuse\" or \"first\""},
         {head + "[module.info]\nserial = \"123456789012345678\"\n",
@@ -113,17 +114,17 @@ TEST(VehicleFile, errorsNameFileAndLine)
 TEST(VehicleFile, limitsThemselvesAreTaken)
 {
     const std::string full(17, 'A');
-    auto const car =
-        parseVehicle("w4 = 25\nvolts = 12.5\npadding = \"none\"\n" + head +
-                         "latency = 60000\nmost_pids = 6\nframe_gap = 5\nmore_pids = \"refuse\"\n[module.info]\n"
-                         "vin = \"" +
-                         full + "\"\nserial = \"" + full +
-                         "\"\nverifications = [\"AABBCCDD\"]\n"
-                         "ecu_name = \"ECM-EngineControl12\"\ncalibrations = [\"1234567890123456\"]\n"
-                         "spark_counters = [0, 65535]\n"
-                         "[[module.signals]]\nrequest = \"2101\"\ndata = \"000000\"\n"
-                         "fields = [{ at = 1, bytes = 2, value = \"rpm\" }]\n",
-                     "car.toml");
+    auto const car = parseVehicle(
+        "w4 = 25\nvolts = 12.5\npadding = \"none\"\n" + head +
+            "latency = 60000\nwarm_ups = 0\nmost_pids = 6\nframe_gap = 5\nmore_pids = \"refuse\"\n[module.info]\n"
+            "vin = \"" +
+            full + "\"\nserial = \"" + full +
+            "\"\nverifications = [\"AABBCCDD\"]\n"
+            "ecu_name = \"ECM-EngineControl12\"\ncalibrations = [\"1234567890123456\"]\n"
+            "spark_counters = [0, 65535]\n"
+            "[[module.signals]]\nrequest = \"2101\"\ndata = \"000000\"\n"
+            "fields = [{ at = 1, bytes = 2, value = \"rpm\" }]\n",
+        "car.toml");
     EXPECT_EQ(car.volts, 12.5);
     EXPECT_FALSE(car.padding);
     EXPECT_EQ(car.addressPause, obdsim::Ms(25));
@@ -167,6 +168,57 @@ TEST(VehicleFile, plainCarIsWhatMostCarsAre)
     EXPECT_EQ(diesel.engine.idleRpm, 780);
     EXPECT_EQ(diesel.engine.litres, 1.6);
     EXPECT_EQ(diesel.engine.ambientCelsius, 18);
+}
+
+TEST(VehicleFile, engineIsWhatTheFileSays)
+{
+    auto const engine =
+        parseVehicle("name = \"Car\"\nprotocol = 6\n[engine]\nfuel = \"diesel\"\nboosted = false\nlitres = 2.2\n"
+                     "idle_rpm = 810\nambient = -5\ncoolant_at_start = 3\nodometer = 99\nfuel_level = 40\n"
+                     "top_speed = 120\n",
+                     "car.toml")
+            .engine;
+    EXPECT_FALSE(engine.boosted);
+    EXPECT_EQ(engine.litres, 2.2);
+    EXPECT_EQ(engine.idleRpm, 810);
+    EXPECT_EQ(engine.ambientCelsius, -5);
+    EXPECT_EQ(engine.startCoolantCelsius, 3);
+    EXPECT_EQ(engine.startFuelPercent, 40);
+    EXPECT_EQ(engine.topSpeedKmh, 120);
+    EXPECT_NEAR(obdsim::DriveModel(engine).at(obdsim::Time(0)).odometerKm, 99, 1e-9);
+}
+
+struct MonitorCase
+{
+    char const* name;
+    int spark; ///< byte B, then C, as 16 bits; -1: this kind of engine has it not
+    int compression;
+};
+
+TEST(VehicleFile, monitorsAreTheBitsOfTheStandard)
+{
+    const MonitorCase cases[] = {
+        {"misfire", 0x0100, 0x0100},      {"fuel-system", 0x0200, 0x0200},
+        {"components", 0x0400, 0x0400},   {"catalyst", 0x01, -1},
+        {"heated-catalyst", 0x02, -1},    {"evaporative-system", 0x04, -1},
+        {"secondary-air", 0x08, -1},      {"particulate-filter", 0x10, -1},
+        {"oxygen-sensor", 0x20, -1},      {"oxygen-sensor-heater", 0x40, -1},
+        {"egr-vvt", 0x80, 0x80},          {"nmhc-catalyst", -1, 0x01},
+        {"nox-aftertreatment", -1, 0x02}, {"boost-pressure", -1, 0x08},
+        {"exhaust-gas-sensor", -1, 0x20}, {"pm-filter", -1, 0x40},
+        {"no-such-monitor", -1, -1},
+    };
+    for (auto const& row : cases) {
+        for (bool const compression : {false, true}) {
+            int const expected = compression ? row.compression : row.spark;
+            obdsim::MonitorBits bits;
+            EXPECT_EQ(obdsim::markMonitor(row.name, compression, false, bits), expected >= 0) << row.name;
+            EXPECT_EQ(obdsim::markMonitor(row.name, compression, true, bits), expected >= 0) << row.name;
+            int const present = bits.continuous << 8 | bits.once;
+            EXPECT_EQ(present, std::max(expected, 0)) << row.name;
+            EXPECT_EQ(bits.continuousIncomplete << 8 | bits.onceIncomplete, present) << row.name;
+        }
+    }
 }
 
 TEST(VehicleFile, codesAreTwoBytes)
