@@ -161,6 +161,29 @@ def shows_traffic_in_whole_lines():
         check("010C" in sent and "ATI" in sent, f"what was sent: {sent}")
 
 
+def tells_of_each_module_and_of_what_it_remembers():
+    check("\n\nControl module 7E9: TCM" in printed(*CAR, "--ecu", "all", "sensors"), "an empty line between modules")
+    car = ["-p", "sim:petrol-can11-modules?instant", "modules"]
+    found, known = run(*car), run(*car)
+    check(found[0] == 0 and "28400-S1004" in found[1] and "are remembered" not in found[2], f"the modules: {found}")
+    check(known[:2] == found[:2] and "These are remembered of this vehicle" in known[2], f"once more: {known}")
+
+
+def stops_after_as_many_readings_as_wished():
+    for count in (1, 3):
+        lines = printed(*CAR, "live", "-n", str(count), "--csv", "-", "RPM").splitlines()
+        check(len(lines) == count + 1, f"the names and {count} rows: {lines}")
+
+
+def forgets_only_what_is_confirmed():
+    kept = {"VELMORA_HISTORY": str(folder / "forgotten.db")}
+    printed(*CAR, "scan", "--history", **kept)
+    text, asked, _ = on_terminal(["history", "forget", "VELMRAS1MM0000001"], "Forget them?", "n\n", **kept)
+    check(asked and len(json.loads(printed("--json", "history", **kept))) == 1, f"the no: {text}")
+    text, asked, _ = on_terminal(["history", "forget", "VELMRAS1MM0000001"], "Forget them?", "Y\n", **kept)
+    check(asked and not json.loads(printed("--json", "history", **kept)), f"the yes: {text}")
+
+
 def keeps_settings():
     listed = printed("settings")
     check(re.search(r"^  displacement +2\.00 l +0\.05 to 30\.00$", listed, re.M), f"the settings: {listed}")
@@ -185,4 +208,7 @@ with tempfile.TemporaryDirectory() as name:
     tells_in_text_what_json_tells()
     shows_traffic_in_whole_lines()
     keeps_settings()
+    tells_of_each_module_and_of_what_it_remembers()
+    stops_after_as_many_readings_as_wished()
+    forgets_only_what_is_confirmed()
 print(f"the command line is as it should be; {time.monotonic() - start:.1f} s")

@@ -104,16 +104,16 @@ class Cases:
         return [case for case in self.cases if number in self.reached[case]]
 
     def notice(self, cases, number, jobs):
-        """Whether a case fails with the change of a number; -1 for none of the switches."""
+        """Whether a case fails with the change of a number; -1 for one that is built in."""
         environment = {"VELMORA_MUTANT": str(number)}
         quick = [case for case in cases if not case.waits]
         for command in {case.command for case in quick}:
             together = [case for case in quick if case.command == command]
             if not self._run(together, self._limit(together), environment):
                 return True
-        return self._one_by_one([case for case in cases if case.waits], environment, jobs)
+        return self._one_by_one([case for case in cases if case.waits], environment, jobs, number < 0)
 
-    def _one_by_one(self, cases, environment, jobs):
+    def _one_by_one(self, cases, environment, jobs, built_in):
         cases = sorted(cases, key=self.seconds.get)
         for first in range(0, len(cases), jobs):
             some = cases[first:first + jobs]
@@ -121,7 +121,7 @@ class Cases:
                 good = list(pool.map(lambda case: self._run([case], self._limit([case]), environment), some))
             for case, well in zip(some, good):
                 # A case in real time that fails without the change as well, on a busy machine, has noticed nothing.
-                if not well and self._run([case], self._limit([case]), {}) and not self._run(
+                if not well and (built_in or self._run([case], self._limit([case]), {})) and not self._run(
                         [case], self._limit([case]), environment):
                     return True
         return False
