@@ -58,6 +58,17 @@ std::string capability(char const* name)
     return text;
 }
 
+// Asked for first: newterm loses memory over a kind that it doesn't know.
+bool isKnown(std::string const& kind)
+{
+    int found = 0;
+    if (::setupterm(kind.c_str(), STDOUT_FILENO, &found) != OK) {
+        return false;
+    }
+    ::del_curterm(cur_term);
+    return true;
+}
+
 attr_t attributesOf(SpanLook const& look, bool coloured)
 {
     attr_t attributes = A_NORMAL;
@@ -118,7 +129,7 @@ struct TerminalScreen::Page
 TerminalScreen::TerminalScreen(std::string const& kind, bool coloured)
     : m_hasBefore(::tcgetattr(STDOUT_FILENO, &m_before) == 0), m_coloured(false), m_hasKeys(::isatty(STDIN_FILENO) != 0)
 {
-    SCREEN* const opened = ::newterm(kind.c_str(), stdout, stdin);
+    SCREEN* const opened = isKnown(kind) ? ::newterm(kind.c_str(), stdout, stdin) : nullptr;
     if (opened == nullptr) {
         return;
     }
