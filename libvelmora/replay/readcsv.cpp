@@ -11,7 +11,7 @@ namespace velmora {
 
 namespace {
 
-constexpr char const* longHeader = "time,vehicle,module,pid,sensor,name,value,unit";
+constexpr char const* longCsvHeader = "time,vehicle,module,pid,sensor,name,value,unit";
 
 // The fields of a line, with their quotes taken off. Nothing where a quote is not closed.
 std::optional<std::vector<std::string>> fieldsOf(std::string const& line)
@@ -109,7 +109,7 @@ Recording readCsv(std::istream& in)
     if (!header || header->size() < 2 || header->front() != "time") {
         failCsv(1, "it is no header that begins with time");
     }
-    CsvReader reader(*header, line == longHeader);
+    CsvReader reader(*header, line == longCsvHeader);
     for (std::size_t number = 2; std::getline(in, line); ++number) {
         bool const torn = in.eof();
         std::optional<std::vector<std::string>> const fields = fieldsOf(line);

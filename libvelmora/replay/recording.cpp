@@ -14,6 +14,7 @@ namespace velmora {
 namespace {
 
 constexpr int mostDecimals = 6;
+constexpr std::int64_t latestTime = 7258118400000; // the year 2200; what lies beyond is no time of a recording
 
 int decimalsOf(std::string_view number)
 {
@@ -92,8 +93,8 @@ bool RecordingMaker::add(std::size_t sensor, std::int64_t time, std::string cons
 
 bool RecordingMaker::add(std::size_t sensor, std::int64_t time, Reading::Value value)
 {
-    if (sensor >= m_recording.sensors.size()) {
-        return true; // one that found no room
+    if (sensor >= m_recording.sensors.size() || time < 0 || time > latestTime) {
+        return true; // left out: a sensor that found no room, or a time that can't be
     }
     if (m_values == mostValues) {
         m_recording.cut = true;

@@ -94,6 +94,7 @@ TEST(Recordings, NdjsonTellsReadingsAmongOtherThings)
     EXPECT_EQ(recording.sensors[0].decimals, 2);
     EXPECT_EQ(recording.sensors[1].about.sensor, "Engine RPM") << "a line of live, which has no key";
     EXPECT_THROW(ndjsonOf("{\n{}\n"), Error);
+    EXPECT_TRUE(csvOf("time,A\n9999-01-01T00:00:00.000Z,1\n1969-12-31T23:59:59.999Z,1\n").sensors.empty());
     EXPECT_TRUE(ndjsonOf("[]\n7\n{\"value\":1,\"name\":2,\"time\":3}\n").sensors.empty());
 }
 
