@@ -13,9 +13,9 @@ public:
     /// White space at both ends of the name is stripped. port is the RFCOMM channel.
     OBD_EXPORT BluetoothDescriptor(std::string const& name, std::string const& address, int port);
 
-    std::string const& name() const { return m_name; }
-    std::string const& address() const { return m_address; }
-    int port() const { return m_port; }
+    std::string const& name() const { return m_name; }       ///< for people
+    std::string const& address() const { return m_address; } ///< as it was given
+    int port() const { return m_port; }                      ///< the RFCOMM channel
 
 private:
     std::string m_name;
@@ -36,9 +36,9 @@ public:
 
     /// Path or name of the port.
     std::string const& device() const { return m_device; }
-    bool autoBaudrate() const { return m_autoBaudrate; }
-    int baudrate() const { return m_baudrate; }
-    int initialBaudrate() const { return m_initialBaudrate; }
+    bool autoBaudrate() const { return m_autoBaudrate; }      ///< whether the line rate is to be found out
+    int baudrate() const { return m_baudrate; }               ///< baud, to work with
+    int initialBaudrate() const { return m_initialBaudrate; } ///< baud, that the adapter starts with; 0 if unknown
     /// For the eye only.
     std::string const& description() const { return m_description; }
 
@@ -54,10 +54,11 @@ private:
 class TcpDescriptor
 {
 public:
+    /// A host name or address, and a port.
     OBD_EXPORT TcpDescriptor(std::string const& address, int port);
 
-    std::string const& address() const { return m_address; }
-    int port() const { return m_port; }
+    std::string const& address() const { return m_address; } ///< host name or address
+    int port() const { return m_port; }                      ///< as it was given
 
 private:
     std::string m_address;

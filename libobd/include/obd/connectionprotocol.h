@@ -12,9 +12,10 @@ namespace obd {
 class OBD_EXPORT ConnectionProtocol
 {
 public:
+    /// Any number is taken; one that no protocol has has no description.
     explicit ConnectionProtocol(VehicleProtocol protocol);
 
-    VehicleProtocol protocol() const;
+    VehicleProtocol protocol() const; ///< as it was given
     /// Such as "ISO 9141-2"; empty for a number that no protocol has.
     std::string description() const;
 

@@ -43,7 +43,7 @@ public:
     bool receive(std::vector<unsigned char>& out, int timeoutMs) override;
     void send(std::vector<unsigned char> const& bytes) override;
     void addLogger(IConnectionLogger* logger) override;
-    void removeLogger(IConnectionLogger* logger) override;
+    void removeLogger(IConnectionLogger* logger) override; ///< as IDataConnection says
 
 private:
     using Bytes = std::vector<unsigned char>;

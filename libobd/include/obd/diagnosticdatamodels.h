@@ -12,6 +12,7 @@ namespace obd {
 /// library alive.
 struct DiagnosticTestDataModel
 {
+    /// How the test has ended.
     enum class Status : int
     {
         NoResult = 0, ///< the test has not run since the codes were cleared
@@ -19,6 +20,7 @@ struct DiagnosticTestDataModel
         Passed = 2,
     };
 
+    /// Fills all members.
     DiagnosticTestDataModel(int id, std::string const& testDescription, std::string const& testValue,
                             std::string const& lowerLimit, std::string const& upperLimit,
                             MeasurementUnit measurementUnit, Status testStatus)
@@ -26,39 +28,40 @@ struct DiagnosticTestDataModel
           unit(measurementUnit), status(testStatus)
     {}
 
-    int testId; ///< test identifier of service 06
-    std::string description;
-    std::string value;
-    std::string minimum; ///< empty if there is no lower limit
-    std::string maximum; ///< empty if there is no upper limit
-    MeasurementUnit unit;
-    Status status;
+    int testId;              ///< test identifier of service 06
+    std::string description; ///< what was tested
+    std::string value;       ///< the result, without its unit
+    std::string minimum;     ///< empty if there is no lower limit
+    std::string maximum;     ///< empty if there is no upper limit
+    MeasurementUnit unit;    ///< of value and limits
+    Status status;           ///< by value and limits
 };
 
 /// An on-board monitor with its test results for the application; a copy that keeps nothing of the library alive.
 struct DiagnosticMonitorDataModel
 {
+    /// Fills all members.
     DiagnosticMonitorDataModel(int monitorId, std::string const& monitorDescription,
                                std::vector<std::shared_ptr<DiagnosticTestDataModel>> const& monitorTests)
         : id(monitorId), description(monitorDescription), tests(monitorTests)
     {}
 
-    int id; ///< monitor identifier of service 06 on CAN, component number on the legacy buses
-    std::string description;
-    std::vector<std::shared_ptr<DiagnosticTestDataModel>> tests;
+    int id;                  ///< monitor identifier of service 06 on CAN, component number on the legacy buses
+    std::string description; ///< what is monitored
+    std::vector<std::shared_ptr<DiagnosticTestDataModel>> tests; ///< in the order of the reply
 };
 
 /// A test result of an oxygen sensor for the application, ready for display; a copy that keeps nothing of the library
 /// alive.
 struct OxygenSensorMonitorDataModel
 {
-    int tid{0};              ///< test identifier of service 05
-    std::string description; // such as "Rich to lean sensor switch time (calculated)"
-    std::string value;
-    std::string minimum;
-    std::string maximum;
-    int status{0}; ///< 0: within the limits, 1: outside
-    MeasurementUnit unit{UnitNone};
+    int tid{0};                     ///< test identifier of service 05
+    std::string description;        ///< such as "Rich to lean sensor switch time (calculated)"
+    std::string value;              ///< the result, without its unit
+    std::string minimum;            ///< empty if there is no lower limit
+    std::string maximum;            ///< empty if there is no upper limit
+    int status{0};                  ///< 0: within the limits, 1: outside
+    MeasurementUnit unit{UnitNone}; ///< of value and limits
 };
 
 /// The tests 01 to 04 of service 05 are thresholds that the module works with, not results: they have no limits (SAE
@@ -72,11 +75,12 @@ constexpr bool isConstantTest(int tid)
 class PerformanceCounterDataModel
 {
 public:
+    /// Writes the number as text.
     PerformanceCounterDataModel(std::string const& counterDescription, unsigned int counterValue)
         : description(counterDescription), value(buildValue(counterValue))
     {}
 
-    std::string description; // such as "Ignition Cycle Counter"
+    std::string description; ///< such as "Ignition Cycle Counter"
     std::string value;       ///< decimal digits, without separators in any locale
 
 private:
@@ -86,6 +90,7 @@ private:
 /// A readiness monitor for the application; a copy that keeps nothing of the library alive.
 struct ReadinessMonitorDataModel
 {
+    /// How far the monitor has come.
     enum Status : int
     {
         Complete = 0,
@@ -94,12 +99,13 @@ struct ReadinessMonitorDataModel
         NotAvailable = 3,      ///< the vehicle has no such monitor
     };
 
+    /// Fills both members.
     ReadinessMonitorDataModel(std::string const& monitorDescription, Status monitorStatus)
         : description(monitorDescription), status(monitorStatus)
     {}
 
-    std::string description; // such as "Catalyst"
-    Status status;
+    std::string description; ///< such as "Catalyst"
+    Status status;           ///< since the codes were cleared, or of the present driving cycle, as was asked
 };
 
 } // namespace obd

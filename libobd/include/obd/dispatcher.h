@@ -38,6 +38,7 @@ public:
 class OBD_EXPORT Dispatcher : public virtual tervex::Notifier<IDispatchRunner>
 {
 public:
+    /// The one of the process. Any thread.
     static Dispatcher& getInstance();
 
     Dispatcher(Dispatcher const&) = delete;

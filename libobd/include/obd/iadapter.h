@@ -12,8 +12,8 @@ class IAdapter
 {
 public:
     IAdapter() = default;
-    IAdapter(IAdapter const&) = default;
-    IAdapter& operator=(IAdapter const&) = default;
+    IAdapter(IAdapter const&) = default;            ///< nothing to copy
+    IAdapter& operator=(IAdapter const&) = default; ///< nothing to copy
     virtual ~IAdapter() = default;
 
     /// Name and version, such as "ELM327 v1.5".
@@ -25,6 +25,7 @@ public:
     /// Supply voltage in volts, as the adapter measures it. False, with volts untouched, if it gives no number. Talks
     /// to the adapter: only while nothing else does.
     virtual bool batteryVoltage(float& volts) = 0;
+    /// The bus family in use.
     virtual ObdProtocol getProtocol() = 0;
     /// The adapter's own words for the protocol in use.
     virtual std::string getProtocolDescription() = 0;

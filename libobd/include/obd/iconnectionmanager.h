@@ -26,7 +26,7 @@ class IConnectionPhaseListener
 public:
     virtual ~IConnectionPhaseListener() = default;
 
-    virtual void onPhaseChanged(int phase) = 0;
+    virtual void onPhaseChanged(int phase) = 0; ///< a ConnectionPhase
 };
 
 /// Owns the life of one connection. Listeners and loggers are not owned: who adds one removes it before it dies.
@@ -41,6 +41,7 @@ class IConnectionManager
 public:
     virtual ~IConnectionManager() = default;
 
+    /// One that is added twice is told twice.
     virtual void addPhaseListener(IConnectionPhaseListener* listener) = 0;
     /// Removes the first equal entry.
     virtual void removePhaseListener(IConnectionPhaseListener* listener) = 0;
@@ -70,7 +71,7 @@ public:
     /// A tap on the traffic of this connection and of those to come. Once removeLogger has returned, the logger is not
     /// called any more. Not from a logger's own call.
     virtual void addLogger(IConnectionLogger* logger) = 0;
-    virtual void removeLogger(IConnectionLogger* logger) = 0;
+    virtual void removeLogger(IConnectionLogger* logger) = 0; ///< one entry at a time; not from a logger's own call
 };
 
 } // namespace obd

@@ -9,8 +9,8 @@ class IConnectionNotifierListener
 public:
     virtual ~IConnectionNotifierListener() = default;
 
-    virtual void onConnectionOpened() = 0;
-    virtual void onConnectionClosed() = 0;
+    virtual void onConnectionOpened() = 0; ///< vehicle link and control modules are up
+    virtual void onConnectionClosed() = 0; ///< the connection is going down
 };
 
 /// Tells opening and closing in the order of three priorities: 0 the control modules, 1 the services, 2 the connection
@@ -20,8 +20,8 @@ class IConnectionNotifier
 public:
     virtual ~IConnectionNotifier() = default;
 
-    virtual bool isConnected() = 0;
-    virtual void attach(unsigned int priority, IConnectionNotifierListener* listener) = 0;
+    virtual bool isConnected() = 0; ///< whether a connection is open
+    virtual void attach(unsigned int priority, IConnectionNotifierListener* listener) = 0; ///< at its end of the list
     /// Removes every entry of the listener at that priority.
     virtual void detach(unsigned int priority, IConnectionNotifierListener* listener) = 0;
 };

@@ -33,19 +33,20 @@ public:
     /// The kind of channel, 0, 1 or 2, whose meaning is the application's. Not checked when set; cut to the range when
     /// loaded.
     virtual int bus() const = 0;
-    virtual void setBus(int bus) = 0;
+    virtual void setBus(int bus) = 0; ///< fires BusChanged
 
-    virtual VehicleProtocol protocol() const = 0; ///< default automatic
-    virtual void setProtocol(VehicleProtocol protocol) = 0;
+    virtual VehicleProtocol protocol() const = 0;           ///< default automatic
+    virtual void setProtocol(VehicleProtocol protocol) = 0; ///< fires ProtocolChanged
 
-    virtual BluetoothDescriptor bluetoothDescriptor() const = 0;
+    virtual BluetoothDescriptor bluetoothDescriptor() const = 0; ///< the one to use
+    /// Fires BluetoothDescriptorChanged.
     virtual void setBluetoothDescriptor(BluetoothDescriptor const& descriptor) = 0;
 
-    virtual SerialDescriptor serialDescriptor() const = 0;
-    virtual void setSerialDescriptor(SerialDescriptor const& descriptor) = 0;
+    virtual SerialDescriptor serialDescriptor() const = 0;                    ///< the one to use
+    virtual void setSerialDescriptor(SerialDescriptor const& descriptor) = 0; ///< fires SerialDescriptorChanged
 
-    virtual TcpDescriptor tcpDescriptor() const = 0;
-    virtual void setTcpDescriptor(TcpDescriptor const& descriptor) = 0;
+    virtual TcpDescriptor tcpDescriptor() const = 0;                    ///< the one to use
+    virtual void setTcpDescriptor(TcpDescriptor const& descriptor) = 0; ///< fires TcpDescriptorChanged
 
     /// Remembers a device, known by its address, and writes the list to the store at once. One that is known under
     /// another name moves to the end with the new name; one that is known as it stands changes nothing. Fires nothing.

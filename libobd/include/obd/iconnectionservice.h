@@ -11,6 +11,7 @@ namespace obd {
 class IAdapter;
 class IConnectionOptions;
 
+/// Hears of the connection and of the control module that is selected.
 class IConnectionServiceObserver
 {
 public:
@@ -28,10 +29,10 @@ public:
 class IConnectionService : public virtual tervex::INotifier<IConnectionServiceObserver>
 {
 public:
-    virtual bool isConnected() const = 0;
+    virtual bool isConnected() const = 0; ///< whether adapter, vehicle and control modules are up
     /// The OBD standard that the current control module reports; empty if there is none.
     virtual std::string standardDescription() const = 0;
-    virtual IConnectionOptions* connectionOptions() const = 0;
+    virtual IConnectionOptions* connectionOptions() const = 0; ///< lives as long as the settings
     /// Null without an adapter.
     virtual std::shared_ptr<IAdapter> adapter() const = 0;
 };

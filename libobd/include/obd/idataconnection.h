@@ -40,7 +40,7 @@ public:
     /// Taps, called in the order of registration. Not owned: who adds a logger removes it before it dies. Once
     /// removeLogger has returned, no call is under way. One that was added twice is removed one entry at a time.
     virtual void addLogger(IConnectionLogger* logger) = 0;
-    virtual void removeLogger(IConnectionLogger* logger) = 0;
+    virtual void removeLogger(IConnectionLogger* logger) = 0; ///< not from a logger's own call
 };
 
 } // namespace obd

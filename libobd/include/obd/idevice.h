@@ -21,6 +21,7 @@ enum class AdapterNote : int
 class IDevice : public IAdapter
 {
 public:
+    /// How an exchange went.
     enum class Status : int
     {
         Ok = 0,         ///< the reply was obtained (and, for bytes, parsed)

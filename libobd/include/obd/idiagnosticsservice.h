@@ -43,12 +43,16 @@ public:
     /// NothingStored of the readiness: not one of the monitors is there, so neither is that of the oxygen sensors; of
     /// the counters: all are 0. Tests and counters may be told in part, see Outcome::missing.
     virtual Outcome<std::vector<std::shared_ptr<ReadinessMonitorDataModel>>> askReadinessMonitors() = 0;
+    /// fetchReadinessMonitorsThisCycle, with how it went.
     virtual Outcome<std::vector<std::shared_ptr<ReadinessMonitorDataModel>>> askReadinessMonitorsThisCycle() = 0;
+    /// fetchMonitorTests, with how it went.
     virtual Outcome<std::vector<std::shared_ptr<DiagnosticMonitorDataModel>>> askMonitorTests() = 0;
+    /// fetchPerformanceCounters, with how it went.
     virtual Outcome<std::vector<std::shared_ptr<PerformanceCounterDataModel>>> askPerformanceCounters() = 0;
+    /// fetchOxygenSensorTests, with how it went.
     virtual Outcome<std::vector<std::shared_ptr<OxygenSensorMonitorDataModel>>>
     askOxygenSensorTests(OxygenSensorLocation location) = 0;
-    virtual Outcome<bool> askOxygenSensorTestComplete() = 0;
+    virtual Outcome<bool> askOxygenSensorTestComplete() = 0; ///< fetchOxygenSensorTestComplete
 };
 
 namespace DiagnosticsServiceBuilder {

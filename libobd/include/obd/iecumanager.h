@@ -11,6 +11,7 @@ namespace obd {
 class IEcu;
 class ParameterDescriptor;
 
+/// What became of the selection of control modules.
 enum class EcuManagerEvent : int
 {
     EcuListChanged = 0,
@@ -28,10 +29,10 @@ public:
     virtual void setCurrentEcu(unsigned int id) = 0;
     /// Appends the ids, in rising order.
     virtual void getEcuIds(std::vector<unsigned int>& ids) = 0;
-    virtual std::vector<std::shared_ptr<IEcu>> getEcus() = 0;
+    virtual std::vector<std::shared_ptr<IEcu>> getEcus() = 0; ///< in rising order of id
     /// Short and long name; empty for an unknown id.
     virtual std::string getEcuName(unsigned int id) = 0;
-    virtual std::string getEcuDescription(unsigned int id) = 0;
+    virtual std::string getEcuDescription(unsigned int id) = 0; ///< the long name
     /// The parameters that the module offers, for display, with no request on the bus. Empty for an unknown id.
     virtual std::vector<std::shared_ptr<ParameterDescriptor>> getParameters(unsigned int id) = 0;
 };

@@ -29,32 +29,32 @@ public:
 
     /// The OBD standard that the module reports to meet, such as "EOBD".
     virtual std::string standardDescription() = 0;
-    virtual std::string protocolDescription() = 0;
-    virtual std::string ecuName() = 0;        // such as "ECM"
-    virtual std::string ecuDescription() = 0; // such as "Engine Control"
+    virtual std::string protocolDescription() = 0; ///< of the bus
+    virtual std::string ecuName() = 0;             ///< such as "ECM"
+    virtual std::string ecuDescription() = 0;      ///< such as "Engine Control"
 
-    virtual bool hasVehicleIdentificationNumber() = 0;
-    virtual std::string fetchVehicleIdentificationNumber() = 0;
+    virtual bool hasVehicleIdentificationNumber() = 0;          ///< by what the module says it supports
+    virtual std::string fetchVehicleIdentificationNumber() = 0; ///< empty if it is not told
     /// Names of the software and calibrations, and their checksums in the same order.
     virtual bool hasCalibrationIds() = 0;
-    virtual std::vector<std::string> fetchCalibrationIds() = 0;
-    virtual bool hasVerificationNumbers() = 0;
-    virtual std::vector<std::string> fetchVerificationNumbers() = 0;
-    virtual bool hasEngineSerialNumber() = 0;
-    virtual std::string fetchEngineSerialNumber() = 0;
+    virtual std::vector<std::string> fetchCalibrationIds() = 0;      ///< empty if they are not told
+    virtual bool hasVerificationNumbers() = 0;                       ///< by what the module says it supports
+    virtual std::vector<std::string> fetchVerificationNumbers() = 0; ///< hexadecimal; empty if they are not told
+    virtual bool hasEngineSerialNumber() = 0;                        ///< by what the module says it supports
+    virtual std::string fetchEngineSerialNumber() = 0;               ///< empty if it is not told
     /// The exhaust regulation or type approval number.
     virtual bool hasErotan() = 0;
-    virtual std::string fetchErotan() = 0;
+    virtual std::string fetchErotan() = 0; ///< empty if it is not told
 
     /// As supportedParameters, of PIDs above 0x7F.
     virtual std::vector<std::shared_ptr<ParameterDataModel>> furtherParameters() = 0;
 
     /// The fetch operations, each with how it went. What the module says it does not offer is not asked for.
     virtual Outcome<std::string> askVehicleIdentificationNumber() = 0;
-    virtual Outcome<std::vector<std::string>> askCalibrationIds() = 0;
-    virtual Outcome<std::vector<std::string>> askVerificationNumbers() = 0;
-    virtual Outcome<std::string> askEngineSerialNumber() = 0;
-    virtual Outcome<std::string> askErotan() = 0;
+    virtual Outcome<std::vector<std::string>> askCalibrationIds() = 0;      ///< fetchCalibrationIds
+    virtual Outcome<std::vector<std::string>> askVerificationNumbers() = 0; ///< fetchVerificationNumbers
+    virtual Outcome<std::string> askEngineSerialNumber() = 0;               ///< fetchEngineSerialNumber
+    virtual Outcome<std::string> askErotan() = 0;                           ///< fetchErotan
 };
 
 namespace EcuServiceBuilder {

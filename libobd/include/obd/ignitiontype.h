@@ -2,6 +2,7 @@
 
 namespace obd {
 
+/// How the engine lights its fuel.
 enum class IgnitionType : int
 {
     Spark = 0,

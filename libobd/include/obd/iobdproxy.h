@@ -26,16 +26,17 @@ public:
 
     /// Whether a vehicle link stands. Waits for a running exchange.
     virtual bool isConnected() = 0;
-    virtual ObdProtocol protocol() = 0;
+    virtual ObdProtocol protocol() = 0; ///< the bus family
 
     /// The control modules found, in rising order of id; they stay after the link is lost.
     virtual std::vector<std::shared_ptr<IEcu>> ecus() = 0;
-    virtual std::shared_ptr<IEcu> firstEcu() = 0;
+    virtual std::shared_ptr<IEcu> firstEcu() = 0; ///< null if none was found
     /// Null for an unknown id.
     virtual std::shared_ptr<IEcu> ecu(unsigned int id) = 0;
 
     /// As in IDevice; Unparsed while no device with a vehicle link is set.
     virtual IDevice::Status execute(std::string const& command, std::string& response, unsigned int timeoutMs) = 0;
+    /// One request; what the control modules reply is added to responses.
     virtual IDevice::Status execute(std::vector<unsigned char> const& request, ResponseMap& responses,
                                     unsigned int timeoutMs) = 0;
 
@@ -53,6 +54,7 @@ public:
         note = AdapterNote::None;
         return execute(command, response, timeoutMs);
     }
+    /// The same of a request.
     virtual IDevice::Status executeNoted(std::vector<unsigned char> const& request, ResponseMap& responses,
                                          unsigned int timeoutMs, AdapterNote& note)
     {

@@ -35,14 +35,14 @@ public:
 
     /// The three values that the object was built with; the application's own.
     virtual unsigned int getHostValue1() const = 0;
-    virtual unsigned int getHostValue2() const = 0;
-    virtual unsigned int getHostValue3() const = 0;
+    virtual unsigned int getHostValue2() const = 0; ///< the second
+    virtual unsigned int getHostValue3() const = 0; ///< the third
 
-    virtual std::shared_ptr<IConnectionManager> getConnectionManager() const = 0;
-    virtual IEcuManager* getEcuManager() const = 0;
-    virtual IVelmoraSettings* getSettings() const = 0;
-    virtual IConfiguration* getConfiguration() const = 0;
-    virtual IConnectionNotifier* getConnectionNotifier() const = 0;
+    virtual std::shared_ptr<IConnectionManager> getConnectionManager() const = 0; ///< opens and closes
+    virtual IEcuManager* getEcuManager() const = 0;                               ///< selects the control module
+    virtual IVelmoraSettings* getSettings() const = 0;                            ///< of vehicle and units
+    virtual IConfiguration* getConfiguration() const = 0;                         ///< what there is to choose from
+    virtual IConnectionNotifier* getConnectionNotifier() const = 0;               ///< tells opening and closing
 };
 
 } // namespace obd

@@ -13,6 +13,7 @@ class IObdProxy;
 class IQuery
 {
 public:
+    /// What an update brought, over all control modules.
     enum class UpdateStatus : int
     {
         UpdateOk = 0,     ///< at least one control module delivered usable data

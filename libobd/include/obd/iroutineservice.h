@@ -13,6 +13,7 @@ namespace obd {
 /// of the library alive.
 struct TestRoutineDataModel
 {
+    /// What became of a run.
     enum Status : int
     {
         Accepted = 0,
@@ -20,11 +21,11 @@ struct TestRoutineDataModel
         NotRun = 2, ///< or no answer
     };
 
-    int id{0}; ///< test identifier, 0 to 255
-    int status{NotRun};
-    std::string message; ///< why the vehicle refused, else empty
-    std::string name;    // "NA" for a routine that the library does not know
-    std::string description;
+    int id{0};               ///< test identifier, 0 to 255
+    int status{NotRun};      ///< a Status
+    std::string message;     ///< why the vehicle refused, else empty
+    std::string name;        ///< "NA" for a routine that the library does not know
+    std::string description; ///< what the routine does
 };
 
 /// The on-board test routines of the current control module (service 08).

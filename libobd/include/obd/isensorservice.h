@@ -49,7 +49,7 @@ public:
 class ISensorService : public virtual tervex::INotifier<ISensorServiceObserver>
 {
 public:
-    virtual bool isConnected() const = 0;
+    virtual bool isConnected() const = 0; ///< whether there is anything to read from
 
     /// What can be read, in rising order of identifiers. Empty without a connection.
     virtual std::vector<std::shared_ptr<ParameterDescriptor>> getDescriptors() = 0;

@@ -12,12 +12,12 @@ class ISettings
 public:
     virtual ~ISettings() = default;
 
-    virtual void setInt(std::string const& key, int value) = 0;
-    virtual void setString(std::string const& key, std::string const& value) = 0;
+    virtual void setInt(std::string const& key, int value) = 0;                   ///< replaces what the key had
+    virtual void setString(std::string const& key, std::string const& value) = 0; ///< replaces what the key had
 
     /// False, with value untouched, if the key has no value.
     virtual bool getInt(std::string const& key, int& value) = 0;
-    virtual bool getString(std::string const& key, std::string& value) = 0;
+    virtual bool getString(std::string const& key, std::string& value) = 0; ///< the same of a text
 
     /// Brings what was set to permanent storage. For the application's own use: the library never calls it.
     virtual void sync() = 0;

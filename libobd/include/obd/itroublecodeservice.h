@@ -24,6 +24,7 @@ namespace obd {
 class ITroubleCodeService
 {
 public:
+    /// The malfunction indicator lamp, as the control module commands it.
     enum class MilStatus : int
     {
         Off = 0,
@@ -34,8 +35,8 @@ public:
 
     /// The codes in the order of the reply, each with all meanings that the catalogue knows.
     virtual std::vector<std::shared_ptr<DtcDataModel>> fetchConfirmedCodes() = 0;
-    virtual std::vector<std::shared_ptr<DtcDataModel>> fetchPendingCodes() = 0;
-    virtual std::vector<std::shared_ptr<DtcDataModel>> fetchPermanentCodes() = 0;
+    virtual std::vector<std::shared_ptr<DtcDataModel>> fetchPendingCodes() = 0;   ///< of this or the last driving cycle
+    virtual std::vector<std::shared_ptr<DtcDataModel>> fetchPermanentCodes() = 0; ///< not to be cleared by a tool
 
     /// The malfunction indicator lamp.
     virtual std::shared_ptr<MilStatus> fetchMilStatus() = 0;
@@ -43,7 +44,7 @@ public:
     /// The distance, and the engine's run time, since the lamp came on or else since the codes were cleared. Null also
     /// where the module does not offer it.
     virtual std::shared_ptr<SensorDataModel> fetchDistance(bool sinceMil) = 0;
-    virtual std::shared_ptr<SensorDataModel> fetchRuntime(bool sinceMil) = 0;
+    virtual std::shared_ptr<SensorDataModel> fetchRuntime(bool sinceMil) = 0; ///< the time
 
     /// The code that caused the freeze frame. Null also for a frame that holds none.
     virtual std::shared_ptr<DtcDataModel> fetchFreezeFrameTroubleCode(unsigned char frame) = 0;
@@ -64,18 +65,22 @@ public:
     /// and the clearing are told or not: there is no "nothing stored" of them. NothingStored of a freeze frame's code
     /// and of its PIDs is a frame that is not there.
     virtual Outcome<std::vector<std::shared_ptr<DtcDataModel>>> askConfirmedCodes() = 0;
-    virtual Outcome<std::vector<std::shared_ptr<DtcDataModel>>> askPendingCodes() = 0;
-    virtual Outcome<std::vector<std::shared_ptr<DtcDataModel>>> askPermanentCodes() = 0;
-    virtual Outcome<std::shared_ptr<MilStatus>> askMilStatus() = 0;
-    virtual Outcome<std::shared_ptr<SensorDataModel>> askDistance(bool sinceMil) = 0;
-    virtual Outcome<std::shared_ptr<SensorDataModel>> askRuntime(bool sinceMil) = 0;
+    virtual Outcome<std::vector<std::shared_ptr<DtcDataModel>>> askPendingCodes() = 0;   ///< fetchPendingCodes
+    virtual Outcome<std::vector<std::shared_ptr<DtcDataModel>>> askPermanentCodes() = 0; ///< fetchPermanentCodes
+    virtual Outcome<std::shared_ptr<MilStatus>> askMilStatus() = 0;                      ///< fetchMilStatus
+    virtual Outcome<std::shared_ptr<SensorDataModel>> askDistance(bool sinceMil) = 0;    ///< fetchDistance
+    virtual Outcome<std::shared_ptr<SensorDataModel>> askRuntime(bool sinceMil) = 0;     ///< fetchRuntime
+    /// fetchFreezeFrameTroubleCode, with how it went.
     virtual Outcome<std::shared_ptr<DtcDataModel>> askFreezeFrameTroubleCode(unsigned char frame) = 0;
+    /// fetchFreezeFramePids, with how it went.
     virtual Outcome<std::vector<ParameterIdentifier::Id>> askFreezeFramePids(unsigned char frame) = 0;
+    /// fetchFreezeFrameSensors, with how it went.
     virtual Outcome<std::vector<std::shared_ptr<SensorDataModel>>>
     askFreezeFrameSensors(unsigned char frame, ParameterIdentifier::Id id) = 0;
+    /// fetchFreezeFrameParameter, with how it went.
     virtual Outcome<std::shared_ptr<ParameterDataModel>> askFreezeFrameParameter(unsigned char frame,
                                                                                  ParameterIdentifier::Id id) = 0;
-    virtual Outcome<bool> askResetCodes() const = 0;
+    virtual Outcome<bool> askResetCodes() const = 0; ///< resetCodes
 };
 
 namespace TroubleCodeServiceBuilder {

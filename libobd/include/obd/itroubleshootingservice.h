@@ -36,8 +36,8 @@ public:
 
     /// Logging is off at the start, and stays as it is across connections. Any thread.
     virtual void startLogging() = 0;
-    virtual bool isLogging() = 0;
-    virtual void stopLogging() = 0;
+    virtual bool isLogging() = 0;   ///< whether observers are told
+    virtual void stopLogging() = 0; ///< any thread
 
     /// query, with how it went. Answered is any text, a control module's refusal among them: it is given as it came, so
     /// there is no Refused, and an adapter stores nothing that it could have none of, so there is no NothingStored.

@@ -31,36 +31,36 @@ public:
     /// Lives as long as the settings.
     virtual IConnectionOptions* connectionOptions() = 0;
 
-    virtual UnitSystem unitSystem() const = 0; ///< default metric
-    virtual void setUnitSystem(UnitSystem system) = 0;
+    virtual UnitSystem unitSystem() const = 0;         ///< default metric
+    virtual void setUnitSystem(UnitSystem system) = 0; ///< fires UnitSystemChanged
 
     /// Number of the language of the trouble code texts, 0 to 19, default 0.
     virtual int language() const = 0;
-    virtual void setLanguage(int language) = 0;
+    virtual void setLanguage(int language) = 0; ///< fires LanguageChanged
 
     /// Whether ignitionType stands in for what the vehicle reports, default false.
     virtual bool fuelTypeOverride() const = 0;
-    virtual void setFuelTypeOverride(bool enabled) = 0;
+    virtual void setFuelTypeOverride(bool enabled) = 0; ///< fires FuelTypeOverrideChanged
 
-    virtual IgnitionType ignitionType() const = 0; ///< default spark
-    virtual void setIgnitionType(IgnitionType type) = 0;
+    virtual IgnitionType ignitionType() const = 0;       ///< default spark
+    virtual void setIgnitionType(IgnitionType type) = 0; ///< fires IgnitionTypeChanged
 
     /// Factor on the derived fuel consumption, default 1.0. Stored in hundredths, the rest is cut off; a value beyond
     /// what the store takes is limited, and one that is no number is stored as 0.
     virtual float fuelCorrectionFactor() const = 0;
-    virtual void setFuelCorrectionFactor(float factor) = 0;
+    virtual void setFuelCorrectionFactor(float factor) = 0; ///< fires FuelCorrectionFactorChanged
 
     /// In percent, 0 to 100, default 85. The setter limits to this range.
     virtual int volumetricEfficiency() const = 0;
-    virtual void setVolumetricEfficiency(int percent) = 0;
+    virtual void setVolumetricEfficiency(int percent) = 0; ///< fires VolumetricEfficiencyChanged
 
     /// In litres, default 2.0. Stored as fuelCorrectionFactor is.
     virtual float engineDisplacement() const = 0;
-    virtual void setEngineDisplacement(float litres) = 0;
+    virtual void setEngineDisplacement(float litres) = 0; ///< fires EngineDisplacementChanged
 
     /// In kilograms, at least 0, default 1500.
     virtual int vehicleWeight() const = 0;
-    virtual void setVehicleWeight(int kilograms) = 0;
+    virtual void setVehicleWeight(int kilograms) = 0; ///< fires VehicleWeightChanged
 };
 
 } // namespace obd

@@ -11,6 +11,7 @@ namespace obd {
 class OBD_EXPORT Manufacturer
 {
 public:
+    /// Numbers that stay as they are.
     enum AutoManufacturer : int
     {
         Generic = 0, ///< the codes of SAE J2012 that mean the same on every vehicle

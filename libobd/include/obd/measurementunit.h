@@ -1,5 +1,9 @@
 #pragma once
 
+/// \file
+/// The units that values come in.
+
+/// \ingroup parameters
 /// The unit of a value, as a code. The library holds no labels: showing a unit is the application's affair. Codes 7,
 /// 47, 52 and 55 are not in use. The scaling identifiers are those of SAE J1979 for on-board monitor results.
 enum MeasurementUnit : int

@@ -34,6 +34,7 @@ public:
     virtual int nack() const;
 
 protected:
+    /// The bytes to send, service first.
     virtual void getRequestData(std::vector<unsigned char>& data) const = 0;
 
     /// What a reply must begin with. An empty signature matches everything.
@@ -42,6 +43,7 @@ protected:
     /// Reads a reply, from its service byte on. False leaves the module's stored value alone.
     virtual bool fromBytes(std::shared_ptr<IEcu> const& ecu, std::vector<unsigned char> const& data) = 0;
 
+    /// Notes a negative reply.
     void setNack(std::shared_ptr<IEcu> const& ecu, std::vector<unsigned char> const& data);
 
     /// Bytes of checksum behind each 7 byte line of a multi-line reply on ISO 9141-2 and J1850, where the parser leaves

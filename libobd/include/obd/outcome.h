@@ -20,7 +20,7 @@ enum class OutcomeKind : int
 /// How it went, without a value.
 struct Verdict
 {
-    OutcomeKind kind{OutcomeKind::Answered};
+    OutcomeKind kind{OutcomeKind::Answered}; ///< how it went
     /// The response code of a negative reply, see Nack; 0 where there was none. A legacy bus refuses some requests
     /// without a code.
     int code{0};
@@ -28,7 +28,7 @@ struct Verdict
     /// Whether the module told what was asked, and be it that there is nothing.
     bool isTold() const { return kind == OutcomeKind::Answered || kind == OutcomeKind::NothingStored; }
 
-    bool operator==(Verdict const&) const = default;
+    bool operator==(Verdict const&) const = default; ///< kind and code
 };
 
 /// How it went, with the value: that of the fetch operation beside it, so empty, null or false unless it was told.
@@ -36,9 +36,10 @@ template <typename T>
 struct Outcome : Verdict
 {
     Outcome() = default;
+    /// From how it went, with what it brought.
     Outcome(Verdict const& verdict, T result = T()) : Verdict(verdict), value(std::move(result)) {}
 
-    T value{};
+    T value{}; ///< of use where isTold
     /// Of an operation that asks several times: how many of its requests brought nothing that could be read. What they
     /// would have told is missing in the value.
     unsigned int missing{0};

@@ -21,12 +21,12 @@ public:
     /// info must not be null.
     SensorDescriptor(std::shared_ptr<SensorInfo const> info, UnitSystem system);
 
-    std::string description() const { return m_info->description(); }
-    bool isNumeric() const { return m_info->isNumeric(); }
-    int uid() const { return m_info->uid(); }
-    MeasurementUnit unit() const { return m_info->unit(m_system); }
-    double minValue() const { return m_info->minValue(m_system); }
-    double maxValue() const { return m_info->maxValue(m_system); }
+    std::string description() const { return m_info->description(); } ///< the sensor's name
+    bool isNumeric() const { return m_info->isNumeric(); }            ///< false if the readings are texts
+    int uid() const { return m_info->uid(); }                         ///< as in SensorInfo
+    MeasurementUnit unit() const { return m_info->unit(m_system); }   ///< in the unit system of the settings
+    double minValue() const { return m_info->minValue(m_system); }    ///< of the range for display
+    double maxValue() const { return m_info->maxValue(m_system); }    ///< of the range for display
 
 private:
     std::shared_ptr<SensorInfo const> m_info;
@@ -41,11 +41,11 @@ public:
     /// Neither pointer may be null.
     ParameterDescriptor(std::shared_ptr<PowertrainParameter> parameter, std::shared_ptr<IEcu> ecu, UnitSystem system);
 
-    ParameterIdentifier::Id pid() const;
-    std::string description() const;
+    ParameterIdentifier::Id pid() const; ///< what the parameter is known by
+    std::string description() const;     ///< the parameter's name
     /// One for each sensor of the parameter, in its order.
     std::vector<std::shared_ptr<SensorDescriptor>> sensors() const;
-    bool hasNumericSensors() const;
+    bool hasNumericSensors() const; ///< whether any sensor is numeric
 
 private:
     std::shared_ptr<PowertrainParameter> m_parameter;

@@ -11,6 +11,7 @@ namespace obd {
 class OBD_EXPORT ParameterIdentifier
 {
 public:
+    /// A PID by its number, or a derived parameter by its name.
     enum Id : int
     {
         FuelConsumption = 0xF0,
@@ -20,10 +21,10 @@ public:
         BoostPressure = 0xF7,
     };
 
-    explicit ParameterIdentifier(int id) : m_id(static_cast<Id>(id)) {}
-    explicit ParameterIdentifier(Id id) : m_id(id) {}
+    explicit ParameterIdentifier(int id) : m_id(static_cast<Id>(id)) {} ///< a PID, or a derived parameter's number
+    explicit ParameterIdentifier(Id id) : m_id(id) {}                   ///< the same
 
-    Id id() const { return m_id; }
+    Id id() const { return m_id; } ///< as it was given
     /// The byte that stands in a request.
     unsigned char toOid() const { return static_cast<unsigned char>(m_id & 0xFF); }
     /// "$" and at least two upper-case hexadecimal digits, such as "$0C".

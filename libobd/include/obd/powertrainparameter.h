@@ -22,10 +22,10 @@ public:
     /// frame: the freeze frame number, of meaning in service 02 only.
     PowertrainParameter(ObdMode mode, unsigned char frame) : m_frame(frame), m_mode(mode) {}
 
-    ObdMode mode() const { return m_mode; }
-    unsigned char frame() const { return m_frame; }
+    ObdMode mode() const { return m_mode; }         ///< service 01, or 02 for a freeze frame
+    unsigned char frame() const { return m_frame; } ///< the freeze frame's number
 
-    virtual ParameterIdentifier::Id pid() const = 0;
+    virtual ParameterIdentifier::Id pid() const = 0; ///< what the parameter is known by
 
     /// The parameter's name, which may depend on what the module has.
     virtual std::string description(IEcu const& ecu) = 0;
@@ -35,7 +35,7 @@ public:
     virtual std::vector<std::shared_ptr<SensorValue>> values(IEcu const& ecu, UnitSystem system) = 0;
 
 protected:
-    void getRequestData(std::vector<unsigned char>& data) const override;
+    void getRequestData(std::vector<unsigned char>& data) const override; ///< service, PID, and the frame in service 02
     void getSignature(std::vector<unsigned char>& signature) const override;
     bool fromBytes(std::shared_ptr<IEcu> const& ecu, std::vector<unsigned char> const& data) override;
 

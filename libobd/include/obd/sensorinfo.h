@@ -15,6 +15,7 @@ namespace obd {
 class OBD_EXPORT SensorInfo
 {
 public:
+    /// uid: see Pid2Uid. numeric: false if the readings are texts.
     SensorInfo(int uid, std::string const& description, bool numeric);
     virtual ~SensorInfo() = default;
 
@@ -22,16 +23,16 @@ public:
     /// leave it.
     void add(UnitSystem system, MeasurementUnit unit, double minimum, double maximum);
 
-    int uid() const { return m_uid; }
-    ParameterIdentifier::Id pid() const { return Uid2Pid(m_uid); }
-    std::string description() const { return m_description; }
+    int uid() const { return m_uid; }                              ///< see Pid2Uid
+    ParameterIdentifier::Id pid() const { return Uid2Pid(m_uid); } ///< of its parameter
+    std::string description() const { return m_description; }      ///< the sensor's name
     /// False if the readings are texts.
     bool isNumeric() const { return m_numeric; }
 
     /// UnitNone, and 0.0 to 0.0, in a unit system of which nothing was said.
     MeasurementUnit unit(UnitSystem system) const;
-    double minValue(UnitSystem system) const;
-    double maxValue(UnitSystem system) const;
+    double minValue(UnitSystem system) const; ///< lower end of the range
+    double maxValue(UnitSystem system) const; ///< upper end of the range
 
 private:
     struct Record

@@ -14,7 +14,7 @@ namespace obd {
 class OBD_EXPORT SensorValue
 {
 public:
-    explicit SensorValue(int uid) : m_uid(uid) {}
+    explicit SensorValue(int uid) : m_uid(uid) {} ///< of the sensor
     virtual ~SensorValue() = default;
 
     /// The uid of the sensor, as in its SensorInfo.
@@ -32,6 +32,7 @@ private:
 class OBD_EXPORT NumericSensorValue : public SensorValue
 {
 public:
+    /// From the uid of the sensor.
     using SensorValue::SensorValue;
 
     /// The number as stored, not rounded.
@@ -47,8 +48,10 @@ template <typename T>
 class ConcreateNumericSensorValue : public NumericSensorValue
 {
 public:
+    /// decimals: 0 to 9.
     ConcreateNumericSensorValue(int uid, T value, int decimals);
 
+    /// The same as a shared object.
     static std::shared_ptr<ConcreateNumericSensorValue<T>> buildObject(int uid, T value, int decimals);
 
     std::string textualValue() override;
@@ -68,7 +71,8 @@ extern template class OBD_EXPORT ConcreateNumericSensorValue<double>;
 class OBD_EXPORT TextualSensorValue : public SensorValue
 {
 public:
-    TextualSensorValue(int uid, std::string text) : SensorValue(uid), m_text(std::move(text)) {}
+    TextualSensorValue(int uid, std::string text) : SensorValue(uid), m_text(std::move(text)) {} ///< a state in words
+    /// A number that is shown as its digits.
     TextualSensorValue(int uid, std::string digits, double number)
         : SensorValue(uid), m_text(std::move(digits)), m_number(number)
     {}

@@ -12,7 +12,7 @@ class IValueFormater
 public:
     virtual ~IValueFormater() = default;
 
-    virtual std::string toString(double value) const = 0;
+    virtual std::string toString(double value) const = 0; ///< without a unit
 };
 
 /// Writes numbers with a fixed count of decimals. A plain value: it stands inside every numeric sensor value, so it

@@ -2,6 +2,7 @@
 
 namespace obd {
 
+/// The units that values are told in.
 enum class UnitSystem : int
 {
     Metric = 0,

@@ -10,7 +10,7 @@ class IEventListener
 public:
     virtual ~IEventListener() = default;
 
-    virtual void onEvent(E const& event) = 0;
+    virtual void onEvent(E const& event) = 0; ///< on the thread that fires
 };
 
 } // namespace tervex

@@ -14,8 +14,8 @@ class IEventProducer
 public:
     virtual ~IEventProducer() = default;
 
-    virtual void attach(L* listener) = 0;
-    virtual void detach(L* listener) = 0;
+    virtual void attach(L* listener) = 0; ///< at the end of the list; not owned
+    virtual void detach(L* listener) = 0; ///< waits for a call on another thread
 };
 
 } // namespace tervex

@@ -18,8 +18,8 @@ public:
     Notifier(Notifier const&) = delete;
     Notifier& operator=(Notifier const&) = delete;
 
-    void attach(Observer<T>* observer) override { m_observers->push_back(observer); }
-    void detach(Observer<T>* observer) override { std::erase(*m_observers, observer); }
+    void attach(Observer<T>* observer) override { m_observers->push_back(observer); }   ///< not owned
+    void detach(Observer<T>* observer) override { std::erase(*m_observers, observer); } ///< all its entries
 
 protected:
     Notifier() = default;

@@ -14,22 +14,23 @@ namespace velmora {
 /// An on-board test routine of service 08.
 struct Routine
 {
-    int id; ///< 0 to 255
-    std::string name;
-    std::string description;
+    int id;                  ///< 0 to 255
+    std::string name;        ///< "Evaporative system leak test"
+    std::string description; ///< what the routine does
 };
 
 /// The routines of one control module that can be run: those that it offers and that are known here. What another one
 /// does, nobody can be warned of.
 struct RoutinesReport
 {
-    TopicAnswer answer = TopicAnswer::NotOffered;
-    std::vector<Routine> routines;
+    TopicAnswer answer = TopicAnswer::NotOffered; ///< whether the module told its routines
+    std::vector<Routine> routines;                ///< those that can be run
 };
 
 /// What a control module said when it was asked to run a routine.
 struct RoutineRun
 {
+    /// What became of the run.
     enum class Result
     {
         Accepted,
@@ -38,14 +39,15 @@ struct RoutineRun
         Unreadable, ///< it answered in a form that can't be decoded
     };
 
-    Routine routine;
-    Result result;
+    Routine routine;    ///< the one that was asked for
+    Result result;      ///< what became of it
     std::string reason; ///< of a refusal, such as "conditions not correct (22)"; empty if the module gave none
 };
 
 /// What a control module said when it was asked to clear its trouble codes.
 struct ClearReport
 {
+    /// What became of the clearing.
     enum class Result
     {
         Cleared,
@@ -54,7 +56,7 @@ struct ClearReport
         Unreadable, ///< it answered in a form that can't be decoded
     };
 
-    Result result;
+    Result result;      ///< what became of it
     std::string reason; ///< of a refusal
 };
 

@@ -29,16 +29,16 @@ class WatchState;
 struct CarOptions
 {
     std::string port = {}; ///< as the program's --port takes it: "192.168.0.10:35000", "sim:petrol-can11"
-    std::optional<unsigned int> baud = {}; ///< line rate of a serial port
-    std::optional<int> protocol = {};      ///< the adapter's number of the bus, 1 to 9; searched for if empty
-    std::optional<Units> units = {};
+    std::optional<unsigned int> baud = {};   ///< line rate of a serial port
+    std::optional<int> protocol = {};        ///< the adapter's number of the bus, 1 to 9; searched for if empty
+    std::optional<Units> units = {};         ///< that values are told in
     std::optional<unsigned int> module = {}; ///< id of the one control module to ask; all of them if empty
     bool reset = false;                      ///< restore and reset the adapter before use
     bool sleep = false;                      ///< send the adapter to sleep at the end, which costs the next visit time
     bool forget = false;                     ///< drop what earlier visits have learnt of adapters and vehicles
-    std::string logFile = {};
-    std::string traceFile = {};    ///< gets the traffic with the adapter
-    std::string settingsFile = {}; ///< velmora/settings.toml in the user's configuration folder if empty
+    std::string logFile = {};                ///< gets what the library says of its work; none if empty
+    std::string traceFile = {};              ///< gets the traffic with the adapter
+    std::string settingsFile = {};           ///< velmora/settings.toml in the user's configuration folder if empty
     /// Files of signals of one's own (docs/signals.md), beside those in the folder `signals` of the settings' folder.
     std::vector<std::string> signalFiles = {};
 
@@ -52,18 +52,18 @@ struct CarOptions
 /// A control module that answers.
 struct Module
 {
-    unsigned int id;
-    std::string name;
-    std::string description;
+    unsigned int id;         ///< such as 0x7E8
+    std::string name;        ///< such as "ECM"
+    std::string description; ///< such as "Engine Control"
 };
 
 /// A sensor that a control module offers.
 struct Sensor
 {
-    unsigned int module;
-    std::string key;   ///< "RPM"
-    std::string pid;   ///< "010C"; empty for a derived value
-    std::string title; ///< "Engine RPM"
+    unsigned int module; ///< id of the control module
+    std::string key;     ///< "RPM"
+    std::string pid;     ///< "010C"; empty for a derived value
+    std::string title;   ///< "Engine RPM"
 };
 
 /// What became of the link while a watch goes on.
@@ -80,10 +80,10 @@ class VELMORA_EXPORT Watch
 public:
     Watch();
     ~Watch();
-    Watch(Watch&&) noexcept;
-    Watch& operator=(Watch&&) noexcept;
+    Watch(Watch&&) noexcept;            ///< leaves the other without a watch
+    Watch& operator=(Watch&&) noexcept; ///< ends what it held before
 
-    void end();
+    void end(); ///< as destroying does; once more does nothing
 
 private:
     friend class Car;
@@ -107,10 +107,12 @@ private:
 class VELMORA_EXPORT Car
 {
 public:
-    using OnReading = std::function<void(Reading const&)>;
-    using OnLink = std::function<void(LinkState)>;
+    using OnReading = std::function<void(Reading const&)>; ///< gets each reading of a watch
+    using OnLink = std::function<void(LinkState)>;         ///< hears of losses and returns of the link
 
+    /// CarOptions::port, and else the settings file and the defaults.
     explicit Car(std::string const& port);
+    /// Connects; waits until the car answers or it is known that it does not.
     explicit Car(CarOptions options);
     /// Closes the connection. Not from a callback. An opening of a network port that is under way is waited for, ten
     /// seconds at most.
@@ -130,20 +132,27 @@ public:
     /// The trouble codes of all control modules. Throws Error if none told any of its lists; whether each module told
     /// all of its own is in codeReports.
     std::vector<StoredCode> codes();
+    /// Lamp and each list of codes, with how asking for it went.
     std::vector<ModuleTopic<CodeReport>> codeReports();
     /// Of all control modules, the newest frame as a rule being 0.
     std::vector<ModuleTopic<FreezeReport>> freezeFrame(unsigned char frame = 0);
+    /// The monitors that an emissions test asks for.
     std::vector<ModuleTopic<ReadinessReport>> readiness();
     /// The results of on-board tests. Asks once for each monitor, which takes seconds.
     std::vector<ModuleTopic<MonitorsReport>> monitors();
     /// The oxygen sensors, on legacy buses with their tests.
     std::vector<ModuleTopic<OxygenReport>> oxygen();
+    /// How often the monitors could run and did.
     std::vector<ModuleTopic<CountersReport>> counters();
+    /// Vehicle identification number, calibrations and more.
     std::vector<ModuleTopic<InfoReport>> info();
+    /// The control modules that are asked: all that answered, or the one that CarOptions names.
     std::vector<Module> modules();
+    /// What read and watch can read.
     std::vector<Sensor> sensors();
     /// Measures the supply voltage, too.
     AdapterReport adapter();
+    /// The bus that the vehicle was found on.
     ProtocolReport protocol();
     /// All of the above but readings. Takes seconds.
     VehicleReport report();
@@ -172,7 +181,9 @@ private:
     std::shared_ptr<CarCore> m_core;
 };
 
+/// "7E8 ECM"
 VELMORA_EXPORT std::ostream& operator<<(std::ostream& out, Module const& module);
+/// "7E8 RPM: Engine RPM"
 VELMORA_EXPORT std::ostream& operator<<(std::ostream& out, Sensor const& sensor);
 /// "lost" or "returned".
 VELMORA_EXPORT std::ostream& operator<<(std::ostream& out, LinkState state);

@@ -28,11 +28,12 @@ enum class ErrorKind : int
 class VELMORA_EXPORT Error : public std::runtime_error
 {
 public:
+    /// what: what was tried and what happened. hints: what to try next, the best first.
     Error(ErrorKind kind, std::string const& what, std::vector<std::string> hints = {})
         : std::runtime_error(what), m_kind(kind), m_hints(std::move(hints))
     {}
 
-    ErrorKind kind() const { return m_kind; }
+    ErrorKind kind() const { return m_kind; } ///< also a good exit code
     /// The likeliest things to try next, the best first; a sentence without its full stop each.
     std::vector<std::string> const& hints() const { return m_hints; }
 

@@ -23,9 +23,9 @@ struct Reading
     std::string sensor; ///< stable key of capitals, digits and '_': "RPM", "PID_C2", or a signal's own id
     std::string pid;    ///< what was asked, in hexadecimal from the service on: "010C"; empty for a derived value
     std::string name;   ///< title for people: "Engine RPM"
-    Value value;
-    std::string unit;               ///< label as people write it: "rpm", "km/h"; empty for none
-    int precision = 0;              ///< digits behind the point that the value is good for
+    Value value;        ///< see Value
+    std::string unit;   ///< label as people write it: "rpm", "km/h"; empty for none
+    int precision = 0;  ///< digits behind the point that the value is good for
     std::vector<unsigned char> raw; ///< the module's payload from the service byte on; empty for a derived value
 };
 

@@ -13,10 +13,10 @@ namespace velmora {
 /// What the adapter says of itself. Empty texts and missing values were not told.
 struct AdapterReport
 {
-    std::string device; ///< name and version
-    std::string description;
-    std::string identification;
-    std::optional<float> volts;
+    std::string device;         ///< name and version
+    std::string description;    ///< its own words, such as "OBDII to RS232 Interpreter"
+    std::string identification; ///< what its owner has stored in it
+    std::optional<float> volts; ///< supply voltage, as the adapter measures it
 };
 
 /// The bus that the vehicle was found on.
@@ -40,16 +40,16 @@ struct LiveValue
 /// All that one control module told.
 struct ModuleReport
 {
-    unsigned int id;
-    std::string name;
-    std::vector<unsigned int> supported; ///< identifiers of service 01 that are sensors
-    InfoReport info;
-    CodeReport codes;
-    FreezeReport freeze;
-    ReadinessReport readiness;
-    MonitorsReport monitors;
-    OxygenReport oxygen;
-    CountersReport counters;
+    unsigned int id;                        ///< of the control module, such as 0x7E8
+    std::string name;                       ///< such as "ECM"
+    std::vector<unsigned int> supported;    ///< identifiers of service 01 that are sensors
+    InfoReport info;                        ///< what it says of itself and the vehicle
+    CodeReport codes;                       ///< lamp and trouble codes
+    FreezeReport freeze;                    ///< frame 0
+    ReadinessReport readiness;              ///< monitors of an emissions test
+    MonitorsReport monitors;                ///< results of on-board tests
+    OxygenReport oxygen;                    ///< oxygen sensors
+    CountersReport counters;                ///< in-use counters
     TopicAnswer offers = TopicAnswer::Read; ///< how asking for what it supports of service 01 went
     std::vector<LiveValue> values = {};     ///< those of what it supports that findings need
 };
@@ -63,8 +63,8 @@ inline bool toldOffers(ModuleReport const& module)
 /// All that a vehicle told, as Car::report gives it. Plain data: copy it, keep it, hand it to any thread.
 struct VehicleReport
 {
-    AdapterReport adapter;
-    ProtocolReport protocol;
+    AdapterReport adapter;             ///< what the adapter says of itself
+    ProtocolReport protocol;           ///< the bus
     std::vector<ModuleReport> modules; ///< in rising order of id
 
     /// The document that docs/json.md describes.

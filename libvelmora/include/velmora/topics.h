@@ -16,14 +16,15 @@ namespace velmora {
 template <typename Report>
 struct ModuleTopic
 {
-    unsigned int id;
-    std::string name;
-    Report report;
+    unsigned int id;  ///< of the control module, such as 0x7E8
+    std::string name; ///< such as "ECM"
+    Report report;    ///< what it told
 };
 
 /// A test that a control module made on itself, with its result as text. Empty limits are none.
 struct LimitTest
 {
+    /// How the test has ended.
     enum class Verdict
     {
         Failed,
@@ -32,66 +33,67 @@ struct LimitTest
         None,     ///< a constant, with no limits to judge by
     };
 
-    int id;
-    std::string description;
-    std::string value;
-    std::string minimum;
-    std::string maximum;
-    std::string unit;
-    Verdict verdict;
+    int id;                  ///< test identifier
+    std::string description; ///< what was tested
+    std::string value;       ///< the result, without its unit
+    std::string minimum;     ///< empty for none
+    std::string maximum;     ///< empty for none
+    std::string unit;        ///< label; empty for none
+    Verdict verdict;         ///< by value and limits
 };
 
 /// An on-board monitor with the results of its tests.
 struct OnBoardMonitor
 {
-    int id;
-    std::string description;
-    std::vector<LimitTest> tests;
+    int id;                       ///< monitor identifier
+    std::string description;      ///< what is monitored
+    std::vector<LimitTest> tests; ///< in the order of the reply
 };
 
 /// The results of on-board tests, service 06 on CAN.
 struct MonitorsReport
 {
-    TopicAnswer answer = TopicAnswer::NotOffered;
-    std::vector<OnBoardMonitor> monitors;
+    TopicAnswer answer = TopicAnswer::NotOffered; ///< whether the module told its monitors
+    std::vector<OnBoardMonitor> monitors;         ///< those that it told
 };
 
 /// An oxygen sensor with the tests that the module made on it.
 struct OxygenSensor
 {
-    obd::OxygenSensorLocation location;
-    std::vector<LimitTest> tests;
+    obd::OxygenSensorLocation location; ///< bank and position
+    std::vector<LimitTest> tests;       ///< on legacy buses alone
 };
 
 /// The oxygen sensors of one control module.
 struct OxygenReport
 {
-    TopicAnswer answer = TopicAnswer::NotOffered;
-    std::optional<bool> complete; ///< whether the monitor has run since the codes were cleared
-    bool onCan = false;           ///< where the tests are among those of the monitors
-    std::vector<OxygenSensor> sensors;
+    TopicAnswer answer = TopicAnswer::NotOffered; ///< whether the module told its sensors
+    std::optional<bool> complete;                 ///< whether the monitor has run since the codes were cleared
+    bool onCan = false;                           ///< where the tests are among those of the monitors
+    std::vector<OxygenSensor> sensors;            ///< those that it told
 };
 
 /// What the vehicle froze when a code was set.
 struct FreezeFrame
 {
+    /// One value of the frame.
     struct Reading
     {
-        std::string name;
+        std::string name;                 ///< title for people
         std::optional<std::string> value; ///< nothing if the module did not tell it
-        std::string unit;
+        std::string unit;                 ///< label; empty for none
     };
 
-    TroubleCode code;
-    std::vector<Reading> readings;
+    TroubleCode code;              ///< the one that caused the frame
+    std::vector<Reading> readings; ///< what the frame holds beside it
 };
 
 /// One frame of a control module, by number.
 struct FreezeReport
 {
-    unsigned int number = 0;
+    unsigned int number = 0;                      ///< of the frame, 0 to 255
     TopicAnswer answer = TopicAnswer::NotOffered; ///< whether the module told what its frame holds
-    std::optional<FreezeFrame> frame;
+    std::optional<FreezeFrame> frame;             ///< nothing if none is stored, or none was told
 };
 
 /// Complete, NotComplete, DisabledThisCycle or NotAvailable.
@@ -100,62 +102,66 @@ using ReadinessStatus = obd::ReadinessMonitorDataModel::Status;
 /// One monitor of the emission system.
 struct ReadinessMonitor
 {
-    std::string name;
-    ReadinessStatus sinceCleared;
+    std::string name;                         ///< "Misfire"
+    ReadinessStatus sinceCleared;             ///< since the codes were cleared
     std::optional<ReadinessStatus> thisCycle; ///< nothing if the module does not tell it
 };
 
 /// Which monitors have run, as an emissions test asks for.
 struct ReadinessReport
 {
-    TopicAnswer answer = TopicAnswer::NotOffered;
-    std::optional<bool> lamp;
-    std::vector<ReadinessMonitor> monitors;
+    TopicAnswer answer = TopicAnswer::NotOffered; ///< whether the module told its monitors
+    std::optional<bool> lamp;               ///< whether the malfunction indicator is on; nothing if that was not told
+    std::vector<ReadinessMonitor> monitors; ///< those that an engine of its kind can have
 };
 
 /// How often monitors could run and did.
 struct CountersReport
 {
+    /// One counter of in-use performance.
     struct Counter
     {
-        std::string name;
-        unsigned int value;
+        std::string name;   ///< title for people
+        unsigned int value; ///< how often
     };
 
-    TopicAnswer answer = TopicAnswer::NotOffered;
-    std::vector<Counter> counters; ///< those that are not 0
+    TopicAnswer answer = TopicAnswer::NotOffered; ///< whether the module told its counters
+    std::vector<Counter> counters;                ///< those that are not 0
 };
 
 /// What a control module tells of itself and the vehicle. Empty texts and missing values were not told.
 struct InfoReport
 {
+    /// A software or a set of data of the module.
     struct Calibration
     {
-        std::string id;
+        std::string id;           ///< its name, as the maker gives it
         std::string verification; ///< the checksum of what the id names
     };
 
+    /// A value as people write it.
     struct Reading
     {
-        std::string value;
-        std::string unit;
+        std::string value; ///< digits
+        std::string unit;  ///< label
     };
 
+    /// How far, and for how long the engine ran.
     struct Travel
     {
-        std::optional<Reading> distance;
-        std::optional<Reading> runTime;
+        std::optional<Reading> distance; ///< driven
+        std::optional<Reading> runTime;  ///< of the engine
     };
 
-    std::string description;
-    std::string standard;
-    std::string protocol;
-    std::string vin;
-    std::vector<Calibration> calibrations;
-    std::string engineSerialNumber;
-    std::string erotan; ///< exhaust regulation or type approval number
-    Travel withLamp;    ///< since the lamp came on
-    Travel sinceCleared;
+    std::string description;               ///< long name of the module
+    std::string standard;                  ///< that it reports to meet, such as "EOBD"
+    std::string protocol;                  ///< of its bus
+    std::string vin;                       ///< vehicle identification number
+    std::vector<Calibration> calibrations; ///< in the order of the reply
+    std::string engineSerialNumber;        ///< as the maker gives it
+    std::string erotan;                    ///< exhaust regulation or type approval number
+    Travel withLamp;                       ///< since the lamp came on
+    Travel sinceCleared;                   ///< since the codes were cleared
 };
 
 /// "read", "not supported", "no answer", "unreadable" or "refused".

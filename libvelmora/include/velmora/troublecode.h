@@ -22,23 +22,25 @@ enum class TopicAnswer
 /// One trouble code as people read it: all its meanings together.
 struct TroubleCode
 {
+    /// What one maker means by a code.
     struct Meaning
     {
-        std::string maker;
-        std::string text;
+        std::string maker; ///< "Generic", a maker, or "Unknown"
+        std::string text;  ///< the meaning
 
-        bool operator==(Meaning const&) const = default;
+        bool operator==(Meaning const&) const = default; ///< maker and text
     };
 
-    std::string code;
-    std::string system;
-    std::vector<Meaning> meanings;
-    std::string maker = {}; ///< whose meanings hold for the vehicle; empty for nobody known
+    std::string code;              ///< "P0171"
+    std::string system;            ///< "Powertrain", "Body", "Chassis", "Network" or "Undefined"
+    std::vector<Meaning> meanings; ///< all that the catalogue has
+    std::string maker = {};        ///< whose meanings hold for the vehicle; empty for nobody known
 };
 
 /// Whose meanings a vehicle's trouble codes are read with.
 struct MakerChoice
 {
+    /// What the choice rests on.
     enum class By
     {
         Nothing,
@@ -47,8 +49,8 @@ struct MakerChoice
         Guess,  ///< the number tells a related maker, which is only offered
     };
 
-    By by = By::Nothing;
-    std::string maker; ///< as the trouble code catalogue writes it
+    By by = By::Nothing; ///< what it rests on
+    std::string maker;   ///< as the trouble code catalogue writes it
 
     /// The maker whose meanings hold; empty for nobody.
     VELMORA_EXPORT std::string const& holding() const;
@@ -66,13 +68,14 @@ enum class CodeKind : int
 struct StoredCode
 {
     unsigned int module; ///< id of the control module
-    CodeKind kind;
-    TroubleCode code;
+    CodeKind kind;       ///< of the list that holds it
+    TroubleCode code;    ///< with its meanings
 };
 
 /// What a control module tells of its codes of one kind.
 struct CodeList
 {
+    /// How asking for the list went.
     enum class Answer : int
     {
         Read,
@@ -81,18 +84,18 @@ struct CodeList
         Unreadable,
     };
 
-    CodeKind kind;
-    Answer answer;
-    std::string reason; ///< of a refusal
-    std::vector<TroubleCode> codes;
-    bool offered = true; ///< false if the refusal says that the module does not have the list
+    CodeKind kind;                  ///< of all codes in it
+    Answer answer;                  ///< without codes, Read says that nothing is stored
+    std::string reason;             ///< of a refusal
+    std::vector<TroubleCode> codes; ///< in the order of the reply
+    bool offered = true;            ///< false if the refusal says that the module does not have the list
 };
 
 /// Lamp and trouble codes of one control module.
 struct CodeReport
 {
-    std::optional<bool> lamp; ///< whether the malfunction indicator is on
-    std::vector<CodeList> lists;
+    std::optional<bool> lamp;                     ///< whether the malfunction indicator is on
+    std::vector<CodeList> lists;                  ///< one for each kind
     MakerChoice maker = {};                       ///< whose meanings the codes are given
     TopicAnswer lampAnswer = TopicAnswer::Silent; ///< why there is no lamp, where there is none
 };

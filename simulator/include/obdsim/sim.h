@@ -19,6 +19,7 @@ using Time = std::chrono::microseconds;
 class Error : public std::runtime_error
 {
 public:
+    /// From what() is to say.
     using std::runtime_error::runtime_error;
 };
 
@@ -35,8 +36,8 @@ struct Options
 /// A line that the host has sent, in capitals and without blanks.
 struct Request
 {
-    Time time{};
-    std::string text;
+    Time time{};      ///< when it was complete
+    std::string text; ///< "010C"
 };
 
 /// One car with its adapter. Its clock stands still until somebody moves it: advance() and ask() by hand, a server by
@@ -47,8 +48,8 @@ public:
     /// Throws Error.
     explicit Simulator(Options const& options = {});
     ~Simulator();
-    Simulator(Simulator&&) noexcept;
-    Simulator& operator=(Simulator&&) noexcept;
+    Simulator(Simulator&&) noexcept;            ///< the other may only be destroyed or assigned to then
+    Simulator& operator=(Simulator&&) noexcept; ///< ends what it held before
 
     /// Bytes from the host, which arrive at now().
     void send(std::string_view bytes);
@@ -62,6 +63,7 @@ public:
     /// Sends the line with a CR, and jumps through the time until the adapter has no more to say.
     std::string ask(std::string_view line);
 
+    /// The time of the simulation.
     Time now() const;
 
     /// False once the simulated link has broken.
@@ -83,7 +85,9 @@ public:
     /// Serves programs in real time, on a thread of its own, until stop(): on 127.0.0.1 (port 0: any free one), or as a
     /// pseudo-terminal. Returns what they connect to. Throws Error.
     std::string serveTcp(std::uint16_t port = 0);
+    /// Returns the path of the device. Throws Error.
     std::string servePseudoTerminal();
+    /// Ends the serving; waits for its thread.
     void stop();
 
 private:
@@ -93,6 +97,7 @@ private:
 
 /// Names of the built-in vehicles and adapters.
 std::vector<std::string> vehicles();
+/// Names of the built-in adapters.
 std::vector<std::string> adapters();
 
 } // namespace velmora::sim
