@@ -58,7 +58,11 @@ public:
 class ObdVelmora : public testing::Test
 {
 protected:
-    ~ObdVelmora() override { obd::VelmoraInstance::set(nullptr); }
+    ~ObdVelmora() override
+    {
+        obd::VelmoraInstance::set(nullptr);
+        m_loop.runPending(); // the Dispatcher is the process's, and so is what waits in it
+    }
 
     std::shared_ptr<obd::IObdVelmora> create() { return createObdVelmora(1, 2, 3, m_store); }
     std::shared_ptr<support::ScriptedChannel> workingChannel()
