@@ -99,7 +99,7 @@ function main() {
     const { text, json } = makeReport(name, port);
     const { tables, anchors, links, said } = parse(text);
     expectWholeRows(text, name);
-    assert.ok(expectRows(json, tables, name) > 5, `${name} tells something`);
+    assert.ok(expectRows(json, tables, name) >= 5, `${name} tells something`);
     assert.ok(said.includes(owner), `${name}: the owner's name of the car stays text`);
     for (const link of links) assert.ok(link.startsWith('#') && anchors.includes(link.slice(1)), `${name}: ${link} leads nowhere`);
     for (const finding of json.findings) {

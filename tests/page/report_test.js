@@ -158,7 +158,7 @@ async function checkInBrowser(reports) {
       const text = joined(await page.evaluate('document.body.textContent'));
       for (const wanted of wantedTexts(report.json)) assert.ok(text.includes(joined(wanted)), `${name}: "${wanted}"`);
       assert.ok(text.includes(joined('<script>alert(1)</script> & "co"')), 'the name stays text');
-      assert.ok(expectRows(report.json, new Map(await rowsByModule(page)), name) > 5, `${name} tells something`);
+      assert.ok(expectRows(report.json, new Map(await rowsByModule(page)), name) >= 5, `${name} tells something`);
       await checkScreen(page, name);
       await page.emulateMediaType('print');
       for (const [format, width] of [['A4', 703], ['Letter', 725]]) {
