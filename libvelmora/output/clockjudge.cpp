@@ -51,9 +51,10 @@ std::string bootId()
 
 ClockLook lookAtClocks()
 {
-    static std::string const id = bootId();
+    // Never destroyed: at the process's end an output that hangs may still be at it.
+    static auto const* const id = new std::string(bootId());
     static bool const battery = hasBattery();
-    return {millisOf(CLOCK_REALTIME), millisOf(CLOCK_BOOTTIME), knowsTimeServer(), id, battery};
+    return {millisOf(CLOCK_REALTIME), millisOf(CLOCK_BOOTTIME), knowsTimeServer(), *id, battery};
 }
 
 ClockStamp stampOf(ClockLook const& look)
