@@ -5,7 +5,7 @@
 // bytes a reading, bytes written a second with the write-ahead file's, and how long the last hour of one sensor takes
 // to be read.
 
-#include "libvelmora/output/sqliteoutput.h"
+#include "libvelmora/output/database/sqliteoutput.h"
 #include "libvelmora/output/valuetext.h"
 
 #include <chrono>

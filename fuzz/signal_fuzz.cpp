@@ -2,8 +2,8 @@
 // read again.
 
 #include "libvelmora/signal/formulaparser.h"
+#include "libvelmora/signal/importing/signalimport.h"
 #include "libvelmora/signal/signalfile.h"
-#include "libvelmora/signal/signalimport.h"
 
 #include <velmora/error.h>
 

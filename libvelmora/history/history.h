@@ -1,7 +1,7 @@
 #pragma once
 
 #include "libvelmora/history/keptscan.h"
-#include "libvelmora/output/database.h"
+#include "libvelmora/output/database/database.h"
 
 #include <filesystem>
 #include <iosfwd>

@@ -3,8 +3,8 @@
 #include <velmora/error.h>
 
 #ifdef VELMORA_OUTPUT_SQLITE
-#include "libvelmora/output/database.h"
-#include "libvelmora/output/sqliteschema.h"
+#include "libvelmora/output/database/database.h"
+#include "libvelmora/output/database/sqliteschema.h"
 #include "libvelmora/output/valuetext.h"
 
 #include <map>

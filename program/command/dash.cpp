@@ -2,9 +2,9 @@
 #include "libvelmora/replay/player.h"
 #include "libvelmora/replay/recordingfile.h"
 #include "program/command/commands.h"
-#include "program/command/dashplay.h"
-#include "program/command/watchcommand.h"
 #include "program/commandline.h"
+#include "program/watch/dashplay.h"
+#include "program/watch/watchcommand.h"
 
 #include <fmt/format.h>
 

@@ -1,7 +1,7 @@
 #include "libvelmora/report/json.h"
+#include "libvelmora/signal/importing/signalimport.h"
 #include "libvelmora/signal/signalfile.h"
 #include "libvelmora/signal/signalhex.h"
-#include "libvelmora/signal/signalimport.h"
 #include "program/command/commands.h"
 #include "program/command/signalsprobe.h"
 #include "program/commandline.h"

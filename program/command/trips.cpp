@@ -1,4 +1,4 @@
-#include "libvelmora/output/triplist.h"
+#include "libvelmora/output/database/triplist.h"
 #include "program/command/commands.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"

@@ -2,11 +2,11 @@
 #include "libvelmora/signal/signalfile.h"
 #include "program/command/commands.h"
 #include "program/command/lastresort.h"
-#include "program/command/watchcommand.h"
-#include "program/command/watchrun.h"
 #include "program/commandline.h"
 #include "program/terminal/interrupt.h"
 #include "program/terminal/output.h"
+#include "program/watch/watchcommand.h"
+#include "program/watch/watchrun.h"
 
 #include <velmora/error.h>
 

@@ -2,8 +2,8 @@
 
 #include "program/terminal/keyinput.h"
 #include "program/view/framestyle.h"
-#include "program/view/livetable.h"
-#include "program/view/sensorpicker.h"
+#include "program/view/live/livetable.h"
+#include "program/view/live/sensorpicker.h"
 
 #include <optional>
 #include <string>

@@ -5,8 +5,8 @@
 #include "program/command/commandsession.h"
 #include "program/live/livefeed.h"
 #include "program/live/liveoptions.h"
-#include "program/view/livetable.h"
-#include "program/view/sensorpicker.h"
+#include "program/view/live/livetable.h"
+#include "program/view/live/sensorpicker.h"
 
 #include <memory>
 #include <string>

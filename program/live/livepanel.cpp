@@ -1,8 +1,8 @@
 #include "program/live/livepanel.h"
 
-#include "program/view/livebig.h"
-#include "program/view/livehelp.h"
-#include "program/view/livescreen.h"
+#include "program/view/live/livebig.h"
+#include "program/view/live/livehelp.h"
+#include "program/view/live/livescreen.h"
 
 #include <velmora/error.h>
 

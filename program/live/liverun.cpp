@@ -5,7 +5,7 @@
 #include "libvelmora/uds/vehiclevin.h"
 #include "libvelmora/vehicle/vehiclekey.h"
 #include "program/terminal/output.h"
-#include "program/view/livelines.h"
+#include "program/view/live/livelines.h"
 #include "program/view/style.h"
 #include "program/view/unitpairs.h"
 

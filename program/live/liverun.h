@@ -9,8 +9,8 @@
 #include "program/live/liverecord.h"
 #include "program/live/performancepage.h"
 #include "program/terminal/terminal.h"
-#include "program/view/livecsv.h"
-#include "program/view/livetable.h"
+#include "program/view/live/livecsv.h"
+#include "program/view/live/livetable.h"
 
 #include <memory>
 #include <optional>

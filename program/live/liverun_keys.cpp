@@ -2,8 +2,8 @@
 #include "program/live/liverun.h"
 #include "program/live/userfiles.h"
 #include "program/terminal/output.h"
-#include "program/view/livelines.h"
-#include "program/view/livescreen.h"
+#include "program/view/live/livelines.h"
+#include "program/view/live/livescreen.h"
 #include "program/view/ratetext.h"
 
 #include <obd/ivelmorasettings.h>

@@ -9,9 +9,9 @@
 #include "program/terminal/interrupt.h"
 #include "program/terminal/output.h"
 #include "program/terminal/terminal.h"
-#include "program/view/livelines.h"
+#include "program/view/live/livelines.h"
+#include "program/view/live/timebar.h"
 #include "program/view/style.h"
-#include "program/view/timebar.h"
 
 #include <velmora/error.h>
 

@@ -1,7 +1,7 @@
 #pragma once
 
 #include "libvelmora/replay/recording.h"
-#include "program/view/livetable.h"
+#include "program/view/live/livetable.h"
 
 #include <cstddef>
 #include <vector>

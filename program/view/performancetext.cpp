@@ -1,7 +1,7 @@
 #include "program/view/performancetext.h"
 
 #include "libvelmora/text/text.h"
-#include "program/view/bigdigits.h"
+#include "program/view/live/bigdigits.h"
 #include "program/view/unitpairs.h"
 
 #include <fmt/format.h>

@@ -5,7 +5,7 @@
 #include "libobd/powertrain/quantities.h"
 #include "libvelmora/read/sensorchoice.h"
 #include "libvelmora/read/sensornames.h"
-#include "program/view/livelines.h"
+#include "program/view/live/livelines.h"
 #include "simulator/simulation.h"
 #include "tests/support/dispatchloop.h"
 #include "tests/support/hexbytes.h"

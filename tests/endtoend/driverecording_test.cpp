@@ -2,7 +2,7 @@
 // back as a spreadsheet would, and held against the drive model.
 
 #include "libobd/powertrain/torque.h"
-#include "program/view/livecsv.h"
+#include "program/view/live/livecsv.h"
 #include "simulator/car/vehiclelibrary.h"
 #include "simulator/simulation.h"
 #include "tests/endtoend/driveclock.h"

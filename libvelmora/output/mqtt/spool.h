@@ -2,7 +2,7 @@
 
 #include "libvelmora/output/ballast.h"
 #include "libvelmora/output/clockkeeper.h"
-#include "libvelmora/output/database.h"
+#include "libvelmora/output/database/database.h"
 
 #include <cstdint>
 #include <optional>

@@ -1,12 +1,12 @@
 #include "libvelmora/output/opening/outputfactory.h"
 
 #include "libvelmora/output/csvoutput.h"
+#include "libvelmora/output/database/sqliteoutput.h"
 #include "libvelmora/output/holdingoutput.h"
 #include "libvelmora/output/influxoutput.h"
 #include "libvelmora/output/mqtt/mqttoutput.h"
 #include "libvelmora/output/ndjsonoutput.h"
 #include "libvelmora/output/prometheusoutput.h"
-#include "libvelmora/output/sqliteoutput.h"
 
 #include <velmora/error.h>
 

@@ -1,6 +1,6 @@
+#include "libvelmora/output/database/sqliteoutput.h"
 #include "libvelmora/output/holdingoutput.h"
 #include "libvelmora/output/opening/outputfactory.h"
-#include "libvelmora/output/sqliteoutput.h"
 #include "tests/support/records.h"
 #include "tests/support/temporaryfolder.h"
 

@@ -1,4 +1,4 @@
-#include "libvelmora/output/sqliteoutput.h"
+#include "libvelmora/output/database/sqliteoutput.h"
 #include "tests/support/records.h"
 #include "tests/support/smalldisk.h"
 #include "tests/support/temporaryfolder.h"

@@ -1,4 +1,4 @@
-#include "libvelmora/output/sqliteoutput.h"
+#include "libvelmora/output/database/sqliteoutput.h"
 #include "libvelmora/replay/player.h"
 #include "libvelmora/replay/recordingfile.h"
 

@@ -1,6 +1,6 @@
-#include "libvelmora/signal/csvtable.h"
+#include "libvelmora/signal/importing/csvtable.h"
+#include "libvelmora/signal/importing/signalimport.h"
 #include "libvelmora/signal/signalfile.h"
-#include "libvelmora/signal/signalimport.h"
 
 #include <velmora/error.h>
 

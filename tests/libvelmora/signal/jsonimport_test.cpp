@@ -1,6 +1,6 @@
+#include "libvelmora/signal/importing/signalimport.h"
+#include "libvelmora/signal/importing/wicanformula.h"
 #include "libvelmora/signal/signalfile.h"
-#include "libvelmora/signal/signalimport.h"
-#include "libvelmora/signal/wicanformula.h"
 
 #include <velmora/error.h>
 

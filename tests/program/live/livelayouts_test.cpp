@@ -1,4 +1,4 @@
-#include "libvelmora/output/database.h"
+#include "libvelmora/output/database/database.h"
 #include "program/live/livelayouts.h"
 #include "program/live/liverecord.h"
 #include "program/live/userfiles.h"

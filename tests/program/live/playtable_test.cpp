@@ -1,6 +1,6 @@
 #include "libvelmora/replay/recordingfile.h"
 #include "program/live/playtable.h"
-#include "program/view/timebar.h"
+#include "program/view/live/timebar.h"
 
 #include <gtest/gtest.h>
 

@@ -11,7 +11,7 @@
 #include "libvelmora/report/readinessreport.h"
 #include "libvelmora/report/routinesreport.h"
 #include "libvelmora/report/vehiclereport.h"
-#include "program/view/livelines.h"
+#include "program/view/live/livelines.h"
 #include "program/view/trafficlog.h"
 #include "tests/support/jsonschema.h"
 

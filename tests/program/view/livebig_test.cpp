@@ -1,6 +1,6 @@
 #include "libvelmora/text/text.h"
-#include "program/view/bigdigits.h"
-#include "program/view/livebig.h"
+#include "program/view/live/bigdigits.h"
+#include "program/view/live/livebig.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>

@@ -1,4 +1,4 @@
-#include "program/view/livetable.h"
+#include "program/view/live/livetable.h"
 #include "tests/program/view/liveparameter.h"
 
 #include <gtest/gtest.h>

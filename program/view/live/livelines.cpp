@@ -1,0 +1,68 @@
+#include "program/view/live/livelines.h"
+
+#include "libvelmora/report/json.h"
+
+#include <obd/parameteridentifier.h>
+
+#include <fmt/format.h>
+
+#include <ctime>
+
+namespace velmora::cli {
+
+namespace {
+
+// A number with the decimals that the sensor has, a text, or null.
+Json toJson(std::string const& text, bool numeric)
+{
+    if (text.empty()) {
+        return nullptr;
+    }
+    if (!numeric) {
+        return text;
+    }
+    return Json::parse(text, nullptr, false).is_number() ? Json::parse(text) : Json(nullptr);
+}
+
+} // namespace
+
+std::string isoTime(std::chrono::system_clock::time_point time)
+{
+    auto const ms = std::chrono::duration_cast<std::chrono::milliseconds>(time.time_since_epoch()).count();
+    auto const seconds = static_cast<std::time_t>(ms / 1000);
+    std::tm fields{};
+    ::gmtime_r(&seconds, &fields);
+    return fmt::format("{:04}-{:02}-{:02}T{:02}:{:02}:{:02}.{:03}Z", fields.tm_year + 1900, fields.tm_mon + 1,
+                       fields.tm_mday, fields.tm_hour, fields.tm_min, fields.tm_sec, ms % 1000);
+}
+
+std::string toLine(LiveRow const& row)
+{
+    if (row.value.empty() || row.unit.empty()) {
+        return fmt::format("{}: {}\n", row.name, orDash(row.value));
+    }
+    return fmt::format("{}: {} {}\n", row.name, row.value, row.unit);
+}
+
+std::string toJsonLine(LiveRow const& row, std::string const& time)
+{
+    Json line = {
+        {"time", time},
+        {"module", fmt::format("{:X}", row.module)},
+        {"pid", fmt::format("{:02X}", static_cast<int>(obd::Uid2Pid(row.uid)))},
+        {"uid", row.uid},
+        {"name", row.name},
+        {"value", toJson(row.value, row.numeric)},
+        {"unit", textOrNull(row.unit)},
+        {"minimum", toJson(row.minimum, row.numeric)},
+        {"mean", toJson(row.mean, row.numeric)},
+        {"maximum", toJson(row.maximum, row.numeric)},
+    };
+    if (!row.sensor.empty()) {
+        line["pid"] = textOrNull(row.request);
+        line["sensor"] = row.sensor;
+    }
+    return line.dump(-1, ' ', false, Json::error_handler_t::replace) + "\n";
+}
+
+} // namespace velmora::cli

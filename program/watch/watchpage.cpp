@@ -1,0 +1,113 @@
+#include "program/watch/watchpage.h"
+
+#include "libvelmora/dash/dashclerk.h"
+#include "libvelmora/dash/dashoutput.h"
+#include "program/terminal/output.h"
+#include "program/terminal/terminal.h"
+#include "program/view/qrtext.h"
+
+#include <fmt/format.h>
+
+#include <algorithm>
+#include <unistd.h>
+
+namespace velmora::cli {
+
+namespace {
+
+// Links stay good when the settings are read again or another vehicle answers.
+std::string const& processToken()
+{
+    static std::string const token = makeToken();
+    return token;
+}
+
+} // namespace
+
+struct WatchPage::Parts
+{
+    std::string vehicle;
+    bool forPage = false;
+    bool linkOnOutput = false; // standard output holds nothing else
+    std::shared_ptr<DashDesk> desk = std::make_shared<DashDesk>();
+
+    void tellLink(std::string const& link, std::string const& remark) const
+    {
+        if (linkOnOutput) {
+            fmt::print("{}\n", link);
+            flushOutput();
+        } else {
+            tell("The page: " + link + "\n");
+        }
+        if (!remark.empty()) {
+            tell(remark + "\n");
+        }
+        if (forPage) {
+            tell(qrForTerminal(link, STDERR_FILENO));
+        }
+    }
+};
+
+struct WatchPage::Service
+{
+    DashClerk clerk;
+};
+
+WatchPage::WatchPage(std::vector<OutputAddress> const& outputs, std::string vehicle, bool forPage)
+{
+    if (std::ranges::any_of(outputs, is)) {
+        m_parts = std::make_shared<Parts>();
+        m_parts->vehicle = std::move(vehicle);
+        m_parts->forPage = forPage;
+        m_parts->linkOnOutput =
+            forPage && std::ranges::none_of(outputs, [](OutputAddress const& each) { return each.target == "-"; });
+    }
+}
+
+WatchPage::~WatchPage() = default;
+
+SessionCarOptions WatchPage::withTaps(SessionCarOptions options) const
+{
+    if (m_parts != nullptr) {
+        std::shared_ptr<DashDesk> const desk = m_parts->desk;
+        options.onReading = [desk](Reading const& reading) { desk->tell(reading); };
+        options.onTraffic = [desk](bool sent, std::string_view text) {
+            desk->tell(DashLine{std::chrono::system_clock::now(), sent, std::string(text)});
+        };
+    }
+    return options;
+}
+
+std::unique_ptr<IOutput> WatchPage::makeOutput(OutputAddress const& address, HealthSource health,
+                                               std::filesystem::path const& settings) const
+{
+    DashContext context;
+    context.desk = m_parts->desk;
+    context.health = std::move(health);
+    context.layouts = DashLayouts::besides(settings);
+    context.token = processToken();
+    context.mustListen = m_parts->forPage;
+    context.onLink = [parts = m_parts](std::string const& link, std::string const& remark) {
+        parts->tellLink(link, remark);
+    };
+    return std::make_unique<DashOutput>(address, std::move(context));
+}
+
+void WatchPage::serve(SessionCar& car, WatchEngine& engine, WatchEngine::Sink const& sink)
+{
+    if (m_parts == nullptr) {
+        return;
+    }
+    if (m_service == nullptr) {
+        m_service = std::make_unique<Service>(Service{DashClerk(car, *m_parts->desk, m_parts->vehicle)});
+    }
+    DashClerk::Outcome const outcome = m_service->clerk.serve();
+    if (outcome.sensors) {
+        sink(car.sensors());
+    }
+    if (outcome.cleared) {
+        engine.lookAtCodesSoon();
+    }
+}
+
+} // namespace velmora::cli
