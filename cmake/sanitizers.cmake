@@ -16,11 +16,11 @@ if(VELMORA_FUZZ)
     add_compile_options(-fsanitize=fuzzer-no-link)
 endif()
 
-# The builds that run the tests under a sanitizer are made whole each time, and the files of a target together compile in
-# a third to a half of the time that they take one by one. A name in an anonymous namespace must therefore be the only
-# one of its kind in its target. That a local name hides one of another file means nothing there.
+# The builds under a sanitizer are made whole each time, and the files of a target together compile in a third to a half
+# of the time that they take one by one. A name in an anonymous namespace must therefore be the only one of its kind in
+# its target. That a local name hides one of another file means nothing there.
 function(velmora_compile_together target)
-    if(VELMORA_SANITIZE AND NOT VELMORA_FUZZ)
+    if(VELMORA_SANITIZE)
         set_target_properties(${target} PROPERTIES UNITY_BUILD ON UNITY_BUILD_BATCH_SIZE 16)
     endif()
 endfunction()
