@@ -1,6 +1,6 @@
 #include "program/globaloptions.h"
 
-#include "libvelmora/text/text.h"
+#include "common/text/text.h"
 
 #include <string_view>
 

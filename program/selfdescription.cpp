@@ -1,10 +1,10 @@
 #include "program/selfdescription.h"
 
+#include "common/text/text.h"
 #include "libvelmora/port/serialportlist.h"
 #include "libvelmora/read/catalogueselection.h"
 #include "libvelmora/read/sensornames.h"
 #include "libvelmora/session/libraryuse.h"
-#include "libvelmora/text/text.h"
 #include "program/terminal/output.h"
 #include "simulator/simulation.h"
 #include "tools/manual/completion.h"

@@ -1,8 +1,8 @@
 #include "program/command/codesuds.h"
 
+#include "common/text/layout.h"
 #include "libvelmora/read/makerreader.h"
 #include "libvelmora/report/codereport.h"
-#include "libvelmora/report/json.h"
 #include "libvelmora/report/troublecode.h"
 #include "libvelmora/uds/failuretype.h"
 #include "libvelmora/uds/kwpcodes.h"
@@ -11,8 +11,9 @@
 #include "libvelmora/uds/vehiclevin.h"
 #include "program/command/commandsession.h"
 #include "program/terminal/output.h"
-#include "program/view/layout.h"
+#include "program/view/json.h"
 #include "program/view/printtext.h"
+#include "program/view/style.h"
 
 #include <obd/troublecodecatalogue.h>
 #include <velmora/error.h>
@@ -56,8 +57,8 @@ std::vector<AskedModule> modulesOf(CommandSession& session)
     return modules;
 }
 
-// Texts are of codes that are written as the standard has it; a maker's own numbering means something else, as far as
-// the standard does not settle the code's meaning.
+// Texts are of codes that are written as the standard has it; a maker's own numbering means something else, as far
+// as the standard does not settle the code's meaning.
 std::string meaningOf(UdsCodeReport const& report, UdsCode const& code, MakerChoice const& maker)
 {
     CodeReport all;

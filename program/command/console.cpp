@@ -1,11 +1,11 @@
-#include "libvelmora/report/json.h"
-#include "libvelmora/text/text.h"
+#include "common/text/text.h"
 #include "program/command/commands.h"
 #include "program/command/commandsession.h"
 #include "program/commandline.h"
 #include "program/terminal/linereader.h"
 #include "program/terminal/output.h"
 #include "program/terminal/promptreader.h"
+#include "program/view/json.h"
 
 #include <obd/idataconnection.h>
 #include <velmora/error.h>

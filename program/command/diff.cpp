@@ -5,6 +5,7 @@
 #include "program/commandline.h"
 #include "program/view/historytext.h"
 #include "program/view/printtext.h"
+#include "program/view/style.h"
 
 #include <velmora/error.h>
 

@@ -1,11 +1,11 @@
+#include "common/text/text.h"
 #include "libvelmora/read/catalogueselection.h"
-#include "libvelmora/report/json.h"
 #include "libvelmora/report/troublecode.h"
 #include "libvelmora/session/libraryuse.h"
-#include "libvelmora/text/text.h"
 #include "program/command/commands.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
+#include "program/view/json.h"
 #include "program/view/printtext.h"
 #include "program/view/reporttext.h"
 

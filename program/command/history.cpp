@@ -1,14 +1,14 @@
 #include "libvelmora/history/history.h"
 
+#include "common/text/layout.h"
+#include "common/text/text.h"
 #include "libvelmora/history/scanjson.h"
 #include "libvelmora/record/checkedfile.h"
-#include "libvelmora/text/text.h"
 #include "program/command/commands.h"
 #include "program/command/confirm.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
 #include "program/view/historytext.h"
-#include "program/view/layout.h"
 #include "program/view/printtext.h"
 #include "program/view/reporttext.h"
 

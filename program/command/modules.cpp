@@ -1,4 +1,4 @@
-#include "libvelmora/report/json.h"
+#include "common/text/layout.h"
 #include "libvelmora/uds/identification.h"
 #include "libvelmora/uds/moduleaddress.h"
 #include "libvelmora/uds/moduleidentity.h"
@@ -10,8 +10,9 @@
 #include "program/commandline.h"
 #include "program/terminal/output.h"
 #include "program/terminal/promptreader.h"
-#include "program/view/layout.h"
+#include "program/view/json.h"
 #include "program/view/printtext.h"
+#include "program/view/style.h"
 
 #include <velmora/error.h>
 
@@ -71,7 +72,8 @@ std::string modulesText(std::vector<FoundModule> const& modules, GlobalOptions c
     return text;
 }
 
-// Before CAN, modules beyond those that the connection has started each need a start of their own, which would end it.
+// Before CAN, modules beyond those that the connection has started each need a start of their own, which would end
+// it.
 std::vector<FoundModule> modulesOfConnection(CommandSession& session)
 {
     std::vector<FoundModule> modules;

@@ -2,11 +2,11 @@
 #include "libvelmora/port/bluetooth/pairing.h"
 #include "libvelmora/port/portaddress.h"
 #include "libvelmora/port/serialportlist.h"
-#include "libvelmora/report/json.h"
 #include "program/command/commands.h"
 #include "program/commandline.h"
 #include "program/terminal/interrupt.h"
 #include "program/terminal/output.h"
+#include "program/view/json.h"
 #include "program/view/printtext.h"
 
 #include <velmora/error.h>

@@ -1,12 +1,13 @@
+#include "common/text/layout.h"
+#include "common/text/text.h"
 #include "libvelmora/read/routinereader.h"
-#include "libvelmora/text/text.h"
 #include "program/command/commands.h"
 #include "program/command/commandsession.h"
 #include "program/command/confirm.h"
 #include "program/command/modulecommand.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
-#include "program/view/layout.h"
+#include "program/view/style.h"
 
 #include <algorithm>
 

@@ -1,16 +1,17 @@
+#include "common/text/layout.h"
+#include "common/text/text.h"
 #include "libvelmora/read/oxygencurrent.h"
 #include "libvelmora/read/topicanswer.h"
-#include "libvelmora/report/json.h"
 #include "libvelmora/report/unitlabel.h"
-#include "libvelmora/text/text.h"
 #include "libvelmora/vehicle/pidtitles.h"
 #include "libvelmora/vehicle/units.h"
 #include "program/command/commands.h"
 #include "program/command/commandsession.h"
 #include "program/command/sensoroffers.h"
 #include "program/commandline.h"
-#include "program/view/layout.h"
+#include "program/view/json.h"
 #include "program/view/printtext.h"
+#include "program/view/style.h"
 
 #include <obd/iecu.h>
 #include <obd/sensorpids.h>

@@ -1,12 +1,13 @@
+#include "common/text/layout.h"
 #include "libvelmora/read/sensorlimits.h"
-#include "libvelmora/report/json.h"
 #include "libvelmora/session/settingsstore.h"
 #include "libvelmora/session/vehiclesettings.h"
 #include "program/command/commands.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
-#include "program/view/layout.h"
+#include "program/view/json.h"
 #include "program/view/printtext.h"
+#include "program/view/style.h"
 
 #include <velmora/error.h>
 

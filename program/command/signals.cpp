@@ -1,4 +1,4 @@
-#include "libvelmora/report/json.h"
+#include "common/text/layout.h"
 #include "libvelmora/signal/importing/signalimport.h"
 #include "libvelmora/signal/signalfile.h"
 #include "libvelmora/signal/signalhex.h"
@@ -6,8 +6,9 @@
 #include "program/command/signalsprobe.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
-#include "program/view/layout.h"
+#include "program/view/json.h"
 #include "program/view/printtext.h"
+#include "program/view/style.h"
 
 #include <velmora/error.h>
 

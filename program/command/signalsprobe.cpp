@@ -1,10 +1,10 @@
 #include "program/command/signalsprobe.h"
 
+#include "common/text/layout.h"
+#include "common/text/text.h"
 #include "libvelmora/record/checkedfile.h"
-#include "libvelmora/report/json.h"
 #include "libvelmora/signal/signalfile.h"
 #include "libvelmora/signal/signalhex.h"
-#include "libvelmora/text/text.h"
 #include "libvelmora/uds/identification.h"
 #include "libvelmora/uds/identifierprobe.h"
 #include "libvelmora/uds/refusalcode.h"
@@ -12,8 +12,9 @@
 #include "program/command/commandsession.h"
 #include "program/terminal/output.h"
 #include "program/terminal/promptreader.h"
-#include "program/view/layout.h"
+#include "program/view/json.h"
 #include "program/view/printtext.h"
+#include "program/view/style.h"
 
 #include <velmora/error.h>
 

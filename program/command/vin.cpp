@@ -3,6 +3,7 @@
 #include "program/commandline.h"
 #include "program/terminal/output.h"
 #include "program/view/printtext.h"
+#include "program/view/style.h"
 #include "program/view/vintext.h"
 
 #include <fmt/format.h>

@@ -1,7 +1,7 @@
 #include "program/live/livelayouts.h"
 
-#include "libvelmora/report/json.h"
 #include "libvelmora/session/settingsstore.h"
+#include "program/view/json.h"
 
 #include <velmora/error.h>
 

@@ -1,10 +1,10 @@
 #include "program/live/playrun.h"
 
+#include "common/text/text.h"
 #include "libvelmora/output/valuetext.h"
 #include "libvelmora/read/sensorlimits.h"
 #include "libvelmora/replay/recordingfile.h"
 #include "libvelmora/session/settingsstore.h"
-#include "libvelmora/text/text.h"
 #include "program/live/livepanel.h"
 #include "program/terminal/interrupt.h"
 #include "program/terminal/output.h"

@@ -1,5 +1,5 @@
+#include "common/text/layout.h"
 #include "libvelmora/report/texts/plaintexts.h"
-#include "program/view/layout.h"
 #include "program/view/reporttext.h"
 
 #include <fmt/format.h>

@@ -1,8 +1,8 @@
+#include "common/text/layout.h"
 #include "libvelmora/report/texts/findingtexts.h"
 #include "libvelmora/report/texts/inspectiontexts.h"
 #include "libvelmora/report/texts/labels.h"
 #include "libvelmora/report/texts/plaintexts.h"
-#include "program/view/layout.h"
 #include "program/view/reporttext.h"
 
 #include <fmt/format.h>

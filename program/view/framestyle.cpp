@@ -1,6 +1,6 @@
 #include "program/view/framestyle.h"
 
-#include "libvelmora/text/text.h"
+#include "common/text/text.h"
 
 #include <fmt/format.h>
 

@@ -1,9 +1,9 @@
 #include "program/view/historytext.h"
 
+#include "common/text/layout.h"
 #include "libvelmora/history/scanjson.h"
 #include "libvelmora/report/texts/changetexts.h"
 #include "libvelmora/report/texts/plaintexts.h"
-#include "program/view/layout.h"
 
 #include <fmt/format.h>
 

@@ -1,8 +1,8 @@
 #include "program/view/printtext.h"
 
+#include "common/text/layout.h"
 #include "program/terminal/output.h"
 #include "program/terminal/terminal.h"
-#include "program/view/layout.h"
 
 #include <fmt/format.h>
 

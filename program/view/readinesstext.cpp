@@ -1,6 +1,6 @@
+#include "common/text/layout.h"
 #include "libvelmora/report/texts/labels.h"
 #include "libvelmora/report/texts/plaintexts.h"
-#include "program/view/layout.h"
 #include "program/view/reporttext.h"
 
 #include <fmt/format.h>

@@ -1,9 +1,9 @@
 #include "program/view/vintext.h"
 
+#include "common/text/layout.h"
 #include "libvelmora/report/texts/labels.h"
 #include "libvelmora/report/texts/plaintexts.h"
 #include "libvelmora/report/vinreport.h"
-#include "program/view/layout.h"
 
 #include <fmt/format.h>
 

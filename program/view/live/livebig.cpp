@@ -1,6 +1,6 @@
 #include "program/view/live/livebig.h"
 
-#include "libvelmora/text/text.h"
+#include "common/text/text.h"
 #include "program/view/live/bigdigits.h"
 #include "program/view/live/trendline.h"
 

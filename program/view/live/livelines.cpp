@@ -1,6 +1,6 @@
 #include "program/view/live/livelines.h"
 
-#include "libvelmora/report/json.h"
+#include "program/view/json.h"
 
 #include <obd/parameteridentifier.h>
 

@@ -1,6 +1,6 @@
 #include "program/view/live/livescreen.h"
 
-#include "libvelmora/text/text.h"
+#include "common/text/text.h"
 #include "program/view/live/trendline.h"
 
 #include <fmt/format.h>

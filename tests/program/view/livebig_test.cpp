@@ -1,4 +1,4 @@
-#include "libvelmora/text/text.h"
+#include "common/text/text.h"
 #include "program/view/live/bigdigits.h"
 #include "program/view/live/livebig.h"
 

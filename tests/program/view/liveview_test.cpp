@@ -1,4 +1,4 @@
-#include "libvelmora/text/text.h"
+#include "common/text/text.h"
 #include "program/view/live/livecsv.h"
 #include "program/view/live/livehelp.h"
 #include "program/view/live/livelines.h"

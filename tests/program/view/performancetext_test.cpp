@@ -1,4 +1,4 @@
-#include "libvelmora/text/text.h"
+#include "common/text/text.h"
 #include "program/view/performancetext.h"
 
 #include <gmock/gmock.h>

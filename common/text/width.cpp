@@ -1,8 +1,8 @@
-#include "libvelmora/text/text.h"
+#include "common/text/text.h"
 
 #include <algorithm>
-#include <locale.h>
-#include <wchar.h>
+#include <clocale>
+#include <cwchar>
 
 namespace velmora {
 

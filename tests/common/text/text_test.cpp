@@ -1,4 +1,4 @@
-#include "libvelmora/text/text.h"
+#include "common/text/text.h"
 
 #include <gtest/gtest.h>
 

@@ -1,15 +1,13 @@
-#include "program/view/layout.h"
+#include "common/text/layout.h"
 
-#include "libvelmora/text/text.h"
-
-#include <fmt/format.h>
+#include "common/text/text.h"
 
 #include <algorithm>
 #include <numeric>
 #include <sstream>
 #include <string_view>
 
-namespace velmora::cli {
+namespace velmora {
 
 namespace {
 
@@ -182,7 +180,9 @@ std::string foldedLine(std::string_view line, std::size_t columns)
 
 std::string labelledLine(std::string const& label, std::string const& value)
 {
-    return fmt::format("  {:<14} {}\n", label, value.empty() ? "-" : value);
+    constexpr std::size_t labelColumns = 14;
+    std::string const blanks(labelColumns - std::min(labelColumns, displayWidth(label)), ' ');
+    return "  " + label + blanks + " " + (value.empty() ? "-" : value) + "\n";
 }
 
 std::string drawColumns(std::vector<std::vector<Cell>> const& rows, std::string const& indent, Style const& style)
@@ -230,7 +230,7 @@ std::string folded(std::string const& text, std::size_t columns)
 
 std::string counted(std::size_t count, std::string const& noun)
 {
-    return fmt::format("{} {}{}", count, noun, count == 1 ? "" : "s");
+    return std::to_string(count) + " " + noun + (count == 1 ? "" : "s");
 }
 
-} // namespace velmora::cli
+} // namespace velmora

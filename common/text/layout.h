@@ -1,11 +1,11 @@
 #pragma once
 
-#include "program/view/style.h"
+#include "common/text/style.h"
 
 #include <string>
 #include <vector>
 
-namespace velmora::cli {
+namespace velmora {
 
 // One line under the heading of a control module: label and value in columns. A value that was not told is "-".
 std::string labelledLine(std::string const& label, std::string const& value);
@@ -32,4 +32,4 @@ std::string folded(std::string const& text, std::size_t columns);
 // "1 code", "2 codes", "0 codes".
 std::string counted(std::size_t count, std::string const& noun);
 
-} // namespace velmora::cli
+} // namespace velmora

@@ -1,11 +1,10 @@
-#include "program/view/layout.h"
+#include "common/text/layout.h"
 
 #include <gtest/gtest.h>
 
 namespace {
 
 using namespace velmora;
-using namespace velmora::cli;
 
 TEST(Layout, LabelsStandInAColumn)
 {
