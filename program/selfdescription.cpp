@@ -1,16 +1,14 @@
 #include "program/selfdescription.h"
 
 #include "common/text/text.h"
-#include "libvelmora/port/serialportlist.h"
-#include "libvelmora/read/catalogueselection.h"
 #include "libvelmora/read/sensornames.h"
-#include "libvelmora/session/libraryuse.h"
 #include "program/terminal/output.h"
 #include "simulator/simulation.h"
 #include "tools/manual/completion.h"
 #include "tools/manual/manualpage.h"
 
-#include <obd/troublecodecatalogue.h>
+#include <velmora/catalogue.h>
+#include <velmora/ports.h>
 #include <velmora/version.h>
 
 #include <fmt/format.h>
@@ -28,7 +26,7 @@ using manual::Completion;
 Completion ports(std::string const& /*begun*/)
 {
     Completion completion;
-    for (SerialPortEntry const& port : listSerialPorts()) {
+    for (SerialPortEntry const& port : serialPorts()) {
         completion.candidates.push_back({port.device, port.description});
     }
     completion.candidates.push_back({"auto", "Look for an adapter"});
@@ -67,13 +65,12 @@ Completion troubleCodes(std::string const& begun)
     if (begun.size() < 3) {
         return completion;
     }
-    LibraryUse const catalogue{std::string()};
     std::string const wanted = toUpper(begun);
     std::string last;
-    for (auto const& row : obd::TroubleCodeCatalogue::getRows()) {
-        if (row->code.starts_with(wanted) && row->code != last) {
-            completion.candidates.push_back({row->code, row->description});
-            last = row->code;
+    for (CatalogueRow const& row : findRows({wanted})) {
+        if (row.code.starts_with(wanted) && row.code != last) {
+            completion.candidates.push_back({row.code, row.text});
+            last = row.code;
         }
     }
     return completion;

@@ -1,16 +1,11 @@
 #pragma once
 
+#include <velmora/ports.h>
+
 #include <filesystem>
-#include <string>
 #include <vector>
 
 namespace velmora {
-
-struct SerialPortEntry
-{
-    std::string device;      // "/dev/ttyUSB0"
-    std::string description; // what the system tells of it, such as the USB product; may be empty
-};
 
 // Serial lines that an adapter may hang on: USB serial converters, USB modems, bound Bluetooth ports. sysRoot and
 // devRoot are "/sys" and "/dev" but for tests.

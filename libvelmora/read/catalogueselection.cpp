@@ -1,6 +1,9 @@
 #include "libvelmora/read/catalogueselection.h"
 
+#include "libvelmora/session/libraryuse.h"
+
 #include <obd/manufacturer.h>
+#include <obd/troublecodecatalogue.h>
 #include <velmora/error.h>
 
 #include <fmt/format.h>
@@ -94,5 +97,24 @@ CatalogueRows selectWords(CatalogueRows const& rows, std::vector<std::string> co
     });
     return selected;
 }
+
+std::vector<CatalogueRow> findRows(std::vector<std::string> const& words, std::string const& maker)
+{
+    LibraryUse const catalogue{std::string()};
+    CatalogueRows rows = selectWords(obd::TroubleCodeCatalogue::getRows(), words);
+    if (!maker.empty()) {
+        rows = selectMaker(rows, maker);
+    }
+    std::vector<CatalogueRow> found;
+    found.reserve(rows.size());
+    for (auto const& row : rows) {
+        found.push_back({row->manufacturer, row->code, row->system, row->description});
+    }
+    return found;
+}
+
+CatalogueUse::CatalogueUse(std::string const& logFile) : m_use(std::make_unique<LibraryUse>(logFile)) {}
+
+CatalogueUse::~CatalogueUse() = default;
 
 } // namespace velmora

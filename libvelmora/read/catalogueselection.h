@@ -1,6 +1,7 @@
 #pragma once
 
 #include <obd/dtcdatamodel.h>
+#include <velmora/catalogue.h>
 
 #include <memory>
 #include <string>
@@ -9,13 +10,6 @@
 namespace velmora {
 
 using CatalogueRows = std::vector<std::shared_ptr<obd::DtcDataModel>>;
-
-// The makers of the catalogue, as it writes them.
-std::vector<std::string> catalogueMakers();
-
-// The maker's name as the catalogue writes it, from one in any case and without its blanks or hyphens. Throws Error
-// with the list of makers if there is none.
-std::string findMaker(std::string const& name);
 
 // The rows of one maker.
 CatalogueRows selectMaker(CatalogueRows const& rows, std::string const& maker);

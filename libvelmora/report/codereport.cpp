@@ -2,6 +2,8 @@
 
 #include "libvelmora/report/texts/findingtexts.h"
 
+#include <velmora/findings.h>
+
 #include <algorithm>
 
 namespace velmora {

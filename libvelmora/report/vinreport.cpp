@@ -8,7 +8,7 @@ namespace {
 
 char const* standingWord(VinFacts const& facts)
 {
-    return facts.standing == WmiRow::Standing::Listed ? "listed" : "probable";
+    return facts.standing == VinFacts::Standing::Listed ? "listed" : "probable";
 }
 
 char const* checkWord(VinFacts::CheckDigit check)
@@ -35,7 +35,7 @@ Json codeList(VinFacts const& facts)
     if (facts.codes.empty()) {
         return nullptr;
     }
-    return {{"maker", facts.codes}, {"standing", facts.basis == WmiRow::Basis::Fact ? "fact" : "guess"}};
+    return {{"maker", facts.codes}, {"standing", facts.basis == VinFacts::CodesBasis::Fact ? "fact" : "guess"}};
 }
 
 } // namespace
@@ -45,7 +45,7 @@ std::string makerText(VinFacts const& facts)
     if (facts.smallMaker) {
         return texts::smallMaker + (facts.country.empty() ? "" : texts::registeredIn + facts.country);
     }
-    bool const sure = facts.maker.empty() || facts.standing == WmiRow::Standing::Listed;
+    bool const sure = facts.maker.empty() || facts.standing == VinFacts::Standing::Listed;
     return sure ? facts.maker : texts::probably + facts.maker;
 }
 

@@ -1,12 +1,14 @@
 #include "libvelmora/vehicle/vin.h"
 
 #include "libvelmora/text/text.h"
+#include "libvelmora/vehicle/wmitable.h"
 
 #include <velmora/error.h>
 
 #include <fmt/format.h>
 
 #include <algorithm>
+#include <chrono>
 #include <string_view>
 
 namespace velmora {
@@ -155,6 +157,13 @@ VinFacts decodeVin(std::string const& vin, int thisYear)
     decodeYear(facts, thisYear);
     judgeCheckDigit(facts);
     return facts;
+}
+
+VinFacts explainVin(std::string const& text)
+{
+    using namespace std::chrono;
+    auto const thisYear = year_month_day(floor<days>(system_clock::now())).year();
+    return decodeVin(parseVin(text), static_cast<int>(thisYear));
 }
 
 } // namespace velmora

@@ -7,8 +7,8 @@ namespace velmora {
 
 namespace {
 
-using enum WmiRow::Basis;
-using enum WmiRow::Standing;
+using enum VinFacts::CodesBasis;
+using enum VinFacts::Standing;
 using enum WmiRow::Make;
 
 constexpr WmiRow wmiRows[] = {

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <velmora/vin.h>
+
 #include <cstdint>
 #include <string_view>
 
@@ -8,19 +10,8 @@ namespace velmora {
 // What the first three characters of a vehicle identification number stand for.
 struct WmiRow
 {
-    // How the maker's codes are read with a list of the trouble code catalogue.
-    enum class Basis : std::uint8_t
-    {
-        None,  // the catalogue has no list for this maker
-        Guess, // the list of a related maker or engine
-        Fact,  // the maker's own list, or that of the same control modules
-    };
-
-    enum class Standing : std::uint8_t
-    {
-        Probable,
-        Listed, // in a regulator's list, or in several public ones
-    };
+    using Basis = VinFacts::CodesBasis;
+    using Standing = VinFacts::Standing;
 
     enum class Make : std::uint8_t
     {

@@ -1,20 +1,15 @@
-#include "common/text/text.h"
-#include "libvelmora/read/catalogueselection.h"
-#include "libvelmora/report/troublecode.h"
-#include "libvelmora/session/libraryuse.h"
 #include "program/command/commands.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
 #include "program/view/json.h"
 #include "program/view/printtext.h"
-#include "program/view/reporttext.h"
 
-#include <obd/troublecodecatalogue.h>
+#include <velmora/catalogue.h>
 #include <velmora/error.h>
+#include <velmora/print.h>
 
 #include <fmt/format.h>
 
-#include <algorithm>
 #include <memory>
 
 namespace velmora::cli {
@@ -29,40 +24,22 @@ struct DtcOptions
     bool dump = false;
 };
 
-// A generic meaning holds for every maker's vehicles.
-void keepMaker(std::vector<TroubleCode::Meaning>& meanings, std::string const& maker)
-{
-    std::erase_if(meanings, [&maker](TroubleCode::Meaning const& meaning) {
-        return meaning.maker != maker && meaning.maker != "Generic";
-    });
-    if (meanings.empty()) {
-        meanings.push_back({maker, "Unknown Trouble Code"});
-    }
-}
-
-ExitCode explain(DtcOptions const& options, std::string const& maker, bool json)
+ExitCode explainAll(DtcOptions const& options, std::string const& maker, bool json)
 {
     std::vector<TroubleCode> found;
     std::vector<std::string> wrong;
     for (std::string const& text : options.codes) {
-        auto const models = obd::TroubleCodeCatalogue::getTroubleCodes(toUpper(text));
-        if (models.empty()) {
+        try {
+            found.push_back(explain(text, maker));
+        } catch (Error const&) {
             wrong.push_back("\"" + text + "\"");
-            continue;
-        }
-        for (TroubleCode& code : groupByCode(models)) {
-            if (!maker.empty()) {
-                keepMaker(code.meanings, maker);
-                code.maker = maker;
-            }
-            found.push_back(std::move(code));
         }
     }
     if (json) {
-        fmt::print("{}", printed(toJsonValue(found)));
+        fmt::print("{}", toJson(found));
     } else {
         for (TroubleCode const& code : found) {
-            printText(toText(code, {}, true));
+            printText(toText(code));
         }
     }
     if (!wrong.empty()) {
@@ -75,30 +52,27 @@ ExitCode explain(DtcOptions const& options, std::string const& maker, bool json)
     return ExitCode::Done;
 }
 
-void printJson(CatalogueRows const& rows)
+void printJson(std::vector<CatalogueRow> const& rows)
 {
     Json list = Json::array();
-    for (auto const& row : rows) {
-        list.push_back({{"maker", row->manufacturer}, {"code", row->code}, {"text", row->description}});
+    for (CatalogueRow const& row : rows) {
+        list.push_back({{"maker", row.maker}, {"code", row.code}, {"text", row.text}});
     }
     fmt::print("{}", printed(list));
 }
 
 ExitCode listRows(DtcOptions const& options, std::string const& maker, bool json)
 {
-    CatalogueRows rows = selectWords(obd::TroubleCodeCatalogue::getRows(), options.words);
-    if (!maker.empty()) {
-        rows = selectMaker(rows, maker);
-    }
+    std::vector<CatalogueRow> const rows = findRows(options.words, maker);
     if (json) {
         printJson(rows);
     } else if (options.dump) {
-        for (auto const& row : rows) {
-            fmt::print("{}\t{}\t{}\n", row->manufacturer, row->code, row->description);
+        for (CatalogueRow const& row : rows) {
+            fmt::print("{}\t{}\t{}\n", row.maker, row.code, row.text);
         }
     } else {
-        for (auto const& row : rows) {
-            printText(toText({row->code, row->system, {{row->manufacturer, row->description}}, {}}, {}, true));
+        for (CatalogueRow const& row : rows) {
+            printText(toText(TroubleCode{row.code, row.system, {{row.maker, row.text}}, {}}));
         }
     }
     if (rows.empty()) {
@@ -120,8 +94,8 @@ ExitCode explainCodes(DtcOptions const& options, GlobalOptions const& global)
                     {"velmora dtc P0420 explains a code; velmora dtc --search catalyst finds codes"});
     }
     std::string const maker = options.maker.empty() ? std::string() : findMaker(options.maker);
-    LibraryUse const catalogue(global.logFile);
-    return options.codes.empty() ? listRows(options, maker, global.json) : explain(options, maker, global.json);
+    CatalogueUse const catalogue(global.logFile);
+    return options.codes.empty() ? listRows(options, maker, global.json) : explainAll(options, maker, global.json);
 }
 
 } // namespace

@@ -10,8 +10,9 @@
 #include "program/terminal/output.h"
 #include "program/view/historytext.h"
 #include "program/view/printtext.h"
-#include "program/view/reporttext.h"
+#include "program/view/style.h"
 
+#include <velmora/document.h>
 #include <velmora/error.h>
 
 #include <fmt/format.h>
@@ -62,7 +63,8 @@ ExitCode showScan(HistoryOptions const& options, GlobalOptions const& global)
     if (global.json) {
         fmt::print("{}", report.toJson());
     } else {
-        printText(historyText({scan}, outputStyle(global)) + "\n" + toText(report, outputStyle(global)));
+        printText(historyText({scan}, outputStyle(global)) + "\n" +
+                  toText(report, DocumentOptions(), textStyle(global)));
     }
     return ExitCode::Done;
 }

@@ -10,7 +10,9 @@
 #include "program/command/commandsession.h"
 #include "program/terminal/output.h"
 #include "program/view/printtext.h"
-#include "program/view/reporttext.h"
+#include "program/view/style.h"
+
+#include <velmora/print.h>
 
 #include <fmt/format.h>
 
@@ -63,8 +65,8 @@ ExitCode udsInfo(GlobalOptions const& options)
     for (std::size_t i = 0; i < modules.size(); ++i) {
         Identifiers const identifiers = readIdentifiers(session, modules[i].id);
         document[i]["identifiers"] = identifiersJson(identifiers);
-        text += (i == 0 ? "" : "\n") + moduleHeading(modules[i].id, modules[i].name) + "\n" +
-                toText(modules[i].report, outputStyle(options)) + identifiersText(identifiers);
+        text +=
+            (i == 0 ? "" : "\n") + toText(std::vector{modules[i]}, textStyle(options)) + identifiersText(identifiers);
     }
     session.checkAdapter();
     if (options.json) {

@@ -1,6 +1,6 @@
 #include "program/command/makeoption.h"
 
-#include "libvelmora/read/catalogueselection.h"
+#include <velmora/catalogue.h>
 
 namespace velmora::cli {
 

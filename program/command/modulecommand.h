@@ -6,10 +6,11 @@
 #include "program/exitcode.h"
 #include "program/terminal/output.h"
 #include "program/view/printtext.h"
-#include "program/view/reporttext.h"
+#include "program/view/style.h"
 
 #include <obd/iecu.h>
 #include <velmora/error.h>
+#include <velmora/print.h>
 
 #include <fmt/format.h>
 
@@ -26,7 +27,7 @@ void print(std::vector<ModuleTopic<Report>> const& modules, GlobalOptions const&
     if (options.json) {
         fmt::print("{}", toJson(modules));
     } else {
-        printText(toText(modules, outputStyle(options)));
+        printText(toText(modules, textStyle(options)));
     }
     flushOutput();
 }

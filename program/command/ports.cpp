@@ -1,7 +1,3 @@
-#include "libvelmora/port/bluetooth/adapterlist.h"
-#include "libvelmora/port/bluetooth/pairing.h"
-#include "libvelmora/port/portaddress.h"
-#include "libvelmora/port/serialportlist.h"
 #include "program/command/commands.h"
 #include "program/commandline.h"
 #include "program/terminal/interrupt.h"
@@ -10,6 +6,7 @@
 #include "program/view/printtext.h"
 
 #include <velmora/error.h>
+#include <velmora/ports.h>
 
 #include <CLI/App.hpp>
 #include <fmt/format.h>
@@ -35,13 +32,13 @@ bool interrupted()
 }
 
 // A computer without Bluetooth is no failure, only a remark.
-std::vector<BluetoothEntry> bluetoothAdapters(bool known)
+std::vector<BluetoothEntry> findBluetooth(bool known)
 {
     try {
-        std::vector<BluetoothEntry> entries = listBluetoothAdapters(std::chrono::seconds(0), interrupted);
+        std::vector<BluetoothEntry> entries = bluetoothAdapters(std::chrono::seconds(0), interrupted);
         if (!known) {
             tell(fmt::format("Listening for Bluetooth adapters nearby, {} s ...\n", inquiry.count()));
-            entries = listBluetoothAdapters(inquiry, interrupted);
+            entries = bluetoothAdapters(inquiry, interrupted);
         }
         return entries;
     } catch (Error const& error) {
@@ -78,8 +75,8 @@ Json toJsonValue(BluetoothEntry const& entry)
 
 ExitCode listPorts(PortsOptions const& options, bool json)
 {
-    std::vector<SerialPortEntry> const ports = listSerialPorts();
-    std::vector<BluetoothEntry> const adapters = bluetoothAdapters(options.known);
+    std::vector<SerialPortEntry> const ports = serialPorts();
+    std::vector<BluetoothEntry> const adapters = findBluetooth(options.known);
     if (json) {
         Json list = Json::array();
         for (SerialPortEntry const& port : ports) {
@@ -105,12 +102,8 @@ ExitCode listPorts(PortsOptions const& options, bool json)
 
 ExitCode pair(std::string const& device)
 {
-    std::string const text = device.starts_with("bt://")    ? device.substr(5)
-                             : device.starts_with("ble://") ? device.substr(6)
-                                                            : device;
-    std::string const mac = parseBluetoothMac(text);
-    pairDevice(
-        mac, [](std::string const& line) { tell(line); }, interrupted);
+    std::string const mac = pairBluetooth(
+        device, [](std::string const& line) { tell(line); }, interrupted);
     tell("Paired with " + mac + "\n");
     return ExitCode::Done;
 }

@@ -7,9 +7,10 @@
 #include "program/commandline.h"
 #include "program/terminal/output.h"
 #include "program/view/printtext.h"
-#include "program/view/reporttext.h"
+#include "program/view/style.h"
 
 #include <obd/isensorservice.h>
+#include <velmora/document.h>
 #include <velmora/error.h>
 
 #include <fmt/format.h>
@@ -88,7 +89,7 @@ ExitCode record(RecordOptions const& chosen, GlobalOptions const& options)
     if (options.json) {
         fmt::print("{}", report.toJson());
     } else {
-        printText(toText(report, outputStyle(options)));
+        printText(toText(report, DocumentOptions(), textStyle(options)));
     }
     return ExitCode::Done;
 }

@@ -42,6 +42,16 @@ std::string routineWarning(RoutineChoice const& choice, GlobalOptions const& opt
         wrapped(choice.routine.description, 76, "  ", outputStyle(options)));
 }
 
+void printRun(ModuleTopic<RoutineRun> const& run, GlobalOptions const& options)
+{
+    if (options.json) {
+        fmt::print("{}", toJson(run));
+    } else {
+        printText(toText(run, textStyle(options)));
+    }
+    flushOutput();
+}
+
 ExitCode run(std::string const& text, GlobalOptions const& options)
 {
     unsigned char const id = parseRoutineId(text);
@@ -54,7 +64,7 @@ ExitCode run(std::string const& text, GlobalOptions const& options)
         return ExitCode::Failed;
     }
     RoutineRun const outcome = runRoutine(session, *choice.ecu, choice.routine);
-    print(std::vector<ModuleTopic<RoutineRun>>{{choice.ecu->id(), choice.ecu->name(), outcome}}, options);
+    printRun({choice.ecu->id(), choice.ecu->name(), outcome}, options);
     requireAccepted(outcome);
     return ExitCode::Done;
 }

@@ -1,5 +1,4 @@
 #include "libvelmora/read/vehiclereader.h"
-#include "libvelmora/report/document/reportfile.h"
 #include "program/command/commands.h"
 #include "program/command/commandsession.h"
 #include "program/command/keepscan.h"
@@ -7,16 +6,15 @@
 #include "program/commandline.h"
 #include "program/terminal/output.h"
 #include "program/view/printtext.h"
-#include "program/view/reporttext.h"
+#include "program/view/style.h"
 
+#include <velmora/document.h>
 #include <velmora/error.h>
-#include <velmora/version.h>
+#include <velmora/findings.h>
 
-#include <fmt/chrono.h>
 #include <fmt/format.h>
 
 #include <algorithm>
-#include <ctime>
 
 namespace velmora::cli {
 
@@ -69,29 +67,27 @@ struct ScanOptions
     std::vector<std::string> reports;
     bool maskVin = false;
     bool force = false;
-    InspectionWish inspection;
+    InspectionRule inspection = InspectionRule::None;
+    std::optional<int> modelYear;
     KeepWish keeping;
 };
 
-ReportFacts factsOf(ScanOptions const& chosen, std::string const& port)
+DocumentOptions documentOf(ScanOptions const& chosen, std::string const& port)
 {
-    std::time_t const now = std::time(nullptr);
-    std::tm local{};
-    localtime_r(&now, &local);
-    return {fmt::format("{:%Y-%m-%d %H:%M}", local),
-            port,
-            versionText,
-            chosen.maskVin,
-            local.tm_year + 1900,
-            chosen.inspection,
-            chosen.keeping.vehicle};
+    DocumentOptions document;
+    document.port = port;
+    document.vehicle = chosen.keeping.vehicle;
+    document.maskVin = chosen.maskVin;
+    document.inspection = chosen.inspection;
+    document.modelYear = chosen.modelYear;
+    return document;
 }
 
 // What can be told before minutes are spent with the vehicle.
 void checkReports(ScanOptions const& chosen)
 {
     for (std::string const& path : chosen.reports) {
-        checkReportPath(path, chosen.force);
+        checkDocument(path, chosen.force);
     }
 }
 
@@ -101,45 +97,41 @@ ExitCode scan(ScanOptions& chosen, GlobalOptions const& options)
     bool const keeps = decidesToKeep(chosen.keeping, options);
     CommandSession session(options);
     session.connect();
-    ReportFacts const facts = factsOf(chosen, session.port());
-    VehicleReport const whole = readVehicle(session, chosen.maker);
-    VehicleReport const report = withShownVins(whole, facts);
-    std::optional<InspectionReport> const inspection =
-        facts.inspection.rule == InspectionRule::None ? std::nullopt
-                                                      : std::optional(inspect(report, facts.inspection, facts.year));
+    DocumentOptions const document = documentOf(chosen, session.port());
+    VehicleReport const report = readVehicle(session, chosen.maker);
     for (std::string const& path : chosen.reports) {
-        writeReport(path, report, facts, toText(report, Style(false), inspection), chosen.force);
+        writeDocument(path, report, document, chosen.force);
     }
     if (options.json) {
-        fmt::print("{}", reportJson(report, facts));
+        fmt::print("{}", toJson(report, document));
     } else {
-        printText(toText(report, outputStyle(options), inspection));
+        printText(toText(report, document, textStyle(options)));
     }
     if (keeps) {
         flushOutput();
-        keepScan(whole, chosen.keeping, options);
+        keepScan(report, chosen.keeping, options);
     }
     return chosen.checking ? check(report, session.trouble()) : ExitCode::Done;
 }
 
 // The rules of the USA go by the model year; the others ignore it.
-void addInspectionOptions(CLI::App& command, InspectionWish& wish)
+void addInspectionOptions(CLI::App& command, ScanOptions& chosen)
 {
     command
         .add_option_function<std::string>(
             "--inspection",
-            [&wish](std::string const& text) {
+            [&chosen](std::string const& text) {
                 auto const rule = parseInspectionRule(text);
                 if (!rule) {
                     throw CLI::ValidationError(
                         "\"" + text + "\" is no rule; known are us-epa, us-california, uk-mot, de-au and none");
                 }
-                wish.rule = *rule;
+                chosen.inspection = *rule;
             },
             "What the report suggests for an inspection: us-epa, us-california, uk-mot, de-au or none (none)")
         ->type_name("RULE");
     command
-        .add_option("--model-year", wish.modelYear,
+        .add_option("--model-year", chosen.modelYear,
                     "Model year, for the rules of the USA (by the VIN, where it tells the year for sure)")
         ->type_name("YEAR")
         ->check(CLI::Range(1980, 2100));
@@ -160,7 +152,7 @@ void addScanCommand(CommandLine& commandLine)
         ->type_name("FILE");
     command->add_flag("--mask-vin", chosen->maskVin, "Show the last six characters of the VIN as zeros");
     command->add_flag("--force", chosen->force, "Let --report replace a file");
-    addInspectionOptions(*command, chosen->inspection);
+    addInspectionOptions(*command, *chosen);
     addKeepOptions(*command, chosen->keeping);
 }
 

@@ -1,32 +1,25 @@
-#include "libvelmora/report/vinreport.h"
 #include "program/command/commands.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
 #include "program/view/printtext.h"
 #include "program/view/style.h"
-#include "program/view/vintext.h"
+
+#include <velmora/print.h>
+#include <velmora/vin.h>
 
 #include <fmt/format.h>
-
-#include <chrono>
 
 namespace velmora::cli {
 
 namespace {
 
-int thisYear()
+ExitCode tellOfVin(std::string const& text, GlobalOptions const& options)
 {
-    using namespace std::chrono;
-    return static_cast<int>(year_month_day(floor<days>(system_clock::now())).year());
-}
-
-ExitCode explainVin(std::string const& text, GlobalOptions const& options)
-{
-    VinFacts const facts = decodeVin(parseVin(text), thisYear());
+    VinFacts const facts = explainVin(text);
     if (options.json) {
-        fmt::print("{}", printed(toJsonValue(facts)));
+        fmt::print("{}", toJson(facts));
     } else {
-        printText(toText(facts, outputStyle(options)));
+        printText(toText(facts, textStyle(options)));
     }
     return ExitCode::Done;
 }
@@ -38,7 +31,7 @@ void addVinCommand(CommandLine& commandLine)
     auto const text = std::make_shared<std::string>();
     CLI::App* const command =
         commandLine.addCommand("vin", "Tell what a vehicle identification number says; no vehicle needed",
-                               [text](GlobalOptions const& options) { return explainVin(*text, options); });
+                               [text](GlobalOptions const& options) { return tellOfVin(*text, options); });
     command->add_option("VIN", *text, "The number, in any case, with or without blanks and hyphens")
         ->type_name("")
         ->required();

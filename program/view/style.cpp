@@ -27,4 +27,10 @@ Style outputStyle(GlobalOptions const& options)
                  options.verbose, Terminal::columnsOf(STDOUT_FILENO));
 }
 
+TextStyle textStyle(GlobalOptions const& options)
+{
+    Style const style = outputStyle(options);
+    return {style.isColoured(), style.isDetailed(), style.columns()};
+}
+
 } // namespace velmora::cli

@@ -3,6 +3,8 @@
 #include "common/text/style.h"
 #include "program/globaloptions.h"
 
+#include <velmora/print.h>
+
 namespace velmora::cli {
 
 // Whether to use colours. What the user chose for this run comes before noColor, the wish for none in all programs;
@@ -11,5 +13,7 @@ bool wantsColor(std::optional<ColorMode> mode, bool noColor, bool terminal);
 
 // The style of standard output.
 Style outputStyle(GlobalOptions const& options);
+// The same for texts that the companion makes.
+TextStyle textStyle(GlobalOptions const& options);
 
 } // namespace velmora::cli

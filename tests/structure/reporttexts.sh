@@ -11,7 +11,8 @@ files=(libvelmora/report/finding/{findings,findingparts,inspection}*.cpp
     libvelmora/report/document/{module,reportdocument,summary,finding,html,markdown,limitbar}*.cpp
     libvelmora/report/{vinreport,troublecode,oxygenreport}.cpp
     libvelmora/history/*changes.cpp)
-plain=(program/view/{code,counter,findings,freeze,history,info,monitor,readiness,routine,vehiclereport,vin}text.cpp)
+plain=(libvelmora/report/plain/{code,counter,findings,freeze,info,monitor,readiness,routine,vehiclereport,vin}text.cpp
+    program/view/historytext.cpp)
 [[ ${#files[@]} -gt 10 ]] || { echo "the files are not where they were"; exit 1; }
 perl -ne '
     next if /^\s*#\s*include|^\s*\/\//;
@@ -20,7 +21,7 @@ perl -ne '
     next if /\{" Co[a-z]+ |Closed loop/;
     # Words of the JSON document, and classes.
     next if /"not ready"|"not judged"|"needle/;
-    my $plain = $ARGV =~ m{^program/};
+    my $plain = $ARGV =~ m{^program/|/plain/};
     s/\["\w+"\]//g if $plain;                    # a member
     while (/"((?:[^"\\]|\\.)*)"/g) {
         my ($whole, $literal) = ($1, $1);

@@ -20,8 +20,8 @@ finds() { # finds FILE TEXT
 }
 for text in 'nothing is wrong' 'Findings' '{} codes are stored' '<p>more than a tag</p>'; do
     finds libvelmora/report/document/reportdocument.cpp "$text"
-    finds program/view/codetext.cpp "$text"
+    finds libvelmora/report/plain/codetext.cpp "$text"
 done
 for text in 'ready' '  {:<14} on\n' "{}'s, by the VIN"; do
-    finds program/view/readinesstext.cpp "$text"
+    finds libvelmora/report/plain/readinesstext.cpp "$text"
 done

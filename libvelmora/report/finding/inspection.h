@@ -2,6 +2,8 @@
 
 #include "libvelmora/report/vehiclereport.h"
 
+#include <velmora/document.h>
+
 #include <cstdint>
 #include <optional>
 #include <string>
@@ -9,18 +11,7 @@
 
 namespace velmora {
 
-// Whose rule a report is held against.
-enum class InspectionRule : std::uint8_t
-{
-    None,
-    UsEpa,
-    UsCalifornia,
-    UkMot,
-    DeAu,
-};
-
-// "us-epa" and so on. Nothing for any other text.
-std::optional<InspectionRule> parseInspectionRule(std::string const& text);
+// "us-epa" and so on.
 char const* inspectionKey(InspectionRule rule);
 
 struct InspectionWish

@@ -1,5 +1,7 @@
 #include "libvelmora/report/codereport.h"
-#include "program/view/reporttext.h"
+#include "libvelmora/report/plain/reporttext.h"
+
+#include <velmora/findings.h>
 
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
@@ -7,7 +9,6 @@
 namespace {
 
 using namespace velmora;
-using namespace velmora::cli;
 using Answer = CodeList::Answer;
 
 CodeList listWithCode(CodeKind kind)

@@ -1,12 +1,13 @@
 #include "libvelmora/report/finding/findings.h"
-#include "program/view/reporttext.h"
+#include "libvelmora/report/plain/reporttext.h"
+
+#include <velmora/findings.h>
 
 #include <gtest/gtest.h>
 
 namespace {
 
 using namespace velmora;
-using namespace velmora::cli;
 
 TroubleCode const slow{"P0133", "Powertrain", {{"Generic", "Slow"}, {"Ford", "Slower"}}};
 TroubleCode const lean{"P0171", "Powertrain", {{"Generic", "Lean"}}};

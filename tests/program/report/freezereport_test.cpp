@@ -1,5 +1,5 @@
 #include "libvelmora/report/freezereport.h"
-#include "program/view/reporttext.h"
+#include "libvelmora/report/plain/reporttext.h"
 
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
@@ -7,7 +7,6 @@
 namespace {
 
 using namespace velmora;
-using namespace velmora::cli;
 
 std::vector<ModuleTopic<FreezeReport>> const modules = {
     {0x7E8,

@@ -1,12 +1,11 @@
 #include "libvelmora/report/monitorsreport.h"
-#include "program/view/reporttext.h"
+#include "libvelmora/report/plain/reporttext.h"
 
 #include <gtest/gtest.h>
 
 namespace {
 
 using namespace velmora;
-using namespace velmora::cli;
 using Verdict = LimitTest::Verdict;
 
 MonitorsReport const report{TopicAnswer::Read,

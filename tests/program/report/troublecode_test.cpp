@@ -1,5 +1,5 @@
+#include "libvelmora/report/plain/reporttext.h"
 #include "libvelmora/report/troublecode.h"
-#include "program/view/reporttext.h"
 
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
@@ -7,7 +7,6 @@
 namespace {
 
 using namespace velmora;
-using namespace velmora::cli;
 
 std::shared_ptr<obd::DtcDataModel> model(std::string const& code, std::string const& text, std::string const& maker)
 {

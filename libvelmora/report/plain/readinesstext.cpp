@@ -1,11 +1,11 @@
 #include "common/text/layout.h"
+#include "libvelmora/report/plain/reporttext.h"
 #include "libvelmora/report/texts/labels.h"
 #include "libvelmora/report/texts/plaintexts.h"
-#include "program/view/reporttext.h"
 
 #include <fmt/format.h>
 
-namespace velmora::cli {
+namespace velmora {
 
 namespace {
 
@@ -61,4 +61,4 @@ std::string toText(ReadinessReport const& report, Style const& style)
     return text + drawMonitors(notCompleteFirst(report.monitors), style);
 }
 
-} // namespace velmora::cli
+} // namespace velmora

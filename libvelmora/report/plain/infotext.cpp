@@ -1,11 +1,11 @@
 #include "common/text/layout.h"
+#include "libvelmora/report/plain/reporttext.h"
 #include "libvelmora/report/texts/labels.h"
 #include "libvelmora/report/texts/plaintexts.h"
-#include "program/view/reporttext.h"
 
 #include <fmt/format.h>
 
-namespace velmora::cli {
+namespace velmora {
 
 namespace {
 
@@ -53,4 +53,4 @@ std::string toText(InfoReport const& report, Style const& /*style*/)
            labelledLine(texts::plain::sinceCleared, travelText(report.sinceCleared));
 }
 
-} // namespace velmora::cli
+} // namespace velmora

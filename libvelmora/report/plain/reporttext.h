@@ -1,11 +1,13 @@
 #pragma once
 
+#include "common/text/style.h"
 #include "libvelmora/report/finding/findings.h"
 #include "libvelmora/report/finding/inspection.h"
 #include "libvelmora/report/moduletopic.h"
 #include "libvelmora/report/routinesreport.h"
 #include "libvelmora/report/vehiclereport.h"
-#include "program/view/style.h"
+
+#include <velmora/print.h>
 
 #include <optional>
 #include <string>
@@ -13,7 +15,7 @@
 
 // Reports as text for people: for each topic indented lines under the heading of a control module.
 
-namespace velmora::cli {
+namespace velmora {
 
 // "Control module 7E8: ECM"
 std::string moduleHeading(unsigned int id, std::string const& name);
@@ -47,6 +49,9 @@ std::string toText(InspectionReport const& report, Style const& style);
 std::string toText(VehicleReport const& report, Style const& style,
                    std::optional<InspectionReport> const& inspection = std::nullopt);
 
+// The style that the companion's callers ask for.
+Style styleOf(TextStyle const& style);
+
 template <typename Report>
 std::string toText(std::vector<ModuleTopic<Report>> const& modules, Style const& style)
 {
@@ -58,4 +63,4 @@ std::string toText(std::vector<ModuleTopic<Report>> const& modules, Style const&
     return text;
 }
 
-} // namespace velmora::cli
+} // namespace velmora

@@ -1,11 +1,11 @@
 #include "common/text/layout.h"
+#include "libvelmora/report/plain/reporttext.h"
 #include "libvelmora/report/texts/labels.h"
 #include "libvelmora/report/texts/plaintexts.h"
-#include "program/view/reporttext.h"
 
 #include <fmt/format.h>
 
-namespace velmora::cli {
+namespace velmora {
 
 namespace {
 
@@ -94,4 +94,4 @@ std::string toText(CodeReport const& report, Style const& style)
     return text + (hasMakersCodes(report) ? labelledLine(texts::plain::meanings, makerText(report.maker)) : "");
 }
 
-} // namespace velmora::cli
+} // namespace velmora

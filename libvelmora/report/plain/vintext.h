@@ -1,13 +1,13 @@
 #pragma once
 
+#include "common/text/style.h"
 #include "libvelmora/vehicle/vin.h"
-#include "program/view/style.h"
 
 #include <string>
 
-namespace velmora::cli {
+namespace velmora {
 
 // What a vehicle identification number says, a line each.
 std::string toText(VinFacts const& facts, Style const& style);
 
-} // namespace velmora::cli
+} // namespace velmora

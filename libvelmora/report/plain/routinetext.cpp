@@ -1,11 +1,11 @@
 #include "common/text/layout.h"
+#include "libvelmora/report/plain/reporttext.h"
 #include "libvelmora/report/texts/labels.h"
 #include "libvelmora/report/texts/plaintexts.h"
-#include "program/view/reporttext.h"
 
 #include <fmt/format.h>
 
-namespace velmora::cli {
+namespace velmora {
 
 namespace {
 
@@ -37,4 +37,4 @@ std::string toText(RoutineRun const& run, Style const& style)
            labelledLine(texts::result, result + (run.reason.empty() ? "" : ": " + run.reason));
 }
 
-} // namespace velmora::cli
+} // namespace velmora

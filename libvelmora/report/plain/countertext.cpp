@@ -1,10 +1,10 @@
 #include "common/text/layout.h"
+#include "libvelmora/report/plain/reporttext.h"
 #include "libvelmora/report/texts/plaintexts.h"
-#include "program/view/reporttext.h"
 
 #include <fmt/format.h>
 
-namespace velmora::cli {
+namespace velmora {
 
 std::string toText(CountersReport const& report, Style const& style)
 {
@@ -23,4 +23,4 @@ std::string toText(CountersReport const& report, Style const& style)
            drawColumns(rows, "    ", style);
 }
 
-} // namespace velmora::cli
+} // namespace velmora

@@ -1,11 +1,11 @@
 #include "common/text/layout.h"
+#include "libvelmora/report/plain/reporttext.h"
 #include "libvelmora/report/texts/labels.h"
 #include "libvelmora/report/texts/plaintexts.h"
-#include "program/view/reporttext.h"
 
 #include <fmt/format.h>
 
-namespace velmora::cli {
+namespace velmora {
 
 namespace {
 
@@ -90,4 +90,4 @@ std::string toText(VehicleReport const& report, Style const& style, std::optiona
     return text;
 }
 
-} // namespace velmora::cli
+} // namespace velmora

@@ -1,8 +1,8 @@
 #include "common/text/layout.h"
+#include "libvelmora/report/plain/reporttext.h"
 #include "libvelmora/report/texts/labels.h"
-#include "program/view/reporttext.h"
 
-namespace velmora::cli {
+namespace velmora {
 
 namespace {
 
@@ -28,4 +28,4 @@ std::string toText(FreezeReport const& report, Style const& style)
                         number + ": " + (hasAnswer(report) ? texts::noneStored : answerWord(report.answer)));
 }
 
-} // namespace velmora::cli
+} // namespace velmora

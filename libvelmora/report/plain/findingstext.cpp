@@ -1,13 +1,13 @@
 #include "common/text/layout.h"
+#include "libvelmora/report/plain/reporttext.h"
 #include "libvelmora/report/texts/findingtexts.h"
 #include "libvelmora/report/texts/inspectiontexts.h"
 #include "libvelmora/report/texts/labels.h"
 #include "libvelmora/report/texts/plaintexts.h"
-#include "program/view/reporttext.h"
 
 #include <fmt/format.h>
 
-namespace velmora::cli {
+namespace velmora {
 
 namespace {
 
@@ -92,4 +92,4 @@ std::string toText(InspectionReport const& report, Style const& style)
     return text;
 }
 
-} // namespace velmora::cli
+} // namespace velmora

@@ -1,4 +1,4 @@
-#include "program/view/vintext.h"
+#include "libvelmora/report/plain/vintext.h"
 
 #include "common/text/layout.h"
 #include "libvelmora/report/texts/labels.h"
@@ -7,7 +7,7 @@
 
 #include <fmt/format.h>
 
-namespace velmora::cli {
+namespace velmora {
 
 namespace {
 
@@ -39,11 +39,11 @@ std::string checkText(VinFacts const& facts, Style const& style)
 std::string codesText(VinFacts const& facts)
 {
     switch (facts.basis) {
-    case WmiRow::Basis::Fact:
+    case VinFacts::CodesBasis::Fact:
         return fmt::format(texts::plain::codesByDefault, facts.codes);
-    case WmiRow::Basis::Guess:
+    case VinFacts::CodesBasis::Guess:
         return fmt::format(texts::plain::codesPerhaps, facts.codes);
-    case WmiRow::Basis::None:
+    case VinFacts::CodesBasis::None:
         break;
     }
     return facts.maker.empty() ? "" : texts::plain::codesUnknown;
@@ -60,4 +60,4 @@ std::string toText(VinFacts const& facts, Style const& style)
            labelledLine(texts::codes, codesText(facts));
 }
 
-} // namespace velmora::cli
+} // namespace velmora

@@ -1,17 +1,15 @@
 #include "common/text/layout.h"
+#include "libvelmora/report/plain/reporttext.h"
 #include "libvelmora/report/texts/labels.h"
 #include "libvelmora/report/texts/plaintexts.h"
-#include "program/view/reporttext.h"
 
 #include <fmt/format.h>
 
 #include <algorithm>
 
-namespace velmora::cli {
+namespace velmora {
 
 namespace {
-
-using Verdict = LimitTest::Verdict;
 
 Mark mark(LimitTest::Verdict verdict)
 {
@@ -93,7 +91,7 @@ private:
     std::string m_lines;
 };
 
-std::size_t count(MonitorsReport const& report, Verdict verdict)
+std::size_t count(MonitorsReport const& report, LimitTest::Verdict verdict)
 {
     std::size_t sum = 0;
     for (OnBoardMonitor const& monitor : report.monitors) {
@@ -109,10 +107,10 @@ std::string summary(MonitorsReport const& report, Style const& style)
     if (report.answer != TopicAnswer::Read) {
         return style.paint(Mark::Faint, answerWord(report.answer));
     }
-    std::size_t const failed = count(report, Verdict::Failed);
-    std::size_t const without = count(report, Verdict::NoResult);
+    std::size_t const failed = count(report, LimitTest::Verdict::Failed);
+    std::size_t const without = count(report, LimitTest::Verdict::NoResult);
     std::string text = failed > 0 ? style.paint(Mark::Bad, fmt::format(texts::plain::testsFailed, failed)) + ", " : "";
-    text += fmt::format(texts::plain::testsPassed, count(report, Verdict::Passed));
+    text += fmt::format(texts::plain::testsPassed, count(report, LimitTest::Verdict::Passed));
     return text + (without > 0 ? ", " + fmt::format(texts::plain::testsWithout, without) : "");
 }
 
@@ -174,4 +172,4 @@ std::string toText(OxygenReport const& report, Style const& style)
                                 : drawTests(report.sensors, style));
 }
 
-} // namespace velmora::cli
+} // namespace velmora
