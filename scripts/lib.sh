@@ -37,12 +37,13 @@ test_packages+=(man-db bash-completion zsh fish)                            # wh
 test_packages+=(prometheus systemd mosquitto mosquitto-clients nats-server) # what outputs speak to
 test_packages+=(openssl postgresql python3-paho-mqtt python3-psycopg)           # what fleets are made of
 test_packages+=(chromium poppler-utils default-jre-headless)                # what reads reports and pages
+test_packages+=(abigail-tools xz-utils)                                          # what guards the ABI
 test_packages+=(python3-dbusmock)                                           # plays the Bluetooth service
 # Some have a newer Node with an npm of its own, which Debian's package would collide with.
 command -v npm >/dev/null || test_packages+=(nodejs npm)
 
 package_packages=(debhelper dh-python dpkg-dev fakeroot lintian mmdebstrap libjs-chart.js libqrcodegencpp-dev) # Debian's packages
-package_packages+=(doxygen abigail-tools xz-utils)
+package_packages+=(doxygen)
 
 # build PRESET [TARGET...]: configures and builds.
 build() {
