@@ -15,6 +15,12 @@ complain() {
 options_of_help() { "$@" --help | grep -oE '^  +(-[a-zA-Z],)?-?-?[a-zA-Z][-a-zA-Z]*' | tr -d ' ' | tr ',' '\n' | grep '^-' | sort -u; }
 options_of_page() { man -l -Tutf8 "$1" | col -b | sed -n '/^OPTIONS/,/^[A-Z][A-Z ]*$/p;' | grep -oE '^ {7}-.*' | grep -oE '(^| )--?[a-zA-Z][-a-zA-Z]*' | tr -d ' ' | sort -u; }
 
+# The same of a command of a command, and of its part of that page.
+options_of_part() {
+    man -l -Tutf8 "$1" | col -bx | sed -n '/^COMMANDS/,$p' | sed -nE "/^ {7}$2( |\$)/,/^( {7})?[a-zA-Z]/p" |
+        grep -oE '^ {14}-.*' | grep -oE '(^| )--?[a-zA-Z][-a-zA-Z]*' | tr -d ' ' | sort -u
+}
+
 check() { # check PAGE PROGRAM [COMMAND]
     local page=$stage/share/man/man1/$1
     shift
@@ -25,11 +31,20 @@ check() { # check PAGE PROGRAM [COMMAND]
 
 check velmora.1 "$stage/bin/velmora"
 check obdsim.1 "$stage/bin/obdsim"
-mapfile -t commands < <("$stage/bin/velmora" --help | sed -n '/^Subcommands:/,/^Exit/s/^  \([a-z]*\)  .*/\1/p')
+commands_of() { "$@" --help | sed -n '/^Subcommands:/,/^Exit/s/^  \([a-z]*\)  .*/\1/p'; }
+mapfile -t commands < <(commands_of "$stage/bin/velmora")
+parts=0
 [[ ${#commands[@]} -ge 24 ]] || complain "only ${#commands[@]} commands are found"
 for command in "${commands[@]}"; do
-    check "velmora-$command.1" "$stage/bin/velmora" "$command"
+    page=$stage/share/man/man1/velmora-$command.1
+    check "${page##*/}" "$stage/bin/velmora" "$command"
+    for part in $(commands_of "$stage/bin/velmora" "$command"); do
+        parts=$((parts + 1))
+        differences=$(diff <(options_of_help "$stage/bin/velmora" "$command" "$part") <(options_of_part "$page" "$part")) ||
+            complain "${page##*/} on $part differs from --help: $differences"
+    done
 done
+[[ $parts -ge 8 ]] || complain "only $parts commands of commands are found"
 [[ $(find "$stage/share/man/man1" -name 'velmora-*.1' | wc -l) -eq ${#commands[@]} ]] || complain "a page is of no command"
 
 for page in "$stage"/share/man/man[15]/*; do
@@ -37,4 +52,34 @@ for page in "$stage"/share/man/man[15]/*; do
     [[ -z $said ]] || complain "$(basename "$page"): $said"
     lexgrog "$page" >/dev/null || complain "$(basename "$page") has no name"
 done
+
+# The examples of the pages on files are such files.
+work=$(mktemp -d)
+trap 'rm -rf "$work"' EXIT
+export XDG_CONFIG_HOME=/proc/nonexistent
+example() { # example PAGE N FILE: writes its Nth example
+    awk -v wanted="$2" '/^\.nf/ {seen++; next} /^\.fi/ {if (seen == wanted) exit} seen == wanted' "$stage/share/man/man5/$1.5" |
+        sed 's/\\e/\\/g; s/\\-/-/g' >"$work/$3"
+    [[ -s $work/$3 ]] || complain "$1 has no example $2"
+}
+works() { # works TEXT ARGUMENT...: what the program says then
+    local said
+    said=$("$stage/bin/velmora" -q "${@:2}" 2>&1) && [[ $said == *"$1"* ]] || complain "velmora ${*:2} says: $said"
+}
+example obdsim-files 1 car.toml
+example obdsim-files 2 drive.csv
+example obdsim-files 3 scenario
+works P0133 -p "sim:$work/car.toml?instant&drive=$work/drive.csv&scenario=$work/scenario" codes --confirmed
+example velmora-recordings 1 rounds.csv
+works 786 live --play "$work/rounds.csv"
+example velmora-recordings 2 readings.csv
+works 786 live --play "$work/readings.csv"
+example velmora-signals 1 gearbox.toml
+works GEARBOX_TEMP signals list "$work/gearbox.toml"
+example velmora-watch 1 watch.toml
+works '' watch --config "$work/watch.toml" --check-config
+example velmora-dialogue 1 van
+works '' -p "replay:$work/van" info
+example velmora-settings 1 settings.toml
+works 1280 --settings "$work/settings.toml" settings
 exit $wrong
