@@ -1,6 +1,7 @@
 #include "program/selfdescription.h"
 
 #include "common/text/text.h"
+#include "libvelmora/output/opening/outputfactory.h"
 #include "libvelmora/read/sensornames.h"
 #include "program/terminal/output.h"
 #include "simulator/simulation.h"
@@ -76,6 +77,19 @@ Completion troubleCodes(std::string const& begun)
     return completion;
 }
 
+// What addresses of the outputs of this build begin with.
+Completion outputs(std::string const& /*begun*/)
+{
+    std::vector<std::string> words;
+    for (std::string const& each : builtInOutputs()) {
+        words.push_back(each + (each.starts_with("mqtt") ? "://" : ":"));
+    }
+#ifdef VELMORA_DASH
+    words.emplace_back("dash:");
+#endif
+    return names(words);
+}
+
 Completion files(std::string const& /*begun*/)
 {
     Completion completion;
@@ -98,7 +112,7 @@ manual::Sources sources()
             {"MAKER", makers},
             {"SYSTEM", fixed({"metric", "imperial", "imperial-uk"})},
             {"WHEN", fixed({"auto", "always", "never"})},
-            {"KIND:TARGET", fixed({"csv:", "csv-long:", "ndjson:", "sqlite:", "influx:", "prometheus:", "mqtt://"})},
+            {"KIND:TARGET", outputs},
             {"--listen", fixed({"pty", "tcp://127.0.0.1:0"})},
             {"--vehicle", vehicles},
             {"--adapter", adapters},

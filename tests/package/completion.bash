@@ -26,6 +26,7 @@ offers '* RPM *' 'velmora live R' velmora live R
 offers '* --fast *' 'velmora live --f' velmora live --f
 offers ' P0420 ' 'velmora dtc P0420' velmora dtc P0420
 offers '* Ford *' 'velmora dtc --make F' velmora dtc --make F
+offers ' mqtt:// mqtts:// ' 'velmora watch -o mq' velmora watch -o mq
 offers '* elm327-v1.5 *' 'obdsim --adapter el' obdsim --adapter el
 cd "$1" || exit 1
 offers '* share *' 'velmora --settings s' velmora --settings s
