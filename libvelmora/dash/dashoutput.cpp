@@ -1,5 +1,6 @@
 #include "libvelmora/dash/dashoutput.h"
 
+#include "libvelmora/dash/dashlimits.h"
 #include "libvelmora/dash/dashpage.h"
 #include "libvelmora/dash/dashplace.h"
 
@@ -18,7 +19,7 @@ constexpr std::chrono::seconds unseenLimit{30};
 constexpr std::chrono::milliseconds runsStep{250};
 constexpr std::size_t chartAtFirst = 6; // sensors whose history comes without being asked for
 
-HttpLimits dashLimits()
+HttpLimits serverLimits()
 {
     HttpLimits limits;
     limits.connections = 64;
@@ -45,7 +46,7 @@ DashOutput::DashOutput(OutputAddress const& address, DashContext context)
       m_allowClear(isAllowed(address, "allow_clear")), m_allowConsole(isAllowed(address, "allow_console")),
       m_access(isLoopback(m_place.host) && !m_allowClear && !m_allowConsole ? std::string() : tokenOf(m_context),
                hostNamesOf(address.option("name"))),
-      m_layouts(m_context.layouts), m_server(dashLimits())
+      m_layouts(m_context.layouts), m_server(serverLimits())
 {
     addRoutes();
 }
@@ -229,6 +230,7 @@ std::string DashOutput::greeting(std::string const& lastId) const
                         {"vehicle", m_state.vehicle()},
                         {"resumed", missed.has_value()},
                         {"layout", chosen},
+                        {"limits", dashLimits(m_context.settings)},
                         {"values", Json::parse(m_state.allValues())},
                         {"history", histories},
                         {"news", m_state.news()},

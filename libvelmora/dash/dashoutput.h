@@ -20,6 +20,7 @@ struct DashContext
     std::shared_ptr<DashDesk> desk;
     HealthSource health = [] { return Health(); };
     std::filesystem::path layouts;
+    std::filesystem::path settings;  // with the sensors' limits; empty for none
     std::function<Json()> playState; // where a recording is played; empty for a vehicle
     std::string token;               // where one is needed; empty: made up
     bool mustListen = false;         // a port that can't be had ends all, rather than being tried again

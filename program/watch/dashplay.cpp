@@ -31,8 +31,9 @@ DashContext pageContext(GlobalOptions const& global, PlayDesk& desk)
         return health;
     };
     context.playState = [&desk] { return desk.state(); };
-    context.layouts = DashLayouts::besides(global.settingsFile.empty() ? SettingsStore::defaultFile()
-                                                                       : std::filesystem::path(global.settingsFile));
+    context.settings =
+        global.settingsFile.empty() ? SettingsStore::defaultFile() : std::filesystem::path(global.settingsFile);
+    context.layouts = DashLayouts::besides(context.settings);
     context.mustListen = true;
     context.onLink = [](std::string const& link, std::string const& remark) {
         fmt::print("{}\n", link);

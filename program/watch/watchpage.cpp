@@ -85,6 +85,7 @@ std::unique_ptr<IOutput> WatchPage::makeOutput(OutputAddress const& address, Hea
     context.desk = m_parts->desk;
     context.health = std::move(health);
     context.layouts = DashLayouts::besides(settings);
+    context.settings = settings;
     context.token = processToken();
     context.mustListen = m_parts->forPage;
     context.onLink = [parts = m_parts](std::string const& link, std::string const& remark) {

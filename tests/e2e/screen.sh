@@ -100,7 +100,9 @@ until_seen 'ended with 139' "a fault ends the view"
 begin 80 24 C.UTF-8 "NO_COLOR=1 $live"
 until_seen '^Engine RPM +![0-9]+ rpm' "the view without colours"
 tmux -L "$name" capture-pane -pe | grep -qP '\x1b\[[0-9;]*3[0-7]m' && fail "NO_COLOR means no colours"
-tmux -L "$name" send-keys q
+signal_child ABRT
+until_seen 'ended with 134' "an abort ends the view"
+[[ $(state) == "0 1" ]] || fail "an abort leaves the terminal as it was"
 
 kind=xterm-kitty
 begin 80 24 C.UTF-8 "$live"

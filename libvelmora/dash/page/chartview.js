@@ -1,12 +1,16 @@
 // The chart of the last minutes, with an axis for each unit. Chart.js is loaded when it is first looked at.
+import { limitLines, segmentOf } from './chartlimits.js';
 import { byId, element, setText } from './tables.js';
 import { chosen, change, setting } from './layout.js';
+import { drawValue, makeValue } from './limits.js';
 import { getJson, programNow } from './link.js';
 import { sensors, takeHistory, titleOf } from './store.js';
-import { convert, show, unitOf } from './units.js';
+import { convert, unitOf } from './units.js';
 
-const light = ['#0b63bd', '#b3202a', '#176b41', '#7a3fb8', '#855300', '#0f6d78'];
-const dark = ['#62b4ff', '#ff8582', '#54d08d', '#c9a2ff', '#f4bd55', '#5fd3de'];
+// None of them is the red of what is beyond a limit.
+const light = ['#0b63bd', '#a3128b', '#176b41', '#7a3fb8', '#855300', '#0f6d78'];
+const dark = ['#62b4ff', '#ff9ae0', '#54d08d', '#c9a2ff', '#f4bd55', '#5fd3de'];
+const stretchPixels = 4; // of which a line has four points at most
 const dashes = [[], [8, 4], [2, 3], [12, 4, 2, 4], [5, 5], [1, 2]]; // no line is told by its colour alone
 
 let chart = null;
@@ -37,7 +41,7 @@ function clock(ms) {
 }
 
 function shown() {
-  return chosen('chart').map((id) => sensors.get(id)).filter(Boolean);
+  return chosen('chart').map((id) => sensors.get(id)).filter((sensor) => sensor?.points);
 }
 
 function datasets() {
@@ -45,6 +49,7 @@ function datasets() {
   return shown().map((sensor, index) => ({
     label: titleOf(sensor), data: [], borderColor: palette[index % 6], backgroundColor: palette[index % 6],
     borderDash: dashes[index % 6], borderWidth: 2, pointRadius: 0, tension: 0, spanGaps: false, yAxisID: axisOf(sensor),
+    segment: segmentOf(sensor, style('--bad')),
   }));
 }
 
@@ -71,14 +76,15 @@ function scales() {
   return result;
 }
 
-// A value in the units that are wanted; the same points again where these are the car's own.
+// In the units that are wanted, with one point before and one behind what is seen.
 function pointsOf(sensor, from, to) {
-  const points = sensor.points;
-  let first = points.findIndex((point) => point.x >= from);
-  if (first < 0) return [];
-  first = Math.max(0, first - 1);
-  const part = points.slice(first).filter((point) => point.x <= to + 1000);
-  return unitOf(sensor) === sensor.unit ? part : part.map((point) => ({ x: point.x, y: convert(sensor, point.y) }));
+  const { points } = sensor;
+  const first = points.indexFrom(from);
+  const result = [];
+  if (first === points.size) return result;
+  const end = Math.min(points.size, points.indexFrom(to) + 1);
+  points.thinned(Math.max(0, first - 1), end, ((to - from) / chart.width) * stretchPixels, (x, y) => result.push({ x, y: convert(sensor, y) }));
+  return result;
 }
 
 function range() {
@@ -106,6 +112,7 @@ export async function rebuild() {
   chart = new window.Chart(byId('canvas'), {
     type: 'line',
     data: { datasets: datasets() },
+    plugins: [limitLines(shown(), axisOf, style('--bad'))],
     options: { parsing: false, animation: false, normalized: true, maintainAspectRatio: false, interaction: { mode: 'nearest', axis: 'x', intersect: false },
       scales: scales(), plugins: { decimation: { enabled: true, algorithm: 'min-max', threshold: 400 },
         legend: { labels: { color: style('--ink'), boxHeight: 0, boxWidth: 36 } }, tooltip: { callbacks: { title: (items) => clock(items[0].parsed.x) } } } },
@@ -126,21 +133,41 @@ export function update() {
   figures(from, to);
 }
 
-function figures(from, to) {
-  const table = byId('figures');
-  const list = shown();
-  if (table.rows.length !== list.length + 1) {
-    const head = ['Sensor', 'Lowest', 'Mean', 'Highest', 'Last', 'Unit'].map((text, index) =>
-      element('th', { scope: 'col', class: index > 0 && index < 5 ? 'right' : null }, text));
-    table.replaceChildren(element('thead', {}, element('tr', {}, ...head)), element('tbody', {}, ...list.map(() =>
-      element('tr', {}, element('th', { scope: 'row' }), ...[1, 2, 3, 4].map(() => element('td', { class: 'right' })), element('td')))));
+// Lowest, mean, highest and last of what lies between two times.
+function summary(points, from, to) {
+  const first = points.indexFrom(from);
+  const end = points.indexFrom(to + 1);
+  if (first >= end) return [null, null, null, null];
+  let low = points.value(first);
+  let high = low;
+  let sum = 0;
+  for (let i = first; i < end; ++i) {
+    low = Math.min(low, points.value(i));
+    high = Math.max(high, points.value(i));
+    sum += points.value(i);
   }
+  return [low, sum / (end - first), high, points.value(end - 1)];
+}
+
+let rows = []; // of the table of figures
+
+function makeFigures(list) {
+  const head = ['Sensor', 'Lowest', 'Mean', 'Highest', 'Last', 'Unit'].map((text, index) =>
+    element('th', { scope: 'col', class: index > 0 && index < 5 ? 'right' : null }, text));
+  rows = list.map(() => ({ name: element('th', { scope: 'row' }), values: [1, 2, 3, 4].map(makeValue), unit: element('td') }));
+  const made = rows.map(({ name, values, unit }) =>
+    element('tr', {}, name, ...values.map(({ nodes }) => element('td', { class: 'right' }, ...nodes)), unit));
+  byId('figures').replaceChildren(element('thead', {}, element('tr', {}, ...head)), element('tbody', {}, ...made));
+}
+
+function figures(from, to) {
+  const list = shown();
+  if (rows.length !== list.length || !byId('figures').tHead) makeFigures(list);
   list.forEach((sensor, index) => {
-    const values = sensor.points.filter((point) => point.x >= from && point.x <= to).map((point) => point.y);
-    const mean = values.length ? values.reduce((sum, value) => sum + value, 0) / values.length : null;
-    const texts = [titleOf(sensor), ...[values.length ? Math.min(...values) : null, mean, values.length ? Math.max(...values) : null, values.at(-1) ?? null]
-      .map((value) => show(sensor, value)), unitOf(sensor)];
-    texts.forEach((text, cell) => setText(table.tBodies[0].rows[index].cells[cell], text));
+    const { name, values, unit } = rows[index];
+    setText(name, titleOf(sensor));
+    setText(unit, unitOf(sensor));
+    summary(sensor.points, from, to).forEach((value, place) => drawValue(values[place], sensor, value));
   });
 }
 

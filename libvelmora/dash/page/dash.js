@@ -3,6 +3,7 @@ import { byId, setText } from './tables.js';
 import * as link from './link.js';
 import * as store from './store.js';
 import * as layout from './layout.js';
+import * as limits from './limits.js';
 import * as gauges from './gauges.js';
 import * as numbers from './numbers.js';
 import * as chart from './chartview.js';
@@ -59,15 +60,16 @@ function status() {
   }
   if (!lastReading) return ['wait', 'Waiting for the first values'];
   const number = codes.count();
-  const found = number === 0 ? '' : number === 1 ? ', 1 trouble code' : `, ${number} trouble codes`;
-  return frozen ? ['warn', `Frozen${found}`] : ['good', `Live${found}`];
+  const beyond = limits.sentence(performance.now());
+  const found = (number === 0 ? '' : number === 1 ? ', 1 trouble code' : `, ${number} trouble codes`) + (beyond && `, ${beyond}`);
+  return [frozen || beyond ? 'warn' : 'good', `${frozen ? 'Frozen' : 'Live'}${found}`];
 }
 
 function drawStatus() {
   const [level, text] = status();
   const line = byId('status');
   line.dataset.level = level;
-  setText(line, spoken || text);
+  setText(line, level === 'bad' ? text : spoken || text); // a loss is told at once, whatever is being said
 }
 
 function say(text) {
@@ -88,12 +90,14 @@ function takeReadings(event) {
   const now = performance.now();
   if (lastReading) usualGap = usualGap * 0.9 + Math.min(now - lastReading, 5000) * 0.1;
   lastReading = now;
+  for (const [id] of event.v) limits.note(store.sensors.get(id), now);
 }
 
 function takeHello(hello) {
   setText(byId('version'), hello.version);
   byId('clear').hidden = !hello.allow.clear;
   byId('consoleLink').hidden = !hello.allow.console;
+  limits.take(hello.limits);
   store.takeOffered(hello.vehicle.offered, hello.resumed);
   layout.take(hello.layout);
   store.takeValues(hello.values);

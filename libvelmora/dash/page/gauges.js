@@ -1,10 +1,20 @@
 // The view that is read from afar: a dial and big digits for each chosen sensor.
 import { byId, button, element, setText, svg } from './tables.js';
 import { chosen, change } from './layout.js';
+import { limitNumber, limitOf, side, words } from './limits.js';
 import { freshMs, sensors, titleOf } from './store.js';
 import { convert, rangeOf, show, unitOf } from './units.js';
 
 const arcPath = 'M 30.7 140 A 80 80 0 1 1 169.3 140'; // two thirds of a circle
+
+// A line across the dial at a share of its sweep.
+function placeMark(mark, share) {
+  const angle = ((150 + 240 * share) * Math.PI) / 180;
+  const at = (radius) => [100 + radius * Math.cos(angle), 100 + radius * Math.sin(angle)].map((each) => each.toFixed(1));
+  const [x1, y1] = at(72);
+  const [x2, y2] = at(92);
+  for (const [name, value] of Object.entries({ x1, y1, x2, y2 })) mark.setAttribute(name, value);
+}
 
 const cards = new Map();
 let dragged = null;
@@ -14,6 +24,8 @@ function makeCard(id) {
   const track = svg('path', { d: arcPath, class: 'track', fill: 'none', 'stroke-width': 13, 'stroke-linecap': 'round' });
   const parts = {
     arc,
+    marks: [0, 1].map(() => svg('line', { class: 'mark', 'stroke-width': 4, visibility: 'hidden' })),
+    sign: element('span', { class: 'sign' }),
     name: element('span', { class: 'name', id: `name-${id}` }),
     number: element('span', { class: 'number' }),
     unit: element('div', { class: 'unit' }),
@@ -21,8 +33,8 @@ function makeCard(id) {
     age: element('span', { class: 'age' }),
   };
   const face = element('div', { class: 'face', role: 'meter', 'aria-labelledby': `name-${id}` },
-    svg('svg', { viewBox: '0 10 200 142', 'aria-hidden': 'true' }, track, arc),
-    element('div', { class: 'digits', 'aria-hidden': 'true' }, parts.number, parts.unit));
+    svg('svg', { viewBox: '0 10 200 142', 'aria-hidden': 'true' }, track, arc, ...parts.marks),
+    element('div', { class: 'digits', 'aria-hidden': 'true' }, parts.sign, parts.number, parts.unit));
   const card = element('li', { class: 'gauge', 'data-id': id }, parts.name, face,
     element('div', { class: 'ends', 'aria-hidden': 'true' }, parts.low, parts.age, parts.high), makeMoves(id));
   Object.assign(parts, { card, face, told: 0 });
@@ -102,6 +114,37 @@ export function isStale(sensor, now) {
   return now - sensor.time > freshMs(sensor);
 }
 
+// As far as the sensor's range goes, and to its limits.
+function endsOf(sensor) {
+  const [low, high] = rangeOf(sensor);
+  const { lowest, highest } = limitOf(sensor);
+  return [Math.min(low, lowest ?? low), Math.max(high, highest ?? high)];
+}
+
+function drawDial(parts, sensor, stale) {
+  const [low, high] = endsOf(sensor);
+  const numeric = typeof sensor.value === 'number';
+  const shareOf = (value) => Math.max(0, Math.min(1, (value - low) / (high - low)));
+  const share = numeric && !stale ? shareOf(sensor.value) : 0;
+  parts.arc.setAttribute('stroke-dashoffset', String(Math.round(1000 - share * 1000) / 10));
+  parts.arc.setAttribute('visibility', share > 0.002 ? 'visible' : 'hidden');
+  setText(parts.low, numeric ? String(Math.round(convert(sensor, low))) : '');
+  setText(parts.high, numeric ? String(Math.round(convert(sensor, high))) : '');
+  const { lowest, highest } = limitOf(sensor);
+  [lowest, highest].forEach((limit, index) => {
+    parts.marks[index].setAttribute('visibility', limit == null || !numeric ? 'hidden' : 'visible');
+    if (limit != null) placeMark(parts.marks[index], shareOf(limit));
+  });
+}
+
+// Under the digits: how old the value is, or which limit it is beyond.
+function remark(sensor, stale, now) {
+  if (stale) return ageText(now - sensor.time);
+  const where = side(sensor, sensor.value);
+  const { lowest, highest } = limitOf(sensor);
+  return where && `${where} ${limitNumber(sensor, where === 'above' ? highest : lowest)}`;
+}
+
 function draw(parts, sensor, now) {
   const title = titleOf(sensor);
   const text = show(sensor, sensor.value);
@@ -111,26 +154,25 @@ function draw(parts, sensor, now) {
   parts.number.classList.toggle('long', text.length > 7);
   setText(parts.unit, unitOf(sensor));
   const stale = sensor.time > 0 && isStale(sensor, now);
+  const beyond = !stale && side(sensor, sensor.value) !== '';
   parts.card.classList.toggle('stale', stale);
-  setText(parts.age, stale ? ageText(now - sensor.time) : '');
-  const [low, high] = rangeOf(sensor);
-  const numeric = typeof sensor.value === 'number';
-  setText(parts.low, numeric ? String(Math.round(convert(sensor, low))) : '');
-  setText(parts.high, numeric ? String(Math.round(convert(sensor, high))) : '');
-  const share = numeric && !stale ? Math.max(0, Math.min(1, (sensor.value - low) / (high - low))) : 0;
-  parts.arc.setAttribute('stroke-dashoffset', String(Math.round(1000 - share * 1000) / 10));
-  parts.arc.setAttribute('visibility', share > 0.002 ? 'visible' : 'hidden');
-  tellReaders(parts, sensor, { low, high, numeric, stale, text }, now);
+  parts.card.classList.toggle('beyond', beyond);
+  setText(parts.sign, beyond ? '!' : '');
+  setText(parts.age, remark(sensor, stale, now));
+  drawDial(parts, sensor, stale);
+  tellReaders(parts, sensor, text, stale, now);
 }
 
 // Once a second at most, and never by itself: a reader of the screen hears it where he goes.
-function tellReaders(parts, sensor, { low, high, numeric, stale, text }, now) {
+function tellReaders(parts, sensor, text, stale, now) {
   if (now - parts.told < 1000) return;
   parts.told = now;
+  const [low, high] = endsOf(sensor);
+  const further = stale ? parts.age.textContent : words(sensor, sensor.value);
   parts.face.setAttribute('aria-valuemin', String(low));
   parts.face.setAttribute('aria-valuemax', String(high));
-  parts.face.setAttribute('aria-valuenow', String(numeric ? sensor.value : low));
-  parts.face.setAttribute('aria-valuetext', sensor.value == null ? 'no value' : `${text} ${unitOf(sensor)}${stale ? ', ' + parts.age.textContent : ''}`);
+  parts.face.setAttribute('aria-valuenow', String(typeof sensor.value === 'number' ? sensor.value : low));
+  parts.face.setAttribute('aria-valuetext', sensor.value == null ? 'no value' : `${text} ${unitOf(sensor)}${further ? `, ${further}` : ''}`);
 }
 
 export function update(now) {
@@ -143,5 +185,5 @@ export function update(now) {
 // A sentence with all values, for a button.
 export function sentence() {
   const told = chosen('gauges').map((id) => sensors.get(id)).filter((sensor) => sensor?.value != null);
-  return told.map((sensor) => `${sensor.name} ${show(sensor, sensor.value)} ${unitOf(sensor)}`).join(', ') || 'No values yet';
+  return told.map((sensor) => [sensor.name, show(sensor, sensor.value), unitOf(sensor), words(sensor, sensor.value)].filter(Boolean).join(' ')).join(', ') || 'No values yet';
 }

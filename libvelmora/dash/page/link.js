@@ -46,7 +46,7 @@ function take(name, event) {
   lastEvent = performance.now();
   if (event.lastEventId) lastId = event.lastEventId;
   const data = JSON.parse(event.data);
-  const now = data.now ?? data.beat?.now;
+  const now = data?.now ?? data?.beat?.now; // a run that was never begun is null
   if (now) clockOffset = now - Date.now();
   handlers.get(name)?.(data);
 }

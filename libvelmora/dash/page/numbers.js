@@ -2,6 +2,7 @@
 import { byId, element, setText } from './tables.js';
 import { chosen } from './layout.js';
 import { ageText, isStale } from './gauges.js';
+import { drawValue, makeValue } from './limits.js';
 import { sensors, titleOf } from './store.js';
 import { show, unitOf } from './units.js';
 
@@ -11,7 +12,9 @@ const rows = new Map();
 function makeRow(id) {
   const cells = heads.map(([, type], index) =>
     element(index === 0 ? 'th' : 'td', { class: index === 1 ? 'right value' : type, scope: index === 0 ? 'row' : null }));
-  return { row: element('tr', { 'data-id': id }, ...cells), cells };
+  const value = makeValue();
+  cells[1].append(...value.nodes);
+  return { row: element('tr', { 'data-id': id }, ...cells), cells, value };
 }
 
 export function rebuild() {
@@ -36,14 +39,15 @@ export function rebuild() {
 
 export function update(now) {
   if (chosen('numbers').length !== rows.size) rebuild();
-  for (const [id, { row, cells }] of rows) {
+  for (const [id, { row, cells, value }] of rows) {
     const sensor = sensors.get(id);
     if (!sensor) continue;
     const { min, max, sum, count } = sensor.stats;
     const stale = sensor.time > 0 && isStale(sensor, now);
     row.classList.toggle('stale', stale);
-    const texts = [titleOf(sensor), show(sensor, sensor.value), unitOf(sensor), show(sensor, min),
+    drawValue(value, sensor, sensor.value);
+    const texts = [titleOf(sensor), null, unitOf(sensor), show(sensor, min),
       show(sensor, count ? sum / count : null), show(sensor, max), sensor.time === 0 ? 'never' : stale ? ageText(now - sensor.time) : 'now'];
-    texts.forEach((text, index) => setText(cells[index], text));
+    texts.forEach((text, index) => text !== null && setText(cells[index], text));
   }
 }

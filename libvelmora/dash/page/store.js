@@ -1,6 +1,7 @@
 // What the car has told so far: the sensors with their values, statistics and history.
+import { Points } from './points.js';
 
-export const keptMs = 15 * 60 * 1000;
+const keptMs = 15 * 60 * 1000;
 const mostPoints = 6000;
 
 export const sensors = new Map(); // by id
@@ -11,16 +12,20 @@ let charted = new Set();
 export function keepPoints(ids) {
   charted = new Set(ids);
   for (const sensor of sensors.values()) {
-    if (charted.has(sensor.id) || !sensor.points.length) continue;
-    sensor.points = [];
-    sensor.hasHistory = false;
+    if (charted.has(sensor.id)) {
+      sensor.points ??= new Points();
+    } else {
+      sensor.points = null;
+      sensor.hasHistory = false;
+    }
   }
 }
 
 function known(id) {
   let sensor = sensors.get(id);
   if (!sensor) {
-    sensor = { id, name: id, unit: '', sensor: '', precision: 0, value: null, time: 0, gap: 0, stats: fresh(), points: [] };
+    const points = charted.has(id) ? new Points() : null;
+    sensor = { id, name: id, unit: '', sensor: '', precision: 0, value: null, time: 0, gap: 0, stats: fresh(), points, hasHistory: false };
     sensors.set(id, sensor);
   }
   return sensor;
@@ -55,29 +60,17 @@ export function takeValues(event) {
     stats.max = stats.count ? Math.max(stats.max, value) : value;
     stats.sum += value;
     stats.count += 1;
-    if (!charted.has(id)) continue;
-    sensor.points.push({ x: time, y: value });
-    trim(sensor, time);
-  }
-}
-
-// In pieces: to cut off one point each time would move all the others.
-function trim(sensor, now) {
-  const points = sensor.points;
-  if (points.length > mostPoints || points[0].x < now - keptMs - 30000) {
-    const first = Math.max(points.findIndex((point) => point.x >= now - keptMs), points.length - mostPoints + 500, 0);
-    sensor.points = points.slice(first);
+    sensor.points?.add(time, value);
+    sensor.points?.trim(time - keptMs, mostPoints);
   }
 }
 
 // {"id", "t": [...], "v": [...]}: what was there before this page, or while its link was broken.
 export function takeHistory(history) {
   const sensor = known(history.id);
-  if (!charted.has(sensor.id)) return;
+  if (!sensor.points) return;
   sensor.hasHistory = true;
-  const times = new Set(sensor.points.map((point) => point.x));
-  const missed = history.t.map((time, index) => ({ x: time, y: history.v[index] })).filter((point) => !times.has(point.x));
-  sensor.points = sensor.points.concat(missed).sort((a, b) => a.x - b.x);
+  sensor.points.merge(history.t, history.v);
 }
 
 // The sensors that are read now or were a moment ago, as in the list of what is offered.

@@ -13,6 +13,11 @@ const imperial = {
   mm: ['in', (v) => v / 25.4, 2],
 };
 
+// Whether a sensor's own unit is one of those, which happens in recordings.
+export function isImperial(unit) {
+  return unit.startsWith('in') || Object.values(imperial).some(([label]) => label === unit);
+}
+
 let system = 'metric';
 export function setSystem(name) {
   system = name;
