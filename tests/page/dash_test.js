@@ -6,6 +6,7 @@
 const fs = require('node:fs');
 const { folder, launch, pictures, running, startDash } = require('./dashrig.js');
 const { testDoors } = require('./dashdoors.js');
+const { testHands } = require('./dashhands.js');
 const { testCarStops, testProgramStops } = require('./dashloss.js');
 const { testLimits, testPlay } = require('./dashplay.js');
 const { testPoints } = require('./dashpoints.js');
@@ -41,6 +42,7 @@ async function main() {
   await step('tells within 2 s that the car does not answer', () => testCarStops(browsers[0]));
   await step('plays a recording', () => testPlay(browsers[0]));
   await step('marks values beyond their limits', () => testLimits(browsers[0]));
+  await step('is worked by hand, and draws no more than it must', () => testHands(browsers[0]));
   await step('lets in nobody without the token', () => testDoors(browsers[1]));
   clearTimeout(timer);
   for (const child of running) child.kill('SIGKILL');

@@ -58,6 +58,7 @@ async function testLimits(browser) {
   const card = 'document.querySelector(\'[data-id="7E8/RPM"]\')';
   const told = `${card}.querySelector('.face').getAttribute('aria-valuetext')`;
   await waitFor(page, `/^80[0-9] rpm$/.test(${told})`);
+  assert.equal(await page.$eval('#playSpeed', (each) => each.selectedOptions[0]?.textContent), '0.125');
   assert.equal(await page.evaluate(`${card}.classList.contains('beyond')`), false);
   await goTo(page, 300);
   await waitFor(page, `/^1100 rpm, above its limit of 1000 rpm$/.test(${told})`);

@@ -1,5 +1,5 @@
 // The bar of a recording that is played: pause, speed, and where it stands.
-import { byId, setText } from './tables.js';
+import { byId, element, setText } from './tables.js';
 import { post } from './link.js';
 
 let state = null;
@@ -14,12 +14,19 @@ const clock = (ms) => {
 export const isPaused = () => Boolean(state?.paused);
 export const isOver = () => Boolean(state && state.position >= state.end);
 
+// The program may have been started with a speed that is not in the list.
+function showSpeed(speed) {
+  const list = byId('playSpeed');
+  if (![...list.options].some((each) => each.value === speed)) list.prepend(element('option', { value: speed }, speed));
+  list.value = speed;
+}
+
 export function take(play) {
   state = play ?? null;
   byId('player').hidden = !state;
   if (!state) return;
   byId('playPause').setAttribute('aria-pressed', String(state.paused));
-  byId('playSpeed').value = String(state.speed);
+  showSpeed(String(state.speed));
   const range = byId('playPlace');
   const length = state.end - state.begin;
   const place = state.position - state.begin;
