@@ -13,18 +13,22 @@ from typing import NamedTuple
 TEST_PROGRAMS = {
     "common": ["common/common_test"],
     "libobd": ["libobd/libobd_test"],
-    "libvelmora": ["libvelmora/libvelmora_test"],
+    # The tables and texts of reports are asked for among the program's views.
+    "libvelmora": ["libvelmora/libvelmora_test", "program/program_test", "e2e/e2e_test"],
     "program": ["program/program_test", "e2e/e2e_test"],
     "simulator": ["simulator/simulator_test"],
 }
 WAITING = {"e2e/e2e_test"}  # in real time: their cases run side by side, and only if the others notice nothing
-SCRIPTS = {  # tests that are no test program, and what they are given
-    "program": [("python3", "tests/e2e/commandline.py", "program/velmora"),
-                ("bash", "tests/e2e/screen.sh", "program/velmora")],
-    "simulator": [("python3", f"tests/simulator/{name}.py", "simulator/program/obdsim")
+VELMORA = [("python3 tests/e2e/commandline.py", ["program/velmora"])]
+SCRIPTS = {  # tests that are no test program, and what of the build they are given
+    "libvelmora": VELMORA + [("/usr/bin/python3 tests/e2e/bluetooth/bluetooth_test.py",
+                              ["program/velmora", "simulator/program/obdsim", "tests/e2e/bluetooth/home"])],
+    "program": VELMORA + [("bash tests/e2e/screen.sh", ["program/velmora"])],
+    "simulator": [(f"python3 tests/simulator/{name}.py", ["simulator/program/obdsim"])
                   for name in ("commandline", "outsideclient")],
 }
 NUMBERS = 4096  # of changes, as in switch.h
+BATCH = 4  # seconds of cases in a batch, each run alone
 MOST_MEMORY = 8 << 30  # of a test program that a change has sent astray
 
 
@@ -36,7 +40,8 @@ class Case(NamedTuple):
 
 def targets(room):
     named = [pathlib.Path(each).name for each in TEST_PROGRAMS[room]]
-    return named + {"program": ["velmora"], "simulator": ["obdsimProgram"]}.get(room, [])
+    return named + {"libvelmora": ["velmora", "obdsimProgram"], "program": ["velmora"], "simulator": ["obdsimProgram"]}.get(
+        room, [])
 
 
 def hold_back():
@@ -78,7 +83,8 @@ class Cases:
                 else:
                     suite = line
         if pattern == "*":
-            self.cases += [Case((*command, str(build / target)), "", True) for *command, target in SCRIPTS.get(room, [])]
+            self.cases += [Case((*command.split(), *(str(build / each) for each in given)), "", True)
+                           for command, given in SCRIPTS.get(room, [])]
         self.reached = {}
         self.seconds = {}
 
@@ -106,12 +112,24 @@ class Cases:
     def notice(self, cases, number, jobs):
         """Whether a case fails with the change of a number; -1 for one that is built in."""
         environment = {"VELMORA_MUTANT": str(number)}
-        quick = [case for case in cases if not case.waits]
-        for command in {case.command for case in quick}:
-            together = [case for case in quick if case.command == command]
-            if not self._run(together, self._limit(together), environment):
+        # What fails once may have failed on a busy machine, not by the change.
+        for together in self._batches([case for case in cases if not case.waits]):
+            limit = self._limit(together)
+            if not self._run(together, limit, environment) and not self._run(together, limit, environment):
                 return True
         return self._one_by_one([case for case in cases if case.waits], environment, jobs, number < 0)
+
+    def _batches(self, cases):
+        """Cases that run in one process, those first that reach least beside; so few that a change that hangs them is known
+        soon."""
+        batches, seconds = [], 0
+        for case in sorted(cases, key=lambda each: (each.command, len(self.reached[each]))):
+            seconds += self.seconds[case]
+            if not batches or batches[-1][0].command != case.command or seconds > BATCH:
+                batches.append([])
+                seconds = self.seconds[case]
+            batches[-1].append(case)
+        return batches
 
     def _one_by_one(self, cases, environment, jobs, built_in):
         cases = sorted(cases, key=self.seconds.get)
