@@ -23,7 +23,7 @@ VELMORA = [("python3 tests/e2e/commandline.py", ["program/velmora"])]
 SCRIPTS = {  # tests that are no test program, and what of the build they are given
     "libvelmora": VELMORA + [("/usr/bin/python3 tests/e2e/bluetooth/bluetooth_test.py",
                               ["program/velmora", "simulator/program/obdsim", "tests/e2e/bluetooth/home"])],
-    "program": VELMORA + [("bash tests/e2e/screen.sh", ["program/velmora"])],
+    "program": VELMORA + [("python3 tests/e2e/livekeys.py", ["program/velmora"]), ("bash tests/e2e/screen.sh", ["program/velmora"])],
     "simulator": [(f"python3 tests/simulator/{name}.py", ["simulator/program/obdsim"])
                   for name in ("commandline", "outsideclient")],
 }
