@@ -19,7 +19,7 @@ TEST_PROGRAMS = {
     "simulator": ["simulator/simulator_test"],
 }
 WAITING = {"e2e/e2e_test"}  # in real time: their cases run side by side, and only if the others notice nothing
-VELMORA = [("python3 tests/e2e/commandline.py", ["program/velmora"])]
+VELMORA = [(f"python3 tests/e2e/{name}.py", ["program/velmora"]) for name in ("commandline", "commandtexts")]
 SCRIPTS = {  # tests that are no test program, and what of the build they are given
     "libvelmora": VELMORA + [("/usr/bin/python3 tests/e2e/bluetooth/bluetooth_test.py",
                               ["program/velmora", "simulator/program/obdsim", "tests/e2e/bluetooth/home"])],
