@@ -151,39 +151,6 @@ TcpAddress parseTcp(std::string const& whole, std::string_view rest)
     return address;
 }
 
-struct Printer
-{
-    std::string operator()(SerialAddress const& address) const
-    {
-        return address.device + " (" + std::to_string(address.baud) + " baud)";
-    }
-    std::string operator()(TcpAddress const& address) const
-    {
-        bool const bracketed = address.host.find(':') != std::string::npos;
-        return (bracketed ? "[" + address.host + "]" : address.host) + ":" + std::to_string(address.port);
-    }
-    std::string operator()(SimulatorAddress const& address) const
-    {
-        std::string options = address.instant ? "&instant" : "";
-        auto const add = [&options](char const* name, std::string const& value) {
-            options += value.empty() ? "" : std::string("&") + name + "=" + value;
-        };
-        add("adapter", address.adapter);
-        add("drive", address.drive);
-        add("scenario", address.scenario);
-        for (std::string const& fault : address.faults) {
-            add("fault", fault);
-        }
-        return "sim:" + address.vehicle + (options.empty() ? "" : "?" + options.substr(1));
-    }
-    std::string operator()(ReplayAddress const& address) const { return "replay:" + address.file; }
-    std::string operator()(BluetoothAddress const& address) const
-    {
-        return "bt://" + address.mac + (address.channel ? "?channel=" + std::to_string(*address.channel) : "");
-    }
-    std::string operator()(BleAddress const& address) const { return "ble://" + address.mac; }
-};
-
 // The name of a serial device without its path, which no host has.
 bool namesSerialDevice(std::string_view text)
 {
@@ -241,11 +208,6 @@ PortAddress parsePortAddress(std::string const& text, unsigned int baud)
         reject(text, "a serial device is named with its path, /dev/" + text);
     }
     return parseTcp(text, rest);
-}
-
-std::string toString(PortAddress const& address)
-{
-    return std::visit(Printer{}, address);
 }
 
 } // namespace velmora

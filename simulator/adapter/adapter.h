@@ -56,6 +56,8 @@ private:
         AwaitingRate ///< for the CR that confirms a new line rate
     };
 
+    static constexpr std::size_t longestLine = 254;
+
     void receiveOne(char character);
     void settle();
     void stop();
