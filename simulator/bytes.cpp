@@ -70,7 +70,7 @@ void appendWord(Bytes& bytes, std::uint16_t word)
 
 std::optional<Bytes> parseHex(std::string_view text)
 {
-    const std::string packed = normaliseCommand(text);
+    std::string const packed = normaliseCommand(text);
     if (packed.size() % 2 != 0 || !std::all_of(packed.begin(), packed.end(), isHexDigit)) {
         return std::nullopt;
     }

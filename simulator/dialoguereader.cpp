@@ -58,8 +58,8 @@ private:
         if (colon == std::string::npos) {
             fail("a header line is \"name: value\"");
         }
-        const std::string name = line.substr(0, colon);
-        const std::string value = line.substr(colon + 2);
+        std::string const name = line.substr(0, colon);
+        std::string const value = line.substr(colon + 2);
         if (name == "vehicle") {
             m_dialogue.vehicle = value;
         } else if (name == "adapter") {
@@ -77,8 +77,8 @@ private:
 
     void readTurn(std::string const& line)
     {
-        const std::string mark = line.substr(0, 2);
-        const std::string rest = line.size() > 3 ? line.substr(3) : "";
+        std::string const mark = line.substr(0, 2);
+        std::string const rest = line.size() > 3 ? line.substr(3) : "";
         bool const spaced = line.size() == 2 || line[2] == ' ';
         if (mark == "->" && spaced) {
             if (m_pause != Time(0)) {
@@ -130,7 +130,7 @@ private:
         case '\\':
             return '\\';
         case 'x': {
-            const std::string digits = text.substr(i + 1, 2);
+            std::string const digits = text.substr(i + 1, 2);
             auto const value = digits.size() == 2 ? parseHexNumber(digits) : std::nullopt;
             if (value) {
                 i += 2;

@@ -157,7 +157,7 @@ int parseBaud(std::string const& text, std::string const& value)
 Fault parseFault(std::string const& text)
 {
     auto const mark = text.find_first_of("=@:");
-    const std::string name = text.substr(0, mark);
+    std::string const name = text.substr(0, mark);
     auto const form =
         std::find_if(std::begin(forms), std::end(forms), [&](FaultForm const& f) { return f.name == name; });
     if (form == std::end(forms) || mark == std::string::npos) {
@@ -186,7 +186,7 @@ Fault parseFault(std::string const& text)
 
 FaultPlan parseFaults(std::vector<std::string> const& texts)
 {
-    const std::string quirk = "quirk:";
+    std::string const quirk = "quirk:";
     FaultPlan plan;
     for (auto const& text : texts) {
         auto const [name, value] = splitAtFirst(text, '=');

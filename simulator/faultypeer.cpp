@@ -152,7 +152,7 @@ bool FaultyPeer::linkIsUp() const
 void FaultyPeer::pull(Time time)
 {
     for (auto next = m_inner->nextOutput(); next && *next <= time; next = m_inner->nextOutput()) {
-        const Time due = *next;
+        Time const due = *next;
         for (char const byte : m_inner->advanceTo(due)) {
             pass(byte, due);
         }

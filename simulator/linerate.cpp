@@ -22,7 +22,7 @@ void LineRate::receive(std::string_view bytes)
 {
     while (!bytes.empty()) {
         auto const end = bytes.find('\r');
-        const std::string_view part = bytes.substr(0, end == std::string_view::npos ? end : end + 1);
+        std::string_view const part = bytes.substr(0, end == std::string_view::npos ? end : end + 1);
         m_toPeer.push(std::max(now(), m_toPeer.end(now())) + duration(part.size()), std::string(part));
         bytes.remove_prefix(part.size());
     }
@@ -37,8 +37,8 @@ std::string LineRate::advanceTo(Time time)
 {
     for (auto next = earlier(m_toPeer.next(), m_inner->nextOutput()); next && *next <= time;
          next = earlier(m_toPeer.next(), m_inner->nextOutput())) {
-        const Time at = std::max(*next, now());
-        const std::string said = m_inner->advanceTo(at);
+        Time const at = std::max(*next, now());
+        std::string const said = m_inner->advanceTo(at);
         m_toHost.push(m_toHost.end(at) + duration(said.size()), said);
         m_inner->receive(m_toPeer.take(at));
     }

@@ -33,7 +33,7 @@ void PeerPlayer::receive(std::string_view bytes)
 
 void PeerPlayer::catchUp()
 {
-    const std::string before = m_peer->advanceTo(virtualNow());
+    std::string const before = m_peer->advanceTo(virtualNow());
     if (m_output && !before.empty()) {
         m_output(before);
     }
@@ -53,7 +53,7 @@ void PeerPlayer::disconnect()
 
 Time PeerPlayer::virtualNow() const
 {
-    const RealMs passed = Clock::now() - m_start;
+    RealMs const passed = Clock::now() - m_start;
     return m_offset + std::chrono::floor<Time>(passed * m_speed);
 }
 
@@ -68,7 +68,7 @@ void PeerPlayer::arm()
         m_timer.cancel();
         return;
     }
-    const RealMs wait = RealMs(next ? *next - m_offset : Time(0)) / m_speed;
+    RealMs const wait = RealMs(next ? *next - m_offset : Time(0)) / m_speed;
     m_timer.expires_at(m_start + std::chrono::ceil<Clock::duration>(wait));
     m_timer.async_wait([this](asio::error_code const& error) {
         if (!error) {
@@ -82,12 +82,12 @@ void PeerPlayer::play()
     if (!m_output) {
         return;
     }
-    const std::string bytes = m_peer->advanceTo(virtualNow());
+    std::string const bytes = m_peer->advanceTo(virtualNow());
     if (!bytes.empty()) {
         m_output(bytes);
     }
     if (!m_peer->linkIsUp() && !m_peer->nextOutput()) {
-        const LinkLost lost = std::exchange(m_linkLost, nullptr);
+        LinkLost const lost = std::exchange(m_linkLost, nullptr);
         if (lost) {
             lost();
         }

@@ -18,7 +18,7 @@ std::string keyOf(std::string const& normalised)
 
 bool isAnswerOfCar(std::string const& key, std::string const& reply)
 {
-    const std::string text = normaliseCommand(reply);
+    std::string const text = normaliseCommand(reply);
     bool const failed = std::any_of(std::begin(errorWords), std::end(errorWords),
                                     [&](char const* word) { return text.find(word) != std::string::npos; });
     return isHexText(key) && !failed && text.find_first_of("0123456789") != std::string::npos;
@@ -69,7 +69,7 @@ std::string elmName(std::string const& description)
 /// Without the notices that an adapter gives while it looks for the bus.
 std::string withoutSearchNotice(std::string bytes)
 {
-    for (const std::string notice : {"SEARCHING...", "BUS INIT: ...OK", "BUS INIT: OK"}) {
+    for (std::string const notice : {"SEARCHING...", "BUS INIT: ...OK", "BUS INIT: OK"}) {
         auto const at = bytes.find(notice);
         if (at != std::string::npos) {
             auto const end = bytes.find_first_not_of("\r\n", at + notice.size());
@@ -86,7 +86,7 @@ std::string missingEnd(std::string const& bytes)
         return "";
     }
     auto const last = bytes.find_last_not_of('\r');
-    const std::size_t returns = bytes.size() - (last == std::string::npos ? 0 : last + 1);
+    std::size_t const returns = bytes.size() - (last == std::string::npos ? 0 : last + 1);
     return (returns == 0 ? "\r\r>" : returns == 1 ? "\r>" : ">");
 }
 
@@ -104,7 +104,7 @@ void ReplayScript::addRows()
     bool beforeBus = true;
     std::string key;
     for (auto const& exchange : m_dialogue.exchanges) {
-        const std::string command = normaliseCommand(exchange.sent);
+        std::string const command = normaliseCommand(exchange.sent);
         key = command.empty() ? key : keyOf(command); // an empty line repeats the last command
         m_rows.push_back({key, &exchange, headersOn, beforeBus});
         if (m_dialogue.headers == DialogueHeaders::Late && (key == "ATH1" || key == "ATH0")) {
@@ -118,7 +118,7 @@ void ReplayScript::findProtocol()
 {
     m_protocol = m_dialogue.protocol;
     for (auto const& row : m_rows) {
-        const std::string reply = row.key == "ATDPN" ? row.exchange->received() : "";
+        std::string const reply = row.key == "ATDPN" ? row.exchange->received() : "";
         auto const digit = reply.find_first_of("123456789");
         if (m_protocol == 0 && digit != std::string::npos) {
             m_protocol = reply[digit] - '0';
@@ -138,7 +138,7 @@ std::optional<std::vector<TimedText>> ReplayScript::toRequest(std::string const&
     if (otherProtocol) {
         return std::nullopt;
     }
-    const std::string key = keyOf(request);
+    std::string const key = keyOf(request);
     auto reply = serve(key, settings);
     if (!reply) {
         return std::vector<TimedText>{{settings.timeout(), isHexText(key) ? "NO DATA\r\r>" : "?\r\r>"}};

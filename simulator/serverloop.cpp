@@ -38,14 +38,14 @@ void ServerLoop::run()
 
 void ServerLoop::start()
 {
-    const std::lock_guard<std::mutex> lock(m_mutex);
+    std::lock_guard<std::mutex> const lock(m_mutex);
     m_thread = std::thread([this] { run(); });
 }
 
 void ServerLoop::stop()
 {
     m_context.stop();
-    const std::lock_guard<std::mutex> lock(m_mutex);
+    std::lock_guard<std::mutex> const lock(m_mutex);
     if (m_thread.joinable()) {
         m_thread.join();
     }

@@ -36,7 +36,7 @@ public:
     template <class Work>
     auto with(Work const& work)
     {
-        const std::lock_guard<std::mutex> lock(m_mutex);
+        std::lock_guard<std::mutex> const lock(m_mutex);
         if (!m_server) {
             return work(*m_car);
         }
@@ -47,7 +47,7 @@ public:
 
     std::string serve(std::unique_ptr<obdsim::IServer> server)
     {
-        const std::lock_guard<std::mutex> lock(m_mutex);
+        std::lock_guard<std::mutex> const lock(m_mutex);
         m_server = std::move(server);
         m_server->start();
         return m_server->address();
@@ -55,7 +55,7 @@ public:
 
     void stop()
     {
-        const std::lock_guard<std::mutex> lock(m_mutex);
+        std::lock_guard<std::mutex> const lock(m_mutex);
         m_server.reset();
     }
 

@@ -66,7 +66,7 @@ void rehearse(SimulatedCar& car, std::vector<ScenarioLine> const& scenario)
 
 std::vector<std::shared_ptr<SimulatedCar>> simulateFleet(SimulationOptions const& options, std::size_t count)
 {
-    const FaultPlan plan = parseFaults(options.faults);
+    FaultPlan const plan = parseFaults(options.faults);
     AdapterProfile profile = adapterProfile(options.adapter);
     apply(plan, profile);
     VehicleData vehicle = loadVehicle(options.vehicle);
@@ -95,7 +95,7 @@ std::shared_ptr<IPeer> simulate(SimulationOptions const& options)
 
 std::shared_ptr<IPeer> replay(std::string const& path, std::vector<std::string> const& faults)
 {
-    const FaultPlan plan = parseFaults(faults);
+    FaultPlan const plan = parseFaults(faults);
     auto script = std::make_shared<ReplayScript>(loadDialogue(path));
     AdapterProfile profile = profileForBanner(script->banner());
     apply(plan, profile);

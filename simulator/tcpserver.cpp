@@ -31,7 +31,7 @@ public:
 private:
     static std::string textOf(tcp::endpoint const& endpoint)
     {
-        const std::string host = endpoint.address().to_string();
+        std::string const host = endpoint.address().to_string();
         return (endpoint.address().is_v6() ? "[" + host + "]" : host) + ":" + std::to_string(endpoint.port());
     }
 
@@ -39,7 +39,7 @@ private:
     {
         try {
             auto const endpoints = tcp::resolver(m_context).resolve(host, std::to_string(port));
-            const tcp::endpoint endpoint = *endpoints.begin();
+            tcp::endpoint const endpoint = *endpoints.begin();
             m_acceptor.open(endpoint.protocol());
             m_acceptor.set_option(tcp::acceptor::reuse_address(true));
             m_acceptor.bind(endpoint);

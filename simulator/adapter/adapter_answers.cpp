@@ -23,7 +23,7 @@ bool Adapter::playScript(std::optional<std::vector<TimedText>> const& texts)
 
 void Adapter::answer(CommandReply const& reply)
 {
-    const Time delay = m_profile.timing.command + reply.delay;
+    Time const delay = m_profile.timing.command + reply.delay;
     if (reply.after == After::Monitor) {
         m_state = State::Monitoring;
         return;
@@ -43,7 +43,7 @@ void Adapter::answer(CommandReply const& reply)
 
 void Adapter::answerReset(CommandReply const& reply)
 {
-    const Time delay = m_profile.timing.command + reply.delay;
+    Time const delay = m_profile.timing.command + reply.delay;
     if (has(Quirk::QuestionBeforeBanner)) {
         say(delay, "?\r");
     }
@@ -68,7 +68,7 @@ void Adapter::answerBaudRate()
 {
     constexpr Time switching = Ms(10);
     say(m_profile.timing.command + switching, m_profile.banner + "\r");
-    const Time wait = m_profile.timing.command + switching + m_settings.baudWait;
+    Time const wait = m_profile.timing.command + switching + m_settings.baudWait;
     finish(wait);
     m_state = State::AwaitingRate;
     m_stateUntil = m_now + wait;
@@ -85,7 +85,7 @@ void Adapter::confirmRate()
 /// The end of a reply: an empty line and the prompt.
 void Adapter::finish(Time delay)
 {
-    const Time prompt = delay + (has(Quirk::PromptSlow) ? slowPrompt : Time(0));
+    Time const prompt = delay + (has(Quirk::PromptSlow) ? slowPrompt : Time(0));
     say(prompt, has(Quirk::SingleReturn) ? "" : "\r");
     sayRaw(prompt, m_promptLost ? "" : ">");
 }

@@ -60,8 +60,8 @@ void Adapter::execute(std::string const& line)
 
 void Adapter::executeCommand(std::string const& command)
 {
-    const Settings before = m_settings;
-    const CommandReply reply = run(command);
+    Settings const before = m_settings;
+    CommandReply const reply = run(command);
     if (playScript(m_script ? m_script->toCommand(command, before) : std::nullopt)) {
         return;
     }
@@ -116,7 +116,7 @@ void Adapter::executeRequest(std::string const& request)
     if (counted) {
         busRequest.expected = static_cast<int>(parseHexNumber(request.substr(request.size() - 1)).value_or(1));
     }
-    const BusReply reply = m_bus.request(busRequest, m_settings, m_now + m_profile.timing.command);
+    BusReply const reply = m_bus.request(busRequest, m_settings, m_now + m_profile.timing.command);
     for (auto const& part : reply.texts) {
         say(m_profile.timing.command + part.delay, part.text);
     }

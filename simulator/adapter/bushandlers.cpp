@@ -208,7 +208,7 @@ CommandReply keywords(CommandContext& context, std::string const& /*argument*/)
 /// Diamex adapters repeat the chosen number: "6=ISO 15765-4 (CAN 11/500)".
 CommandReply diamexTryProtocol(CommandContext& context, std::string const& argument)
 {
-    const CommandReply reply = tryProtocol(context, argument);
+    CommandReply const reply = tryProtocol(context, argument);
     bool const chosen = reply.lines.front() == "OK";
     return chosen ? line(argument + "=" + context.bus.description()) : reply;
 }

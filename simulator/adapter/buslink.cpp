@@ -61,8 +61,8 @@ std::string BusLink::description() const
         return "AUTO";
     }
     Protocol const* chosen = findProtocol(m_number);
-    const std::string name = chosen != nullptr ? chosen->name : others[(m_number - 10) % 3];
-    const std::string comma = m_quirks.has(Quirk::TightDescription) ? "," : ", ";
+    std::string const name = chosen != nullptr ? chosen->name : others[(m_number - 10) % 3];
+    std::string const comma = m_quirks.has(Quirk::TightDescription) ? "," : ", ";
     return m_automatic ? "AUTO" + comma + name : name;
 }
 

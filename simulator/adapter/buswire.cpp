@@ -25,13 +25,13 @@ std::vector<TimedFrame> schedule(Vehicle const& vehicle, std::vector<ModuleMessa
     std::vector<TimedFrame> frames;
     std::map<std::uint32_t, Time> freeAt;
     for (auto const& message : messages) {
-        const std::uint32_t lane = isCan(protocol) ? message.source : 0;
-        const Time gap = message.frameGap.value_or(protocol.frameGap);
+        std::uint32_t const lane = isCan(protocol) ? message.source : 0;
+        Time const gap = message.frameGap.value_or(protocol.frameGap);
         Time time = std::max(at + message.delay, freeAt[lane]);
         for (auto& frame :
              frameReply(protocol, message.source, everyone, message.payload, vehicle.padding(), message.tester)) {
             // Behind a first frame the module awaits the adapter's flow control, and takes its time to heed it.
-            const Time flowControl = canFrameTime(protocol, 8) + 2 * gap;
+            Time const flowControl = canFrameTime(protocol, 8) + 2 * gap;
             bool const waits = isCan(protocol) && isFirstFrame(frame, message.tester.has_value());
             time += isCan(protocol) ? canFrameTime(protocol, frame.data.size())
                                     : receivingTime(protocol, serialBytes(frame));
@@ -55,7 +55,7 @@ bool passes(Protocol const& protocol, Settings const& settings, Frame const& fra
         bool const short11 = protocol.family == BusFamily::Can11;
         return ours && (short11 ? (frame.source & 0x7F8) == 0x7E8 : (frame.source & 0x1FFFFF00) == 0x18DAF100);
     }
-    const std::uint32_t mask = settings.canMask.value_or(0x1FFFFFFF);
+    std::uint32_t const mask = settings.canMask.value_or(0x1FFFFFFF);
     return ours && (frame.source & mask) == (settings.canFilter.value_or(0) & mask);
 }
 
@@ -77,7 +77,7 @@ Bytes headerOf(Protocol const& protocol, Settings const& settings)
 
 bool isPending(Protocol const& protocol, Frame const& frame, bool extended)
 {
-    const std::size_t first = (isCan(protocol) ? 1U : 0U) + (extended ? 1U : 0U);
+    std::size_t const first = (isCan(protocol) ? 1U : 0U) + (extended ? 1U : 0U);
     return frame.data.size() > first + 2 && frame.data[first] == 0x7F && frame.data[first + 2] == 0x78;
 }
 
@@ -102,8 +102,8 @@ void BusWire::forget()
 
 BusReply BusWire::exchange(BusRequest const& request, Settings const& settings, BusReply reply, Time now)
 {
-    const Time begin = free(now + reply.end);
-    const Time sent = send(request, settings, begin);
+    Time const begin = free(now + reply.end);
+    Time const sent = send(request, settings, begin);
     reply.end = sent - now;
     if (settings.responses) {
         listen(request, settings, reply, now, sent);
@@ -122,7 +122,7 @@ Time BusWire::free(Time at) const
 Time BusWire::send(BusRequest const& request, Settings const& settings, Time at)
 {
     Protocol const& bus = m_vehicle->protocol();
-    const Time sent = at + requestTime(bus, request.data.size());
+    Time const sent = at + requestTime(bus, request.data.size());
     m_busyUntil = sent;
     auto const past = [&](TimedFrame const& each) { return each.time <= sent; };
     m_frames.erase(std::remove_if(m_frames.begin(), m_frames.end(), past), m_frames.end());
@@ -150,7 +150,7 @@ Time BusWire::send(BusRequest const& request, Settings const& settings, Time at)
 void BusWire::listen(BusRequest const& request, Settings const& settings, BusReply& reply, Time now, Time sent)
 {
     Protocol const& bus = m_vehicle->protocol();
-    const FrameWriter writer(bus, settings, m_profile.quirks);
+    FrameWriter const writer(bus, settings, m_profile.quirks);
     FrameCounter counter(bus, request.expected, m_profile.quirks);
     Time deadline = sent + settings.timeout();
     std::map<std::uint32_t, Time> promised; // modules that asked for patience, whatever the others say meanwhile

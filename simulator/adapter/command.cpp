@@ -24,7 +24,7 @@ constexpr unsigned int hasBaudRate = all & ~obdPros & ~mask(AdapterFamily::ObdKe
 using namespace handler;
 
 // clang-format off
-const Command commands[] = {
+Command const commands[] = {
     {"@1", "", 100, notDiamex, description},
     {"@2", "", 100, notDiamex & ~elm, identifier},
     {"@2", "", 130, elm, identifier},
@@ -174,9 +174,9 @@ bool knows(AdapterProfile const& profile, Command const& command)
 std::optional<CommandCall> findExact(AdapterProfile const& profile, std::string const& text)
 {
     for (auto const& command : commands) {
-        const std::string_view name = command.name;
+        std::string_view const name = command.name;
         if (text.compare(0, name.size(), name) == 0 && knows(profile, command)) {
-            const std::string argument = text.substr(name.size());
+            std::string const argument = text.substr(name.size());
             if (matches(command.shape, argument)) {
                 return CommandCall{&command, argument};
             }

@@ -7,7 +7,7 @@ namespace {
 /// The PCI byte of a CAN frame, behind the address byte where there is one.
 std::uint8_t pciOf(Frame const& frame, bool extended)
 {
-    const std::size_t at = extended ? 1 : 0;
+    std::size_t const at = extended ? 1 : 0;
     return frame.data.size() > at ? frame.data[at] : std::uint8_t{0};
 }
 
@@ -24,7 +24,7 @@ std::uint32_t automaticFlowHeader(Protocol const& protocol, std::uint32_t reply)
 
 std::uint32_t requestIdentifier(Protocol const& protocol, ModuleData const& module)
 {
-    const std::uint32_t usual = protocol.family == BusFamily::Can11
+    std::uint32_t const usual = protocol.family == BusFamily::Can11
                                     ? module.id - 8
                                     : (module.id & 0xFFFF0000U) | (module.id & 0xFF) << 8 | (module.id >> 8 & 0xFF);
     return module.request.value_or(usual);
@@ -44,13 +44,13 @@ bool isConsecutiveFrame(Frame const& frame, bool extended)
 
 std::size_t promisedFrames(Frame const& frame, bool extended)
 {
-    const std::size_t at = extended ? 1 : 0;
+    std::size_t const at = extended ? 1 : 0;
     if (frame.data.size() < at + 2) {
         return 0;
     }
-    const std::size_t length = (frame.data[at] & 0x0FU) << 8U | frame.data[at + 1];
-    const std::size_t inFirst = 6 - at;
-    const std::size_t inEach = 7 - at;
+    std::size_t const length = (frame.data[at] & 0x0FU) << 8U | frame.data[at + 1];
+    std::size_t const inFirst = 6 - at;
+    std::size_t const inEach = 7 - at;
     return length > inFirst ? (length - inFirst + inEach - 1) / inEach : 0;
 }
 

@@ -27,7 +27,7 @@ FrameWriter::FrameWriter(Protocol const& protocol, Settings const& settings, Qui
 
 std::string FrameWriter::lines(Frame const& frame) const
 {
-    const std::string once = isCan(m_protocol) ? canLines(frame) : serialLine(frame);
+    std::string const once = isCan(m_protocol) ? canLines(frame) : serialLine(frame);
     return m_quirks.has(Quirk::FramesTwice) ? once + once : once;
 }
 
@@ -39,7 +39,7 @@ std::string FrameWriter::canLines(Frame const& frame) const
     }
     // A genuine ELM327 prints every byte that it has received, the padding too (data sheet v2.1, page 41).
     bool const cut = formatting && m_quirks.has(Quirk::PaddingCut);
-    const Bytes data = cut ? withoutPadding(frame.data) : frame.data;
+    Bytes const data = cut ? withoutPadding(frame.data) : frame.data;
     return header(frame) + text(data) + "\r";
 }
 
@@ -53,7 +53,7 @@ std::string FrameWriter::formattedCan(Frame const& whole) const
     if (kind(frame) == singleFrame) {
         return text(from(withoutPadding(frame.data), 1)) + "\r";
     }
-    const std::string blank = m_settings.spaces ? " " : "";
+    std::string const blank = m_settings.spaces ? " " : "";
     if (kind(frame) == firstFrame) {
         auto const length = static_cast<std::uint32_t>((frame.data[0] & 0x0F) << 8 | frame.data[1]);
         return hexNumber(length, 3) + "\r0:" + blank + text(from(frame.data, 2)) + "\r";
@@ -78,7 +78,7 @@ std::string FrameWriter::serialLine(Frame const& frame) const
 /// The identifier of a CAN frame: three digits for 11 bits, four bytes for 29.
 std::string FrameWriter::header(Frame const& frame) const
 {
-    const std::string blank = m_settings.spaces ? " " : "";
+    std::string const blank = m_settings.spaces ? " " : "";
     std::string id = m_protocol.family == BusFamily::Can11 ? hexNumber(frame.source, 3) + blank : text(frame.header);
     if (!m_settings.lengths) {
         return id;
@@ -88,7 +88,7 @@ std::string FrameWriter::header(Frame const& frame) const
 
 std::string FrameWriter::text(Bytes const& bytes) const
 {
-    const std::string separator = m_quirks.has(Quirk::BytePerLine) ? "\r" : m_settings.spaces ? " " : "";
+    std::string const separator = m_quirks.has(Quirk::BytePerLine) ? "\r" : m_settings.spaces ? " " : "";
     std::string line;
     for (auto const byte : bytes) {
         line += hexByte(byte) + separator;
@@ -106,7 +106,7 @@ Bytes FrameWriter::withoutPadding(Bytes const& data) const
     if (data.empty() || data[0] >> 4 != singleFrame || m_quirks.has(Quirk::PaddingShown)) {
         return data;
     }
-    const std::size_t size = std::min<std::size_t>(data.size(), 1 + (data[0] & 0x0FU));
+    std::size_t const size = std::min<std::size_t>(data.size(), 1 + (data[0] & 0x0FU));
     return {data.begin(), data.begin() + static_cast<std::ptrdiff_t>(size)};
 }
 

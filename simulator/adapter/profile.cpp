@@ -10,7 +10,7 @@ namespace {
 constexpr char const* elmDescription = "OBDII to RS232 Interpreter";
 
 // clang-format off
-const AdapterProfile profiles[] = {
+AdapterProfile const profiles[] = {
     {"elm327-v1.5", AdapterFamily::Elm, "ELM327 v1.5", elmDescription, "", 142, "", {Quirk::PaddingCut}},
     {"elm327-v1.2", AdapterFamily::Elm, "ELM327 v1.2", elmDescription, "", 120, "", {}},
     {"elm327-v1.3a", AdapterFamily::Elm, "ELM327 v1.3a", elmDescription, "", 131, "", {}},
@@ -55,7 +55,7 @@ std::string upperCase(std::string text)
 
 AdapterProfile const& familyProfile(std::string const& banner)
 {
-    const std::string text = upperCase(banner);
+    std::string const text = upperCase(banner);
     for (auto const& row : familyWords) {
         if (text.find(row.word) != std::string::npos) {
             return *findProfile(row.key);

@@ -16,7 +16,7 @@ Time ReplyTimer::wait(Settings const& settings) const
     if (settings.adaptiveTiming == 0 || !m_slowest) {
         return settings.timeout();
     }
-    const Time adapted = settings.adaptiveTiming == 1 ? *m_slowest * 3 / 2 : *m_slowest * 6 / 5;
+    Time const adapted = settings.adaptiveTiming == 1 ? *m_slowest * 3 / 2 : *m_slowest * 6 / 5;
     return std::min(adapted, settings.timeout());
 }
 

@@ -59,15 +59,15 @@ Frame canFrame(Protocol const& protocol, std::uint32_t source, Tester first, Byt
 std::vector<Frame> canReply(Protocol const& protocol, std::uint32_t source, Bytes const& payload, Padding padding,
                             Tester own)
 {
-    const std::size_t address = own ? 1 : 0;
+    std::size_t const address = own ? 1 : 0;
     if (payload.size() + address <= nextFramePayload) {
         auto const length = static_cast<std::uint8_t>(payload.size());
         return {canFrame(protocol, source, own, {length}, payload, padding)};
     }
-    const Bytes lengthPci = {static_cast<std::uint8_t>(0x10 | payload.size() >> 8),
+    Bytes const lengthPci = {static_cast<std::uint8_t>(0x10 | payload.size() >> 8),
                              static_cast<std::uint8_t>(payload.size() & 0xFF)};
-    const std::size_t first = firstFramePayload - address;
-    const std::size_t next = nextFramePayload - address;
+    std::size_t const first = firstFramePayload - address;
+    std::size_t const next = nextFramePayload - address;
     std::vector<Frame> frames = {canFrame(protocol, source, own, lengthPci, slice(payload, 0, first), std::nullopt)};
     std::uint8_t sequence = 1;
     for (std::size_t at = first; at < payload.size(); at += next) {
@@ -126,18 +126,18 @@ std::optional<Target> target11(std::uint32_t id)
 std::optional<Target> target29(std::uint32_t id)
 {
     // ISO 15765-4: functional 18 DB tt ss, physical 18 DA tt ss; the reply swaps them.
-    const std::uint32_t kind = id >> 16 & 0xFF;
+    std::uint32_t const kind = id >> 16 & 0xFF;
     if (kind == 0xDB) {
         return Target{true, 0, id};
     }
     // Other identifiers reach a module that listens to them.
-    const std::uint32_t reply = (id & 0xFFFF0000U) | (id & 0xFF) << 8 | (id >> 8 & 0xFF);
+    std::uint32_t const reply = (id & 0xFFFF0000U) | (id & 0xFF) << 8 | (id >> 8 & 0xFF);
     return Target{false, kind == 0xDA ? reply : 0, id};
 }
 
 std::optional<Target> targetOnWire(Protocol const& protocol, Bytes const& header)
 {
-    const Bytes standard = functionalHeader(protocol);
+    Bytes const standard = functionalHeader(protocol);
     bool const functionalKwp = protocol.family == BusFamily::Kwp && header[0] >= 0xC0;
     if (functionalKwp || (header[0] == standard[0] && header[1] == standard[1])) {
         return Target{true, 0};

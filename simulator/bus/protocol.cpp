@@ -58,7 +58,7 @@ Time receivingTime(Protocol const& protocol, std::size_t bytes)
 Time canFrameTime(Protocol const& protocol, std::size_t dataBytes)
 {
     // ISO 11898-1: all but the data, with the three bits between two frames.
-    const std::size_t frameBits = protocol.family == BusFamily::Can11 ? 47 : 67;
+    std::size_t const frameBits = protocol.family == BusFamily::Can11 ? 47 : 67;
     auto const bits = static_cast<Time::rep>(frameBits + dataBytes * 8);
     return microseconds(bits * 1000 / protocol.kilobaud);
 }

@@ -75,7 +75,7 @@ Answer currentData(ServiceCall const& call)
     }
     Bytes message = {call.positiveService()};
     for (std::size_t i = 1; i <= count && i < call.request.size(); ++i) {
-        const std::uint8_t pid = call.request[i];
+        std::uint8_t const pid = call.request[i];
         if (auto const data = currentItem(call, pid)) {
             message.push_back(pid);
             message.insert(message.end(), data->begin(), data->end());

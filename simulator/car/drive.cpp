@@ -105,7 +105,7 @@ void Drive::startEngine(Time now)
     if (!m_stoppedAt) {
         return;
     }
-    const DriveState reached = DriveModel(m_engine).at(*m_stoppedAt - m_start);
+    DriveState const reached = DriveModel(m_engine).at(*m_stoppedAt - m_start);
     m_engine.startCoolantCelsius = reached.coolantCelsius;
     m_engine.startOdometerKm = reached.odometerKm;
     m_engine.startFuelPercent = reached.fuelLevelPercent;

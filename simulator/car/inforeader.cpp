@@ -21,7 +21,7 @@ std::string layOutName(std::string const& text)
 {
     constexpr std::size_t acronymSize = 4;
     std::string acronym = text.substr(0, text.find('-'));
-    const std::string rest = text.substr(acronym.size());
+    std::string const rest = text.substr(acronym.size());
     acronym.resize(std::max(acronymSize, acronym.size()), '\0');
     return acronym + rest;
 }

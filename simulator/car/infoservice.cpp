@@ -38,7 +38,7 @@ Item numberItem(std::uint8_t id, std::string const& text, bool onCan)
 {
     constexpr std::size_t onCanSize = 17;
     constexpr std::size_t onLinesSize = 20;
-    const Bytes data = rightAligned(characters(text), onCanSize);
+    Bytes const data = rightAligned(characters(text), onCanSize);
     return {id, 1, onCan ? data : rightAligned(data, onLinesSize)};
 }
 
@@ -57,7 +57,7 @@ Item calibrationsItem(std::vector<std::string> const& calibrations)
     constexpr std::size_t size = 16;
     Item item{0x04, static_cast<std::uint8_t>(calibrations.size()), {}};
     for (auto const& calibration : calibrations) {
-        const Bytes data = resized(characters(calibration), size);
+        Bytes const data = resized(characters(calibration), size);
         item.data.insert(item.data.end(), data.begin(), data.end());
     }
     return item;
@@ -117,7 +117,7 @@ std::set<std::uint8_t> ids(std::vector<Item> const& items, bool onCan)
 
 Answer tellItem(ServiceCall const& call, Item const& item)
 {
-    const Bytes head = {call.positiveService(), item.id};
+    Bytes const head = {call.positiveService(), item.id};
     if (call.onCan()) {
         Bytes message = head;
         message.push_back(item.count);
@@ -125,7 +125,7 @@ Answer tellItem(ServiceCall const& call, Item const& item)
         return {0, {message}};
     }
     Answer answer;
-    const Bytes data = resized(item.data, lineCount(item) * lineData);
+    Bytes const data = resized(item.data, lineCount(item) * lineData);
     for (std::size_t line = 0; line < lineCount(item); ++line) {
         Bytes message = head;
         message.push_back(static_cast<std::uint8_t>(line + 1));

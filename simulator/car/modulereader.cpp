@@ -105,11 +105,11 @@ void readTestsOf(ModuleData& module, TableReader& table, bool onCan)
     table.tables("monitor_tests",
                  [&](TableReader& test) { module.monitorTests.push_back(readMonitorTest(test, onCan)); });
     table.tables("sensor_tests", [&](TableReader& test) {
-        const std::uint8_t id = test.byte("test");
+        std::uint8_t const id = test.byte("test");
         module.sensorTests.push_back({id, test.byte("sensor"), test.bytes("value")});
     });
     table.tables("routines", [&](TableReader& routine) {
-        const std::uint8_t id = routine.byte("id");
+        std::uint8_t const id = routine.byte("id");
         module.routines[id] = readRoutine(routine);
     });
 }
@@ -117,10 +117,10 @@ void readTestsOf(ModuleData& module, TableReader& table, bool onCan)
 void readRecordedOf(ModuleData& module, TableReader& table)
 {
     table.table("raw", [&](TableReader& raw) {
-        raw.entries([&](const Bytes& request, const std::vector<Bytes>& messages) { module.raw[request] = messages; });
+        raw.entries([&](Bytes const& request, std::vector<Bytes> const& messages) { module.raw[request] = messages; });
     });
     table.table("delays", [&](TableReader& delays) {
-        delays.tableEntries([&](const Bytes& request, TableReader& delay) {
+        delays.tableEntries([&](Bytes const& request, TableReader& delay) {
             module.delays[request] = {delay.integer("times", 0, 100, 1),
                                       Ms(delay.integer("milliseconds", 0, longestDelayMs, 100))};
         });
@@ -129,9 +129,9 @@ void readRecordedOf(ModuleData& module, TableReader& table)
 
 std::uint32_t readId(TableReader& table, Protocol const& protocol, std::string const& key)
 {
-    const std::string text = table.text(key);
+    std::string const text = table.text(key);
     auto const id = parseHexNumber(text);
-    const std::size_t digits = protocol.family == BusFamily::Can11 ? 3 : protocol.family == BusFamily::Can29 ? 8 : 2;
+    std::size_t const digits = protocol.family == BusFamily::Can11 ? 3 : protocol.family == BusFamily::Can29 ? 8 : 2;
     if (!id || text.size() != digits) {
         table.fail(key, "\"" + key + "\" must have " + std::to_string(digits) + " hexadecimal digits on this bus");
     }
@@ -152,7 +152,7 @@ void readAddressOf(ModuleData& module, TableReader& table, Protocol const& proto
 
 MorePids readMorePids(TableReader& table, bool onCan)
 {
-    const std::string text = table.text("more_pids", onCan ? "first" : "silence");
+    std::string const text = table.text("more_pids", onCan ? "first" : "silence");
     if (text == "silence") {
         return MorePids::Silence;
     }

@@ -47,7 +47,7 @@ constexpr MonitorName monitorNames[] = {
 
 bool markMonitor(std::string const& name, bool compression, bool incomplete, MonitorBits& bits)
 {
-    const Engine engine = compression ? Engine::Compression : Engine::Spark;
+    Engine const engine = compression ? Engine::Compression : Engine::Spark;
     auto const row = std::find_if(std::begin(monitorNames), std::end(monitorNames), [&](MonitorName const& m) {
         return m.name == name && (m.engine == Engine::Any || m.engine == engine);
     });
@@ -63,7 +63,7 @@ bool markMonitor(std::string const& name, bool compression, bool incomplete, Mon
 std::optional<std::uint16_t> parseCode(std::string const& text)
 {
     constexpr std::size_t codeSize = 5;
-    const std::string systems = "PCBU";
+    std::string const systems = "PCBU";
     auto const system = text.size() == codeSize ? systems.find(text[0]) : std::string::npos;
     auto const number = parseHexNumber(std::string_view(text).substr(std::min<std::size_t>(1, text.size())));
     if (system == std::string::npos || !number || *number > 0x3FFF) {

@@ -16,7 +16,7 @@ bool hasSignals(ModuleData const& data)
     return first != data.signals.end() && first->first[0] == service;
 }
 
-const Service services[] = {
+Service const services[] = {
     {0x01, currentData, [](ModuleData const& d) { return !d.live.empty() || !d.fixed.empty() || d.monitors; }},
     {0x02, freezeFrame, [](ModuleData const& d) { return d.hasStored; }},
     {0x03, storedCodes, [](ModuleData const& d) { return d.hasStored; }},
@@ -73,7 +73,7 @@ std::optional<Bytes> supportedMask(std::set<std::uint8_t> const& ids, std::uint8
         if (id <= base) {
             continue;
         }
-        const std::size_t place = std::min<std::size_t>(static_cast<std::size_t>(id - base), range) - 1;
+        std::size_t const place = std::min<std::size_t>(static_cast<std::size_t>(id - base), range) - 1;
         mask[place / 8] |= static_cast<std::uint8_t>(0x80 >> place % 8);
     }
     return mask;
@@ -95,7 +95,7 @@ std::optional<std::uint8_t> rangeFiller(std::uint8_t service)
 
 Answer tellRange(ServiceCall const& call, std::set<std::uint8_t> const& ids)
 {
-    const std::uint8_t base = call.request[1];
+    std::uint8_t const base = call.request[1];
     auto const mask = ids.empty() ? std::nullopt : supportedMask(ids, base);
     if (!mask) {
         return {};

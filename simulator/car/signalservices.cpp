@@ -25,7 +25,7 @@ void put(Bytes& data, SignalField const& field, double value)
 Bytes dataOf(ServiceCall const& call, SignalData const& signal)
 {
     Bytes data = signal.data;
-    const DriveState drive = call.module.drive(call.now);
+    DriveState const drive = call.module.drive(call.now);
     for (auto const& field : signal.fields) {
         put(data, field, *Drive::value(drive, field.value) * field.scale + field.offset);
     }
@@ -74,7 +74,7 @@ Answer localData(ServiceCall const& call)
         return {refusal::subfunctionNotSupported, {}};
     }
     Bytes message = {call.positiveService(), call.request[1]};
-    const Bytes data = dataOf(call, found->second);
+    Bytes const data = dataOf(call, found->second);
     message.insert(message.end(), data.begin(), data.end());
     return {0, {message}};
 }

@@ -88,7 +88,7 @@ Bytes TableReader::bytes(std::string_view key)
 std::uint8_t TableReader::byte(std::string_view key)
 {
     toml::node const& node = need(key);
-    const Bytes value = hex(node);
+    Bytes const value = hex(node);
     if (value.size() != 1) {
         failAt(node, quoted(key) + " must be one byte of two hexadecimal digits");
     }
@@ -204,7 +204,7 @@ toml::node const& TableReader::need(std::string_view key)
 /// The array at `key`, an empty one if the key is missing.
 toml::array const& TableReader::array(std::string_view key, std::string const& ofWhat)
 {
-    static const toml::array none;
+    static toml::array const none;
     toml::node const* node = find(key);
     if (node != nullptr && !node->is_array()) {
         failAt(*node, quoted(key) + " must be an array of " + ofWhat);

@@ -27,7 +27,7 @@ SignalField readField(TableReader& table, std::size_t size)
 
 void readSignal(ModuleData& module, TableReader& table)
 {
-    const Bytes request = table.bytes("request");
+    Bytes const request = table.bytes("request");
     bool const local = request.size() == 2 && (request[0] == 0x21 || request[0] == 0x1A);
     bool const identifier = request.size() == 3 && request[0] == 0x22;
     if (!local && !identifier) {
@@ -49,13 +49,13 @@ void readUdsOf(ModuleData& module, TableReader& table)
     module.uds = table.flag("uds", false);
     table.tables("signals", [&](TableReader& signal) { readSignal(module, signal); });
     table.tables("uds_codes", [&](TableReader& code) {
-        const std::uint16_t number = readCode(code, "code", code.text("code"));
-        const std::uint8_t type = code.byte("type");
+        std::uint16_t const number = readCode(code, "code", code.text("code"));
+        std::uint8_t const type = code.byte("type");
         module.udsCodes.push_back({number, type, code.byte("status")});
     });
     module.hasKwpCodes = table.has("kwp_codes");
     table.tables("kwp_codes", [&](TableReader& code) {
-        const std::uint16_t number = readCode(code, "code", code.text("code"));
+        std::uint16_t const number = readCode(code, "code", code.text("code"));
         module.kwpCodes.push_back({number, code.byte("status")});
     });
     table.table("refusals", [&](TableReader& refusals) {

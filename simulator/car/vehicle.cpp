@@ -50,7 +50,7 @@ void tell(std::vector<ModuleMessage>& messages, Module& module, bool everyone, B
         return;
     }
     ModuleData const& data = module.data();
-    const Pending pending = pendingOf(data, request);
+    Pending const pending = pendingOf(data, request);
     Time delay = data.latency + (pending.times == 0 ? pending.delay : Time(0));
     auto const say = [&](Bytes payload) {
         auto const tester = data.address ? std::optional(data.tester) : std::nullopt;
@@ -74,7 +74,7 @@ Vehicle::Vehicle(VehicleData const& data)
     : m_name(data.name), m_protocol(protocolOf(data)), m_padding(data.padding), m_addressPause(data.addressPause),
       m_volts(data.volts), m_drive(data.engine)
 {
-    const DataLayout layout = isCan(m_protocol) ? DataLayout::Can : DataLayout::Numbered;
+    DataLayout const layout = isCan(m_protocol) ? DataLayout::Can : DataLayout::Numbered;
     for (auto const& module : data.modules) {
         m_modules.emplace_back(module, data.engine.compression, m_drive, layout);
     }

@@ -9,7 +9,7 @@ namespace {
 EngineData readEngine(TableReader& table)
 {
     EngineData engine;
-    const std::string fuel = table.text("fuel", "petrol");
+    std::string const fuel = table.text("fuel", "petrol");
     if (fuel != "petrol" && fuel != "diesel") {
         table.fail("fuel", "\"fuel\" must be \"petrol\" or \"diesel\"");
     }
@@ -56,7 +56,7 @@ VehicleData readVehicle(TableReader& table)
 VehicleData parseVehicle(std::string_view text, std::string const& origin)
 {
     try {
-        const toml::table table = toml::parse(text, std::string_view(origin));
+        toml::table const table = toml::parse(text, std::string_view(origin));
         TableReader reader(table, origin, "the vehicle");
         VehicleData vehicle = readVehicle(reader);
         reader.finish();

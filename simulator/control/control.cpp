@@ -10,7 +10,7 @@ Control::Control(Vehicle& vehicle, FaultyPeer& wire, RequestLog const& requests)
 
 std::vector<Control::Command> const& Control::commands()
 {
-    static const std::vector<Command> all = {
+    static std::vector<Command> const all = {
         {{"ignition on|off", "off: no module answers, a CAN bus gives CAN ERROR"}, true, &Control::ignition},
         {{"engine start|stop", "stopped: nothing turns, the battery is alone; started: the drive begins anew"},
          true,
@@ -70,7 +70,7 @@ std::string Control::follow(std::string const& line, Time now)
     if (isEmptyControlLine(line)) {
         return "";
     }
-    const Words words = controlWords(line);
+    Words const words = controlWords(line);
     return (this->*find(words).follow)(words, now);
 }
 

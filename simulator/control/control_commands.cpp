@@ -11,7 +11,7 @@ namespace {
 
 std::string idText(Module const& module)
 {
-    const std::uint32_t id = module.data().id;
+    std::uint32_t const id = module.data().id;
     return hexNumber(id, id > 0xFFF ? 8 : id > 0xFF ? 3 : 2);
 }
 
@@ -63,7 +63,7 @@ std::string Control::set(Words const& words, Time /*now*/)
     if (!code) {
         failAtWord(words, 1, "a trouble code such as P0420");
     }
-    const std::string kind = words.size() > 2 ? words[2] : "stored";
+    std::string const kind = words.size() > 2 ? words[2] : "stored";
     Module& target = moduleAt(words, 3);
     target.addCode(kind == "stored"    ? CodeKind::Stored
                    : kind == "pending" ? CodeKind::Pending
@@ -133,7 +133,7 @@ std::string Control::fault(Words const& words, Time /*now*/)
         m_wire.clear();
         return "";
     }
-    const std::string next = "@next";
+    std::string const next = "@next";
     if (auto const at = text.rfind(next); at != std::string::npos) {
         text.replace(at, next.size(), "@1");
     }

@@ -52,10 +52,10 @@ bool isEmptyControlLine(std::string const& line)
 
 void checkForm(ControlForm const& form, std::vector<std::string> const& words)
 {
-    const std::vector<std::string> wanted = controlWords(form.form);
+    std::vector<std::string> const wanted = controlWords(form.form);
     for (std::size_t i = 1; i < wanted.size(); ++i) {
         bool const optional = wanted[i].front() == '[';
-        const std::string want = withoutBrackets(wanted[i]);
+        std::string const want = withoutBrackets(wanted[i]);
         if (i >= words.size()) {
             if (optional) {
                 return;
@@ -85,7 +85,7 @@ std::string joinFrom(std::vector<std::string> const& words, std::size_t index)
 
 void failAtWord(std::vector<std::string> const& words, std::size_t index, std::string const& expected)
 {
-    const std::string there = index < words.size() ? "is \"" + words[index] + "\"" : "is missing";
+    std::string const there = index < words.size() ? "is \"" + words[index] + "\"" : "is missing";
     throw ControlError("word " + std::to_string(index + 1) + " " + there + "; here belongs " + expected);
 }
 

@@ -22,12 +22,12 @@ std::string restOf(std::string const& line)
 
 ScenarioLine parseLine(std::string const& line, Time before)
 {
-    const std::vector<std::string> words = controlWords(line);
+    std::vector<std::string> const words = controlWords(line);
     auto const seconds = parseDecimal(words[0]);
     if (!seconds || *seconds < 0 || *seconds > longestSeconds) {
         failAtWord(words, 0, "the seconds since the beginning");
     }
-    const Time time(std::llround(*seconds * static_cast<double>(perSecond)));
+    Time const time(std::llround(*seconds * static_cast<double>(perSecond)));
     if (time < before) {
         failAtWord(words, 0, "a time that is not before that of the line above");
     }
@@ -51,7 +51,7 @@ std::vector<ScenarioLine> parseScenario(std::string const& text, std::string con
         if (isEmptyControlLine(line)) {
             continue;
         }
-        const std::string place = origin + ":" + std::to_string(number);
+        std::string const place = origin + ":" + std::to_string(number);
         try {
             lines.push_back(parseLine(line, lines.empty() ? Time(0) : lines.back().time));
             lines.back().place = place;

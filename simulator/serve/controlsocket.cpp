@@ -85,7 +85,7 @@ public:
         : m_acceptor(context), m_handler(std::move(handler))
     {
         try {
-            const tcp::endpoint endpoint(asio::ip::address_v4::loopback(), port);
+            tcp::endpoint const endpoint(asio::ip::address_v4::loopback(), port);
             m_acceptor.open(endpoint.protocol());
             m_acceptor.set_option(tcp::acceptor::reuse_address(true));
             m_acceptor.bind(endpoint);
@@ -177,7 +177,7 @@ private:
         if (isEmptyControlLine(line)) {
             return;
         }
-        const std::string reply = controlReply(m_handler, line, m_number);
+        std::string const reply = controlReply(m_handler, line, m_number);
         std::FILE* const stream = reply.starts_with("error: ") ? stderr : stdout;
         std::fputs(reply.c_str(), stream);
         std::fflush(stream);

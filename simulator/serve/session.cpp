@@ -22,7 +22,7 @@ struct TcpListen
 
 std::optional<TcpListen> parseListen(std::string const& text)
 {
-    const std::string scheme = "tcp://";
+    std::string const scheme = "tcp://";
     auto const colon = text.rfind(':');
     if (!text.starts_with(scheme) || colon < scheme.size()) {
         return std::nullopt;
@@ -119,7 +119,7 @@ private:
         std::string answer;
         loop.atOnce([&] {
             for (auto const& car : m_cars) {
-                const std::string own = car->control(line);
+                std::string const own = car->control(line);
                 answer = car == m_cars.front() ? own : answer;
             }
         });

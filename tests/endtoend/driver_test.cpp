@@ -44,7 +44,7 @@ struct CarCase
     std::set<unsigned int> modules;
 };
 
-const CarCase carCases[] = {
+CarCase const carCases[] = {
     {"petrol-pwm", obd::ObdProtocolJ1850, {0x10}},
     {"petrol-vpw", obd::ObdProtocolJ1850, {0x10, 0x18}},
     {"petrol-iso9141", obd::ObdProtocolIso9141, {0x10}},
@@ -202,7 +202,7 @@ struct ReplayCase
 };
 
 // Recordings that hold enough for a whole bring-up.
-const ReplayCase replayCases[] = {
+ReplayCase const replayCases[] = {
     {"kwpfast-van-2005-stn", obd::ObdProtocolIso14230, {0x12}},
     {"kwpfast-bmw-two-modules", obd::ObdProtocolIso14230, {0x12, 0x18}},
     {"kwpfast-espace-empty-mask", obd::ObdProtocolIso14230, {0x7A}},

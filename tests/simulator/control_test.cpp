@@ -60,7 +60,7 @@ TEST(Control, engineStopsAndBeginsAnewWithWhatItHasReached)
     Simulator car = awake();
     car.control("module 7E9 silent");
     car.advance(std::chrono::seconds(60));
-    const std::string odometer = car.ask("01A61");
+    std::string const odometer = car.ask("01A61");
     car.control("engine stop");
     EXPECT_EQ(car.ask("010C1").substr(0, 8), "410C0000");
     EXPECT_EQ(car.ask("010D1").substr(0, 6), "410D00");
@@ -144,7 +144,7 @@ TEST(Control, requestsAreCounted)
     ASSERT_EQ(car.requests().size(), 6U);
     EXPECT_EQ(car.requests()[4].text, "010C");
     EXPECT_GT(car.requests()[5].time, car.requests()[4].time);
-    const std::string told = car.control("requests");
+    std::string const told = car.control("requests");
     EXPECT_EQ(told.substr(0, 9), "6 in all\n");
     EXPECT_NE(told.find("2 010C\n"), std::string::npos) << told;
 }
@@ -157,7 +157,7 @@ struct MistakeCase
 
 TEST(Control, mistakesNameTheWordAndWhatBelongsThere)
 {
-    const MistakeCase cases[] = {
+    MistakeCase const cases[] = {
         {"fly", "word 1 is \"fly\"; here belongs a command; help lists them"},
         {"ignition", "word 2 is missing; here belongs on or off"},
         {"ignition maybe", "word 2 is \"maybe\"; here belongs on or off"},
@@ -193,9 +193,9 @@ TEST(Control, mistakesNameTheWordAndWhatBelongsThere)
 
 TEST(Control, helpTellsEveryFormAndSoDoesTheGuide)
 {
-    const std::string help = obdsim::simulateCar({})->control("help");
+    std::string const help = obdsim::simulateCar({})->control("help");
     std::ifstream file(VELMORA_SOURCE_DIR "/docs/simulator.md");
-    const std::string guide((std::istreambuf_iterator<char>(file)), std::istreambuf_iterator<char>());
+    std::string const guide((std::istreambuf_iterator<char>(file)), std::istreambuf_iterator<char>());
     for (auto const& each : obdsim::Control::forms()) {
         EXPECT_NE(help.find(std::string(each.form) + " "), std::string::npos) << each.form;
         EXPECT_NE(guide.find("\n" + std::string(each.form) + "\n"), std::string::npos) << each.form;
@@ -226,7 +226,7 @@ TEST(Scenario, linesAreReadAndMistakesNameTheirPlace)
     EXPECT_EQ(obdsim::parseScenario("0 clear\n10000000 clear\n", "x").size(), 2U);
     EXPECT_EQ(lines[1].time, Ms(2000));
     EXPECT_EQ(obdsim::formatScenario(lines), "0.500000 ignition off\n2.000000 voltage 11.8 \n");
-    const MistakeCase cases[] = {
+    MistakeCase const cases[] = {
         {"soon clear", "x:1: word 1 is \"soon\"; here belongs the seconds since the beginning"},
         {"10000000.1 clear", "x:1: word 1 is \"10000000.1\"; here belongs the seconds since the beginning"},
         {"-1 clear", "x:1: word 1 is \"-1\"; here belongs the seconds since the beginning"},
@@ -281,17 +281,17 @@ std::string runOf(Simulator& car, bool typing)
 TEST(Scenario, whatWasTypedRunsAgainBitForBit)
 {
     Simulator typed;
-    const std::string first = runOf(typed, true);
+    std::string const first = runOf(typed, true);
     EXPECT_NE(first.find("CAN ERROR"), std::string::npos);
     EXPECT_NE(first.find("41 0D 21"), std::string::npos);
-    const ScenarioFile file(typed.scenario());
+    ScenarioFile const file(typed.scenario());
     Options options;
     options.scenario = file.path();
     Simulator again(options);
     EXPECT_EQ(runOf(again, false), first);
-    const ScenarioFile wrong("1 module 999 silent\n");
+    ScenarioFile const wrong("1 module 999 silent\n");
     try {
-        const Simulator never(
+        Simulator const never(
             Options{.vehicle = "petrol-can11", .adapter = "elm327-v1.5", .faults = {}, .scenario = wrong.path()});
         ADD_FAILURE();
     } catch (velmora::sim::Error const& error) {
@@ -302,7 +302,7 @@ TEST(Scenario, whatWasTypedRunsAgainBitForBit)
 /// Each control line that changes something, and what a host gets meanwhile.
 TEST(Scenario, everyControlLineRepeatsBitForBit)
 {
-    const std::vector<std::string> lines = {
+    std::vector<std::string> const lines = {
         "set P0420 pending",  "hold speed 90", "voltage 11.8",      "value 7E8 0C 3000", "engine stop", "engine start",
         "ignition off",       "ignition on",   "module 7E9 silent", "fault prompt@next", "clear",       "fault none",
         "fault garbage=0.05", "loss"};
@@ -325,12 +325,12 @@ TEST(Scenario, everyControlLineRepeatsBitForBit)
         return said + (car.linkIsUp() ? "up" : "lost");
     };
     Simulator typed({.vehicle = "petrol-can11", .adapter = "elm327-v1.5", .faults = {"seed=3"}});
-    const std::string first = run(typed, true);
+    std::string const first = run(typed, true);
     EXPECT_EQ(untried, (std::set<std::string>{"help", "requests"})) << "these change nothing";
     for (char const* part : {"47 02 03 00 04 20", "41 0D 5A", "11.8V", "41 0C 30 00", "CAN ERROR", "lost"}) {
         EXPECT_NE(first.find(part), std::string::npos) << part;
     }
-    const ScenarioFile file(typed.scenario());
+    ScenarioFile const file(typed.scenario());
     for (int i = 0; i < 2; ++i) {
         Simulator again(Options{
             .vehicle = "petrol-can11", .adapter = "elm327-v1.5", .faults = {"seed=3"}, .scenario = file.path()});

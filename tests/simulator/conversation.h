@@ -35,7 +35,7 @@ public:
 
     std::string listen()
     {
-        const obdsim::Time start = m_peer->now();
+        obdsim::Time const start = m_peer->now();
         std::string text;
         while (auto const next = m_peer->nextOutput()) {
             text += m_peer->advanceTo(*next);

@@ -15,11 +15,11 @@ using obdsim::Ms;
 using obdsim::parseDialogue;
 using obdsim::Time;
 
-const std::string head = "vehicle: car\nadapter: ELM327 v2.3\nprotocol: 5\nheaders: on\n\n";
+std::string const head = "vehicle: car\nadapter: ELM327 v2.3\nprotocol: 5\nheaders: on\n\n";
 
 TEST(Dialogue, isReadWithEscapesAndPauses)
 {
-    const Dialogue dialogue =
+    Dialogue const dialogue =
         parseDialogue("# a comment\n" + head +
                           "-> ATZ\n<- ATZ\\r\\r\\xFCELM327 v2.3\\r\\r>\n"
                           "# between\n->\n<- SEARCHING...\\r\n<- OK\\r\n.. 800\n<- 86\\x20\\r\\r>\n",
@@ -48,7 +48,7 @@ struct ErrorCase
 
 TEST(Dialogue, malformedFileIsToldWithItsLine)
 {
-    const ErrorCase cases[] = {
+    ErrorCase const cases[] = {
         {"", "a.dialogue:0: the header has no end"},
         {"vehicle: car\n", "a.dialogue:1: the header has no end"},
         {"vehicle car\n", "a.dialogue:1: a header line is"},
@@ -90,7 +90,7 @@ TEST(Dialogue, isWrittenInTheFormThatIsRead)
     dialogue.raw = true;
     dialogue.exchanges = {{"ATI", {{Time(0), "ELM327 v1.5\r\r>"}}},
                           {"", {{Time(0), "A \\\t"}, {Ms(12), std::string(" \0\xFF\n>", 5)}}}};
-    const std::string text = obdsim::formatDialogue(dialogue, {"how it came"});
+    std::string const text = obdsim::formatDialogue(dialogue, {"how it came"});
     EXPECT_EQ(text, "# how it came\nvehicle: car\nadapter: ELM327 v1.5\nprotocol: 6\nheaders: late\nraw: yes\n\n"
                     "-> ATI\n<- ELM327 v1.5\\r\\r>\n->\n<- A \\\\\\t\n.. 12\n<- \\x20\\x00\\xFF\\n>\n");
     EXPECT_EQ(obdsim::formatDialogue(parseDialogue(text, "x"), {"how it came"}), text);
@@ -104,9 +104,9 @@ TEST(Dialogue, everyRecordedOneIsReadAndWrittenBack)
             continue;
         }
         ++count;
-        const Dialogue dialogue = obdsim::loadDialogue(file.path());
+        Dialogue const dialogue = obdsim::loadDialogue(file.path());
         EXPECT_FALSE(dialogue.exchanges.empty()) << file.path();
-        const Dialogue again = parseDialogue(obdsim::formatDialogue(dialogue), "again");
+        Dialogue const again = parseDialogue(obdsim::formatDialogue(dialogue), "again");
         ASSERT_EQ(again.exchanges.size(), dialogue.exchanges.size()) << file.path();
         for (std::size_t i = 0; i < again.exchanges.size(); ++i) {
             EXPECT_EQ(again.exchanges[i].sent, dialogue.exchanges[i].sent) << file.path();

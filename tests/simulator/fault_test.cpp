@@ -55,7 +55,7 @@ TEST(Fault, wrongTextIsToldWithTheFormsThereAre)
             parseFaults({text});
             ADD_FAILURE() << text;
         } catch (FaultError const& error) {
-            const std::string what = error.what();
+            std::string const what = error.what();
             EXPECT_EQ(what.find("fault \"" + std::string(text) + "\": "), 0U) << what;
         }
     }
@@ -67,7 +67,7 @@ TEST(FaultyPeer, sameSeedGivesTheSameGarbage)
         auto host = faulty({"garbage=0.05", "nul=0.02", seed});
         return host.ask("ATZ") + host.ask("ATE0") + host.ask("0100") + host.ask("0902");
     };
-    const std::string first = run("seed=3");
+    std::string const first = run("seed=3");
     EXPECT_EQ(first, run("seed=3"));
     EXPECT_NE(first, run("seed=4"));
     EXPECT_NE(first.find('\0'), std::string::npos);
@@ -94,7 +94,7 @@ TEST(FaultyPeer, outputStallsBeforeAByte)
     auto host = faulty({"stall@14:700"});
     host.ask("ATE0");
     host.peer().receive("ATI\r");
-    const Time start = host.peer().now();
+    Time const start = host.peer().now();
     EXPECT_EQ(host.peer().advanceTo(start + Ms(600)), "ELM");
     EXPECT_EQ(host.peer().advanceTo(start + Ms(704)), "327 v1.5\r\r>");
     host.ask("ATI");
@@ -114,7 +114,7 @@ TEST(FaultyPeer, errorWordTakesThePlaceOfAReply)
     auto host = faulty({"error:BUS BUSY@3"});
     host.ask("ATE0");
     EXPECT_EQ(host.ask("0100").substr(0, 13), "SEARCHING...\r");
-    const Time start = host.peer().now();
+    Time const start = host.peer().now();
     host.peer().receive("0100\r");
     EXPECT_EQ(host.peer().advanceTo(start + Ms(19)), "");
     EXPECT_EQ(host.peer().advanceTo(start + Ms(20)), "BUS BUSY\r\r>");

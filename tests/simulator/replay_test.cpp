@@ -21,7 +21,7 @@ Conversation recorded(std::string const& name)
     return Conversation(obdsim::replay(VELMORA_SOURCE_DIR "/tests/dialogues/" + name + ".dialogue"));
 }
 
-const std::string kwp = "adapter: ELM327 v2.3 on an STN2120\nprotocol: 5\nheaders: on\n";
+std::string const kwp = "adapter: ELM327 v2.3 on an STN2120\nprotocol: 5\nheaders: on\n";
 
 TEST(Replay, servesRepliesInTheirOrderAndThenTheLastAgain)
 {
@@ -80,7 +80,7 @@ TEST(Replay, echoIsTheHostsChoice)
 
 TEST(Replay, missingPromptIsPutInExceptInRawRecordings)
 {
-    const std::string turns = "-> 0100\n<- 4100BE3EA813\\r\n-> 0120\n<- 412080000000\n";
+    std::string const turns = "-> 0100\n<- 4100BE3EA813\\r\n-> 0120\n<- 412080000000\n";
     auto host = replaying("adapter: x\nprotocol: 6\nheaders: off\n", turns);
     host.ask("ATE0");
     EXPECT_EQ(host.ask("0100"), "4100BE3EA813\r\r>");
@@ -95,7 +95,7 @@ TEST(Replay, pausesAreKept)
     auto host = replaying(kwp, "-> 0100\n<- SEARCHING...\\r\n.. 800\n<- 86F1124100983B2013D0\\r\\r>\n");
     host.ask("ATE0");
     host.peer().receive("0100\r");
-    const Time start = host.peer().now();
+    Time const start = host.peer().now();
     EXPECT_EQ(host.peer().advanceTo(start + Ms(799)), "SEARCHING...\r");
     EXPECT_EQ(host.peer().advanceTo(start + Ms(804)), "86F1124100983B2013D0\r\r>");
 }
@@ -179,7 +179,7 @@ struct BringUpCase
 };
 
 // Real cars that a driver can bring up from their recording alone.
-const BringUpCase bringUpCases[] = {
+BringUpCase const bringUpCases[] = {
     {"kwpfast-van-2005-stn", "A5", "86F1124100983B2013D0"},
     {"kwpfast-bmw-two-modules", "A5", "86 F1 18 41 00 80 18 00 11 79"},
     {"kwpfast-espace-empty-mask", "A5", "8"},
@@ -197,7 +197,7 @@ TEST(Replay, realCarsComeUpWithTheCommandsOfADriver)
         for (char const* command : {"ATE0", "ATL0", "ATS0", "ATM0", "ATST64", "ATTP0"}) {
             EXPECT_NE(host.ask(command).find("OK"), std::string::npos) << row.dialogue << " " << command;
         }
-        const std::string probe = host.ask("0100");
+        std::string const probe = host.ask("0100");
         EXPECT_NE(probe.find("41"), std::string::npos) << row.dialogue << ": " << probe;
         EXPECT_EQ(host.ask("ATDPN"), std::string(row.number) + "\r\r>") << row.dialogue;
         EXPECT_NE(host.ask("ATH1").find("OK"), std::string::npos) << row.dialogue;

@@ -189,7 +189,7 @@ TEST(UnsentText, holdsWhatFitsAndTakesMoreWhenItIsRead)
 TEST(TcpServer, portInUseIsTold)
 {
     auto const server = obdsim::serveTcp(obdsim::simulate({}), "127.0.0.1", 0);
-    const std::string address = server->address();
+    std::string const address = server->address();
     auto const port = static_cast<std::uint16_t>(std::stoi(address.substr(address.rfind(':') + 1)));
     try {
         obdsim::serveTcp(obdsim::simulate({}), "127.0.0.1", port);
@@ -217,7 +217,7 @@ TEST(PtyServer, stopsAtOnceAndTakesItsDeviceAway)
 {
     auto server = obdsim::servePseudoTerminal(obdsim::simulate({}));
     server->start();
-    const std::string path = server->address();
+    std::string const path = server->address();
     EXPECT_LT(timeOf([&] { server->stop(); }), milliseconds(200));
     server.reset();
     EXPECT_NE(::access(path.c_str(), F_OK), 0);
@@ -230,7 +230,7 @@ TEST(PtyServer, lostLinkTakesTheDeviceAway)
     server->start();
     Line client(::open(server->address().c_str(), O_RDWR | O_NOCTTY));
     EXPECT_EQ(client.ask("ATE0"), "ATE0\rOK\r\r>");
-    const std::string rest = client.ask("ATI");
+    std::string const rest = client.ask("ATI");
     EXPECT_EQ(rest, std::string("ELM").substr(0, rest.size())) << "the hang-up may take unread bytes with it";
     EXPECT_TRUE(client.ended());
 }

@@ -37,7 +37,7 @@ TEST_F(TextFile, onlyPlainFilesOfABoundedSizeAreRead)
     EXPECT_EQ(obdsim::readTextFile(m_file, 5), "12345");
     EXPECT_EQ(obdsim::readTextFile(m_file, 4), std::nullopt);
     EXPECT_EQ(obdsim::whyNoText(m_file, 4), "it is larger than 0 MiB");
-    for (const std::string path : {"/dev/zero", "/dev/null", "/", m_pipe.c_str()}) {
+    for (std::string const path : {"/dev/zero", "/dev/null", "/", m_pipe.c_str()}) {
         EXPECT_EQ(obdsim::readTextFile(path), std::nullopt) << path;
         EXPECT_EQ(obdsim::whyNoText(path), "it is no plain file") << path;
     }

@@ -20,17 +20,17 @@ public:
     void setDelimiter(char delimiter) override { m_delimiter = delimiter; }
     bool isValid() const override
     {
-        const std::lock_guard lock(m_mutex);
+        std::lock_guard const lock(m_mutex);
         return !m_broken && m_peer->linkIsUp();
     }
 
     bool receive(std::vector<unsigned char>& out, int timeoutMs) override
     {
-        const std::lock_guard lock(m_mutex);
+        std::lock_guard const lock(m_mutex);
         if (m_broken) {
             return false;
         }
-        const obdsim::Time deadline = m_peer->now() + obdsim::Ms(std::max(0, timeoutMs));
+        obdsim::Time const deadline = m_peer->now() + obdsim::Ms(std::max(0, timeoutMs));
         pull(m_peer->now());
         while (m_pending.find(m_delimiter) == std::string::npos) {
             auto const next = m_peer->nextOutput();
@@ -51,7 +51,7 @@ public:
 
     void send(std::vector<unsigned char> const& bytes) override
     {
-        const std::lock_guard lock(m_mutex);
+        std::lock_guard const lock(m_mutex);
         m_peer->receive(std::string(bytes.begin(), bytes.end()));
         for (auto* logger : m_loggers) {
             logger->onDataSent(bytes);
@@ -59,12 +59,12 @@ public:
     }
     void addLogger(obd::IConnectionLogger* logger) override
     {
-        const std::lock_guard lock(m_mutex);
+        std::lock_guard const lock(m_mutex);
         m_loggers.push_back(logger);
     }
     void removeLogger(obd::IConnectionLogger* logger) override
     {
-        const std::lock_guard lock(m_mutex);
+        std::lock_guard const lock(m_mutex);
         auto const found = std::find(m_loggers.begin(), m_loggers.end(), logger);
         if (found != m_loggers.end()) {
             m_loggers.erase(found);
@@ -74,12 +74,12 @@ public:
     /// Time that passes without a word from the host.
     void pass(obdsim::Time time)
     {
-        const std::lock_guard lock(m_mutex);
+        std::lock_guard const lock(m_mutex);
         pull(m_peer->now() + time);
     }
     obdsim::Time now() const
     {
-        const std::lock_guard lock(m_mutex);
+        std::lock_guard const lock(m_mutex);
         return m_peer->now();
     }
     /// The link is gone from here on.
@@ -92,7 +92,7 @@ public:
 private:
     void pull(obdsim::Time time)
     {
-        const std::string bytes = m_peer->advanceTo(time);
+        std::string const bytes = m_peer->advanceTo(time);
         m_bytesReceived += bytes.size();
         m_pending += bytes;
     }

@@ -47,13 +47,13 @@ bool isTroubleCode(std::string_view text)
 
 std::vector<std::string> expandCodes(std::string_view word)
 {
-    const std::size_t dash = word.find('-');
-    const std::string_view first = word.substr(0, dash);
+    std::size_t const dash = word.find('-');
+    std::string_view const first = word.substr(0, dash);
     requireTroubleCode(first);
     if (dash == std::string_view::npos) {
         return {std::string(first)};
     }
-    const std::string_view last = word.substr(dash + 1);
+    std::string_view const last = word.substr(dash + 1);
     requireTroubleCode(last);
     if (first.front() != last.front() || codeNumber(first) >= codeNumber(last)) {
         throw SourceError("the codes of '" + std::string(word) + "' do not rise");

@@ -84,7 +84,7 @@ int main(int argc, char** argv)
         return 2;
     }
     catalogue::Source source = readSources(options.sources);
-    const std::vector<catalogue::Row> table = catalogue::buildTable(source);
+    std::vector<catalogue::Row> const table = catalogue::buildTable(source);
     for (std::string const& problem : source.problems) {
         std::cerr << problem << '\n';
     }

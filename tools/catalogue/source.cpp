@@ -14,8 +14,8 @@ namespace {
 // Takes the first word off a line.
 std::string_view takeWord(std::string_view& line)
 {
-    const std::size_t end = std::min(line.find(' '), line.size());
-    const std::string_view word = line.substr(0, end);
+    std::size_t const end = std::min(line.find(' '), line.size());
+    std::string_view const word = line.substr(0, end);
     line = trim(line.substr(end));
     return word;
 }
@@ -120,7 +120,7 @@ void FileReader::readLine(std::string_view line)
         return;
     }
     std::string_view rest = line;
-    const std::string_view word = takeWord(rest);
+    std::string_view const word = takeWord(rest);
     if (word == "maker") {
         readMaker(rest);
     } else if (word == "list") {
@@ -147,8 +147,8 @@ void FileReader::readMaker(std::string_view name)
 // list NAME = ENTRY | ENTRY | ...
 void FileReader::readList(std::string_view definition)
 {
-    const std::size_t equals = std::min(definition.find('='), definition.size());
-    const std::string_view name = trim(definition.substr(0, equals));
+    std::size_t const equals = std::min(definition.find('='), definition.size());
+    std::string_view const name = trim(definition.substr(0, equals));
     if (name.empty() || equals == definition.size()) {
         throw SourceError("a list reads 'list NAME = ENTRY | ENTRY'");
     }
@@ -163,7 +163,7 @@ void FileReader::readList(std::string_view definition)
 void FileReader::readTwin(std::string_view line)
 {
     constexpr std::string_view except = " except ";
-    const std::size_t end = line.find(except);
+    std::size_t const end = line.find(except);
     Twin twin{currentMaker(), requireMaker(line.substr(0, end)), {}, m_place};
     if (end != std::string_view::npos) {
         line = trim(line.substr(end + except.size()));

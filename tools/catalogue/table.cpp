@@ -43,7 +43,7 @@ private:
 
 void TableBuilder::copyTwin(Twin const& twin)
 {
-    const std::string name(makerName(twin.original));
+    std::string const name(makerName(twin.original));
     if (isTwin(twin.original)) {
         report(twin.place, "'" + name + "' is itself the same as another maker: name that one");
         return;

@@ -46,7 +46,7 @@ public:
             m_blocks.emplace_back();
             m_size = 0;
         }
-        const TextPosition position{m_blocks.size() - 1, m_size};
+        TextPosition const position{m_blocks.size() - 1, m_size};
         m_blocks.back().push_back(text);
         m_size += text.size() + 1;
         m_positions.emplace(text, position);

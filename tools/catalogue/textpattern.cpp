@@ -35,12 +35,12 @@ bool isLetter(std::string_view text)
 // The alternatives of "1-4" or "A-F"; nothing when the group is no range.
 std::optional<Alternatives> expandRange(std::string_view group)
 {
-    const std::size_t dash = group.find('-');
+    std::size_t const dash = group.find('-');
     if (dash == std::string_view::npos) {
         return std::nullopt;
     }
-    const std::string_view first = group.substr(0, dash);
-    const std::string_view last = group.substr(dash + 1);
+    std::string_view const first = group.substr(0, dash);
+    std::string_view const last = group.substr(dash + 1);
     Alternatives entries;
     if (auto const from = parseNumber(first), to = parseNumber(last); from && to) {
         for (unsigned int number = *from; number <= *to; ++number) {
@@ -79,14 +79,14 @@ std::vector<Alternatives> splitPattern(std::string_view pattern, Lists const& li
 {
     std::vector<Alternatives> parts;
     while (!pattern.empty()) {
-        const std::size_t open = pattern.find_first_of("{}");
+        std::size_t const open = pattern.find_first_of("{}");
         if (open != 0) {
             parts.push_back({std::string(pattern.substr(0, open))});
         }
         if (open == std::string_view::npos) {
             break;
         }
-        const std::size_t close = pattern.find_first_of("{}", open + 1);
+        std::size_t const close = pattern.find_first_of("{}", open + 1);
         if (pattern[open] != '{' || close == std::string_view::npos || pattern[close] != '}') {
             throw SourceError("a brace of the family is not closed or not opened");
         }
@@ -102,7 +102,7 @@ std::vector<std::string> splitAlternatives(std::string_view text)
 {
     std::vector<std::string> entries;
     for (std::size_t start = 0; start <= text.size();) {
-        const std::size_t bar = std::min(text.find('|', start), text.size());
+        std::size_t const bar = std::min(text.find('|', start), text.size());
         entries.emplace_back(trim(text.substr(start, bar - start)));
         if (entries.back().empty()) {
             throw SourceError("an entry between bars is empty");
@@ -114,7 +114,7 @@ std::vector<std::string> splitAlternatives(std::string_view text)
 
 std::vector<std::string> expandText(std::string_view pattern, std::size_t count, Lists const& lists)
 {
-    const std::vector<Alternatives> parts = splitPattern(pattern, lists);
+    std::vector<Alternatives> const parts = splitPattern(pattern, lists);
     if (pattern.find('{') == std::string_view::npos) {
         return std::vector<std::string>(count, std::string(pattern));
     }
@@ -132,7 +132,7 @@ std::vector<std::string> expandText(std::string_view pattern, std::size_t count,
         }
     }
     if (texts.size() != count) {
-        const std::string amount = texts.size() > count ? "more" : "only " + std::to_string(texts.size());
+        std::string const amount = texts.size() > count ? "more" : "only " + std::to_string(texts.size());
         throw SourceError("the family has " + std::to_string(count) + " codes but " + amount + " texts");
     }
     return texts;

@@ -8,7 +8,7 @@ namespace catalogue {
 // The text without the blanks at its ends.
 inline std::string_view trim(std::string_view text)
 {
-    const std::size_t first = text.find_first_not_of(' ');
+    std::size_t const first = text.find_first_not_of(' ');
     if (first == std::string_view::npos) {
         return {};
     }

@@ -139,7 +139,7 @@ TEST(DtcTable, GenericCodesStandOnce)
 TEST(DtcTable, TextsArePrintableAndOfTheRightLength)
 {
     for (DtcRow const& row : DtcTable()) {
-        const std::string_view text = row.text;
+        std::string_view const text = row.text;
         EXPECT_TRUE(!text.empty() && text.size() <= 140) << row.code;
         EXPECT_TRUE(std::all_of(text.begin(), text.end(), [](char c) { return c >= ' ' && c <= '~'; })) << text;
         EXPECT_EQ(text.find_first_of("()[]{}#\""), std::string_view::npos) << row.code << ' ' << text;
@@ -196,7 +196,7 @@ TEST(DtcTable, ConditionsThatAreAlikeAreKeptApart)
 
 TEST(DtcTable, GenericSamplesWordForWord)
 {
-    const std::pair<char const*, char const*> samples[] = {
+    std::pair<char const*, char const*> const samples[] = {
         {"B0001", "Driver Frontal Stage 1 Deployment Control"},
         {"C0035", "Right Front Wheel Speed Sensor Supply"},
         {"P0105", "Manifold Absolute Pressure/Barometric Pressure Sensor Circuit"},
@@ -213,7 +213,7 @@ TEST(DtcTable, GenericSamplesWordForWord)
 
 TEST(DtcTable, MakersSamplesWordForWord)
 {
-    const std::array<char const*, 3> samples[] = {
+    std::array<char const*, 3> const samples[] = {
         {"Buick", "P1300]", "Ignitor Circuit"},
         {"Chrysler", "P1000", "Cooling System Heat Valve Control Circuit"},
         {"Dodge", "P1000", "Cooling System Heat Valve Control Circuit"},
@@ -274,7 +274,7 @@ TEST(DtcTable, MakersOfOnePlatformHaveTheSameRows)
 
 TEST(DtcTable, GenericRowsStayInTheControlledRanges)
 {
-    const std::set<std::string> generic = {"P0", "P2", "P3", "U0", "U3", "B0", "B3", "C0"};
+    std::set<std::string> const generic = {"P0", "P2", "P3", "U0", "U3", "B0", "B3", "C0"};
     for (DtcRow const& row : DtcTable()) {
         if (row.maker == 0) {
             EXPECT_EQ(generic.count(std::string(row.code, 2)), 1U) << row.code;
@@ -295,7 +295,7 @@ TEST(DtcTable, AllCodesButTwoAreWellFormed)
 
 TEST(DtcTable, IteratorWalksAllRows)
 {
-    const DtcTable table;
+    DtcTable const table;
     EXPECT_EQ(static_cast<std::size_t>(std::distance(table.begin(), table.end())), DtcTable::size());
     auto second = table.begin();
     EXPECT_EQ((*second++).code, DtcTable::row(0).code);

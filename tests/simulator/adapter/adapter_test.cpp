@@ -106,7 +106,7 @@ TEST(Adapter, tellsItsSettingsInTheFormsOfTheChip)
     EXPECT_EQ(host.ask("ATCS"), "T:00 R:00 \r\r>");
     EXPECT_EQ(host.ask("ATKW"), "1:-- 2:--\r\r>");
     EXPECT_EQ(host.ask("ATIGN"), "ON\r\r>");
-    const std::string parameters = host.ask("ATPPS");
+    std::string const parameters = host.ask("ATPPS");
     EXPECT_EQ(parameters.substr(0, 36), "00:FF F  01:FF F  02:FF F  03:32 F\r0");
     EXPECT_EQ(std::count(parameters.begin(), parameters.end(), '\r'), 13);
     EXPECT_EQ(host.ask({"ATSH8213F0", "ATBD"}), "03 82 13 F0 00 00 00 00 00 00 00 00 00 \r\r>");
@@ -201,7 +201,7 @@ struct FamilyCase
     char const* reply;
 };
 
-const FamilyCase familyCases[] = {
+FamilyCase const familyCases[] = {
     {"obdkey", "ATI", "OBDKey 1.30"},
     {"obdkey", "ATTP0", "?"},
     {"obdkey", "ATSP0", "OK"},
@@ -252,8 +252,8 @@ TEST(Adapter, everyProfileAnswersItsName)
 {
     for (auto const& key : obdsim::profileKeys()) {
         auto host = unplugged(key);
-        const std::string reply = host.ask("ATI");
-        const std::string banner = obdsim::findProfile(key)->banner;
+        std::string const reply = host.ask("ATI");
+        std::string const banner = obdsim::findProfile(key)->banner;
         EXPECT_EQ(reply, key == "silent" ? "" : "ATI\r" + banner + "\r\r>") << key;
     }
 }

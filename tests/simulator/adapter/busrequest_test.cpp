@@ -77,7 +77,7 @@ TEST(BusRequest, expectedCountEndsTheWaiting)
 {
     auto host = ready(twoModules, {"ATS0", "ATSP6"});
     host.ask("0100");
-    const Time whole = host.lastWait();
+    Time const whole = host.lastWait();
     EXPECT_EQ(host.ask("01001"), "4100BE3FA813\r\r>");
     EXPECT_LT(host.lastWait(), whole);
     EXPECT_EQ(host.ask("01002"), "4100BE3FA813\r410098180011\r\r>");
@@ -88,7 +88,7 @@ TEST(BusRequest, silenceLastsAsLongAsTheTimeOut)
 {
     auto host = ready(twoModules, {"ATS0", "ATSP6", "ATST64"});
     EXPECT_EQ(host.ask("015C"), "NO DATA\r\r>");
-    const Time before = std::chrono::microseconds(4222); // the adapter's own time, and a frame of 111 bits
+    Time const before = std::chrono::microseconds(4222); // the adapter's own time, and a frame of 111 bits
     EXPECT_EQ(host.lastWait(), before + 0x64 * std::chrono::microseconds(4096));
     host.ask({"ATST19", "015C"});
     EXPECT_EQ(host.lastWait(), before + 0x19 * std::chrono::microseconds(4096));
@@ -135,7 +135,7 @@ TEST(BusRequest, pendingAnswerKeepsTheAdapterWaiting)
 
 TEST(BusRequest, pendingAnswerIsAwaitedBehindThatOfAnotherModule)
 {
-    const std::string other = R"(
+    std::string const other = R"(
 [[module]]
 id = "7E9"
 latency = 40
@@ -198,7 +198,7 @@ struct SearchCase
     char const* reply; ///< to 0100 with headers, first characters
 };
 
-const SearchCase searchCases[] = {
+SearchCase const searchCases[] = {
     {"petrol-pwm", 1, "SAE J1850 PWM", "41 6B 10 41 00 "},
     {"petrol-vpw", 2, "SAE J1850 VPW", "48 6B 10 41 00 "},
     {"petrol-iso9141", 3, "ISO 9141-2", "48 6B 10 41 00 "},
@@ -215,7 +215,7 @@ TEST(ProtocolSearch, findsEachOfTheNine)
     for (auto const& row : searchCases) {
         for (char const* automatic : {"ATSP0", "ATTP0"}) {
             auto host = simulated(row.vehicle);
-            const std::string reply = host.ask({"ATE0", automatic, "ATH1", "0100"});
+            std::string const reply = host.ask({"ATE0", automatic, "ATH1", "0100"});
             EXPECT_EQ(reply.substr(0, 13), "SEARCHING...\r") << row.vehicle;
             EXPECT_EQ(reply.substr(13, std::string(row.reply).size()), row.reply) << row.vehicle;
             EXPECT_LT(host.lastWait(), Ms(10000)) << row.vehicle;
@@ -256,7 +256,7 @@ struct WrongCase
     char const* reply;
 };
 
-const WrongCase wrongCases[] = {
+WrongCase const wrongCases[] = {
     {"petrol-vpw", "ATSP6", "CAN ERROR"},
     {"petrol-can11", "ATSP8", "CAN ERROR"},
     {"petrol-can11", "ATSP7", "NO DATA"},

@@ -17,7 +17,7 @@ struct LevelCase
 
 TEST(Level, commandsAreKnownFromTheirVersionOn)
 {
-    const LevelCase cases[] = {
+    LevelCase const cases[] = {
         {"KW1", 120},          {"IFR2", 120},       {"D0", 130},          {"CRA7E8", 130}, {"JE", 130},
         {"FE", 131},           {"SS", 140},         {"RD", 140},          {"SD12", 140},   {"IB48", 140},
         {"CSM1", 142},         {"JHF0", 142},       {"CRA", 142},         {"JTM1", 142},   {"AMC", 200},
@@ -92,7 +92,7 @@ TEST(Level, guideTellsEachCommandAndItsVersion)
         obdsim::AdapterProfile profile = *obdsim::findProfile("elm327-v2.3");
         auto const bar = samples.find('|');
         for (auto at = samples.find("`AT"); at != std::string::npos; at = samples.find("`AT", at + 1)) {
-            const std::string command = samples.substr(at + 3, samples.find('`', at + 1) - at - 3);
+            std::string const command = samples.substr(at + 3, samples.find('`', at + 1) - at - 3);
             profile.level = level;
             EXPECT_TRUE(obdsim::findCommand(profile, command)) << line << ": " << command;
             profile.level = level - 1;

@@ -75,7 +75,7 @@ TEST(Quirk, bannerWithJunkAndQuestions)
 {
     EXPECT_EQ(clone(Quirk::JunkBeforeBanner).ask("ATZ"), "ATZ\r\xFC\r\rELM327 v1.5\r\r>");
     EXPECT_EQ(clone(Quirk::QuestionBeforeBanner).ask("ATZ"), "ATZ\r?\r\r\rELM327 v1.5\r\r>");
-    const std::string reply = clone(Quirk::LeftoverQuestions).ask("ATZ");
+    std::string const reply = clone(Quirk::LeftoverQuestions).ask("ATZ");
     EXPECT_EQ(std::count(reply.begin(), reply.end(), '?'), 10);
     EXPECT_EQ(std::count(reply.begin(), reply.end(), '>'), 11);
 }

@@ -161,7 +161,7 @@ TEST(CountDigit, clonesCountMessagesRefuseOrIgnoreIt)
 
 TEST(SeveralPids, modulesTakeThemRefuseOrAnswerTheFirst)
 {
-    const std::string module = R"(
+    std::string const module = R"(
 name = "Choosy"
 protocol = 6
 [[module]]
@@ -196,7 +196,7 @@ TEST(PaddingCut, cloneCutsSingleFramesWithHeadersOn)
 double requestsPerSecond(Conversation& host, std::string const& request)
 {
     constexpr int count = 50;
-    const Time start = host.peer().now();
+    Time const start = host.peer().now();
     for (int i = 0; i < count; ++i) {
         host.ask(request);
     }
@@ -214,7 +214,7 @@ struct RateCase
 
 TEST(Rates, areThoseOfBusModuleAndLine)
 {
-    const RateCase cases[] = {
+    RateCase const cases[] = {
         // P3 stands before each request, P4 between its bytes: SAE J1979 on a K line cannot be faster.
         {"petrol-kwp-fast", {}, "010C1", 7, 8.4},
         {"petrol-iso9141", {}, "010C1", 6, 8.4},

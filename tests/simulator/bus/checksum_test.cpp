@@ -13,7 +13,7 @@ struct Case
 };
 
 // Frames of real cars and bench simulators; the last byte of each is `check`.
-const Case sumCases[] = {
+Case const sumCases[] = {
     {"86 F1 12 41 00 98 3B 20 13", 0xD0},    // KWP, a delivery van of 2005
     {"83 F1 12 41 0D 00", 0xD4},             // the same, speed
     {"87 F1 18 43 00 00 00 00 00 00", 0xD3}, // KWP, no codes
@@ -25,7 +25,7 @@ const Case sumCases[] = {
     {"48 6B 10 43 03 00 03 02 03 03", 0x14}, // ISO 9141-2, misfires
 };
 
-const Case crcCases[] = {
+Case const crcCases[] = {
     {"48 6B 10 43 03 06 03 56 00 00", 0xDC}, // VPW, Dodge Dakota
     {"48 6B 10 43 01 00 02 00 03 00", 0x05}, // VPW, bench
     {"48 6B 18 43 01 01 00 00 00 00", 0x5E}, // VPW, bench

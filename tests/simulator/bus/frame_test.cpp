@@ -75,7 +75,7 @@ TEST(Frame, canLastFrameIsFilledAndThoseBeforeAreFull)
 
 TEST(Frame, canSequenceNumberWrapsFromFifteenToZero)
 {
-    const Bytes payload(6 + 7 * 17, 0x11);
+    Bytes const payload(6 + 7 * 17, 0x11);
     auto const frames = frameReply(*findProtocol(6), 0x7E8, true, payload, std::nullopt);
     ASSERT_EQ(frames.size(), 18U);
     EXPECT_EQ(frames[1].data[0], 0x21);
@@ -92,7 +92,7 @@ TEST(Frame, kwpFormatByteHoldsTheLength)
 
 TEST(Frame, kwpMessageAboveSixtyThreeBytesHasALengthByte)
 {
-    const Bytes payload(64, 0x00);
+    Bytes const payload(64, 0x00);
     auto const frames = frameReply(*findProtocol(5), 0x10, true, payload, std::nullopt);
     EXPECT_EQ(frames[0].header, (Bytes{0x80, 0xF1, 0x10, 0x40}));
 }
@@ -118,7 +118,7 @@ struct TargetCase
     std::uint32_t module;
 };
 
-const TargetCase targetCases[] = {
+TargetCase const targetCases[] = {
     {6, "07 DF", true, 0},
     {6, "07 E0", false, 0x7E8},
     {6, "07 E1", false, 0x7E9},

@@ -21,7 +21,7 @@ Time seconds(int count)
 
 TEST(DriveModel, goesThroughIdleAccelerationCruiseAndBraking)
 {
-    const DriveModel drive{EngineData{}};
+    DriveModel const drive{EngineData{}};
     EXPECT_EQ(drive.at(seconds(5)).speedKmh, 0);
     EXPECT_NEAR(drive.at(seconds(5)).rpm, 780, 10);
     EXPECT_GT(drive.at(seconds(28)).loadPercent, drive.at(seconds(5)).loadPercent + 20);
@@ -32,8 +32,8 @@ TEST(DriveModel, goesThroughIdleAccelerationCruiseAndBraking)
 
 TEST(DriveModel, repeatsItselfToTheBit)
 {
-    const DriveModel one{EngineData{}};
-    const DriveModel other{EngineData{}};
+    DriveModel const one{EngineData{}};
+    DriveModel const other{EngineData{}};
     for (int s = 0; s < 400; s += 7) {
         EXPECT_EQ(one.at(seconds(s)).rpm, other.at(seconds(s)).rpm);
         EXPECT_EQ(one.at(seconds(s)).kilometres, other.at(seconds(s)).kilometres);
@@ -42,10 +42,10 @@ TEST(DriveModel, repeatsItselfToTheBit)
 
 TEST(DriveModel, speedNeverJumpsAndTheWayGrowsWithIt)
 {
-    const DriveModel drive{EngineData{}};
+    DriveModel const drive{EngineData{}};
     DriveState before = drive.at(Time(0));
     for (int ms = 500; ms <= 260000; ms += 500) {
-        const DriveState state = drive.at(Ms(ms));
+        DriveState const state = drive.at(Ms(ms));
         EXPECT_LT(std::abs(state.speedKmh - before.speedKmh), 5) << ms;
         EXPECT_GE(state.kilometres, before.kilometres) << ms;
         EXPECT_LE(state.kilometres - before.kilometres, 0.02) << ms;
@@ -58,7 +58,7 @@ TEST(DriveModel, engineWarmsUp)
 {
     EngineData cold;
     cold.startCoolantCelsius = 10;
-    const DriveModel drive{cold};
+    DriveModel const drive{cold};
     EXPECT_NEAR(drive.at(Time(0)).coolantCelsius, 10, 1);
     EXPECT_FALSE(drive.at(Time(0)).closedLoop);
     EXPECT_NEAR(drive.at(seconds(3600)).coolantCelsius, 91, 1);
@@ -71,9 +71,9 @@ TEST(DriveModel, valuesStayInTheRangesOfAnEngine)
         EngineData engine;
         engine.compression = compression;
         engine.boosted = compression;
-        const DriveModel drive{engine};
+        DriveModel const drive{engine};
         for (int s = 0; s < 1300; ++s) {
-            const DriveState state = drive.at(seconds(s));
+            DriveState const state = drive.at(seconds(s));
             EXPECT_GE(state.rpm, 700) << s;
             EXPECT_LE(state.rpm, 4000) << s;
             EXPECT_GE(state.loadPercent, 0) << s;
@@ -103,7 +103,7 @@ struct MeanCase
 };
 
 // A scenario of yesterday must give the same numbers tomorrow: the means of ten minutes of each value, in its unit.
-const MeanCase meanCases[] = {
+MeanCase const meanCases[] = {
     {&DriveState::speedKmh, 47.8687838, 68.1609856, 47.8687838},
     {&DriveState::rpm, 1827.06886, 2339.1537, 1427.39071},
     {&DriveState::loadPercent, 32.5029538, 37.033292, 32.5029538},
@@ -141,7 +141,7 @@ const MeanCase meanCases[] = {
 
 std::vector<DriveState> tenMinutes(EngineData const& engine)
 {
-    const DriveModel drive(engine);
+    DriveModel const drive(engine);
     std::vector<DriveState> states;
     for (int ms = 0; ms < 600000; ms += 700) {
         states.push_back(drive.at(Ms(ms)));
@@ -184,7 +184,7 @@ struct PidCase
 };
 
 // clang-format off
-const PidCase pidCases[] = {
+PidCase const pidCases[] = {
     {0x04, [](DriveState& s) { s.loadPercent = 100; }, {0xFF}},
     {0x05, [](DriveState& s) { s.coolantCelsius = 93; }, {0x85}},
     {0x06, [](DriveState& s) { s.shortTrimPercent = 0; }, {0x80}},
@@ -263,7 +263,7 @@ TEST(LivePids, areTheFormulasOfTheStandardTurnedRound)
 
 TEST(LivePids, countersComeFromTheTimeSinceClearing)
 {
-    const obdsim::SinceCleared cleared{600, 640, 12, 120, 9};
+    obdsim::SinceCleared const cleared{600, 640, 12, 120, 9};
     EXPECT_EQ(obdsim::livePid(0x21, {}, cleared), (Bytes{0x00, 0x09}));
     EXPECT_EQ(obdsim::livePid(0x30, {}, cleared), Bytes{0x0C});
     EXPECT_EQ(obdsim::livePid(0x31, {}, cleared), (Bytes{0x02, 0x80}));

@@ -120,7 +120,7 @@ struct MaskCase
     char const* mask; ///< null: not answered
 };
 
-const MaskCase maskCases[] = {
+MaskCase const maskCases[] = {
     {{1, 3, 4, 5, 6, 7, 11, 12, 13, 14, 15, 16, 17, 19, 21, 28, 31, 32}, 0x00, "BE3FA813"},
     {{0x21}, 0x00, "00000001"},
     {{0x21}, 0x20, "80000000"},

@@ -20,7 +20,7 @@ Conversation reached(std::string const& vehicle, std::initializer_list<char cons
 TEST(Service22, tellsIdentifiersTogetherAndRefusesByCode)
 {
     auto host = reached("petrol-can11-modules", {"ATH1", "ATSH7E1"});
-    const std::string oil = host.ask("221E1C");
+    std::string const oil = host.ask("221E1C");
     ASSERT_EQ(oil.size(), 3 + 16 + 3U) << oil;
     EXPECT_EQ(oil.substr(0, 11), "7E905621E1C");
     EXPECT_EQ(host.ask("221E301"), "7E9037F223100000000\r\r>");

@@ -21,7 +21,7 @@ std::string errorOf(std::string const& text)
     return "none";
 }
 
-const std::string head = "name = \"Car\"\nprotocol = 6\n[[module]]\nid = \"7E8\"\n";
+std::string const head = "name = \"Car\"\nprotocol = 6\n[[module]]\nid = \"7E8\"\n";
 
 struct ErrorCase
 {
@@ -31,7 +31,7 @@ struct ErrorCase
 
 TEST(VehicleFile, errorsNameFileAndLine)
 {
-    const ErrorCase cases[] = {
+    ErrorCase const cases[] = {
         {"name = ", "car.toml:1: "},
         {"[%]\n", "car.toml:1: "},
         {"protocol = 6\n", "car.toml:1: the vehicle needs \"name\""},
@@ -113,7 +113,7 @@ TEST(VehicleFile, errorsNameFileAndLine)
 
 TEST(VehicleFile, limitsThemselvesAreTaken)
 {
-    const std::string full(17, 'A');
+    std::string const full(17, 'A');
     auto const car = parseVehicle(
         "w4 = 25\nvolts = 12.5\npadding = \"none\"\n" + head +
             "latency = 60000\nwarm_ups = 0\nmost_pids = 6\nframe_gap = 5\nmore_pids = \"refuse\"\n[module.info]\n"
@@ -197,7 +197,7 @@ struct MonitorCase
 
 TEST(VehicleFile, monitorsAreTheBitsOfTheStandard)
 {
-    const MonitorCase cases[] = {
+    MonitorCase const cases[] = {
         {"misfire", 0x0100, 0x0100},      {"fuel-system", 0x0200, 0x0200},
         {"components", 0x0400, 0x0400},   {"catalyst", 0x01, -1},
         {"heated-catalyst", 0x02, -1},    {"evaporative-system", 0x04, -1},
@@ -262,7 +262,7 @@ TEST(VehicleLibrary, everyVehicleLoads)
 
 TEST(VehicleLibrary, readsAFileAndNamesAMissingOne)
 {
-    const std::string path = testing::TempDir() + "obdsim-vehicle.toml";
+    std::string const path = testing::TempDir() + "obdsim-vehicle.toml";
     std::ofstream(path) << head;
     EXPECT_EQ(obdsim::loadVehicle(path).name, "Car");
     std::remove(path.c_str());

@@ -4,7 +4,7 @@
 
 namespace {
 
-const std::vector<catalogue::Row> table = {
+std::vector<catalogue::Row> const table = {
     {0, "B0001", "Airbag", false, {}},
     {0, "P0300", "Misfire", false, {}},
     {12, "P1001", "Misfire", false, {}},
@@ -23,7 +23,7 @@ TEST(Report, CountsMakersPrefixesAndTotals)
 {
     std::ostringstream output;
     catalogue::writeCounts(output, table);
-    const std::string text = output.str();
+    std::string const text = output.str();
     EXPECT_NE(text.find("maker\tGeneric\t2\n"), std::string::npos);
     EXPECT_NE(text.find("maker\tDaewoo\t0\n"), std::string::npos);
     EXPECT_NE(text.find("maker\tFord\t1\n"), std::string::npos);

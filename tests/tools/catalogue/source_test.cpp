@@ -21,7 +21,7 @@ Problems problemsOf(std::string const& text)
 
 TEST(Source, ReadsRowsOfAMaker)
 {
-    const Source source = read("# Ford's codes\n"
+    Source const source = read("# Ford's codes\n"
                                "maker Ford\n"
                                "\n"
                                "P1000  OBD-II Monitor Testing Incomplete\n"
@@ -39,14 +39,14 @@ TEST(Source, ReadsRowsOfAMaker)
 
 TEST(Source, ReadsRepeats)
 {
-    const Source source = read("maker Fiat\nP1111 Sensor\nrepeat P1111 Sensor Circuit\n");
+    Source const source = read("maker Fiat\nP1111 Sensor\nrepeat P1111 Sensor Circuit\n");
     ASSERT_EQ(source.rows.size(), 2U);
     EXPECT_TRUE(source.rows[1].repeat);
 }
 
 TEST(Source, ReadsMalformedCodes)
 {
-    const Source source = read("maker Buick\nmalformed P1300]  Ignitor Circuit\n");
+    Source const source = read("maker Buick\nmalformed P1300]  Ignitor Circuit\n");
     ASSERT_EQ(source.rows.size(), 1U);
     EXPECT_EQ(source.rows[0].code, "P1300]");
     EXPECT_EQ(source.rows[0].text, "Ignitor Circuit");
@@ -54,7 +54,7 @@ TEST(Source, ReadsMalformedCodes)
 
 TEST(Source, ReadsTwins)
 {
-    const Source source = read("maker Buick\nsame as Pontiac except P1300, P1400-P1401\n");
+    Source const source = read("maker Buick\nsame as Pontiac except P1300, P1400-P1401\n");
     ASSERT_EQ(source.twins.size(), 1U);
     EXPECT_EQ(source.twins[0].maker, 5U);
     EXPECT_EQ(source.twins[0].original, 34U);
@@ -63,23 +63,23 @@ TEST(Source, ReadsTwins)
 
 TEST(Source, ListsOfAFileWithoutMakerServeLaterFiles)
 {
-    const Source lists = read("list pair = Low | High\n");
-    const Source source = read("maker Ford\nP1001, P1002 Circuit {pair}\n", lists);
+    Source const lists = read("list pair = Low | High\n");
+    Source const source = read("maker Ford\nP1001, P1002 Circuit {pair}\n", lists);
     EXPECT_TRUE(source.problems.empty());
     EXPECT_EQ(source.rows.size(), 2U);
 }
 
 TEST(Source, ListsOfAMakersFileStayInIt)
 {
-    const Source first = read("maker Ford\nlist pair = Low | High\nP1001, P1002 Circuit {pair}\n");
+    Source const first = read("maker Ford\nlist pair = Low | High\nP1001, P1002 Circuit {pair}\n");
     EXPECT_TRUE(first.problems.empty());
-    const Source source = read("maker Audi\nP1001, P1002 Circuit {pair}\n", first);
+    Source const source = read("maker Audi\nP1001, P1002 Circuit {pair}\n", first);
     EXPECT_EQ(source.problems, (Problems{"test.codes:2: '{pair}' is no range, no choice and no known list"}));
 }
 
 TEST(Source, LinesMayEndInCarriageReturns)
 {
-    const Source source = read("maker Ford\r\nP1001 Sensor\r\n");
+    Source const source = read("maker Ford\r\nP1001 Sensor\r\n");
     EXPECT_TRUE(source.problems.empty());
     EXPECT_EQ(source.rows.at(0).text, "Sensor");
 }
@@ -92,7 +92,7 @@ TEST(Source, RefusesAnUnknownMaker)
 
 TEST(Source, RefusesRowsBeforeTheMaker)
 {
-    const Problems expected{"test.codes:1: a 'maker' line must come before the first code"};
+    Problems const expected{"test.codes:1: a 'maker' line must come before the first code"};
     EXPECT_EQ(problemsOf("P1001 Sensor\n"), expected);
     EXPECT_EQ(problemsOf("same as Ford\n"), expected);
 }
@@ -118,7 +118,7 @@ TEST(Source, RefusesEmptyAndLongTexts)
 
 TEST(Source, RefusesControlCharactersAndOtherAlphabets)
 {
-    const Problems expected{"test.codes:2: a control character, a tab or a character outside ASCII"};
+    Problems const expected{"test.codes:2: a control character, a tab or a character outside ASCII"};
     EXPECT_EQ(problemsOf("maker Ford\nP1001\tSensor\n"), expected);
     EXPECT_EQ(problemsOf("maker Ford\nP1001 Sen\x01sor\n"), expected);
     EXPECT_EQ(problemsOf("maker Ford\nP1001 Capteur cass\xC3\xA9\n"), expected);
@@ -162,7 +162,7 @@ TEST(Source, RefusesWordsBehindTheExceptions)
 
 TEST(Source, TellsEveryBadLine)
 {
-    const Source source = read("maker Ford\nP1 A\nP1001 Sensor\nP2 B\n");
+    Source const source = read("maker Ford\nP1 A\nP1001 Sensor\nP2 B\n");
     EXPECT_EQ(source.problems,
               (Problems{"test.codes:2: 'P1' is no trouble code", "test.codes:4: 'P2' is no trouble code"}));
     EXPECT_EQ(source.rows.size(), 1U);

@@ -24,7 +24,7 @@ std::size_t occurrences(std::string const& text, std::string const& part)
 
 TEST(TableWriter, StoresEachTextOnce)
 {
-    const std::string text = write({{0, "P0300", "Misfire", false, {}}, {12, "P1001", "Misfire", false, {}}});
+    std::string const text = write({{0, "P0300", "Misfire", false, {}}, {12, "P1001", "Misfire", false, {}}});
     EXPECT_EQ(occurrences(text, "\"Misfire\\0\""), 1U);
     EXPECT_NE(text.find("{\"P0300\", 0, 0, 0},\n    {\"P1001\", 12, 0, 0},"), std::string::npos);
     EXPECT_NE(text.find("packedDtcRowCount = 2;"), std::string::npos);
@@ -32,7 +32,7 @@ TEST(TableWriter, StoresEachTextOnce)
 
 TEST(TableWriter, OffsetsStepOverTheClosingZero)
 {
-    const std::string text = write({{0, "P0300", "Misfire", false, {}}, {0, "P0301", "Other", false, {}}});
+    std::string const text = write({{0, "P0300", "Misfire", false, {}}, {0, "P0301", "Other", false, {}}});
     EXPECT_NE(text.find("{\"P0301\", 0, 0, 8},"), std::string::npos);
 }
 
@@ -47,7 +47,7 @@ TEST(TableWriter, StartsABlockWhenOneIsFull)
     for (int number = 0; number < 1000; ++number) {
         table.push_back({0, "P0300", std::string(100, 'A') + std::to_string(number), false, {}});
     }
-    const std::string text = write(table);
+    std::string const text = write(table);
     EXPECT_NE(text.find("dtcTextBlocks[] = {block0, block1};"), std::string::npos);
     EXPECT_NE(text.find("\", 0, 1, 0},"), std::string::npos);
 }

@@ -7,7 +7,7 @@ using catalogue::expandText;
 using catalogue::SourceError;
 using Texts = std::vector<std::string>;
 
-const catalogue::Lists lists = {{"pair", {"Low", "High"}}};
+catalogue::Lists const lists = {{"pair", {"Low", "High"}}};
 
 TEST(TextPattern, PlainTextStandsForItself)
 {
