@@ -2,6 +2,8 @@
 
 #include "common/text/text.h"
 
+#include <obd/connectionprotocol.h>
+
 #include <string_view>
 
 namespace velmora::cli {
@@ -15,10 +17,9 @@ std::optional<obd::VehicleProtocol> parseProtocol(std::string const& text)
     if (digits.size() == 2 && (digits.front() == 'A' || digits.front() == 'a')) {
         digits.remove_prefix(1);
     }
-    if (digits.size() != 1 || digits.front() < '1' || digits.front() > '9') {
-        return std::nullopt;
-    }
-    return static_cast<obd::VehicleProtocol>(digits.front() - '0');
+    auto const protocol = static_cast<obd::VehicleProtocol>(digits.empty() ? 0 : digits.front() - '0');
+    bool const known = digits.size() == 1 && obd::toObdProtocol(protocol) != obd::ObdProtocolUnknown;
+    return known ? std::optional(protocol) : std::nullopt;
 }
 
 std::optional<unsigned int> parseEcuId(std::string const& text)

@@ -14,7 +14,6 @@ namespace {
 
 constexpr std::size_t headerBytes = 3;
 constexpr std::size_t sourceIndex = 2;
-constexpr unsigned char refusalByte = 0x7F;
 constexpr std::size_t pendingBytes = 3;
 
 // Removes the first count bytes and returns them.
@@ -30,7 +29,7 @@ ByteView takeFront(ByteView& bytes, std::size_t count)
 bool isResponsePending(ByteView payload, std::size_t checksumBytes)
 {
     return (payload.size() == pendingBytes || payload.size() == pendingBytes + checksumBytes) &&
-           byteAt(payload, 0) == refusalByte && byteAt(payload, 2) == NackResponsePending;
+           byteAt(payload, 0) == negativeReply && byteAt(payload, 2) == NackResponsePending;
 }
 
 // Joins a further frame to what came of its module. The answer that a module asked to wait for takes the place of the

@@ -2,16 +2,12 @@
 
 #include "libobd/parameters/replychecks.h"
 
+#include <obd/nack.h>
 #include <obd/protocolfamily.h>
 
 #include <utility>
 
 namespace obd {
-namespace {
-
-constexpr unsigned char positiveReply = 0x40;
-
-} // namespace
 
 FixedRequestParameter::FixedRequestParameter(std::vector<unsigned char> lead, std::vector<unsigned char> tail)
     : m_lead(std::move(lead)), m_tail(std::move(tail))
@@ -26,7 +22,7 @@ void FixedRequestParameter::getRequestData(std::vector<unsigned char>& data) con
 void FixedRequestParameter::getSignature(std::vector<unsigned char>& signature) const
 {
     signature = m_lead;
-    signature.front() = static_cast<unsigned char>(signature.front() + positiveReply);
+    signature.front() = positiveReply(signature.front());
 }
 
 std::optional<SaeLines> FixedRequestParameter::saeLines(std::vector<unsigned char> const& data) const

@@ -4,6 +4,10 @@
 #include "libobd/powertrain/quantities.h"
 #include "libobd/powertrain/tableparameter.h"
 
+#include <obd/sensorpids.h>
+
+#include <algorithm>
+
 namespace obd {
 
 // A fuel trim of bank 1 or 2. A vehicle with four banks sends that of bank 3 or 4 in a second byte, of which nothing in
@@ -49,6 +53,7 @@ inline constexpr ParameterRow fuelTrimRows[] = {
     fuelTrimRow(0x58, "Long Term Secondary O2 Sensor Fuel Trim", 2),
 };
 static_assert(pidsRise(fuelTrimRows), "PIDs must rise, none twice");
+static_assert(std::ranges::all_of(fuelTrimRows, isFuelTrim, &ParameterRow::pid), "<obd/sensorpids.h> tells otherwise");
 
 template <int id>
 using FuelTrimParameter = RowParameter<FuelTrim, fuelTrimRows, id>;

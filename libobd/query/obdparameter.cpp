@@ -3,12 +3,12 @@
 #include <common/logrecord.h>
 #include <common/tracestream.h>
 #include <obd/iobdproxy.h>
+#include <obd/nack.h>
 #include <obd/obdparameter.h>
 
 namespace obd {
 namespace {
 
-constexpr unsigned char negativeReply = 0x7F;
 constexpr int cutNack = 0x79; // a negative reply too short to hold its code
 constexpr std::size_t nackCodePosition = 2;
 constexpr std::size_t saeLineLength = 7; // data bytes of one ISO 9141-2 or J1850 line

@@ -19,7 +19,6 @@ namespace {
 
 using Parameters = std::vector<std::shared_ptr<PowertrainParameter>>;
 
-constexpr int lastListedPid = 0x7F;
 constexpr unsigned int anyWeight = 1500;           // kg; no description depends on it
 constexpr ConsumptionSettings anyVehicle{0, 0, 0}; // nor on these
 

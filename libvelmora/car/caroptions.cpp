@@ -1,5 +1,6 @@
 #include "libvelmora/car/caroptions.h"
 
+#include <obd/connectionprotocol.h>
 #include <velmora/error.h>
 
 namespace velmora {
@@ -10,10 +11,11 @@ SessionOptions sessionOptions(CarOptions const& options)
     result.port = options.port;
     result.baud = options.baud;
     if (options.protocol) {
-        if (*options.protocol < 1 || *options.protocol > 9) {
+        auto const protocol = static_cast<obd::VehicleProtocol>(*options.protocol);
+        if (obd::toObdProtocol(protocol) == obd::ObdProtocolUnknown) {
             throw Error(ErrorKind::WrongUse, "A protocol is a number from 1 to 9");
         }
-        result.protocol = static_cast<obd::VehicleProtocol>(*options.protocol);
+        result.protocol = protocol;
     }
     result.units = options.units;
     result.ecu = options.module;

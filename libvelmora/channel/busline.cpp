@@ -2,6 +2,8 @@
 
 #include "libvelmora/channel/elmcommand.h"
 
+#include <obd/connectionprotocol.h>
+
 #include <algorithm>
 
 namespace velmora {
@@ -142,11 +144,28 @@ std::uint8_t j1850CheckByte(FrameBytes const& bytes)
 
 } // namespace
 
+BusKind busKindOf(obd::ObdProtocol protocol)
+{
+    switch (protocol) {
+    case obd::ObdProtocolIso9141:
+        return BusKind::Iso9141;
+    case obd::ObdProtocolIso14230:
+        return BusKind::Kwp;
+    case obd::ObdProtocolJ1850:
+        return BusKind::J1850;
+    case obd::ObdProtocolCan11:
+        return BusKind::Can11;
+    case obd::ObdProtocolCan29:
+        return BusKind::Can29;
+    case obd::ObdProtocolUnknown:
+        break;
+    }
+    return BusKind::Unknown;
+}
+
 BusKind busKindOf(int protocol)
 {
-    constexpr BusKind kinds[] = {BusKind::Unknown, BusKind::J1850, BusKind::J1850, BusKind::Iso9141, BusKind::Kwp,
-                                 BusKind::Kwp,     BusKind::Can11, BusKind::Can29, BusKind::Can11,   BusKind::Can29};
-    return protocol >= 1 && protocol <= 9 ? kinds[protocol] : BusKind::Unknown;
+    return busKindOf(obd::toObdProtocol(static_cast<obd::VehicleProtocol>(protocol)));
 }
 
 bool isCanBus(BusKind bus)

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <obd/obdprotocol.h>
+
 #include <cstdint>
 #include <optional>
 #include <string>
@@ -19,7 +21,8 @@ enum class BusKind : int
     Can29
 };
 
-// Of the adapter's protocol numbers 1 to 9; Unknown for all others.
+BusKind busKindOf(obd::ObdProtocol protocol);
+// Of the adapter's protocol numbers; Unknown where none has that one.
 BusKind busKindOf(int protocol);
 bool isCanBus(BusKind bus);
 

@@ -1,5 +1,6 @@
 #include "libvelmora/channel/learntstore.h"
 
+#include "libvelmora/channel/busline.h"
 #include "libvelmora/text/toml.h"
 
 #include <fstream>
@@ -54,8 +55,8 @@ void LearntStore::load()
         toml::table const root = toml::parse_file(m_file.string());
         for (auto const& [name, node] : root["adapter"].is_table() ? *root["adapter"].as_table() : toml::table()) {
             toml::node_view<toml::node const> const entry(node);
-            auto const protocol = entry["protocol"].value_or<std::int64_t>(0);
-            m_adapters[std::string(name.str())] = {protocol >= 1 && protocol <= 9 ? static_cast<int>(protocol) : 0,
+            int const protocol = entry["protocol"].value_or(0);
+            m_adapters[std::string(name.str())] = {busKindOf(protocol) != BusKind::Unknown ? protocol : 0,
                                                    entry["counts"].value_or(true)};
         }
         for (auto const& [vin, node] : root["vehicle"].is_table() ? *root["vehicle"].as_table() : toml::table()) {

@@ -3,15 +3,14 @@
 #include "libvelmora/channel/canmessagelist.h"
 #include "libvelmora/channel/replyhealer.h"
 
+#include <obd/nack.h>
+
 #include <algorithm>
 #include <utility>
 
 namespace velmora {
 
 namespace {
-
-constexpr std::uint8_t refusalService = 0x7F;
-constexpr std::uint8_t responsePending = 0x78;
 
 enum class Answer : int
 {
@@ -24,7 +23,7 @@ enum class Answer : int
 // Behind the service of a reply stands which item it is of, for the services that have items.
 bool isOfRequest(std::vector<std::uint8_t> const& request, std::vector<std::uint8_t> const& payload)
 {
-    if (payload.empty() || payload[0] != request[0] + 0x40) {
+    if (payload.empty() || payload[0] != obd::positiveReply(request[0])) {
         return false;
     }
     bool const hasItem = request.size() > 1 && request[0] != 0x03 && request[0] != 0x07 && request[0] != 0x0A;
@@ -37,9 +36,9 @@ Answer judgeAnswer(std::vector<std::uint8_t> const& request, std::vector<std::ui
     if (isOfRequest(request, payload)) {
         return Answer::Right;
     }
-    if (payload.size() > 1 && payload[0] == refusalService && payload[1] == request[0]) {
+    if (payload.size() > 1 && payload[0] == obd::negativeReply && payload[1] == request[0]) {
         // On SAE J1850 the request's own bytes stand between the service and the code.
-        return payload.size() > 2 && payload.back() == responsePending ? Answer::Pending : Answer::Refusal;
+        return payload.size() > 2 && payload.back() == obd::NackResponsePending ? Answer::Pending : Answer::Refusal;
     }
     return Answer::Foreign;
 }

@@ -6,6 +6,7 @@
 
 #include <obd/iecu.h>
 #include <obd/parameterfactory.h>
+#include <obd/protocolfamily.h>
 #include <obd/sensorpids.h>
 
 #include <fmt/format.h>
@@ -183,8 +184,7 @@ void checkVehicle(Session& session, DoctorReport& report)
     measureLatency(session, pids.front(), figures);
     figures.longestReply = longestWholeReply(session);
     figures.countWorks = tryCount(session, pids.front(), figures);
-    bool const can = ecu.protocol() == obd::ObdProtocolCan11 || ecu.protocol() == obd::ObdProtocolCan29;
-    figures.pidsPerRequest = can ? tryMulti(session, ecu, pids) : 1;
+    figures.pidsPerRequest = obd::isCan(ecu.protocol()) ? tryMulti(session, ecu, pids) : 1;
     figures.valuesPerSecond = measureRate(session, pids, figures);
     if (figures.requests < measuredRequests) {
         report.checks.push_back(

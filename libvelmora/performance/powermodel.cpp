@@ -1,5 +1,6 @@
 #include "libvelmora/performance/powermodel.h"
 
+#include <obd/nack.h>
 #include <obd/parameterfactory.h>
 #include <obd/sensorvalue.h>
 
@@ -11,7 +12,7 @@ namespace velmora {
 namespace {
 
 constexpr std::chrono::milliseconds modelStep{500};
-constexpr unsigned char replyOfLiveData = 0x41;
+constexpr unsigned char replyOfLiveData = obd::positiveReply(obd::ObdMode::CurrentData);
 constexpr unsigned char speedPid = 0x0D;
 constexpr unsigned char engineSpeedPid = 0x0C;
 

@@ -2,6 +2,8 @@
 
 #include "libvelmora/poll/pollcycle.h"
 
+#include <obd/nack.h>
+
 #include <utility>
 
 namespace velmora {
@@ -9,7 +11,6 @@ namespace velmora {
 namespace {
 
 constexpr unsigned char currentData = 0x01;
-constexpr unsigned char negativeReply = 0x7F;
 constexpr unsigned int pollReplyLimitMs = 1500;
 
 std::set<unsigned int> modulesOf(std::vector<std::size_t> const& members, std::vector<PollWish> const& wishes)
@@ -161,7 +162,7 @@ std::optional<PollCycle::Parts> PollCycle::judge(unsigned int module, std::vecto
     if (payload == nullptr) {
         limit.missed(pids.size());
     } else {
-        parts = payload->front() != negativeReply ? splitMultiReply(*payload, pids, m_length) : std::nullopt;
+        parts = payload->front() != obd::negativeReply ? splitMultiReply(*payload, pids, m_length) : std::nullopt;
         if (!parts) {
             limit.failed(pids.size());
         } else if (parts->size() > 1) {

@@ -2,6 +2,7 @@
 
 #include <common/clock.h>
 #include <obd/parameterfactory.h>
+#include <obd/sensorpids.h>
 
 #include <algorithm>
 
@@ -11,20 +12,16 @@ namespace {
 
 constexpr std::chrono::milliseconds longestSleep{20}; // so that the end is not waited for
 
-// On a vehicle of four banks some trims come with the value of a second bank, on others without: such are asked alone.
-bool isTrim(unsigned char pid)
-{
-    return (pid >= 0x06 && pid <= 0x09) || (pid >= 0x55 && pid <= 0x58);
-}
-
 PidLength lengths(std::vector<PollSource> const& sources)
 {
     bool const fourBanks = std::any_of(sources.begin(), sources.end(), [](PollSource const& source) {
         return source.ecu != nullptr && source.ecu->oxygenSensorBanks() == obd::OxygenSensorBank::Pid1D;
     });
+    // How long a trim is there, only the reply can tell: such are asked alone.
     return [fourBanks](unsigned char pid) {
-        return fourBanks && isTrim(pid) ? std::nullopt
-                                        : obd::ParameterFactory::dataLength(obd::ParameterIdentifier(pid).id());
+        return fourBanks && obd::isFuelTrim(pid)
+                   ? std::nullopt
+                   : obd::ParameterFactory::dataLength(obd::ParameterIdentifier(pid).id());
     };
 }
 

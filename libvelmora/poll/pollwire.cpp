@@ -1,6 +1,7 @@
 #include "libvelmora/poll/pollwire.h"
 
 #include <common/clock.h>
+#include <obd/nack.h>
 
 #include <utility>
 
@@ -9,7 +10,6 @@ namespace velmora {
 namespace {
 
 constexpr unsigned char liveService = 0x01;
-constexpr unsigned char liveServiceReply = 0x41;
 
 } // namespace
 
@@ -48,7 +48,7 @@ obd::IDevice::Status PollWire::execute(std::vector<unsigned char> const& request
         return status;
     }
     for (auto const& [sender, payload] : responses) {
-        if (payload.size() > 2 && payload[0] == liveServiceReply && payload[1] == request[1]) {
+        if (payload.size() > 2 && payload[0] == obd::positiveReply(liveService) && payload[1] == request[1]) {
             m_notes.note(sender, request[1], now());
         }
     }

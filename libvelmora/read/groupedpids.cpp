@@ -2,8 +2,8 @@
 
 #include "libvelmora/read/multireply.h"
 
-#include <obd/obdprotocol.h>
 #include <obd/parameterfactory.h>
+#include <obd/protocolfamily.h>
 
 namespace velmora {
 
@@ -25,8 +25,7 @@ std::optional<std::size_t> groupedLength(unsigned char pid)
 void GroupedPids::fetch(std::span<unsigned char const> pids)
 {
     m_replies.clear();
-    obd::ObdProtocol const bus = m_proxy->protocol();
-    m_alone = m_alone || (bus != obd::ObdProtocolCan11 && bus != obd::ObdProtocolCan29);
+    m_alone = m_alone || !obd::isCan(m_proxy->protocol());
     std::vector<unsigned char> group;
     for (std::size_t i = 0; i < pids.size() && !m_alone; ++i) {
         if (groupedLength(pids[i])) {

@@ -1,12 +1,14 @@
 #include "libvelmora/read/multireply.h"
 
+#include <obd/nack.h>
+
 #include <algorithm>
 
 namespace velmora {
 
 namespace {
 
-constexpr unsigned char currentDataReply = 0x41;
+constexpr unsigned char currentDataReply = obd::positiveReply(obd::ObdMode::CurrentData);
 
 } // namespace
 

@@ -2,15 +2,11 @@
 
 #include "libvelmora/read/topicanswer.h"
 
+#include <obd/nack.h>
+
 #include <utility>
 
 namespace velmora {
-
-namespace {
-
-constexpr unsigned char negative = 0x7F;
-
-} // namespace
 
 ServiceReplies::ServiceReplies(obd::IObdProxy& proxy, unsigned char service, unsigned int timeoutMs)
     : m_service(service)
@@ -33,10 +29,10 @@ ServiceReply ServiceReplies::of(unsigned int ecu) const
         return {m_others, {}, {}};
     }
     std::vector<unsigned char> const& bytes = found->second;
-    if (bytes[0] == m_service + 0x40) {
+    if (bytes[0] == obd::positiveReply(m_service)) {
         return {ServiceReply::Kind::Positive, bytes, {}};
     }
-    if (bytes[0] == negative && bytes.size() >= 3 && bytes[1] == m_service) {
+    if (bytes[0] == obd::negativeReply && bytes.size() >= 3 && bytes[1] == m_service) {
         return {ServiceReply::Kind::Refused, bytes, refusalText(bytes[2])};
     }
     return {ServiceReply::Kind::Unreadable, bytes, {}};

@@ -2,6 +2,8 @@
 
 #include "libvelmora/text/text.h"
 
+#include <obd/protocolfamily.h>
+
 #include <fmt/format.h>
 
 #include <algorithm>
@@ -94,11 +96,6 @@ std::string shownModule(std::string const& reply)
     return isLegacyHeader(reply) ? reply.substr(4) : reply;
 }
 
-bool isCanBus(obd::ObdProtocol protocol)
-{
-    return protocol == obd::ObdProtocolCan11 || protocol == obd::ObdProtocolCan29;
-}
-
 bool isBroadcast(Signal const& signal)
 {
     return signal.header.empty() || isFunctionalHeader(signal.header);
@@ -107,7 +104,7 @@ bool isBroadcast(Signal const& signal)
 AddressOrReason addressOf(std::string const& header, std::string const& reply, std::optional<unsigned char> ext,
                           obd::ObdProtocol protocol)
 {
-    if (!isCanBus(protocol)) {
+    if (!obd::isCan(protocol)) {
         return legacyAddress(header, reply, ext.has_value(), protocol);
     }
     RequestAddress address;

@@ -20,7 +20,7 @@ struct AddressOrReason
 // Whether a signal goes to all modules, by the bus's standard request.
 bool isBroadcast(Signal const& signal);
 
-// Whether a header is one of the buses before CAN, whose modules are told apart by a byte of it.
+// Whether a header is one of the legacy buses, whose modules are told apart by a byte of it.
 bool isLegacyHeader(std::string const& header);
 
 // Who answers a request to this address, by the identifier or byte that replies carry.
@@ -32,8 +32,6 @@ AddressOrReason addressOf(Signal const& signal, obd::ObdProtocol protocol);
 // request. ext is the module's address byte, if it has one.
 AddressOrReason addressOf(std::string const& header, std::string const& reply, std::optional<unsigned char> ext,
                           obd::ObdProtocol protocol);
-
-bool isCanBus(obd::ObdProtocol protocol);
 
 // Where a module that answers standard requests listens alone, by the identifier of its replies: "7E0" for 7E8
 // (ISO 15765-4), "8011F1" for 11 (ISO 14230-4). Nothing for others.

@@ -5,6 +5,8 @@
 #include "libvelmora/uds/moduleaddress.h"
 #include "libvelmora/uds/refusalcode.h"
 
+#include <obd/nack.h>
+
 #include <algorithm>
 #include <utility>
 
@@ -12,9 +14,6 @@ namespace velmora {
 
 namespace {
 
-constexpr unsigned char udsRefusal = 0x7F;
-constexpr unsigned char udsPending = 0x78;
-constexpr unsigned char positiveBit = 0x40;
 constexpr unsigned int exchangeLimitMs = 6000;
 constexpr unsigned int longestWaitMs = 1044; // ATST FF
 
@@ -23,26 +22,10 @@ std::string moduleKey(RequestAddress const& address)
     return address.header + "/" + address.extended;
 }
 
-BusKind busOf(obd::ObdProtocol protocol)
-{
-    switch (protocol) {
-    case obd::ObdProtocolIso9141:
-        return BusKind::Iso9141;
-    case obd::ObdProtocolIso14230:
-        return BusKind::Kwp;
-    case obd::ObdProtocolJ1850:
-        return BusKind::J1850;
-    case obd::ObdProtocolCan29:
-        return BusKind::Can29;
-    default:
-        return BusKind::Can11;
-    }
-}
-
 // Of several identifiers in one request the module leaves those out that it has not.
 bool isEchoed(std::vector<unsigned char> const& request, std::vector<unsigned char> const& payload)
 {
-    if (payload.empty() || payload.front() != (request.front() | positiveBit)) {
+    if (payload.empty() || payload.front() != obd::positiveReply(request.front())) {
         return false;
     }
     if (request.front() == 0x22 && request.size() > 3) {
@@ -66,7 +49,7 @@ unsigned char refusalIn(std::vector<unsigned char> const& request, std::vector<u
 
 bool asksForTime(ModuleAnswer const& answer)
 {
-    return answer.kind == ModuleAnswer::Kind::Refused && answer.code == udsPending;
+    return answer.kind == ModuleAnswer::Kind::Refused && answer.code == obd::NackResponsePending;
 }
 
 } // namespace
@@ -102,7 +85,8 @@ ModuleAnswer judgeReply(std::vector<unsigned char> const& request, ReplyContent 
         if (isEchoed(request, each.payload)) {
             return {ModuleAnswer::Kind::Positive, each.id, each.payload, 0, {}};
         }
-        bool const refusal = each.payload.size() > 2 && each.payload[0] == udsRefusal && each.payload[1] == request[0];
+        bool const refusal =
+            each.payload.size() > 2 && each.payload[0] == obd::negativeReply && each.payload[1] == request[0];
         // Behind a "response pending" may come another refusal, which is the answer.
         if (refusal && (answer.kind != ModuleAnswer::Kind::Refused || asksForTime(answer))) {
             answer = {ModuleAnswer::Kind::Refused, each.id, {}, refusalIn(request, each.payload), {}};
@@ -136,7 +120,7 @@ ReplyContent ModuleAsker::exchange(RequestAddress const& address, std::vector<un
     } else if (!reply.answered) {
         trouble = {ModuleAnswer::Kind::BusTrouble, 0, {}, 0, "the adapter does not answer"};
     }
-    ReplyContent content = readReply(reply, busOf(m_proxy.protocol()));
+    ReplyContent content = readReply(reply, busKindOf(m_proxy.protocol()));
     if (isLegacyHeader(address.header)) {
         // There the adapter hears whoever speaks to the tester.
         std::erase_if(content.messages,

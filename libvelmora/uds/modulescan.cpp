@@ -4,6 +4,7 @@
 #include "libvelmora/uds/moduleaddress.h"
 #include "libvelmora/uds/standingguard.h"
 
+#include <obd/protocolfamily.h>
 #include <velmora/error.h>
 
 #include <utility>
@@ -102,7 +103,7 @@ std::optional<FoundModule> ModuleScan::ask(unsigned int id, ModuleAnswer::Kind& 
 
 std::vector<FoundModule> ModuleScan::find()
 {
-    if (!isCanBus(m_asker.proxy().protocol())) {
+    if (!obd::isCan(m_asker.proxy().protocol())) {
         throw Error(ErrorKind::NotSupported,
                     "The bus of this vehicle is no CAN: modules beyond OBD can't be looked for",
                     {"on older buses each module needs a start of its own, which would end the connection"});

@@ -15,6 +15,7 @@
 #include "program/view/printtext.h"
 #include "program/view/style.h"
 
+#include <obd/protocolfamily.h>
 #include <obd/troublecodecatalogue.h>
 #include <velmora/error.h>
 
@@ -213,7 +214,7 @@ ExitCode udsCodes(std::string const& named, GlobalOptions const& options)
     CommandSession session(options);
     session.connect();
     obd::ObdProtocol const protocol = session.proxy()->protocol();
-    if (!isCanBus(protocol) && protocol != obd::ObdProtocolIso14230) {
+    if (!obd::isCan(protocol) && protocol != obd::ObdProtocolIso14230) {
         throw Error(ErrorKind::NotSupported, "Services 19 and 18 are asked on CAN and ISO 14230 only",
                     {"`velmora codes` reads this vehicle's codes"});
     }

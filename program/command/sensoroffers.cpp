@@ -7,13 +7,6 @@
 
 namespace velmora::cli {
 
-namespace {
-
-// Up to it the library knows all PIDs, some of which are no parameters of their own.
-constexpr unsigned char lastWellKnownPid = 0x7F;
-
-} // namespace
-
 std::vector<Offer> offers(bool all)
 {
     std::vector<Offer> list;
@@ -35,7 +28,7 @@ std::vector<unsigned char> undecoded(obd::IEcu const& ecu)
     std::vector<Offer> const known = offers(true);
     std::vector<unsigned char> pids = ecu.supportedIds(obd::ObdMode::CurrentData, 0);
     std::erase_if(pids, [&known](unsigned char pid) {
-        bool const isLater = pid > lastWellKnownPid && !obd::isSupportMask(pid);
+        bool const isLater = pid > obd::lastListedPid && !obd::isSupportMask(pid);
         return !isLater || std::any_of(known.begin(), known.end(), [pid](Offer const& offer) {
             return static_cast<int>(offer.parameter->id) == pid;
         });
