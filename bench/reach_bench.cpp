@@ -134,8 +134,9 @@ double secondsSince(Clock::time_point start)
     return std::chrono::duration<double>(Clock::now() - start).count();
 }
 
-// Twice in a row, with what the first visit has learnt.
-void bringUp(benchmark::State& state, Way way, Row const& row)
+// Twice in a row, with what the first visit has learnt: connects, and does what else a visit is for.
+template <typename Rest>
+void visitTwice(benchmark::State& state, Way way, Row const& row, Rest const& rest)
 {
     for ([[maybe_unused]] auto const once : state) {
         Visits const visits;
@@ -145,25 +146,20 @@ void bringUp(benchmark::State& state, Way way, Row const& row)
             Session session(optionsFor(car.address(), way, visits.settings()));
             Clock::time_point const start = Clock::now();
             session.connect();
+            rest(session);
             state.counters[visit] = secondsSince(start);
         }
     }
 }
 
+void bringUp(benchmark::State& state, Way way, Row const& row)
+{
+    visitTwice(state, way, row, [](Session& /*session*/) {});
+}
+
 void scan(benchmark::State& state, Way way, Row const& row)
 {
-    for ([[maybe_unused]] auto const once : state) {
-        Visits const visits;
-        CarProcess const car(row.car);
-        prepare(row, car.address());
-        for (char const* visit : {"first_s", "second_s"}) {
-            Session session(optionsFor(car.address(), way, visits.settings()));
-            Clock::time_point const start = Clock::now();
-            session.connect();
-            benchmark::DoNotOptimize(readVehicle(session));
-            state.counters[visit] = secondsSince(start);
-        }
-    }
+    visitTwice(state, way, row, [](Session& session) { benchmark::DoNotOptimize(readVehicle(session)); });
 }
 
 Row rowOf(std::string const& vehicle, std::string const& baud, std::string const& wait)
