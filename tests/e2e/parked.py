@@ -3,13 +3,13 @@ may reach its modules: the simulated car counts them. Prints what went wrong; ex
 
 import json
 import os
-import signal
 import subprocess
 import sys
-import tempfile
 import time
 
-LIMIT = 60.0  # seconds for anything that is waited for
+import watching
+from watching import wait_for
+
 PARKED = 9.0  # seconds that are looked at: longer than any idle connection of the library is left alone
 
 SETTINGS = """port = "%s"
@@ -32,15 +32,6 @@ class Car:
     def say(self, line):
         self.process.stdin.write(line + "\n")
         self.process.stdin.flush()
-
-
-def wait_for(what, condition):
-    end = time.monotonic() + LIMIT
-    while not condition():
-        if time.monotonic() > end:
-            print("not within a minute:", what)
-            sys.exit(1)
-        time.sleep(0.05)
 
 
 def requests(car):
@@ -84,21 +75,7 @@ def run(program, folder, processes):
     car.say("engine start")
     assert car.process.stdout.readline() == "ok\n"
     wait_for("the car to wake up", lambda: events(folder).count("engine_start") == 2)
-    watch.send_signal(signal.SIGTERM)
-    if watch.wait(60) != 0:
-        print("the watch ended with", watch.returncode)
-        sys.exit(1)
+    watching.end(watch)
 
 
-def main():
-    processes = []
-    with tempfile.TemporaryDirectory() as folder:
-        try:
-            run(sys.argv[1], folder, processes)
-        finally:
-            for each in processes:
-                each.kill()
-                each.wait()
-
-
-main()
+watching.main(run)

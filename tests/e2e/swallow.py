@@ -5,18 +5,17 @@ nothing did."""
 import json
 import os
 import select
-import signal
 import socket
 import sqlite3
 import subprocess
 import sys
-import tempfile
 import threading
 import time
 
 import paho.mqtt.client as mqtt
 
-LIMIT = 60.0  # seconds for anything that is waited for
+import watching
+from watching import wait_for
 
 
 class Proxy:
@@ -55,15 +54,6 @@ def free_port():
     with socket.socket() as probe:
         probe.bind(("127.0.0.1", 0))
         return probe.getsockname()[1]
-
-
-def wait_for(what, condition):
-    end = time.monotonic() + LIMIT
-    while not condition():
-        if time.monotonic() > end:
-            print("not within a minute:", what)
-            sys.exit(1)
-        time.sleep(0.05)
 
 
 def listens(port):
@@ -116,13 +106,6 @@ def start_watch(program, folder, port, proxy):
             stderr=log, env=dict(os.environ, STATE_DIRECTORY=folder))
 
 
-def end(watch):
-    watch.send_signal(signal.SIGTERM)
-    if watch.wait(60) != 0:
-        print("the watch ended with", watch.returncode)
-        sys.exit(1)
-
-
 def run(program, folder, processes):
     port = free_port()
     with open(folder + "/broker.conf", "w") as settings:
@@ -142,12 +125,12 @@ def run(program, folder, processes):
     wait_for("readings on the disk", lambda: rows(folder + "/spool") > 100)
     proxy.swallows = False
     wait_for("readings to come again", lambda: len(consumer.readings) > came + 100)
-    end(watch)
+    watching.end(watch)
     if rows(folder + "/spool") > 0:  # what the end left there is sent by a watch without a car
         rest = start_watch(program, folder, "tcp://127.0.0.1:1", proxy)
         processes.append(rest)
         wait_for("an empty spool", lambda: rows(folder + "/spool") == 0)
-        end(rest)
+        watching.end(rest)
     wait_for("all readings", lambda: len(consumer.readings) >= len(written(folder)))
     if consumer.mistakes or sorted(consumer.readings.values(), key=repr) != sorted(written(folder), key=repr):
         print(f"{len(written(folder))} readings were written, {len(consumer.readings)} came, and they differ; numbers "
@@ -155,15 +138,4 @@ def run(program, folder, processes):
         sys.exit(1)
 
 
-def main():
-    processes = []
-    with tempfile.TemporaryDirectory() as folder:
-        try:
-            run(sys.argv[1], folder, processes)
-        finally:
-            for each in processes:
-                each.kill()
-                each.wait()
-
-
-main()
+watching.main(run)
