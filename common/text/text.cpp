@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <charconv>
+#include <cmath>
 #include <numeric>
 #include <string_view>
 
@@ -51,6 +52,14 @@ std::string toUpper(std::string text)
     std::transform(text.begin(), text.end(), text.begin(),
                    [](char each) { return each >= 'a' && each <= 'z' ? static_cast<char>(each - 'a' + 'A') : each; });
     return text;
+}
+
+std::optional<double> numberIn(std::string const& text)
+{
+    double number = 0.0;
+    auto const [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
+    bool const whole = !text.empty() && error == std::errc() && end == text.data() + text.size();
+    return whole && std::isfinite(number) ? std::optional(number) : std::nullopt;
 }
 
 std::optional<unsigned int> parseHex(std::string const& text, unsigned int highest)

@@ -14,6 +14,9 @@ std::string toUpper(std::string text);
 // A hexadecimal number, with or without 0x. Nothing for any other text or a number above the highest.
 std::optional<unsigned int> parseHex(std::string const& text, unsigned int highest);
 
+// The whole text as a finite number in decimal; nothing for any other text.
+std::optional<double> numberIn(std::string const& text);
+
 // What an adapter sent, line by line: without line ends, empty lines and the zero bytes that some slip in.
 std::vector<std::string> adapterLines(std::string const& text);
 

@@ -1,3 +1,4 @@
+#include "common/text/text.h"
 #include "libvelmora/report/finding/findingparts.h"
 #include "libvelmora/report/finding/testlimits.h"
 #include "libvelmora/report/oxygenreport.h"

@@ -1,8 +1,9 @@
 #include "libvelmora/report/finding/testlimits.h"
 
+#include "common/text/text.h"
+
 #include <algorithm>
 #include <array>
-#include <charconv>
 #include <cmath>
 
 namespace velmora {
@@ -95,14 +96,6 @@ constexpr MonitorRange monitorRanges[] = {
 };
 
 } // namespace
-
-std::optional<double> numberIn(std::string const& text)
-{
-    double number = 0.0;
-    auto const [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
-    bool const whole = !text.empty() && error == std::errc() && end == text.data() + text.size();
-    return whole && std::isfinite(number) ? std::optional(number) : std::nullopt;
-}
 
 std::optional<TestLimits> limitsOf(LimitTest const& test)
 {

@@ -35,7 +35,4 @@ Closeness closenessOf(LimitTest const& test);
 // The readiness monitor whose completion gives the results of that monitor of service 06 their meaning; null for none.
 char const* readinessNameOf(int monitor, bool diesel);
 
-// The number that the text is; nothing for any other text.
-std::optional<double> numberIn(std::string const& text);
-
 } // namespace velmora

@@ -1,13 +1,12 @@
 #include "program/view/live/livetable.h"
 
+#include "common/text/text.h"
 #include "libvelmora/read/sensornames.h"
 #include "libvelmora/report/unitlabel.h"
 
 #include <fmt/format.h>
 
 #include <algorithm>
-#include <charconv>
-#include <cmath>
 #include <limits>
 
 namespace velmora::cli {
@@ -103,14 +102,6 @@ void take(LiveRow& row, obd::SensorValueDataModel const& value, LiveTime now)
 }
 
 } // namespace
-
-std::optional<double> numberIn(std::string const& text)
-{
-    double number = 0.0;
-    auto const [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
-    bool const whole = !text.empty() && error == std::errc() && end == text.data() + text.size();
-    return whole && std::isfinite(number) ? std::optional(number) : std::nullopt;
-}
 
 bool LiveRow::isOutside() const
 {

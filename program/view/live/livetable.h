@@ -69,9 +69,6 @@ struct LiveRow
 // The key of a row's sensor for settings and recordings: "RPM", "LAMBDA_2", or a signal's own.
 std::string keyOf(LiveRow const& row);
 
-// The whole text as a finite number.
-std::optional<double> numberIn(std::string const& text);
-
 // The live values of the selected parameters, in the order of their selection.
 class LiveTable
 {

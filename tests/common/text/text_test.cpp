@@ -27,6 +27,15 @@ TEST(Text, ReadableShowsNoiseAsReplacementCharacters)
                                                 "b");
 }
 
+TEST(Text, ANumberIsTheWholeText)
+{
+    EXPECT_EQ(velmora::numberIn("-12.5"), -12.5);
+    EXPECT_EQ(velmora::numberIn("0"), 0.0);
+    for (std::string const text : {"", "-", "12 km", " 12", "+12", "0x10", "inf", "nan", "1e999"}) {
+        EXPECT_EQ(velmora::numberIn(text), std::nullopt) << text;
+    }
+}
+
 TEST(Text, WidthsAreThoseOfATerminal)
 {
     using velmora::displayWidth;
