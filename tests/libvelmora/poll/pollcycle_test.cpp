@@ -1,121 +1,13 @@
-#include "libvelmora/poll/pollcycle.h"
-#include "libvelmora/read/oxygencurrent.h"
-#include "tests/support/fakeclock.h"
-#include "tests/support/fakeproxy.h"
-#include "tests/support/memorysettings.h"
-
-#include <obd/iobdvelmora.h>
-#include <obd/obdvelmorabuilder.h>
-#include <obd/parameterfactory.h>
-
-#include <gtest/gtest.h>
+#include "tests/libvelmora/poll/pollcyclefixture.h"
 
 namespace {
 
-using support::FakeEcu;
 using support::FakeProxy;
-using velmora::PollCycle;
-using velmora::PollPace;
-using velmora::PollResult;
-
-constexpr PollPace careful{};
-constexpr PollPace fastSingle{std::chrono::milliseconds(0), std::chrono::milliseconds(0), 1};
-constexpr PollPace fastSix{std::chrono::milliseconds(0), std::chrono::milliseconds(0), 6};
-constexpr PollPace fastAddressed{std::chrono::milliseconds(0), std::chrono::milliseconds(0), 1, true};
-
-// Notes which module requests go to.
-struct FakeChannel : velmora::IChannelControl
-{
-    void addressModule(std::optional<unsigned int> id) override { module = id; }
-    void address(std::optional<velmora::RequestAddress> const& /*address*/) override {}
-    std::string refusedAddress() const override { return {}; }
-    velmora::AddressedReply takeReply() override { return {}; }
-    void onConnected() override {}
-    velmora::ChannelStatistics statistics() const override { return {}; }
-
-    std::optional<unsigned int> module;
-};
-
-// A vehicle whose modules answer in 12 ms, and a poller on it that runs in a time of its own.
-class PollCycleTest : public testing::Test
-{
-protected:
-    PollCycleTest()
-    {
-        m_proxy->during([this] { m_clock.advance(12); });
-        m_engine->setSupported(obd::ObdMode::CurrentData, {0x04, 0x05, 0x0B, 0x0C, 0x0D, 0x10, 0x11, 0x33});
-        m_proxy->setEcus({m_engine, m_gearbox});
-    }
-
-    void want(std::shared_ptr<FakeEcu> const& ecu, int pid, std::optional<double> hertz = {})
-    {
-        auto const id = obd::ParameterIdentifier(pid).id();
-        m_sources.push_back({ecu, obd::ParameterFactory().createParameter(id), hertz});
-    }
-    void want(int pid) { want(m_engine, pid); }
-
-    // For so many milliseconds from the start of the cycle, or from where it was.
-    void run(PollPace const& pace, unsigned int ms)
-    {
-        if (m_cycle == nullptr) {
-            m_cycle = std::make_unique<PollCycle>(
-                m_proxy, m_sources, pace,
-                [](unsigned char pid) { return obd::ParameterFactory::dataLength(obd::ParameterIdentifier(pid).id()); },
-                m_units, [this](PollResult const& result) { m_results.push_back(result); }, &m_channel);
-        }
-        unsigned int const end = m_clock.millis() + ms;
-        while (m_clock.millis() < end) {
-            if (auto const wait = m_cycle->wait(); wait.count() > 0) {
-                m_clock.advance(static_cast<unsigned int>(wait.count()));
-            } else {
-                m_cycle->step();
-            }
-        }
-    }
-
-    // Texts of what was read last from a module.
-    std::string last(unsigned int module, int pid) const
-    {
-        std::string text;
-        for (PollResult const& result : m_results) {
-            if (result.module == module && result.id == pid) {
-                text = result.values.front()->value;
-            }
-        }
-        return text;
-    }
-    std::size_t count(unsigned int module, int pid) const
-    {
-        return static_cast<std::size_t>(std::count_if(m_results.begin(), m_results.end(), [&](auto const& result) {
-            return result.module == module && result.id == pid;
-        }));
-    }
-
-    // Modules answer in so many milliseconds, and at their own addresses in so many; 0: not at all. Notes how requests
-    // go.
-    void answerIn(unsigned int broadcast, unsigned int addressed)
-    {
-        m_proxy->during([this, broadcast, addressed] {
-            m_way += m_channel.module ? 'a' : 'b';
-            m_clock.advance(m_channel.module ? std::max(addressed, 20U) : broadcast);
-            if (addressed == 0) {
-                m_channel.module ? m_proxy->fail("01 0C", FakeProxy::Status::NoResponse)
-                                 : m_proxy->answer("01 0C", "41 0C 1A F8");
-            }
-        });
-    }
-
-    support::FakeClock m_clock;
-    FakeChannel m_channel;
-    std::string m_way;
-    std::shared_ptr<FakeProxy> m_proxy = std::make_shared<FakeProxy>();
-    std::shared_ptr<FakeEcu> m_engine = std::make_shared<FakeEcu>(0x7E8);
-    std::shared_ptr<FakeEcu> m_gearbox = std::make_shared<FakeEcu>(0x7E9);
-    std::vector<velmora::PollSource> m_sources;
-    std::unique_ptr<PollCycle> m_cycle;
-    std::vector<PollResult> m_results;
-    velmora::Units m_units = velmora::Units::Metric;
-};
+using velmora::test::careful;
+using velmora::test::fastAddressed;
+using velmora::test::fastSingle;
+using velmora::test::fastSix;
+using velmora::test::PollCycleTest;
 
 TEST_F(PollCycleTest, ReadsAsTheLibraryDoesAndKeepsTheFloor)
 {
@@ -280,66 +172,6 @@ TEST_F(PollCycleTest, TheGapOfOldBusesHoldsForAllRequests)
     EXPECT_GE(m_proxy->count(), 27);
 }
 
-// Consumption without air: a mass air flow that is claimed and never told made 0.5 l/100 km of nothing.
-TEST_F(PollCycleTest, ADerivedValueNeedsFreshInputsOfItsOwnModule)
-{
-    auto const obd = obd::ObdVelmoraBuilder::createObdVelmora(0, 0, 0, std::make_shared<support::MemorySettings>());
-    auto const id = obd::ParameterIdentifier::FuelConsumption;
-    m_sources.push_back({m_engine, obd::ParameterFactory().createParameter(*m_engine, *obd->getSettings(), id), {}});
-    m_proxy->answer("01 0D", {{0x7E8, "41 0D 50"}, {0x7E9, "41 0D 50"}});
-    m_proxy->answer("01 10", {{0x7E9, "41 10 07 D0"}}); // the air of another module is not that of the engine
-    run(careful, 1000);
-    EXPECT_EQ(count(0x7E8, id), 0U);
-    m_proxy->answer("01 10", {{0x7E8, "41 10 07 D0"}});
-    run(careful, 1000);
-    std::size_t const told = count(0x7E8, id);
-    EXPECT_GT(told, 10U);
-    EXPECT_EQ(m_results.back().readings.front().sensor, "CONSUMPTION");
-    EXPECT_EQ(m_results.back().readings.front().pid, "");
-    // A lost reply now and then does no harm, but air of more than 5 s ago is none.
-    m_proxy->fail("01 10", FakeProxy::Status::NoResponse);
-    run(careful, 6000);
-    std::size_t const stale = count(0x7E8, id);
-    EXPECT_GT(stale, told + 60U);
-    run(careful, 6000);
-    EXPECT_EQ(count(0x7E8, id), stale);
-}
-
-// 20 g/s of air burn 1.36 g/s of petrol (14.7 to 1), 6.57 l/h at 745 g/l: at 80 km/h 8.22 l/100 km, 28.6 miles on 3.785
-// l and 34.4 miles on 4.546 l.
-TEST_F(PollCycleTest, ConsumptionIsInTheGallonsOfTheUnits)
-{
-    for (auto const& [units, unit, number] : {std::tuple(velmora::Units::Metric, "l/100 km", 8.22),
-                                              {velmora::Units::Imperial, "mpg", 28.62},
-                                              {velmora::Units::ImperialUk, "mpg (UK)", 34.37}}) {
-        auto const obd = obd::ObdVelmoraBuilder::createObdVelmora(0, 0, 0, std::make_shared<support::MemorySettings>());
-        auto const id = obd::ParameterIdentifier::FuelConsumption;
-        m_units = units;
-        m_cycle = nullptr;
-        m_sources = {{m_engine, obd::ParameterFactory().createParameter(*m_engine, *obd->getSettings(), id), {}}};
-        m_proxy->answer("01 0D", "41 0D 50");
-        m_proxy->answer("01 10", "41 10 07 D0");
-        run(careful, 500);
-        velmora::Reading const& reading = m_results.back().readings.front();
-        EXPECT_EQ(reading.unit, unit);
-        EXPECT_NEAR(std::get<double>(reading.value), number, 0.06) << unit;
-        EXPECT_NEAR(std::stod(m_results.back().values.front()->mean), number, 0.06) << unit;
-    }
-}
-
-TEST_F(PollCycleTest, InputsOfADerivedValueAreFetchedTogether)
-{
-    want(obd::ParameterIdentifier::Torque);
-    m_proxy->answer("01 0C", "41 0C 1A F8");
-    m_proxy->answer("01 0D", "41 0D 50");
-    m_proxy->answer("01 0C 0D", "41 0C 1A F8 0D 50");
-    run(fastSix, 240);
-    EXPECT_EQ(m_proxy->count("01 0C"), 1); // at first what it needs is not known
-    EXPECT_EQ(m_proxy->count("01 0D"), 1);
-    EXPECT_EQ(m_proxy->count("01 0C 0D"), 18);
-    EXPECT_EQ(count(0x7E8, obd::ParameterIdentifier::Torque), 19U);
-}
-
 TEST_F(PollCycleTest, OneModulesValuesGoTheQuickerWay)
 {
     want(0x0C);
@@ -376,37 +208,6 @@ TEST_F(PollCycleTest, OnlyRequestsOfOneModuleAmongSeveralAreAddressed)
     m_proxy->setEcus({m_engine});
     run(fastAddressed, 1000);
     EXPECT_EQ(m_way.find('a'), std::string::npos) << "nobody else answers";
-}
-
-TEST_F(PollCycleTest, TheBatteryIsTheAdaptersAffair)
-{
-    want(obd::ParameterIdentifier::BatteryVoltage);
-    m_proxy->setBatteryVoltage(12.4F);
-    run(careful, 100);
-    EXPECT_EQ(last(0x7E8, obd::ParameterIdentifier::BatteryVoltage), "12.4");
-}
-
-TEST_F(PollCycleTest, TheCurrentOfAnOxygenSensorIsThatOfTheStandard)
-{
-    want(0x34);
-    m_proxy->answer("01 34", "41 34 80 00 80 00"); // in the middle of both ranges
-    run(careful, 100);
-    ASSERT_EQ(m_results.front().readings.size(), 2U);
-    EXPECT_EQ(std::get<double>(m_results.front().readings[1].value), 0.0);
-    EXPECT_EQ(m_results.front().readings[1].sensor, "PID_34_2");
-    EXPECT_EQ(m_results.front().values[1]->value, "0.00");
-    EXPECT_EQ(m_results.front().values[1]->minimum, "0.00");
-    EXPECT_EQ(m_results.front().values[0]->value, "1.000");
-}
-
-TEST(OxygenCurrent, TheOffsetIsOfTheCurrentsAlone)
-{
-    EXPECT_EQ(velmora::shownText(0x34 * 10 + 1, "128.50"), "0.50");
-    EXPECT_EQ(velmora::shownText(0x3B * 10 + 1, "0.00"), "-128.00");
-    EXPECT_EQ(velmora::shownText(0x34 * 10, "1.00"), "1.00");
-    EXPECT_EQ(velmora::shownText(0x33 * 10 + 1, "5.00"), "5.00");
-    EXPECT_EQ(velmora::shownText(0x3C * 10 + 1, "5.00"), "5.00");
-    EXPECT_EQ(velmora::shownText(0x34 * 10 + 1, ""), "");
 }
 
 } // namespace

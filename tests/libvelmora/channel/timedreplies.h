@@ -1,0 +1,31 @@
+#pragma once
+
+#include "tests/support/scriptedwire.h"
+
+#include <string>
+
+// Replies with the time that adapters take for them.
+namespace velmora::test {
+
+using Pieces = support::ScriptedWire::Reply;
+
+inline std::string const speedLine = "7E804410C1AF8";
+inline std::string const speedOfTwo = "7E804410C1AF8\r7E904410C1AF9";
+
+// What an adapter that waits says plainly, and with a count.
+inline Pieces saidPlainly(std::string const& lines)
+{
+    return {{lines + "\r"}, {"\r>", WireTime(80)}};
+}
+inline Pieces saidCounted(std::string const& lines)
+{
+    return {{lines + "\r\r>"}};
+}
+
+// An adapter that ignores its adaptive timing: 400 ms behind each reply, or what ATST tells.
+inline Pieces saidSlowly(std::string const& lines, int waitMs)
+{
+    return {{lines + "\r", WireTime(20)}, {"\r>", WireTime(waitMs)}};
+}
+
+} // namespace velmora::test
