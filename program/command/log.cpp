@@ -7,6 +7,7 @@
 #include "program/view/trafficlog.h"
 
 #include <obd/isensorservice.h>
+#include <obd/itroublecodeservice.h>
 #include <obd/itroubleshootingservice.h>
 #include <tervex/observer.h>
 
@@ -84,9 +85,15 @@ private:
     std::shared_ptr<obd::ITroubleshootingService> m_service;
 };
 
-SensorIds chosenSensors(std::vector<std::string> const& names, obd::ISensorService& service)
+// Asks for the sensors over and over. Without any it asks once for the lamp: from its first request on the library
+// keeps an idle connection up, by one every five seconds.
+void startTraffic(std::vector<std::string> const& names, obd::ISensorService& service)
 {
-    return names.empty() ? SensorIds() : chooseSensors(names, offeredSensors(service));
+    if (names.empty()) {
+        obd::TroubleCodeServiceBuilder::createTroubleCodeService()->askMilStatus();
+    } else {
+        service.startUpdates(chooseSensors(names, offeredSensors(service)));
+    }
 }
 
 ExitCode log(LogOptions const& chosen, GlobalOptions const& options)
@@ -98,7 +105,7 @@ ExitCode log(LogOptions const& chosen, GlobalOptions const& options)
     if (chosen.count > 0) {
         traffic.limit(chosen.count);
     }
-    sensors->startUpdates(chosenSensors(chosen.sensors, *sensors));
+    startTraffic(chosen.sensors, *sensors);
     Clock::time_point const start = Clock::now();
     auto const done = [&] {
         bool const expired =
@@ -123,7 +130,8 @@ void addLogCommand(CommandLine& commandLine)
         commandLine.addCommand("log", "Show the traffic with the adapter as it happens",
                                [chosen](GlobalOptions const& options) { return log(*chosen, options); });
     command->add_option("SENSOR", chosen->sensors,
-                        "What to ask for meanwhile, named as for live; without, only the connection is kept up");
+                        "What to ask for meanwhile, named as for live; without, only the connection is kept up,\n"
+                        "by a request every five seconds");
     command->add_option("-n,--count", chosen->count, "Stop N entries after the connection stands")
         ->type_name("N")
         ->check(CLI::Range(1UL, 1000000000UL));

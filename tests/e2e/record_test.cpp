@@ -107,3 +107,13 @@ TEST(Log, CountsFromWhereTheConnectionStands)
     auto const lineBegin = outcome.out.begin() + static_cast<std::ptrdiff_t>(outcome.out.rfind('\n', first) + 1);
     EXPECT_EQ(std::count(lineBegin, outcome.out.end(), '\n'), 4) << outcome.out;
 }
+
+// The library keeps an idle connection up from its first request on.
+TEST(Log, WithoutASensorTheConnectionIsKeptUp)
+{
+    Outcome const outcome = runVelmora({"-q", "-p", "sim:petrol-can11?instant", "log", "-n", "4"});
+    EXPECT_EQ(outcome.exitCode, 0) << outcome.err;
+    std::size_t const stands = outcome.out.rfind(" ATST64");
+    ASSERT_NE(stands, std::string::npos) << outcome.out;
+    EXPECT_NE(outcome.out.find(" 0101", stands), std::string::npos) << outcome.out;
+}
