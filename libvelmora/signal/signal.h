@@ -72,11 +72,11 @@ std::optional<std::string> refusalOf(std::vector<unsigned char> const& request);
 // with 18DAF1xx. Nothing for any other header.
 std::optional<std::string> standardReply(std::string const& header);
 
-// The header of the answer on the buses before CAN: receiver and sender change places, "82F110" for 8210F1. Nothing for
+// The header of the answer on legacy buses: receiver and sender change places, "82F110" for 8210F1. Nothing for
 // a header that is none of a tester there.
 std::optional<std::string> swappedReply(std::string const& header);
 
-// Whether a header asks all modules: 7DF, 18DB33F1, and those of the buses before CAN.
+// Whether a header asks all modules: 7DF, 18DB33F1, and those of the legacy buses.
 bool isFunctionalHeader(std::string const& header);
 
 // What is wrong in a file, and where.

@@ -32,7 +32,7 @@ KwpCodeReport readKwpCodes(ModuleAsker& asker, RequestAddress const& address);
 struct CodesByService
 {
     UdsCodeReport uds;
-    std::optional<KwpCodeReport> kwp; // of one that does not know service 19, or is on a bus before CAN
+    std::optional<KwpCodeReport> kwp; // of one that does not know service 19, or is on a legacy bus
 
     TopicAnswer answer() const { return kwp ? kwp->answer : uds.answer; }
     // Nothing if it did not tell them.

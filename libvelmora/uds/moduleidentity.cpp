@@ -54,7 +54,7 @@ void ModuleIdentity::readByService1A(FoundModule& module, RequestAddress const& 
     }
 }
 
-// On the buses before CAN nobody speaks ISO 14229.
+// On legacy buses nobody speaks ISO 14229.
 bool ModuleIdentity::asksByService22(RequestAddress const& address) const
 {
     return !isLegacyHeader(address.header);

@@ -106,7 +106,7 @@ std::vector<FoundModule> ModuleScan::find()
     if (!obd::isCan(m_asker.proxy().protocol())) {
         throw Error(ErrorKind::NotSupported,
                     "The bus of this vehicle is no CAN: modules beyond OBD can't be looked for",
-                    {"on older buses each module needs a start of its own, which would end the connection"});
+                    {"on legacy buses each module needs a start of its own, which would end the connection"});
     }
     StandingGuard guard(m_asker.proxy());
     guard.check();

@@ -103,7 +103,7 @@ std::vector<PollResult> SignalGroup::turn(PollWire& wire)
 }
 
 // What may be asked for in one request: identifiers whose length is known, and was right when they were asked for
-// alone. Before CAN a request has one identifier (ISO 14230-3).
+// alone. On a legacy bus a request has one identifier (ISO 14230-3).
 std::vector<SignalGroup::Request*> SignalGroup::together(std::vector<Request*> const& due) const
 {
     std::vector<Request*> chosen;

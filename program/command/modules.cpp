@@ -72,7 +72,7 @@ std::string modulesText(std::vector<FoundModule> const& modules, GlobalOptions c
     return text;
 }
 
-// Before CAN, modules beyond those that the connection has started each need a start of their own, which would end
+// On legacy buses, modules beyond those that the connection has started each need a start of their own, which would end
 // it.
 std::vector<FoundModule> modulesOfConnection(CommandSession& session)
 {
