@@ -120,12 +120,23 @@ DocumentSection codeSection(CodeReport const& report)
     return section;
 }
 
-std::optional<DocumentSection> freezeSection(FreezeReport const& report)
+// What a module did not tell, as a paragraph, unless it does not offer it, which is told of nobody.
+std::optional<DocumentSection> untoldSection(std::string const& title, TopicAnswer answer)
 {
-    if (!hasAnswer(report)) {
+    if (answer == TopicAnswer::NotOffered) {
         return std::nullopt;
     }
-    DocumentSection section{2, fmt::format("{} {}", texts::freezeFrame, report.number), {}};
+    return DocumentSection{
+        2, title, {DocumentParagraph{{texts::answers[static_cast<std::size_t>(answer)], DocumentMark::Faint}}}};
+}
+
+std::optional<DocumentSection> freezeSection(FreezeReport const& report)
+{
+    std::string const title = fmt::format("{} {}", texts::freezeFrame, report.number);
+    if (!hasAnswer(report)) {
+        return untoldSection(title, report.answer);
+    }
+    DocumentSection section{2, title, {}};
     if (!report.frame) {
         section.blocks.push_back(DocumentParagraph{{texts::noneStored}});
         return section;
@@ -140,16 +151,6 @@ std::optional<DocumentSection> freezeSection(FreezeReport const& report)
     section.blocks.push_back(code);
     section.blocks.push_back(readings);
     return section;
-}
-
-// What a module did not tell, as a paragraph, unless it does not offer it, which is told of nobody.
-std::optional<DocumentSection> untoldSection(char const* title, TopicAnswer answer)
-{
-    if (answer == TopicAnswer::NotOffered) {
-        return std::nullopt;
-    }
-    return DocumentSection{
-        2, title, {DocumentParagraph{{texts::answers[static_cast<std::size_t>(answer)], DocumentMark::Faint}}}};
 }
 
 DocumentCell statusCell(std::optional<ReadinessStatus> status, bool marked)

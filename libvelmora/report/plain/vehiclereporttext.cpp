@@ -64,9 +64,9 @@ std::string moduleText(ModuleReport const& module, Style const& style)
     std::string text = moduleHeading(module.id, module.name) + "\n" + toText(module.info, style) +
                        labelledLine(texts::sensors, std::to_string(module.supported.size()));
     for (std::string const& topic :
-         {toText(module.codes, style), hasAnswer(module.freeze) ? toText(module.freeze, style) : std::string(),
-          readinessText(module.readiness, style), topicText(module.monitors, style), topicText(module.oxygen, style),
-          topicText(module.counters, style), valuesText(module.values, style)}) {
+         {toText(module.codes, style), topicText(module.freeze, style), readinessText(module.readiness, style),
+          topicText(module.monitors, style), topicText(module.oxygen, style), topicText(module.counters, style),
+          valuesText(module.values, style)}) {
         text += topic.empty() ? "" : "\n" + topic;
     }
     return text;

@@ -174,6 +174,10 @@ TEST(ReportDocument, TellsSilenceAndRefusalAsWhatTheyAre)
     ModuleReport silent{0x7E9, "", {}, {}, {}, {}, {}, {}, {}, {}};
     std::string const untold = toHtml(makeDocument({{}, {}, {silent}}, facts));
     EXPECT_NE(untold.find("not reported"), std::string::npos) << "the lamp";
+    EXPECT_EQ(untold.find("Freeze frame 0"), std::string::npos) << "nor what is not offered";
+    silent.freeze.answer = TopicAnswer::Silent;
+    std::string const lost = toHtml(makeDocument({{}, {}, {silent}}, facts));
+    EXPECT_NE(lost.find("no answer", lost.find("Freeze frame 0")), std::string::npos);
 }
 
 TEST(ReportDocument, DrawsABarWhereThereAreLimits)

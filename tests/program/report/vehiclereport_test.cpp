@@ -16,6 +16,7 @@ VehicleReport vehicle()
     module.info.standard = "EOBD";
     module.codes = {false, {{CodeKind::Confirmed, CodeList::Answer::Read, {}, {}}}};
     module.readiness = {TopicAnswer::Read, false, {{"Catalyst", ReadinessStatus::Complete, {}}}};
+    module.freeze.answer = TopicAnswer::Silent;
     module.counters.answer = TopicAnswer::Silent;
     report.modules = {module};
     return report;
@@ -49,6 +50,8 @@ Control module 7E8: ECM
 
   Lamp           off
   Confirmed      none stored
+
+  Freeze frame   0: no answer
 
   Readiness      ready
     Monitor   Since cleared  This driving cycle
