@@ -112,7 +112,8 @@ void addLater(Rows& rows, unsigned char pid)
 std::string whyUnknown(obd::IEcu const& ecu, obd::ObdMode mode)
 {
     TopicAnswer const answer = toAnswer(ecu.detection(mode, 0));
-    return answer == TopicAnswer::Silent || answer == TopicAnswer::Unreadable
+    bool const refused = answer == TopicAnswer::Refused && mode == obd::ObdMode::CurrentData; // which all modules have
+    return answer == TopicAnswer::Silent || answer == TopicAnswer::Unreadable || refused
                ? fmt::format(" (not known in full: {})", answerWord(answer))
                : std::string();
 }

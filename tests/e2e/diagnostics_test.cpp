@@ -6,6 +6,9 @@
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
 
+#include <cstdio>
+#include <fstream>
+
 namespace {
 
 using e2e::Outcome;
@@ -74,6 +77,19 @@ TEST(Diagnostics, CountersAndInformationAreThoseOfTheCar)
 TEST(Diagnostics, ReadsWhatAModuleOnAKLineAsksTimeFor)
 {
     EXPECT_EQ(runJson("petrol-kwp-fast", "info")[0]["vin"], "VELMRAK1M70000004");
+}
+
+TEST(Diagnostics, AModuleThatRefusesToTellWhatItHasIsToldSo)
+{
+    std::string const file = testing::TempDir() + "velmora-refusing.toml";
+    std::ofstream(file) << "name = 'refuses'\nprotocol = 6\n[[module]]\nid = '7E8'\nlive = '0C'\n"
+                           "[[module]]\nid = '7E9'\n[module.raw]\n'0100' = '7F 01 22'\n";
+    Outcome const outcome = runVelmora({"-q", "-p", "sim:" + file + "?instant", "sensors"});
+    std::size_t const second = outcome.out.find("Control module 7E9");
+    ASSERT_NE(second, std::string::npos) << outcome.out;
+    EXPECT_FALSE(holds(outcome.out.substr(0, second), "refused")) << outcome.out;
+    EXPECT_TRUE(holds(outcome.out.substr(second), "F6 (not known in full: refused)\n")) << outcome.out;
+    std::remove(file.c_str());
 }
 
 TEST(Diagnostics, WhatNoModuleOffersIsExitCodeSix)
