@@ -12,6 +12,9 @@ namespace {
 // Shorter ones come of the line and the system. They are not lost: they add up until they make one that counts.
 constexpr obdsim::Time shortestPause = obdsim::Ms(20);
 
+// The channel takes no longer reply. An adapter that floods must not fill the memory.
+constexpr std::size_t longestReply = 1U << 20U;
+
 bool asks(obdsim::Exchange const& exchange, char const* command)
 {
     return obdsim::normaliseCommand(exchange.sent) == command;
@@ -38,6 +41,7 @@ void DialogueRecorder::onSent(std::string_view bytes)
     for (char const character : bytes) {
         if (character == '\r') {
             m_dialogue.exchanges.push_back({std::exchange(m_line, {}), {}});
+            m_room = longestReply;
         } else {
             m_line += character;
         }
@@ -47,9 +51,11 @@ void DialogueRecorder::onSent(std::string_view bytes)
 void DialogueRecorder::onReceived(std::string_view bytes)
 {
     std::lock_guard const lock(m_mutex);
-    if (m_dialogue.exchanges.empty()) {
+    bytes = bytes.substr(0, m_room);
+    if (bytes.empty()) {
         return;
     }
+    m_room -= bytes.size();
     obdsim::Time const pause = pauseUntil(Clock::now());
     auto& chunks = m_dialogue.exchanges.back().chunks;
     if (chunks.empty() || pause != obdsim::Time(0)) {

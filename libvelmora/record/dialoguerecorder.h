@@ -8,7 +8,8 @@
 
 namespace velmora {
 
-// Records what passes a port as a dialogue, byte for byte and with its pauses. Any thread.
+// Records what passes a port as a dialogue, byte for byte and with its pauses, up to a megabyte of each reply. Any
+// thread.
 class DialogueRecorder
 {
 public:
@@ -26,6 +27,7 @@ private:
     mutable std::mutex m_mutex;
     obdsim::Dialogue m_dialogue; // protected by m_mutex, as what follows
     std::string m_line;          // sent so far, its end is still to come
+    std::size_t m_room = 0;      // for further bytes of the reply under way; none before the first command
     Clock::time_point m_told;    // how far the pauses that were written reach
 };
 

@@ -38,6 +38,21 @@ TEST(DialogueRecorder, dropsWhatComesBeforeTheFirstCommand)
     EXPECT_EQ(recorder.dialogue().exchanges[0].received(), "");
 }
 
+TEST(DialogueRecorder, keepsAMegabyteOfAReplyThatHasNoEnd)
+{
+    constexpr std::size_t megabyte = 1U << 20U;
+    DialogueRecorder recorder;
+    recorder.onSent("ATI\r");
+    for (int i = 0; i < 3; ++i) {
+        recorder.onReceived(std::string(megabyte / 2 + 1, '>'));
+    }
+    recorder.onSent("ATE0\r");
+    recorder.onReceived("OK\r\r>");
+    obdsim::Dialogue const dialogue = recorder.dialogue();
+    EXPECT_EQ(dialogue.exchanges[0].received().size(), megabyte);
+    EXPECT_EQ(dialogue.exchanges[1].received(), "OK\r\r>");
+}
+
 TEST(DialogueRecorder, tellsProtocolAndHeadersFromTheBytes)
 {
     DialogueRecorder recorder;
