@@ -1,8 +1,11 @@
 #include "libvelmora/output/outputaddress.h"
 
+#include "libvelmora/record/checkedfile.h"
+
 #include <velmora/error.h>
 
 #include <algorithm>
+#include <array>
 #include <charconv>
 #include <string_view>
 #include <vector>
@@ -124,6 +127,16 @@ std::string toString(OutputAddress const& address)
 {
     KnownKind const* const kind = findKind(address.kind);
     return address.kind + (kind != nullptr && kind->isUrl ? "://" : ":") + address.target;
+}
+
+void requirePlainTarget(OutputAddress const& address)
+{
+    static std::array<std::string_view, 5> const files = {"csv", "csv-long", "ndjson", "influx", "sqlite"};
+    bool const isFile = std::ranges::find(files, address.kind) != files.end() && address.target != "-" &&
+                        !address.target.starts_with("udp://");
+    if (isFile) {
+        requirePlainFile(address.target);
+    }
 }
 
 unsigned long long parseSize(std::string const& text)

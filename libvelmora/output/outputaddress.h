@@ -25,6 +25,10 @@ void addOption(OutputAddress& address, std::string const& key, std::string const
 // "csv:drive.csv", without options: how messages call it.
 std::string toString(OutputAddress const& address);
 
+// Throws Error for an output to a file whose target stands and is no plain one: a pipe would hold it up, a device keeps
+// nothing.
+void requirePlainTarget(OutputAddress const& address);
+
 // A number of bytes: "500", "10k", "10MB", "1G". Throws Error for anything else and for 0.
 unsigned long long parseSize(std::string const& text);
 

@@ -26,6 +26,19 @@ void requireWritable(std::filesystem::path const& file, std::string const& what)
                 {"does its folder exist, and may you write there?"});
 }
 
+void requirePlainFile(std::filesystem::path const& file)
+{
+    std::error_code error;
+    std::filesystem::file_status const status = std::filesystem::status(file, error);
+    if (!std::filesystem::exists(status) || std::filesystem::is_regular_file(status)) {
+        return;
+    }
+    char const* const kind = std::filesystem::is_directory(status) ? "a folder"
+                             : std::filesystem::is_fifo(status)    ? "a pipe"
+                                                                   : "a device";
+    throw Error(ErrorKind::WrongUse, fmt::format("{} is {}, no plain file", file.string(), kind), {"name a file"});
+}
+
 std::string whyUnreadable(std::filesystem::path const& file, std::uintmax_t largest)
 {
     std::error_code error;

@@ -1,5 +1,7 @@
 #include "libvelmora/record/dialoguefile.h"
 
+#include "libvelmora/record/checkedfile.h"
+
 #include <velmora/error.h>
 
 #include <utility>
@@ -10,7 +12,8 @@ namespace {
 
 std::filesystem::path const& unused(std::filesystem::path const& path)
 {
-    if (std::filesystem::exists(path)) {
+    requirePlainFile(path);
+    if (std::error_code error; std::filesystem::exists(path, error)) {
         throw Error(ErrorKind::WrongUse, "The file " + path.string() + " exists already",
                     {"record to another name, or remove the file first"});
     }

@@ -1,5 +1,6 @@
 #include "libvelmora/replay/recordingfile.h"
 
+#include "libvelmora/record/checkedfile.h"
 #include "libvelmora/replay/readdatabase.h"
 
 #include <velmora/error.h>
@@ -14,10 +15,7 @@ namespace {
 
 std::ifstream opened(std::filesystem::path const& file)
 {
-    std::error_code error;
-    if (std::filesystem::is_directory(file, error)) {
-        throw Error(ErrorKind::WrongUse, file.string() + " is a folder", {"name a recording in it"});
-    }
+    requirePlainFile(file);
     std::ifstream in(file, std::ios::binary);
     if (!in) {
         throw Error(ErrorKind::Failed, "Could not read " + file.string() + ": " + std::strerror(errno),

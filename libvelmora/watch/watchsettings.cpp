@@ -136,6 +136,7 @@ void WatchSettingsReader::readOutput(toml::node const& node)
             }
             addOption(address, name, number ? std::to_string(*number) : *text);
         }
+        requirePlainTarget(address);
         m_settings.outputs.push_back(std::move(address));
     } catch (Error const& error) {
         m_table.mistake(*table, "output", error.what());

@@ -1,6 +1,7 @@
 #include "libvelmora/output/database/triplist.h"
 
 #include "libvelmora/output/valuetext.h"
+#include "libvelmora/record/checkedfile.h"
 
 #include <velmora/error.h>
 
@@ -26,7 +27,8 @@ std::optional<double> realOrNothing(Statement const& row, int column)
 
 std::vector<Trip> readTrips(std::string const& file)
 {
-    if (!std::filesystem::is_regular_file(file)) {
+    requirePlainFile(file);
+    if (std::error_code error; !std::filesystem::exists(file, error)) {
         throw Error(ErrorKind::WrongUse, "There is no file " + file, {"name the FILE of watch's output sqlite:FILE"});
     }
     Database database(file, Database::Access::ReadOnly);

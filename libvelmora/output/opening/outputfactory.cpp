@@ -93,6 +93,7 @@ std::vector<std::string> builtInOutputs()
 
 std::unique_ptr<IOutput> makeOutput(OutputAddress const& address, OutputContext const& context)
 {
+    requirePlainTarget(address);
     for (Maker const& each : makers()) {
         if (address.kind == each.kind) {
             return each.make(address, context);

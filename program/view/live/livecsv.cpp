@@ -30,6 +30,16 @@ std::string quoted(std::string const& text)
     return result + "\"";
 }
 
+[[noreturn]] void failOpen(std::string const& file, int why)
+{
+    if (why == ENXIO) {
+        throw Error(ErrorKind::Failed, "Nobody reads " + file + ", which is a pipe",
+                    {"start its reader first, or name a file"});
+    }
+    throw Error(ErrorKind::Failed, "Could not open " + file + " for writing: " + std::strerror(why),
+                {why == EISDIR ? "name a file in it" : "does the folder exist, and may you write there?"});
+}
+
 std::FILE* openFile(std::string const& file)
 {
     // Not truncated yet: a connection that fails must not cost an old recording. A pipe that nobody reads is an error
@@ -41,8 +51,7 @@ std::FILE* openFile(std::string const& file)
     }
     std::FILE* const stream = descriptor >= 0 ? ::fdopen(descriptor, "w") : nullptr;
     if (stream == nullptr) {
-        throw Error(ErrorKind::Failed, "Could not open " + file + " for writing: " + std::strerror(errno),
-                    {"does the folder exist, and may you write there?"});
+        failOpen(file, errno);
     }
     return stream;
 }

@@ -1,11 +1,15 @@
 #include "libvelmora/output/opening/outputfactory.h"
 #include "libvelmora/output/outputaddress.h"
 #include "libvelmora/output/valuetext.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <velmora/error.h>
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
+
+#include <filesystem>
+#include <sys/stat.h>
 
 namespace {
 
@@ -58,6 +62,23 @@ TEST(OutputAddress, TellsWhatIsWrong)
     EXPECT_THAT(outputComplaint("csv:a?rotate=1k&rotate=day"), HasSubstr("twice"));
     EXPECT_THAT(outputComplaint("csv:a?rotate=often"), HasSubstr("\"often\" is no size"));
     EXPECT_THAT(outputComplaint("influx:udp://nowhere"), HasSubstr("needs a host and a port"));
+}
+
+TEST(OutputFiles, ArePlainOnes)
+{
+    testsupport::TemporaryFolder const folder;
+    ASSERT_EQ(::mkfifo(folder.file("pipe").c_str(), 0600), 0);
+    std::filesystem::create_directory(folder.file("inner"));
+    for (std::string const kind : {"csv:", "csv-long:", "ndjson:", "influx:", "sqlite:"}) {
+        for (auto const& [target, what] : {std::pair(folder.file("pipe"), " is a pipe, no plain file"),
+                                           {folder.file("inner"), " is a folder, no plain file"},
+                                           {std::string("/dev/null"), " is a device, no plain file"}}) {
+            EXPECT_EQ(outputComplaint(kind + target), target + what) << kind;
+        }
+        EXPECT_EQ(outputComplaint(kind + folder.file("none")), "") << kind << " makes it";
+    }
+    EXPECT_EQ(outputComplaint("ndjson:-"), "");
+    EXPECT_EQ(outputComplaint("influx:udp://127.0.0.1:8089"), "");
 }
 
 TEST(OutputAddress, SizesHaveBinaryUnits)

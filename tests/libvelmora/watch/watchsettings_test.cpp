@@ -94,6 +94,8 @@ rotate = "day"
 [[output]]
 to = "csv:a"
 qos = 1
+[[output]]
+to = "csv:/dev/null"
 )"),
                 AllOf(HasSubstr("w.toml:1: prot: is not known here"), HasSubstr("w.toml:2: vehicle: must"),
                       HasSubstr("w.toml:3: vin: must"), HasSubstr("w.toml:4: sensors: "),
@@ -102,7 +104,8 @@ qos = 1
                       HasSubstr("w.toml:10: battery.volts: is not known here"),
                       HasSubstr("w.toml:11: output: \"tape:x\" is no output"),
                       HasSubstr("w.toml:13: output.to: is missing"),
-                      HasSubstr("w.toml:15: output: The output csv:a has no setting \"qos\"")));
+                      HasSubstr("w.toml:15: output: The output csv:a has no setting \"qos\""),
+                      HasSubstr("w.toml:18: output: /dev/null is a device, no plain file")));
     EXPECT_THAT(settingsComplaint("port = \"a\"\nvehicle = "), HasSubstr("w.toml:2: "));
     EXPECT_THAT(settingsComplaint("output = 3\nbattery = 4"),
                 AllOf(HasSubstr("w.toml:1: output: must"), HasSubstr("w.toml:2: battery: must")));

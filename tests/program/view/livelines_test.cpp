@@ -204,7 +204,18 @@ TEST_F(LiveCsvFile, TellsOfAFileThatCannotBeOpenedOrWritten)
 {
     EXPECT_THROW(LiveCsv("/nowhere/at/all.csv"), Error);
     ASSERT_EQ(::mkfifo(file.c_str(), 0600), 0);
-    EXPECT_THROW(LiveCsv(file.string()), Error) << "a pipe that nobody reads is not waited for";
+    auto const complaint = [](std::string const& name) {
+        try {
+            LiveCsv{name};
+        } catch (Error const& error) {
+            return error.what() + (" - " + error.hints().front());
+        }
+        return std::string();
+    };
+    EXPECT_EQ(complaint(file),
+              "Nobody reads " + file.string() + ", which is a pipe - start its reader first, or name a file")
+        << "it is not waited for";
+    EXPECT_THAT(complaint(file.parent_path()), testing::EndsWith("Is a directory - name a file in it"));
     if (std::filesystem::exists("/dev/full")) {
         LiveCsv full("/dev/full");
         EXPECT_THROW(full.begin(table, now, start), Error);
