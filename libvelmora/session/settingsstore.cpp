@@ -133,6 +133,22 @@ SettingsStore::SettingsStore(std::filesystem::path file) : m_file(std::move(file
         place << problem.description() << " (line " << problem.source().begin.line << ")";
         failRead(m_file, place.str());
     }
+    refuseWrongValues();
+}
+
+// A value that nobody can set would count all the same, and bring plausible wrong numbers.
+void SettingsStore::refuseWrongValues() const
+{
+    for (VehicleSetting const& setting : vehicleSettings()) {
+        auto const found = m_values.find(setting.key);
+        if (found == m_values.end()) {
+            continue;
+        }
+        int const* const number = std::get_if<int>(&found->second);
+        if (number == nullptr || *number < setting.lowest || *number > setting.highest) {
+            failRead(m_file, found->first + " has no value that it can have; expected " + storedRange(setting));
+        }
+    }
 }
 
 void SettingsStore::setInt(std::string const& key, int value)
@@ -210,6 +226,9 @@ void SettingsStore::sync()
     std::error_code error;
     if (m_file.has_parent_path()) {
         std::filesystem::create_directories(m_file.parent_path(), error);
+    }
+    if (error) {
+        failWrite(m_file, error.value());
     }
     writeWhole(m_file, toToml());
 }

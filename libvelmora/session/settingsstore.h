@@ -41,6 +41,7 @@ private:
 
     template <typename T>
     bool get(std::string const& key, T& value);
+    void refuseWrongValues() const;
     std::string toToml() const;
 
     std::filesystem::path m_file;

@@ -160,6 +160,19 @@ std::string shownRange(VehicleSetting const& setting)
     return fmt::format("{} or {}", fmt::join(leading, ", "), setting.words.back());
 }
 
+std::string storedRange(VehicleSetting const& setting)
+{
+    if (setting.words.empty()) {
+        return fmt::format("{} to {}{}", setting.lowest, setting.highest,
+                           setting.decimals == hundredths ? " hundredths" : "");
+    }
+    std::string text;
+    for (std::size_t number = 0; number < setting.words.size(); ++number) {
+        text += fmt::format("{}{} ({})", number == 0 ? "" : " or ", number, setting.words[number]);
+    }
+    return text;
+}
+
 void setSetting(VehicleSetting const& setting, std::string const& text, obd::ISettings& store)
 {
     std::optional<int> const stored = parseStored(setting, text);

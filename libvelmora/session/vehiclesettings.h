@@ -37,6 +37,9 @@ std::string shownDefault(VehicleSetting const& setting);
 // "0.05 to 30.00", "metric or imperial".
 std::string shownRange(VehicleSetting const& setting);
 
+// The same as a settings file has it: "5 to 3000 hundredths", "0 (metric) or 1 (imperial)".
+std::string storedRange(VehicleSetting const& setting);
+
 // Sets it from what a person typed, without bringing it to the disk. Throws Error that tells the range.
 void setSetting(VehicleSetting const& setting, std::string const& text, obd::ISettings& store);
 

@@ -112,11 +112,31 @@ TEST_F(Settings, BrokenFileIsToldWithItsLineAndLeftAlone)
 {
     for (char const* broken :
          {"[common\n", "a = \n", "[common]\nunitsystem = 1.5\n", "[common]\nenginedisplacement = 1e9\n",
-          "[common]\nenginedisplacement = nan\n", "x = [1]\n", "x = 9999999999\n"}) {
+          "[common]\nenginedisplacement = nan\n", "x = [1]\n", "x = 9999999999\n", "[common]\nvehicleweight = -5\n",
+          "[common]\nvehicleweight = 60001\n", "[common]\nenginedisplacement = 40.0\n", "[common]\nunitsystem = 2\n",
+          "[common]\nunitsystem = 'imperial'\n"}) {
         write(broken);
         EXPECT_THROW(SettingsStore{m_file}, Error) << broken;
         EXPECT_EQ(content(), broken);
     }
+}
+
+TEST_F(Settings, AValueThatNobodyCanSetIsToldWithWhatIsExpected)
+{
+    for (auto const& [text, expected] :
+         {std::pair("vehicleweight = -5", "common/vehicleweight has no value that it can have; expected 1 to 60000"),
+          {"enginedisplacement = 4", "expected 5 to 3000 hundredths"},
+          {"unitsystem = 'imperial'", "expected 0 (metric) or 1 (imperial)"}}) {
+        write(std::string("[common]\n") + text + "\n");
+        try {
+            SettingsStore{m_file};
+            ADD_FAILURE() << text;
+        } catch (Error const& error) {
+            EXPECT_TRUE(std::string(error.what()).ends_with(expected)) << error.what();
+        }
+    }
+    write("[common]\nvehicleweight = 60000\nenginedisplacement = 0.05\nunitsystem = 1\n");
+    EXPECT_NO_THROW(SettingsStore{m_file});
 }
 
 TEST_F(Settings, AValueInThePlaceOfAGroupGivesWay)
