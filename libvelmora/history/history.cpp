@@ -53,11 +53,22 @@ void makeFolder(std::filesystem::path const& file)
     }
 }
 
+bool stands(std::filesystem::path const& file)
+{
+    std::error_code error;
+    bool const found = std::filesystem::exists(file, error);
+    if (error) {
+        throw Error(ErrorKind::Failed, "Could not read " + file.string() + ": " + error.message(),
+                    {"may you read its folder? VELMORA_HISTORY=FILE names another place"});
+    }
+    return found;
+}
+
 } // namespace
 
 History::History(std::filesystem::path const& file, Access access) : m_file(file)
 {
-    if (access == Access::Look && !std::filesystem::exists(file)) {
+    if (access == Access::Look && !stands(file)) {
         return;
     }
     if (access == Access::Keep && file.has_parent_path()) {

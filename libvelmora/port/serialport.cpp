@@ -27,7 +27,8 @@ namespace {
         throw Error(ErrorKind::PortFailed, what,
                     {"your user may not use serial ports: add it to the group dialout and log in again"});
     }
-    if (error == asio::error_code(ENOTTY, asio::error::get_system_category())) {
+    bool const isFolder = error == asio::error_code(EISDIR, asio::error::get_system_category());
+    if (isFolder || error == asio::error_code(ENOTTY, asio::error::get_system_category())) {
         throw Error(ErrorKind::PortFailed, address.device + " is no serial port",
                     {"`velmora ports` lists what is there", "a recorded car is replay:FILE"});
     }

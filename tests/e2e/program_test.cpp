@@ -58,7 +58,7 @@ TEST(Program, WrongUseIsExitCodeTwoAndSaysWhatToDo)
 
 TEST(Program, PortThatDoesNotExistIsExitCodeThree)
 {
-    for (char const* port : {"/dev/no-such-port", "127.0.0.1:1", "/dev/null", "sim:no-such-car", "sim:/",
+    for (char const* port : {"/dev/no-such-port", "127.0.0.1:1", "/dev/null", "/tmp", "sim:no-such-car", "sim:/",
                              "replay:/no/such/file", "replay:/"}) {
         Outcome const outcome = runVelmora({"-p", port, "scan"});
         EXPECT_EQ(outcome.exitCode, 3) << port << outcome.err;

@@ -127,6 +127,8 @@ TEST_F(HistoryTest, RefusesAnotherProgramsDatabase)
     EXPECT_THROW(open("other.db"), Error);
     History const missing(m_folder.file("missing.db"), History::Access::Look);
     EXPECT_TRUE(missing.scans().empty());
+    EXPECT_THROW(open(("x/" + std::string(300, 'x')).c_str()), Error) << "a place that can't be looked at";
+    EXPECT_THROW(History(m_folder.file(std::string(300, 'x')), History::Access::Look), Error);
     EXPECT_FALSE(std::filesystem::exists(m_folder.file("missing.db"))) << "looking makes no file";
 }
 
