@@ -198,9 +198,11 @@ bool FastChannel::setUpAgain(HealedReply const& reply)
         return false;
     }
     m_resetAt = now;
-    if (reply.error.find("LVRESET") != std::string::npos) {
+    if (reply.reset && !reply.error.empty()) {
+        // LV RESET and ERR94 come before the adapter has started anew, and the supply may still be low. A banner in
+        // this time is dropped below.
         m_buffer.clear();
-        m_wire->read(now + restartPause); // the supply may still be low; a banner in this time is dropped below
+        m_wire->read(now + restartPause);
     }
     if (m_state.protocol() == 0 && !reply.error.empty()) {
         // Behind LV RESET and ERR94 a search leaves CAN out until the adapter is told to forget them.

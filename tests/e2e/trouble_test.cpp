@@ -70,7 +70,7 @@ TEST(Trouble, AnAdapterThatFallsSilentIsExitCodeFourInEveryCommand)
 TEST(Trouble, AnAdapterThatResetsItselfIsSetUpAgainAndNamed)
 {
     // One without a word is found behind the request that it fell into, which may have been the one for the VIN.
-    for (auto const& [reset, lastsBehind] : {std::pair{"reset:LV RESET@40", "VELMRAS1MM0000001"},
+    for (auto const& [reset, lastsBehind] : {std::pair{"reset:ERR94@40", "VELMRAS1MM0000001"},
                                              {"reset:banner@40", "VELMRAS1MM0000001"},
                                              {"reset@40", "640 km"}}) {
         FaultyCar const car({reset});
@@ -126,6 +126,10 @@ TEST(Trouble, FilesWithoutAnEndOrABeginningAreRefusedAtOnce)
                                                           {"signals", "import", file},
                                                           {"-p", "sim:", "--signals", file, "live", "RPM"},
                                                           {"history", "import", file},
+                                                          {"live", "--play", file},
+                                                          {"trips", file},
+                                                          {"-p", "sim:", "watch", "--output", "csv:" + file},
+                                                          {"-p", "sim:", "watch", "--output", "sqlite:" + file},
                                                           {"-p", "sim:", "record", file},
                                                           {"-p", "sim:", "doctor", "--bundle", file}}) {
             Outcome const outcome = runVelmora(arguments);
