@@ -190,6 +190,12 @@ TEST(DtcTable, ConditionsThatAreAlikeAreKeptApart)
     EXPECT_EQ(textsOf("GM", "P1134"), std::vector<std::string>{"O2 Sensor Transition Time Ratio"});
     EXPECT_EQ(textsOf("Isuzu", "P1640"), (std::vector<std::string>{"ODM 1 Circuit High - Except 1998 Rodeo",
                                                                    "ODM Output A Circuit - 1998 Rodeo"}));
+    EXPECT_EQ(textsOf("Isuzu", "P1381"),
+              (std::vector<std::string>{"Cylinder Position Sensor Intermittent - Misfire Detected - Except 1998 Rodeo",
+                                        "ABS Rough Road Class 2 Serial Data or Link Error - 1998 Rodeo"}));
+    EXPECT_EQ(textsOf("Mazda", "P1601"), std::vector<std::string>{"PCM Communication Line to TCM Error"});
+    EXPECT_EQ(textsOf("Nissan", "P1336"), std::vector<std::string>{"Crankshaft Position Sensor"});
+    EXPECT_EQ(textsOf("Infinity", "P1336"), std::vector<std::string>{"Crankshaft Position Sensor Cog Signal"});
     EXPECT_EQ(textsOf("Mazda", "P1602"), (std::vector<std::string>{"PCM Communication Line to TCM Error",
                                                                    "Immobilizer System Communication Error with PCM"}));
 }
