@@ -80,7 +80,8 @@ SignalSet::SignalSet(std::vector<std::string> const& files, std::filesystem::pat
             add(loadSignalFile(file.string()));
         } catch (Error const& error) {
             if (tell) {
-                tell(fmt::format("{} is passed over: {}\n", file.string(), error.what()));
+                std::string const why = error.hints().empty() ? "" : "  - " + error.hints().front() + "\n";
+                tell(fmt::format("{} is passed over: {}\n{}", file.string(), error.what(), why));
             }
         }
     }

@@ -1,4 +1,6 @@
 #include "libvelmora/signal/signalfile.h"
+#include "libvelmora/signal/signalset.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <velmora/error.h>
 
@@ -236,4 +238,16 @@ TEST(SignalFile, LoadsFilesThatAreSound)
     std::filesystem::remove(path);
     EXPECT_THROW(loadSignalFile(path.string()), Error);
     EXPECT_THROW(loadSignalFile("/dev/zero"), Error);
+}
+
+TEST(SignalSet, PassesOverBrokenFilesOfItsFolderAndSaysWhatIsWrong)
+{
+    testsupport::TemporaryFolder const folder;
+    std::ofstream(folder.file("a.toml")) << "x = 1\n";
+    std::ofstream(folder.file("b.toml")) << gearbox;
+    std::string told;
+    SignalSet const set({}, folder.path(), [&told](std::string const& text) { told += text; });
+    EXPECT_EQ(told, folder.file("a.toml") + " is passed over: The signal file " + folder.file("a.toml") +
+                        " has mistakes\n  - " + folder.file("a.toml") +
+                        ":1: x: is no key of a signal file (vehicle, signal)\n");
 }
