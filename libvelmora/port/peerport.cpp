@@ -107,8 +107,11 @@ std::unique_ptr<IPort> openSimulatorPort(SimulatorAddress const& address)
 
 std::unique_ptr<IPort> openReplayPort(ReplayAddress const& address)
 {
+    constexpr std::string_view instantEnding = "?instant"; // without the pauses of the recording
+    bool const instant = address.file.ends_with(instantEnding);
+    std::string const file = address.file.substr(0, address.file.size() - (instant ? instantEnding.size() : 0));
     try {
-        return std::make_unique<PeerPort>(obdsim::replay(address.file));
+        return std::make_unique<PeerPort>(obdsim::replay(file), instant);
     } catch (obdsim::SimulatorError const& error) {
         throw Error(ErrorKind::PortFailed, std::string("Could not replay the recorded dialogue: ") + error.what(),
                     {"replay:FILE takes a file that `velmora record FILE` has written"});

@@ -86,4 +86,14 @@ obdsim::Dialogue DialogueRecorder::dialogue() const
     return dialogue;
 }
 
+std::vector<std::string> DialogueRecorder::sentFrom(std::size_t first) const
+{
+    std::lock_guard const lock(m_mutex);
+    std::vector<std::string> sent;
+    for (std::size_t i = first; i < m_dialogue.exchanges.size(); ++i) {
+        sent.push_back(m_dialogue.exchanges[i].sent);
+    }
+    return sent;
+}
+
 } // namespace velmora

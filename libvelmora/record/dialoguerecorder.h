@@ -3,8 +3,11 @@
 #include "simulator/dialogue.h"
 
 #include <chrono>
+#include <cstddef>
 #include <mutex>
+#include <string>
 #include <string_view>
+#include <vector>
 
 namespace velmora {
 
@@ -18,6 +21,8 @@ public:
 
     // What was said so far. What vehicle and adapter were is the caller's to tell.
     obdsim::Dialogue dialogue() const;
+    // What was sent behind the first so many lines.
+    std::vector<std::string> sentFrom(std::size_t first) const;
 
 private:
     using Clock = std::chrono::steady_clock;

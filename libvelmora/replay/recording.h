@@ -31,6 +31,7 @@ struct Recording
     std::int64_t begin = 0; // of the first value
     std::int64_t end = 0;   // of the last one
     bool cut = false;       // it holds more than can be played
+    bool dated = true;      // else its times count from a beginning that nobody has noted
 };
 
 // Puts a recording together of values in any order. One thread.

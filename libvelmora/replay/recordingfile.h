@@ -12,7 +12,7 @@ enum class RecordingForm
     Database, // as the output sqlite writes it
     Csv,      // one column a sensor, or one line a reading
     Ndjson,   // of the output ndjson, or of live --json
-    Dialogue, // with an adapter: to be played as one, by the port replay:FILE
+    Dialogue, // with an adapter: see readDialogue
 };
 
 // By what the file begins with. Throws Error if it can't be read.

@@ -3,6 +3,7 @@
 #include "libvelmora/replay/recordingfile.h"
 #include "program/command/commands.h"
 #include "program/commandline.h"
+#include "program/live/playeddialogue.h"
 #include "program/watch/dashplay.h"
 #include "program/watch/watchcommand.h"
 
@@ -35,10 +36,13 @@ ExitCode dash(GlobalOptions const& given, DashOptions const& chosen)
         address += fmt::format("&name={}", fmt::join(chosen.names, ","));
     }
     if (!chosen.play.empty()) {
-        if (formOf(chosen.play) != RecordingForm::Dialogue) {
-            return playOnPage(global, parseOutputAddress(address), chosen.play, chosen.speed);
+        bool const dialogue = formOf(chosen.play) == RecordingForm::Dialogue;
+        std::optional<Recording> const recording =
+            dialogue ? playedDialogue(global, chosen.play) : std::optional(readRecording(chosen.play));
+        if (recording) {
+            return playOnPage(global, parseOutputAddress(address), *recording, chosen.speed);
         }
-        global.port = "replay:" + chosen.play; // a dialogue is a vehicle that is read as any other
+        global.port = "replay:" + chosen.play; // read as a vehicle
     }
     watch.outputs.insert(watch.outputs.begin(), address);
     watch.page = true;

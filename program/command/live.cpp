@@ -4,6 +4,7 @@
 #include "program/command/commandsession.h"
 #include "program/commandline.h"
 #include "program/live/liverun.h"
+#include "program/live/playeddialogue.h"
 #include "program/live/playrun.h"
 #include "program/terminal/output.h"
 
@@ -30,9 +31,9 @@ void judgeSilence(Session const& session, LiveRun const& run, LiveOptions const&
     }
 }
 
-ExitCode playRecording(GlobalOptions const& global, LiveOptions const& options)
+ExitCode playRecording(GlobalOptions const& global, LiveOptions const& options, Recording recording)
 {
-    PlayRun run(global, options.play, options.sensors, options.speed);
+    PlayRun run(global, options.play, std::move(recording), options.sensors, options.speed);
     run.run();
     return ExitCode::Done;
 }
@@ -56,14 +57,16 @@ ExitCode readVehicle(GlobalOptions const& global, LiveOptions const& given)
     return ExitCode::Done;
 }
 
-// A dialogue is a vehicle that is read as any other.
 ExitCode live(GlobalOptions const& global, LiveOptions const& options)
 {
     if (options.play.empty()) {
         return readVehicle(global, options);
     }
     if (formOf(options.play) != RecordingForm::Dialogue) {
-        return playRecording(global, options);
+        return playRecording(global, options, readRecording(options.play));
+    }
+    if (std::optional<Recording> recording = playedDialogue(global, options.play)) {
+        return playRecording(global, options, std::move(*recording));
     }
     GlobalOptions replayed = global;
     replayed.port = "replay:" + options.play;

@@ -3,7 +3,6 @@
 #include "common/text/text.h"
 #include "libvelmora/output/valuetext.h"
 #include "libvelmora/read/sensorlimits.h"
-#include "libvelmora/replay/recordingfile.h"
 #include "libvelmora/session/settingsstore.h"
 #include "program/live/livepanel.h"
 #include "program/terminal/interrupt.h"
@@ -38,9 +37,9 @@ bool means(std::string const& word, SensorEntry const& sensor)
 
 } // namespace
 
-PlayRun::PlayRun(GlobalOptions const& options, std::filesystem::path file, std::vector<std::string> const& sensors,
-                 double speed)
-    : m_options(options), m_file(std::move(file)), m_recording(readRecording(m_file)), m_player(m_recording),
+PlayRun::PlayRun(GlobalOptions const& options, std::filesystem::path file, Recording recording,
+                 std::vector<std::string> const& sensors, double speed)
+    : m_options(options), m_file(std::move(file)), m_recording(std::move(recording)), m_player(m_recording),
       m_table(m_recording)
 {
     choose(sensors);
@@ -98,7 +97,7 @@ void PlayRun::printAll()
     m_player.seek(m_recording.end, [&](std::size_t sensor, RecordedValue const& value) {
         LiveRow const* const row = open && !Interrupt::instance().raised() ? m_table.take(sensor, value) : nullptr;
         if (row != nullptr) {
-            open = writeOutput(m_options.json ? toJsonLine(*row, utcTime(fromMillis(value.time))) : toLine(*row));
+            open = writeOutput(m_options.json ? toJsonLine(*row, clockText(value.time)) : toLine(*row));
         }
     });
 }
@@ -133,10 +132,16 @@ void PlayRun::jump(std::int64_t to)
     m_player.seek(to, [this](std::size_t sensor, RecordedValue const& value) { take(sensor, value); });
 }
 
+std::string PlayRun::clockText(std::int64_t time) const
+{
+    return m_recording.dated ? utcTime(fromMillis(time)) : std::string();
+}
+
 std::string PlayRun::title() const
 {
-    return fmt::format("{}, {} sensors, {}", m_file.filename().string(), m_recording.sensors.size(),
-                       utcTime(fromMillis(m_player.position())));
+    std::string const clock = clockText(m_player.position());
+    return fmt::format("{}, {} sensors{}", m_file.filename().string(), m_recording.sensors.size(),
+                       clock.empty() ? "" : ", " + clock);
 }
 
 std::string PlayRun::state() const

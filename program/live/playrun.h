@@ -15,9 +15,10 @@ namespace velmora::cli {
 class PlayRun : private ILiveHost
 {
 public:
-    // sensors: words of which each is a part of a name or key; none means all. Throws Error.
-    PlayRun(GlobalOptions const& options, std::filesystem::path file, std::vector<std::string> const& sensors,
-            double speed);
+    // file: where the recording is from. sensors: words of which each is a part of a name or key; none means all.
+    // Throws Error.
+    PlayRun(GlobalOptions const& options, std::filesystem::path file, Recording recording,
+            std::vector<std::string> const& sensors, double speed);
 
     // On a terminal until the user ends it; in lines until the recording ends, without waiting.
     void run();
@@ -29,6 +30,7 @@ private:
     void jump(std::int64_t to);
     void applyLimits();
     void take(std::size_t sensor, RecordedValue const& value) { m_table.take(sensor, value); }
+    std::string clockText(std::int64_t time) const; // empty for a recording that has no date
 
     std::vector<LiveRow> const& rows() const override { return m_table.rows(); }
     LiveTime now() const override { return PlayTable::timeOf(m_player.position()); }

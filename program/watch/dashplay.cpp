@@ -2,7 +2,6 @@
 
 #include "libvelmora/dash/dashoutput.h"
 #include "libvelmora/dash/playdesk.h"
-#include "libvelmora/replay/recordingfile.h"
 #include "libvelmora/session/settingsstore.h"
 #include "program/terminal/interrupt.h"
 #include "program/terminal/output.h"
@@ -46,9 +45,8 @@ DashContext pageContext(GlobalOptions const& global, PlayDesk& desk)
 
 } // namespace
 
-ExitCode playOnPage(GlobalOptions const& global, OutputAddress const& address, std::string const& file, double speed)
+ExitCode playOnPage(GlobalOptions const& global, OutputAddress const& address, Recording const& recording, double speed)
 {
-    Recording const recording = readRecording(file);
     PlayDesk desk(recording, speed);
     DashOutput output(address, pageContext(global, desk));
     output.open();

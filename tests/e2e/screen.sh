@@ -139,6 +139,23 @@ stays '^Coolant +69 °C +20 ' "the values of then"
 tmux -L "$name" send-keys q
 until_seen 'ended with 0' "q ends a recording"
 
+# A dialogue has the times of its replies, and no date.
+{
+    printf 'vehicle: made up\nadapter: ELM327 v1.5\nprotocol: 6\nheaders: on\n\n'
+    printf -- '-> 0100\n<- 7E8 06 41 00 BE 1F A8 12\\r\\r>\n'
+    for speed in 10 20 30; do
+        printf -- '-> 010D\n.. 30000\n<- 7E8 03 41 0D %s\\r\\r>\n' "$speed"
+    done
+} >"$folder/drive.dialogue"
+begin 80 24 C.UTF-8 "$velmora live --play $folder/drive.dialogue"
+until_seen '0:0[0-9] \[.*\] 1:00 1x' "the bar of a dialogue"
+tmux -L "$name" send-keys Space End
+until_seen 'Paused 1:00' "the end of the dialogue"
+stays '^Vehicle Speed Sensor +48 km/h +16 +32 +48' "values and statistics of a dialogue"
+stays 'drive.dialogue, 1 sensors *$' "a dialogue has no date"
+tmux -L "$name" send-keys q
+until_seen 'ended with 0' "q ends a dialogue"
+
 begin 80 24 C.UTF-8 "$live --fast"
 until_seen 'Asking without the pause that spares the vehicle' "the warning of --fast"
 stays 'q quit|RPM' "the table beside the warning"

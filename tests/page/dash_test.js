@@ -8,7 +8,7 @@ const { folder, launch, pictures, running, startDash } = require('./dashrig.js')
 const { testDoors } = require('./dashdoors.js');
 const { testHands } = require('./dashhands.js');
 const { testCarStops, testProgramStops } = require('./dashloss.js');
-const { testLimits, testPlay } = require('./dashplay.js');
+const { testDialogue, testLimits, testPlay } = require('./dashplay.js');
 const { testPoints } = require('./dashpoints.js');
 const { testLayout, testLooks, testViews } = require('./dashviews.js');
 
@@ -19,7 +19,7 @@ async function main() {
     console.error('This takes too long');
     for (const child of running) child.kill('SIGKILL');
     process.exit(1);
-  }, 200000);
+  }, 270000);
   let failed = 0;
   const step = async (name, action) => {
     try {
@@ -41,6 +41,7 @@ async function main() {
   }
   await step('tells within 2 s that the car does not answer', () => testCarStops(browsers[0]));
   await step('plays a recording', () => testPlay(browsers[0]));
+  await step('plays a dialogue', () => testDialogue(browsers[0]));
   await step('marks values beyond their limits', () => testLimits(browsers[0]));
   await step('is worked by hand, and draws no more than it must', () => testHands(browsers[0]));
   await step('lets in nobody without the token', () => testDoors(browsers[1]));

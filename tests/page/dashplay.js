@@ -48,6 +48,26 @@ async function testPlay(browser) {
   await ended(child);
 }
 
+// A dialogue has the time that its replies took: here a second each.
+async function testDialogue(browser) {
+  const file = path.join(folder, 'drive.dialogue');
+  const hex = (number) => number.toString(16).toUpperCase().padStart(4, '0').replace(/(..)(..)/, '$1 $2');
+  const turn = (_, i) => `-> 010C\n.. 1000\n<- 7E8 04 41 0C ${hex(4 * (800 + i))}\\r\\r>`;
+  fs.writeFileSync(file, ['vehicle: made up', 'adapter: ELM327 v1.5', 'protocol: 6', 'headers: on', '',
+    '-> 0100', '<- 7E8 06 41 00 BE 1F A8 12\\r\\r>', ...Array.from({ length: 121 }, turn), ''].join('\n'));
+  const child = start(['dash', '--play', file, '--listen', '127.0.0.1:0']);
+  const page = await openPage(browser, await firstLine(child));
+  await waitFor(page, status('Live'));
+  await waitFor(page, "/^0:0[0-9] of 2:00$/.test(document.getElementById('playTime').textContent)");
+  await page.click('#playPause');
+  await goTo(page, 100);
+  await waitFor(page, "document.querySelector('[data-id=\"7E8/RPM\"] .number')?.textContent === '900'");
+  assert.deepEqual(page.problems, []);
+  await page.close();
+  child.kill('SIGTERM');
+  await ended(child);
+}
+
 // By sign, word and colour, on gauge, number and chart, and for who listens.
 async function testLimits(browser) {
   const set = start(['settings', 'limit.RPM', '1000']);
@@ -82,4 +102,4 @@ async function testLimits(browser) {
   await ended(child);
 }
 
-module.exports = { testLimits, testPlay };
+module.exports = { testDialogue, testLimits, testPlay };

@@ -71,7 +71,8 @@ function scales() {
   const result = { x: { type: 'linear', ticks: { color: ink, maxTicksLimit: 7, maxRotation: 0, callback: clock }, grid: { color: grid }, afterBuildTicks: ticks } };
   [...new Set(shown().map(axisOf))].forEach((id, index) => {
     result[id] = { type: 'linear', grace: '8%', position: index % 2 ? 'right' : 'left', ticks: { color: ink, maxTicksLimit: 7 },
-      grid: { color: grid, drawOnChartArea: index === 0 }, title: { display: true, color: ink, text: id.slice(2).replace('none', '') } };
+      grid: { color: grid, drawOnChartArea: index === 0, tickLength: 4 }, // on a phone three axes have a sixth of the width each
+      title: { display: true, color: ink, padding: 0, text: id.slice(2).replace('none', '') } };
   });
   return result;
 }

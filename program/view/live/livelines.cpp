@@ -47,7 +47,7 @@ std::string toLine(LiveRow const& row)
 std::string toJsonLine(LiveRow const& row, std::string const& time)
 {
     Json line = {
-        {"time", time},
+        {"time", textOrNull(time)},
         {"module", fmt::format("{:X}", row.module)},
         {"pid", fmt::format("{:02X}", static_cast<int>(obd::Uid2Pid(row.uid)))},
         {"uid", row.uid},

@@ -12,7 +12,7 @@ std::string isoTime(std::chrono::system_clock::time_point time);
 // "Engine RPM: 1726 rpm\n"
 std::string toLine(LiveRow const& row);
 
-// One line of JSON with its line feed.
+// One line of JSON with its line feed. An empty time is null.
 std::string toJsonLine(LiveRow const& row, std::string const& time);
 
 } // namespace velmora::cli
