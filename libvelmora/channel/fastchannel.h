@@ -159,6 +159,7 @@ private:
     std::optional<unsigned int> countFor(Pending const& pending) const;
     bool takeCounted(HealedReply const& reply, WireTime took);
     bool triesProtocol(std::string const& text);
+    void recallWait();
     bool fallsBackToSearch(HealedReply const& reply);
     bool needsFullWait(HealedReply const& reply) const;
     void adaptWait(HealedReply const& reply);
@@ -171,7 +172,9 @@ private:
     void keepLearnt();
 
     // Waits that the adapter does not shorten.
+    bool triesBus() const;
     bool mayCut() const;
+    bool saysEnough() const;
     WireTime cutTime() const;
     void cutWait();
     std::string withoutOwnStop(std::string const& raw) const;
@@ -219,6 +222,7 @@ private:
     bool m_protocolTried = false;
     unsigned int m_waitSteps = 0;  // of 4.096 ms, where the channel has shortened the wait
     unsigned int m_waitBefore = 0; // what a wait that was given back had been
+    unsigned int m_longest = 0;    // the longest that the adapter has agreed to
     bool m_waitsLong = false;      // the adapter does not adapt its wait behind replies
     WireTime m_slowest{0};
     std::vector<AddressStep> m_restore;      // takes back the address that is in force

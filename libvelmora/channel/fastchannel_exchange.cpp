@@ -56,6 +56,7 @@ void FastChannel::begin(std::string const& text)
     }
     m_pending = std::move(pending);
     if (triesProtocol(text)) {
+        recallWait();
         writePending("ATTP" + std::to_string(m_triedProtocol));
     } else {
         writePending(text + (m_pending->count ? std::to_string(*m_pending->count) : ""));

@@ -81,6 +81,21 @@ bool FastChannel::triesProtocol(std::string const& text)
     return m_triedProtocol != 0;
 }
 
+// The first request on the bus of the last visit need not be waited for as long as the core has set it: it only tells
+// whether the vehicle is there. The next one, with headers, asks who is, and has all of the wait again.
+void FastChannel::recallWait()
+{
+    LearntWait const learnt = m_store->wait(adapterKey());
+    unsigned int const steps = std::max(learnt.steps, shortestWaitSteps);
+    bool const can = isCanBus(busKindOf(m_triedProtocol));
+    if (m_options.shortWait && can && learnt.steps != 0 && steps < stepsOf(m_state.setting("ATST"))) {
+        setWait(steps);
+        if (learnt.isCut) {
+            m_cutter.recall();
+        }
+    }
+}
+
 // It was another vehicle: the search takes place after all, within the time of the core's first request.
 bool FastChannel::fallsBackToSearch(HealedReply const& reply)
 {
@@ -92,6 +107,7 @@ bool FastChannel::fallsBackToSearch(HealedReply const& reply)
         return false;
     }
     ++m_protocolsChosen;
+    giveWaitBack();
     if (!confirms("ATTP0", ownCommandLimit)) {
         return false;
     }
@@ -167,6 +183,7 @@ void FastChannel::setWait(unsigned int steps)
 {
     m_waitBefore = 0;
     m_waitSteps = confirms(waitCommand(steps), ownCommandLimit) ? steps : 0;
+    m_longest = std::max(m_longest, m_waitSteps);
 }
 
 void FastChannel::giveWaitBack()
@@ -200,6 +217,7 @@ void FastChannel::keepLearnt()
     }
     m_store->setProtocol(adapterKey(), m_state.protocol());
     m_store->setCanCount(adapterKey(), m_learner.works() || !m_learner.isOff());
+    m_store->setWait(adapterKey(), {m_waitsLong ? m_longest : 0, m_cutter.pays()});
     if (!m_vin.empty()) {
         m_store->setCounts(m_vin, m_learner.learnt());
     }

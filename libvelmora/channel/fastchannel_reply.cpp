@@ -114,6 +114,7 @@ void FastChannel::observe(HealedReply const& reply)
     }
     if (!hadHeaders && m_state.headersOn() && !m_connected) {
         m_memory.start();
+        giveWaitBack(); // who is there is asked with all of the core's wait
     } else if (!command.onlyAsks()) {
         m_learner.clear(); // replies may be others from here on
         m_memory.stop();

@@ -24,6 +24,13 @@ std::string frameText(FrameSet const& frames)
     return text;
 }
 
+// More than ATST takes is none of ours.
+LearntWait readWait(toml::node_view<toml::node const> const& entry)
+{
+    auto const steps = entry["wait"].value_or<std::int64_t>(0);
+    return {steps > 0 && steps <= 0xFF ? static_cast<unsigned int>(steps) : 0, entry["cut"].value_or(false)};
+}
+
 // Nothing for a text that is none of ours.
 FrameSet readFrameText(std::string const& text)
 {
@@ -57,7 +64,7 @@ void LearntStore::load()
             toml::node_view<toml::node const> const entry(node);
             int const protocol = entry["protocol"].value_or(0);
             m_adapters[std::string(name.str())] = {busKindOf(protocol) != BusKind::Unknown ? protocol : 0,
-                                                   entry["counts"].value_or(true)};
+                                                   entry["counts"].value_or(true), readWait(entry)};
         }
         for (auto const& [vin, node] : root["vehicle"].is_table() ? *root["vehicle"].as_table() : toml::table()) {
             for (auto const& [request, frames] : node.is_table() ? *node.as_table() : toml::table()) {
@@ -99,6 +106,19 @@ void LearntStore::setCanCount(std::string const& adapter, bool can)
     m_adapters[adapter].canCount = can;
 }
 
+LearntWait LearntStore::wait(std::string const& adapter) const
+{
+    std::lock_guard const lock(m_mutex);
+    auto const found = m_adapters.find(adapter);
+    return found != m_adapters.end() ? found->second.wait : LearntWait();
+}
+
+void LearntStore::setWait(std::string const& adapter, LearntWait const& wait)
+{
+    std::lock_guard const lock(m_mutex);
+    m_adapters[adapter].wait = wait;
+}
+
 std::map<std::string, FrameSet> LearntStore::counts(std::string const& vin) const
 {
     std::lock_guard const lock(m_mutex);
@@ -120,7 +140,12 @@ void LearntStore::save() const
     }
     toml::table adapters;
     for (auto const& [name, adapter] : m_adapters) {
-        adapters.insert(name, toml::table{{"protocol", adapter.protocol}, {"counts", adapter.canCount}});
+        toml::table entry{{"protocol", adapter.protocol}, {"counts", adapter.canCount}};
+        if (adapter.wait.steps != 0) {
+            entry.insert("wait", adapter.wait.steps);
+            entry.insert("cut", adapter.wait.isCut);
+        }
+        adapters.insert(name, std::move(entry));
     }
     toml::table vehicles;
     for (auto const& [vin, counts] : m_vehicles) {

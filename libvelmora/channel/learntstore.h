@@ -9,9 +9,16 @@
 
 namespace velmora {
 
-// What is kept from visit to visit in a small file: the bus that an adapter found last and whether it can count, by
-// adapter; the frames that requests bring, by vehicle. A file that can't be read is as none; one that can't be written
-// costs the next visit its haste and nothing else.
+// How an adapter that listens long behind replies was brought to listen less.
+struct LearntWait
+{
+    unsigned int steps = 0; // of ATST, enough for the slowest reply of the last visit; 0 for an adapter that needs none
+    bool isCut = false;     // it agrees to that and does not keep to it, but a blank ends its wait
+};
+
+// What is kept from visit to visit in a small file: the bus that an adapter found last, whether it can count and how it
+// waits, by adapter; the frames that requests bring, by vehicle. A file that can't be read is as none; one that can't
+// be written costs the next visit its haste and nothing else.
 class LearntStore
 {
 public:
@@ -24,6 +31,8 @@ public:
     // False for an adapter that gains nothing by counting, or refuses it.
     bool canCount(std::string const& adapter) const;
     void setCanCount(std::string const& adapter, bool can);
+    LearntWait wait(std::string const& adapter) const;
+    void setWait(std::string const& adapter, LearntWait const& wait);
 
     std::map<std::string, FrameSet> counts(std::string const& vin) const;
     void setCounts(std::string const& vin, std::map<std::string, FrameSet> const& counts);
@@ -40,6 +49,7 @@ private:
     {
         int protocol = 0;
         bool canCount = true;
+        LearntWait wait;
     };
 
     void load();

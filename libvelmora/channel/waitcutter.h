@@ -16,11 +16,17 @@ public:
     // A wait was cut: how long the prompt took then, and whether the reply was whole.
     void cut(WireTime took, bool whole);
 
+    // An earlier visit has learnt that it is needed and works.
+    void recall();
+
     bool pays() const;
+    // How much later than agreed the first cut comes, so that an adapter that has changed shows that it ends by itself.
+    WireTime doubt() const;
 
 private:
     int m_late = 0; // replies in a row
     int m_failures = 0;
+    bool m_recalled = false; // and not seen so far
 };
 
 } // namespace velmora

@@ -54,6 +54,7 @@ TEST_F(Visits, ASecondOneTriesTheBusOfTheFirstUntilThatIsForgotten)
     e2e::Outcome const second = visit({});
     EXPECT_THAT(trace(), HasSubstr("ATTP6"));
     EXPECT_THAT(trace(), Not(HasSubstr("ATTP0")));
+    EXPECT_LT(trace().find("ATST19"), trace().find("ATTP6")) << "so does the wait that it was brought to";
     EXPECT_EQ(second.out, first.out);
     e2e::Outcome const third = visit({"--forget", "--sleep"});
     EXPECT_THAT(trace(), HasSubstr("ATTP0"));
