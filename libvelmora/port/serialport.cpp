@@ -58,6 +58,7 @@ std::unique_ptr<IPort> openSerialPort(SerialAddress const& address)
     port.set_option(Line::flow_control(Line::flow_control::none), error);
     port.set_option(Line::baud_rate(address.baud), error);
     if (error) {
+        leaveToOthers(port);
         throw Error(ErrorKind::PortFailed,
                     "The serial port " + address.device + " refuses " + std::to_string(address.baud) + " baud",
                     {"usual rates are 9600, 38400, 57600, 115200: choose with --baud"});

@@ -47,6 +47,8 @@ public:
     {
         if (m_isTerminal) {
             ::tcsetattr(m_line, TCSANOW, &m_before);
+        }
+        if (m_isClaimed) {
             ::ioctl(m_line, TIOCNXCL);
         }
         if (m_line >= 0) {
@@ -59,7 +61,14 @@ public:
     bool isOpen() const { return m_line >= 0; }
     int error() const { return m_error; }
     bool isTerminal() const { return m_isTerminal; }
-    bool claim() const { return ::flock(m_line, LOCK_EX | LOCK_NB) == 0 && ::ioctl(m_line, TIOCEXCL) == 0; }
+    // False for a line that another program has taken for itself. The administrator may open such a one all the same.
+    bool claim()
+    {
+        int isTaken = 0;
+        bool const free = ::ioctl(m_line, TIOCGEXCL, &isTaken) != 0 || isTaken == 0;
+        m_isClaimed = free && ::flock(m_line, LOCK_EX | LOCK_NB) == 0 && ::ioctl(m_line, TIOCEXCL) == 0;
+        return m_isClaimed;
+    }
 
     bool setRate(speed_t speed) const
     {
@@ -100,6 +109,7 @@ private:
     int m_line;
     int m_error;
     bool m_isTerminal = false;
+    bool m_isClaimed = false;
     termios m_before{};
 };
 
@@ -172,7 +182,7 @@ SerialProbe probeSerialPort(std::string const& device, std::vector<unsigned int>
     if (std::optional<std::string> const holder = findPortHolder(device, places)) {
         return {Outcome::Held, 0, *holder};
     }
-    BorrowedLine const line(device);
+    BorrowedLine line(device);
     SerialProbe result = judgeOpening(line);
     if (result.outcome != Outcome::Silent) {
         return result;

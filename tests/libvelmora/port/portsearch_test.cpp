@@ -1,6 +1,7 @@
 #include "libvelmora/port/opening/portsearch.h"
 #include "simulator/server.h"
 #include "simulator/simulation.h"
+#include "tests/libvelmora/port/scripteddevice.h"
 
 #include <velmora/error.h>
 
@@ -8,16 +9,11 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <atomic>
-#include <cstdlib>
 #include <fcntl.h>
 #include <filesystem>
 #include <fstream>
-#include <mutex>
-#include <poll.h>
 #include <sys/file.h>
 #include <termios.h>
-#include <thread>
 #include <unistd.h>
 
 namespace {
@@ -26,73 +22,8 @@ namespace fs = std::filesystem;
 using velmora::PortSearch;
 using velmora::SerialAddress;
 using velmora::SerialProbe;
+using velmora::test::ScriptedDevice;
 using Outcome = SerialProbe::Outcome;
-
-// A device of the test's own at the end of a pseudo-terminal: answers a line at one rate with a fixed text.
-class ScriptedDevice
-{
-public:
-    ScriptedDevice(std::string answer, speed_t speed) : m_answer(std::move(answer)), m_speed(speed)
-    {
-        m_master = ::posix_openpt(O_RDWR | O_NOCTTY | O_CLOEXEC);
-        ::grantpt(m_master);
-        ::unlockpt(m_master);
-        m_path = ::ptsname(m_master);
-        m_slave = ::open(m_path.c_str(), O_RDWR | O_NOCTTY | O_CLOEXEC);
-        m_thread = std::thread([this] { serve(); });
-    }
-    ~ScriptedDevice()
-    {
-        m_stop = true;
-        m_thread.join();
-        ::close(m_slave);
-        ::close(m_master);
-    }
-    ScriptedDevice(ScriptedDevice const&) = delete;
-    ScriptedDevice& operator=(ScriptedDevice const&) = delete;
-
-    std::string const& path() const { return m_path; }
-    std::string received() const
-    {
-        std::lock_guard const lock(m_mutex);
-        return m_received;
-    }
-    termios settings() const
-    {
-        termios settings{};
-        ::tcgetattr(m_slave, &settings);
-        return settings;
-    }
-
-private:
-    void serve()
-    {
-        while (!m_stop) {
-            pollfd state{m_master, POLLIN, 0};
-            char bytes[64];
-            if (::poll(&state, 1, 10) <= 0) {
-                continue;
-            }
-            ssize_t const count = ::read(m_master, bytes, sizeof(bytes));
-            std::lock_guard const lock(m_mutex);
-            m_received.append(bytes, count > 0 ? static_cast<std::size_t>(count) : 0);
-            termios const now = settings();
-            if (m_received.ends_with('\r') && ::cfgetospeed(&now) == m_speed) {
-                [[maybe_unused]] ssize_t const written = ::write(m_master, m_answer.data(), m_answer.size());
-            }
-        }
-    }
-
-    std::string m_answer;
-    speed_t m_speed;
-    std::string m_path;
-    int m_master = -1;
-    int m_slave = -1;
-    std::atomic<bool> m_stop{false};
-    mutable std::mutex m_mutex;
-    std::string m_received; // protected by m_mutex
-    std::thread m_thread;
-};
 
 TEST(SerialProbe, FindsTheSimulatedAdapter)
 {
