@@ -110,7 +110,6 @@ private:
     };
 
     PortAddress searchPort();
-    void rememberPort(PortAddress const& address);
     void openLink();
     void enter(Phase phase);
     obd::VehicleProtocol protocol() const;

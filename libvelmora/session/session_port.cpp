@@ -1,8 +1,8 @@
 // Which port a session opens, and how.
 
 #include "libvelmora/port/opening/openport.h"
-#include "libvelmora/port/opening/portsearch.h"
 #include "libvelmora/port/recordedport.h"
+#include "libvelmora/session/foundport.h"
 #include "libvelmora/session/link.h"
 #include "libvelmora/session/session.h"
 #include "libvelmora/session/settingsstore.h"
@@ -22,12 +22,6 @@ constexpr WireTime lowEnergyLatency{200};
 std::string portKey()
 {
     return "velmora/port";
-}
-
-// Where an adapter was found last, by looking for it.
-std::string foundPortKey()
-{
-    return "velmora/foundport";
 }
 
 // None where there is no Bluetooth, which is no reason not to look elsewhere.
@@ -53,7 +47,6 @@ PortAddress Session::findPort()
     return *m_address;
 }
 
-// The winner is remembered apart from a port that the user names.
 PortAddress Session::searchPort()
 {
     PortSearch search;
@@ -62,27 +55,7 @@ PortAddress Session::searchPort()
     search.baud = m_options.baud;
     search.tell = [this](std::string const& line) { tellProgress(line); };
     search.stop = [this] { return m_interrupted.load(); };
-    if (std::string last; m_settings->getString(foundPortKey(), last)) {
-        search.last = parsePortAddress(last);
-    }
-    PortAddress const found = findAdapter(search);
-    if (found != search.last) {
-        rememberPort(found);
-    }
-    return found;
-}
-
-// A help for the next time, which must not stand in the way of this one.
-void Session::rememberPort(PortAddress const& address)
-{
-    try {
-        // Alone: what was chosen for this run stays out of the file.
-        SettingsStore kept(m_settings->file());
-        kept.setString(foundPortKey(), toAddressText(address));
-        kept.sync();
-    } catch (Error const& error) {
-        tellProgress(std::string("The port is not remembered: ") + error.what() + "\n");
-    }
+    return findAdapterAgain(std::move(search), m_settings->file());
 }
 
 std::string Session::port() const
