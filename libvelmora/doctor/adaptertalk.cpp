@@ -46,6 +46,7 @@ std::optional<std::string> AdapterTalk::ask(std::string const& command, std::chr
         std::lock_guard const lock(m_mutex);
         m_received.clear();
     }
+    m_echoed = false;
     m_port->write(command + "\r");
     std::unique_lock lock(m_mutex);
     m_changed.wait_for(lock, limit, [this] { return m_lost || m_received.find('>') != std::string::npos; });

@@ -37,6 +37,30 @@ bool examineAdapter(PortAddress const& address, DialogueRecorder& recorder, Doct
     }
 }
 
+// Which link of the chain an error tells of.
+char const* linkOf(Error const& error)
+{
+    switch (error.kind()) {
+    case ErrorKind::PortFailed:
+    case ErrorKind::LinkLost:
+        return "port";
+    case ErrorKind::AdapterSilent:
+        return "adapter";
+    default:
+        return "bus";
+    }
+}
+
+// Interrupting the examination ends it; whatever else goes wrong is a finding.
+void noteFailure(Error const& error, DoctorReport& report)
+{
+    if (error.kind() == ErrorKind::Interrupted) {
+        throw error;
+    }
+    report.checks.push_back(
+        {linkOf(error), Verdict::Bad, error.what(), error.hints().empty() ? std::string() : error.hints().front()});
+}
+
 // What can't be read by name may hold a secret, so only harmless lines are kept.
 std::string harmlessSettings(std::filesystem::path const& file)
 {
@@ -74,11 +98,7 @@ DoctorReport examine(Session& session, DialogueRecorder& recorder)
     try {
         session.connect();
     } catch (Error const& error) {
-        if (error.kind() == ErrorKind::Interrupted) {
-            throw;
-        }
-        report.checks.push_back(
-            {"bus", Verdict::Bad, error.what(), error.hints().empty() ? std::string() : error.hints().front()});
+        noteFailure(error, report);
         noteHabits(session, report);
         session.disconnect();
         if (error.kind() == ErrorKind::VehicleSilent) {
@@ -86,7 +106,11 @@ DoctorReport examine(Session& session, DialogueRecorder& recorder)
         }
         return report;
     }
-    checkVehicle(session, report);
+    try {
+        checkVehicle(session, report);
+    } catch (Error const& error) {
+        noteFailure(error, report);
+    }
     noteHabits(session, report);
     return report;
 }

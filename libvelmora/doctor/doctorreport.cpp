@@ -47,8 +47,9 @@ std::string DoctorReport::verdict() const
 {
     auto const bad = firstBad(*this);
     if (bad != checks.end()) {
-        return fmt::format("The {} is where it breaks: {}{}{}.", bad->link, bad->finding,
-                           bad->advice.empty() ? "" : "; ", bad->advice);
+        std::string const end = bad->advice.ends_with('?') ? "" : ".";
+        return fmt::format("The {} is where it breaks: {}{}{}{}", bad->link, bad->finding,
+                           bad->advice.empty() ? "" : "; ", bad->advice, end);
     }
     return figures ? fmt::format("Everything works from the port to the control modules; about {:.0f} values a second "
                                  "are within reach.",

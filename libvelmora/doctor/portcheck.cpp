@@ -78,6 +78,7 @@ std::vector<DoctorCheck> checkPort(PortAddress const& address, std::filesystem::
         return {{"port", Verdict::Good, toString(address), ""}};
     }
     std::vector<unsigned int> rates = usualRates();
+    std::erase(rates, serial->baud);
     rates.insert(rates.begin(), serial->baud);
     std::vector<DoctorCheck> checks;
     DoctorCheck const check = judge(probeSerialPort(serial->device, rates), *serial);

@@ -7,6 +7,7 @@
 #include <asio/local/stream_protocol.hpp>
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <atomic>
 #include <cstdlib>
 #include <fcntl.h>

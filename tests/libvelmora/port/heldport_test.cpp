@@ -2,6 +2,7 @@
 
 #include "libvelmora/port/opening/portsearch.h"
 #include "libvelmora/port/serialport.h"
+#include "tests/libvelmora/port/asuser.h"
 #include "tests/libvelmora/port/scripteddevice.h"
 #include "tests/support/temporaryfolder.h"
 
@@ -13,7 +14,6 @@
 
 #include <csignal>
 #include <fstream>
-#include <functional>
 #include <sys/ioctl.h>
 #include <sys/prctl.h>
 #include <sys/wait.h>
@@ -23,33 +23,9 @@ namespace {
 using testing::ElementsAre;
 using velmora::PortSearch;
 using velmora::SerialProbe;
+using velmora::test::asUser;
 using velmora::test::ScriptedDevice;
 using Outcome = SerialProbe::Outcome;
-
-constexpr uid_t nobody = 65534;
-
-// What another process does; its exit code.
-template <typename Work>
-int inAnotherProcess(Work const& work)
-{
-    pid_t const child = ::fork();
-    if (child == 0) {
-        ::_exit(work());
-    }
-    int status = 0;
-    ::waitpid(child, &status, 0);
-    return WIFEXITED(status) ? WEXITSTATUS(status) : -1;
-}
-
-// The administrator is refused nothing, so that a user of no rights asks in its place.
-int asUser(ScriptedDevice const& device, std::function<int()> const& work)
-{
-    bool const isRoot = ::geteuid() == 0;
-    if (isRoot && ::chown(device.path().c_str(), nobody, nobody) != 0) {
-        return -1;
-    }
-    return inAnotherProcess([&] { return isRoot && ::setresuid(nobody, nobody, nobody) != 0 ? -1 : work(); });
-}
 
 // A program that has taken a line for itself, until it is ended.
 class Holder
@@ -97,7 +73,7 @@ TEST(HeldPort, ThatAnotherProgramHasTakenForItselfIsNotAsked)
     auto const outcome = [&device] {
         return static_cast<int>(velmora::probeSerialPort(device.path(), {38400}).outcome);
     };
-    EXPECT_EQ(asUser(device, outcome), static_cast<int>(Outcome::Held)) << "EBUSY";
+    EXPECT_EQ(asUser(device.path(), true, outcome), static_cast<int>(Outcome::Held)) << "EBUSY";
     EXPECT_EQ(outcome(), static_cast<int>(Outcome::Held)) << "whom the system would let pass";
     EXPECT_EQ(device.received(), "");
     PortSearch search;
@@ -108,7 +84,7 @@ TEST(HeldPort, ThatAnotherProgramHasTakenForItselfIsNotAsked)
     } catch (velmora::Error const& error) {
         EXPECT_EQ(error.hints()[0], device.path() + " is held by another program; by which is not readable");
     }
-    EXPECT_EQ(asUser(device, outcome), static_cast<int>(Outcome::Held)) << "it is still the other's";
+    EXPECT_EQ(asUser(device.path(), true, outcome), static_cast<int>(Outcome::Held)) << "it is still the other's";
 }
 
 TEST(HeldPort, IsNamedByTheLockFileOfALivingProcess)
@@ -142,10 +118,10 @@ TEST(HeldPort, IsLeftToOthersBehindTheLastVisit)
             return 1;
         }
     };
-    EXPECT_EQ(asUser(device, open), 0);
-    EXPECT_EQ(asUser(device, open), 0);
+    EXPECT_EQ(asUser(device.path(), true, open), 0);
+    EXPECT_EQ(asUser(device.path(), true, open), 0);
     velmora::probeSerialPort(device.path(), {38400});
-    EXPECT_EQ(asUser(device, open), 0);
+    EXPECT_EQ(asUser(device.path(), true, open), 0);
 }
 
 // Something that answers at each rate, and as no adapter does.
