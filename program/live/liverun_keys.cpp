@@ -15,12 +15,14 @@
 
 namespace velmora::cli {
 
+// Where rates were asked for, they stand before what a narrow screen may cut.
 std::string LiveRun::title() const
 {
     double const elapsed = std::chrono::duration<double>(std::chrono::steady_clock::now() - m_start).count();
     std::string const rates = reachedRates(m_feed->rates());
-    return fmt::format("{}, {}, {:.0f} s, {:.1f} readings/s{}{}", m_session.port(), m_choice->modulesText(), elapsed,
-                       rate(), rates.empty() ? "" : ", ", rates);
+    std::string const pace = fmt::format("{:.0f} s, {:.1f} readings/s", elapsed, rate());
+    return rates.empty() ? fmt::format("{}, {}, {}", m_session.port(), m_choice->modulesText(), pace)
+                         : fmt::format("{}, {}, {}, {}", m_session.port(), pace, rates, m_choice->modulesText());
 }
 
 std::string LiveRun::state() const

@@ -53,6 +53,34 @@ TEST(Live, WhoAsksWithoutThePauseIsToldSoOnce)
     EXPECT_EQ(toldTimes({}), 0) << "the pause is kept by default";
 }
 
+// The pause between requests leaves some 33 a second, of which the two get an equal share.
+TEST(Live, RatesAreToldAndWhatTheBusCanNotGiveIsShared)
+{
+    Outcome const outcome = runVelmora(
+        {"-v", "-p", "sim:petrol-can11", "live", "7E8:RPM@40hz", "7E8:SPEED@40hz", "7E9:05@1hz", "--count", "200"});
+    EXPECT_EQ(outcome.exitCode, 0) << outcome.err;
+    EXPECT_NE(outcome.err.find("More is asked for than the bus can give: 7E8 RPM "), std::string::npos) << outcome.err;
+    std::size_t const told = outcome.err.find("Reached: 7E8 RPM ");
+    ASSERT_NE(told, std::string::npos) << outcome.err;
+    double engine = 0.0;
+    double speed = 0.0;
+    EXPECT_EQ(std::sscanf(outcome.err.c_str() + told, "Reached: 7E8 RPM %lf of 40 Hz, 7E8 SPEED %lf of 40 Hz", &engine,
+                          &speed),
+              2)
+        << outcome.err;
+    EXPECT_NEAR(engine / speed, 1.0, 0.2);
+    EXPECT_NE(outcome.err.find(" of 1 Hz", told), std::string::npos) << outcome.err;
+
+    Outcome const screen =
+        e2e::runOnTerminal({"-p", "sim:petrol-can11", "live", "7E8:RPM@40hz", "7E9:05"}, "", " of 40 Hz", "q");
+    EXPECT_EQ(screen.exitCode, 0);
+    EXPECT_NE(screen.out.find(" of 40 Hz"), std::string::npos) << "in the title, on 80 columns: " << screen.out;
+
+    Outcome const all = runVelmora({"-p", "sim:petrol-can11?instant", "--ecu", "all", "live", "05", "--count", "4"});
+    EXPECT_NE(all.out.find("7E8 Engine Coolant"), std::string::npos) << all.out;
+    EXPECT_NE(all.out.find("7E9 Engine Coolant"), std::string::npos) << all.out;
+}
+
 // What `velmora ... | head -1` needs: a reader that has gone ends it without a complaint.
 TEST(Live, EndsQuietlyWhenItsReaderHasGone)
 {

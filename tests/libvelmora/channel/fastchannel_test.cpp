@@ -167,6 +167,7 @@ TEST(FastChannel, WhatWasSaidUnaskedIsNobodysReply)
     rig.wire->say("7E803410D20\r\r>", WireTime(0));
     rig.wire->say("7E80341", WireTime(0));
     EXPECT_THAT(rig.ask("010C"), Optional(engineSpeed));
+    EXPECT_EQ(rig.met(Habit::StaleReply), 1U) << "the rest of a line; a whole reply is taken before";
 }
 
 TEST(FastChannel, AnAdapterThatResetItselfIsSetUpAgainOnce)
