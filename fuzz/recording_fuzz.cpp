@@ -1,7 +1,6 @@
 // Recordings, as CSV or NDJSON by the first byte of the input. What was read can be played from end to end, in the
 // order of time.
 
-#include "libvelmora/replay/player.h"
 #include "libvelmora/replay/recordingfile.h"
 
 #include <velmora/error.h>

@@ -1,12 +1,12 @@
 // Reports as a history or an import holds them. What was accepted must survive being written and read again, and be
 // shown and compared.
 
-#include "libvelmora/history/changes.h"
 #include "libvelmora/history/scanjson.h"
 #include "libvelmora/report/document/reportdocument.h"
 #include "libvelmora/report/document/vehiclereportjson.h"
 
 #include <velmora/error.h>
+#include <velmora/history.h>
 
 #include <cstdlib>
 #include <string>
@@ -27,7 +27,7 @@ void report(std::string const& text)
     if (again.toJson() != written) {
         std::abort();
     }
-    toJsonValue(changesBetween(read, again));
+    toJson(changesBetween(read, again));
     toHtml(makeDocument(read, {"date", "port", "1", false, 2026, {InspectionRule::UsEpa, 2005}, {}}));
     toMarkdown(makeDocument(read, {"date", "port", "1", true, 2026, {}, {}}));
 }

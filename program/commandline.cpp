@@ -1,6 +1,5 @@
 #include "program/commandline.h"
 
-#include "libvelmora/output/opening/outputfactory.h"
 #include "program/helpformatter.h"
 #include "program/licencetext.h"
 #include "program/selfdescription.h"
@@ -10,6 +9,7 @@
 
 #include <obd/version.h>
 #include <velmora/error.h>
+#include <velmora/longwatch.h>
 #include <velmora/velmora.h>
 
 #include <CLI/Config.hpp>

@@ -12,8 +12,9 @@ SessionOptions sessionOptions(CarOptions const& options)
     result.baud = options.baud;
     if (options.protocol) {
         auto const protocol = static_cast<obd::VehicleProtocol>(*options.protocol);
-        if (obd::toObdProtocol(protocol) == obd::ObdProtocolUnknown) {
-            throw Error(ErrorKind::WrongUse, "A protocol is a number from 1 to 9");
+        bool const search = protocol == obd::VehicleProtocol::Automatic;
+        if (!search && obd::toObdProtocol(protocol) == obd::ObdProtocolUnknown) {
+            throw Error(ErrorKind::WrongUse, "A protocol is a number from 1 to 9, or 0 to search for it");
         }
         result.protocol = protocol;
     }

@@ -1,7 +1,8 @@
 #pragma once
 
 #include "libvelmora/dash/dashdesk.h"
-#include "libvelmora/replay/player.h"
+
+#include <velmora/recording.h>
 
 #include <memory>
 #include <mutex>

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "libvelmora/history/changes.h"
+#include <velmora/history.h>
 
 #include <string>
 

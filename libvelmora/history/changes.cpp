@@ -1,7 +1,6 @@
-#include "libvelmora/history/changes.h"
-
 #include "libvelmora/history/changeparts.h"
 #include "libvelmora/report/finding/findingparts.h"
+#include "libvelmora/report/json.h"
 #include "libvelmora/report/texts/changetexts.h"
 #include "libvelmora/report/texts/labels.h"
 
@@ -211,7 +210,7 @@ bool hasWorse(std::vector<Change> const& changes)
                        [](Change const& each) { return each.weight == ChangeWeight::Worse; });
 }
 
-Json toJsonValue(std::vector<Change> const& changes)
+std::string toJson(std::vector<Change> const& changes)
 {
     static constexpr std::array<char const*, 3> weights = {"neutral", "better", "worse"};
     Json list = Json::array();
@@ -224,7 +223,7 @@ Json toJsonValue(std::vector<Change> const& changes)
                         {"before", textOrNull(each.before)},
                         {"after", textOrNull(each.after)}});
     }
-    return list;
+    return printed(list);
 }
 
 } // namespace velmora

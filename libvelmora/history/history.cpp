@@ -1,9 +1,9 @@
-#include "libvelmora/history/history.h"
-
 #include "libvelmora/history/scanjson.h"
+#include "libvelmora/output/database/database.h"
 #include "libvelmora/session/userfolders.h"
 
 #include <velmora/error.h>
+#include <velmora/history.h>
 
 #include <cerrno>
 #include <cstdlib>
@@ -66,7 +66,17 @@ bool stands(std::filesystem::path const& file)
 
 } // namespace
 
-History::History(std::filesystem::path const& file, Access access) : m_file(file)
+struct History::Parts
+{
+    Parts(std::filesystem::path path, Access access);
+
+    void prepare();
+
+    std::filesystem::path const file;
+    std::unique_ptr<Database> database; // null where there is no file to look into
+};
+
+History::Parts::Parts(std::filesystem::path path, Access access) : file(std::move(path))
 {
     if (access == Access::Look && !stands(file)) {
         return;
@@ -74,38 +84,44 @@ History::History(std::filesystem::path const& file, Access access) : m_file(file
     if (access == Access::Keep && file.has_parent_path()) {
         makeFolder(file);
     }
-    m_database = std::make_unique<Database>(file.string(), access == Access::Keep ? Database::Access::Write
-                                                                                  : Database::Access::ReadOnly);
+    database = std::make_unique<Database>(file.string(), access == Access::Keep ? Database::Access::Write
+                                                                                : Database::Access::ReadOnly);
     if (access == Access::Keep) {
         ::chmod(file.c_str(), S_IRUSR | S_IWUSR); // a file from elsewhere may have been open to all
     }
     prepare();
 }
 
-void History::prepare()
+void History::Parts::prepare()
 {
-    bool const empty = m_database->number("SELECT count(*) FROM sqlite_schema") == 0;
+    bool const empty = database->number("SELECT count(*) FROM sqlite_schema") == 0;
     if (empty) {
-        Transaction transaction(*m_database);
-        m_database->execute(historySchema);
-        m_database->execute("PRAGMA application_id=" + std::to_string(historyApplicationId));
-        m_database->execute("PRAGMA user_version=" + std::to_string(historyVersion));
+        Transaction transaction(*database);
+        database->execute(historySchema);
+        database->execute("PRAGMA application_id=" + std::to_string(historyApplicationId));
+        database->execute("PRAGMA user_version=" + std::to_string(historyVersion));
         transaction.commit();
     }
-    if (m_database->number("PRAGMA application_id") != historyApplicationId) {
-        throw Error(ErrorKind::WrongUse, m_file.string() + " is the database of another program",
+    if (database->number("PRAGMA application_id") != historyApplicationId) {
+        throw Error(ErrorKind::WrongUse, file.string() + " is the database of another program",
                     {"VELMORA_HISTORY=FILE names another file"});
     }
-    if (m_database->number("PRAGMA user_version") != historyVersion) {
-        throw Error(ErrorKind::WrongUse, m_file.string() + " was made by another version of this program",
+    if (database->number("PRAGMA user_version") != historyVersion) {
+        throw Error(ErrorKind::WrongUse, file.string() + " was made by another version of this program",
                     {"VELMORA_HISTORY=FILE names another file"});
     }
 }
 
+History::History(Access access) : History(defaultFile(), access) {}
+
+History::History(std::string const& file, Access access) : m_parts(std::make_unique<Parts>(file, access)) {}
+
+History::~History() = default;
+
 std::optional<std::int64_t> History::add(KeptScan const& scan)
 {
     // One that is ignored for its key would use up a number.
-    Statement insert(*m_database,
+    Statement insert(*m_parts->database,
                      "INSERT INTO scan (vehicle, time, program, hash, document) SELECT ?1, ?2, ?3, ?4, ?5 "
                      "WHERE NOT EXISTS (SELECT 1 FROM scan WHERE vehicle = ?1 AND time = ?2 AND hash = ?4)");
     insert.bind(1, scan.vehicle);
@@ -114,17 +130,18 @@ std::optional<std::int64_t> History::add(KeptScan const& scan)
     insert.bind(4, scan.hash);
     insert.bind(5, scan.document);
     insert.run();
-    bool const added = m_database->number("SELECT changes()") > 0;
-    return added ? std::optional(m_database->number("SELECT last_insert_rowid()")) : std::nullopt;
+    bool const added = m_parts->database->number("SELECT changes()") > 0;
+    return added ? std::optional(m_parts->database->number("SELECT last_insert_rowid()")) : std::nullopt;
 }
 
 std::vector<KeptScan> History::scans(std::string const& vehicle) const
 {
     std::vector<KeptScan> list;
-    if (m_database == nullptr) {
+    if (m_parts->database == nullptr) {
         return list;
     }
-    Statement rows(*m_database, std::string(scanColumns) + "WHERE ?1 = '' OR vehicle = ?1 ORDER BY time, number");
+    Statement rows(*m_parts->database,
+                   std::string(scanColumns) + "WHERE ?1 = '' OR vehicle = ?1 ORDER BY time, number");
     rows.bind(1, vehicle);
     while (rows.next()) {
         list.push_back(scanAt(rows));
@@ -134,8 +151,8 @@ std::vector<KeptScan> History::scans(std::string const& vehicle) const
 
 KeptScan History::scan(std::int64_t number) const
 {
-    if (m_database != nullptr) {
-        Statement rows(*m_database, std::string(scanColumns) + "WHERE number = ?");
+    if (m_parts->database != nullptr) {
+        Statement rows(*m_parts->database, std::string(scanColumns) + "WHERE number = ?");
         rows.bind(1, number);
         if (rows.next()) {
             KeptScan const found = scanAt(rows);
@@ -143,7 +160,7 @@ KeptScan History::scan(std::int64_t number) const
             return found;
         }
     }
-    throw Error(ErrorKind::WrongUse, "There is no scan " + std::to_string(number) + " in " + m_file.string(),
+    throw Error(ErrorKind::WrongUse, "There is no scan " + std::to_string(number) + " in " + m_parts->file.string(),
                 {"velmora history lists those there are"});
 }
 
@@ -153,12 +170,12 @@ std::size_t History::forget(std::string const& vehicle)
     if (count == 0) {
         throw Error(ErrorKind::WrongUse, "Nothing is kept of " + vehicle, {"velmora history lists the vehicles"});
     }
-    m_database->execute("PRAGMA secure_delete=ON");
-    Statement drop(*m_database, "DELETE FROM scan WHERE vehicle = ?");
+    m_parts->database->execute("PRAGMA secure_delete=ON");
+    Statement drop(*m_parts->database, "DELETE FROM scan WHERE vehicle = ?");
     drop.bind(1, vehicle);
     drop.run();
-    m_database->execute("VACUUM");
-    m_database->checkpoint();
+    m_parts->database->execute("VACUUM");
+    m_parts->database->checkpoint();
     return count;
 }
 
@@ -176,7 +193,7 @@ std::size_t History::exportTo(std::ostream& out) const
 
 History::Imported History::importFrom(std::istream& in)
 {
-    Transaction transaction(*m_database);
+    Transaction transaction(*m_parts->database);
     Imported result;
     std::string line;
     for (std::size_t number = 1; std::getline(in, line); ++number) {
@@ -200,10 +217,10 @@ History::Imported History::importFrom(std::istream& in)
     return result;
 }
 
-std::filesystem::path History::defaultFile()
+std::string History::defaultFile()
 {
     char const* const file = std::getenv("VELMORA_HISTORY");
-    return file != nullptr && *file != '\0' ? std::filesystem::path(file) : userDataFolder() / "history.db";
+    return file != nullptr && *file != '\0' ? std::string(file) : (userDataFolder() / "history.db").string();
 }
 
 } // namespace velmora

@@ -161,27 +161,36 @@ KeptScan parseLine(std::string_view line)
     return scan;
 }
 
-Json toJsonValue(KeptScan const& scan)
+ScanFacts factsOf(KeptScan const& scan)
 {
     VehicleReport const report = reportOf(scan);
-    std::optional<bool> lamp;
-    Json codes = Json::array();
+    ScanFacts facts;
+    facts.modules = report.modules.size();
     for (ModuleReport const& module : report.modules) {
         if (module.codes.lamp) {
-            lamp = lamp.value_or(false) || *module.codes.lamp;
+            facts.lamp = facts.lamp.value_or(false) || *module.codes.lamp;
         }
         for (CodeList const& list : module.codes.lists) {
             for (TroubleCode const& code : list.codes) {
-                bool const known = std::find(codes.begin(), codes.end(), Json(code.code)) != codes.end();
-                if (!known && list.kind != CodeKind::Pending) {
-                    codes.push_back(code.code);
+                if (list.kind != CodeKind::Pending && std::ranges::count(facts.codes, code.code) == 0) {
+                    facts.codes.push_back(code.code);
                 }
             }
         }
     }
-    return {{"number", scan.number},           {"vehicle", scan.vehicle},   {"time", timeText(scan.time)},
-            {"program", scan.program},         {"lamp", valueOrNull(lamp)}, {"codes", codes},
-            {"modules", report.modules.size()}};
+    return facts;
+}
+
+std::string toJson(KeptScan const& scan)
+{
+    ScanFacts const facts = factsOf(scan);
+    return printed({{"number", scan.number},
+                    {"vehicle", scan.vehicle},
+                    {"time", timeText(scan.time)},
+                    {"program", scan.program},
+                    {"lamp", valueOrNull(facts.lamp)},
+                    {"codes", facts.codes},
+                    {"modules", facts.modules}});
 }
 
 } // namespace velmora

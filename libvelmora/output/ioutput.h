@@ -2,17 +2,9 @@
 
 #include "libvelmora/output/record.h"
 
-#include <cstdint>
-#include <optional>
+#include <velmora/health.h>
 
 namespace velmora {
-
-// How an output is that keeps a connection, and what it holds back itself.
-struct OutputState
-{
-    std::optional<bool> up;
-    std::optional<std::uint64_t> waiting; // records
-};
 
 // Where values go. The calls come from one thread at a time and never overlap; queue, batching, pauses after a failure
 // and counts stand around it, in OutputRunner.

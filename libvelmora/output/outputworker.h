@@ -23,18 +23,6 @@ struct OutputLimits
     std::chrono::milliseconds longestPause{60000};
 };
 
-struct OutputCounts
-{
-    std::uint64_t accepted = 0;
-    std::uint64_t written = 0;
-    std::uint64_t dropped = 0;
-    std::uint64_t failures = 0;
-    std::size_t queued = 0; // those of a write under way too
-    bool failing = false;   // the last attempt failed
-    OutputState state;
-    std::string lastError;
-};
-
 // An output's queue, and what its thread does. Shared by that thread and the runner, which it may outlive.
 class OutputWorker
 {

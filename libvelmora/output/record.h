@@ -1,6 +1,7 @@
 #pragma once
 
-#include <velmora/reading.h>
+#include <velmora/recording.h>
+#include <velmora/trips.h>
 
 #include <chrono>
 #include <cstdint>
@@ -25,25 +26,6 @@ struct Event
     std::string text;                   // for people
 };
 
-// A way from engine start to engine stop, as TripMeter saw it. What was not told stays empty.
-struct Trip
-{
-    WallTime begin;
-    WallTime end;
-    std::string vehicle;
-    bool engineRun = false; // too short in way or time to be called a trip
-    double distanceKm = 0.0;
-    double durationS = 0.0;
-    double idleS = 0.0;
-    double gapS = 0.0; // of the duration, without readings of the speed
-    std::optional<double> fuelL;
-    std::optional<double> odometerKm; // difference of the odometer, or of the distance since codes were cleared
-    std::optional<double> meanKmh;
-    std::optional<double> maxKmh;
-    std::optional<double> maxRpm;
-    std::optional<double> maxCoolantC;
-};
-
 // A control module of the vehicle.
 struct ModuleInfo
 {
@@ -53,17 +35,6 @@ struct ModuleInfo
     std::string name;
     std::string description;
     std::string vin; // only if the user wants it kept
-};
-
-// A sensor that will be read from now on.
-struct SensorEntry
-{
-    unsigned int module = 0;
-    std::string sensor;
-    std::string pid;
-    std::string name;
-    std::string unit;
-    double hertz = 0.0; // how often it will be read; 0 for as often as there is time
 };
 
 // All sensors that will be read from now on; replaces the list before.

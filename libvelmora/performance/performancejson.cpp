@@ -1,5 +1,7 @@
 #include "libvelmora/performance/performancejson.h"
 
+#include "libvelmora/performance/sprint.h"
+
 #include <cmath>
 
 namespace velmora {
@@ -24,27 +26,32 @@ Json goalJson(SprintGoal const& goal, std::optional<SprintTime> const& time)
 
 } // namespace
 
-Json performanceJson(PerformanceMeter const& meter, std::vector<SprintGoal> const& goals, int kilograms)
+Json performanceJson(PerformanceRun const& run, std::vector<SprintGoal> const& goals)
 {
-    std::vector<SpeedPoint> const run = meter.run();
-    Json json = {{"state", stateText(meter.state())},
-                 {"weight_kg", kilograms},
-                 {"interval_s", rounded(meter.interval(), 1000.0)},
-                 {"distance_m", rounded(distanceOf(run), 10.0)},
+    Json json = {{"state", stateText(run.state)},
+                 {"weight_kg", run.kilograms},
+                 {"interval_s", rounded(run.interval, 1000.0)},
+                 {"distance_m", rounded(distanceOf(run.speeds), 10.0)},
                  {"goals", Json::array()},
                  {"speed", Json::array()},
                  {"power", Json::array()}};
     for (SprintGoal const& goal : goals) {
-        json["goals"].push_back(goalJson(goal, timeOf(goal, run, meter.interval())));
+        json["goals"].push_back(goalJson(goal, timeOf(goal, run.speeds, run.interval)));
     }
-    for (SpeedPoint const& point : run) {
-        json["speed"].push_back({{"s", rounded(point.seconds - run.front().seconds, 1000.0)}, {"kmh", point.kmh}});
+    for (SpeedPoint const& point : run.speeds) {
+        json["speed"].push_back(
+            {{"s", rounded(point.seconds - run.speeds.front().seconds, 1000.0)}, {"kmh", point.kmh}});
     }
-    for (PerformanceMeter::PowerPoint const& point : meter.powers()) {
+    for (PowerPoint const& point : run.powers) {
         json["power"].push_back(
             {{"rpm", point.rpm}, {"kw", rounded(point.kilowatt, 10.0)}, {"nm", rounded(point.newtonMetre, 10.0)}});
     }
     return json;
+}
+
+std::string toJson(PerformanceRun const& run, std::vector<SprintGoal> const& goals)
+{
+    return printed(performanceJson(run, goals));
 }
 
 } // namespace velmora

@@ -16,16 +16,16 @@ constexpr std::size_t mostPoints = 5000; // of one run
 
 void PerformanceMeter::addSpeed(double seconds, double kmh)
 {
-    bool const stood = m_state == State::Standing || m_state == State::Stopped;
+    bool const stood = m_state == RunState::Standing || m_state == RunState::Stopped;
     if (kmh <= 0.0) {
-        if (m_state == State::Running) {
+        if (m_state == RunState::Running) {
             goOn(seconds, kmh);
         }
-        m_state = m_state == State::Running || m_state == State::Stopped ? State::Stopped : State::Standing;
+        m_state = m_state == RunState::Running || m_state == RunState::Stopped ? RunState::Stopped : RunState::Standing;
         m_lastStanding = seconds;
     } else if (stood) {
         begin(seconds, kmh);
-    } else if (m_state == State::Running) {
+    } else if (m_state == RunState::Running) {
         goOn(seconds, kmh);
     }
     m_kmh = kmh;
@@ -34,7 +34,7 @@ void PerformanceMeter::addSpeed(double seconds, double kmh)
 
 void PerformanceMeter::begin(double seconds, double kmh)
 {
-    m_state = State::Running;
+    m_state = RunState::Running;
     m_firstSeconds = seconds;
     m_readings = 1;
     m_powers.clear();
@@ -73,10 +73,10 @@ void PerformanceMeter::reckonStart()
 }
 
 // With the way since the last change, where the speed has been steady for long.
-std::vector<SpeedPoint> PerformanceMeter::run() const
+std::vector<SpeedPoint> PerformanceMeter::points() const
 {
     std::vector<SpeedPoint> points = m_run;
-    if (m_state == State::Running && m_lastSeconds - points.back().seconds > steadyAfter) {
+    if (m_state == RunState::Running && m_lastSeconds - points.back().seconds > steadyAfter) {
         points.push_back({m_lastSeconds, m_kmh});
     }
     return points;
@@ -89,7 +89,7 @@ double PerformanceMeter::interval() const
 
 void PerformanceMeter::addPower(double rpm, double kilowatt, double newtonMetre)
 {
-    if (m_state != State::Running || !(rpm > 0.0) || !(kilowatt > 0.0)) {
+    if (m_state != RunState::Running || !(rpm > 0.0) || !(kilowatt > 0.0)) {
         return;
     }
     int const step = static_cast<int>(rpm / rpmStep);
@@ -99,7 +99,7 @@ void PerformanceMeter::addPower(double rpm, double kilowatt, double newtonMetre)
     }
 }
 
-std::vector<PerformanceMeter::PowerPoint> PerformanceMeter::powers() const
+std::vector<PowerPoint> PerformanceMeter::powers() const
 {
     std::vector<PowerPoint> points;
     for (auto const& [step, point] : m_powers) {
@@ -108,16 +108,21 @@ std::vector<PerformanceMeter::PowerPoint> PerformanceMeter::powers() const
     return points;
 }
 
-std::string stateText(PerformanceMeter::State state)
+PerformanceRun PerformanceMeter::run(int kilograms) const
+{
+    return {m_state, m_kmh, points(), interval(), powers(), kilograms};
+}
+
+std::string stateText(RunState state)
 {
     switch (state) {
-    case PerformanceMeter::State::Moving:
+    case RunState::Moving:
         return "stand still to be ready";
-    case PerformanceMeter::State::Standing:
+    case RunState::Standing:
         return "standing, ready";
-    case PerformanceMeter::State::Running:
+    case RunState::Running:
         return "running";
-    case PerformanceMeter::State::Stopped:
+    case RunState::Stopped:
         return "standing, ready for the next run";
     }
     return {};

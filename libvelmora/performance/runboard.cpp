@@ -1,6 +1,7 @@
 #include "libvelmora/performance/runboard.h"
 
 #include "libvelmora/performance/performancejson.h"
+#include "libvelmora/performance/sprint.h"
 
 #include <utility>
 
@@ -53,7 +54,7 @@ Json RunBoard::state(bool whole) const
     if (!m_begun) {
         return {};
     }
-    Json json = performanceJson(m_meter, allSprintGoals(), m_kilograms);
+    Json json = performanceJson(m_meter.run(m_kilograms), allSprintGoals());
     if (!whole) {
         json.erase("speed");
     }

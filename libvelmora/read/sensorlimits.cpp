@@ -123,4 +123,34 @@ std::vector<std::string> limitedSensors(SettingsStore& store)
     return store.keysBelow(limitGroup);
 }
 
+struct SensorLimits::Parts
+{
+    explicit Parts(std::filesystem::path const& file) : store(file) {}
+
+    SettingsStore store;
+};
+
+SensorLimits::SensorLimits(std::string const& settingsFile)
+    : m_parts(std::make_unique<Parts>(settingsFile.empty() ? SettingsStore::defaultFile()
+                                                           : std::filesystem::path(settingsFile)))
+{}
+
+SensorLimits::~SensorLimits() = default;
+
+SensorLimit SensorLimits::of(std::string const& key) const
+{
+    return limitOf(m_parts->store, key);
+}
+
+std::vector<std::string> SensorLimits::sensors() const
+{
+    return limitedSensors(m_parts->store);
+}
+
+void SensorLimits::set(std::string const& key, SensorLimit const& limit)
+{
+    setLimit(m_parts->store, key, limit);
+    m_parts->store.sync();
+}
+
 } // namespace velmora

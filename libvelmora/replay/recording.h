@@ -1,38 +1,14 @@
 #pragma once
 
-#include "libvelmora/output/record.h"
+#include <velmora/recording.h>
 
 #include <cstdint>
 #include <map>
+#include <optional>
 #include <string>
-#include <vector>
+#include <string_view>
 
 namespace velmora {
-
-// One value of a recorded sensor. Nothing where the recording says that there was none.
-struct RecordedValue
-{
-    std::int64_t time = 0; // ms since 1970, UTC
-    Reading::Value value;
-};
-
-struct RecordedSensor
-{
-    SensorEntry about;
-    int decimals = 0;                  // the most that a value has
-    bool numeric = true;               // every value is a number
-    std::vector<RecordedValue> values; // in the order of time
-};
-
-// What a file of readings holds.
-struct Recording
-{
-    std::vector<RecordedSensor> sensors;
-    std::int64_t begin = 0; // of the first value
-    std::int64_t end = 0;   // of the last one
-    bool cut = false;       // it holds more than can be played
-    bool dated = true;      // else its times count from a beginning that nobody has noted
-};
 
 // Puts a recording together of values in any order. One thread.
 class RecordingMaker

@@ -7,6 +7,7 @@
 
 #include <cerrno>
 #include <cstring>
+#include <filesystem>
 #include <fstream>
 
 namespace velmora {
@@ -26,7 +27,7 @@ std::ifstream opened(std::filesystem::path const& file)
 
 } // namespace
 
-RecordingForm formOf(std::filesystem::path const& file)
+RecordingForm formOf(std::string const& file)
 {
     std::ifstream in = opened(file);
     std::string start(16, '\0');
@@ -40,7 +41,7 @@ RecordingForm formOf(std::filesystem::path const& file)
                                       : RecordingForm::Dialogue;
 }
 
-Recording readRecording(std::filesystem::path const& file)
+Recording readRecording(std::string const& file)
 {
     RecordingForm const form = formOf(file);
     std::ifstream in = opened(file);
@@ -48,7 +49,7 @@ Recording readRecording(std::filesystem::path const& file)
                           : form == RecordingForm::Csv    ? readCsv(in)
                                                           : readNdjson(in);
     if (recording.sensors.empty()) {
-        throw Error(ErrorKind::Failed, file.string() + " holds no readings");
+        throw Error(ErrorKind::Failed, file + " holds no readings");
     }
     return recording;
 }

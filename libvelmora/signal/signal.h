@@ -2,6 +2,8 @@
 
 #include "libvelmora/signal/formula.h"
 
+#include <velmora/signals.h>
+
 #include <map>
 #include <optional>
 #include <string>
@@ -78,16 +80,5 @@ std::optional<std::string> swappedReply(std::string const& header);
 
 // Whether a header asks all modules: 7DF, 18DB33F1, and those of the legacy buses.
 bool isFunctionalHeader(std::string const& header);
-
-// What is wrong in a file, and where.
-struct SignalMistake
-{
-    std::size_t line = 0;
-    std::string key; // "signal 3, formula"; empty for the file as a whole
-    std::string what;
-};
-
-// "gearbox.toml:12: signal 3, formula: ..."
-std::string toText(SignalMistake const& mistake, std::string const& path);
 
 } // namespace velmora

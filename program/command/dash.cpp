@@ -1,11 +1,11 @@
-#include "libvelmora/http/httpserver.h"
-#include "libvelmora/replay/player.h"
-#include "libvelmora/replay/recordingfile.h"
 #include "program/command/commands.h"
 #include "program/commandline.h"
 #include "program/live/playeddialogue.h"
 #include "program/watch/dashplay.h"
 #include "program/watch/watchcommand.h"
+
+#include <velmora/longwatch.h>
+#include <velmora/recording.h>
 
 #include <fmt/format.h>
 
@@ -28,7 +28,7 @@ struct DashOptions
 ExitCode dash(GlobalOptions const& given, DashOptions const& chosen)
 {
     GlobalOptions global = given;
-    parseHttpPlace(chosen.listen);
+    checkPagePlace(chosen.listen);
     WatchOptions watch = chosen.watch;
     std::string address = fmt::format("dash:{}?allow_clear={}&allow_console={}", chosen.listen,
                                       chosen.allowClear ? "yes" : "no", chosen.allowConsole ? "yes" : "no");
@@ -40,7 +40,7 @@ ExitCode dash(GlobalOptions const& given, DashOptions const& chosen)
         std::optional<Recording> const recording =
             dialogue ? playedDialogue(global, chosen.play) : std::optional(readRecording(chosen.play));
         if (recording) {
-            return playOnPage(global, parseOutputAddress(address), *recording, chosen.speed);
+            return playOnPage(global, address, *recording, chosen.speed);
         }
         global.port = "replay:" + chosen.play; // read as a vehicle
     }

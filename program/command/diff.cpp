@@ -1,13 +1,11 @@
-#include "libvelmora/history/changes.h"
-#include "libvelmora/history/history.h"
-#include "libvelmora/history/scanjson.h"
 #include "program/command/commands.h"
 #include "program/commandline.h"
-#include "program/view/historytext.h"
+#include "program/view/json.h"
 #include "program/view/printtext.h"
 #include "program/view/style.h"
 
 #include <velmora/error.h>
+#include <velmora/history.h>
 
 #include <fmt/format.h>
 
@@ -52,7 +50,7 @@ ScanPair lastTwo(History const& history, std::string const& wanted)
 
 ScanPair choosePair(DiffOptions const& options)
 {
-    History const history(History::defaultFile(), History::Access::Look);
+    History const history(History::Access::Look);
     if (!options.older) {
         return lastTwo(history, options.vehicle);
     }
@@ -78,13 +76,13 @@ ExitCode diff(DiffOptions const& options, GlobalOptions const& global)
     VehicleReport const after = reportOf(newer);
     std::vector<Change> const changes = changesBetween(before, after);
     if (global.json) {
-        fmt::print("{}", printed(Json{{"older", toJsonValue(older)},
-                                      {"newer", toJsonValue(newer)},
+        fmt::print("{}", printed(Json{{"older", Json::parse(toJson(older))},
+                                      {"newer", Json::parse(toJson(newer))},
                                       {"cleared", wereCleared(before, after)},
                                       {"worse", hasWorse(changes)},
-                                      {"changes", toJsonValue(changes)}}));
+                                      {"changes", Json::parse(toJson(changes))}}));
     } else {
-        printText(diffText(older, newer, changes, outputStyle(global)));
+        printText(toText(older, newer, changes, textStyle(global)));
     }
     return options.checking && hasWorse(changes) ? ExitCode::Findings : ExitCode::Done;
 }

@@ -1,19 +1,17 @@
-#include "libvelmora/history/history.h"
-
 #include "common/text/layout.h"
 #include "common/text/text.h"
-#include "libvelmora/history/scanjson.h"
 #include "libvelmora/record/checkedfile.h"
 #include "program/command/commands.h"
 #include "program/command/confirm.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
-#include "program/view/historytext.h"
+#include "program/view/json.h"
 #include "program/view/printtext.h"
 #include "program/view/style.h"
 
 #include <velmora/document.h>
 #include <velmora/error.h>
+#include <velmora/history.h>
 
 #include <fmt/format.h>
 
@@ -43,14 +41,14 @@ struct HistoryOptions
 
 ExitCode listScans(GlobalOptions const& global)
 {
-    std::vector<KeptScan> const scans = History(History::defaultFile(), History::Access::Look).scans();
+    std::vector<KeptScan> const scans = History(History::Access::Look).scans();
     if (!global.json) {
-        printText(historyText(scans, outputStyle(global)));
+        printText(toText(scans, textStyle(global)));
         return ExitCode::Done;
     }
     Json list = Json::array();
     for (KeptScan const& scan : scans) {
-        list.push_back(toJsonValue(scan));
+        list.push_back(Json::parse(toJson(scan)));
     }
     fmt::print("{}", printed(list));
     return ExitCode::Done;
@@ -58,12 +56,12 @@ ExitCode listScans(GlobalOptions const& global)
 
 ExitCode showScan(HistoryOptions const& options, GlobalOptions const& global)
 {
-    KeptScan const scan = History(History::defaultFile(), History::Access::Look).scan(options.number);
+    KeptScan const scan = History(History::Access::Look).scan(options.number);
     VehicleReport const report = reportOf(scan);
     if (global.json) {
         fmt::print("{}", report.toJson());
     } else {
-        printText(historyText({scan}, outputStyle(global)) + "\n" +
+        printText(toText(std::vector{scan}, textStyle(global)) + "\n" +
                   toText(report, DocumentOptions(), textStyle(global)));
     }
     return ExitCode::Done;
@@ -72,7 +70,7 @@ ExitCode showScan(HistoryOptions const& options, GlobalOptions const& global)
 ExitCode forgetVehicle(HistoryOptions const& options, GlobalOptions const& global)
 {
     requireConsent(global, "Forgetting", "forgets without asking");
-    History history(History::defaultFile(), History::Access::Keep);
+    History history(History::Access::Keep);
     std::size_t const count = history.scans(options.vehicle).size();
     std::string const warning =
         fmt::format("{} of {} would be gone for good.\n", counted(count, "scan"), options.vehicle);
@@ -112,7 +110,7 @@ void writePrivately(std::string const& path, std::string const& text)
 ExitCode exportScans(HistoryOptions const& options, GlobalOptions const& global)
 {
     std::ostringstream lines;
-    std::size_t const count = History(History::defaultFile(), History::Access::Look).exportTo(lines);
+    std::size_t const count = History(History::Access::Look).exportTo(lines);
     if (options.file == "-") {
         writeOutput(lines.str());
         return ExitCode::Done;
@@ -135,7 +133,7 @@ ExitCode importScans(HistoryOptions const& options, GlobalOptions const& global)
         throw Error(ErrorKind::WrongUse, "Could not read " + options.file + ": " + why,
                     {"velmora history export FILE writes one"});
     }
-    History::Imported const result = History(History::defaultFile(), History::Access::Keep).importFrom(in);
+    History::Imported const result = History(History::Access::Keep).importFrom(in);
     fmt::print("{}", global.json ? printed(Json{{"added", result.added}, {"known", result.known}})
                                  : fmt::format("Imported {}, {} known already\n", counted(result.added, "scan"),
                                                counted(result.known, "scan")));

@@ -1,15 +1,11 @@
 #include "program/command/keepscan.h"
 
-#ifdef VELMORA_HISTORY
-#include "libvelmora/history/history.h"
-#include "libvelmora/history/scanjson.h"
-#endif
-
 #include "libvelmora/session/settingsstore.h"
 #include "program/command/confirm.h"
 #include "program/terminal/output.h"
 
 #include <velmora/error.h>
+#include <velmora/history.h>
 #include <velmora/version.h>
 
 #include <fmt/format.h>
@@ -62,7 +58,7 @@ bool ask(SettingsStore& store, GlobalOptions const& options)
     std::string const what = fmt::format(
         "velmora can keep each scan, by the vehicle's identification number, to tell later what has changed:\n"
         "  {}\nNothing leaves this machine. velmora history shows, exports and forgets it.\n",
-        History::defaultFile().string());
+        History::defaultFile());
     bool const keep = confirmed(options, what, "Keep this scan and those to come?");
     remember(store, keep);
     tell(keep ? "" : "Nothing is kept; scan --history keeps a single one.\n");
@@ -95,7 +91,7 @@ void keepScan(VehicleReport const& report, KeepWish const& wish, GlobalOptions c
 {
     using namespace std::chrono;
     try {
-        History history(History::defaultFile(), History::Access::Keep);
+        History history(History::Access::Keep);
         KeptScan const scan =
             makeScan(report, wish.vehicle, floor<milliseconds>(system_clock::now()), std::string(versionText));
         std::optional<std::int64_t> const number = history.add(scan);

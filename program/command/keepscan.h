@@ -1,7 +1,8 @@
 #pragma once
 
-#include "libvelmora/report/vehiclereport.h"
 #include "program/globaloptions.h"
+
+#include <velmora/report.h>
 
 #include <CLI/App.hpp>
 

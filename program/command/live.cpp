@@ -1,5 +1,4 @@
 #include "libvelmora/poll/sensorwish.h"
-#include "libvelmora/replay/recordingfile.h"
 #include "program/command/commands.h"
 #include "program/command/commandsession.h"
 #include "program/commandline.h"
@@ -9,6 +8,7 @@
 #include "program/terminal/output.h"
 
 #include <velmora/error.h>
+#include <velmora/recording.h>
 
 #include <fmt/format.h>
 

@@ -1,7 +1,4 @@
 #include "common/text/layout.h"
-#include "libvelmora/signal/importing/signalimport.h"
-#include "libvelmora/signal/signalfile.h"
-#include "libvelmora/signal/signalhex.h"
 #include "program/command/commands.h"
 #include "program/command/signalsprobe.h"
 #include "program/commandline.h"
@@ -11,6 +8,7 @@
 #include "program/view/style.h"
 
 #include <velmora/error.h>
+#include <velmora/signals.h>
 
 #include <CLI/App.hpp>
 #include <fmt/format.h>
@@ -41,16 +39,12 @@ void tellAll(std::vector<SignalMistake> const& mistakes, std::string const& path
 
 ExitCode importFile(SignalOptions const& options, bool json)
 {
-    SignalImport const import = importSignalFile(options.source);
+    SignalListing const import = convertSignals(options.source);
     tellAll(import.notes, options.source);
-    tellAll(import.refused, options.source);
-    tell(fmt::format("{} taken, {} left out\n", counted(import.file.signals.size(), "signal"), import.refused.size()));
-    if (json) {
-        fmt::print("{}", printed(toJsonValue(import.file)));
-    } else {
-        fmt::print("{}", toToml(import.file));
-    }
-    if (import.file.signals.empty()) {
+    tellAll(import.mistakes, options.source);
+    tell(fmt::format("{} taken, {} left out\n", counted(import.signals.size(), "signal"), import.mistakes.size()));
+    fmt::print("{}", json ? import.json : import.toml);
+    if (import.signals.empty()) {
         throw Error(ErrorKind::Failed, "Nothing of " + options.source + " could be taken");
     }
     return ExitCode::Done;
@@ -60,23 +54,23 @@ ExitCode checkFiles(SignalOptions const& options)
 {
     bool sound = true;
     for (std::string const& path : options.files) {
-        SignalFileReading const reading = checkSignalFile(path);
-        tellAll(reading.mistakes, path);
-        sound = sound && reading.mistakes.empty();
-        if (reading.mistakes.empty()) {
-            fmt::print("{}: {}\n", path, counted(reading.file.signals.size(), "signal"));
+        SignalListing const listing = checkSignals(path);
+        tellAll(listing.mistakes, path);
+        sound = sound && listing.mistakes.empty();
+        if (listing.mistakes.empty()) {
+            fmt::print("{}: {}\n", path, counted(listing.signals.size(), "signal"));
         }
     }
     return sound ? ExitCode::Done : ExitCode::WrongUse;
 }
 
-std::vector<Cell> row(Signal const& signal)
+std::vector<Cell> row(SignalOutline const& signal)
 {
     std::string const how = signal.enabled ? signal.reason : "off: " + signal.reason;
     return {{signal.id},
             {signal.name},
             {signal.header.empty() ? "-" : signal.header},
-            {signal.request.empty() ? "-" : hexText(signal.request)},
+            {signal.request.empty() ? "-" : fmt::format("{:02X}", fmt::join(signal.request, ""))},
             {signal.unit},
             {how}};
 }
@@ -85,13 +79,13 @@ ExitCode listFiles(SignalOptions const& options, GlobalOptions const& global)
 {
     Json document = Json::array();
     for (std::string const& path : options.files) {
-        SignalFile const file = loadSignalFile(path);
+        SignalListing const listing = listSignals(path);
         if (global.json) {
-            document.push_back(toJsonValue(file));
+            document.push_back(Json::parse(listing.json));
             continue;
         }
         std::vector<std::vector<Cell>> rows;
-        for (Signal const& signal : file.signals) {
+        for (SignalOutline const& signal : listing.signals) {
             rows.push_back(row(signal));
         }
         printText(fmt::format("{}\n{}", path, drawColumns(rows, "  ", outputStyle(global))));

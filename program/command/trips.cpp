@@ -1,8 +1,9 @@
-#include "libvelmora/output/database/triplist.h"
 #include "program/command/commands.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
 #include "program/view/tripstext.h"
+
+#include <velmora/trips.h>
 
 namespace velmora::cli {
 
@@ -17,7 +18,7 @@ struct TripsOptions
 ExitCode trips(GlobalOptions const& global, TripsOptions const& chosen)
 {
     std::vector<Trip> const list = readTrips(chosen.file);
-    writeOutput(global.json ? tripsJson(list) : chosen.csv ? tripsCsv(list) : tripsText(list));
+    writeOutput(global.json ? toJson(list) : chosen.csv ? tripsCsv(list) : tripsText(list));
     return ExitCode::Done;
 }
 

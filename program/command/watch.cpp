@@ -1,14 +1,14 @@
-#include "libvelmora/poll/sensorwish.h"
-#include "libvelmora/signal/signalfile.h"
 #include "program/command/commands.h"
 #include "program/command/lastresort.h"
 #include "program/commandline.h"
 #include "program/terminal/interrupt.h"
 #include "program/terminal/output.h"
+#include "program/view/qrtext.h"
+#include "program/view/timetext.h"
 #include "program/watch/watchcommand.h"
-#include "program/watch/watchrun.h"
 
 #include <velmora/error.h>
+#include <velmora/longwatch.h>
 
 #include <fmt/format.h>
 
@@ -18,170 +18,100 @@ namespace velmora::cli {
 
 namespace {
 
-[[noreturn]] void rejectOption(std::string const& option, std::string const& text, std::string const& expected)
+CarOptions carOf(GlobalOptions const& global)
 {
-    throw Error(ErrorKind::WrongUse, option + ": \"" + text + "\" is not " + expected);
+    CarOptions car;
+    car.port = global.port;
+    car.baud = global.baud;
+    if (global.protocol) {
+        car.protocol = static_cast<int>(*global.protocol);
+    }
+    car.module = global.ecu;
+    car.reset = global.reset;
+    car.logFile = global.logFile;
+    car.traceFile = global.traceFile;
+    car.settingsFile = global.settingsFile;
+    car.signalFiles = global.signalFiles;
+    return car;
 }
 
-// A watch that runs for months had better not begin, nor go on, with files that it can't read.
-void checkSignalFiles(std::vector<std::string> const& files)
+// A link that stands alone on standard output can be taken from there by another program.
+void tellPage(PageLink const& page, bool forPage)
 {
-    std::vector<std::string> mistakes;
-    for (std::string const& file : files) {
-        for (SignalMistake const& each : checkSignalFile(file).mistakes) {
-            mistakes.push_back(toText(each, file));
-        }
+    if (forPage && page.outputIsFree) {
+        fmt::print("{}\n", page.link);
+        flushOutput();
+    } else {
+        tell("The page: " + page.link + "\n");
     }
-    if (!mistakes.empty()) {
-        throw Error(ErrorKind::WrongUse, fmt::format("{}", fmt::join(mistakes, "\n")));
+    if (!page.remark.empty()) {
+        tell(page.remark + "\n");
     }
+#ifdef VELMORA_DASH
+    if (forPage) {
+        tell(qrForTerminal(page.link, STDERR_FILENO));
+    }
+#endif
 }
 
-// What the command line says stands above what the file says; outputs come on top.
-WatchSettings settingsOf(GlobalOptions const& global, WatchOptions const& chosen)
+LongWatchOptions optionsOf(GlobalOptions const& global, WatchOptions const& chosen)
 {
-    WatchSettings settings = chosen.config.empty() ? WatchSettings() : readWatchSettings(chosen.config);
-    checkSignalFiles(settings.signals);
-    checkSignalFiles(global.signalFiles);
-    if (!chosen.sensors.empty()) {
-        settings.sensors = chosen.sensors;
-        for (std::string const& each : chosen.sensors) {
-            parseSensorWish(each);
-        }
+    LongWatchOptions options;
+    options.car = carOf(global);
+    options.configFile = chosen.config;
+    options.sensors = chosen.sensors;
+    options.outputs = chosen.outputs;
+    options.vehicle = chosen.vehicle;
+    options.fullVin = chosen.vin.empty() ? std::nullopt : std::optional(chosen.vin == "full");
+    options.stopAfter = chosen.stopAfter;
+    options.wake = chosen.wake;
+    options.electric = chosen.electric;
+    options.fast = chosen.fast;
+    options.forPage = chosen.page;
+    if (!global.quiet) {
+        options.onEvent = [](std::string const& text) {
+            tell(isoTime(std::chrono::system_clock::now()) + " " + text + "\n");
+        };
     }
-    for (std::string const& each : chosen.outputs) {
-        settings.outputs.push_back(parseOutputAddress(each));
-    }
-    if (!chosen.vehicle.empty()) {
-        if (!isVehicleName(chosen.vehicle)) {
-            rejectOption("--vehicle", chosen.vehicle, "a name of letters, digits, - and _");
-        }
-        settings.vehicle = chosen.vehicle;
-    }
-    if (!chosen.vin.empty()) {
-        settings.fullVin = chosen.vin == "full";
-    }
-    if (!chosen.stopAfter.empty()) {
-        auto const time = parseDuration(chosen.stopAfter);
-        if (!time || *time < std::chrono::seconds(1)) {
-            rejectOption("--stop-after", chosen.stopAfter, "a time such as 120s or 5min");
-        }
-        settings.battery.stopAfter = std::chrono::floor<std::chrono::seconds>(*time);
-    }
-    if (!chosen.wake.empty() && !parseWake(chosen.wake, settings.battery)) {
-        rejectOption("--wake", chosen.wake, "\"voltage\" or such as \"every 30min\"");
-    }
-    settings.battery.electric = settings.battery.electric || chosen.electric;
-    settings.fast = settings.fast || chosen.fast;
-    return settings;
+    options.onPage = [forPage = chosen.page](PageLink const& page) { tellPage(page, forPage); };
+    options.onReload = [](std::string const& text) { tell(text + "\n"); };
+    return options;
 }
 
 constexpr std::chrono::milliseconds carPatience{700}; // with the car, before the outputs are ended without it
 
-// A run, and what signals do to it.
-class WatchCommand
+// What signals do to a watch.
+class WatchSignals
 {
 public:
-    WatchCommand(GlobalOptions const& global, WatchOptions const& chosen)
-        : m_global(global), m_chosen(chosen), m_settings(settingsOf(global, chosen))
+    // reloads: a hang-up has the settings read again.
+    WatchSignals(LongWatch& watch, bool reloads)
     {
-        Interrupt::instance().setHandler([this] {
-            end();
-            m_lastResort.arm(carPatience, [this] { giveUp(); });
+        Interrupt::instance().setHandler([this, &watch] {
+            watch.end();
+            m_lastResort.arm(carPatience, [&watch] { giveUp(watch); });
         });
-        // The page ends with its terminal; there is no file to read again.
-        if (!m_chosen.page || !m_chosen.config.empty()) {
-            Interrupt::instance().setHangUpHandler([this] {
-                m_reload = true;
-                end();
-            });
+        if (reloads) {
+            Interrupt::instance().setHangUpHandler([&watch] { watch.reload(); });
         }
     }
-    ~WatchCommand()
+    ~WatchSignals()
     {
         Interrupt::instance().setHandler(nullptr);
         Interrupt::instance().setHangUpHandler(nullptr);
     }
-    WatchCommand(WatchCommand const&) = delete;
-    WatchCommand& operator=(WatchCommand const&) = delete;
-
-    ExitCode run()
-    {
-        while (!Interrupt::instance().raised()) {
-            runOnce();
-            if (m_reload.exchange(false)) {
-                reload();
-            }
-        }
-        m_notify.tell("STOPPING=1");
-        return ExitCode::Done;
-    }
+    WatchSignals(WatchSignals const&) = delete;
+    WatchSignals& operator=(WatchSignals const&) = delete;
 
 private:
-    void runOnce()
-    {
-        auto run = std::make_unique<WatchRun>(m_global, m_settings, m_notify, m_chosen.page);
-        WatchRun& now = *run;
-        {
-            std::lock_guard const lock(m_mutex);
-            m_run = std::move(run);
-        }
-        try {
-            if (!Interrupt::instance().raised() && !m_reload) {
-                now.run();
-            }
-            now.finish();
-        } catch (...) {
-            now.finish();
-            forget();
-            throw;
-        }
-        forget();
-    }
-
-    void forget()
-    {
-        std::lock_guard const lock(m_mutex);
-        m_run.reset();
-    }
-
-    void end()
-    {
-        std::lock_guard const lock(m_mutex);
-        if (m_run != nullptr) {
-            m_run->end();
-        }
-    }
-
     // What hangs in the operating system, such as the way to an adapter that is out of reach, hears no signal.
-    void giveUp()
+    static void giveUp(LongWatch& watch)
     {
-        std::lock_guard const lock(m_mutex);
-        if (m_run == nullptr || m_run->endOutputs()) {
-            m_notify.tell("STOPPING=1");
+        if (watch.abandon()) {
             ::_exit(static_cast<int>(ExitCode::Done));
         }
     }
 
-    // Settings that make no sense leave the old ones in force.
-    void reload()
-    {
-        m_notify.tell("RELOADING=1");
-        try {
-            m_settings = settingsOf(m_global, m_chosen);
-            tell("The settings were read again\n");
-        } catch (Error const& error) {
-            tell(std::string("The settings stay as they were: ") + error.what() + "\n");
-        }
-    }
-
-    GlobalOptions const m_global;
-    WatchOptions const m_chosen;
-    WatchSettings m_settings;
-    ServiceNotify m_notify;
-    std::atomic<bool> m_reload{false};
-    std::mutex m_mutex;
-    std::unique_ptr<WatchRun> m_run; // protected by m_mutex
     LastResort m_lastResort;
 };
 
@@ -189,12 +119,15 @@ private:
 
 ExitCode runWatch(GlobalOptions const& global, WatchOptions const& chosen)
 {
+    LongWatch watch(optionsOf(global, chosen));
     if (chosen.checkConfig) {
-        settingsOf(global, chosen);
         tell("The settings make sense\n");
         return ExitCode::Done;
     }
-    return WatchCommand(global, chosen).run();
+    // A page ends with its terminal, where there is no file to read again.
+    WatchSignals const signals(watch, !chosen.page || !chosen.config.empty());
+    watch.run();
+    return ExitCode::Done;
 }
 
 void addWatchCommand(CommandLine& commandLine)

@@ -1,15 +1,15 @@
 #include "program/live/liverun.h"
 
-#include "libvelmora/read/sensorlimits.h"
-#include "libvelmora/session/settingsstore.h"
 #include "libvelmora/uds/vehiclevin.h"
 #include "libvelmora/vehicle/vehiclekey.h"
 #include "program/terminal/output.h"
 #include "program/view/live/livelines.h"
 #include "program/view/style.h"
+#include "program/view/timetext.h"
 #include "program/view/unitpairs.h"
 
 #include <velmora/error.h>
+#include <velmora/limits.h>
 
 namespace velmora::cli {
 
@@ -23,9 +23,9 @@ constexpr char const* fastWarning =
     "Asking without the pause that spares the vehicle; too much traffic has upset control modules";
 
 // Kept in metric units, whatever is shown.
-SensorLimit limitOfRow(SettingsStore& store, LiveRow const& row)
+SensorLimit limitOfRow(SensorLimits const& limits, LiveRow const& row)
 {
-    return converted(limitOf(store, keyOf(row)), row.metricUnit, row.unit);
+    return converted(limits.of(keyOf(row)), row.metricUnit, row.unit);
 }
 
 } // namespace
@@ -87,8 +87,8 @@ std::string const& LiveRun::vehicle()
 void LiveRun::select()
 {
     m_table.select(m_choice->parameters(), m_session.units());
-    SettingsStore store(m_session.settingsFile());
-    m_table.setLimits([&store](LiveRow const& row) { return limitOfRow(store, row); });
+    SensorLimits const limits(m_session.settingsFile().string());
+    m_table.setLimits([&limits](LiveRow const& row) { return limitOfRow(limits, row); });
     if (m_panel != nullptr) {
         m_panel->refresh();
     }
@@ -209,11 +209,13 @@ void LiveRun::take(PollResult const& result)
         return;
     }
     m_table.update(result.id, result.values, now, result.module);
-    if (m_record != nullptr) {
-        m_record->take(result);
-    }
-    if (m_performance != nullptr) {
-        m_performance->take(result);
+    for (Reading const& reading : result.readings) {
+        if (m_record != nullptr) {
+            m_record->take(reading);
+        }
+        if (m_performance != nullptr) {
+            m_performance->take(reading);
+        }
     }
     if (m_csv != nullptr && !m_csv->update(m_table, now)) {
         m_readerGone = true;

@@ -2,9 +2,9 @@
 #include "program/live/liverun.h"
 #include "program/live/userfiles.h"
 #include "program/terminal/output.h"
-#include "program/view/live/livelines.h"
 #include "program/view/live/livescreen.h"
 #include "program/view/ratetext.h"
+#include "program/view/timetext.h"
 
 #include <obd/ivelmorasettings.h>
 #include <velmora/error.h>

@@ -1,8 +1,8 @@
 #pragma once
 
-#include "libvelmora/performance/performancemeter.h"
-#include "libvelmora/performance/powermodel.h"
 #include "program/view/framestyle.h"
+
+#include <velmora/performance.h>
 
 #include <memory>
 #include <string>
@@ -16,16 +16,16 @@ public:
     // module: whose readings count. settings must outlive it.
     PerformancePage(std::shared_ptr<obd::IEcu> module, obd::IVelmoraSettings const& settings);
 
-    void take(PollResult const& result);
+    void take(Reading const& reading) { m_timer.take(reading); }
     std::string draw(std::string const& note, FrameStyle const& style) const;
     // Writes the run to a file of the user's, and tells which.
     std::string save() const;
 
 private:
-    std::shared_ptr<obd::IEcu> const m_module;
+    bool isImperial() const;
+
     obd::IVelmoraSettings const& m_settings;
-    PowerModel m_model;
-    PerformanceMeter m_meter;
+    PerformanceTimer m_timer;
 };
 
 } // namespace velmora::cli

@@ -1,7 +1,8 @@
 #pragma once
 
-#include "libvelmora/replay/recording.h"
 #include "program/globaloptions.h"
+
+#include <velmora/recording.h>
 
 #include <optional>
 #include <string>

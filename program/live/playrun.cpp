@@ -1,9 +1,6 @@
 #include "program/live/playrun.h"
 
 #include "common/text/text.h"
-#include "libvelmora/output/valuetext.h"
-#include "libvelmora/read/sensorlimits.h"
-#include "libvelmora/session/settingsstore.h"
 #include "program/live/livepanel.h"
 #include "program/terminal/interrupt.h"
 #include "program/terminal/output.h"
@@ -11,8 +8,10 @@
 #include "program/view/live/livelines.h"
 #include "program/view/live/timebar.h"
 #include "program/view/style.h"
+#include "program/view/timetext.h"
 
 #include <velmora/error.h>
+#include <velmora/limits.h>
 
 #include <fmt/format.h>
 
@@ -70,12 +69,11 @@ void PlayRun::choose(std::vector<std::string> const& words)
 // Those of units that are not the sensor's own metric one can't be told here, so limits count for metric recordings.
 void PlayRun::applyLimits()
 {
-    SettingsStore store(m_options.settingsFile.empty() ? SettingsStore::defaultFile()
-                                                       : std::filesystem::path(m_options.settingsFile));
-    m_table.table().setLimits([&store](LiveRow const& row) {
+    SensorLimits const limits(m_options.settingsFile);
+    m_table.table().setLimits([&limits](LiveRow const& row) {
         bool const imperial = row.unit == "mph" || row.unit == "°F" || row.unit == "psi" || row.unit == "mi" ||
                               row.unit == "hp" || row.unit == "lb/min" || row.unit.starts_with("in");
-        return imperial ? SensorLimit() : limitOf(store, keyOf(row));
+        return imperial ? SensorLimit() : limits.of(keyOf(row));
     });
 }
 
@@ -134,7 +132,7 @@ void PlayRun::jump(std::int64_t to)
 
 std::string PlayRun::clockText(std::int64_t time) const
 {
-    return m_recording.dated ? utcTime(fromMillis(time)) : std::string();
+    return m_recording.dated ? isoTimeOf(time) : std::string();
 }
 
 std::string PlayRun::title() const

@@ -1,9 +1,10 @@
 #pragma once
 
-#include "libvelmora/replay/player.h"
 #include "program/globaloptions.h"
 #include "program/live/ilivehost.h"
 #include "program/live/playtable.h"
+
+#include <velmora/recording.h>
 
 #include <filesystem>
 #include <string>

@@ -1,7 +1,8 @@
 #pragma once
 
-#include "libvelmora/replay/recording.h"
 #include "program/view/live/livetable.h"
+
+#include <velmora/recording.h>
 
 #include <cstddef>
 #include <vector>

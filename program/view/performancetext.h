@@ -1,7 +1,8 @@
 #pragma once
 
-#include "libvelmora/performance/performancemeter.h"
 #include "program/view/framestyle.h"
+
+#include <velmora/performance.h>
 
 #include <string>
 
@@ -10,10 +11,9 @@ namespace velmora::cli {
 // What a timed run has come to.
 struct PerformanceView
 {
-    PerformanceMeter const& meter;
+    PerformanceRun run;
     bool imperial = false;
-    int kilograms = 0; // that power is reckoned with
-    std::string note;  // in the place of the keys
+    std::string note; // in the place of the keys
 };
 
 // The speed in big digits, the times of the goals with their errors, and power and torque by engine speed.

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "libvelmora/output/record.h"
+#include <velmora/trips.h>
 
 #include <string>
 #include <vector>
@@ -10,7 +10,5 @@ namespace velmora::cli {
 // A line a trip, then the totals of trips by day and by month. Days are those of the local zone at the begin.
 std::string tripsText(std::vector<Trip> const& trips);
 std::string tripsCsv(std::vector<Trip> const& trips);
-// {"trips": [...], "days": [...], "months": [...]}.
-std::string tripsJson(std::vector<Trip> const& trips);
 
 } // namespace velmora::cli

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "libvelmora/read/sensorlimits.h"
+#include <velmora/limits.h>
 
 #include <optional>
 #include <string>

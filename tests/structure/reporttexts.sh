@@ -11,8 +11,7 @@ files=(libvelmora/report/finding/{findings,findingparts,inspection}*.cpp
     libvelmora/report/document/{module,reportdocument,summary,finding,html,markdown,limitbar}*.cpp
     libvelmora/report/{vinreport,troublecode,oxygenreport}.cpp
     libvelmora/history/*changes.cpp)
-plain=(libvelmora/report/plain/{code,counter,findings,freeze,info,monitor,readiness,routine,vehiclereport,vin}text.cpp
-    program/view/historytext.cpp)
+plain=(libvelmora/report/plain/{code,counter,findings,freeze,history,info,monitor,readiness,routine,vehiclereport,vin}text.cpp)
 [[ ${#files[@]} -gt 10 ]] || { echo "the files are not where they were"; exit 1; }
 perl -ne '
     next if /^\s*#\s*include|^\s*\/\//;

@@ -1,9 +1,8 @@
-#include "libvelmora/output/database/triplist.h"
-
 #include "libvelmora/output/valuetext.h"
 #include "libvelmora/record/checkedfile.h"
 
 #include <velmora/error.h>
+#include <velmora/trips.h>
 
 #ifdef VELMORA_OUTPUT_SQLITE
 #include "libvelmora/output/database/database.h"

@@ -4,6 +4,8 @@
 #include "libvelmora/output/mqtt/brokerlink.h"
 #include "libvelmora/output/mqtt/homestate.h"
 #include "libvelmora/output/mqtt/spoolsender.h"
+#include "libvelmora/output/outputcontext.h"
+#include "libvelmora/output/outputrunner.h"
 
 #include <chrono>
 #include <memory>

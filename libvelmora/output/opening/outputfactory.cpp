@@ -9,6 +9,7 @@
 #include "libvelmora/output/prometheusoutput.h"
 
 #include <velmora/error.h>
+#include <velmora/longwatch.h>
 
 namespace velmora {
 

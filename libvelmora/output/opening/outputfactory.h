@@ -10,9 +10,6 @@
 
 namespace velmora {
 
-// The kinds that this build has, as they are written in an address.
-std::vector<std::string> builtInOutputs();
-
 // Throws Error if the address makes no sense, what stands there is no plain file, or it names a kind that was left out
 // of this build.
 std::unique_ptr<IOutput> makeOutput(OutputAddress const& address, OutputContext const& context);

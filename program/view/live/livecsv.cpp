@@ -1,6 +1,7 @@
 #include "program/view/live/livecsv.h"
 
-#include "program/view/live/livelines.h"
+#include "program/view/csvfield.h"
+#include "program/view/timetext.h"
 
 #include <velmora/error.h>
 
@@ -17,18 +18,6 @@ namespace velmora::cli {
 namespace {
 
 constexpr std::chrono::seconds longestWait{1};
-
-std::string quoted(std::string const& text)
-{
-    if (text.find_first_of(",\"\r\n") == std::string::npos) {
-        return text;
-    }
-    std::string result = "\"";
-    for (char const each : text) {
-        result += each == '"' ? std::string("\"\"") : std::string(1, each);
-    }
-    return result + "\"";
-}
 
 [[noreturn]] void failOpen(std::string const& file, int why)
 {
@@ -62,7 +51,7 @@ std::string toCsvHeader(std::vector<LiveRow> const& rows)
 {
     std::string text = "time";
     for (LiveRow const& row : rows) {
-        text += "," + quoted(nameWithUnit(row));
+        text += "," + csvField(nameWithUnit(row));
     }
     return text + "\n";
 }
@@ -71,7 +60,7 @@ std::string toCsvRow(std::vector<LiveRow> const& rows, std::string const& time)
 {
     std::string text = time;
     for (LiveRow const& row : rows) {
-        text += "," + quoted(orDash(row.value));
+        text += "," + csvField(orDash(row.value));
     }
     return text + "\n";
 }

@@ -6,8 +6,6 @@
 
 #include <fmt/format.h>
 
-#include <ctime>
-
 namespace velmora::cli {
 
 namespace {
@@ -25,16 +23,6 @@ Json toJson(std::string const& text, bool numeric)
 }
 
 } // namespace
-
-std::string isoTime(std::chrono::system_clock::time_point time)
-{
-    auto const ms = std::chrono::duration_cast<std::chrono::milliseconds>(time.time_since_epoch()).count();
-    auto const seconds = static_cast<std::time_t>(ms / 1000);
-    std::tm fields{};
-    ::gmtime_r(&seconds, &fields);
-    return fmt::format("{:04}-{:02}-{:02}T{:02}:{:02}:{:02}.{:03}Z", fields.tm_year + 1900, fields.tm_mon + 1,
-                       fields.tm_mday, fields.tm_hour, fields.tm_min, fields.tm_sec, ms % 1000);
-}
 
 std::string toLine(LiveRow const& row)
 {

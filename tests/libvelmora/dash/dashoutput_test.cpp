@@ -7,10 +7,16 @@
 #include "tests/support/memorysettings.h"
 #include "tests/support/temporaryfolder.h"
 
+#include <velmora/error.h>
+#include <velmora/recording.h>
+
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <fstream>
+#include <future>
 #include <sstream>
+#include <thread>
 
 namespace {
 
@@ -363,6 +369,26 @@ TEST(DashPlay, TellsARecordingAsIfItCameNow)
     EXPECT_EQ(step(0.0), std::vector<std::string>{"codes"}) << "there is no vehicle to ask";
     EXPECT_TRUE(velmora::PlayDesk::parse({{"speed", "fast"}}).is_null());
     EXPECT_THAT(Page().post("/ask", R"({"topic":"play","paused":true})"), StartsWith("HTTP/1.1 400"));
+}
+
+TEST(PagePlay, ServesARecordingUntilItsEnd)
+{
+    testsupport::TemporaryFolder const folder;
+    std::ofstream(folder.file("drive.csv")) << "time,7E8 RPM (rpm)\n2024-03-07T09:05:00.000Z,800\n";
+    std::promise<std::string> served;
+    velmora::PagePlay play(
+        velmora::readRecording(folder.file("drive.csv")), "dash:127.0.0.1:0", 1.0, folder.file("settings.toml"),
+        [&served](std::string const& link, std::string const& /*remark*/) { served.set_value(link); });
+    std::thread runner([&play] { play.run(); });
+    std::string const link = served.get_future().get();
+    EXPECT_THAT(link, StartsWith("http://127.0.0.1:"));
+    auto const port = static_cast<unsigned short>(std::stoi(link.substr(link.rfind(':') + 1)));
+    HttpClient stream(port);
+    stream.send("GET /events HTTP/1.1\r\nHost: localhost\r\n\r\n");
+    EXPECT_EQ(nextEvent(stream, "beat")["state"], "playing");
+    play.end();
+    runner.join();
+    EXPECT_THROW(velmora::PagePlay({}, "csv:" + folder.file("none.csv"), 1.0, "", {}), velmora::Error);
 }
 
 TEST(DashOutput, AStreamThatBrokeBringsWhatWasMissed)

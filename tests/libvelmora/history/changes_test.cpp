@@ -1,5 +1,6 @@
-#include "libvelmora/history/changes.h"
 #include "tests/libvelmora/report/carbuilder.h"
+
+#include <velmora/history.h>
 
 #include <gtest/gtest.h>
 
@@ -17,7 +18,7 @@ std::vector<std::string> changed(ModuleReport const& older, ModuleReport const& 
     std::vector<std::string> list;
     std::vector<Change> const changes = changesBetween(vehicleOf({older}), vehicleOf({newer}));
     for (Change const& each : changes) {
-        list.push_back(std::string(each.kind) + " " + weights[static_cast<int>(each.weight)]);
+        list.push_back(each.kind + " " + weights[static_cast<int>(each.weight)]);
     }
     bool const worse =
         std::any_of(list.begin(), list.end(), [](std::string const& each) { return each.ends_with(" worse"); });
@@ -131,8 +132,8 @@ TEST(Changes, OfCountersSoftwareNumbersAndModules)
     ModuleReport const gearbox = soundModule(0x7E9);
     std::vector<Change> const more = changesBetween(vehicleOf({older}), vehicleOf({older, gearbox}));
     ASSERT_EQ(more.size(), 1U);
-    EXPECT_STREQ(more[0].kind, "module-new");
-    EXPECT_STREQ(changesBetween(vehicleOf({older, gearbox}), vehicleOf({older})).at(0).kind, "module-gone");
+    EXPECT_EQ(more[0].kind, "module-new");
+    EXPECT_EQ(changesBetween(vehicleOf({older, gearbox}), vehicleOf({older})).at(0).kind, "module-gone");
 }
 
 } // namespace

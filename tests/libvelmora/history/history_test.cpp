@@ -1,9 +1,10 @@
-#include "libvelmora/history/history.h"
 #include "libvelmora/history/scanjson.h"
+#include "libvelmora/output/database/database.h"
 #include "tests/libvelmora/report/carbuilder.h"
 #include "tests/support/temporaryfolder.h"
 
 #include <velmora/error.h>
+#include <velmora/history.h>
 
 #include <gtest/gtest.h>
 
@@ -162,6 +163,27 @@ TEST(KeptScanLine, GoesByTheFirstRealVinElseByTheName)
     EXPECT_EQ(makeScan(vehicleOf({first}), "golf", firstTime, "1").vehicle, "golf");
     EXPECT_THROW(makeScan(vehicleOf({first}), "", firstTime, "1"), Error);
     EXPECT_EQ(timeText(firstTime), "2026-05-01T10:00:00.123Z");
+}
+
+TEST(KeptScan, TellsLampAndCodesForLists)
+{
+    ModuleReport module = soundModule();
+    module.codes.lamp.reset();
+    EXPECT_EQ(factsOf(makeScan(vehicleOf({module}), "golf", firstTime, "1")).lamp, std::nullopt);
+    module.codes.lists[0] = readCodes(CodeKind::Confirmed, {"P0420", "P0300"});
+    module.codes.lists[1] = readCodes(CodeKind::Pending, {"P0171"});
+    module.codes.lists[2] = readCodes(CodeKind::Permanent, {"P0420"});
+    ModuleReport second = soundModule(0x7E9);
+    second.codes.lamp = true;
+    KeptScan const scan = makeScan(vehicleOf({module, second}), "golf", firstTime, "1");
+    ScanFacts const facts = factsOf(scan);
+    EXPECT_EQ(facts.lamp, true);
+    EXPECT_EQ(facts.codes, (std::vector<std::string>{"P0420", "P0300"}));
+    EXPECT_EQ(facts.modules, 2U);
+    Json const json = Json::parse(toJson(scan));
+    EXPECT_EQ(json["lamp"], true);
+    EXPECT_EQ(json["codes"], Json({"P0420", "P0300"}));
+    EXPECT_FALSE(json.contains("report"));
 }
 
 } // namespace

@@ -1,5 +1,6 @@
 #include "libvelmora/performance/performancejson.h"
 #include "libvelmora/performance/performancemeter.h"
+#include "libvelmora/performance/sprint.h"
 
 #include <gtest/gtest.h>
 
@@ -19,7 +20,7 @@ void drive(PerformanceMeter& meter, double start, double gain, double end, doubl
 
 std::optional<SprintTime> sprint(PerformanceMeter const& meter, std::size_t goal, bool imperial = false)
 {
-    return timeOf(sprintGoals(imperial)[goal], meter.run(), meter.interval());
+    return timeOf(sprintGoals(imperial)[goal], meter.points(), meter.interval());
 }
 
 TEST(Sprint, TimesAreTrueWithinTheErrorThatIsTold)
@@ -70,9 +71,9 @@ TEST(Sprint, ASteadySpeedIsNoSlowRise)
     for (int i = 2; i <= 100; ++i) {
         meter.addSpeed(i * 0.1, 36.0);
     }
-    EXPECT_NEAR(distanceOf(meter.run()), 99.5, 0.1) << "up to the last reading";
+    EXPECT_NEAR(distanceOf(meter.points()), 99.5, 0.1) << "up to the last reading";
     meter.addSpeed(10.1, 37.0);
-    EXPECT_NEAR(distanceOf(meter.run()), 100.5, 0.1);
+    EXPECT_NEAR(distanceOf(meter.points()), 100.5, 0.1);
 }
 
 TEST(Sprint, NothingIsTimedThatDidNotHappen)
@@ -81,7 +82,7 @@ TEST(Sprint, NothingIsTimedThatDidNotHappen)
     for (int i = 0; i < 200; ++i) {
         moving.addSpeed(i * 0.1, 50.0 + i);
     }
-    EXPECT_EQ(moving.state(), PerformanceMeter::State::Moving);
+    EXPECT_EQ(moving.state(), RunState::Moving);
     EXPECT_FALSE(sprint(moving, 0)) << "nobody saw it start";
     PerformanceMeter slow;
     drive(slow, 1.0, 10.0, 9.0, 0.1);
@@ -93,9 +94,9 @@ TEST(Sprint, NothingIsTimedThatDidNotHappen)
 TEST(PerformanceMeter, EachStartIsARunOfItsOwn)
 {
     PerformanceMeter meter;
-    EXPECT_EQ(meter.state(), PerformanceMeter::State::Moving);
+    EXPECT_EQ(meter.state(), RunState::Moving);
     drive(meter, 2.0, 10.0, 11.0, 0.1);
-    EXPECT_EQ(meter.state(), PerformanceMeter::State::Running);
+    EXPECT_EQ(meter.state(), RunState::Running);
     meter.addPower(2510.0, 40.0, 150.0);
     meter.addPower(2600.0, 50.0, 180.0);
     meter.addPower(2700.0, 45.0, 160.0);
@@ -105,11 +106,11 @@ TEST(PerformanceMeter, EachStartIsARunOfItsOwn)
     EXPECT_EQ(meter.powers()[0].kilowatt, 50.0);
     EXPECT_EQ(meter.powers()[0].newtonMetre, 180.0);
     meter.addSpeed(14.0, 0.0);
-    EXPECT_EQ(meter.state(), PerformanceMeter::State::Stopped);
+    EXPECT_EQ(meter.state(), RunState::Stopped);
     EXPECT_TRUE(sprint(meter, 0)) << "the time stays";
     meter.addSpeed(15.0, 0.0);
     meter.addSpeed(15.1, 3.0);
-    EXPECT_EQ(meter.state(), PerformanceMeter::State::Running);
+    EXPECT_EQ(meter.state(), RunState::Running);
     EXPECT_FALSE(sprint(meter, 0));
     EXPECT_TRUE(meter.powers().empty());
 }
@@ -119,7 +120,7 @@ TEST(PerformanceMeter, IsExportedWhole)
     PerformanceMeter meter;
     drive(meter, 1.0, 20.0, 6.0, 0.05);
     meter.addPower(3000.0, 61.26, 195.0);
-    Json const json = performanceJson(meter, sprintGoals(false), 1500);
+    Json const json = performanceJson(meter.run(1500), sprintGoals(false));
     EXPECT_EQ(json["weight_kg"], 1500);
     EXPECT_EQ(json["goals"][0]["name"], "0 to 100 km/h");
     EXPECT_NEAR(json["goals"][0]["seconds"].get<double>(), 5.0, 0.11);

@@ -74,4 +74,40 @@ TEST(PowerModelReadings, AreInTheirOwnUnitsWhateverIsShown)
     EXPECT_EQ(velmora::engineSpeedIn(reading), 1726.0);
 }
 
+TEST(PerformanceTimer, TakesTheReadingsOfItsModule)
+{
+    support::FakeClock clock;
+    auto ecu = std::make_shared<support::FakeEcu>(0x7E8);
+    ecu->setSupported(obd::ObdMode::CurrentData, {0x0C, 0x0D});
+    obd::VelmoraSettings const settings{std::make_shared<support::MemorySettings>()};
+    velmora::PerformanceTimer timer(ecu, settings);
+    velmora::PerformanceTimer simple;
+    velmora::Reading reading;
+    auto const tell = [&](unsigned int module, std::vector<unsigned char> const& raw) {
+        clock.advance(50);
+        reading.time += std::chrono::milliseconds(50);
+        reading.module = module;
+        reading.raw = raw;
+        timer.take(reading);
+        simple.take(reading);
+    };
+    for (unsigned char kmh = 0; kmh <= 110; ++kmh) {
+        tell(0x7E8, {0x41, 0x0C, 0x2E, 0xE0});
+        tell(0x7E8, {0x41, 0x0D, kmh});
+    }
+    tell(0x7E9, {0x41, 0x0D, 0});
+    velmora::PerformanceRun const run = timer.run();
+    EXPECT_EQ(run.state, velmora::RunState::Running) << "another module's speed is none of this run";
+    EXPECT_EQ(run.kilograms, 1500);
+    EXPECT_FALSE(run.powers.empty());
+    std::optional<velmora::SprintTime> const time =
+        velmora::timeOf(velmora::sprintGoals(false)[0], run.speeds, run.interval);
+    ASSERT_TRUE(time);
+    EXPECT_NEAR(time->seconds, 10.0, 0.2);
+    velmora::PerformanceRun const plain = simple.run();
+    EXPECT_EQ(plain.state, velmora::RunState::Stopped) << "without a module each speed counts";
+    EXPECT_TRUE(plain.powers.empty());
+    EXPECT_EQ(plain.kilograms, 0);
+}
+
 } // namespace

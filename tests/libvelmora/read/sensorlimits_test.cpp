@@ -49,6 +49,12 @@ TEST(SensorLimits, AreKeptInTheSettings)
     EXPECT_EQ(limitedSensors(again), (std::vector<std::string>{"MAF", "RPM", "SPEED"}));
     setLimit(again, "RPM", {});
     EXPECT_EQ(limitOf(again, "RPM"), SensorLimit());
+    SensorLimits limits(file);
+    EXPECT_EQ(limits.of("RPM"), (SensorLimit{800.0, 6000.0})) << "what was not brought to the disk";
+    limits.set("RPM", {});
+    limits.set("ECT", parseLimit("110"));
+    EXPECT_EQ(SensorLimits(file).of("RPM"), SensorLimit());
+    EXPECT_EQ(SensorLimits(file).sensors(), (std::vector<std::string>{"ECT", "MAF", "SPEED"}));
     std::filesystem::remove(file);
 }
 

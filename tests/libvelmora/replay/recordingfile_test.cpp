@@ -1,5 +1,4 @@
 #include "libvelmora/output/database/sqliteoutput.h"
-#include "libvelmora/replay/player.h"
 #include "libvelmora/replay/recordingfile.h"
 
 #include <velmora/error.h>

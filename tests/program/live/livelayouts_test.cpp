@@ -70,11 +70,9 @@ TEST_F(LiveFiles, ARecordingIsADatabaseOfTheWatch)
     reading.name = "Engine RPM";
     reading.value = 1726.0;
     reading.unit = "rpm";
-    PollResult result;
-    result.readings = {reading};
     {
         LiveRecord record(folder / "live.db", "vehicle-1");
-        record.take(result);
+        record.take(reading);
         EXPECT_EQ(record.trouble(), "");
     }
     Database database((folder / "live.db").string());

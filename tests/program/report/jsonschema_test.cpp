@@ -12,6 +12,7 @@
 #include "libvelmora/report/routinesreport.h"
 #include "libvelmora/report/vehiclereport.h"
 #include "program/view/live/livelines.h"
+#include "program/view/timetext.h"
 #include "program/view/trafficlog.h"
 #include "tests/support/jsonschema.h"
 

@@ -1,5 +1,6 @@
 #include "program/view/live/livecsv.h"
 #include "program/view/live/livelines.h"
+#include "program/view/timetext.h"
 #include "tests/program/view/liveparameter.h"
 #include "tests/program/view/liverows.h"
 

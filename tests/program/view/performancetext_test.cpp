@@ -12,23 +12,25 @@ using namespace velmora;
 using namespace velmora::cli;
 using testing::HasSubstr;
 
-PerformanceMeter fullRun()
+PerformanceRun fullRun()
 {
-    PerformanceMeter meter;
-    meter.addSpeed(0.0, 0.0);
-    for (int kmh = 1; kmh <= 130; ++kmh) {
-        meter.addSpeed(kmh * 0.1, kmh);
+    PerformanceRun run;
+    run.state = RunState::Running;
+    run.interval = 0.1;
+    run.kilograms = 1500;
+    for (int kmh = 0; kmh <= 130; ++kmh) {
+        run.speeds.push_back({kmh * 0.1, static_cast<double>(kmh)});
     }
     for (int step = 0; step < 30; ++step) {
-        meter.addPower(1000.0 + step * 250.0, 10.0 + step, 100.0);
+        run.powers.push_back({1125.0 + step * 250.0, 10.0 + step, 100.0});
     }
-    return meter;
+    return run;
 }
 
 TEST(PerformanceText, TellsTimesErrorsAndTheCurve)
 {
-    PerformanceMeter const meter = fullRun();
-    std::string const text = drawPerformance({meter, false, 1500, ""}, {});
+    PerformanceRun const run = fullRun();
+    std::string const text = drawPerformance({run, false, ""}, {});
     EXPECT_THAT(text, HasSubstr("Performance: running\n"));
     EXPECT_THAT(text, HasSubstr("  0 to 100 km/h     10.00 s +- 0.20 s\n"));
     EXPECT_THAT(text, HasSubstr("  80 to 120 km/h     4.00 s +- 0.20 s\n"));
@@ -36,26 +38,26 @@ TEST(PerformanceText, TellsTimesErrorsAndTheCurve)
     EXPECT_THAT(text, HasSubstr("whole km/h each 100 ms"));
     EXPECT_THAT(text, HasSubstr(" 8375 rpm    39 kW   100 Nm ━")) << "the highest engine speeds have the room";
     EXPECT_THAT(text, HasSubstr("for 1500 kg"));
-    EXPECT_THAT(drawPerformance({meter, true, 1500, ""}, {}), HasSubstr("  0 to 60 mph        9.66 s"));
-    EXPECT_THAT(drawPerformance({meter, true, 1500, ""}, {}), HasSubstr("    52 hp"));
+    EXPECT_THAT(drawPerformance({run, true, ""}, {}), HasSubstr("  0 to 60 mph        9.66 s"));
+    EXPECT_THAT(drawPerformance({run, true, ""}, {}), HasSubstr("    52 hp"));
 }
 
 TEST(PerformanceText, FitsTheScreen)
 {
-    PerformanceMeter const meter = fullRun();
+    PerformanceRun const run = fullRun();
     for (auto const& [columns, rows] : {std::pair{80U, 24U}, std::pair{40U, 20U}, std::pair{200U, 60U}}) {
         FrameStyle style;
         style.columns = columns;
         style.rows = rows;
         style.ascii = true;
-        std::istringstream lines(drawPerformance({meter, false, 1500, "Saved"}, style));
+        std::istringstream lines(drawPerformance({run, false, "Saved"}, style));
         std::size_t count = 0;
         for (std::string line; std::getline(lines, line); ++count) {
             EXPECT_LE(displayWidth(line), columns);
         }
         EXPECT_LE(count, rows);
     }
-    EXPECT_THAT(drawPerformance({PerformanceMeter(), false, 1500, ""}, {}), HasSubstr("stand still to be ready"));
+    EXPECT_THAT(drawPerformance({PerformanceRun(), false, ""}, {}), HasSubstr("stand still to be ready"));
 }
 
 } // namespace

@@ -51,7 +51,7 @@ protected:
 
 TEST_F(TripsText, TotalsAreByTheDayAndMonthInWhichATripBeganHere)
 {
-    nlohmann::json const document = nlohmann::json::parse(velmora::cli::tripsJson(m_trips));
+    nlohmann::json const document = nlohmann::json::parse(velmora::toJson(m_trips));
     EXPECT_EQ(document["trips"].size(), 4U);
     EXPECT_EQ(document["days"], nlohmann::json::parse(R"([
         {"period": "2026-03-31", "trips": 1, "distance_km": 10.0, "duration_s": 1800.0, "fuel_l": 1.0},

@@ -1,17 +1,11 @@
-#include "program/watch/watchpage.h"
+#include "libvelmora/longwatch/watchpage.h"
 
 #include "libvelmora/dash/dashclerk.h"
 #include "libvelmora/dash/dashoutput.h"
-#include "program/terminal/output.h"
-#include "program/terminal/terminal.h"
-#include "program/view/qrtext.h"
-
-#include <fmt/format.h>
 
 #include <algorithm>
-#include <unistd.h>
 
-namespace velmora::cli {
+namespace velmora {
 
 namespace {
 
@@ -28,24 +22,9 @@ struct WatchPage::Parts
 {
     std::string vehicle;
     bool forPage = false;
-    bool linkOnOutput = false; // standard output holds nothing else
+    bool outputIsFree = true;
+    std::function<void(PageLink const&)> onPage;
     std::shared_ptr<DashDesk> desk = std::make_shared<DashDesk>();
-
-    void tellLink(std::string const& link, std::string const& remark) const
-    {
-        if (linkOnOutput) {
-            fmt::print("{}\n", link);
-            flushOutput();
-        } else {
-            tell("The page: " + link + "\n");
-        }
-        if (!remark.empty()) {
-            tell(remark + "\n");
-        }
-        if (forPage) {
-            tell(qrForTerminal(link, STDERR_FILENO));
-        }
-    }
 };
 
 struct WatchPage::Service
@@ -53,14 +32,15 @@ struct WatchPage::Service
     DashClerk clerk;
 };
 
-WatchPage::WatchPage(std::vector<OutputAddress> const& outputs, std::string vehicle, bool forPage)
+WatchPage::WatchPage(std::vector<OutputAddress> const& outputs, std::string vehicle, LongWatchOptions const& options)
 {
     if (std::ranges::any_of(outputs, is)) {
         m_parts = std::make_shared<Parts>();
         m_parts->vehicle = std::move(vehicle);
-        m_parts->forPage = forPage;
-        m_parts->linkOnOutput =
-            forPage && std::ranges::none_of(outputs, [](OutputAddress const& each) { return each.target == "-"; });
+        m_parts->forPage = options.forPage;
+        m_parts->onPage = options.onPage;
+        m_parts->outputIsFree =
+            std::ranges::none_of(outputs, [](OutputAddress const& each) { return each.target == "-"; });
     }
 }
 
@@ -89,7 +69,9 @@ std::unique_ptr<IOutput> WatchPage::makeOutput(OutputAddress const& address, Hea
     context.token = processToken();
     context.mustListen = m_parts->forPage;
     context.onLink = [parts = m_parts](std::string const& link, std::string const& remark) {
-        parts->tellLink(link, remark);
+        if (parts->onPage) {
+            parts->onPage({link, remark, parts->outputIsFree});
+        }
     };
     return std::make_unique<DashOutput>(address, std::move(context));
 }
@@ -111,4 +93,4 @@ void WatchPage::serve(SessionCar& car, WatchEngine& engine, WatchEngine::Sink co
     }
 }
 
-} // namespace velmora::cli
+} // namespace velmora

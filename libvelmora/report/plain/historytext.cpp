@@ -1,20 +1,20 @@
-#include "program/view/historytext.h"
-
 #include "common/text/layout.h"
-#include "libvelmora/history/scanjson.h"
+#include "libvelmora/report/plain/reporttext.h"
 #include "libvelmora/report/texts/changetexts.h"
 #include "libvelmora/report/texts/plaintexts.h"
+
+#include <velmora/history.h>
 
 #include <fmt/format.h>
 
 #include <algorithm>
 #include <ctime>
 
-namespace velmora::cli {
+namespace velmora {
 
 namespace {
 
-std::string localTime(KeptScan const& scan)
+std::string scanTime(KeptScan const& scan)
 {
     std::time_t const seconds = std::chrono::system_clock::to_time_t(scan.time);
     std::tm fields{};
@@ -26,18 +26,16 @@ std::string localTime(KeptScan const& scan)
 
 std::vector<Cell> scanRow(KeptScan const& scan)
 {
-    Json const facts = toJsonValue(scan);
-    std::vector<std::string> const codes = facts["codes"];
-    Json const& lamp = facts["lamp"];
-    bool const on = lamp.is_boolean() && lamp.get<bool>();
+    ScanFacts const facts = factsOf(scan);
+    bool const on = facts.lamp.value_or(false);
     return {{std::to_string(scan.number), Mark::None, true},
-            {localTime(scan)},
-            {lamp.is_null() ? texts::plain::lampUnknown
-             : on           ? texts::plain::lampOn
-                            : texts::plain::lampOff,
+            {scanTime(scan)},
+            {!facts.lamp ? texts::plain::lampUnknown
+             : on        ? texts::plain::lampOn
+                         : texts::plain::lampOff,
              on ? Mark::Bad : Mark::None},
-            {codes.empty() ? texts::plain::noCodes : fmt::format("{}", fmt::join(codes, " ")),
-             codes.empty() ? Mark::None : Mark::Bad}};
+            {facts.codes.empty() ? texts::plain::noCodes : fmt::format("{}", fmt::join(facts.codes, " ")),
+             facts.codes.empty() ? Mark::None : Mark::Bad}};
 }
 
 Mark changeMark(ChangeWeight weight)
@@ -60,8 +58,9 @@ std::vector<Cell> changeRow(Change const& change)
 
 } // namespace
 
-std::string historyText(std::vector<KeptScan> const& scans, Style const& style)
+std::string toText(std::vector<KeptScan> const& scans, TextStyle const& chosen)
 {
+    Style const style = styleOf(chosen);
     if (scans.empty()) {
         return std::string(texts::plain::nothingKept) + "\n";
     }
@@ -84,12 +83,13 @@ std::string historyText(std::vector<KeptScan> const& scans, Style const& style)
     return text;
 }
 
-std::string diffText(KeptScan const& older, KeptScan const& newer, std::vector<Change> const& changes,
-                     Style const& style)
+std::string toText(KeptScan const& older, KeptScan const& newer, std::vector<Change> const& changes,
+                   TextStyle const& chosen)
 {
+    Style const style = styleOf(chosen);
     std::string const text = fmt::format(
-        "{}\n  {}\n  {}\n\n{}\n", newer.vehicle, fmt::format(texts::plain::scanOf, older.number, localTime(older)),
-        fmt::format(texts::plain::scanOf, newer.number, localTime(newer)), texts::change::title);
+        "{}\n  {}\n  {}\n\n{}\n", newer.vehicle, fmt::format(texts::plain::scanOf, older.number, scanTime(older)),
+        fmt::format(texts::plain::scanOf, newer.number, scanTime(newer)), texts::change::title);
     if (changes.empty()) {
         return text + "  " + style.paint(Mark::Good, texts::change::none) + "\n";
     }
@@ -100,4 +100,4 @@ std::string diffText(KeptScan const& older, KeptScan const& newer, std::vector<C
     return text + drawColumns(rows, "  ", style);
 }
 
-} // namespace velmora::cli
+} // namespace velmora

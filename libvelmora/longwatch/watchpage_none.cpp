@@ -1,8 +1,8 @@
-#include "program/watch/watchpage.h"
+#include "libvelmora/longwatch/watchpage.h"
 
 #include <velmora/error.h>
 
-namespace velmora::cli {
+namespace velmora {
 
 struct WatchPage::Parts
 {};
@@ -10,7 +10,9 @@ struct WatchPage::Parts
 struct WatchPage::Service
 {};
 
-WatchPage::WatchPage(std::vector<OutputAddress> const& /*outputs*/, std::string /*vehicle*/, bool /*forPage*/) {}
+WatchPage::WatchPage(std::vector<OutputAddress> const& /*outputs*/, std::string /*vehicle*/,
+                     LongWatchOptions const& /*options*/)
+{}
 
 WatchPage::~WatchPage() = default;
 
@@ -27,4 +29,4 @@ std::unique_ptr<IOutput> WatchPage::makeOutput(OutputAddress const& /*address*/,
 
 void WatchPage::serve(SessionCar& /*car*/, WatchEngine& /*engine*/, WatchEngine::Sink const& /*sink*/) {}
 
-} // namespace velmora::cli
+} // namespace velmora

@@ -1,24 +1,21 @@
 #pragma once
 
-#include "libvelmora/output/health.h"
+#include "libvelmora/longwatch/watchpage.h"
+#include "libvelmora/output/outputrunner.h"
 #include "libvelmora/watch/servicenotify.h"
-#include "libvelmora/watch/sessioncar.h"
-#include "libvelmora/watch/watchengine.h"
 #include "libvelmora/watch/watchsettings.h"
-#include "program/globaloptions.h"
-#include "program/watch/watchpage.h"
 
 #include <atomic>
 #include <mutex>
 
-namespace velmora::cli {
+namespace velmora {
 
 // One run of the watch with one set of settings: the car, the engine, and the outputs.
 class WatchRun
 {
 public:
-    // Opens the outputs. page: the page in the browser is what it is for. Throws Error for settings that make no sense.
-    WatchRun(GlobalOptions const& options, WatchSettings const& settings, ServiceNotify& notify, bool page = false);
+    // Opens the outputs. Throws Error for settings that make no sense. options and notify must outlive it.
+    WatchRun(LongWatchOptions const& options, WatchSettings const& settings, ServiceNotify& notify);
     ~WatchRun();
     WatchRun(WatchRun const&) = delete;
     WatchRun& operator=(WatchRun const&) = delete;
@@ -33,6 +30,8 @@ public:
     // The last part of it: flushes the outputs, and waits only for those that don't hang. Any thread, at most one that
     // does it: false for the others.
     bool endOutputs();
+    // Any thread.
+    Health health() const;
 
 private:
     struct HealthBoard
@@ -47,7 +46,7 @@ private:
     void takeHealth();
     void say(std::string const& text) const;
 
-    GlobalOptions const m_options;
+    LongWatchOptions const& m_options;
     ServiceNotify& m_notify;
     std::string const m_vehicle;
     WatchPage m_page;
@@ -61,4 +60,4 @@ private:
     bool m_finished = false;
 };
 
-} // namespace velmora::cli
+} // namespace velmora

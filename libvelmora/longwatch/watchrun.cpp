@@ -1,10 +1,10 @@
-#include "program/watch/watchrun.h"
+#include "libvelmora/longwatch/watchrun.h"
 
+#include "libvelmora/car/caroptions.h"
 #include "libvelmora/output/opening/outputfactory.h"
 #include "libvelmora/output/valuetext.h"
 #include "libvelmora/session/settingsstore.h"
 #include "libvelmora/watch/statefolder.h"
-#include "program/terminal/output.h"
 
 #include <velmora/error.h>
 
@@ -15,7 +15,7 @@
 #include <random>
 #include <utility>
 
-namespace velmora::cli {
+namespace velmora {
 
 namespace {
 
@@ -26,19 +26,16 @@ WatchTime timeNow()
     return {std::chrono::steady_clock::now(), std::chrono::system_clock::now()};
 }
 
-SessionCarOptions carOptions(GlobalOptions const& options, WatchSettings const& settings, std::string const& vehicle)
+SessionCarOptions watchedCar(CarOptions const& options, WatchSettings const& settings, std::string const& vehicle)
 {
     SessionCarOptions result;
+    result.session = sessionOptions(options);
     result.session.port = options.port.empty() ? settings.port : options.port;
-    result.session.baud = options.baud;
-    result.session.protocol = options.protocol;
     result.session.units = Units::Metric;
-    result.session.ecu = options.ecu;
-    result.session.reset = options.reset;
-    result.session.logFile = options.logFile;
-    result.session.traceFile = options.traceFile;
-    result.session.settingsFile = options.settingsFile;
-    result.session.signalFiles = options.signalFiles;
+    result.session.sleep = false;
+    result.session.forget = false;
+    result.session.onProgress = nullptr;
+    result.session.openPort = nullptr;
     result.session.signalFiles.insert(result.session.signalFiles.end(), settings.signals.begin(),
                                       settings.signals.end());
     if (result.session.settingsFile.empty() && runsAsService()) {
@@ -67,16 +64,9 @@ OutputLimits limitsOf(OutputAddress const& address)
     return limits;
 }
 
-void sayUnless(bool quiet, std::string const& text)
+std::filesystem::path settingsPath(CarOptions const& options)
 {
-    if (!quiet) {
-        tell(utcTime(std::chrono::system_clock::now()) + " " + text + "\n");
-    }
-}
-
-std::filesystem::path settingsPath(GlobalOptions const& options)
-{
-    std::string const named = carOptions(options, {}, {}).session.settingsFile;
+    std::string const named = watchedCar(options, {}, {}).session.settingsFile;
     return named.empty() ? SettingsStore::defaultFile() : std::filesystem::path(named);
 }
 
@@ -97,11 +87,11 @@ WatchRules rulesOf(WatchSettings const& settings, std::string const& vehicle)
 
 } // namespace
 
-WatchRun::WatchRun(GlobalOptions const& options, WatchSettings const& settings, ServiceNotify& notify, bool page)
-    : m_options(options), m_notify(notify), m_vehicle(vehicleName(settings)), m_page(settings.outputs, m_vehicle, page),
-      m_car(m_page.withTaps(carOptions(options, settings, m_vehicle)))
+WatchRun::WatchRun(LongWatchOptions const& options, WatchSettings const& settings, ServiceNotify& notify)
+    : m_options(options), m_notify(notify), m_vehicle(vehicleName(settings)),
+      m_page(settings.outputs, m_vehicle, options), m_car(m_page.withTaps(watchedCar(options.car, settings, m_vehicle)))
 {
-    if (options.port.empty() && settings.port.empty()) {
+    if (options.car.port.empty() && settings.port.empty()) {
         throw Error(ErrorKind::WrongUse, "No port is named", {"name it with --port, or as port in the settings"});
     }
     addOutputs(settings);
@@ -115,7 +105,9 @@ void WatchRun::addOutputs(WatchSettings const& settings)
     context.vehicle = m_vehicle;
     context.stateFolder = stateFolder();
     // An output that hangs may outlive this object.
-    context.tell = [quiet = m_options.quiet](std::string const& text) { sayUnless(quiet, text); };
+    if (m_options.onEvent) {
+        context.tell = m_options.onEvent;
+    }
     context.health = [board = m_health] {
         std::lock_guard const lock(board->mutex);
         return board->health;
@@ -125,7 +117,7 @@ void WatchRun::addOutputs(WatchSettings const& settings)
         std::unique_ptr<IOutput> output;
         if (WatchPage::is(address)) {
             limits.interval = WatchPage::interval;
-            output = m_page.makeOutput(address, context.health, settingsPath(m_options));
+            output = m_page.makeOutput(address, context.health, settingsPath(m_options.car));
         } else {
             output = makeOutput(address, context);
         }
@@ -240,9 +232,17 @@ void WatchRun::takeHealth()
     m_health->health = std::move(health);
 }
 
-void WatchRun::say(std::string const& text) const
+Health WatchRun::health() const
 {
-    sayUnless(m_options.quiet, text);
+    std::lock_guard const lock(m_health->mutex);
+    return m_health->health;
 }
 
-} // namespace velmora::cli
+void WatchRun::say(std::string const& text) const
+{
+    if (m_options.onEvent) {
+        m_options.onEvent(text);
+    }
+}
+
+} // namespace velmora

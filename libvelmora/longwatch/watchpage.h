@@ -6,9 +6,11 @@
 #include "libvelmora/watch/sessioncar.h"
 #include "libvelmora/watch/watchengine.h"
 
+#include <velmora/longwatch.h>
+
 #include <filesystem>
 
-namespace velmora::cli {
+namespace velmora {
 
 // What joins the page in the browser to a watch. In a build without it, the same that knows of no page.
 class WatchPage
@@ -16,8 +18,8 @@ class WatchPage
 public:
     static constexpr std::chrono::milliseconds interval{100}; // between two events of the page
 
-    // forPage: the page is what the watch is for.
-    WatchPage(std::vector<OutputAddress> const& outputs, std::string vehicle, bool forPage);
+    // options: whether the page is what the watch is for, and who is told where it is.
+    WatchPage(std::vector<OutputAddress> const& outputs, std::string vehicle, LongWatchOptions const& options);
     ~WatchPage();
     WatchPage(WatchPage const&) = delete;
     WatchPage& operator=(WatchPage const&) = delete;
@@ -39,4 +41,4 @@ private:
     std::unique_ptr<Service> m_service;
 };
 
-} // namespace velmora::cli
+} // namespace velmora

@@ -1,0 +1,48 @@
+#include "tests/support/temporaryfolder.h"
+
+#include <velmora/error.h>
+#include <velmora/readingoutput.h>
+
+#include <gtest/gtest.h>
+
+namespace {
+
+using testsupport::TemporaryFolder;
+using velmora::Error;
+using velmora::Reading;
+using velmora::ReadingOutput;
+
+Reading engineSpeed()
+{
+    Reading reading;
+    reading.time = std::chrono::system_clock::now();
+    reading.vehicle = "unnamed";
+    reading.module = 0x7E8;
+    reading.sensor = "RPM";
+    reading.value = 1726.0;
+    return reading;
+}
+
+TEST(ReadingOutput, WritesUnderTheVehiclesName)
+{
+    TemporaryFolder const folder;
+    {
+        ReadingOutput named("ndjson:" + folder.file("named"), "van");
+        ReadingOutput plain("ndjson:" + folder.file("plain"), "");
+        named.write(engineSpeed());
+        plain.write(engineSpeed());
+        EXPECT_EQ(named.counts().accepted, 1U);
+        EXPECT_EQ(named.trouble(), "");
+    }
+    EXPECT_NE(folder.read("named").find("\"vehicle\":\"van\""), std::string::npos) << folder.read("named");
+    EXPECT_NE(folder.read("plain").find("\"vehicle\":\"unnamed\""), std::string::npos) << folder.read("plain");
+}
+
+TEST(ReadingOutput, TellsWhatIsWrong)
+{
+    EXPECT_NE(ReadingOutput("ndjson:/nowhere/at/all", "van").trouble(), "");
+    EXPECT_THROW(ReadingOutput("pigeon:coop", "van"), Error);
+    EXPECT_THROW(ReadingOutput("dash:127.0.0.1:0", "van"), Error) << "a page needs a car that it can ask";
+}
+
+} // namespace
