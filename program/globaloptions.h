@@ -1,8 +1,7 @@
 #pragma once
 
-#include "libvelmora/vehicle/units.h"
-
 #include <obd/vehicleprotocol.h>
+#include <velmora/units.h>
 
 #include <optional>
 #include <string>

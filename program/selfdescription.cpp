@@ -1,14 +1,14 @@
 #include "program/selfdescription.h"
 
 #include "common/text/text.h"
-#include "libvelmora/output/opening/outputfactory.h"
-#include "libvelmora/read/sensornames.h"
 #include "program/terminal/output.h"
 #include "simulator/simulation.h"
 #include "tools/manual/completion.h"
 #include "tools/manual/manualpage.h"
 
 #include <velmora/catalogue.h>
+#include <velmora/longwatch.h>
+#include <velmora/offers.h>
 #include <velmora/ports.h>
 #include <velmora/version.h>
 

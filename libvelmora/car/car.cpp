@@ -66,6 +66,21 @@ void Car::reconnect()
     m_core->reconnect();
 }
 
+void Car::check()
+{
+    m_core->check();
+}
+
+std::string Car::trouble()
+{
+    return m_core->trouble();
+}
+
+std::string Car::port()
+{
+    return m_core->port();
+}
+
 void Car::library(std::function<void(obd::IObdVelmora&)> const& function)
 {
     m_core->call([&function](Session& session) { function(session.obd()); });

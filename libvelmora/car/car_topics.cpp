@@ -1,14 +1,14 @@
-// What a car tells, topic by topic, and what it can be made to do.
+// What a car tells, topic by topic.
 
 #include "libvelmora/car/carcore.h"
+#include "libvelmora/car/carmodules.h"
+#include "libvelmora/car/caroffers.h"
 #include "libvelmora/car/carsensors.h"
-#include "libvelmora/read/codeclearing.h"
 #include "libvelmora/read/codereader.h"
 #include "libvelmora/read/diagnosticreaders.h"
 #include "libvelmora/read/freezereader.h"
 #include "libvelmora/read/makerreader.h"
 #include "libvelmora/read/modulereader.h"
-#include "libvelmora/read/routinereader.h"
 #include "libvelmora/read/vehiclereader.h"
 #include "libvelmora/text/text.h"
 
@@ -21,15 +21,37 @@ namespace velmora {
 
 namespace {
 
-std::vector<ModuleTopic<CodeReport>> readCodes(Session& session)
+// The vehicle identification number is asked for only where it matters.
+std::vector<ModuleTopic<CodeReport>> readCodes(Session& session, std::vector<CodeKind> const& kinds,
+                                               std::string const& named)
 {
     CodeReader reader(session);
-    auto modules = readModules(session, [&reader](Session&, obd::IEcu const& ecu) {
-        return reader.read(ecu, {CodeKind::Confirmed, CodeKind::Pending, CodeKind::Permanent});
+    auto modules =
+        readModules(session, [&](Session& /*session*/, obd::IEcu const& ecu) { return reader.read(ecu, kinds); });
+    bool const needed =
+        std::any_of(modules.begin(), modules.end(), [](auto const& module) { return hasMakersCodes(module.report); });
+    MakerChoice const maker = needed ? readMaker(session, named) : chooseMaker(named, {});
+    for (ModuleTopic<CodeReport>& module : modules) {
+        applyMaker(module.report, maker);
+    }
+    return modules;
+}
+
+// Whether the code of any frame means something else with each maker.
+bool needsMaker(std::vector<ModuleTopic<FreezeReport>> const& modules)
+{
+    return std::any_of(modules.begin(), modules.end(), [](ModuleTopic<FreezeReport> const& module) {
+        return module.report.frame && isMakersCode(module.report.frame->code.code);
     });
-    if (std::any_of(modules.begin(), modules.end(), [](auto const& module) { return hasMakersCodes(module.report); })) {
-        MakerChoice const maker = readMaker(session, {});
-        for (ModuleTopic<CodeReport>& module : modules) {
+}
+
+std::vector<ModuleTopic<FreezeReport>> readFrames(Session& session, unsigned char frame, std::string const& named)
+{
+    auto modules =
+        readModules(session, [frame](Session& each, obd::IEcu const& ecu) { return readFreeze(each, ecu, frame); });
+    if (needsMaker(modules)) {
+        MakerChoice const maker = readMaker(session, named);
+        for (ModuleTopic<FreezeReport>& module : modules) {
             applyMaker(module.report, maker);
         }
     }
@@ -75,15 +97,22 @@ std::vector<StoredCode> Car::codes()
 
 std::vector<ModuleTopic<CodeReport>> Car::codeReports()
 {
-    return m_core->call(readCodes);
+    return codeReports({CodeKind::Confirmed, CodeKind::Pending, CodeKind::Permanent});
+}
+
+std::vector<ModuleTopic<CodeReport>> Car::codeReports(std::vector<CodeKind> const& kinds, std::string const& maker)
+{
+    return m_core->call([&](Session& session) { return readCodes(session, kinds, maker); });
 }
 
 std::vector<ModuleTopic<FreezeReport>> Car::freezeFrame(unsigned char frame)
 {
-    return m_core->call([frame](Session& session) {
-        return readModules(session,
-                           [frame](Session& each, obd::IEcu const& ecu) { return readFreeze(each, ecu, frame); });
-    });
+    return freezeFrame(frame, {});
+}
+
+std::vector<ModuleTopic<FreezeReport>> Car::freezeFrame(unsigned char frame, std::string const& maker)
+{
+    return m_core->call([&](Session& session) { return readFrames(session, frame, maker); });
 }
 
 std::vector<ModuleTopic<ReadinessReport>> Car::readiness()
@@ -122,6 +151,26 @@ std::vector<Module> Car::modules()
     });
 }
 
+std::vector<FoundModule> Car::findModules(ModuleSearch const& search)
+{
+    return m_core->call([&search](Session& session) { return velmora::findModules(session, search); });
+}
+
+std::vector<ModuleTopic<ModuleIdentifiers>> Car::identifiers()
+{
+    return m_core->call(readIdentifiers);
+}
+
+std::vector<UdsModuleReport> Car::udsCodes(std::string const& maker)
+{
+    return m_core->call([&maker](Session& session) { return readUdsReports(session, maker); });
+}
+
+std::vector<ModuleOffers> Car::offers(bool all)
+{
+    return m_core->call([all](Session& session) { return readOffers(session, all); });
+}
+
 std::vector<Sensor> Car::sensors()
 {
     return m_core->call(sensorsOf);
@@ -139,30 +188,12 @@ ProtocolReport Car::protocol()
 
 VehicleReport Car::report()
 {
-    return m_core->call([](Session& session) { return readVehicle(session); });
+    return report({});
 }
 
-std::vector<ModuleTopic<ClearReport>> Car::clearCodes()
+VehicleReport Car::report(std::string const& maker)
 {
-    auto modules = m_core->call(velmora::clearCodes);
-    requireCleared(modules);
-    return modules;
-}
-
-std::vector<ModuleTopic<RoutinesReport>> Car::routines()
-{
-    return m_core->call([](Session& session) { return readModules(session, readRoutines); });
-}
-
-ModuleTopic<RoutineRun> Car::runRoutine(int id)
-{
-    auto const run = m_core->call([id](Session& session) {
-        RoutineChoice const choice = findRoutine(session, id);
-        return ModuleTopic<RoutineRun>{choice.ecu->id(), readable(choice.ecu->name()),
-                                       velmora::runRoutine(session, *choice.ecu, choice.routine)};
-    });
-    requireAccepted(run.report);
-    return run;
+    return m_core->call([&maker](Session& session) { return readVehicle(session, maker); });
 }
 
 } // namespace velmora

@@ -27,7 +27,7 @@ void claim()
 
 } // namespace
 
-CarCore::CarCore(CarOptions options) : m_options(std::move(options))
+CarCore::CarCore(CarOptions options) : m_options(std::move(options)), m_onStop(m_options.stop, [this] { interrupt(); })
 {
     claim();
     auto const connected = std::make_shared<std::promise<void>>();
@@ -48,13 +48,26 @@ CarCore::~CarCore()
     {
         std::lock_guard const lock(m_mutex);
         m_stop = true;
-        m_wake.notify_one();
-        if (m_session != nullptr) {
-            m_session->interrupt();
-        }
     }
+    interrupt();
     m_thread.join();
     carStands = false;
+}
+
+void CarCore::interrupt()
+{
+    std::lock_guard const lock(m_mutex);
+    m_wake.notify_one();
+    if (m_session != nullptr) {
+        m_session->interrupt();
+    }
+}
+
+void CarCore::refuseIfStopped() const
+{
+    if (m_options.stop.stop_requested()) {
+        throw Error(ErrorKind::Interrupted, "Interrupted");
+    }
 }
 
 void CarCore::refuseCallback() const
@@ -78,6 +91,7 @@ void CarCore::post(std::function<void()> work)
 Session& CarCore::openSession() const
 {
     if (m_session == nullptr) {
+        refuseIfStopped();
         throw Error(ErrorKind::LinkLost, "The link to the adapter is lost",
                     {"a watch tries to come back by itself; reconnect() tries at once"});
     }

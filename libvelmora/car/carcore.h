@@ -13,6 +13,7 @@
 #include <future>
 #include <memory>
 #include <mutex>
+#include <stop_token>
 #include <thread>
 #include <type_traits>
 #include <vector>
@@ -40,6 +41,12 @@ public:
                                       Car::OnLink onLink);
     void reconnect();
 
+    // Throws Error if the link is lost, the adapter has fallen silent, or the car was stopped.
+    void check();
+    // As a session has them; without one there is nothing to tell.
+    std::string trouble();
+    std::string port();
+
 private:
     using Clock = std::chrono::steady_clock;
 
@@ -53,6 +60,8 @@ private:
         return answer->get();
     }
 
+    void interrupt();
+    void refuseIfStopped() const;
     void refuseCallback() const;
     void post(std::function<void()> work);
     Session& openSession() const;
@@ -61,6 +70,7 @@ private:
     void run(std::promise<void>& connected);
     void connect();
     void disconnect();
+    void noteEnd() const;
     void wait();
     void runWork();
     void startWatch(std::shared_ptr<WatchState> const& state);
@@ -82,6 +92,7 @@ private:
     bool m_stop = false;                      // protected by m_mutex
     std::unique_ptr<Session> m_session;       // changed under m_mutex, by the car's thread alone
     std::thread m_thread;
+    std::stop_callback<std::function<void()>> m_onStop;
 };
 
 } // namespace velmora

@@ -2,6 +2,10 @@
 
 #include "libvelmora/car/carcore.h"
 #include "libvelmora/car/caroptions.h"
+#include "libvelmora/car/sessionend.h"
+#include "libvelmora/record/recorderparts.h"
+
+#include <velmora/recorder.h>
 
 #include <algorithm>
 
@@ -20,9 +24,13 @@ void CarCore::connect()
     {
         std::lock_guard const lock(m_mutex);
         m_session = std::move(session);
-        if (m_stop) {
+        if (m_stop || m_options.stop.stop_requested()) {
             m_session->interrupt();
         }
+    }
+    if (m_options.recorder != nullptr) {
+        m_options.recorder->m_parts->opening();
+        m_session->record(m_options.recorder->m_parts->recorder);
     }
     m_session->connect();
     m_lastReading = Clock::now();
@@ -33,6 +41,7 @@ void CarCore::disconnect()
     for (std::shared_ptr<WatchState> const& watch : m_watches) {
         watch->setPoller(nullptr);
     }
+    noteEnd();
     std::unique_ptr<Session> session;
     {
         std::lock_guard const lock(m_mutex);
@@ -40,9 +49,42 @@ void CarCore::disconnect()
     }
 }
 
+// What only the session knows, before it ends.
+void CarCore::noteEnd() const
+{
+    if (m_session == nullptr) {
+        return;
+    }
+    if (m_options.recorder != nullptr) {
+        auto const adapter = m_session->adapter();
+        m_options.recorder->m_parts->closing(adapter != nullptr ? adapter->device() : std::string());
+    }
+    tellUnwritten(*m_session, m_options);
+}
+
+void CarCore::check()
+{
+    onThread([this] {
+        if (m_session == nullptr) {
+            openSession();
+        }
+        m_session->check();
+    });
+}
+
+std::string CarCore::trouble()
+{
+    return onThread([this] { return m_session != nullptr ? m_session->trouble() : std::string(); });
+}
+
+std::string CarCore::port()
+{
+    return onThread([this] { return m_session != nullptr ? m_session->port() : m_options.port; });
+}
+
 void CarCore::superviseLink()
 {
-    if (m_watches.empty()) {
+    if (m_watches.empty() || m_options.stop.stop_requested()) {
         return; // the next call finds out
     }
     if (m_session == nullptr) {

@@ -32,6 +32,14 @@ std::set<unsigned int> knownModules(obd::IEcuManager& modules)
     return {ids.begin(), ids.end()};
 }
 
+// What a refusal means for who wanted it.
+Error refusedToClear(ModuleTopic<ClearReport> const& module)
+{
+    return {ErrorKind::Refused,
+            fmt::format("Control module {:X} refused to clear its codes: {}", module.id, module.report.reason),
+            {"most modules clear only with the ignition on and the engine off"}};
+}
+
 } // namespace
 
 // The library's own clearing tells of the current module alone; asking again to learn of the others would clear twice.
@@ -56,13 +64,6 @@ std::vector<ModuleTopic<ClearReport>> clearCodes(Session& session)
     return reports;
 }
 
-Error refusedToClear(ModuleTopic<ClearReport> const& module)
-{
-    return {ErrorKind::Refused,
-            fmt::format("Control module {:X} refused to clear its codes: {}", module.id, module.report.reason),
-            {"most modules clear only with the ignition on and the engine off"}};
-}
-
 void requireCleared(std::vector<ModuleTopic<ClearReport>> const& modules)
 {
     auto const first = [&modules](ClearReport::Result result) {
@@ -77,6 +78,16 @@ void requireCleared(std::vector<ModuleTopic<ClearReport>> const& modules)
     }
     throw Error(ErrorKind::VehicleSilent, "No control module confirmed that it cleared its codes",
                 {"is the ignition still on?", "read the codes to see what is stored now"});
+}
+
+void requireAllCleared(std::vector<ModuleTopic<ClearReport>> const& modules)
+{
+    for (ModuleTopic<ClearReport> const& module : modules) {
+        if (module.report.result == ClearReport::Result::Refused) {
+            throw refusedToClear(module);
+        }
+    }
+    requireCleared(modules);
 }
 
 } // namespace velmora

@@ -13,10 +13,4 @@ namespace velmora {
 // not known are among the results. Throws Error if the link breaks or the user interrupts.
 std::vector<ModuleTopic<ClearReport>> clearCodes(Session& session);
 
-// Throws Error unless a module has cleared its codes.
-void requireCleared(std::vector<ModuleTopic<ClearReport>> const& modules);
-
-// What a refusal means for who wanted it.
-Error refusedToClear(ModuleTopic<ClearReport> const& module);
-
 } // namespace velmora

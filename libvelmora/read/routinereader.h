@@ -26,7 +26,4 @@ RoutineChoice findRoutine(Session& session, int id);
 // Starts a routine, without any question.
 RoutineRun runRoutine(Session& session, obd::IEcu const& ecu, Routine const& routine);
 
-// Throws Error unless the module said that it runs it.
-void requireAccepted(RoutineRun const& run);
-
 } // namespace velmora

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <velmora/modules.h>
+
 #include <string>
 #include <vector>
 
@@ -32,8 +34,5 @@ std::string identifierText(unsigned int did, std::vector<unsigned char> const& d
 
 // The data of a local identifier of service 1A: text, or hexadecimal where it is none.
 std::string localIdentifierText(std::vector<unsigned char> const& data);
-
-// The name of F180 to F19F; for 1A80 and other local identifiers what service tells them.
-std::string identifierName(unsigned int did);
 
 } // namespace velmora

@@ -1,15 +1,16 @@
-#include "libvelmora/read/codeclearing.h"
-#include "libvelmora/report/clearreport.h"
+#include "program/command/commandcar.h"
 #include "program/command/commands.h"
-#include "program/command/commandsession.h"
 #include "program/command/confirm.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
 #include "program/view/printtext.h"
 
 #include <velmora/error.h>
+#include <velmora/print.h>
 
 #include <fmt/format.h>
+
+#include <sstream>
 
 namespace velmora::cli {
 
@@ -34,32 +35,21 @@ void checkOptions(GlobalOptions const& options)
 
 std::string outcomeText(ModuleTopic<ClearReport> const& module)
 {
-    return fmt::format("Control module {:X}{}{}: {}{}{}\n", module.id, module.name.empty() ? "" : " ", module.name,
-                       resultWord(module.report.result), module.report.reason.empty() ? "" : ": ",
-                       module.report.reason);
-}
-
-ExitCode judge(std::vector<ModuleTopic<ClearReport>> const& modules)
-{
-    for (ModuleTopic<ClearReport> const& module : modules) {
-        if (module.report.result == ClearReport::Result::Refused) {
-            throw refusedToClear(module);
-        }
-    }
-    requireCleared(modules);
-    return ExitCode::Done;
+    std::ostringstream outcome;
+    outcome << module.report;
+    return fmt::format("Control module {:X}{}{}: {}\n", module.id, module.name.empty() ? "" : " ", module.name,
+                       outcome.str());
 }
 
 ExitCode clear(GlobalOptions const& options)
 {
     checkOptions(options);
-    CommandSession session(options);
-    session.connect();
-    if (!confirmed(session, clearWarning, "Clear now?")) {
+    CommandCar car(options);
+    if (!confirmed(car, clearWarning, "Clear now?")) {
         tell("Nothing was cleared.\n");
         return ExitCode::Failed;
     }
-    auto const modules = clearCodes(session);
+    auto const modules = car.tryClearCodes();
     if (options.json) {
         fmt::print("{}", toJson(modules));
     } else {
@@ -68,7 +58,8 @@ ExitCode clear(GlobalOptions const& options)
         }
     }
     flushOutput();
-    return judge(modules);
+    requireAllCleared(modules);
+    return ExitCode::Done;
 }
 
 } // namespace

@@ -1,8 +1,5 @@
-#include "libvelmora/read/codereader.h"
-#include "libvelmora/read/makerreader.h"
 #include "program/command/codesuds.h"
 #include "program/command/commands.h"
-#include "program/command/commandsession.h"
 #include "program/command/makeoption.h"
 #include "program/command/modulecommand.h"
 #include "program/commandline.h"
@@ -36,15 +33,15 @@ std::vector<CodeKind> chosenKinds(CodesOptions const& options)
     return kinds;
 }
 
-bool anyList(std::vector<ModuleCodes> const& modules, CodeList::Answer answer)
+bool anyList(std::vector<ModuleTopic<CodeReport>> const& modules, CodeList::Answer answer)
 {
-    return std::any_of(modules.begin(), modules.end(), [answer](ModuleCodes const& module) {
+    return std::any_of(modules.begin(), modules.end(), [answer](ModuleTopic<CodeReport> const& module) {
         return std::any_of(module.report.lists.begin(), module.report.lists.end(),
                            [answer](CodeList const& list) { return list.answer == answer; });
     });
 }
 
-Error withoutAnswer(Session const& session, std::vector<ModuleCodes> const& modules)
+Error withoutAnswer(Car& car, std::vector<ModuleTopic<CodeReport>> const& modules)
 {
     if (anyList(modules, CodeList::Answer::Refused)) {
         return {ErrorKind::Refused,
@@ -53,21 +50,10 @@ Error withoutAnswer(Session const& session, std::vector<ModuleCodes> const& modu
     }
     std::vector<std::string> const hints = {
         "is the ignition on?", "not all vehicles report pending codes, and only newer ones permanent codes"};
-    if (!session.trouble().empty()) {
-        return silentVehicle(session, "No control module reported these codes", hints);
+    if (!car.trouble().empty()) {
+        return silentVehicle(car, "No control module reported these codes", hints);
     }
     return {ErrorKind::NotSupported, "No control module reported these codes", hints};
-}
-
-// The vehicle identification number is asked for only where it matters.
-void giveMeanings(Session& session, std::vector<ModuleCodes>& modules, std::string const& named)
-{
-    bool const needed = std::any_of(modules.begin(), modules.end(),
-                                    [](ModuleCodes const& module) { return hasMakersCodes(module.report); });
-    MakerChoice const maker = needed ? readMaker(session, named) : chooseMaker(named, {});
-    for (ModuleCodes& module : modules) {
-        applyMaker(module.report, maker);
-    }
 }
 
 ExitCode codes(CodesOptions const& chosen, GlobalOptions const& options)
@@ -75,14 +61,10 @@ ExitCode codes(CodesOptions const& chosen, GlobalOptions const& options)
     if (chosen.uds) {
         return udsCodes(chosen.maker, options);
     }
-    CommandSession session(options);
-    session.connect();
-    CodeReader reader(session);
-    auto modules = readModules(
-        session, [&](Session& /*session*/, obd::IEcu const& ecu) { return reader.read(ecu, chosenKinds(chosen)); });
-    giveMeanings(session, modules, chosen.maker);
+    CommandCar car(options);
+    auto const modules = car.codeReports(chosenKinds(chosen), chosen.maker);
     print(modules, options);
-    requireAnswer(session, modules, withoutAnswer(session, modules));
+    requireAnswer(car, modules, withoutAnswer(car, modules));
     return ExitCode::Done;
 }
 

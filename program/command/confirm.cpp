@@ -50,15 +50,15 @@ void requireConsent(GlobalOptions const& options, std::string const& action, std
     }
 }
 
-bool confirmed(CommandSession const& session, std::string const& warning, std::string const& question)
+bool confirmed(CommandCar& car, std::string const& warning, std::string const& question)
 {
-    if (session.options().yes) {
+    if (car.options().yes) {
         return true;
     }
     dropTypedAhead();
     tellText(fmt::format("{}{} [y/N] ", warning, question));
     std::string answer;
-    return LineReader(session).read(answer) && isYes(answer);
+    return LineReader([&car] { car.check(); }).read(answer) && isYes(answer);
 }
 
 bool confirmed(GlobalOptions const& options, std::string const& warning, std::string const& question)

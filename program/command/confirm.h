@@ -1,6 +1,6 @@
 #pragma once
 
-#include "program/command/commandsession.h"
+#include "program/command/commandcar.h"
 
 #include <string>
 
@@ -13,7 +13,7 @@ namespace velmora::cli {
 void requireConsent(GlobalOptions const& options, std::string const& action, std::string const& yes);
 
 // Asks, unless the options say yes already. The question is on standard error, behind the warning.
-bool confirmed(CommandSession const& session, std::string const& warning, std::string const& question);
+bool confirmed(CommandCar& car, std::string const& warning, std::string const& question);
 
 // The same without a vehicle.
 bool confirmed(GlobalOptions const& options, std::string const& warning, std::string const& question);

@@ -1,4 +1,3 @@
-#include "libvelmora/read/diagnosticreaders.h"
 #include "program/command/commands.h"
 #include "program/command/modulecommand.h"
 #include "program/commandline.h"
@@ -8,7 +7,7 @@ namespace velmora::cli {
 void addCountersCommand(CommandLine& commandLine)
 {
     commandLine.addCommand("counters", "Show how often monitors could run and did", [](GlobalOptions const& options) {
-        return showTopic(options, readCounters,
+        return showTopic(options, &Car::counters,
                          {ErrorKind::NotSupported,
                           "No control module keeps in-use counters",
                           {"vehicles before about 2008 have none"}});

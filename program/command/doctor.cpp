@@ -1,20 +1,13 @@
-#include "libvelmora/doctor/doctor.h"
-
-#include "libvelmora/record/checkedfile.h"
-#include "libvelmora/record/dialoguerecorder.h"
+#include "program/command/commandcar.h"
 #include "program/command/commands.h"
-#include "program/command/commandsession.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
 #include "program/view/printtext.h"
 
-#include <velmora/error.h>
+#include <velmora/doctor.h>
 
-#include <fmt/format.h>
-
-#include <cstring>
-#include <filesystem>
-#include <fstream>
+#include <memory>
+#include <string>
 
 namespace velmora::cli {
 
@@ -27,46 +20,23 @@ struct DoctorOptions
     bool force = false;
 };
 
-// What can be told before a minute is spent with the vehicle.
-void checkBundle(DoctorOptions const& chosen)
-{
-    std::error_code error;
-    if (chosen.bundle.empty()) {
-        return;
-    }
-    if (!chosen.force && std::filesystem::exists(chosen.bundle, error)) {
-        throw Error(ErrorKind::WrongUse, "The file " + chosen.bundle + " stands already",
-                    {"--force replaces it", "write to another name"});
-    }
-    requireWritable(chosen.bundle, "bundle");
-}
-
-void save(std::string const& file, std::string const& text)
-{
-    std::ofstream out(file, std::ios::binary);
-    out << text << std::flush;
-    if (!out) {
-        throw Error(ErrorKind::Failed, "Could not write " + file + ": " + std::strerror(errno),
-                    {"is there a folder of that name, and room on the disk?"});
-    }
-}
-
 ExitCode examineChain(DoctorOptions const& chosen, GlobalOptions const& options)
 {
-    checkBundle(chosen);
-    CommandSession session(options);
-    DialogueRecorder recorder;
-    DoctorReport const report = examine(session, recorder);
+    if (!chosen.bundle.empty()) {
+        Doctor::checkBundle(chosen.bundle, chosen.force);
+    }
+    InterruptStop const stop;
+    Doctor const doctor(carOptions(options, stop.token()));
     if (options.json) {
-        writeOutput(printed(toJson(report)));
+        writeOutput(doctor.toJson());
     } else {
-        printText(toText(report));
+        printText(doctor.toText());
         flushOutput();
     }
     if (!chosen.bundle.empty()) {
-        save(chosen.bundle, makeBundle(report, session, recorder, chosen.keepVin));
+        doctor.saveBundle(chosen.bundle, chosen.keepVin);
     }
-    return report.isHealthy() ? ExitCode::Done : ExitCode::Failed;
+    return doctor.isHealthy() ? ExitCode::Done : ExitCode::Failed;
 }
 
 } // namespace

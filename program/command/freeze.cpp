@@ -1,11 +1,7 @@
-#include "libvelmora/read/freezereader.h"
-#include "libvelmora/read/makerreader.h"
 #include "program/command/commands.h"
 #include "program/command/makeoption.h"
 #include "program/command/modulecommand.h"
 #include "program/commandline.h"
-
-#include <algorithm>
 
 namespace velmora::cli {
 
@@ -17,29 +13,12 @@ struct FreezeOptions
     std::string maker;
 };
 
-// Whether the code of any frame means something else with each maker.
-bool needsMaker(std::vector<ModuleTopic<FreezeReport>> const& modules)
-{
-    return std::any_of(modules.begin(), modules.end(), [](ModuleTopic<FreezeReport> const& module) {
-        return module.report.frame && isMakersCode(module.report.frame->code.code);
-    });
-}
-
 ExitCode freeze(FreezeOptions const& chosen, GlobalOptions const& options)
 {
-    CommandSession session(options);
-    session.connect();
-    auto modules = readModules(session, [&chosen](Session& each, obd::IEcu const& ecu) {
-        return readFreeze(each, ecu, static_cast<unsigned char>(chosen.frame));
-    });
-    if (needsMaker(modules)) {
-        MakerChoice const maker = readMaker(session, chosen.maker);
-        for (ModuleTopic<FreezeReport>& module : modules) {
-            applyMaker(module.report, maker);
-        }
-    }
+    CommandCar car(options);
+    auto const modules = car.freezeFrame(static_cast<unsigned char>(chosen.frame), chosen.maker);
     print(modules, options);
-    requireAnswer(session, modules,
+    requireAnswer(car, modules,
                   Error(ErrorKind::NotSupported,
                         fmt::format("No control module answers for freeze frame {}", chosen.frame),
                         {"vehicles with no code stored may not answer; most know frame 0 only"}));

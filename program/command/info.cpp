@@ -1,6 +1,4 @@
-#include "libvelmora/read/diagnosticreaders.h"
 #include "program/command/commands.h"
-#include "program/command/commandsession.h"
 #include "program/command/infouds.h"
 #include "program/command/modulecommand.h"
 #include "program/commandline.h"
@@ -13,9 +11,8 @@ namespace {
 
 ExitCode info(GlobalOptions const& options)
 {
-    CommandSession session(options);
-    session.connect();
-    print(readModules(session, readInfo), options);
+    CommandCar car(options);
+    print(car.info(), options);
     return ExitCode::Done;
 }
 

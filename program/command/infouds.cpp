@@ -1,18 +1,12 @@
 #include "program/command/infouds.h"
 
-#include "libvelmora/read/diagnosticreaders.h"
-#include "libvelmora/read/modulereader.h"
-#include "libvelmora/report/inforeport.h"
-#include "libvelmora/report/moduletopic.h"
-#include "libvelmora/uds/identification.h"
-#include "libvelmora/uds/moduleaddress.h"
-#include "libvelmora/uds/moduleidentity.h"
-#include "program/command/commandsession.h"
+#include "program/command/commandcar.h"
 #include "program/terminal/output.h"
+#include "program/view/json.h"
 #include "program/view/printtext.h"
 #include "program/view/style.h"
 
-#include <velmora/print.h>
+#include <velmora/modules.h>
 
 #include <fmt/format.h>
 
@@ -20,22 +14,7 @@ namespace velmora::cli {
 
 namespace {
 
-using Identifiers = std::map<unsigned int, std::string>;
-
-// None of a module that can't be asked alone.
-Identifiers readIdentifiers(CommandSession& session, unsigned int module)
-{
-    std::optional<std::string> const request = standardRequest(module, session.proxy()->protocol());
-    if (!request) {
-        return {};
-    }
-    ModuleAsker asker(*session.proxy(), session.channel());
-    FoundModule found{*request, swappedReply(*request).value_or(std::string()), {}, {}, {}, {}};
-    ModuleIdentity(asker, [&session] { session.check(); }).readIdentifiers(found);
-    return found.identifiers;
-}
-
-std::string identifiersText(Identifiers const& identifiers)
+std::string identifiersText(ModuleIdentifiers const& identifiers)
 {
     std::string text;
     for (auto const& [did, told] : identifiers) {
@@ -44,7 +23,7 @@ std::string identifiersText(Identifiers const& identifiers)
     return text;
 }
 
-Json identifiersJson(Identifiers const& identifiers)
+Json identifiersJson(ModuleIdentifiers const& identifiers)
 {
     Json json = Json::object();
     for (auto const& [did, told] : identifiers) {
@@ -57,18 +36,16 @@ Json identifiersJson(Identifiers const& identifiers)
 
 ExitCode udsInfo(GlobalOptions const& options)
 {
-    CommandSession session(options);
-    session.connect();
-    auto const modules = readModules(session, readInfo);
+    CommandCar car(options);
+    auto const modules = car.info();
+    auto const told = car.identifiers();
     Json document = Json::parse(toJson(modules));
     std::string text;
-    for (std::size_t i = 0; i < modules.size(); ++i) {
-        Identifiers const identifiers = readIdentifiers(session, modules[i].id);
-        document[i]["identifiers"] = identifiersJson(identifiers);
-        text +=
-            (i == 0 ? "" : "\n") + toText(std::vector{modules[i]}, textStyle(options)) + identifiersText(identifiers);
+    for (std::size_t i = 0; i < modules.size() && i < told.size(); ++i) {
+        document[i]["identifiers"] = identifiersJson(told[i].report);
+        text += (i == 0 ? "" : "\n") + toText(std::vector{modules[i]}, textStyle(options)) +
+                identifiersText(told[i].report);
     }
-    session.checkAdapter();
     if (options.json) {
         fmt::print("{}", printed(document));
     } else {

@@ -1,4 +1,3 @@
-#include "libvelmora/read/diagnosticreaders.h"
 #include "program/command/commands.h"
 #include "program/command/modulecommand.h"
 #include "program/commandline.h"
@@ -9,7 +8,7 @@ void addMonitorsCommand(CommandLine& commandLine)
 {
     commandLine.addCommand("monitors", "Show the results of the on-board monitors' tests",
                            [](GlobalOptions const& options) {
-                               return showTopic(options, readMonitors,
+                               return showTopic(options, &Car::monitors,
                                                 {ErrorKind::NotSupported,
                                                  "No control module offers monitor test results",
                                                  {"older vehicles may have oxygen sensor tests only: velmora oxygen"}});

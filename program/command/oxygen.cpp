@@ -1,4 +1,3 @@
-#include "libvelmora/read/diagnosticreaders.h"
 #include "program/command/commands.h"
 #include "program/command/modulecommand.h"
 #include "program/commandline.h"
@@ -9,7 +8,7 @@ void addOxygenCommand(CommandLine& commandLine)
 {
     commandLine.addCommand("oxygen", "Show the oxygen sensors, and their tests on legacy buses, those before CAN",
                            [](GlobalOptions const& options) {
-                               return showTopic(options, readOxygen,
+                               return showTopic(options, &Car::oxygen,
                                                 {ErrorKind::NotSupported,
                                                  "No control module reports oxygen sensors",
                                                  {"diesel engines have none, or don't report them"}});

@@ -1,21 +1,16 @@
-#include "libvelmora/read/vehiclereader.h"
-#include "libvelmora/record/dialoguefile.h"
-#include "libvelmora/record/dialoguerecorder.h"
-#include "libvelmora/record/vinmask.h"
+#include "program/command/commandcar.h"
 #include "program/command/commands.h"
-#include "program/command/commandsession.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
 #include "program/view/printtext.h"
 #include "program/view/style.h"
 
-#include <obd/isensorservice.h>
 #include <velmora/document.h>
-#include <velmora/error.h>
+#include <velmora/recorder.h>
 
 #include <fmt/format.h>
 
-#include <algorithm>
+#include <memory>
 
 namespace velmora::cli {
 
@@ -28,64 +23,34 @@ struct RecordOptions
     bool keepVin = false;
 };
 
-// A header of a recording is one line of plain text.
-std::string headerText(std::string text, char const* otherwise)
+void save(Recorder& recorder, RecordOptions const& chosen, GlobalOptions const& options)
 {
-    std::replace_if(
-        text.begin(), text.end(), [](char each) { return each >= 0 && each < ' '; }, ' ');
-    return text.empty() ? otherwise : text;
+    std::size_t const recorded = recorder.save(chosen.vehicle, chosen.keepVin);
+    if (recorded != 0 && !options.quiet) {
+        tell(fmt::format("Recorded {} requests and commands to {}\n", recorded, chosen.file));
+    }
 }
 
-// Each sensor once, so that a replay can serve live values.
-void readSensors(Session& session)
+VehicleReport readAll(GlobalOptions const& options, std::shared_ptr<Recorder> const& recorder)
 {
-    auto const service = obd::SensorServiceBuilder::createSensorService();
-    for (auto const& ecu : session.selectedModules()) {
-        session.select(*ecu);
-        for (obd::ParameterIdentifier::Id const id : service->getSupportedIds()) {
-            service->fetchSensors(id);
-            session.check();
-        }
-    }
-    session.checkAdapter();
-}
-
-void save(DialogueRecorder const& recorder, CommandSession const& session, RecordOptions const& chosen,
-          DialogueFile& file)
-{
-    obdsim::Dialogue dialogue = recorder.dialogue();
-    if (dialogue.exchanges.empty()) {
-        return;
-    }
-    auto const adapter = session.adapter();
-    dialogue.vehicle = headerText(chosen.vehicle, "unknown");
-    dialogue.adapter = headerText(adapter != nullptr ? adapter->device() : std::string(), "unknown");
-    if (!chosen.keepVin) {
-        maskVins(dialogue);
-    }
-    file.save(dialogue);
-    if (!session.options().quiet) {
-        tell(fmt::format("Recorded {} requests and commands to {}\n", dialogue.exchanges.size(), chosen.file));
-    }
+    CommandCar car(options, recorder);
+    VehicleReport report = car.report();
+    car.askSensors();
+    return report;
 }
 
 ExitCode record(RecordOptions const& chosen, GlobalOptions const& options)
 {
-    DialogueFile file(chosen.file);
-    DialogueRecorder recorder;
-    CommandSession session(options);
-    session.record(recorder);
+    auto const recorder = std::make_shared<Recorder>(chosen.file);
     VehicleReport report;
     try {
-        session.connect();
-        report = readVehicle(session);
-        readSensors(session);
+        report = readAll(options, recorder);
     } catch (Error const&) {
         // What went wrong is what one wants to look at later.
-        save(recorder, session, chosen, file);
+        save(*recorder, chosen, options);
         throw;
     }
-    save(recorder, session, chosen, file);
+    save(*recorder, chosen, options);
     if (options.json) {
         fmt::print("{}", report.toJson());
     } else {

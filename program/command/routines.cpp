@@ -1,8 +1,6 @@
 #include "common/text/layout.h"
 #include "common/text/text.h"
-#include "libvelmora/read/routinereader.h"
 #include "program/command/commands.h"
-#include "program/command/commandsession.h"
 #include "program/command/confirm.h"
 #include "program/command/modulecommand.h"
 #include "program/commandline.h"
@@ -27,19 +25,19 @@ unsigned char parseRoutineId(std::string const& text)
 
 ExitCode list(GlobalOptions const& options)
 {
-    return showTopic(options, readRoutines,
+    return showTopic(options, &Car::routines,
                      {ErrorKind::NotSupported,
                       "No control module offers a routine that is known here",
                       {"many vehicles have none"}});
 }
 
-std::string routineWarning(RoutineChoice const& choice, GlobalOptions const& options)
+std::string routineWarning(ModuleTopic<Routine> const& choice, GlobalOptions const& options)
 {
     return fmt::format(
-        "This asks control module {:X} {} to run routine {}: {}\n{}"
+        "This asks control module {:X} {} to run routine {:02X}: {}\n{}"
         "The routine acts on the vehicle. Have it parked safely, with nobody near moving or hot parts.\n",
-        choice.ecu->id(), choice.ecu->name(), routineId(choice.routine.id), choice.routine.name,
-        wrapped(choice.routine.description, 76, "  ", outputStyle(options)));
+        choice.id, choice.name, choice.report.id, choice.report.name,
+        wrapped(choice.report.description, 76, "  ", outputStyle(options)));
 }
 
 void printRun(ModuleTopic<RoutineRun> const& run, GlobalOptions const& options)
@@ -56,16 +54,14 @@ ExitCode run(std::string const& text, GlobalOptions const& options)
 {
     unsigned char const id = parseRoutineId(text);
     requireConsent(options, "Running a routine", "runs it without asking");
-    CommandSession session(options);
-    session.connect();
-    RoutineChoice const choice = findRoutine(session, id);
-    if (!confirmed(session, routineWarning(choice, options), "Run now?")) {
+    CommandCar car(options);
+    if (!confirmed(car, routineWarning(car.findRoutine(id), options), "Run now?")) {
         tell("Nothing was run.\n");
         return ExitCode::Failed;
     }
-    RoutineRun const outcome = runRoutine(session, *choice.ecu, choice.routine);
-    printRun({choice.ecu->id(), choice.ecu->name(), outcome}, options);
-    requireAccepted(outcome);
+    ModuleTopic<RoutineRun> const outcome = car.tryRoutine(id);
+    printRun(outcome, options);
+    requireAccepted(outcome.report);
     return ExitCode::Done;
 }
 

@@ -1,6 +1,5 @@
-#include "libvelmora/read/vehiclereader.h"
+#include "program/command/commandcar.h"
 #include "program/command/commands.h"
-#include "program/command/commandsession.h"
 #include "program/command/keepscan.h"
 #include "program/command/makeoption.h"
 #include "program/commandline.h"
@@ -95,10 +94,9 @@ ExitCode scan(ScanOptions& chosen, GlobalOptions const& options)
 {
     checkReports(chosen);
     bool const keeps = decidesToKeep(chosen.keeping, options);
-    CommandSession session(options);
-    session.connect();
-    DocumentOptions const document = documentOf(chosen, session.port());
-    VehicleReport const report = readVehicle(session, chosen.maker);
+    CommandCar car(options);
+    DocumentOptions const document = documentOf(chosen, car.port());
+    VehicleReport const report = car.report(chosen.maker);
     for (std::string const& path : chosen.reports) {
         writeDocument(path, report, document, chosen.force);
     }
@@ -111,7 +109,7 @@ ExitCode scan(ScanOptions& chosen, GlobalOptions const& options)
         flushOutput();
         keepScan(report, chosen.keeping, options);
     }
-    return chosen.checking ? check(report, session.trouble()) : ExitCode::Done;
+    return chosen.checking ? check(report, car.trouble()) : ExitCode::Done;
 }
 
 // The rules of the USA go by the model year; the others ignore it.

@@ -1,183 +1,149 @@
 #include "common/text/layout.h"
-#include "common/text/text.h"
-#include "libvelmora/read/oxygencurrent.h"
-#include "libvelmora/read/topicanswer.h"
-#include "libvelmora/report/unitlabel.h"
-#include "libvelmora/vehicle/pidtitles.h"
-#include "libvelmora/vehicle/units.h"
+#include "program/command/commandcar.h"
 #include "program/command/commands.h"
-#include "program/command/commandsession.h"
-#include "program/command/sensoroffers.h"
 #include "program/commandline.h"
 #include "program/view/json.h"
 #include "program/view/printtext.h"
 #include "program/view/style.h"
 
-#include <obd/iecu.h>
-#include <obd/sensorpids.h>
+#include <velmora/offers.h>
 
 #include <fmt/format.h>
 
-#include <cmath>
+#include <memory>
 
 namespace velmora::cli {
 
 namespace {
 
-struct Service
+using Service = ModuleOffers::Service;
+using Value = ModuleOffers::Value;
+using Rows = std::vector<std::vector<Cell>>;
+
+char const* serviceTitle(int number)
 {
-    obd::ObdMode mode;
-    char const* title;
-};
+    return number == 1   ? "01 current data"
+           : number == 6 ? "06 monitor tests"
+           : number == 8 ? "08 system control"
+                         : "09 vehicle information";
+}
 
-constexpr Service services[] = {
-    {obd::ObdMode::CurrentData, "01 current data"},
-    {obd::ObdMode::MonitorTests, "06 monitor tests"},
-    {obd::ObdMode::SystemControl, "08 system control"},
-    {obd::ObdMode::VehicleInformation, "09 vehicle information"},
-};
-
-// Without the markers that only tell of the next range.
-std::vector<std::string> identifiers(obd::IEcu const& ecu, obd::ObdMode mode)
+std::vector<std::string> identifiers(Service const& service)
 {
     std::vector<std::string> texts;
-    for (unsigned char const id : ecu.supportedIds(mode, 0)) {
-        if (!obd::isSupportMask(id)) {
-            texts.push_back(fmt::format("{:02X}", id));
-        }
+    for (unsigned int const id : service.identifiers) {
+        texts.push_back(fmt::format("{:02X}", id));
     }
     return texts;
 }
 
-struct SensorsOptions
+// Why a set may lack what the module has; empty if it was read.
+std::string whyUnknown(Service const& service)
 {
-    bool all = false;
-};
-
-// How the list is to be shown.
-struct ListStyle
-{
-    bool all;
-    Units units;
-    Style text;
-};
-
-char const* label(obd::SensorDataModel const& sensor, Units units)
-{
-    return labelInUnits(unitLabel(sensor.uid, sensor.unit), sensor.unit, units);
+    switch (service.answer) {
+    case TopicAnswer::Silent:
+        return " (not known in full: no answer)";
+    case TopicAnswer::Unreadable:
+        return " (not known in full: unreadable)";
+    case TopicAnswer::Refused: // service 01 is one that all modules have
+        return service.number == 1 ? " (not known in full: refused)" : "";
+    default:
+        return {};
+    }
 }
 
-// An end of the sensor's range, in whole numbers as the library gives it.
-int limit(obd::SensorDataModel const& sensor, int number, Units units)
+std::string range(Value const& value)
 {
-    return static_cast<int>(std::lround(inUnits(shownNumber(sensor.uid, number), sensor.unit, units)));
+    return value.minimum && value.maximum ? fmt::format("{} to {}", *value.minimum, *value.maximum) : "text";
 }
 
-std::string range(obd::SensorDataModel const& sensor, Units units)
+void addParameter(Rows& rows, ModuleOffers::Parameter const& parameter, bool all)
 {
-    return sensor.numeric != nullptr ? fmt::format("{} to {}", limit(sensor, sensor.numeric->minimum, units),
-                                                   limit(sensor, sensor.numeric->maximum, units))
-                                     : "text";
-}
-
-using Rows = std::vector<std::vector<Cell>>;
-
-void addOffer(Rows& rows, Offer const& offer, ListStyle const& style)
-{
-    std::string lead = fmt::format("{:02X}", static_cast<int>(offer.parameter->id));
-    for (auto const& sensor : offer.parameter->sensors) {
-        rows.push_back({{lead}, {sensor->name}, {label(*sensor, style.units)}, {range(*sensor, style.units)}});
-        if (style.all) {
-            rows.back().push_back({offer.offered ? "offered" : "-"});
+    std::string lead = fmt::format("{:02X}", parameter.pid);
+    for (Value const& value : parameter.values) {
+        rows.push_back({{lead}, {value.name}, {value.unit}, {range(value)}});
+        if (all) {
+            rows.back().push_back({parameter.offered ? "offered" : "-"});
         }
         lead.clear();
     }
 }
 
-void addLater(Rows& rows, unsigned char pid)
+void addLater(Rows& rows, ModuleOffers::LaterParameter const& later)
 {
-    std::vector<BuiltinPid> const values = laterValues(pid);
-    std::string lead = fmt::format("{:02X}", pid);
-    if (values.empty()) {
-        rows.push_back({{lead}, {std::string(pidTitle(pid)) + " (not decoded)"}});
+    std::string lead = fmt::format("{:02X}", later.pid);
+    if (later.values.empty()) {
+        rows.push_back({{lead}, {later.name + " (not decoded)"}});
     }
-    for (BuiltinPid const& each : values) {
-        std::string const how = fmt::format("{} ({})", each.signal.id, standingWord(each.standing));
-        rows.push_back({{lead}, {each.signal.name}, {each.signal.unit}, {how}});
+    for (ModuleOffers::LaterValue const& each : later.values) {
+        rows.push_back({{lead}, {each.name}, {each.unit}, {fmt::format("{} ({})", each.sensor, each.standing)}});
         lead.clear();
     }
 }
 
-// Why a set may lack what the module has; empty if it was read.
-std::string whyUnknown(obd::IEcu const& ecu, obd::ObdMode mode)
+std::string offerText(ModuleOffers const& module, bool all, Style const& style)
 {
-    TopicAnswer const answer = toAnswer(ecu.detection(mode, 0));
-    bool const refused = answer == TopicAnswer::Refused && mode == obd::ObdMode::CurrentData; // which all modules have
-    return answer == TopicAnswer::Silent || answer == TopicAnswer::Unreadable || refused
-               ? fmt::format(" (not known in full: {})", answerWord(answer))
-               : std::string();
-}
-
-std::string offerText(obd::IEcu const& ecu, ListStyle const& style)
-{
-    std::string text =
-        fmt::format("Control module {:X}: {} ({})\n", ecu.id(), readable(ecu.name()), readable(ecu.description()));
-    for (Service const& service : services) {
-        std::vector<std::string> const ids = identifiers(ecu, service.mode);
-        text += fmt::format("  {:<24} {}{}\n", service.title,
-                            ids.empty() ? "-" : fmt::format("{}", fmt::join(ids, " ")), whyUnknown(ecu, service.mode));
+    std::string text = fmt::format("Control module {:X}: {} ({})\n", module.id, module.name, module.description);
+    for (Service const& service : module.services) {
+        std::vector<std::string> const ids = identifiers(service);
+        text += fmt::format("  {:<24} {}{}\n", serviceTitle(service.number),
+                            ids.empty() ? "-" : fmt::format("{}", fmt::join(ids, " ")), whyUnknown(service));
     }
     Rows rows;
-    for (Offer const& offer : offers(style.all)) {
-        addOffer(rows, offer, style);
+    for (ModuleOffers::Parameter const& parameter : module.parameters) {
+        addParameter(rows, parameter, all);
     }
-    for (unsigned char const pid : undecoded(ecu)) {
-        addLater(rows, pid);
+    for (ModuleOffers::LaterParameter const& later : module.further) {
+        addLater(rows, later);
     }
-    return text + "\n" + drawColumns(rows, "  ", style.text) + "\n";
+    return text + "\n" + drawColumns(rows, "  ", style) + "\n";
 }
 
-Json sensorJson(obd::SensorDataModel const& sensor, Units units)
+Json valuesJson(std::vector<Value> const& values)
 {
-    bool const ranged = sensor.numeric != nullptr;
-    return {{"uid", sensor.uid},
-            {"name", sensor.name},
-            {"unit", textOrNull(label(sensor, units))},
-            {"minimum", ranged ? Json(limit(sensor, sensor.numeric->minimum, units)) : Json(nullptr)},
-            {"maximum", ranged ? Json(limit(sensor, sensor.numeric->maximum, units)) : Json(nullptr)}};
+    Json list = Json::array();
+    for (Value const& value : values) {
+        list.push_back({{"uid", value.uid},
+                        {"name", value.name},
+                        {"unit", textOrNull(value.unit)},
+                        {"minimum", value.minimum ? Json(*value.minimum) : Json(nullptr)},
+                        {"maximum", value.maximum ? Json(*value.maximum) : Json(nullptr)}});
+    }
+    return list;
 }
 
-Json toJson(obd::IEcu const& ecu, ListStyle const& style)
+Json laterJson(ModuleOffers::LaterParameter const& later)
+{
+    Json values = Json::array();
+    for (ModuleOffers::LaterValue const& each : later.values) {
+        values.push_back({{"sensor", each.sensor},
+                          {"name", each.name},
+                          {"unit", textOrNull(each.unit)},
+                          {"standing", each.standing}});
+    }
+    return {{"id", fmt::format("{:02X}", later.pid)}, {"name", later.name}, {"values", values}};
+}
+
+Json offerJson(ModuleOffers const& module)
 {
     Json supported;
-    for (Service const& service : services) {
-        supported[std::string(service.title, 2)] = identifiers(ecu, service.mode);
+    for (Service const& service : module.services) {
+        supported[std::string(serviceTitle(service.number), 2)] = identifiers(service);
     }
     Json parameters = Json::array();
-    for (Offer const& offer : offers(style.all)) {
-        Json sensorList = Json::array();
-        for (auto const& sensor : offer.parameter->sensors) {
-            sensorList.push_back(sensorJson(*sensor, style.units));
-        }
-        parameters.push_back({{"id", fmt::format("{:02X}", static_cast<int>(offer.parameter->id))},
-                              {"name", offer.parameter->name},
-                              {"offered", offer.offered},
-                              {"sensors", sensorList}});
+    for (ModuleOffers::Parameter const& parameter : module.parameters) {
+        parameters.push_back({{"id", fmt::format("{:02X}", parameter.pid)},
+                              {"name", parameter.name},
+                              {"offered", parameter.offered},
+                              {"sensors", valuesJson(parameter.values)}});
     }
     Json rest = Json::array();
-    for (unsigned char const pid : undecoded(ecu)) {
-        Json values = Json::array();
-        for (BuiltinPid const& each : laterValues(pid)) {
-            values.push_back({{"sensor", each.signal.id},
-                              {"name", each.signal.name},
-                              {"unit", textOrNull(each.signal.unit)},
-                              {"standing", standingWord(each.standing)}});
-        }
-        rest.push_back({{"id", fmt::format("{:02X}", pid)}, {"name", pidTitle(pid)}, {"values", values}});
+    for (ModuleOffers::LaterParameter const& later : module.further) {
+        rest.push_back(laterJson(later));
     }
-    return {{"id", fmt::format("{:X}", ecu.id())},
-            {"name", textOrNull(ecu.name())},
-            {"description", textOrNull(ecu.description())},
+    return {{"id", fmt::format("{:X}", module.id)},
+            {"name", textOrNull(module.name)},
+            {"description", textOrNull(module.description)},
             {"supported", supported},
             {"parameters", parameters},
             {"undecoded", rest}};
@@ -185,17 +151,13 @@ Json toJson(obd::IEcu const& ecu, ListStyle const& style)
 
 ExitCode sensors(GlobalOptions const& options, bool all)
 {
-    CommandSession session(options);
-    session.connect();
-    session.checkAdapter();
-    ListStyle const style{all, session.units(), outputStyle(options)};
+    CommandCar car(options);
     Json modules = Json::array();
-    for (std::shared_ptr<obd::IEcu> const& ecu : session.selectedModules()) {
-        session.select(*ecu);
+    for (ModuleOffers const& module : car.offers(all)) {
         if (options.json) {
-            modules.push_back(toJson(*ecu, style));
+            modules.push_back(offerJson(module));
         } else {
-            printText(offerText(*ecu, style));
+            printText(offerText(module, all, outputStyle(options)));
         }
     }
     if (options.json) {
@@ -208,11 +170,11 @@ ExitCode sensors(GlobalOptions const& options, bool all)
 
 void addSensorsCommand(CommandLine& commandLine)
 {
-    auto const chosen = std::make_shared<SensorsOptions>();
+    auto const all = std::make_shared<bool>(false);
     CLI::App* const command =
         commandLine.addCommand("sensors", "List what the vehicle offers, by control module",
-                               [chosen](GlobalOptions const& options) { return sensors(options, chosen->all); });
-    command->add_flag("--all", chosen->all, "Also what the vehicle does not offer");
+                               [all](GlobalOptions const& options) { return sensors(options, *all); });
+    command->add_flag("--all", *all, "Also what the vehicle does not offer");
 }
 
 } // namespace velmora::cli

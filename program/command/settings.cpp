@@ -1,7 +1,4 @@
 #include "common/text/layout.h"
-#include "libvelmora/read/sensorlimits.h"
-#include "libvelmora/session/settingsstore.h"
-#include "libvelmora/session/vehiclesettings.h"
 #include "program/command/commands.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
@@ -9,7 +6,7 @@
 #include "program/view/printtext.h"
 #include "program/view/style.h"
 
-#include <velmora/error.h>
+#include <velmora/settingsfile.h>
 
 #include <fmt/format.h>
 
@@ -23,30 +20,23 @@ struct SettingsOptions
     std::string value;
 };
 
-SettingsStore openStore(GlobalOptions const& options)
-{
-    return SettingsStore(options.settingsFile.empty() ? SettingsStore::defaultFile()
-                                                      : std::filesystem::path(options.settingsFile));
-}
+using Setting = SettingsFile::Setting;
 
-Json toJson(VehicleSetting const& setting, SettingsStore& store)
+Json toJson(Setting const& setting)
 {
-    return {{"name", setting.name},
-            {"title", setting.title},
-            {"value", shownSetting(setting, store)},
-            {"unit", textOrNull(setting.unit)},
-            {"range", shownRange(setting)},
-            {"default", shownDefault(setting)},
+    return {{"name", setting.name},   {"title", setting.title},
+            {"value", setting.value}, {"unit", textOrNull(setting.unit)},
+            {"range", setting.range}, {"default", setting.fallback},
             {"key", setting.key}};
 }
 
 constexpr char const* limitPrefix = "limit.";
 
-Json limitJson(std::string const& sensor, SettingsStore& store)
+Json limitJson(std::string const& sensor, SettingsFile& file)
 {
     return {{"name", limitPrefix + sensor},
             {"title", "Limit of " + sensor},
-            {"value", textOrNull(limitText(limitOf(store, sensor)))},
+            {"value", textOrNull(file.limit(sensor))},
             {"unit", nullptr},
             {"range", "highest, or lowest..highest"},
             {"default", nullptr},
@@ -54,82 +44,79 @@ Json limitJson(std::string const& sensor, SettingsStore& store)
 }
 
 // A value of "none" takes the limit away.
-void explainLimit(SettingsOptions const& chosen, SettingsStore& store, GlobalOptions const& options)
+void explainLimit(SettingsOptions const& chosen, SettingsFile& file, GlobalOptions const& options)
 {
-    std::string const sensor = limitKey(chosen.name.substr(std::string(limitPrefix).size()));
+    std::string const sensor = SettingsFile::limitKey(chosen.name.substr(std::string(limitPrefix).size()));
     if (!chosen.value.empty()) {
-        setLimit(store, sensor, chosen.value == "none" ? SensorLimit() : parseLimit(chosen.value));
-        store.sync();
+        file.setLimit(sensor, chosen.value);
     }
     if (options.json) {
-        fmt::print("{}", printed(limitJson(sensor, store)));
+        fmt::print("{}", printed(limitJson(sensor, file)));
         return;
     }
     printText(fmt::format("Limit of {}\n{}{}", sensor,
                           wrapped("In the sensor's metric unit: the highest value, such as 6000, or a range such as "
                                   "11.8..14.8, or none. live marks values outside.",
                                   76, "  "),
-                          labelledLine("Value", limitText(limitOf(store, sensor)))));
+                          labelledLine("Value", file.limit(sensor))));
 }
 
-std::string withUnit(VehicleSetting const& setting, std::string const& value)
+std::string withUnit(Setting const& setting, std::string const& value)
 {
-    return *setting.unit != '\0' ? value + " " + setting.unit : value;
+    return setting.unit.empty() ? value : value + " " + setting.unit;
 }
 
-void list(SettingsStore& store, GlobalOptions const& options)
+void list(SettingsFile& file, GlobalOptions const& options)
 {
     if (options.json) {
         Json document = Json::array();
-        for (VehicleSetting const& setting : vehicleSettings()) {
-            document.push_back(toJson(setting, store));
+        for (Setting const& setting : file.settings()) {
+            document.push_back(toJson(setting));
         }
-        for (std::string const& sensor : limitedSensors(store)) {
-            document.push_back(limitJson(sensor, store));
+        for (std::string const& sensor : file.limitedSensors()) {
+            document.push_back(limitJson(sensor, file));
         }
         fmt::print("{}", printed(document));
         return;
     }
     std::vector<std::vector<Cell>> rows;
-    for (VehicleSetting const& setting : vehicleSettings()) {
-        rows.push_back({{setting.name}, {withUnit(setting, shownSetting(setting, store))}, {shownRange(setting)}});
+    for (Setting const& setting : file.settings()) {
+        rows.push_back({{setting.name}, {withUnit(setting, setting.value)}, {setting.range}});
     }
-    for (std::string const& sensor : limitedSensors(store)) {
-        rows.push_back({{limitPrefix + sensor}, {limitText(limitOf(store, sensor))}, {}});
+    for (std::string const& sensor : file.limitedSensors()) {
+        rows.push_back({{limitPrefix + sensor}, {file.limit(sensor)}, {}});
     }
     printText(fmt::format("{}\n{}\n  velmora settings NAME explains one, velmora settings NAME VALUE sets it\n",
-                          store.file().string(), drawColumns(rows, "  ", outputStyle(options))));
+                          file.path(), drawColumns(rows, "  ", outputStyle(options))));
 }
 
-void explain(VehicleSetting const& setting, SettingsStore& store, GlobalOptions const& options)
+void explain(Setting const& setting, GlobalOptions const& options)
 {
     if (options.json) {
-        fmt::print("{}", printed(toJson(setting, store)));
+        fmt::print("{}", printed(toJson(setting)));
         return;
     }
     printText(fmt::format("{}\n{}{}{}{}", setting.title, wrapped(setting.explanation, 76, "  ", outputStyle(options)),
-                          labelledLine("Value", withUnit(setting, shownSetting(setting, store))),
-                          labelledLine("Range", withUnit(setting, shownRange(setting))),
-                          labelledLine("Default", withUnit(setting, shownDefault(setting)))));
+                          labelledLine("Value", withUnit(setting, setting.value)),
+                          labelledLine("Range", withUnit(setting, setting.range)),
+                          labelledLine("Default", withUnit(setting, setting.fallback))));
 }
 
 ExitCode settings(SettingsOptions const& chosen, GlobalOptions const& options)
 {
-    SettingsStore store = openStore(options);
+    SettingsFile file(options.settingsFile);
     if (chosen.name.empty()) {
-        list(store, options);
+        list(file, options);
         return ExitCode::Done;
     }
     if (chosen.name.starts_with(limitPrefix)) {
-        explainLimit(chosen, store, options);
+        explainLimit(chosen, file, options);
         return ExitCode::Done;
     }
-    VehicleSetting const& setting = findSetting(chosen.name);
     if (!chosen.value.empty()) {
-        setSetting(setting, chosen.value, store);
-        store.sync();
+        file.set(chosen.name, chosen.value);
     }
-    explain(setting, store, options);
+    explain(file.setting(chosen.name), options);
     return ExitCode::Done;
 }
 

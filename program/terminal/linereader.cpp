@@ -1,7 +1,5 @@
 #include "program/terminal/linereader.h"
 
-#include "libvelmora/session/session.h"
-
 #include <poll.h>
 #include <termios.h>
 #include <unistd.h>
@@ -29,9 +27,9 @@ bool LineReader::fill()
 {
     pollfd input{STDIN_FILENO, POLLIN, 0};
     while (::poll(&input, 1, 100) <= 0) {
-        m_session.check();
+        m_check();
     }
-    m_session.check();
+    m_check();
     char bytes[512];
     ssize_t const count = ::read(STDIN_FILENO, bytes, sizeof bytes);
     if (count > 0) {

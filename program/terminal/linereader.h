@@ -1,10 +1,8 @@
 #pragma once
 
+#include <functional>
 #include <string>
-
-namespace velmora {
-class Session;
-}
+#include <utility>
 
 namespace velmora::cli {
 
@@ -12,15 +10,16 @@ namespace velmora::cli {
 class LineReader
 {
 public:
-    explicit LineReader(Session const& session) : m_session(session) {}
+    // check is called some times a second while there is no line; it throws what ends the waiting.
+    explicit LineReader(std::function<void()> check) : m_check(std::move(check)) {}
 
-    // False at the end of the input. Throws Error if the link breaks or the user interrupts meanwhile.
+    // False at the end of the input. Throws what check does.
     bool read(std::string& line);
 
 private:
     bool fill();
 
-    Session const& m_session;
+    std::function<void()> const m_check;
     std::string m_buffer;
 };
 

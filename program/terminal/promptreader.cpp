@@ -1,6 +1,5 @@
 #include "program/terminal/promptreader.h"
 
-#include "libvelmora/session/session.h"
 #include "program/terminal/interrupt.h"
 #include "program/terminal/output.h"
 
@@ -11,6 +10,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <unistd.h>
+#include <utility>
 
 namespace velmora::cli {
 
@@ -25,7 +25,7 @@ bool PromptReader::isUsable()
     return ::isatty(STDIN_FILENO) != 0 && canRedraw();
 }
 
-PromptReader::PromptReader(Session const& session) : m_session(session)
+PromptReader::PromptReader(std::function<void()> check) : m_check(std::move(check))
 {
     Interrupt::instance().setLastAct([this] { m_keys.restore(); });
 }
@@ -53,7 +53,7 @@ LineEditor::State PromptReader::typeOn()
 {
     constexpr std::chrono::milliseconds step{100};
     while (true) {
-        m_session.check();
+        m_check();
         std::optional<Key> const key = m_keys.read(step);
         LineEditor::State const state = key ? m_editor.press(*key) : LineEditor::State::Typing;
         if (m_keys.ended()) {

@@ -3,11 +3,8 @@
 #include "program/terminal/keyinput.h"
 #include "program/terminal/lineeditor.h"
 
+#include <functional>
 #include <string>
-
-namespace velmora {
-class Session;
-}
 
 namespace velmora::cli {
 
@@ -22,19 +19,20 @@ public:
     // Whether standard error is such a terminal.
     static bool canRedraw();
 
-    explicit PromptReader(Session const& session);
+    // check is called some times a second while nothing is typed; it throws what ends the waiting.
+    explicit PromptReader(std::function<void()> check);
     ~PromptReader();
     PromptReader(PromptReader const&) = delete;
     PromptReader& operator=(PromptReader const&) = delete;
 
-    // False if the user ends the input. Throws Error if the link breaks or the user interrupts meanwhile.
+    // False if the user ends the input. Throws what check does.
     bool read(std::string& line);
 
 private:
     LineEditor::State typeOn();
     void draw() const;
 
-    Session const& m_session;
+    std::function<void()> const m_check;
     KeyInput m_keys;
     LineEditor m_editor;
 };

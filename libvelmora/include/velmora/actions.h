@@ -60,6 +60,13 @@ struct ClearReport
     std::string reason; ///< of a refusal
 };
 
+/// Throws Error unless a module has cleared its codes: Refused if one refused, else VehicleSilent.
+VELMORA_EXPORT void requireCleared(std::vector<ModuleTopic<ClearReport>> const& modules);
+/// Throws Error if any module refused, with what it said, and as requireCleared does.
+VELMORA_EXPORT void requireAllCleared(std::vector<ModuleTopic<ClearReport>> const& modules);
+/// Throws Error unless the module said that it runs the routine.
+VELMORA_EXPORT void requireAccepted(RoutineRun const& run);
+
 /// "01 Evaporative system leak test"
 VELMORA_EXPORT std::ostream& operator<<(std::ostream& out, Routine const& routine);
 /// A line for each routine, or why there are none.

@@ -4,6 +4,8 @@
 #include <velmora/error.h>
 #include <velmora/export.h>
 #include <velmora/iport.h>
+#include <velmora/modules.h>
+#include <velmora/offers.h>
 #include <velmora/reading.h>
 #include <velmora/report.h>
 #include <velmora/units.h>
@@ -11,6 +13,7 @@
 #include <functional>
 #include <memory>
 #include <optional>
+#include <stop_token>
 #include <string>
 #include <vector>
 
@@ -21,6 +24,7 @@ class IObdVelmora;
 namespace velmora {
 
 class CarCore;
+class Recorder;
 class WatchState;
 
 /// How a car is to be reached. What stays empty comes from the settings file, or is the default.
@@ -29,8 +33,9 @@ class WatchState;
 struct CarOptions
 {
     std::string port = {}; ///< as the program's --port takes it: "192.168.0.10:35000", "sim:petrol-can11"
-    std::optional<unsigned int> baud = {};   ///< line rate of a serial port
-    std::optional<int> protocol = {};        ///< the adapter's number of the bus, 1 to 9; searched for if empty
+    std::optional<unsigned int> baud = {}; ///< line rate of a serial port
+    /// The adapter's number of the bus, 1 to 9, or 0 to search for it whatever the settings say.
+    std::optional<int> protocol = {};
     std::optional<Units> units = {};         ///< that values are told in
     std::optional<unsigned int> module = {}; ///< id of the one control module to ask; all of them if empty
     bool reset = false;                      ///< restore and reset the adapter before use
@@ -47,6 +52,20 @@ struct CarOptions
     /// Opens a transport of the application's own in place of `port`; throws Error if it can't. Called for each
     /// connection, on the car's thread.
     std::function<std::unique_ptr<IPort>()> openPort = {};
+
+    /// Ends what the car is at, connecting too, for good: that, and whatever is asked later, throws Error of the kind
+    /// Interrupted. Any thread may ask for it.
+    std::stop_token stop = {};
+    /// What was found on the way, as lines with their line feeds. On the car's thread.
+    std::function<void(std::string const&)> onDetail = {};
+    /// What the opening is at, some times a second: a short text for a line that is drawn anew; empty at its end. On
+    /// the car's thread.
+    std::function<void(std::string const&)> onPhase = {};
+    /// Gets the name of logFile or traceFile if it could not be written to its end, as the connection closes. On the
+    /// car's thread.
+    std::function<void(std::string const&)> onUnwritten = {};
+    /// Takes down all that passes the port, from the connection on; see <velmora/recorder.h>.
+    std::shared_ptr<Recorder> recorder = {};
 };
 
 /// A control module that answers.
@@ -134,8 +153,13 @@ public:
     std::vector<StoredCode> codes();
     /// Lamp and each list of codes, with how asking for it went.
     std::vector<ModuleTopic<CodeReport>> codeReports();
+    /// The same for some lists alone, with what that maker means by the codes; maker as findMaker of
+    /// <velmora/catalogue.h> gives it, or empty for that of the vehicle identification number.
+    std::vector<ModuleTopic<CodeReport>> codeReports(std::vector<CodeKind> const& kinds, std::string const& maker = {});
     /// Of all control modules, the newest frame as a rule being 0.
     std::vector<ModuleTopic<FreezeReport>> freezeFrame(unsigned char frame = 0);
+    /// The same with what that maker means by the code, as for codeReports.
+    std::vector<ModuleTopic<FreezeReport>> freezeFrame(unsigned char frame, std::string const& maker);
     /// The monitors that an emissions test asks for.
     std::vector<ModuleTopic<ReadinessReport>> readiness();
     /// The results of on-board tests. Asks once for each monitor, which takes seconds.
@@ -148,6 +172,18 @@ public:
     std::vector<ModuleTopic<InfoReport>> info();
     /// The control modules that are asked: all that answered, or the one that CarOptions names.
     std::vector<Module> modules();
+    /// The control modules beyond OBD: on CAN looked for once, which takes half a minute with the vehicle standing, and
+    /// remembered by its VIN. Only reads, but asks identifiers that no driver asks. Throws Error if the vehicle moves.
+    std::vector<FoundModule> findModules(ModuleSearch const& search = {});
+    /// What the modules that are asked tell by the identifiers of ISO 14229 and ISO 14230; none of one that can't be
+    /// asked alone.
+    std::vector<ModuleTopic<ModuleIdentifiers>> identifiers();
+    /// Trouble codes by service 19, or 18, also of the modules that findModules has found. maker as for codeReports.
+    /// Throws Error on a bus that has neither.
+    std::vector<UdsModuleReport> udsCodes(std::string const& maker = {});
+    /// What each module offers, by what it said when it was met. all: also what the library decodes and the module does
+    /// not offer.
+    std::vector<ModuleOffers> offers(bool all = false);
     /// What read and watch can read.
     std::vector<Sensor> sensors();
     /// Measures the supply voltage, too.
@@ -156,12 +192,18 @@ public:
     ProtocolReport protocol();
     /// All of the above but readings. Takes seconds.
     VehicleReport report();
+    /// The same with what that maker means by the codes, as for codeReports.
+    VehicleReport report(std::string const& maker);
+    /// Asks for each sensor of each module once, so that a recording holds them all.
+    void askSensors();
 
     /// Clears the confirmed and pending codes of all control modules, whichever CarOptions::module names, and turns the
     /// lamp off. Also erases freeze frames, readiness, test results, and the distance and time since the last clearing:
     /// the vehicle must be driven before it can pass an emissions test. Asks nothing back. Gives what each module said;
     /// throws Error if none cleared its codes: Refused if one refused, else VehicleSilent.
     std::vector<ModuleTopic<ClearReport>> clearCodes();
+    /// The same, but throws only if the link is lost or the car was stopped: what each module said is in the reports.
+    std::vector<ModuleTopic<ClearReport>> tryClearCodes();
 
     /// The on-board test routines that can be run.
     std::vector<ModuleTopic<RoutinesReport>> routines();
@@ -169,9 +211,19 @@ public:
     /// nobody near moving or hot parts. Asks nothing back. Throws Error if no module offers it, or if the module
     /// refuses or does not say that it runs it.
     ModuleTopic<RoutineRun> runRoutine(int id);
+    /// The same, but what the module said is in the report, a refusal too.
+    ModuleTopic<RoutineRun> tryRoutine(int id);
+    /// What runRoutine would run, and on which module. Asks the vehicle nothing. Throws Error if no module offers it.
+    ModuleTopic<Routine> findRoutine(int id);
 
     /// Connects anew after a loss.
     void reconnect();
+    /// Throws Error if the link is lost, the adapter has fallen silent, or the car was stopped. Asks nothing.
+    void check();
+    /// The adapter's word for it that the last request brought nothing, such as "CAN ERROR"; empty for none.
+    std::string trouble();
+    /// The port's address as it was found, for messages and reports.
+    std::string port();
 
     /// The rest of the core: runs a function on the car's thread, the one that dispatches, with the top-level object
     /// of <obd/obd.h>. What it makes there must be gone when it returns. An exception comes back to the caller.

@@ -1,0 +1,88 @@
+// The bare dialogue with an adapter; see <velmora/console.h>.
+
+#include "libvelmora/car/caroptions.h"
+#include "libvelmora/car/sessionend.h"
+#include "libvelmora/text/text.h"
+
+#include <obd/idataconnection.h>
+#include <velmora/console.h>
+
+#include <chrono>
+
+namespace velmora {
+
+namespace {
+
+constexpr std::chrono::seconds adapterLimit{5};
+constexpr std::chrono::seconds vehicleLimit{30}; // a search for the bus takes that long
+constexpr int stepMs = 100;
+
+AdapterConsole::Answer answerOf(std::vector<unsigned char> const& message, std::string const& command)
+{
+    AdapterConsole::Answer answer{true, adapterLines({message.begin(), message.end()})};
+    if (!answer.lines.empty() && answer.lines.front() == command) {
+        answer.lines.erase(answer.lines.begin());
+    }
+    return answer;
+}
+
+} // namespace
+
+class ConsoleParts
+{
+public:
+    explicit ConsoleParts(CarOptions const& options)
+        : session(sessionOptions(options)), end(session, options), connection(session.connectToPort())
+    {
+        connection->setDelimiter('>');
+    }
+
+    bool await(std::vector<unsigned char>& message, std::chrono::steady_clock::duration limit)
+    {
+        auto const until = std::chrono::steady_clock::now() + limit;
+        while (std::chrono::steady_clock::now() < until) {
+            session.check();
+            if (connection->receive(message, stepMs)) {
+                return true;
+            }
+        }
+        return false;
+    }
+
+    Session session;
+    SessionEnd end;
+    std::shared_ptr<obd::IDataConnection> connection;
+};
+
+AdapterConsole::AdapterConsole(CarOptions const& options) : m_parts(std::make_unique<ConsoleParts>(options)) {}
+
+AdapterConsole::~AdapterConsole() = default;
+
+AdapterConsole::Answer AdapterConsole::ask(std::string const& command)
+{
+    std::vector<unsigned char> message;
+    while (m_parts->connection->receive(message, 0)) {
+        // what came unasked belongs to nothing
+    }
+    std::string const sent = command + "\r";
+    m_parts->connection->send({sent.begin(), sent.end()});
+    bool const ofAdapter = toUpper(command).starts_with("AT") || toUpper(command).starts_with("ST");
+    if (m_parts->await(message, ofAdapter ? adapterLimit : vehicleLimit)) {
+        return answerOf(message, command);
+    }
+    // An adapter that shows traffic without end stops at any character. A CR would repeat a command that was done.
+    m_parts->connection->send({' '});
+    return m_parts->await(message, adapterLimit) ? answerOf(message, command) : Answer{};
+}
+
+void AdapterConsole::check() const
+{
+    m_parts->session.check();
+}
+
+std::string AdapterConsole::port() const
+{
+    return m_parts->session.port();
+}
+
+} // namespace velmora

@@ -1,0 +1,263 @@
+// What the program asks of a car beside its topics: to stop, to be recorded, to tell of its files and of its port.
+
+#include "tests/support/temporaryfolder.h"
+
+#include <velmora/car.h>
+#include <velmora/console.h>
+#include <velmora/doctor.h>
+#include <velmora/recorder.h>
+#include <velmora/settingsfile.h>
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <fstream>
+#include <sstream>
+
+namespace {
+
+using velmora::Car;
+using velmora::CarOptions;
+using velmora::CodeKind;
+using velmora::CodeList;
+using velmora::Error;
+using velmora::ErrorKind;
+
+CarOptions instantCar(std::string const& vehicle)
+{
+    CarOptions options;
+    options.port = "sim:" + vehicle + "?instant";
+    options.settingsFile = "/proc/nonexistent/settings.toml";
+    return options;
+}
+
+template <typename Function>
+ErrorKind kindThrown(Function const& function)
+{
+    try {
+        function();
+    } catch (Error const& error) {
+        return error.kind();
+    }
+    ADD_FAILURE() << "nothing was thrown";
+    return ErrorKind::Failed;
+}
+
+std::string wholeFile(std::string const& file)
+{
+    std::ostringstream text;
+    text << std::ifstream(file).rdbuf();
+    return text.str();
+}
+
+TEST(CarFace, AWishToStopEndsWhatItIsAtForGood)
+{
+    std::stop_source stop;
+    CarOptions options = instantCar("petrol-can11");
+    options.stop = stop.get_token();
+    Car car(options);
+    EXPECT_NO_THROW(car.check());
+    EXPECT_EQ(car.port(), "sim:petrol-can11?instant");
+    EXPECT_EQ(car.trouble(), "");
+    stop.request_stop();
+    EXPECT_EQ(kindThrown([&] { car.check(); }), ErrorKind::Interrupted);
+    EXPECT_EQ(kindThrown([&] { car.codeReports(); }), ErrorKind::Interrupted);
+    EXPECT_EQ(kindThrown([&] { car.reconnect(); }), ErrorKind::Interrupted);
+}
+
+TEST(CarFace, AWishToStopThatCameBeforeEndsTheConnecting)
+{
+    std::stop_source stop;
+    stop.request_stop();
+    CarOptions options = instantCar("petrol-can11");
+    options.stop = stop.get_token();
+    EXPECT_EQ(kindThrown([&] { Car const car(options); }), ErrorKind::Interrupted);
+}
+
+TEST(CarFace, GivesChosenListsTheMeaningsOfANamedMaker)
+{
+    Car car(instantCar("petrol-can11"));
+    auto const pending = car.codeReports({CodeKind::Pending});
+    ASSERT_EQ(pending.size(), 2U);
+    ASSERT_EQ(pending[0].report.lists.size(), 1U);
+    EXPECT_EQ(pending[0].report.lists[0].kind, CodeKind::Pending);
+    auto const named = car.codeReports({CodeKind::Confirmed}, "Ford");
+    EXPECT_EQ(named[0].report.maker.by, velmora::MakerChoice::By::Option);
+    EXPECT_EQ(named[0].report.maker.maker, "Ford");
+
+    auto const routine = car.findRoutine(1);
+    EXPECT_EQ(routine.id, 0x7E8U);
+    EXPECT_EQ(routine.report.name, "Evaporative system leak test");
+    EXPECT_EQ(kindThrown([&] { car.findRoutine(0x7F); }), ErrorKind::NotSupported);
+    EXPECT_EQ(car.tryRoutine(1).report.result, velmora::RoutineRun::Result::Accepted);
+
+    auto const cleared = car.tryClearCodes();
+    ASSERT_FALSE(cleared.empty());
+    EXPECT_NO_THROW(velmora::requireAllCleared(cleared));
+    auto refused = cleared;
+    refused.back().report = {velmora::ClearReport::Result::Refused, "conditions not correct (22)"};
+    EXPECT_NO_THROW(velmora::requireCleared(refused)) << "one has cleared its codes";
+    EXPECT_EQ(kindThrown([&] { velmora::requireAllCleared(refused); }), ErrorKind::Refused);
+}
+
+TEST(CarFace, TellsWhatEachModuleOffers)
+{
+    Car car(instantCar("petrol-can11"));
+    auto const offers = car.offers();
+    ASSERT_EQ(offers.size(), 2U);
+    EXPECT_EQ(offers[0].name, "ECM");
+    ASSERT_EQ(offers[0].services.size(), 4U);
+    EXPECT_EQ(offers[0].services[0].number, 1);
+    EXPECT_EQ(offers[0].services[0].answer, velmora::TopicAnswer::Read);
+    auto const& ids = offers[0].services[0].identifiers;
+    EXPECT_TRUE(std::is_sorted(ids.begin(), ids.end()));
+    EXPECT_NE(std::find(ids.begin(), ids.end(), 0x0CU), ids.end());
+    EXPECT_EQ(std::find(ids.begin(), ids.end(), 0x20U), ids.end()) << "only tells of the next range";
+    auto const& parameters = offers[0].parameters;
+    auto const speed =
+        std::find_if(parameters.begin(), parameters.end(), [](auto const& each) { return each.pid == 0x0D; });
+    ASSERT_NE(speed, parameters.end());
+    EXPECT_TRUE(speed->offered);
+    ASSERT_EQ(speed->values.size(), 1U);
+    EXPECT_EQ(speed->values[0].unit, "km/h");
+    EXPECT_EQ(speed->values[0].maximum, 255);
+    EXPECT_GT(car.offers(true)[0].parameters.size(), parameters.size());
+}
+
+TEST(CarFace, TellsTheModulesOfAKLineByIso14230)
+{
+    Car car(instantCar("petrol-kwp-fast"));
+    auto const modules = car.findModules({true, true});
+    ASSERT_EQ(modules.size(), 2U);
+    EXPECT_EQ(modules[0].request, "8011F1");
+    EXPECT_EQ(modules[0].codes, 1U);
+    auto const codes = car.udsCodes();
+    ASSERT_EQ(codes.size(), 2U);
+    EXPECT_TRUE(codes[0].byService18);
+    ASSERT_EQ(codes[0].codes.size(), 1U);
+    EXPECT_EQ(codes[0].codes[0].hex, "0420");
+    EXPECT_EQ(codes[0].codes[0].meaning, "") << "nobody says that the number is one of SAE J2012";
+    EXPECT_NE(toText(codes, {}).find("0420  status E8"), std::string::npos);
+    EXPECT_NE(toJson(codes).find("\"byService18\""), std::string::npos);
+    EXPECT_NE(toText(modules, {}).find("8011F1"), std::string::npos);
+    auto const told = car.identifiers();
+    ASSERT_EQ(told.size(), 2U);
+    EXPECT_EQ(told[0].report.at(0x1A90), "VELMRAK1M70000004");
+}
+
+TEST(CarFace, IsRecordedWithoutItsVinAndWithoutItsEnd)
+{
+    testsupport::TemporaryFolder const folder;
+    std::string const file = folder.file("car.dialogue");
+    auto const recorder = std::make_shared<velmora::Recorder>(file);
+    EXPECT_EQ(kindThrown([&] { velmora::Recorder const second(file); }), ErrorKind::WrongUse);
+    std::string vin;
+    {
+        CarOptions options = instantCar("petrol-can11");
+        options.recorder = recorder;
+        options.sleep = true;
+        Car car(options);
+        vin = car.info()[0].report.vin;
+        car.askSensors();
+    }
+    EXPECT_GT(recorder->save("test\ncar"), 20U);
+    std::string const text = wholeFile(file);
+    EXPECT_NE(text.find("test car"), std::string::npos) << "on one line";
+    EXPECT_NE(text.find("ELM327"), std::string::npos) << "the adapter names itself";
+    EXPECT_EQ(text.find("ATLP"), std::string::npos) << "closing is no part of it";
+
+    Car replayed([&] {
+        CarOptions options = instantCar("petrol-can11");
+        options.port = "replay:" + file;
+        return options;
+    }());
+    EXPECT_EQ(replayed.info()[0].report.vin, vin.substr(0, 11) + "000000");
+    EXPECT_EQ(replayed.read({"RPM"}).size(), 1U);
+
+    std::string const unsaved = folder.file("none.dialogue");
+    {
+        velmora::Recorder nothing(unsaved);
+        EXPECT_EQ(nothing.save("car"), 0U);
+    }
+    EXPECT_FALSE(std::filesystem::exists(unsaved));
+}
+
+TEST(CarFace, TellsOfAFileThatItCouldNotWrite)
+{
+    std::vector<std::string> unwritten;
+    CarOptions options = instantCar("petrol-can11");
+    options.traceFile = "/dev/full";
+    options.onUnwritten = [&unwritten](std::string const& file) { unwritten.push_back(file); };
+    {
+        Car const car(options);
+    }
+    EXPECT_EQ(unwritten, std::vector<std::string>{"/dev/full"});
+}
+
+TEST(CarFace, TakesTheSearchForABusInPlaceOfTheSettings)
+{
+    testsupport::TemporaryFolder const folder;
+    CarOptions options = instantCar("petrol-can11");
+    options.protocol = 10;
+    EXPECT_EQ(kindThrown([&] { Car const car(options); }), ErrorKind::WrongUse);
+    options.protocol = 0;
+    Car car(options);
+    EXPECT_EQ(car.protocol().number, 6);
+}
+
+TEST(DoctorFace, ExaminesAndBundlesWithoutTheVin)
+{
+    testsupport::TemporaryFolder const folder;
+    std::string const file = folder.file("bundle.txt");
+    velmora::Doctor::checkBundle(file);
+    velmora::Doctor const doctor(instantCar("petrol-can11"));
+    EXPECT_NE(doctor.toText().find("adapter"), std::string::npos);
+    EXPECT_EQ(doctor.toJson().front(), '{');
+    doctor.saveBundle(file);
+    EXPECT_EQ(kindThrown([&] { velmora::Doctor::checkBundle(file); }), ErrorKind::WrongUse);
+    EXPECT_NO_THROW(velmora::Doctor::checkBundle(file, true));
+    EXPECT_EQ(wholeFile(file), doctor.bundle());
+    EXPECT_NE(doctor.bundle(true), doctor.bundle()) << "the VIN";
+}
+
+TEST(ConsoleFace, GivesWhatTheAdapterSays)
+{
+    std::stop_source stop;
+    CarOptions options = instantCar("petrol-can11");
+    options.stop = stop.get_token();
+    velmora::AdapterConsole console(options);
+    auto const answer = console.ask("ATI");
+    EXPECT_TRUE(answer.complete);
+    ASSERT_EQ(answer.lines.size(), 1U) << "without its echo";
+    EXPECT_EQ(answer.lines[0].substr(0, 6), "ELM327");
+    EXPECT_EQ(console.port(), "sim:petrol-can11?instant");
+    stop.request_stop();
+    EXPECT_EQ(kindThrown([&] { console.ask("ATI"); }), ErrorKind::Interrupted);
+    EXPECT_EQ(kindThrown([&] { console.check(); }), ErrorKind::Interrupted);
+}
+
+TEST(SettingsFace, SetsAndTellsSettingsAndLimits)
+{
+    testsupport::TemporaryFolder const folder;
+    std::string const path = folder.file("settings.toml");
+    {
+        velmora::SettingsFile file(path);
+        EXPECT_EQ(file.path(), path);
+        EXPECT_EQ(file.setting("displacement").value, "2.00");
+        file.set("displacement", "1.6");
+        EXPECT_EQ(kindThrown([&] { file.set("displacement", "99"); }), ErrorKind::WrongUse);
+        EXPECT_EQ(kindThrown([&] { file.setting("nothing"); }), ErrorKind::WrongUse);
+        file.setLimit(velmora::SettingsFile::limitKey("0C"), "6000");
+    }
+    velmora::SettingsFile file(path);
+    EXPECT_EQ(file.setting("displacement").value, "1.60");
+    EXPECT_EQ(file.setting("displacement").unit, "l");
+    EXPECT_GT(file.settings().size(), 4U);
+    ASSERT_EQ(file.limitedSensors(), std::vector<std::string>{"RPM"});
+    EXPECT_EQ(file.limit("RPM"), "..6000");
+    file.setLimit("RPM", "none");
+    EXPECT_TRUE(file.limitedSensors().empty());
+    EXPECT_EQ(kindThrown([&] { file.setLimit("RPM", "many"); }), ErrorKind::WrongUse);
+}
+
+} // namespace
