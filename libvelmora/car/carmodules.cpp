@@ -36,8 +36,8 @@ std::vector<FoundModule> scanForModules(Session& session, ModuleAsker& asker)
     return modules;
 }
 
-// Before CAN, modules beyond those that the connection has started each need a start of their own, which would end
-// it.
+// On legacy buses, modules beyond those that the connection has started each need a start of their own, which would
+// end it.
 std::vector<FoundModule> modulesOfConnection(Session& session)
 {
     session.tellProgress("On this bus those that the connection has started; others would need a start of their own\n");

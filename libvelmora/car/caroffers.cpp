@@ -38,8 +38,7 @@ int shownEnd(obd::SensorDataModel const& sensor, int number, Units units)
 
 ModuleOffers::Value offeredValue(obd::SensorDataModel const& sensor, Units units)
 {
-    ModuleOffers::Value value{
-        sensor.uid, sensor.name, labelInUnits(unitLabel(sensor.uid, sensor.unit), sensor.unit, units), {}, {}};
+    ModuleOffers::Value value{sensor.uid, sensor.name, sensorUnit(sensor.uid, sensor.unit, units), {}, {}};
     if (sensor.numeric != nullptr) {
         value.minimum = shownEnd(sensor, sensor.numeric->minimum, units);
         value.maximum = shownEnd(sensor, sensor.numeric->maximum, units);
@@ -91,6 +90,11 @@ void addParameters(ModuleOffers& offers, obd::IEcu const& ecu, Units units, bool
 }
 
 } // namespace
+
+char const* sensorUnit(int uid, MeasurementUnit unit, Units units)
+{
+    return labelInUnits(unitLabel(uid, unit), unit, units);
+}
 
 std::vector<ModuleOffers> readOffers(Session& session, bool all)
 {

@@ -1,4 +1,3 @@
-#include "libvelmora/read/sensorlimits.h"
 #include "libvelmora/session/settingsstore.h"
 #include "libvelmora/session/vehiclesettings.h"
 
@@ -48,24 +47,27 @@ void SettingsFile::set(std::string const& name, std::string const& value)
     m_store->sync();
 }
 
-std::vector<std::string> SettingsFile::limitedSensors() const
+std::optional<std::string> SettingsFile::text(std::string const& key) const
 {
-    return velmora::limitedSensors(*m_store);
+    std::string text;
+    return m_store->getString(key, text) ? std::optional(text) : std::nullopt;
 }
 
-std::string SettingsFile::limitKey(std::string const& sensor)
+std::optional<int> SettingsFile::number(std::string const& key) const
 {
-    return velmora::limitKey(sensor);
+    int number = 0;
+    return m_store->getInt(key, number) ? std::optional(number) : std::nullopt;
 }
 
-std::string SettingsFile::limit(std::string const& key) const
+void SettingsFile::setText(std::string const& key, std::string const& text)
 {
-    return limitText(limitOf(*m_store, key));
+    m_store->setString(key, text);
+    m_store->sync();
 }
 
-void SettingsFile::setLimit(std::string const& key, std::string const& limit)
+void SettingsFile::setNumber(std::string const& key, int number)
 {
-    velmora::setLimit(*m_store, key, limit == "none" ? SensorLimit() : parseLimit(limit));
+    m_store->setInt(key, number);
     m_store->sync();
 }
 

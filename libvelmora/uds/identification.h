@@ -28,10 +28,6 @@ struct IdentifierRow
 // F180 to F19F, in rising order.
 std::vector<IdentifierRow> const& standardIdentifiers();
 
-// The data of such an identifier for people: text, "2023-05-17", "default session"; hexadecimal for what can't be read
-// as what it should be. Empty for data that is filling only.
-std::string identifierText(unsigned int did, std::vector<unsigned char> const& data);
-
 // The data of a local identifier of service 1A: text, or hexadecimal where it is none.
 std::string localIdentifierText(std::vector<unsigned char> const& data);
 

@@ -1,12 +1,4 @@
 #pragma once
 
 #include <obd/iobdproxy.h>
-
-#include <string>
-
-namespace velmora {
-
-// The VIN by service 09, of the first module that tells one; empty if none does.
-std::string vehicleVin(obd::IObdProxy& proxy);
-
-} // namespace velmora
+#include <velmora/vin.h>

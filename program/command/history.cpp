@@ -1,6 +1,5 @@
 #include "common/text/layout.h"
 #include "common/text/text.h"
-#include "libvelmora/record/checkedfile.h"
 #include "program/command/commands.h"
 #include "program/command/confirm.h"
 #include "program/commandline.h"
@@ -12,6 +11,7 @@
 #include <velmora/document.h>
 #include <velmora/error.h>
 #include <velmora/history.h>
+#include <velmora/settingsfile.h>
 
 #include <fmt/format.h>
 

@@ -1,11 +1,11 @@
 #include "program/command/keepscan.h"
 
-#include "libvelmora/session/settingsstore.h"
 #include "program/command/confirm.h"
 #include "program/terminal/output.h"
 
 #include <velmora/error.h>
 #include <velmora/history.h>
+#include <velmora/settingsfile.h>
 #include <velmora/version.h>
 
 #include <fmt/format.h>
@@ -37,30 +37,23 @@ bool hasTerminal()
     return ::isatty(STDIN_FILENO) != 0 && ::isatty(STDERR_FILENO) != 0;
 }
 
-SettingsStore openSettings(GlobalOptions const& options)
-{
-    return SettingsStore(options.settingsFile.empty() ? SettingsStore::defaultFile()
-                                                      : std::filesystem::path(options.settingsFile));
-}
-
-void remember(SettingsStore& store, bool keep)
+void remember(SettingsFile& settings, bool keep)
 {
     try {
-        store.setInt(keepKey, keep ? 1 : 0);
-        store.sync();
+        settings.setNumber(keepKey, keep ? 1 : 0);
     } catch (Error const& error) {
         tell(fmt::format("velmora: the answer is not remembered: {}\n", error.what()));
     }
 }
 
-bool ask(SettingsStore& store, GlobalOptions const& options)
+bool ask(SettingsFile& settings, GlobalOptions const& options)
 {
     std::string const what = fmt::format(
         "velmora can keep each scan, by the vehicle's identification number, to tell later what has changed:\n"
         "  {}\nNothing leaves this machine. velmora history shows, exports and forgets it.\n",
         History::defaultFile());
     bool const keep = confirmed(options, what, "Keep this scan and those to come?");
-    remember(store, keep);
+    remember(settings, keep);
     tell(keep ? "" : "Nothing is kept; scan --history keeps a single one.\n");
     return keep;
 }
@@ -76,15 +69,15 @@ bool decidesToKeep(KeepWish& wish, GlobalOptions const& options)
     if (!wish.keep && !mayAsk) {
         return false;
     }
-    SettingsStore store = openSettings(options);
+    SettingsFile settings(options.settingsFile);
     if (wish.vehicle.empty()) {
-        store.getString(nameKey, wish.vehicle);
+        wish.vehicle = settings.text(nameKey).value_or(std::string());
     }
-    int kept = 0;
-    if (wish.keep || store.getInt(keepKey, kept)) {
-        return wish.keep || kept != 0;
+    std::optional<int> const kept = settings.number(keepKey);
+    if (wish.keep || kept) {
+        return wish.keep || *kept != 0;
     }
-    return !options.yes && ask(store, options); // who wants no questions has not said yes to this one
+    return !options.yes && ask(settings, options); // who wants no questions has not said yes to this one
 }
 
 void keepScan(VehicleReport const& report, KeepWish const& wish, GlobalOptions const& options)

@@ -6,6 +6,7 @@
 #include "program/view/printtext.h"
 #include "program/view/style.h"
 
+#include <velmora/limits.h>
 #include <velmora/settingsfile.h>
 
 #include <fmt/format.h>
@@ -32,11 +33,11 @@ Json toJson(Setting const& setting)
 
 constexpr char const* limitPrefix = "limit.";
 
-Json limitJson(std::string const& sensor, SettingsFile& file)
+Json limitJson(std::string const& sensor, SensorLimits const& limits)
 {
     return {{"name", limitPrefix + sensor},
             {"title", "Limit of " + sensor},
-            {"value", textOrNull(file.limit(sensor))},
+            {"value", textOrNull(limitText(limits.of(sensor)))},
             {"unit", nullptr},
             {"range", "highest, or lowest..highest"},
             {"default", nullptr},
@@ -44,21 +45,22 @@ Json limitJson(std::string const& sensor, SettingsFile& file)
 }
 
 // A value of "none" takes the limit away.
-void explainLimit(SettingsOptions const& chosen, SettingsFile& file, GlobalOptions const& options)
+void explainLimit(SettingsOptions const& chosen, GlobalOptions const& options)
 {
-    std::string const sensor = SettingsFile::limitKey(chosen.name.substr(std::string(limitPrefix).size()));
+    SensorLimits limits(options.settingsFile);
+    std::string const sensor = limitKey(chosen.name.substr(std::string(limitPrefix).size()));
     if (!chosen.value.empty()) {
-        file.setLimit(sensor, chosen.value);
+        limits.set(sensor, chosen.value == "none" ? SensorLimit() : parseLimit(chosen.value));
     }
     if (options.json) {
-        fmt::print("{}", printed(limitJson(sensor, file)));
+        fmt::print("{}", printed(limitJson(sensor, limits)));
         return;
     }
     printText(fmt::format("Limit of {}\n{}{}", sensor,
                           wrapped("In the sensor's metric unit: the highest value, such as 6000, or a range such as "
                                   "11.8..14.8, or none. live marks values outside.",
                                   76, "  "),
-                          labelledLine("Value", file.limit(sensor))));
+                          labelledLine("Value", limitText(limits.of(sensor)))));
 }
 
 std::string withUnit(Setting const& setting, std::string const& value)
@@ -66,15 +68,16 @@ std::string withUnit(Setting const& setting, std::string const& value)
     return setting.unit.empty() ? value : value + " " + setting.unit;
 }
 
-void list(SettingsFile& file, GlobalOptions const& options)
+void list(SettingsFile const& file, GlobalOptions const& options)
 {
+    SensorLimits const limits(options.settingsFile);
     if (options.json) {
         Json document = Json::array();
         for (Setting const& setting : file.settings()) {
             document.push_back(toJson(setting));
         }
-        for (std::string const& sensor : file.limitedSensors()) {
-            document.push_back(limitJson(sensor, file));
+        for (std::string const& sensor : limits.sensors()) {
+            document.push_back(limitJson(sensor, limits));
         }
         fmt::print("{}", printed(document));
         return;
@@ -83,8 +86,8 @@ void list(SettingsFile& file, GlobalOptions const& options)
     for (Setting const& setting : file.settings()) {
         rows.push_back({{setting.name}, {withUnit(setting, setting.value)}, {setting.range}});
     }
-    for (std::string const& sensor : file.limitedSensors()) {
-        rows.push_back({{limitPrefix + sensor}, {file.limit(sensor)}, {}});
+    for (std::string const& sensor : limits.sensors()) {
+        rows.push_back({{limitPrefix + sensor}, {limitText(limits.of(sensor))}, {}});
     }
     printText(fmt::format("{}\n{}\n  velmora settings NAME explains one, velmora settings NAME VALUE sets it\n",
                           file.path(), drawColumns(rows, "  ", outputStyle(options))));
@@ -110,7 +113,7 @@ ExitCode settings(SettingsOptions const& chosen, GlobalOptions const& options)
         return ExitCode::Done;
     }
     if (chosen.name.starts_with(limitPrefix)) {
-        explainLimit(chosen, file, options);
+        explainLimit(chosen, options);
         return ExitCode::Done;
     }
     if (!chosen.value.empty()) {

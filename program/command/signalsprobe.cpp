@@ -2,13 +2,10 @@
 
 #include "common/text/layout.h"
 #include "common/text/text.h"
-#include "libvelmora/record/checkedfile.h"
 #include "libvelmora/signal/signalfile.h"
 #include "libvelmora/signal/signalhex.h"
-#include "libvelmora/uds/identification.h"
 #include "libvelmora/uds/identifierprobe.h"
 #include "libvelmora/uds/refusalcode.h"
-#include "libvelmora/uds/vehiclevin.h"
 #include "program/command/commandsession.h"
 #include "program/terminal/output.h"
 #include "program/terminal/promptreader.h"
@@ -17,6 +14,9 @@
 #include "program/view/style.h"
 
 #include <velmora/error.h>
+#include <velmora/modules.h>
+#include <velmora/settingsfile.h>
+#include <velmora/vin.h>
 
 #include <fmt/format.h>
 

@@ -1,13 +1,13 @@
 #include "program/live/livechoice.h"
 
 #include "libvelmora/poll/sensorwish.h"
-#include "libvelmora/report/unitlabel.h"
 
 #include <obd/iecu.h>
 #include <obd/ivelmorasettings.h>
 #include <obd/parameterdescriptor.h>
 #include <obd/parameterfactory.h>
 #include <velmora/error.h>
+#include <velmora/offers.h>
 
 #include <fmt/format.h>
 
@@ -36,7 +36,7 @@ std::map<int, std::string> metricUnitsOf(std::shared_ptr<obd::PowertrainParamete
 {
     std::map<int, std::string> units;
     for (auto const& sensor : obd::ParameterDescriptor(parameter, ecu, obd::UnitSystem::Metric).sensors()) {
-        units[sensor->uid()] = unitLabel(sensor->uid(), sensor->unit());
+        units[sensor->uid()] = sensorUnit(sensor->uid(), sensor->unit(), Units::Metric);
     }
     return units;
 }

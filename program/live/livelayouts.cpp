@@ -1,9 +1,9 @@
 #include "program/live/livelayouts.h"
 
-#include "libvelmora/session/settingsstore.h"
 #include "program/view/json.h"
 
 #include <velmora/error.h>
+#include <velmora/settingsfile.h>
 
 namespace velmora::cli {
 
@@ -41,9 +41,8 @@ std::optional<LiveLayout> parsedLayout(std::string const& text)
 std::optional<LiveLayout> LiveLayouts::load(std::string const& vehicle) const
 {
     try {
-        std::string text;
-        SettingsStore store(m_file);
-        return store.getString(liveKey(vehicle), text) ? parsedLayout(text) : std::nullopt;
+        std::optional<std::string> const text = SettingsFile(m_file.string()).text(liveKey(vehicle));
+        return text ? parsedLayout(*text) : std::nullopt;
     } catch (Error const& /*unreadable*/) {
         return std::nullopt;
     }
@@ -52,9 +51,8 @@ std::optional<LiveLayout> LiveLayouts::load(std::string const& vehicle) const
 // Read anew each time: other programs keep layouts of their own vehicles there.
 void LiveLayouts::save(std::string const& vehicle, LiveLayout const& layout) const
 {
-    SettingsStore store(m_file);
-    store.setString(liveKey(vehicle), Json{{"sensors", layout.sensors}, {"big", layout.big}}.dump());
-    store.sync();
+    SettingsFile(m_file.string())
+        .setText(liveKey(vehicle), Json{{"sensors", layout.sensors}, {"big", layout.big}}.dump());
 }
 
 } // namespace velmora::cli

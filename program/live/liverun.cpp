@@ -1,7 +1,5 @@
 #include "program/live/liverun.h"
 
-#include "libvelmora/uds/vehiclevin.h"
-#include "libvelmora/vehicle/vehiclekey.h"
 #include "program/terminal/output.h"
 #include "program/view/live/livelines.h"
 #include "program/view/style.h"
@@ -10,6 +8,7 @@
 
 #include <velmora/error.h>
 #include <velmora/limits.h>
+#include <velmora/vin.h>
 
 namespace velmora::cli {
 

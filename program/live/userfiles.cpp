@@ -1,8 +1,7 @@
 #include "program/live/userfiles.h"
 
-#include "libvelmora/session/userfolders.h"
-
 #include <velmora/error.h>
+#include <velmora/settingsfile.h>
 
 #include <fmt/format.h>
 

@@ -1,7 +1,8 @@
 #include "program/view/ratetext.h"
 
 #include "libvelmora/poll/sensorwish.h"
-#include "libvelmora/read/sensornames.h"
+
+#include <velmora/offers.h>
 
 #include <fmt/format.h>
 

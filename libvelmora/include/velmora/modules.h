@@ -67,6 +67,10 @@ struct UdsModuleReport
 /// what service tells them.
 VELMORA_EXPORT std::string identifierName(unsigned int identifier);
 
+/// The data of such an identifier for people: text, "2023-05-17", "default session"; hexadecimal for what can't be read
+/// as what it should be. Empty for data that is filling only.
+VELMORA_EXPORT std::string identifierText(unsigned int identifier, std::vector<unsigned char> const& data);
+
 /// A table, and below it the identifiers of each module that told some.
 VELMORA_EXPORT std::string toText(std::vector<FoundModule> const& modules, TextStyle const& style);
 /// Under a heading for each module a line for each code.

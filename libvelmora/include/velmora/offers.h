@@ -1,7 +1,9 @@
 #pragma once
 
+#include <obd/measurementunit.h>
 #include <velmora/export.h>
 #include <velmora/topics.h>
+#include <velmora/units.h>
 
 #include <optional>
 #include <string>
@@ -79,5 +81,9 @@ VELMORA_EXPORT std::vector<SensorName> const& sensorAliases();
 VELMORA_EXPORT std::string sensorNameOf(int pid);
 /// The key of a PID for programs: its first name, or "PID_C2".
 VELMORA_EXPORT std::string sensorKey(int pid);
+
+/// The label of a sensor's unit, as the core's descriptors tell both, in the units that people are shown: "km/h",
+/// "mpg (UK)"; empty for none. Never null.
+VELMORA_EXPORT char const* sensorUnit(int uid, MeasurementUnit unit, Units units);
 
 } // namespace velmora

@@ -2,7 +2,10 @@
 
 #include <velmora/export.h>
 
+#include <cstdint>
+#include <filesystem>
 #include <memory>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -10,7 +13,7 @@ namespace velmora {
 
 class SettingsStore;
 
-/// The settings file: what derived values depend on, and the limits that views mark values by. A file that does not
+/// The settings file: what derived values depend on. <velmora/limits.h> has the limits in it. A file that does not
 /// exist has all defaults. What is set is on the disk when the function returns. For one thread.
 class VELMORA_EXPORT SettingsFile
 {
@@ -44,19 +47,28 @@ public:
     /// From what a person typed. Throws Error that tells the names, or the range, or that the file can't be written.
     void set(std::string const& name, std::string const& value);
 
-    /// The keys of all sensors that have a limit.
-    std::vector<std::string> limitedSensors() const;
-    /// The key that a sensor's limit is kept under: of a PID in any usual form, of any of its names, or a signal's id.
-    /// Throws Error for a text that can be none.
-    static std::string limitKey(std::string const& sensor);
-    /// "..6000", "11.8..", "11.8..14.8", in the sensor's metric unit; empty for none. By limitKey.
-    std::string limit(std::string const& key) const;
-    /// Reads "6000", which is the highest value, and what limit gives; "none" takes it away. Throws Error for any other
-    /// text.
-    void setLimit(std::string const& key, std::string const& limit);
+    /// What an application keeps there of its own, by keys such as "live/vehicle" that name a group and a value in it;
+    /// nothing where there is none.
+    std::optional<std::string> text(std::string const& key) const;
+    std::optional<int> number(std::string const& key) const; ///< as text
+    /// Throws Error if the file can't be written.
+    void setText(std::string const& key, std::string const& text);
+    void setNumber(std::string const& key, int number); ///< as setText
 
 private:
     std::unique_ptr<SettingsStore> m_store;
 };
+
+/// The user's folder for what programs of the companion write: velmora in XDG_DATA_HOME, or in .local/share of HOME. It
+/// need not exist.
+VELMORA_EXPORT std::filesystem::path userDataFolder();
+
+/// Whether a file can be written to: makes it if it does not stand, and changes it no further. Throws Error for one
+/// that can't, and for a pipe that nobody reads, which would hold up whoever opens it. what names the file's use, such
+/// as "trace file".
+VELMORA_EXPORT void requireWritable(std::filesystem::path const& file, std::string const& what);
+/// Whether a file is a plain one of no more than that many bytes, so that it can be read whole. Nothing if it is; else
+/// why not.
+VELMORA_EXPORT std::string whyUnreadable(std::filesystem::path const& file, std::uintmax_t largest);
 
 } // namespace velmora

@@ -6,6 +6,10 @@
 #include <string>
 #include <vector>
 
+namespace obd {
+class IObdProxy;
+}
+
 namespace velmora {
 
 /// What a vehicle identification number says by the standards alone (ISO 3779, ISO 3780, 49 CFR 565). Empty texts are
@@ -60,5 +64,11 @@ struct VinFacts
 /// What a vehicle identification number says, from one that was typed: any case, with blanks and hyphens. Throws Error
 /// that tells what is wrong with it. Any thread.
 VELMORA_EXPORT VinFacts explainVin(std::string const& text);
+
+/// What a vehicle's own things are kept under: it tells vehicles apart, and nobody the number.
+VELMORA_EXPORT std::string vehicleKey(std::string const& vin);
+/// The number that a vehicle tells by service 09, for who works with the core: of the first module that tells one;
+/// empty if none does.
+VELMORA_EXPORT std::string vehicleVin(obd::IObdProxy& proxy);
 
 } // namespace velmora

@@ -1,8 +1,8 @@
 #include "program/view/live/livetable.h"
 
 #include "common/text/text.h"
-#include "libvelmora/read/sensornames.h"
-#include "libvelmora/report/unitlabel.h"
+
+#include <velmora/offers.h>
 
 #include <fmt/format.h>
 
@@ -27,7 +27,7 @@ LiveRow makeRow(LiveParameter const& chosen, obd::SensorDescriptor const& sensor
     }
     row.alone = alone;
     row.name = alone ? parameter.description() : parameter.description() + ": " + sensor.description();
-    row.unit = labelInUnits(unitLabel(sensor.uid(), sensor.unit()), sensor.unit(), units);
+    row.unit = sensorUnit(sensor.uid(), sensor.unit(), units);
     auto const metric = chosen.metricUnits.find(row.uid);
     row.metricUnit = metric != chosen.metricUnits.end() ? metric->second : row.unit;
     // What has a unit is a number, though the library gives some, such as distances, as plain digits.

@@ -1,12 +1,12 @@
 #pragma once
 
 #include "libvelmora/uds/signalrow.h"
-#include "libvelmora/vehicle/units.h"
 #include "program/view/framestyle.h"
 
 #include <obd/parameterdescriptor.h>
 #include <obd/sensordatamodels.h>
 #include <velmora/limits.h>
+#include <velmora/units.h>
 
 #include <chrono>
 #include <deque>

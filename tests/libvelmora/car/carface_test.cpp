@@ -236,7 +236,7 @@ TEST(ConsoleFace, GivesWhatTheAdapterSays)
     EXPECT_EQ(kindThrown([&] { console.check(); }), ErrorKind::Interrupted);
 }
 
-TEST(SettingsFace, SetsAndTellsSettingsAndLimits)
+TEST(SettingsFace, SetsAndTellsSettings)
 {
     testsupport::TemporaryFolder const folder;
     std::string const path = folder.file("settings.toml");
@@ -247,17 +247,17 @@ TEST(SettingsFace, SetsAndTellsSettingsAndLimits)
         file.set("displacement", "1.6");
         EXPECT_EQ(kindThrown([&] { file.set("displacement", "99"); }), ErrorKind::WrongUse);
         EXPECT_EQ(kindThrown([&] { file.setting("nothing"); }), ErrorKind::WrongUse);
-        file.setLimit(velmora::SettingsFile::limitKey("0C"), "6000");
     }
     velmora::SettingsFile file(path);
     EXPECT_EQ(file.setting("displacement").value, "1.60");
     EXPECT_EQ(file.setting("displacement").unit, "l");
     EXPECT_GT(file.settings().size(), 4U);
-    ASSERT_EQ(file.limitedSensors(), std::vector<std::string>{"RPM"});
-    EXPECT_EQ(file.limit("RPM"), "..6000");
-    file.setLimit("RPM", "none");
-    EXPECT_TRUE(file.limitedSensors().empty());
-    EXPECT_EQ(kindThrown([&] { file.setLimit("RPM", "many"); }), ErrorKind::WrongUse);
+    EXPECT_FALSE(file.text("own/word").has_value());
+    file.setText("own/word", "text");
+    file.setNumber("own/number", 7);
+    EXPECT_EQ(velmora::SettingsFile(path).text("own/word"), "text");
+    EXPECT_EQ(velmora::SettingsFile(path).number("own/number"), 7);
+    EXPECT_FALSE(file.number("own/word").has_value());
 }
 
 } // namespace
