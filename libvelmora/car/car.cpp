@@ -66,6 +66,11 @@ void Car::reconnect()
     m_core->reconnect();
 }
 
+void Car::keepAsking(std::vector<std::string> const& sensors)
+{
+    m_core->keepAsking(sensors);
+}
+
 void Car::check()
 {
     m_core->check();

@@ -1,9 +1,11 @@
 #pragma once
 
 #include "libvelmora/car/threadanswer.h"
+#include "libvelmora/car/traffictap.h"
 #include "libvelmora/car/watchstate.h"
 #include "libvelmora/session/session.h"
 
+#include <obd/isensorservice.h>
 #include <velmora/car.h>
 
 #include <chrono>
@@ -40,6 +42,8 @@ public:
     std::shared_ptr<WatchState> watch(std::vector<std::string> const& sensors, Car::OnReading onReading,
                                       Car::OnLink onLink);
     void reconnect();
+    // Has the core ask for sensors over and over.
+    void keepAsking(std::vector<std::string> const& sensors);
 
     // Throws Error if the link is lost, the adapter has fallen silent, or the car was stopped.
     void check();
@@ -91,6 +95,9 @@ private:
     std::deque<std::function<void()>> m_work; // protected by m_mutex
     bool m_stop = false;                      // protected by m_mutex
     std::unique_ptr<Session> m_session;       // changed under m_mutex, by the car's thread alone
+    // Of the session, and gone before it.
+    std::unique_ptr<TrafficTap> m_traffic;
+    std::shared_ptr<obd::ISensorService> m_asking;
     std::thread m_thread;
     std::stop_callback<std::function<void()>> m_onStop;
 };

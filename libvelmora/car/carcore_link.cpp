@@ -3,8 +3,10 @@
 #include "libvelmora/car/carcore.h"
 #include "libvelmora/car/caroptions.h"
 #include "libvelmora/car/sessionend.h"
+#include "libvelmora/read/sensorchoice.h"
 #include "libvelmora/record/recorderparts.h"
 
+#include <obd/itroublecodeservice.h>
 #include <velmora/recorder.h>
 
 #include <algorithm>
@@ -32,6 +34,9 @@ void CarCore::connect()
         m_options.recorder->m_parts->opening();
         m_session->record(m_options.recorder->m_parts->recorder);
     }
+    if (m_options.onTraffic) {
+        m_traffic = std::make_unique<TrafficTap>(m_options.onTraffic);
+    }
     m_session->connect();
     m_lastReading = Clock::now();
 }
@@ -41,6 +46,8 @@ void CarCore::disconnect()
     for (std::shared_ptr<WatchState> const& watch : m_watches) {
         watch->setPoller(nullptr);
     }
+    m_asking.reset();
+    m_traffic.reset();
     noteEnd();
     std::unique_ptr<Session> session;
     {
@@ -60,6 +67,20 @@ void CarCore::noteEnd() const
         m_options.recorder->m_parts->closing(adapter != nullptr ? adapter->device() : std::string());
     }
     tellUnwritten(*m_session, m_options);
+}
+
+// Without any sensor it asks once for the lamp: from its first request on the library keeps an idle connection up, by
+// one every five seconds.
+void CarCore::keepAsking(std::vector<std::string> const& sensors)
+{
+    call([this, &sensors](Session& /*session*/) {
+        if (sensors.empty()) {
+            obd::TroubleCodeServiceBuilder::createTroubleCodeService()->askMilStatus();
+            return;
+        }
+        m_asking = obd::SensorServiceBuilder::createSensorService();
+        m_asking->startUpdates(chooseSensors(sensors, offeredSensors(*m_asking)));
+    });
 }
 
 void CarCore::check()

@@ -1,19 +1,13 @@
-#include "libvelmora/read/sensorchoice.h"
+#include "program/command/commandcar.h"
 #include "program/command/commands.h"
-#include "program/command/commandsession.h"
 #include "program/commandline.h"
-#include "program/terminal/interrupt.h"
 #include "program/terminal/lineprinter.h"
 #include "program/view/trafficlog.h"
-
-#include <obd/isensorservice.h>
-#include <obd/itroublecodeservice.h>
-#include <obd/itroubleshootingservice.h>
-#include <tervex/observer.h>
 
 #include <chrono>
 #include <mutex>
 #include <optional>
+#include <thread>
 
 namespace velmora::cli {
 
@@ -30,19 +24,23 @@ struct LogOptions
     double duration = 0.0; // seconds after the connection stands; 0: no end
 };
 
-// Prints the traffic from its construction on, that of connecting too.
-class TrafficLog : public tervex::Observer<obd::ITroubleshootingServiceObserver>
+// Prints what it is told of, from any thread.
+class TrafficPrinter
 {
 public:
-    explicit TrafficLog(bool json)
-        : m_json(json), m_service(obd::TroubleshootingServiceBuilder::createTroubleshootingService())
+    explicit TrafficPrinter(bool json) : m_json(json) {}
+
+    void print(obd::MessageDataModel const& entry)
     {
-        m_service->attach(this);
-        m_service->startLogging();
+        std::lock_guard const lock(m_mutex);
+        if (m_left == std::size_t{0}) {
+            return;
+        }
+        m_printer.print(m_json ? toJsonLine(entry) : toLine(entry));
+        if (m_left) {
+            --*m_left;
+        }
     }
-    ~TrafficLog() override = default;
-    TrafficLog(TrafficLog const&) = delete;
-    TrafficLog& operator=(TrafficLog const&) = delete;
 
     // Prints this many entries more, and none after.
     void limit(std::size_t entries)
@@ -57,55 +55,31 @@ public:
     }
     bool readerGone() const { return m_printer.readerGone(); }
 
-    // Ends with what was logged so far. Throws Error if it can't be printed.
+    // Ends with what was told so far. Throws Error if it can't be printed.
     void finish()
     {
-        m_service.reset();
+        limit(0);
         m_printer.finish();
     }
 
 private:
-    void onLogEntryAdded(std::shared_ptr<obd::MessageDataModel> const& entry) override
-    {
-        std::lock_guard const lock(m_mutex);
-        if (m_left == std::size_t{0}) {
-            return;
-        }
-        m_printer.print(m_json ? toJsonLine(*entry) : toLine(*entry));
-        if (m_left) {
-            --*m_left;
-        }
-    }
-
     bool const m_json;
     LinePrinter m_printer;
     mutable std::mutex m_mutex;
     std::optional<std::size_t> m_left; // protected by m_mutex; nothing for no limit
-    // Its end waits for an entry that is under way on another thread, which detaching would not.
-    std::shared_ptr<obd::ITroubleshootingService> m_service;
 };
-
-// Asks for the sensors over and over. Without any it asks once for the lamp: from its first request on the library
-// keeps an idle connection up, by one every five seconds.
-void startTraffic(std::vector<std::string> const& names, obd::ISensorService& service)
-{
-    if (names.empty()) {
-        obd::TroubleCodeServiceBuilder::createTroubleCodeService()->askMilStatus();
-    } else {
-        service.startUpdates(chooseSensors(names, offeredSensors(service)));
-    }
-}
 
 ExitCode log(LogOptions const& chosen, GlobalOptions const& options)
 {
-    CommandSession session(options);
-    TrafficLog traffic(options.json);
-    session.connect();
-    auto const sensors = obd::SensorServiceBuilder::createSensorService();
+    TrafficPrinter traffic(options.json);
+    InterruptStop const stop;
+    CarOptions carChoice = carOptions(options, stop.token());
+    carChoice.onTraffic = [&traffic](obd::MessageDataModel const& entry) { traffic.print(entry); };
+    Car car(carChoice);
     if (chosen.count > 0) {
         traffic.limit(chosen.count);
     }
-    startTraffic(chosen.sensors, *sensors);
+    car.keepAsking(chosen.sensors);
     Clock::time_point const start = Clock::now();
     auto const done = [&] {
         bool const expired =
@@ -113,9 +87,8 @@ ExitCode log(LogOptions const& chosen, GlobalOptions const& options)
         return traffic.done() || expired || traffic.readerGone();
     };
     while (!done()) {
-        Clock::time_point const limit = Clock::now() + lookInterval;
-        session.loop().runUntil([&] { return Interrupt::instance().raised() || Clock::now() >= limit; }, limit);
-        session.check();
+        std::this_thread::sleep_for(lookInterval);
+        car.check();
     }
     traffic.finish();
     return ExitCode::Done;

@@ -19,7 +19,8 @@
 
 namespace obd {
 class IObdVelmora;
-}
+struct MessageDataModel;
+} // namespace obd
 
 namespace velmora {
 
@@ -64,6 +65,9 @@ struct CarOptions
     /// Gets the name of logFile or traceFile if it could not be written to its end, as the connection closes. On the
     /// car's thread.
     std::function<void(std::string const&)> onUnwritten = {};
+    /// Gets each entry of the core's log of the traffic, from the connecting up to the closing. On the thread that
+    /// sends or receives, in the middle of an exchange, which it holds up.
+    std::function<void(obd::MessageDataModel const&)> onTraffic = {};
     /// Takes down all that passes the port, from the connection on; see <velmora/recorder.h>.
     std::shared_ptr<Recorder> recorder = {};
 };
@@ -196,6 +200,9 @@ public:
     VehicleReport report(std::string const& maker);
     /// Asks for each sensor of each module once, so that a recording holds them all.
     void askSensors();
+    /// Asks the current module for sensors over and over, as the core does it and until the link is closed, so that
+    /// there is traffic to look at; nothing is told. Throws Error for what is not known, not clear, or not offered.
+    void keepAsking(std::vector<std::string> const& sensors);
 
     /// Clears the confirmed and pending codes of all control modules, whichever CarOptions::module names, and turns the
     /// lamp off. Also erases freeze frames, readiness, test results, and the distance and time since the last clearing:

@@ -2,6 +2,7 @@
 
 #include "tests/support/temporaryfolder.h"
 
+#include <obd/messagedatamodel.h>
 #include <velmora/car.h>
 #include <velmora/console.h>
 #include <velmora/doctor.h>
@@ -11,7 +12,9 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <condition_variable>
 #include <fstream>
+#include <mutex>
 #include <sstream>
 
 namespace {
@@ -180,6 +183,30 @@ TEST(CarFace, IsRecordedWithoutItsVinAndWithoutItsEnd)
         EXPECT_EQ(nothing.save("car"), 0U);
     }
     EXPECT_FALSE(std::filesystem::exists(unsaved));
+}
+
+TEST(CarFace, TellsItsTrafficUpToTheClosing)
+{
+    std::mutex mutex;
+    std::condition_variable asked;
+    int requests = 0;
+    std::string last;
+    {
+        CarOptions options = instantCar("petrol-can11");
+        options.sleep = true;
+        options.onTraffic = [&](obd::MessageDataModel const& entry) {
+            std::lock_guard const lock(mutex);
+            last = entry.data;
+            requests += entry.direction == obd::MessageDataModel::Sent && entry.data.starts_with("010C") ? 1 : 0;
+            asked.notify_one();
+        };
+        Car car(options);
+        EXPECT_EQ(kindThrown([&] { car.keepAsking({"NOSUCHTHING"}); }), ErrorKind::WrongUse);
+        car.keepAsking({"RPM"});
+        std::unique_lock lock(mutex);
+        EXPECT_TRUE(asked.wait_for(lock, std::chrono::seconds(10), [&] { return requests >= 2; }));
+    }
+    EXPECT_EQ(last.find("ATLP"), std::string::npos) << "closing is not told";
 }
 
 TEST(CarFace, TellsOfAFileThatItCouldNotWrite)
