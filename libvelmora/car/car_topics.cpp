@@ -3,6 +3,7 @@
 #include "libvelmora/car/carcore.h"
 #include "libvelmora/car/carmodules.h"
 #include "libvelmora/car/caroffers.h"
+#include "libvelmora/car/carprobe.h"
 #include "libvelmora/car/carsensors.h"
 #include "libvelmora/read/codereader.h"
 #include "libvelmora/read/diagnosticreaders.h"
@@ -164,6 +165,11 @@ std::vector<ModuleTopic<ModuleIdentifiers>> Car::identifiers()
 std::vector<UdsModuleReport> Car::udsCodes(std::string const& maker)
 {
     return m_core->call([&maker](Session& session) { return readUdsReports(session, maker); });
+}
+
+ProbeReport Car::probe(ProbeRequest const& request, std::function<void(std::string const& at)> const& onResumed)
+{
+    return ProbeReport(m_core->call([&](Session& session) { return probeModule(session, request, onResumed); }));
 }
 
 std::vector<ModuleOffers> Car::offers(bool all)

@@ -10,6 +10,7 @@
 #include <obd/iecu.h>
 #include <obd/protocolfamily.h>
 #include <obd/troublecodecatalogue.h>
+#include <velmora/error.h>
 
 #include <algorithm>
 

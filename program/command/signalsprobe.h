@@ -3,6 +3,8 @@
 #include "program/exitcode.h"
 #include "program/globaloptions.h"
 
+#include <velmora/probe.h>
+
 #include <CLI/App.hpp>
 
 #include <memory>
@@ -13,14 +15,8 @@ namespace velmora::cli {
 // What `signals probe` is told.
 struct ProbeOptions
 {
-    std::string module = "7E0";
-    std::string reply;
-    std::string extended;
-    std::string service = "22";
-    std::string from = "F100";
-    std::string to = "F1FF";
+    ProbeRequest request;
     std::string output;
-    bool fresh = false;
     bool force = false;
 };
 

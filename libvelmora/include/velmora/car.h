@@ -6,6 +6,7 @@
 #include <velmora/iport.h>
 #include <velmora/modules.h>
 #include <velmora/offers.h>
+#include <velmora/probe.h>
 #include <velmora/reading.h>
 #include <velmora/report.h>
 #include <velmora/units.h>
@@ -185,6 +186,10 @@ public:
     /// Trouble codes by service 19, or 18, also of the modules that findModules has found. maker as for codeReports.
     /// Throws Error on a bus that has neither.
     std::vector<UdsModuleReport> udsCodes(std::string const& maker = {});
+    /// Asks a module for its identifiers one by one, five a second; it only reads, with the vehicle standing. A run
+    /// that ended early is gone on with, of which onResumed is told on the car's thread, with the identifier. Throws
+    /// Error on trouble; what was found is kept for the next run then.
+    ProbeReport probe(ProbeRequest const& request, std::function<void(std::string const& at)> const& onResumed = {});
     /// What each module offers, by what it said when it was met. all: also what the library decodes and the module does
     /// not offer.
     std::vector<ModuleOffers> offers(bool all = false);
