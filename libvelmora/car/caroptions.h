@@ -2,7 +2,7 @@
 
 #include "libvelmora/session/sessionoptions.h"
 
-#include <velmora/car.h>
+#include <velmora/caroptions.h>
 
 namespace velmora {
 

@@ -2,7 +2,7 @@
 
 #include "libvelmora/session/session.h"
 
-#include <velmora/car.h>
+#include <velmora/caroptions.h>
 
 #include <functional>
 #include <stop_token>

@@ -1,6 +1,6 @@
 #pragma once
 
-#include <velmora/car.h>
+#include <velmora/caroptions.h>
 #include <velmora/export.h>
 
 #include <memory>
