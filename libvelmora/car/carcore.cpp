@@ -6,7 +6,6 @@
 #include <obd/parameterfactory.h>
 
 #include <algorithm>
-#include <atomic>
 #include <utility>
 
 namespace velmora {
@@ -14,22 +13,11 @@ namespace velmora {
 namespace {
 
 constexpr std::chrono::milliseconds step{100};
-// The core has one top-level object.
-std::atomic<bool> carStands{false};
-
-void claim()
-{
-    if (carStands.exchange(true)) {
-        throw Error(ErrorKind::WrongUse, "There is a car in this process already",
-                    {"a process has one car at a time: destroy the first one, or run another process"});
-    }
-}
 
 } // namespace
 
 CarCore::CarCore(CarOptions options) : m_options(std::move(options)), m_onStop(m_options.stop, [this] { interrupt(); })
 {
-    claim();
     auto const connected = std::make_shared<std::promise<void>>();
     try {
         m_thread = std::thread([this, connected] { run(*connected); });
@@ -38,7 +26,6 @@ CarCore::CarCore(CarOptions options) : m_options(std::move(options)), m_onStop(m
         if (m_thread.joinable()) {
             m_thread.join();
         }
-        carStands = false;
         throw;
     }
 }
@@ -51,7 +38,6 @@ CarCore::~CarCore()
     }
     interrupt();
     m_thread.join();
-    carStands = false;
 }
 
 void CarCore::interrupt()

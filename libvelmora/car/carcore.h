@@ -1,5 +1,6 @@
 #pragma once
 
+#include "libvelmora/car/onecar.h"
 #include "libvelmora/car/threadanswer.h"
 #include "libvelmora/car/traffictap.h"
 #include "libvelmora/car/watchstate.h"
@@ -84,6 +85,7 @@ private:
     bool isLinkLost();
     void comeBack();
 
+    OneCar const m_place;
     CarOptions const m_options;
     std::vector<std::shared_ptr<WatchState>> m_watches;
     Clock::time_point m_lastReading;

@@ -1,6 +1,7 @@
 // The bare dialogue with an adapter; see <velmora/console.h>.
 
 #include "libvelmora/car/caroptions.h"
+#include "libvelmora/car/onecar.h"
 #include "libvelmora/car/sessionend.h"
 #include "libvelmora/text/text.h"
 
@@ -49,6 +50,7 @@ public:
         return false;
     }
 
+    OneCar const place;
     Session session;
     SessionEnd end;
     std::shared_ptr<obd::IDataConnection> connection;

@@ -1,6 +1,7 @@
 // The examination as applications see it; see <velmora/doctor.h>.
 
 #include "libvelmora/car/caroptions.h"
+#include "libvelmora/car/onecar.h"
 #include "libvelmora/car/sessionend.h"
 #include "libvelmora/doctor/doctor.h"
 #include "libvelmora/record/checkedfile.h"
@@ -23,6 +24,7 @@ public:
         : session(sessionOptions(options)), end(session, options), report(examine(session, recorder))
     {}
 
+    OneCar const place;
     DialogueRecorder recorder;
     Session session;
     SessionEnd end;

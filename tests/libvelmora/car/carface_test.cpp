@@ -258,6 +258,7 @@ TEST(ConsoleFace, GivesWhatTheAdapterSays)
     ASSERT_EQ(answer.lines.size(), 1U) << "without its echo";
     EXPECT_EQ(answer.lines[0].substr(0, 6), "ELM327");
     EXPECT_EQ(console.port(), "sim:petrol-can11?instant");
+    EXPECT_EQ(kindThrown([&] { Car const second(instantCar("petrol-can11")); }), ErrorKind::WrongUse);
     stop.request_stop();
     EXPECT_EQ(kindThrown([&] { console.ask("ATI"); }), ErrorKind::Interrupted);
     EXPECT_EQ(kindThrown([&] { console.check(); }), ErrorKind::Interrupted);
