@@ -9,7 +9,7 @@
 
 namespace velmora {
 
-// The modules of the vehicle: those that are remembered, or looked for now, and then remembered by VIN; before CAN
+// The modules of the vehicle: those that are remembered, or looked for now, and then remembered by VIN; on legacy buses
 // those of the connection. Tells its progress. Throws Error.
 std::vector<FoundModule> findModules(Session& session, ModuleSearch const& search);
 

@@ -157,7 +157,8 @@ public:
     /// Asks for each sensor of each module once, so that a recording holds them all.
     void askSensors();
     /// Asks the current module for sensors over and over, as the core does it and until the link is closed, so that
-    /// there is traffic to look at; nothing is told. Throws Error for what is not known, not clear, or not offered.
+    /// there is traffic to look at; nothing is told. Without any the connection is only kept up. Throws Error for what
+    /// is not known, not clear, or not offered.
     void keepAsking(std::vector<std::string> const& sensors);
 
     /// Clears the confirmed and pending codes of all control modules, whichever CarOptions::module names, and turns the
