@@ -388,7 +388,7 @@ TEST(PagePlay, ServesARecordingUntilItsEnd)
     EXPECT_EQ(nextEvent(stream, "beat")["state"], "playing");
     play.end();
     runner.join();
-    EXPECT_THROW(velmora::PagePlay({}, "csv:" + folder.file("none.csv"), 1.0, "", {}), velmora::Error);
+    EXPECT_THROW(velmora::PagePlay({}, "dash:127.0.0.1:99999", 1.0, "", {}), velmora::Error);
 }
 
 TEST(DashOutput, AStreamThatBrokeBringsWhatWasMissed)
