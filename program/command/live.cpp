@@ -1,4 +1,4 @@
-#include "libvelmora/poll/sensorwish.h"
+#include "libvelmora/live/livechoice.h"
 #include "program/command/commands.h"
 #include "program/command/commandsession.h"
 #include "program/commandline.h"
@@ -42,7 +42,7 @@ ExitCode readVehicle(GlobalOptions const& global, LiveOptions const& given)
 {
     LiveOptions options = given;
     if (!options.rate.empty()) {
-        options.hertz = parseSensorWish("x@" + options.rate).hertz;
+        options.hertz = liveRate(options.rate);
     }
     std::unique_ptr<LiveCsv> const csv =
         options.csv.empty() ? nullptr : std::make_unique<LiveCsv>(options.csv, options.force);
@@ -92,10 +92,10 @@ void addLiveCommand(CommandLine& commandLine)
     command
         ->add_option("--rate", options->rate, "How often to read the sensors that have no rate of their own (RPM@10hz)")
         ->type_name("HZ");
-    command->add_flag("--fast", options->will.fast,
+    command->add_flag("--fast", options->fast,
                       "As fast as the bus allows, several PIDs in one request where the modules\n"
                       "can; without the pause that spares them");
-    command->add_option("--pids", options->will.pidsPerRequest, "PIDs in one request at most, with --fast")
+    command->add_option("--pids", options->pidsPerRequest, "PIDs in one request at most, with --fast")
         ->type_name("N")
         ->check(CLI::Range(1, 6));
     CLI::Option* const play = command

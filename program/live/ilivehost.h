@@ -34,7 +34,7 @@ public:
     virtual std::string page(std::string const& note, FrameStyle const& style) const = 0;
     // The sensors that can be chosen. Throws Error that tells why none can.
     virtual SensorPicker picker() const = 0;
-    virtual void pick(SensorIds const& ids) = 0;
+    virtual void pick(std::vector<int> const& ids) = 0;
     // Does what a key asks for and gives what to tell of it, if anything; nothing for a key that it doesn't know.
     // Throws Error.
     virtual std::optional<std::string> handle(Key key) = 0;

@@ -24,7 +24,17 @@ constexpr char const* fastWarning =
 // Kept in metric units, whatever is shown.
 SensorLimit limitOfRow(SensorLimits const& limits, LiveRow const& row)
 {
-    return converted(limits.of(keyOf(row)), row.metricUnit, row.unit);
+    return converted(limits.of(row.key), row.metricUnit, row.unit);
+}
+
+LiveWish wishOf(CommandSession const& session, LiveOptions const& options)
+{
+    LiveWish wish;
+    wish.hertz = options.hertz;
+    wish.will.fast = options.fast;
+    wish.will.pidsPerRequest = options.pidsPerRequest;
+    wish.selectedModules = session.options().ecu || session.options().allEcus;
+    return wish;
 }
 
 } // namespace
@@ -34,12 +44,14 @@ LiveRun::LiveRun(CommandSession& session, LiveOptions const& options, LiveCsv* c
 {
     std::optional<LiveLayout> const layout = keptLayout();
     try {
-        m_choice = std::make_unique<LiveChoice>(session, options, layout ? layout->sensors : options.sensors);
+        m_choice =
+            std::make_unique<LiveChoice>(session, wishOf(session, options), layout ? layout->sensors : options.sensors);
     } catch (Error const&) {
         if (!layout) {
             throw;
         }
-        m_choice = std::make_unique<LiveChoice>(session, options, options.sensors); // what it offers has changed
+        m_choice = std::make_unique<LiveChoice>(session, wishOf(session, options),
+                                                options.sensors); // what it offers has changed
     }
     m_big = !layout || layout->big;
     select();
@@ -78,14 +90,14 @@ std::optional<LiveLayout> LiveRun::keptLayout()
 std::string const& LiveRun::vehicle()
 {
     if (m_vehicle.empty()) {
-        m_vehicle = vehicleKey(vehicleVin(*m_session.proxy()));
+        m_vehicle = layoutKey(m_session);
     }
     return m_vehicle;
 }
 
 void LiveRun::select()
 {
-    m_table.select(m_choice->parameters(), m_session.units());
+    m_table.select(m_choice->parameters());
     SensorLimits const limits(m_session.settingsFile().string());
     m_table.setLimits([&limits](LiveRow const& row) { return limitOfRow(limits, row); });
     if (m_panel != nullptr) {
@@ -98,7 +110,7 @@ void LiveRun::start()
 {
     m_feed.reset();
     select();
-    m_feed = m_choice->feed(m_options.will);
+    m_feed = m_choice->feed();
 }
 
 void LiveRun::run()
@@ -111,12 +123,12 @@ void LiveRun::run()
     if (m_csv != nullptr) {
         m_csv->begin(m_table, m_start, std::chrono::system_clock::now());
     }
-    if (m_options.will.fast && m_panel != nullptr) {
+    if (m_options.fast && m_panel != nullptr) {
         m_panel->tell(fastWarning);
-    } else if (m_options.will.fast && !m_session.options().quiet) {
+    } else if (m_options.fast && !m_session.options().quiet) {
         tell(std::string(fastWarning) + "\n");
     }
-    m_feed = m_choice->feed(m_options.will);
+    m_feed = m_choice->feed();
     try {
         while (!isDone()) {
             runOnce();

@@ -1,9 +1,9 @@
 #pragma once
 
+#include "libvelmora/live/livechoice.h"
 #include "program/command/commandsession.h"
 #include "program/exitcode.h"
 #include "program/live/ilivehost.h"
-#include "program/live/livechoice.h"
 #include "program/live/livelayouts.h"
 #include "program/live/livepanel.h"
 #include "program/live/liverecord.h"
@@ -61,7 +61,7 @@ private:
     std::string state() const override;
     std::string page(std::string const& note, FrameStyle const& style) const override;
     SensorPicker picker() const override;
-    void pick(SensorIds const& ids) override;
+    void pick(std::vector<int> const& ids) override;
     std::optional<std::string> handle(Key key) override;
     std::vector<KeyHelp> keys() const override;
 

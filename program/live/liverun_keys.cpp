@@ -3,7 +3,6 @@
 #include "program/live/userfiles.h"
 #include "program/terminal/output.h"
 #include "program/view/live/livescreen.h"
-#include "program/view/ratetext.h"
 #include "program/view/timetext.h"
 
 #include <obd/ivelmorasettings.h>
@@ -19,7 +18,7 @@ namespace velmora::cli {
 std::string LiveRun::title() const
 {
     double const elapsed = std::chrono::duration<double>(std::chrono::steady_clock::now() - m_start).count();
-    std::string const rates = reachedRates(m_feed->rates());
+    std::string const rates = m_feed->reached();
     std::string const pace = fmt::format("{:.0f} s, {:.1f} readings/s", elapsed, rate());
     return rates.empty() ? fmt::format("{}, {}, {}", m_session.port(), m_choice->modulesText(), pace)
                          : fmt::format("{}, {}, {}, {}", m_session.port(), pace, rates, m_choice->modulesText());
@@ -50,10 +49,11 @@ SensorPicker LiveRun::picker() const
     if (m_performance != nullptr) {
         throw Error(ErrorKind::WrongUse, "Speed and engine speed alone are read here; p goes back to the values");
     }
-    return m_choice->picker();
+    std::vector<int> const picked = m_choice->picked();
+    return {m_choice->offers(), picked};
 }
 
-void LiveRun::pick(SensorIds const& ids)
+void LiveRun::pick(std::vector<int> const& ids)
 {
     m_choice->pick(ids);
     start();

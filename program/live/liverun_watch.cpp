@@ -1,7 +1,6 @@
 // What a run notices of its own readings: rates, and silence.
 #include "program/live/liverun.h"
 #include "program/terminal/output.h"
-#include "program/view/ratetext.h"
 
 #include <velmora/error.h>
 
@@ -30,7 +29,7 @@ double LiveRun::rate() const
 void LiveRun::tellRate() const
 {
     fmt::print(stderr, "{} readings, {:.1f} a second\n", m_table.readings(), rate());
-    if (std::string const rates = reachedRates(m_feed->rates()); !rates.empty()) {
+    if (std::string const rates = m_feed->reached(); !rates.empty()) {
         fmt::print(stderr, "Reached: {}\n", rates);
     }
 }
@@ -42,7 +41,7 @@ void LiveRun::watchRates(LiveTime now)
         return;
     }
     m_ratesTold = true;
-    std::string const missed = missedRates(m_feed->rates());
+    std::string const missed = m_feed->missed();
     if (!missed.empty() && m_terminal == nullptr && !m_session.options().quiet) {
         tell("More is asked for than the bus can give: " + missed + "\n");
     }

@@ -73,7 +73,7 @@ void PlayRun::applyLimits()
     m_table.table().setLimits([&limits](LiveRow const& row) {
         bool const imperial = row.unit == "mph" || row.unit == "°F" || row.unit == "psi" || row.unit == "mi" ||
                               row.unit == "hp" || row.unit == "lb/min" || row.unit.starts_with("in");
-        return imperial ? SensorLimit() : limits.of(keyOf(row));
+        return imperial ? SensorLimit() : limits.of(row.key);
     });
 }
 
@@ -156,21 +156,21 @@ std::string PlayRun::page(std::string const& /*note*/, FrameStyle const& /*style
 
 SensorPicker PlayRun::picker() const
 {
-    std::vector<OfferedSensor> offered;
-    SensorIds chosen;
+    std::vector<LiveOffer> offered;
+    std::vector<int> chosen;
     for (std::size_t i = 0; i < m_recording.sensors.size(); ++i) {
-        offered.push_back({obd::ParameterIdentifier(static_cast<int>(i)).id(), m_recording.sensors[i].about.name});
+        offered.push_back({static_cast<int>(i), m_recording.sensors[i].about.name});
     }
     for (std::size_t const each : m_table.selected()) {
-        chosen.push_back(obd::ParameterIdentifier(static_cast<int>(each)).id());
+        chosen.push_back(static_cast<int>(each));
     }
     return {offered, chosen};
 }
 
-void PlayRun::pick(SensorIds const& ids)
+void PlayRun::pick(std::vector<int> const& ids)
 {
     std::vector<std::size_t> sensors;
-    for (obd::ParameterIdentifier::Id const id : ids) {
+    for (int const id : ids) {
         sensors.push_back(static_cast<std::size_t>(id));
     }
     m_table.select(sensors);

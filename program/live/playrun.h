@@ -39,7 +39,7 @@ private:
     std::string state() const override;
     std::string page(std::string const& note, FrameStyle const& style) const override;
     SensorPicker picker() const override;
-    void pick(SensorIds const& ids) override;
+    void pick(std::vector<int> const& ids) override;
     std::optional<std::string> handle(Key key) override;
     std::vector<KeyHelp> keys() const override;
 

@@ -10,17 +10,19 @@ namespace velmora::cli {
 
 namespace {
 
-SignalRow rowOf(RecordedSensor const& sensor, std::size_t number)
+LiveSensor liveSensor(RecordedSensor const& recorded, std::size_t number)
 {
-    SignalRow row;
-    row.module = sensor.about.module;
-    row.id = static_cast<int>(number);
-    row.sensor = sensor.about.sensor;
-    row.request = sensor.about.pid;
-    row.name = sensor.about.name;
-    row.unit = sensor.about.unit;
-    row.numeric = sensor.numeric;
-    return row;
+    LiveSensor sensor;
+    sensor.module = recorded.about.module;
+    sensor.id = static_cast<int>(number);
+    sensor.uid = obd::Pid2Uid(sensor.id);
+    sensor.isSignal = !recorded.about.sensor.empty();
+    sensor.key = recorded.about.sensor;
+    sensor.request = recorded.about.pid;
+    sensor.name = recorded.about.name;
+    sensor.unit = sensor.metricUnit = recorded.about.unit;
+    sensor.numeric = recorded.numeric;
+    return sensor;
 }
 
 } // namespace
@@ -40,7 +42,7 @@ void PlayTable::select(std::vector<std::size_t> const& sensors)
     m_statistics.assign(m_recording.sensors.size(), {});
     LiveTable::Parameters parameters;
     for (std::size_t const each : sensors) {
-        parameters.emplace_back(rowOf(m_recording.sensors[each], each));
+        parameters.push_back({liveSensor(m_recording.sensors[each], each)});
     }
     m_table.select(parameters);
 }

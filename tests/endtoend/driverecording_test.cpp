@@ -2,6 +2,7 @@
 // back as a spreadsheet would, and held against the drive model.
 
 #include "libobd/powertrain/torque.h"
+#include "libvelmora/live/livesensors.h"
 #include "program/view/live/livecsv.h"
 #include "simulator/car/vehiclelibrary.h"
 #include "simulator/simulation.h"
@@ -50,8 +51,11 @@ public:
     Recording(obd::ISensorService& service, RequestWindows& windows, std::string const& file)
         : m_windows(windows), m_csv(file)
     {
-        auto const descriptors = service.getDescriptors();
-        m_table.select({descriptors.begin(), descriptors.end()});
+        velmora::cli::LiveTable::Parameters parameters;
+        for (auto const& each : service.getDescriptors()) {
+            parameters.push_back(velmora::liveSensors(*each, *each, 0, std::nullopt, velmora::Units::Metric));
+        }
+        m_table.select(parameters);
         m_latest.resize(m_table.rows().size());
         m_csv.begin(m_table, LiveTime(), velmora::cli::LiveCsv::WallTime());
     }

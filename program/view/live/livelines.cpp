@@ -46,9 +46,9 @@ std::string toJsonLine(LiveRow const& row, std::string const& time)
         {"mean", toJson(row.mean, row.numeric)},
         {"maximum", toJson(row.maximum, row.numeric)},
     };
-    if (!row.sensor.empty()) {
+    if (row.isSignal) {
         line["pid"] = textOrNull(row.request);
-        line["sensor"] = row.sensor;
+        line["sensor"] = row.key;
     }
     return line.dump(-1, ' ', false, Json::error_handler_t::replace) + "\n";
 }

@@ -2,7 +2,7 @@
 
 #include "common/text/text.h"
 
-#include <velmora/offers.h>
+#include <obd/parameteridentifier.h>
 
 #include <fmt/format.h>
 
@@ -16,39 +16,35 @@ namespace {
 constexpr std::chrono::seconds patience{2};
 constexpr int patienceRounds = 3;
 
-LiveRow makeRow(LiveParameter const& chosen, obd::SensorDescriptor const& sensor, bool alone, Units units)
+LiveRow makeRow(LiveSensor const& sensor, bool several)
 {
-    obd::ParameterDescriptor const& parameter = *chosen.descriptor;
     LiveRow row{};
-    row.uid = sensor.uid();
-    row.module = chosen.module;
-    if (chosen.hertz) {
-        row.period = std::chrono::duration_cast<LiveTime::duration>(std::chrono::duration<double>(1.0 / *chosen.hertz));
+    row.uid = sensor.uid;
+    row.module = sensor.module;
+    if (sensor.hertz) {
+        row.period = std::chrono::duration_cast<LiveTime::duration>(std::chrono::duration<double>(1.0 / *sensor.hertz));
     }
-    row.alone = alone;
-    row.name = alone ? parameter.description() : parameter.description() + ": " + sensor.description();
-    row.unit = sensorUnit(sensor.uid(), sensor.unit(), units);
-    auto const metric = chosen.metricUnits.find(row.uid);
-    row.metricUnit = metric != chosen.metricUnits.end() ? metric->second : row.unit;
-    // What has a unit is a number, though the library gives some, such as distances, as plain digits.
-    row.numeric = sensor.isNumeric() || !row.unit.empty();
+    bool const named = several && (!sensor.isSignal || sensor.module != 0);
+    row.name = named ? fmt::format("{:X} {}", sensor.module, sensor.name) : sensor.name;
+    row.unit = sensor.unit;
+    row.metricUnit = sensor.metricUnit;
+    row.key = sensor.key;
+    row.isSignal = sensor.isSignal;
+    row.request = sensor.request;
+    row.numeric = sensor.numeric;
     return row;
 }
 
-LiveRow makeRow(LiveParameter const& chosen)
+// The module of a parameter is that of each of its sensors.
+bool ofSeveralModules(LiveTable::Parameters const& parameters)
 {
-    LiveRow row{};
-    row.uid = obd::Pid2Uid(chosen.signal->id);
-    row.module = chosen.module;
-    if (chosen.hertz) {
-        row.period = std::chrono::duration_cast<LiveTime::duration>(std::chrono::duration<double>(1.0 / *chosen.hertz));
+    std::set<unsigned int> modules;
+    for (LiveParameter const& parameter : parameters) {
+        for (LiveSensor const& sensor : parameter) {
+            modules.insert(sensor.module);
+        }
     }
-    row.name = chosen.signal->name;
-    row.unit = row.metricUnit = chosen.signal->unit;
-    row.sensor = chosen.signal->sensor;
-    row.request = chosen.signal->request;
-    row.numeric = chosen.signal->numeric;
-    return row;
+    return modules.size() > 1;
 }
 
 // Begins the means up to that of now; those between have no readings.
@@ -109,15 +105,6 @@ bool LiveRow::isOutside() const
     return number && limit.isOutside(*number);
 }
 
-std::string keyOf(LiveRow const& row)
-{
-    if (!row.sensor.empty()) {
-        return row.sensor;
-    }
-    std::string const key = sensorKey(obd::Uid2Pid(row.uid));
-    return row.alone ? key : fmt::format("{}_{}", key, row.uid % 10 + 1);
-}
-
 void LiveTable::setLimits(std::function<SensorLimit(LiveRow const& row)> const& limitOf)
 {
     for (LiveRow& row : m_rows) {
@@ -125,32 +112,18 @@ void LiveTable::setLimits(std::function<SensorLimit(LiveRow const& row)> const& 
     }
 }
 
-void LiveTable::select(Parameters const& parameters, Units units)
+void LiveTable::select(Parameters const& parameters)
 {
     m_rows.clear();
     m_selected.clear();
     m_seen.clear();
     m_roundLength = {};
-    bool const several = std::any_of(parameters.begin(), parameters.end(), [&](LiveParameter const& each) {
-        return each.module != parameters.front().module;
-    });
+    bool const several = ofSeveralModules(parameters);
     for (LiveParameter const& parameter : parameters) {
-        if (parameter.signal) {
-            m_rows.push_back(makeRow(parameter));
-            if (several && parameter.module != 0) {
-                m_rows.back().name.insert(0, fmt::format("{:X} ", parameter.module));
-            }
-            m_selected.insert({parameter.module, parameter.signal->id});
-            continue;
+        for (LiveSensor const& sensor : parameter) {
+            m_rows.push_back(makeRow(sensor, several));
+            m_selected.insert({sensor.module, sensor.id});
         }
-        auto const sensors = parameter.descriptor->sensors();
-        for (auto const& sensor : sensors) {
-            m_rows.push_back(makeRow(parameter, *sensor, sensors.size() == 1, units));
-            if (several) {
-                m_rows.back().name.insert(0, fmt::format("{:X} ", parameter.module));
-            }
-        }
-        m_selected.insert({parameter.module, parameter.descriptor->pid()});
     }
 }
 

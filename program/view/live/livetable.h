@@ -1,9 +1,8 @@
 #pragma once
 
-#include "libvelmora/uds/signalrow.h"
+#include "libvelmora/live/livesensor.h"
 #include "program/view/framestyle.h"
 
-#include <obd/parameterdescriptor.h>
 #include <obd/sensordatamodels.h>
 #include <velmora/limits.h>
 #include <velmora/units.h>
@@ -21,23 +20,6 @@
 
 namespace velmora::cli {
 
-// A parameter to be shown.
-struct LiveParameter
-{
-    LiveParameter(std::shared_ptr<obd::ParameterDescriptor> parameter, unsigned int id = 0,
-                  std::optional<double> rate = std::nullopt)
-        : descriptor(std::move(parameter)), module(id), hertz(rate)
-    {}
-
-    explicit LiveParameter(SignalRow const& row) : module(row.module), hertz(row.hertz), signal(row) {}
-
-    std::shared_ptr<obd::ParameterDescriptor> descriptor; // null for a signal
-    unsigned int module;                                  // id of the control module; 0: any
-    std::optional<double> hertz;                          // how often it is to come
-    std::optional<SignalRow> signal{};
-    std::map<int, std::string> metricUnits{}; // by the sensors' uids, where other units are shown
-};
-
 // One sensor with what is known of it. Texts are empty where nothing is known, for a sensor that the vehicle no longer
 // answers for too.
 struct LiveRow
@@ -47,10 +29,10 @@ struct LiveRow
     std::string name; // with the module's id in front where there are several
     std::string unit;
     std::string metricUnit;
-    std::string sensor;  // key of a signal; empty for a standard sensor
+    std::string key; // of its sensor, for settings and recordings: "RPM", "LAMBDA_2", or a signal's own
+    bool isSignal;
     std::string request; // of a signal, hexadecimal
     bool numeric;
-    bool alone; // the only sensor of its parameter
     std::string value;
     std::string minimum;
     std::string mean;
@@ -66,9 +48,6 @@ struct LiveRow
     bool isOutside() const;
 };
 
-// The key of a row's sensor for settings and recordings: "RPM", "LAMBDA_2", or a signal's own.
-std::string keyOf(LiveRow const& row);
-
 // The live values of the selected parameters, in the order of their selection.
 class LiveTable
 {
@@ -80,7 +59,7 @@ public:
     using Values = std::vector<std::shared_ptr<obd::SensorValueDataModel>>;
 
     // Starts anew, with other parameters or other units.
-    void select(Parameters const& parameters, Units units = Units::Metric);
+    void select(Parameters const& parameters);
 
     // From now on, until others are selected.
     void setLimits(std::function<SensorLimit(LiveRow const& row)> const& limitOf);

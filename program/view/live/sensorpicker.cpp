@@ -9,16 +9,16 @@
 
 namespace velmora::cli {
 
-SensorPicker::SensorPicker(std::vector<OfferedSensor> offered, SensorIds const& chosen)
+SensorPicker::SensorPicker(std::vector<LiveOffer> offered, std::vector<int> const& chosen)
 {
-    for (obd::ParameterIdentifier::Id const id : chosen) {
-        auto const found = std::ranges::find(offered, id, &OfferedSensor::id);
+    for (int const id : chosen) {
+        auto const found = std::ranges::find(offered, id, &LiveOffer::id);
         if (found != offered.end()) {
             m_lines.push_back({*found, true});
             offered.erase(found);
         }
     }
-    for (OfferedSensor& each : offered) {
+    for (LiveOffer& each : offered) {
         m_lines.push_back({std::move(each), false});
     }
 }
@@ -52,9 +52,9 @@ void SensorPicker::carry(int lines)
     }
 }
 
-SensorIds SensorPicker::chosen() const
+std::vector<int> SensorPicker::chosen() const
 {
-    SensorIds ids;
+    std::vector<int> ids;
     for (Line const& each : m_lines) {
         if (each.marked) {
             ids.push_back(each.sensor.id);
@@ -71,7 +71,7 @@ std::string SensorPicker::draw(FrameStyle const& style) const
     for (std::size_t i = first; i < std::min(m_lines.size(), first + room); ++i) {
         Line const& each = m_lines[i];
         std::string const line = fmt::format("{} [{}] {:02X} {}", i == m_cursor ? ">" : " ", each.marked ? "x" : " ",
-                                             static_cast<int>(each.sensor.id), each.sensor.title);
+                                             each.sensor.id, each.sensor.title);
         text += looking(i == m_cursor ? Look::Marked : Look::Plain, cutTo(line, style.columns), style) + "\n";
     }
     return text + "\n" +

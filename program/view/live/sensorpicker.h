@@ -1,6 +1,6 @@
 #pragma once
 
-#include "libvelmora/read/sensorchoice.h"
+#include "libvelmora/live/livesensor.h"
 #include "program/view/framestyle.h"
 
 #include <string>
@@ -12,21 +12,21 @@ namespace velmora::cli {
 class SensorPicker
 {
 public:
-    SensorPicker(std::vector<OfferedSensor> offered, SensorIds const& chosen);
+    SensorPicker(std::vector<LiveOffer> offered, std::vector<int> const& chosen);
 
     void move(int lines); // the cursor: down, or up below 0
     void toggle();
     // Moves the sensor under the cursor among the others.
     void carry(int lines);
     // Those marked, in the order of the list.
-    SensorIds chosen() const;
+    std::vector<int> chosen() const;
 
     std::string draw(FrameStyle const& style) const;
 
 private:
     struct Line
     {
-        OfferedSensor sensor;
+        LiveOffer sensor;
         bool marked = false;
     };
 

@@ -46,7 +46,7 @@ TEST_F(PlayTableTest, ShowsValuesWithTheirDigitsAndStatistics)
     EXPECT_EQ(rpm.mean, "900");
     EXPECT_EQ(rpm.maximum, "1000");
     EXPECT_EQ(rpm.unit, "rpm");
-    EXPECT_EQ(keyOf(rpm), "RPM");
+    EXPECT_EQ(rpm.key, "RPM");
     EXPECT_EQ(table.rows()[1].value, "30.00") << "as many digits as the recording has";
     EXPECT_EQ(table.rows()[2].value, "");
     EXPECT_EQ(table.rows()[2].last, "on");

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "libvelmora/live/livesensors.h"
 #include "tests/support/fakeecu.h"
 
 #include <obd/parameterdescriptor.h>
@@ -50,13 +51,14 @@ private:
     std::vector<std::shared_ptr<obd::SensorInfo const>> m_infos;
 };
 
-inline std::shared_ptr<obd::ParameterDescriptor> liveParameter(int pid, std::string const& title,
-                                                               std::vector<std::string> const& sensors = {""},
-                                                               bool numeric = true, MeasurementUnit unit = UnitPercent)
+inline velmora::LiveParameter liveParameter(int pid, std::string const& title,
+                                            std::vector<std::string> const& sensors = {""}, bool numeric = true,
+                                            MeasurementUnit unit = UnitPercent,
+                                            velmora::Units units = velmora::Units::Metric)
 {
-    return std::make_shared<obd::ParameterDescriptor>(
-        std::make_shared<LiveParameter>(pid, title, sensors, numeric, unit), std::make_shared<FakeEcu>(),
-        obd::UnitSystem::Metric);
+    obd::ParameterDescriptor const descriptor(std::make_shared<LiveParameter>(pid, title, sensors, numeric, unit),
+                                              std::make_shared<FakeEcu>(), obd::UnitSystem::Metric);
+    return velmora::liveSensors(descriptor, descriptor, 0, std::nullopt, units);
 }
 
 inline std::shared_ptr<obd::SensorValueDataModel> liveValue(int uid, std::string const& text)

@@ -161,17 +161,16 @@ TEST(LiveScreen, TheSmallestScreenHasARow)
 
 TEST(LivePicker, MarksAndOrders)
 {
-    auto const id = [](int pid) { return obd::ParameterIdentifier(pid).id(); };
-    SensorPicker picker({{id(0x04), "Load"}, {id(0x0C), "RPM"}, {id(0x0D), "Speed"}}, {id(0x0D), id(0x0C)});
+    SensorPicker picker({{0x04, "Load"}, {0x0C, "RPM"}, {0x0D, "Speed"}}, {0x0D, 0x0C});
     EXPECT_THAT(picker.draw({40, 10}), HasSubstr("> [x] 0D Speed\n  [x] 0C RPM\n  [ ] 04 Load\n"));
     picker.move(1);
     picker.carry(-1);
-    EXPECT_THAT(picker.chosen(), ElementsAre(id(0x0C), id(0x0D)));
+    EXPECT_THAT(picker.chosen(), ElementsAre(0x0C, 0x0D));
     picker.toggle();
     picker.move(100);
     picker.toggle();
     picker.carry(1);
-    EXPECT_THAT(picker.chosen(), ElementsAre(id(0x0D), id(0x04)));
+    EXPECT_THAT(picker.chosen(), ElementsAre(0x0D, 0x04));
     picker.move(-100);
     picker.carry(-1);
     EXPECT_THAT(picker.draw({40, 10}), HasSubstr("> [ ] 0C RPM\n  [x] 0D Speed\n  [x] 04 Load\n"));
@@ -179,9 +178,9 @@ TEST(LivePicker, MarksAndOrders)
 
 TEST(LivePicker, ScrollsWithTheCursor)
 {
-    std::vector<OfferedSensor> offered;
+    std::vector<LiveOffer> offered;
     for (int pid = 3; pid < 0x20; ++pid) {
-        offered.push_back({obd::ParameterIdentifier(pid).id(), "x"});
+        offered.push_back({pid, "x"});
     }
     SensorPicker picker(offered, {});
     picker.move(15);

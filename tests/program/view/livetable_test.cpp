@@ -61,9 +61,9 @@ TEST_F(Live, GivesDigitsWithAUnitAndAnglesTheirSign)
 
 TEST_F(Live, TellsTheGallonsApart)
 {
-    table.select({liveParameter(0xF4, "Consumption", {""}, true, UnitConsumptionImperial)}, velmora::Units::ImperialUk);
+    table.select({liveParameter(0xF4, "Consumption", {""}, true, UnitConsumptionImperial, velmora::Units::ImperialUk)});
     EXPECT_EQ(table.rows()[0].unit, "mpg (UK)");
-    table.select({liveParameter(0xF4, "Consumption", {""}, true, UnitConsumptionImperial)}, velmora::Units::Imperial);
+    table.select({liveParameter(0xF4, "Consumption", {""}, true, UnitConsumptionImperial, velmora::Units::Imperial)});
     EXPECT_EQ(table.rows()[0].unit, "mpg");
 }
 
@@ -174,7 +174,7 @@ TEST_F(Live, ALimitIsFoundByTheSensorsKey)
 {
     std::vector<std::string> asked;
     table.setLimits([&asked](LiveRow const& row) {
-        asked.push_back(keyOf(row));
+        asked.push_back(row.key);
         return velmora::SensorLimit{{}, 6000.0};
     });
     EXPECT_EQ(asked, (std::vector<std::string>{"RPM", "SHORT_FUEL_TRIM_1_1", "SHORT_FUEL_TRIM_1_2", "FUEL_STATUS"}));

@@ -1,12 +1,12 @@
-#include "program/view/ratetext.h"
+#include "libvelmora/live/ratetext.h"
 
 #include <gtest/gtest.h>
 
 namespace {
 
+using velmora::missedRates;
 using velmora::PollRate;
-using velmora::cli::missedRates;
-using velmora::cli::reachedRates;
+using velmora::reachedRates;
 
 TEST(RateText, AskedAndReachedStandSideBySide)
 {

@@ -1,6 +1,9 @@
-#include "program/live/livechoice.h"
+#include "libvelmora/live/livechoice.h"
 
+#include "libvelmora/live/livesensors.h"
 #include "libvelmora/poll/sensorwish.h"
+#include "libvelmora/uds/vehiclevin.h"
+#include "libvelmora/vehicle/vehiclekey.h"
 
 #include <obd/iecu.h>
 #include <obd/ivelmorasettings.h>
@@ -15,15 +18,14 @@
 #include <set>
 #include <utility>
 
-namespace velmora::cli {
+namespace velmora {
 
 namespace {
 
-// The modules that words mean which name none: those of --ecu, or the first one.
-std::vector<unsigned int> modulesMeant(CommandSession const& session)
+std::vector<unsigned int> modulesMeant(Session const& session, LiveWish const& wish)
 {
     std::vector<unsigned int> ids;
-    if (session.options().ecu || session.options().allEcus) {
+    if (wish.selectedModules) {
         for (std::shared_ptr<obd::IEcu> const& ecu : session.selectedModules()) {
             ids.push_back(ecu->id());
         }
@@ -31,20 +33,10 @@ std::vector<unsigned int> modulesMeant(CommandSession const& session)
     return ids;
 }
 
-std::map<int, std::string> metricUnitsOf(std::shared_ptr<obd::PowertrainParameter> const& parameter,
-                                         std::shared_ptr<obd::IEcu> const& ecu)
-{
-    std::map<int, std::string> units;
-    for (auto const& sensor : obd::ParameterDescriptor(parameter, ecu, obd::UnitSystem::Metric).sensors()) {
-        units[sensor->uid()] = sensorUnit(sensor->uid(), sensor->unit(), Units::Metric);
-    }
-    return units;
-}
-
 } // namespace
 
-LiveChoice::LiveChoice(CommandSession& session, LiveOptions const& options, std::vector<std::string> const& words)
-    : m_session(session), m_options(options), m_offers(moduleOffers(session.obd(), modulesMeant(session))),
+LiveChoice::LiveChoice(Session& session, LiveWish const& wish, std::vector<std::string> const& words)
+    : m_session(session), m_wish(wish), m_offers(moduleOffers(session.obd(), modulesMeant(session, wish))),
       m_signals(session), m_choices(choose(words))
 {}
 
@@ -60,12 +52,12 @@ std::vector<PollChoice> LiveChoice::choose(std::vector<std::string> const& words
     std::vector<std::string> standard;
     for (std::string const& word : words) {
         SensorWish wish = parseSensorWish(word);
-        wish.hertz = wish.hertz ? wish.hertz : m_options.hertz;
+        wish.hertz = wish.hertz ? wish.hertz : m_wish.hertz;
         if (m_signals.choose(wish, meant)) {
             continue;
         }
         try {
-            choosePolled({word}, m_offers, m_options.hertz);
+            choosePolled({word}, m_offers, m_wish.hertz);
         } catch (Error const&) {
             if (!m_signals.chooseByName(wish, meant)) {
                 throw;
@@ -75,34 +67,44 @@ std::vector<PollChoice> LiveChoice::choose(std::vector<std::string> const& words
         standard.push_back(word);
     }
     return standard.empty() && !m_signals.empty() ? std::vector<PollChoice>()
-                                                  : choosePolled(standard, m_offers, m_options.hertz);
+                                                  : choosePolled(standard, m_offers, m_wish.hertz);
 }
 
-void LiveChoice::pick(SensorIds const& ids)
+void LiveChoice::pick(std::vector<int> const& ids)
 {
     std::vector<PollChoice> choices;
-    for (obd::ParameterIdentifier::Id const id : ids) {
+    for (int const number : ids) {
+        obd::ParameterIdentifier::Id const id = obd::ParameterIdentifier(number).id();
         auto const old = std::ranges::find(m_choices, id, &PollChoice::id);
-        choices.push_back(old != m_choices.end() ? *old : PollChoice{m_choices.front().ecu, id, m_options.hertz});
+        choices.push_back(old != m_choices.end() ? *old : PollChoice{m_choices.front().ecu, id, m_wish.hertz});
     }
     m_choices = std::move(choices);
 }
 
-SensorPicker LiveChoice::picker() const
+std::vector<int> LiveChoice::picked() const
 {
-    SensorIds ids;
+    std::vector<int> ids;
     for (PollChoice const& choice : m_choices) {
         if (choice.ecu != m_choices.front().ecu) {
             throw Error(ErrorKind::WrongUse, "Sensors of several modules are chosen on the command line");
         }
-        ids.push_back(choice.id);
+        ids.push_back(static_cast<int>(choice.id));
     }
+    return ids;
+}
+
+std::vector<LiveOffer> LiveChoice::offers() const
+{
     auto const offer = std::ranges::find_if(
         m_offers, [&](ModuleOffer const& each) { return !m_choices.empty() && each.ecu == m_choices.front().ecu; });
     if (offer == m_offers.end()) {
         throw Error(ErrorKind::WrongUse, "Signals are chosen on the command line");
     }
-    return {offer->sensors, ids};
+    std::vector<LiveOffer> list;
+    for (OfferedSensor const& each : offer->sensors) {
+        list.push_back({static_cast<int>(each.id), each.title});
+    }
+    return list;
 }
 
 std::shared_ptr<obd::IEcu> LiveChoice::chooseForRuns()
@@ -129,29 +131,28 @@ std::vector<std::string> LiveChoice::words() const
     return words;
 }
 
-LiveTable::Parameters LiveChoice::parameters() const
+std::vector<LiveParameter> LiveChoice::parameters() const
 {
     obd::IVelmoraSettings const& settings = *m_session.obd().getSettings();
-    LiveTable::Parameters chosen;
+    std::vector<LiveParameter> chosen;
     for (PollChoice const& choice : polled()) {
         auto const parameter = obd::ParameterFactory().createParameter(*choice.ecu, settings, choice.id);
         if (parameter != nullptr) {
-            auto const descriptor =
-                std::make_shared<obd::ParameterDescriptor>(parameter, choice.ecu, settings.unitSystem());
-            chosen.emplace_back(descriptor, choice.ecu->id(), choice.hertz);
-            chosen.back().metricUnits = metricUnitsOf(parameter, choice.ecu);
+            chosen.push_back(liveSensors(obd::ParameterDescriptor(parameter, choice.ecu, settings.unitSystem()),
+                                         obd::ParameterDescriptor(parameter, choice.ecu, obd::UnitSystem::Metric),
+                                         choice.ecu->id(), choice.hertz, m_session.units()));
         }
     }
     for (SignalRow const& row : m_replaced.empty() ? m_signals.rows() : std::vector<SignalRow>()) {
-        chosen.emplace_back(row);
+        chosen.push_back(liveSensors(row));
     }
     return chosen;
 }
 
-std::unique_ptr<LiveFeed> LiveChoice::feed(PollWill const& will)
+std::unique_ptr<LiveFeed> LiveChoice::feed()
 {
     return std::make_unique<LiveFeed>(
-        m_session.obd(), m_session.loop(), polled(), will, m_session.units(), m_session.channel(),
+        m_session.obd(), m_session.loop(), polled(), m_wish.will, m_session.units(), m_session.channel(),
         m_replaced.empty() ? m_signals.sources(m_choices.empty()) : std::vector<PollSource>());
 }
 
@@ -182,4 +183,14 @@ std::string LiveChoice::signalTroubles() const
     return text;
 }
 
-} // namespace velmora::cli
+std::optional<double> liveRate(std::string const& text)
+{
+    return parseSensorWish("x@" + text).hertz;
+}
+
+std::string layoutKey(Session& session)
+{
+    return vehicleKey(vehicleVin(*session.proxy()));
+}
+
+} // namespace velmora

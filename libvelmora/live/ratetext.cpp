@@ -1,4 +1,4 @@
-#include "program/view/ratetext.h"
+#include "libvelmora/live/ratetext.h"
 
 #include "libvelmora/poll/sensorwish.h"
 
@@ -8,7 +8,7 @@
 
 #include <algorithm>
 
-namespace velmora::cli {
+namespace velmora {
 
 namespace {
 
@@ -41,4 +41,4 @@ std::string missedRates(std::vector<PollRate> const& rates)
     return describe(rates, nearEnough);
 }
 
-} // namespace velmora::cli
+} // namespace velmora

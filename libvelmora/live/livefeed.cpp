@@ -1,8 +1,8 @@
-#include "program/live/livefeed.h"
+#include "libvelmora/live/livefeed.h"
 
 #include <utility>
 
-namespace velmora::cli {
+namespace velmora {
 
 LiveFeed::LiveFeed(obd::IObdVelmora const& obd, DispatchLoop& loop, std::vector<PollChoice> const& choices,
                    PollWill const& will, Units units, IChannelControl& channel, std::vector<PollSource> const& guests)
@@ -30,4 +30,4 @@ std::vector<PollResult> LiveFeed::take()
     return std::exchange(m_results, {});
 }
 
-} // namespace velmora::cli
+} // namespace velmora

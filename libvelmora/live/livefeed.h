@@ -1,5 +1,6 @@
 #pragma once
 
+#include "libvelmora/live/ratetext.h"
 #include "libvelmora/poll/vehiclepoll.h"
 #include "libvelmora/session/dispatchloop.h"
 
@@ -7,9 +8,9 @@
 #include <mutex>
 #include <vector>
 
-namespace velmora::cli {
+namespace velmora {
 
-// What a poller reads, for the main thread to take, whose loop it wakes.
+// What a poller reads, for the thread of the session to take, whose loop it wakes.
 class LiveFeed
 {
 public:
@@ -19,7 +20,9 @@ public:
 
     bool hasNew() const;
     std::vector<PollResult> take();
-    std::vector<PollRate> rates() const { return m_poller->rates(); }
+    // The rates that were asked for with those reached; see reachedRates and missedRates.
+    std::string reached() const { return reachedRates(m_poller->rates()); }
+    std::string missed() const { return missedRates(m_poller->rates()); }
 
 private:
     mutable std::mutex m_mutex;
@@ -27,4 +30,4 @@ private:
     std::unique_ptr<Poller> m_poller;  // ends before what it hands over to
 };
 
-} // namespace velmora::cli
+} // namespace velmora
