@@ -2,6 +2,7 @@
 #include "libvelmora/car/carsensors.h"
 
 #include <velmora/car.h>
+#include <velmora/vin.h>
 
 #include <utility>
 
@@ -59,6 +60,16 @@ std::vector<Reading> Car::read(std::vector<std::string> const& sensors)
 Watch Car::watch(std::vector<std::string> const& sensors, OnReading onReading, OnLink onLink)
 {
     return Watch(m_core->watch(sensors, std::move(onReading), std::move(onLink)));
+}
+
+std::unique_ptr<LiveReader> Car::live(LiveWish const& wish)
+{
+    return std::unique_ptr<LiveReader>(new LiveReader(m_core, m_core->live(wish)));
+}
+
+std::string Car::vehicleKey()
+{
+    return m_core->call([](Session& session) { return velmora::vehicleKey(vehicleVin(*session.proxy())); });
 }
 
 void Car::reconnect()

@@ -149,6 +149,16 @@ std::shared_ptr<WatchState> CarCore::watch(std::vector<std::string> const& senso
     return state;
 }
 
+std::shared_ptr<LiveState> CarCore::live(LiveWish const& wish)
+{
+    return call([&](Session& session) {
+        auto state = std::make_shared<LiveState>(session, wish);
+        std::erase_if(m_lives, [](std::weak_ptr<LiveState> const& each) { return each.expired(); });
+        m_lives.push_back(state);
+        return state;
+    });
+}
+
 void CarCore::startWatch(std::shared_ptr<WatchState> const& state)
 {
     auto sink = [this, state](PollResult const& result) {

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "libvelmora/car/livestate.h"
 #include "libvelmora/car/onecar.h"
 #include "libvelmora/car/threadanswer.h"
 #include "libvelmora/car/traffictap.h"
@@ -42,6 +43,7 @@ public:
 
     std::shared_ptr<WatchState> watch(std::vector<std::string> const& sensors, Car::OnReading onReading,
                                       Car::OnLink onLink);
+    std::shared_ptr<LiveState> live(LiveWish const& wish);
     void reconnect();
     // Has the core ask for sensors over and over.
     void keepAsking(std::vector<std::string> const& sensors);
@@ -53,6 +55,7 @@ public:
     std::string port();
 
 private:
+    friend class LiveReader;
     using Clock = std::chrono::steady_clock;
 
     // The answer is shared, for its thread may still hold it when the waiting one goes on.
@@ -88,6 +91,7 @@ private:
     OneCar const m_place;
     CarOptions const m_options;
     std::vector<std::shared_ptr<WatchState>> m_watches;
+    std::vector<std::weak_ptr<LiveState>> m_lives;
     Clock::time_point m_lastReading;
     Clock::time_point m_nextTry;
     std::chrono::seconds m_pause{0}; // before the try after the next

@@ -10,6 +10,7 @@
 #include <velmora/recorder.h>
 
 #include <algorithm>
+#include <utility>
 
 namespace velmora {
 
@@ -45,6 +46,11 @@ void CarCore::disconnect()
 {
     for (std::shared_ptr<WatchState> const& watch : m_watches) {
         watch->setPoller(nullptr);
+    }
+    for (std::weak_ptr<LiveState> const& each : std::exchange(m_lives, {})) {
+        if (std::shared_ptr<LiveState> const state = each.lock()) {
+            state->drop();
+        }
     }
     m_asking.reset();
     m_traffic.reset();

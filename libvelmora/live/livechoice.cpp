@@ -2,8 +2,6 @@
 
 #include "libvelmora/live/livesensors.h"
 #include "libvelmora/poll/sensorwish.h"
-#include "libvelmora/uds/vehiclevin.h"
-#include "libvelmora/vehicle/vehiclekey.h"
 
 #include <obd/iecu.h>
 #include <obd/ivelmorasettings.h>
@@ -25,7 +23,7 @@ namespace {
 std::vector<unsigned int> modulesMeant(Session const& session, LiveWish const& wish)
 {
     std::vector<unsigned int> ids;
-    if (wish.selectedModules) {
+    if (wish.allModules) {
         for (std::shared_ptr<obd::IEcu> const& ecu : session.selectedModules()) {
             ids.push_back(ecu->id());
         }
@@ -33,15 +31,20 @@ std::vector<unsigned int> modulesMeant(Session const& session, LiveWish const& w
     return ids;
 }
 
+std::optional<double> rateOf(LiveWish const& wish)
+{
+    return wish.rate.empty() ? std::nullopt : parseSensorWish("x@" + wish.rate).hertz;
+}
+
 } // namespace
 
-LiveChoice::LiveChoice(Session& session, LiveWish const& wish, std::vector<std::string> const& words)
-    : m_session(session), m_wish(wish), m_offers(moduleOffers(session.obd(), modulesMeant(session, wish))),
-      m_signals(session), m_choices(choose(words))
+LiveChoice::LiveChoice(Session& session, LiveWish const& wish)
+    : m_session(session), m_wish(wish), m_hertz(rateOf(wish)),
+      m_offers(moduleOffers(session.obd(), modulesMeant(session, wish))), m_signals(session), m_choices(choose())
 {}
 
 // Signals of one's own first, by id or name; then standard sensors; then words of a signal's name.
-std::vector<PollChoice> LiveChoice::choose(std::vector<std::string> const& words)
+std::vector<PollChoice> LiveChoice::choose()
 {
     std::vector<unsigned int> meant;
     for (ModuleOffer const& offer : m_offers) {
@@ -50,14 +53,14 @@ std::vector<PollChoice> LiveChoice::choose(std::vector<std::string> const& words
         }
     }
     std::vector<std::string> standard;
-    for (std::string const& word : words) {
+    for (std::string const& word : m_wish.sensors) {
         SensorWish wish = parseSensorWish(word);
-        wish.hertz = wish.hertz ? wish.hertz : m_wish.hertz;
+        wish.hertz = wish.hertz ? wish.hertz : m_hertz;
         if (m_signals.choose(wish, meant)) {
             continue;
         }
         try {
-            choosePolled({word}, m_offers, m_wish.hertz);
+            choosePolled({word}, m_offers, m_hertz);
         } catch (Error const&) {
             if (!m_signals.chooseByName(wish, meant)) {
                 throw;
@@ -67,7 +70,7 @@ std::vector<PollChoice> LiveChoice::choose(std::vector<std::string> const& words
         standard.push_back(word);
     }
     return standard.empty() && !m_signals.empty() ? std::vector<PollChoice>()
-                                                  : choosePolled(standard, m_offers, m_wish.hertz);
+                                                  : choosePolled(standard, m_offers, m_hertz);
 }
 
 void LiveChoice::pick(std::vector<int> const& ids)
@@ -76,7 +79,7 @@ void LiveChoice::pick(std::vector<int> const& ids)
     for (int const number : ids) {
         obd::ParameterIdentifier::Id const id = obd::ParameterIdentifier(number).id();
         auto const old = std::ranges::find(m_choices, id, &PollChoice::id);
-        choices.push_back(old != m_choices.end() ? *old : PollChoice{m_choices.front().ecu, id, m_wish.hertz});
+        choices.push_back(old != m_choices.end() ? *old : PollChoice{m_choices.front().ecu, id, m_hertz});
     }
     m_choices = std::move(choices);
 }
@@ -149,11 +152,12 @@ std::vector<LiveParameter> LiveChoice::parameters() const
     return chosen;
 }
 
-std::unique_ptr<LiveFeed> LiveChoice::feed()
+std::shared_ptr<LiveFeed> LiveChoice::feed()
 {
-    return std::make_unique<LiveFeed>(
-        m_session.obd(), m_session.loop(), polled(), m_wish.will, m_session.units(), m_session.channel(),
-        m_replaced.empty() ? m_signals.sources(m_choices.empty()) : std::vector<PollSource>());
+    PollWill const will{m_wish.fast, m_wish.pidsPerRequest};
+    return std::make_shared<LiveFeed>(m_session.obd(), polled(), will, m_session.units(), m_session.channel(),
+                                      m_replaced.empty() ? m_signals.sources(m_choices.empty())
+                                                         : std::vector<PollSource>());
 }
 
 std::string LiveChoice::modulesText() const
@@ -183,14 +187,9 @@ std::string LiveChoice::signalTroubles() const
     return text;
 }
 
-std::optional<double> liveRate(std::string const& text)
+void checkRate(std::string const& rate)
 {
-    return parseSensorWish("x@" + text).hertz;
-}
-
-std::string layoutKey(Session& session)
-{
-    return vehicleKey(vehicleVin(*session.proxy()));
+    parseSensorWish("x@" + rate);
 }
 
 } // namespace velmora

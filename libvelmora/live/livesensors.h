@@ -1,10 +1,10 @@
 #pragma once
 
-#include "libvelmora/live/livesensor.h"
 #include "libvelmora/uds/signalrow.h"
 #include "libvelmora/vehicle/units.h"
 
 #include <obd/parameterdescriptor.h>
+#include <velmora/live.h>
 
 namespace velmora {
 

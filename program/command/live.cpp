@@ -1,6 +1,5 @@
-#include "libvelmora/live/livechoice.h"
+#include "program/command/commandcar.h"
 #include "program/command/commands.h"
-#include "program/command/commandsession.h"
 #include "program/commandline.h"
 #include "program/live/liverun.h"
 #include "program/live/playeddialogue.h"
@@ -17,13 +16,13 @@ namespace velmora::cli {
 namespace {
 
 // Who waited for a time and saw nothing is told so; who ended it by hand saw it all.
-void judgeSilence(Session const& session, LiveRun const& run, LiveOptions const& options, bool quiet)
+void judgeSilence(CommandCar& car, LiveRun const& run, LiveOptions const& options, bool quiet)
 {
     std::vector<std::string> const silent = run.silentSensors();
     if (options.duration > 0.0 && !run.anyValue()) {
         flushOutput();
-        session.checkAdapter();
-        throw silentVehicle(session, "The vehicle gave none of the chosen values",
+        run.checkAdapter();
+        throw silentVehicle(car, "The vehicle gave none of the chosen values",
                             {"is the ignition on?", "`velmora sensors` lists what the vehicle offers"});
     }
     if (!silent.empty() && run.anyValue() && !quiet) {
@@ -38,22 +37,20 @@ ExitCode playRecording(GlobalOptions const& global, LiveOptions const& options, 
     return ExitCode::Done;
 }
 
-ExitCode readVehicle(GlobalOptions const& global, LiveOptions const& given)
+ExitCode readVehicle(GlobalOptions const& global, LiveOptions const& options)
 {
-    LiveOptions options = given;
     if (!options.rate.empty()) {
-        options.hertz = liveRate(options.rate);
+        checkRate(options.rate);
     }
     std::unique_ptr<LiveCsv> const csv =
         options.csv.empty() ? nullptr : std::make_unique<LiveCsv>(options.csv, options.force);
-    CommandSession session(global);
-    session.connect();
-    LiveRun run(session, options, csv.get());
+    CommandCar car(global);
+    LiveRun run(car, options, csv.get());
     run.run();
     if (std::string const troubles = run.signalTroubles(); !troubles.empty() && !global.quiet) {
         tell(troubles);
     }
-    judgeSilence(session, run, options, global.quiet);
+    judgeSilence(car, run, options, global.quiet);
     return ExitCode::Done;
 }
 

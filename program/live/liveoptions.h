@@ -1,7 +1,6 @@
 #pragma once
 
 #include <cstddef>
-#include <optional>
 #include <string>
 #include <vector>
 
@@ -19,8 +18,7 @@ struct LiveOptions
     double speed = 1.0;             // of play
     bool fast = false;              // as fast as the bus allows
     std::size_t pidsPerRequest = 6; // at most; with fast only
-    std::string rate;               // as given
-    std::optional<double> hertz;    // of sensors without a rate of their own
+    std::string rate;               // of sensors without a rate of their own
 };
 
 } // namespace velmora::cli

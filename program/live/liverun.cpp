@@ -8,7 +8,7 @@
 
 #include <velmora/error.h>
 #include <velmora/limits.h>
-#include <velmora/vin.h>
+#include <velmora/settingsfile.h>
 
 namespace velmora::cli {
 
@@ -27,31 +27,19 @@ SensorLimit limitOfRow(SensorLimits const& limits, LiveRow const& row)
     return converted(limits.of(row.key), row.metricUnit, row.unit);
 }
 
-LiveWish wishOf(CommandSession const& session, LiveOptions const& options)
-{
-    LiveWish wish;
-    wish.hertz = options.hertz;
-    wish.will.fast = options.fast;
-    wish.will.pidsPerRequest = options.pidsPerRequest;
-    wish.selectedModules = session.options().ecu || session.options().allEcus;
-    return wish;
-}
-
 } // namespace
 
-LiveRun::LiveRun(CommandSession& session, LiveOptions const& options, LiveCsv* csv)
-    : m_session(session), m_options(options), m_csv(csv)
+LiveRun::LiveRun(CommandCar& car, LiveOptions const& options, LiveCsv* csv)
+    : m_car(car), m_port(car.port()), m_options(options), m_csv(csv)
 {
     std::optional<LiveLayout> const layout = keptLayout();
     try {
-        m_choice =
-            std::make_unique<LiveChoice>(session, wishOf(session, options), layout ? layout->sensors : options.sensors);
-    } catch (Error const&) {
-        if (!layout) {
+        m_reader = car.live(wish(layout ? layout->sensors : options.sensors));
+    } catch (Error const& error) {
+        if (!layout || error.kind() == ErrorKind::Interrupted) {
             throw;
         }
-        m_choice = std::make_unique<LiveChoice>(session, wishOf(session, options),
-                                                options.sensors); // what it offers has changed
+        m_reader = car.live(wish(options.sensors)); // what it offers has changed
     }
     m_big = !layout || layout->big;
     select();
@@ -59,15 +47,31 @@ LiveRun::LiveRun(CommandSession& session, LiveOptions const& options, LiveCsv* c
 
 LiveRun::~LiveRun() = default;
 
+LiveWish LiveRun::wish(std::vector<std::string> const& sensors) const
+{
+    LiveWish wish;
+    wish.sensors = sensors;
+    wish.rate = m_options.rate;
+    wish.fast = m_options.fast;
+    wish.pidsPerRequest = m_options.pidsPerRequest;
+    wish.allModules = m_car.options().ecu || m_car.options().allEcus;
+    return wish;
+}
+
+std::string LiveRun::settingsFile() const
+{
+    return SettingsFile(m_car.options().settingsFile).path();
+}
+
 bool LiveRun::wantsScreen() const
 {
     bool const csvOnly = m_csv != nullptr && m_csv->toStandardOutput();
-    return !m_session.options().json && !csvOnly && Terminal::isUsable();
+    return !m_car.options().json && !csvOnly && Terminal::isUsable();
 }
 
 void LiveRun::openScreen()
 {
-    bool const coloured = outputStyle(m_session.options()).isColoured();
+    bool const coloured = outputStyle(m_car.options()).isColoured();
     m_terminal = Terminal::open(coloured);
     if (m_terminal == nullptr) {
         tell("Nothing is known of this kind of terminal, so values come in lines\n");
@@ -84,33 +88,26 @@ std::optional<LiveLayout> LiveRun::keptLayout()
     if (!wantsScreen() || m_csv != nullptr || !m_options.sensors.empty()) {
         return std::nullopt;
     }
-    return LiveLayouts(m_session.settingsFile()).load(vehicle());
+    return LiveLayouts(settingsFile()).load(vehicle());
 }
 
 std::string const& LiveRun::vehicle()
 {
     if (m_vehicle.empty()) {
-        m_vehicle = layoutKey(m_session);
+        m_vehicle = m_car.vehicleKey();
     }
     return m_vehicle;
 }
 
 void LiveRun::select()
 {
-    m_table.select(m_choice->parameters());
-    SensorLimits const limits(m_session.settingsFile().string());
+    m_modules = m_reader->modulesText();
+    m_table.select(m_reader->parameters());
+    SensorLimits const limits(m_car.options().settingsFile);
     m_table.setLimits([&limits](LiveRow const& row) { return limitOfRow(limits, row); });
     if (m_panel != nullptr) {
         m_panel->refresh();
     }
-}
-
-// Afresh, with other sensors, other units or empty statistics. The poller is gone before the next one begins.
-void LiveRun::start()
-{
-    m_feed.reset();
-    select();
-    m_feed = m_choice->feed();
 }
 
 void LiveRun::run()
@@ -125,10 +122,9 @@ void LiveRun::run()
     }
     if (m_options.fast && m_panel != nullptr) {
         m_panel->tell(fastWarning);
-    } else if (m_options.fast && !m_session.options().quiet) {
+    } else if (m_options.fast && !m_car.options().quiet) {
         tell(std::string(fastWarning) + "\n");
     }
-    m_feed = m_choice->feed();
     try {
         while (!isDone()) {
             runOnce();
@@ -157,7 +153,7 @@ void LiveRun::finish()
             keepLayout();
         }
     }
-    if (m_session.options().verbose) {
+    if (m_car.options().verbose) {
         tellRate();
     }
 }
@@ -183,10 +179,8 @@ bool LiveRun::isDone() const
 
 void LiveRun::runOnce()
 {
-    LiveTime const limit = Clock::now() + step;
-    m_session.loop().runUntil([&] { return m_feed->hasNew() || m_session.interrupted() || Clock::now() >= limit; },
-                              limit);
-    m_session.check();
+    m_reader->wait(step);
+    m_car.check();
     takeReadings();
     LiveTime const now = Clock::now();
     m_table.expire(now);
@@ -202,16 +196,16 @@ void LiveRun::runOnce()
 
 void LiveRun::takeReadings()
 {
-    for (PollResult const& result : m_feed->take()) {
+    for (LiveTurn const& turn : m_reader->take()) {
         if (!isDone()) {
-            take(result);
+            take(turn);
         }
     }
 }
 
-void LiveRun::take(PollResult const& result)
+void LiveRun::take(LiveTurn const& turn)
 {
-    bool const begins = m_table.beginsRound(result.id, result.module);
+    bool const begins = m_table.beginsRound(turn.id, turn.module);
     LiveTime const now = Clock::now();
     m_lastReading = now;
     m_silenceTold = false;
@@ -219,31 +213,28 @@ void LiveRun::take(PollResult const& result)
         m_quit = true;
         return;
     }
-    m_table.update(result.id, result.values, now, result.module);
-    for (Reading const& reading : result.readings) {
+    m_table.update(turn.id, turn.values, now, turn.module);
+    for (Reading const& reading : turn.readings) {
         if (m_record != nullptr) {
             m_record->take(reading);
-        }
-        if (m_performance != nullptr) {
-            m_performance->take(reading);
         }
     }
     if (m_csv != nullptr && !m_csv->update(m_table, now)) {
         m_readerGone = true;
     }
-    print(result);
+    print(turn);
 }
 
-void LiveRun::print(PollResult const& result)
+void LiveRun::print(LiveTurn const& turn)
 {
     if (m_terminal != nullptr || (m_csv != nullptr && m_csv->toStandardOutput())) {
         return;
     }
     std::string text;
     std::string const time =
-        isoTime(result.readings.empty() ? std::chrono::system_clock::now() : result.readings.front().time);
-    for (LiveRow const* row : m_table.rowsOf(result.id, result.module)) {
-        text += m_session.options().json ? toJsonLine(*row, time) : toLine(*row);
+        isoTime(turn.readings.empty() ? std::chrono::system_clock::now() : turn.readings.front().time);
+    for (LiveRow const* row : m_table.rowsOf(turn.id, turn.module)) {
+        text += m_car.options().json ? toJsonLine(*row, time) : toLine(*row);
     }
     m_readerGone = m_readerGone || !writeOutput(text);
 }

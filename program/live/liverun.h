@@ -1,7 +1,6 @@
 #pragma once
 
-#include "libvelmora/live/livechoice.h"
-#include "program/command/commandsession.h"
+#include "program/command/commandcar.h"
 #include "program/exitcode.h"
 #include "program/live/ilivehost.h"
 #include "program/live/livelayouts.h"
@@ -24,8 +23,8 @@ namespace velmora::cli {
 class LiveRun : private ILiveHost
 {
 public:
-    // csv may be null. session must be connected, and outlive the run as options must.
-    LiveRun(CommandSession& session, LiveOptions const& options, LiveCsv* csv);
+    // csv may be null. car and options must outlive the run.
+    LiveRun(CommandCar& car, LiveOptions const& options, LiveCsv* csv);
     ~LiveRun() override;
 
     // Until the count, the duration or the user ends it. Throws Error on a lost link and on Ctrl-C.
@@ -34,25 +33,28 @@ public:
     // The sensors that no value has come of, by their names.
     std::vector<std::string> silentSensors() const;
     // Signals whose replies gave no value or were refused, a line each.
-    std::string signalTroubles() const { return m_choice->signalTroubles(); }
+    std::string signalTroubles() const { return m_reader->signalTroubles(); }
     bool anyValue() const { return m_table.readings() > 0; }
+    // Throws Error if the adapter is silent.
+    void checkAdapter() const { m_reader->checkAdapter(); }
 
 private:
     bool wantsScreen() const;
     void openScreen();
     std::string const& vehicle();
     std::optional<LiveLayout> keptLayout();
-    void start();
+    std::string settingsFile() const;
+    LiveWish wish(std::vector<std::string> const& sensors) const;
     void select();
     void takeReadings();
-    void take(PollResult const& result);
+    void take(LiveTurn const& turn);
 
     bool isDone() const;
     void runOnce();
     void finish();
     void watchSilence(LiveTime now);
     void watchRates(LiveTime now);
-    void print(PollResult const& result);
+    void print(LiveTurn const& turn);
     void tellRate() const;
     double rate() const;
 
@@ -72,16 +74,17 @@ private:
     void keepLayout();
     std::string wholeTable() const;
 
-    CommandSession& m_session;
+    CommandCar& m_car;
+    std::string const m_port;
     LiveOptions const& m_options;
     LiveCsv* const m_csv;
     std::string m_vehicle;                // what its layout is kept under, once it is asked for
     bool m_big = true;                    // as the layout has it
     std::unique_ptr<Terminal> m_terminal; // null where lines are printed
     std::unique_ptr<LivePanel> m_panel;   // the same
-    std::unique_ptr<LiveChoice> m_choice;
+    std::unique_ptr<LiveReader> m_reader;
+    std::string m_modules; // of what is read
     LiveTable m_table;
-    std::unique_ptr<LiveFeed> m_feed;
     std::unique_ptr<LiveRecord> m_record;           // null while nothing is recorded
     std::unique_ptr<PerformancePage> m_performance; // null while the values are shown
     LiveTime m_start;

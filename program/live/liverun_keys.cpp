@@ -5,7 +5,6 @@
 #include "program/view/live/livescreen.h"
 #include "program/view/timetext.h"
 
-#include <obd/ivelmorasettings.h>
 #include <velmora/error.h>
 
 #include <fmt/format.h>
@@ -18,10 +17,10 @@ namespace velmora::cli {
 std::string LiveRun::title() const
 {
     double const elapsed = std::chrono::duration<double>(std::chrono::steady_clock::now() - m_start).count();
-    std::string const rates = m_feed->reached();
+    std::string const rates = m_reader->reachedRates();
     std::string const pace = fmt::format("{:.0f} s, {:.1f} readings/s", elapsed, rate());
-    return rates.empty() ? fmt::format("{}, {}, {}", m_session.port(), m_choice->modulesText(), pace)
-                         : fmt::format("{}, {}, {}, {}", m_session.port(), pace, rates, m_choice->modulesText());
+    return rates.empty() ? fmt::format("{}, {}, {}", m_port, m_modules, pace)
+                         : fmt::format("{}, {}, {}, {}", m_port, pace, rates, m_modules);
 }
 
 std::string LiveRun::state() const
@@ -49,14 +48,14 @@ SensorPicker LiveRun::picker() const
     if (m_performance != nullptr) {
         throw Error(ErrorKind::WrongUse, "Speed and engine speed alone are read here; p goes back to the values");
     }
-    std::vector<int> const picked = m_choice->picked();
-    return {m_choice->offers(), picked};
+    std::vector<int> const picked = m_reader->picked();
+    return {m_reader->offers(), picked};
 }
 
 void LiveRun::pick(std::vector<int> const& ids)
 {
-    m_choice->pick(ids);
-    start();
+    m_reader->pick(ids);
+    select();
     m_big = m_panel->big();
     keepLayout();
 }
@@ -69,7 +68,8 @@ std::optional<std::string> LiveRun::handle(Key key)
         m_quit = true;
         return "";
     case 'r':
-        start();
+        m_reader->restart();
+        select();
         return "The statistics begin anew";
     case 'u':
         switchUnits();
@@ -101,10 +101,8 @@ void LiveRun::switchUnits()
     if (m_csv != nullptr || m_record != nullptr) {
         throw Error(ErrorKind::WrongUse, "The recording's units are fixed");
     }
-    obd::IVelmoraSettings* const settings = m_session.obd().getSettings();
-    bool const metric = settings->unitSystem() == obd::UnitSystem::Metric;
-    settings->setUnitSystem(metric ? obd::UnitSystem::Imperial : obd::UnitSystem::Metric);
-    start();
+    m_reader->setMetric(m_reader->units() != Units::Metric);
+    select();
 }
 
 std::string LiveRun::switchRecording()
@@ -128,16 +126,16 @@ std::string LiveRun::switchPerformance()
 {
     if (m_performance != nullptr) {
         m_performance.reset();
-        m_choice->restore();
-        start();
+        m_reader->endRuns();
+        select();
         return {};
     }
     if (m_csv != nullptr) {
         throw Error(ErrorKind::WrongUse, "The recording's columns are fixed");
     }
-    std::shared_ptr<obd::IEcu> const module = m_choice->chooseForRuns();
-    m_performance = std::make_unique<PerformancePage>(module, *m_session.obd().getSettings());
-    start();
+    m_reader->beginRuns();
+    m_performance = std::make_unique<PerformancePage>(*m_reader);
+    select();
     return {};
 }
 
@@ -161,8 +159,11 @@ std::string LiveRun::snapshot() const
 void LiveRun::keepLayout()
 {
     try {
-        LiveLayouts(m_session.settingsFile()).save(vehicle(), {m_choice->words(), m_big});
+        LiveLayouts(settingsFile()).save(vehicle(), {m_reader->words(), m_big});
     } catch (Error const& error) {
+        if (error.kind() == ErrorKind::Interrupted) {
+            return; // who is in a hurry to leave wants no word of it
+        }
         if (m_panel != nullptr) {
             m_panel->tell(error.what());
         } else {

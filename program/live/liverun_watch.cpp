@@ -29,7 +29,7 @@ double LiveRun::rate() const
 void LiveRun::tellRate() const
 {
     fmt::print(stderr, "{} readings, {:.1f} a second\n", m_table.readings(), rate());
-    if (std::string const rates = m_feed->reached(); !rates.empty()) {
+    if (std::string const rates = m_reader->reachedRates(); !rates.empty()) {
         fmt::print(stderr, "Reached: {}\n", rates);
     }
 }
@@ -41,8 +41,8 @@ void LiveRun::watchRates(LiveTime now)
         return;
     }
     m_ratesTold = true;
-    std::string const missed = m_feed->missed();
-    if (!missed.empty() && m_terminal == nullptr && !m_session.options().quiet) {
+    std::string const missed = m_reader->missedRates();
+    if (!missed.empty() && m_terminal == nullptr && !m_car.options().quiet) {
         tell("More is asked for than the bus can give: " + missed + "\n");
     }
 }
@@ -54,19 +54,19 @@ void LiveRun::watchSilence(LiveTime now)
         return;
     }
     m_lastLinkCheck = now;
-    if (!m_session.proxy()->isConnected()) {
-        m_session.check();
+    if (!m_reader->isConnected()) {
+        m_car.check();
         throw Error(ErrorKind::AdapterSilent, "The adapter no longer answers",
                     {"is it still plugged in and in reach?"});
     }
     if (m_options.count > 0 && now - m_lastReading > longSilence) {
-        throw silentVehicle(m_session,
+        throw silentVehicle(m_car,
                             m_table.readings() == 0 ? "The vehicle gives none of the chosen values"
                                                     : "The vehicle no longer answers",
                             {"is the ignition still on?"});
     }
-    if (!m_silenceTold && m_terminal == nullptr && !m_session.options().quiet) {
-        std::string const trouble = m_session.trouble();
+    if (!m_silenceTold && m_terminal == nullptr && !m_car.options().quiet) {
+        std::string const trouble = m_car.trouble();
         tell(trouble.empty()
                  ? "No values come from the vehicle; still asking. Is the ignition on?\n"
                  : fmt::format("No values come from the vehicle, the adapter reports {}; still asking\n", trouble));

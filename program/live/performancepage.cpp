@@ -3,34 +3,26 @@
 #include "program/live/userfiles.h"
 #include "program/view/performancetext.h"
 
-#include <obd/ivelmorasettings.h>
 #include <velmora/error.h>
-
-#include <utility>
 
 namespace velmora::cli {
 
-PerformancePage::PerformancePage(std::shared_ptr<obd::IEcu> module, obd::IVelmoraSettings const& settings)
-    : m_settings(settings), m_timer(std::move(module), settings)
+PerformancePage::PerformancePage(LiveReader const& reader)
+    : m_reader(reader), m_imperial(reader.units() != Units::Metric)
 {}
-
-bool PerformancePage::isImperial() const
-{
-    return m_settings.unitSystem() == obd::UnitSystem::Imperial;
-}
 
 std::string PerformancePage::draw(std::string const& note, FrameStyle const& style) const
 {
-    return drawPerformance({m_timer.run(), isImperial(), note}, style);
+    return drawPerformance({m_reader.run(), m_imperial, note}, style);
 }
 
 std::string PerformancePage::save() const
 {
-    PerformanceRun const run = m_timer.run();
+    PerformanceRun const run = m_reader.run();
     if (run.speeds.empty()) {
         throw Error(ErrorKind::Failed, "There is no run yet");
     }
-    return "Saved as " + saveUserText("performance", ".json", toJson(run, sprintGoals(isImperial()))).string();
+    return "Saved as " + saveUserText("performance", ".json", toJson(run, sprintGoals(m_imperial))).string();
 }
 
 } // namespace velmora::cli

@@ -2,9 +2,8 @@
 
 #include "program/view/framestyle.h"
 
-#include <velmora/performance.h>
+#include <velmora/live.h>
 
-#include <memory>
 #include <string>
 
 namespace velmora::cli {
@@ -13,19 +12,16 @@ namespace velmora::cli {
 class PerformancePage
 {
 public:
-    // module: whose readings count. settings must outlive it.
-    PerformancePage(std::shared_ptr<obd::IEcu> module, obd::IVelmoraSettings const& settings);
+    // reader must outlive it, and time runs.
+    explicit PerformancePage(LiveReader const& reader);
 
-    void take(Reading const& reading) { m_timer.take(reading); }
     std::string draw(std::string const& note, FrameStyle const& style) const;
     // Writes the run to a file of the user's, and tells which.
     std::string save() const;
 
 private:
-    bool isImperial() const;
-
-    obd::IVelmoraSettings const& m_settings;
-    PerformanceTimer m_timer;
+    LiveReader const& m_reader;
+    bool const m_imperial;
 };
 
 } // namespace velmora::cli

@@ -4,6 +4,7 @@
 #include <velmora/caroptions.h>
 #include <velmora/error.h>
 #include <velmora/export.h>
+#include <velmora/live.h>
 #include <velmora/modules.h>
 #include <velmora/offers.h>
 #include <velmora/probe.h>
@@ -103,6 +104,11 @@ public:
     /// readings come in.
     /// A sensor may have a rate: "RPM@10hz".
     [[nodiscard]] Watch watch(std::vector<std::string> const& sensors, OnReading onReading, OnLink onLink = {});
+    /// Reads over and over for a view, which takes what has come, until the result is destroyed; see <velmora/live.h>.
+    /// A loss of the link ends it. Throws Error for what is not known, not clear, or not offered.
+    [[nodiscard]] std::unique_ptr<LiveReader> live(LiveWish const& wish);
+    /// What this vehicle's own things are kept under, such as the layout of a view. Asks the vehicle for its number.
+    std::string vehicleKey();
 
     /// The trouble codes of all control modules. Throws Error if none told any of its lists; whether each module told
     /// all of its own is in codeReports.

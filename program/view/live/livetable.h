@@ -1,11 +1,10 @@
 #pragma once
 
-#include "libvelmora/live/livesensor.h"
 #include "program/view/framestyle.h"
 
 #include <obd/sensordatamodels.h>
 #include <velmora/limits.h>
-#include <velmora/units.h>
+#include <velmora/live.h>
 
 #include <chrono>
 #include <deque>

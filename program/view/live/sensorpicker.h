@@ -1,7 +1,8 @@
 #pragma once
 
-#include "libvelmora/live/livesensor.h"
 #include "program/view/framestyle.h"
+
+#include <velmora/live.h>
 
 #include <string>
 #include <vector>
