@@ -4,6 +4,8 @@
 #include "tests/support/fakeecu.h"
 #include "tests/support/memorysettings.h"
 
+#include <velmora/performance.h>
+
 #include <gtest/gtest.h>
 
 namespace {
