@@ -1,20 +1,16 @@
 #include "program/live/playeddialogue.h"
 
-#include "libvelmora/replay/readdialogue.h"
-#include "program/command/commandsession.h"
+#include "program/command/commandcar.h"
 #include "program/terminal/output.h"
-
-#include <memory>
 
 namespace velmora::cli {
 
 std::optional<Recording> playedDialogue(GlobalOptions const& global, std::string const& file)
 {
     GlobalOptions replayed = global;
-    replayed.port = "replay:" + file + "?instant";
     replayed.quiet = true; // there is no vehicle whose connection would be worth telling
-    std::optional<Recording> recording =
-        readDialogue(file, [&replayed] { return std::make_shared<CommandSession>(replayed); });
+    InterruptStop const stop;
+    std::optional<Recording> recording = readDialogueRecording(file, carOptions(replayed, stop.token()));
     if (!recording && !global.quiet) {
         tell("The dialogue has no times: it is read as a vehicle, without pause and bar\n");
     }

@@ -12,15 +12,15 @@
 
 namespace velmora::cli {
 
-ExitCode playOnPage(GlobalOptions const& global, std::string const& address, Recording const& recording,
-                    double speed)
+ExitCode playOnPage(GlobalOptions const& global, std::string const& address, Recording const& recording, double speed)
 {
-    PagePlay play(recording, address, speed, global.settingsFile, [](std::string const& link, std::string const& remark) {
-        fmt::print("{}\n", link);
-        flushOutput();
-        tell(remark.empty() ? remark : remark + "\n");
-        tell(qrForTerminal(link, STDERR_FILENO));
-    });
+    PagePlay play(recording, address, speed, global.settingsFile,
+                  [](std::string const& link, std::string const& remark) {
+                      fmt::print("{}\n", link);
+                      flushOutput();
+                      tell(remark.empty() ? remark : remark + "\n");
+                      tell(qrForTerminal(link, STDERR_FILENO));
+                  });
     Interrupt::instance().setHandler([&play] { play.end(); });
     try {
         play.run();

@@ -10,7 +10,6 @@
 namespace velmora::cli {
 
 // Shows a recording on the page in the place of a vehicle, until the user ends it. Throws Error.
-ExitCode playOnPage(GlobalOptions const& global, std::string const& address, Recording const& recording,
-                    double speed);
+ExitCode playOnPage(GlobalOptions const& global, std::string const& address, Recording const& recording, double speed);
 
 } // namespace velmora::cli

@@ -7,12 +7,15 @@
 #include <cstdint>
 #include <functional>
 #include <memory>
+#include <optional>
 #include <string>
 #include <vector>
 
 /// Recordings of readings, and who plays them: as a person looks at them, or on the page for browsers.
 
 namespace velmora {
+
+struct CarOptions;
 
 /// A sensor as lists and recordings name it.
 struct SensorEntry
@@ -65,6 +68,11 @@ VELMORA_EXPORT RecordingForm formOf(std::string const& file);
 /// All readings of a file that is no dialogue. Throws Error that names the line which can't be read; a last line that
 /// is torn is left out.
 VELMORA_EXPORT Recording readRecording(std::string const& file);
+/// The live values that a dialogue of a Recorder holds, each at the time that its reply was whole. Dialogues keep the
+/// time that replies took and no other, so it counts from the first command and leaves out what the host waited.
+/// Nothing where no two readings lie apart: such a dialogue can only be read as a vehicle. options: those of the car
+/// that reads it; their port does not matter. Throws Error.
+VELMORA_EXPORT std::optional<Recording> readDialogueRecording(std::string const& file, CarOptions const& options);
 
 /// Plays a recording: gives its values as time goes on, at a speed, with pauses and jumps. One thread.
 class VELMORA_EXPORT RecordingPlayer
@@ -106,8 +114,8 @@ class VELMORA_EXPORT PagePlay
 {
 public:
     /// address: that of the output, such as "dash:127.0.0.1:8722". settingsFile: the layouts stand beside it; the
-    /// user's own if empty. onLink: told of the page's link, and what to know about it. Throws Error for an address that
-    /// makes no sense, and in a build without the page.
+    /// user's own if empty. onLink: told of the page's link, and what to know about it. Throws Error for an address
+    /// that makes no sense, and in a build without the page.
     PagePlay(Recording recording, std::string const& address, double speed, std::string const& settingsFile,
              std::function<void(std::string const& link, std::string const& remark)> onLink);
     ~PagePlay();
