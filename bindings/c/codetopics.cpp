@@ -46,7 +46,8 @@ using namespace velmora;
 
 int velmora_car_codes(velmora_car* car, velmora_code_fn fn, void* user, velmora_error** error)
 {
-    return cface::tellEach(car, &Car::codeReports, cface::tellCodes, fn, user, error);
+    return cface::tellEach(
+        car, [](Car& asked) { return asked.codeReports(); }, cface::tellCodes, fn, user, error);
 }
 
 int velmora_car_clear(velmora_car* car, uint32_t flags, velmora_cleared_fn fn, void* user, velmora_error** error)

@@ -4,6 +4,7 @@
 #include "program/exitcode.h"
 #include "program/live/ilivehost.h"
 #include "program/live/livelayouts.h"
+#include "program/live/liveoptions.h"
 #include "program/live/livepanel.h"
 #include "program/live/liverecord.h"
 #include "program/live/performancepage.h"

@@ -3,6 +3,7 @@
 #include "libobd/powertrain/formula.h"
 #include "libobd/powertrain/parametertables.h"
 #include "libobd/powertrain/quantities.h"
+#include "libvelmora/live/livesensors.h"
 #include "libvelmora/read/sensorchoice.h"
 #include "libvelmora/read/sensornames.h"
 #include "program/view/live/livelines.h"
@@ -50,7 +51,7 @@ public:
     void onSensorUpdated(bool /*success*/, std::shared_ptr<obd::ParameterDescriptor> const& descriptor,
                          std::vector<std::shared_ptr<obd::SensorValueDataModel>> const& read) override
     {
-        table.select({descriptor});
+        table.select({velmora::liveSensors(*descriptor, *descriptor, 0, std::nullopt, velmora::Units::Metric)});
         table.update(descriptor->pid(), read, velmora::cli::LiveTime());
     }
 
