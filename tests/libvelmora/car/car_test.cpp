@@ -360,4 +360,26 @@ TEST(CarLife, TellsALossAndReconnects)
     EXPECT_EQ(car.read({"RPM"}).size(), 1U);
 }
 
+TEST(CarFiles, GetTheLogAndTheTraffic)
+{
+    testsupport::TemporaryFolder const folder;
+    velmora::CarOptions options;
+    options.port = "sim:petrol-can11?instant";
+    options.settingsFile = folder.file("settings.toml");
+    options.logFile = folder.file("log");
+    options.traceFile = folder.file("trace");
+    {
+        Car car(options);
+        EXPECT_EQ(car.modules().size(), 2U);
+    }
+    EXPECT_FALSE(folder.read("log").empty());
+    EXPECT_NE(folder.read("trace").find("0100"), std::string::npos);
+}
+
+TEST(LinkState, IsPrintedAsAWord)
+{
+    EXPECT_EQ(printed(velmora::LinkState::Lost), "lost");
+    EXPECT_EQ(printed(velmora::LinkState::Returned), "returned");
+}
+
 } // namespace

@@ -87,6 +87,22 @@ TEST(BringUp, CountsOfAVehicleHoldOnceItsNumberIsRead)
     }
 }
 
+TEST(BringUp, CountsAreNotKeptForANumberThatIsNone)
+{
+    testsupport::TemporaryFolder const folder;
+    for (int visit = 0; visit < 2; ++visit) {
+        ChannelRig rig(std::make_shared<LearntStore>(folder.path() / "learnt.toml"));
+        rig.wire->on("010C", saidPlainly(speedLine)).on("010C1", saidCounted(speedLine));
+        rig.wire->on("0902", saidPlainly("7E8101449020156454C\r7E8214D524153314D4D\r7E8223030303030302D")); // a dash
+        rig.connect();
+        rig.ask("0902");
+        rig.wire->takeCommands();
+        rig.ask("010C");
+        rig.ask("010C");
+        EXPECT_THAT(rig.wire->takeCommands(), ElementsAre("010C", "010C"));
+    }
+}
+
 TEST(BringUp, AFileThatIsNoneIsAsNone)
 {
     testsupport::TemporaryFolder const folder;

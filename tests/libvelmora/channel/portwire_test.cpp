@@ -34,4 +34,15 @@ TEST(PortWire, AFloodEndsTheLinkAndFillsNoMemory)
     EXPECT_EQ(wire.read(wire.now()).size(), 17 * piece.size()) << "what was too much, and nothing behind it";
 }
 
+TEST(PortWire, IsDownWhileItIsGivenUp)
+{
+    velmora::IPort::Receiver say;
+    velmora::PortWire wire(std::make_unique<PlayedPort>(say));
+    wire.giveUp();
+    EXPECT_FALSE(wire.isUp());
+    EXPECT_FALSE(wire.lost()) << "the link itself is whole";
+    EXPECT_TRUE(wire.resume());
+    EXPECT_TRUE(wire.isUp());
+}
+
 } // namespace

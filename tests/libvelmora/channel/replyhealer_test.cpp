@@ -1,3 +1,4 @@
+#include "libvelmora/channel/bringupmemory.h"
 #include "libvelmora/channel/replyhealer.h"
 
 #include <gtest/gtest.h>
@@ -138,6 +139,60 @@ TEST(ReplyHealer, ANulIsTakenOut)
     EXPECT_EQ(counts[static_cast<std::size_t>(Habit::StrayBytes)], 1U);
 }
 
+TEST(ReplyHealer, AFirstFrameThatComesTwiceCountsOnce)
+{
+    HabitCounts counts{};
+    ReplyHealer healer(counts);
+    std::string const first = "7E8101449020156454C\r";
+    std::string const rest = "7E8214D524153314D4D\r7E82230303030303031\r";
+    HealedReply const reply = healer.heal(first + first + rest, {ElmCommand("0902"), "0902", BusKind::Can11, true});
+    EXPECT_EQ(reply.text(), first + rest);
+    EXPECT_EQ(counts[static_cast<std::size_t>(Habit::RepeatedFrame)], 1U);
+}
+
+TEST(BringUpMemory, BeginsAnewEachTime)
+{
+    HabitCounts counts{};
+    ReplyHealer healer(counts);
+    ElmCommand const mask("0100");
+    ReplyContext const context{mask, "0100", BusKind::Can11, true};
+    BringUpMemory memory;
+    memory.remember(mask, healer.heal("7E8064100BE3EA813\r", context));
+    EXPECT_EQ(memory.recall(mask), std::nullopt) << "not begun";
+    for (char const* const reply : {"7E8064100BE3EA813\r", "7E906410098188001\r"}) {
+        memory.start();
+        EXPECT_EQ(memory.recall(mask), std::nullopt);
+        memory.remember(mask, healer.heal(reply, context));
+        EXPECT_EQ(memory.recall(mask), reply) << "the vehicle may be another one";
+    }
+    memory.remember(ElmCommand("0120"),
+                    healer.heal("7E8064120A0010001\r", {ElmCommand("0120"), "0120", BusKind::Can11, true}));
+    EXPECT_EQ(memory.recall(ElmCommand("0120")), std::nullopt) << "another module has spoken";
+    memory.stop();
+    EXPECT_EQ(memory.recall(mask), std::nullopt);
+}
+
+TEST(BusKinds, FollowTheNumbersOfProtocols)
+{
+    std::vector<BusKind> kinds;
+    for (int protocol = -1; protocol <= 11; ++protocol) {
+        kinds.push_back(busKindOf(protocol));
+    }
+    EXPECT_EQ(kinds, (std::vector<BusKind>{BusKind::Unknown, BusKind::Unknown, BusKind::J1850, BusKind::J1850,
+                                           BusKind::Iso9141, BusKind::Kwp, BusKind::Kwp, BusKind::Can11, BusKind::Can29,
+                                           BusKind::Can11, BusKind::Can29, BusKind::Unknown, BusKind::Unknown}));
+}
+
+TEST(ElmCommands, OfOneShapeAreLiveValuesAndTheItemsOfTheStandard)
+{
+    for (char const* fixed : {"010C", "010C0D", "0902", "090F"}) {
+        EXPECT_TRUE(ElmCommand(fixed).hasFixedShape()) << fixed;
+    }
+    for (char const* loose : {"0910", "09", "090204", "03", "ATI"}) {
+        EXPECT_FALSE(ElmCommand(loose).hasFixedShape()) << loose;
+    }
+}
+
 // Two frames with the same number and other data: nothing tells which of them is right.
 TEST(ReplyHealer, AMessageWithTwoFramesForOnePlaceGoes)
 {
@@ -178,7 +233,7 @@ TEST(ReplyHealer, TellsAResetFromAnErrorOfTheBus)
     for (char const* raw : {"ELM327 v1.5\r", "LV RESET\r", "ERR94\r", "\r\rELM327 v2.1\r"}) {
         EXPECT_TRUE(healer.heal(raw, context).reset) << raw;
     }
-    for (char const* raw : {"BUS ERROR\r", "CAN ERROR\r", "7E804410C1AF8\r"}) {
+    for (char const* raw : {"BUS ERROR\r", "CAN ERROR\r", "ERR\r", "ERRA1\r", "ERR941\r", "7E804410C1AF8\r"}) {
         EXPECT_FALSE(healer.heal(raw, context).reset) << raw;
     }
 }

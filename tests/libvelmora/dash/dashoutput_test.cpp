@@ -152,6 +152,8 @@ TEST(DashOutput, KeepsALayoutForItsVehicle)
     EXPECT_EQ(nextEvent(other, "hello")["layout"], nullptr);
     page.desk->tell(velmora::DashVehicle{"van", {}});
     EXPECT_EQ(nextEvent(other, "hello")["layout"]["units"], "imperial");
+    page.post("/layout", R"({"units":"metric"})");
+    EXPECT_EQ(nextEvent(other, "layout")["units"], "metric") << "other browsers follow";
 }
 
 TEST(DashOutput, AsksTheCarForWhatIsAllowedOnly)

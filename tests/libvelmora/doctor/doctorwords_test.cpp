@@ -1,6 +1,7 @@
 // What the doctor says, word by word, of adapters that a test plays and of findings that it makes up.
 
 #include "libvelmora/doctor/adaptercheck.h"
+#include "libvelmora/doctor/commandmatrix.h"
 #include "libvelmora/doctor/portcheck.h"
 #include "tests/support/temporaryfolder.h"
 
@@ -110,6 +111,22 @@ TEST(DoctorsAdapter, IsToldFromItsReplies)
     DoctorReport const stn = adapterReport({{"ATI", "ELM327 v1.4a"}, {"STI", "STN1110 v4.2.0"}});
     EXPECT_EQ(linesOf(stn)[1], "ok adapter: STN1110 v4.2.0|");
     EXPECT_THAT(linesOf(stn)[2], HasSubstr("lacks")) << "what an STN claims besides is not held against it";
+}
+
+TEST(DoctorsAdapter, KnowsACommandByItsOkOrByAText)
+{
+    auto const missing = [](char const* reply) {
+        return velmora::probeCommands([reply](std::string const&) { return reply; }, "ELM327 v2.3", false).missing;
+    };
+    EXPECT_EQ(missing("?").size(), 50U);
+    EXPECT_EQ(missing("huh").size(), 37U) << "thirteen are questions";
+    EXPECT_THAT(missing("huh"), testing::Contains("ATIFR1"));
+    EXPECT_THAT(missing("huh"), Not(testing::Contains("ATDPN")));
+    EXPECT_EQ(missing("").size(), 50U);
+    auto const stn = velmora::probeCommands([](std::string const&) { return "?"; }, "ELM327 v2.3", true);
+    EXPECT_THAT(stn.missing, Not(testing::Contains("ATAMC")));
+    EXPECT_THAT(stn.missing, testing::SizeIs(45U));
+    EXPECT_EQ(stn.level, "");
 }
 
 TEST(DoctorsAdapter, IsAskedForItsNameTwice)

@@ -162,6 +162,7 @@ TEST(KeptScanLine, GoesByTheFirstRealVinElseByTheName)
     EXPECT_EQ(makeScan(vehicleOf({first, second}), "golf", firstTime, "1").vehicle, american);
     EXPECT_EQ(makeScan(vehicleOf({first}), "golf", firstTime, "1").vehicle, "golf");
     EXPECT_THROW(makeScan(vehicleOf({first}), "", firstTime, "1"), Error);
+    EXPECT_EQ(makeScan(vehicleOf({first}), "golf", firstTime, "1").number, 0) << "the history numbers it";
     EXPECT_EQ(timeText(firstTime), "2026-05-01T10:00:00.123Z");
 }
 

@@ -56,7 +56,9 @@ TEST(HttpServer, ServesRoutes)
                 HasSubstr("\r\n\r\nPOST /a  hi me"));
     EXPECT_THAT(rig.ask(get("/files/x/y")), HasSubstr("GET /files/x/y"));
     EXPECT_THAT(rig.ask(get("/files/bad")), StartsWith("HTTP/1.1 500"));
-    EXPECT_THAT(rig.ask(get("/b")), StartsWith("HTTP/1.1 404"));
+    for (char const* const elsewhere : {"/b", "/files", "/filesX", "/ab", "/"}) {
+        EXPECT_THAT(rig.ask(get(elsewhere)), StartsWith("HTTP/1.1 404")) << elsewhere;
+    }
     std::string const refused = rig.ask("PUT /a HTTP/1.1\r\nConnection: close\r\n\r\n");
     EXPECT_THAT(refused, StartsWith("HTTP/1.1 405"));
     EXPECT_THAT(refused, HasSubstr("Allow: GET, POST"));
@@ -86,6 +88,15 @@ TEST(HttpServer, RefusesWhatIsTooLongOrNoHttp)
     EXPECT_THAT(rig.ask("POST /a HTTP/1.1\r\nContent-Length: 101\r\n\r\n"), StartsWith("HTTP/1.1 413"));
     EXPECT_THAT(rig.ask("nonsense\r\n\r\n"), StartsWith("HTTP/1.1 400"));
     EXPECT_THAT(rig.ask(get("/a")), StartsWith("HTTP/1.1 200")); // and goes on
+
+    Rig const usual;
+    auto const posted = [&usual](std::size_t size) {
+        return usual.ask("POST /a HTTP/1.1\r\nContent-Length: " + std::to_string(size) +
+                         "\r\nConnection: close\r\n\r\n" + std::string(size, 'x'));
+    };
+    EXPECT_THAT(posted(65536), StartsWith("HTTP/1.1 200"));
+    EXPECT_THAT(posted(65537), StartsWith("HTTP/1.1 413"));
+    EXPECT_THAT(usual.ask("GET /a HTTP/1.1\r\nX: " + std::string(8192, 'x') + "\r\n\r\n"), StartsWith("HTTP/1.1 431"));
 }
 
 TEST(HttpServer, ASlowClientIsCutOffAndTooManyAreNotServed)

@@ -185,6 +185,7 @@ TEST(SpoolSender, WaitsForTheConsumersMarkAndBelievesNoneThatCannotBe)
     EXPECT_EQ(sent.spool.rows(), 6);
     sent.now += 29s;
     EXPECT_FALSE(sent.sender.isStuck(sent.now));
+    sent.sender.onMark(4, sent.now); // says nothing new
     sent.now += 1s;
     EXPECT_TRUE(sent.sender.isStuck(sent.now)); // lost on the way: over a new connection, then
     sent.up();

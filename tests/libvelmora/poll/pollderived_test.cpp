@@ -103,6 +103,10 @@ TEST(OxygenCurrent, TheOffsetIsOfTheCurrentsAlone)
     EXPECT_EQ(velmora::shownText(0x33 * 10 + 1, "5.00"), "5.00");
     EXPECT_EQ(velmora::shownText(0x3C * 10 + 1, "5.00"), "5.00");
     EXPECT_EQ(velmora::shownText(0x34 * 10 + 1, ""), "");
+    EXPECT_EQ(velmora::shownText(0x34 * 10 + 1, "200"), "72");
+    for (char const* const text : {"on", "5 mA", "1.5x"}) {
+        EXPECT_EQ(velmora::shownText(0x34 * 10 + 1, text), text);
+    }
 }
 
 } // namespace

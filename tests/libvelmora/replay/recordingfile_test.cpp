@@ -74,6 +74,10 @@ TEST(Recordings, OfTheWatchNameModulesAndLeaveOutWhatDidNotCome)
     Recording const rows = csvOf("time,vehicle,module,pid,sensor,name,value,unit\n"
                                  "2024-03-07T09:05:00.000Z,car,7E8,010C,RPM,Engine RPM,800,rpm\n"
                                  "2024-03-07T09:05:00.500Z,car,7E9,010C,RPM,Engine RPM,801,rpm\n");
+    Recording const nobody = csvOf("time,vehicle,module,pid,sensor,name,value,unit\n"
+                                   "2024-03-07T09:05:00.000Z,car,,,VOLTS,Battery,12,V\n");
+    EXPECT_EQ(nobody.sensors.at(0).about.module, 0U);
+    EXPECT_EQ(nobody.sensors.at(0).about.pid, "");
     ASSERT_EQ(rows.sensors.size(), 2U);
     EXPECT_EQ(rows.sensors[1].about.module, 0x7E9U);
     EXPECT_EQ(rows.sensors[1].about.pid, "010C");

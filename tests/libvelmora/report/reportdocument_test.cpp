@@ -102,6 +102,24 @@ TEST(ReportDocument, HoldsEveryTextOfTheJsonInHtmlAndMarkdown)
     EXPECT_GT(texts, 40);
 }
 
+std::string between(std::string const& text, std::string const& begin, std::string const& end)
+{
+    std::size_t const from = text.find(begin);
+    return from == std::string::npos ? "" : text.substr(from, text.find(end, from) - from);
+}
+
+TEST(ReportDocument, MarksWhatIsOpenSinceTheClearing)
+{
+    VehicleReport report = richVehicle();
+    report.modules[0].readiness.monitors = {{"Catalyst", ReadinessStatus::NotComplete, ReadinessStatus::NotComplete},
+                                            {"EGR", ReadinessStatus::Complete, ReadinessStatus::NotComplete}};
+    std::string const html = toHtml(makeDocument(report, facts));
+    std::string const open = between(html, "<td>Catalyst</td>", "</tr>");
+    EXPECT_NE(open.find("class=\"mark\""), std::string::npos) << open;
+    EXPECT_EQ(open.find("class=\"mark\""), open.rfind("class=\"mark\"")) << "this cycle counts not: " << open;
+    EXPECT_EQ(between(html, "<td>EGR</td>", "</tr>").find("class=\"mark\""), std::string::npos);
+}
+
 TEST(ReportDocument, ShowsCountersAsRatios)
 {
     VehicleReport report = richVehicle();

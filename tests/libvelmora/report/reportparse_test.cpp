@@ -17,6 +17,12 @@ VehicleReport fullReport()
 {
     ModuleReport module = soundModule();
     module.info.vin = "1M8GDM9AXKP042788";
+    module.info.description = "Engine";
+    module.info.standard = "EOBD";
+    module.info.protocol = "ISO 15765-4";
+    module.info.engineSerialNumber = "4711";
+    module.info.erotan = "EX1";
+    module.info.withLamp = {InfoReport::Reading{"1", "km"}, InfoReport::Reading{"2", "min"}};
     module.info.calibrations = {{"A", "1"}, {"B", ""}};
     module.info.sinceCleared.distance = InfoReport::Reading{"412", "km"};
     module.codes.lists[0] = readCodes(CodeKind::Confirmed, {"P1105", "P0420"});

@@ -67,6 +67,24 @@ TEST(Suggestions, TellClearedCodesByTwoOfThreeSigns)
     }
 }
 
+// A counter that stands at its end has gone on for nobody knows how long.
+TEST(Suggestions, TellTheRunTimeSinceAClearUnlessItsCounterIsFull)
+{
+    for (bool const full : {false, true}) {
+        ModuleReport module = soundModule();
+        setValue(module, 0x30, {3});
+        setValue(module, 0x31, {12}, {}, "km");
+        setValue(module, 0x4E, {full ? 65535.0 : 65534.0}, "65534", "min");
+        std::vector<Finding> const found = suggestions(vehicleOf({module}));
+        ASSERT_EQ(found.size(), 1U);
+        bool told = false;
+        for (Evidence const& each : found[0].evidence) {
+            told = told || each.text == "the engine ran for 65534 min since codes were cleared";
+        }
+        EXPECT_EQ(told, !full);
+    }
+}
+
 // The monitors that run all the time are complete soon after a clear, and say nothing.
 TEST(Suggestions, CountNoContinuousMonitors)
 {

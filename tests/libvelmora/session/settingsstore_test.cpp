@@ -4,7 +4,9 @@
 
 #include <gtest/gtest.h>
 
+#include <cerrno>
 #include <csignal>
+#include <cstring>
 #include <filesystem>
 #include <fstream>
 #include <sys/resource.h>
@@ -162,6 +164,22 @@ TEST_F(Settings, FailingWriteLeavesTheOldFile)
     ::setrlimit(RLIMIT_FSIZE, &old);
     std::signal(SIGXFSZ, handler);
     EXPECT_EQ(content(), "[common]\nunitsystem = 1\n");
+    auto const files = std::filesystem::directory_iterator(m_folder);
+    EXPECT_EQ(std::distance(begin(files), end(files)), 1) << "no half written file stays";
+}
+
+TEST_F(Settings, ANameThatIsTakenByAFolderIsTold)
+{
+    SettingsStore store(m_file);
+    store.setInt("common/unitsystem", 0);
+    std::filesystem::create_directories(m_file / "in the way");
+    try {
+        store.sync();
+        ADD_FAILURE() << "nothing can be written there";
+    } catch (Error const& error) {
+        EXPECT_EQ(std::string(error.what()),
+                  "Could not write the settings file " + m_file.string() + ": " + std::strerror(EISDIR));
+    }
     auto const files = std::filesystem::directory_iterator(m_folder);
     EXPECT_EQ(std::distance(begin(files), end(files)), 1) << "no half written file stays";
 }

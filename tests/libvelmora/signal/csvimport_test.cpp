@@ -141,6 +141,9 @@ TEST(CsvTable, CutsAnyText)
     EXPECT_EQ(records[0].cells, (std::vector<std::string>{"a", "b\nc"}));
     EXPECT_EQ(records[1].line, 4U);
     EXPECT_EQ(readCsv("a,\"open").at(0).cells.at(1), "open");
+    EXPECT_EQ(readCsv(R"("a ""b""",c)").at(0).cells, (std::vector<std::string>{"a \"b\"", "c"}));
+    EXPECT_EQ(readCsv(std::string_view(R"("a""b")", 3)).at(0).cells.at(0), "a")
+        << "what stands behind the end counts not";
     EXPECT_TRUE(isUtf8("°"));
     EXPECT_FALSE(isUtf8("\xB0"));
     EXPECT_FALSE(isUtf8("\xC2"));

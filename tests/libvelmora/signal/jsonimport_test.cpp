@@ -115,6 +115,11 @@ TEST(WicanImport, CountsBytesOfFrames)
               "signed16(M*256+N)*0.1");
     EXPECT_EQ(fromFrameBytes("B3+B7:4^1", ReplyFrames::One, 2), "A+bit(E,4)^1");
     EXPECT_EQ(fromFrameBytes("S9", ReplyFrames::Several, 3), "signed8(D)");
+    EXPECT_EQ(fromFrameBytes("B806", ReplyFrames::Several, 3), "ZZ") << "the last byte that has a name";
+    EXPECT_THROW(fromFrameBytes("B807", ReplyFrames::Several, 3), FormulaError);
+    EXPECT_THROW(fromFrameBytes("B0", ReplyFrames::One, 0), FormulaError) << "the length of the frame";
+    EXPECT_EQ(fromFrameBytes("B1+B7", ReplyFrames::One, 0), "A+G");
+    EXPECT_THROW(fromFrameBytes("B8", ReplyFrames::One, 0), FormulaError);
 }
 
 TEST(WicanImport, ListsWhatCantBeTold)
@@ -131,6 +136,19 @@ TEST(WicanImport, ListsWhatCantBeTold)
     SignalImport const import = importWican(session, "f");
     ASSERT_EQ(import.file.signals.size(), 1U);
     EXPECT_FALSE(import.file.signals[0].enabled);
+    ASSERT_EQ(import.notes.size(), 1U);
+    EXPECT_EQ(import.notes[0].what, "needs session 1003, which is not opened");
+}
+
+TEST(SignalImport, ListsWhatIsRefusedInItsOrder)
+{
+    SignalImport const import = importWican(
+        R"({"init": "ATSH7E4;", "pids": [{"pid": "2201019", "parameters": {"A": "B8", "B": "B0", "C": "B16"}}]})", "f");
+    std::vector<std::string> names;
+    for (SignalMistake const& each : import.refused) {
+        names.push_back(each.key);
+    }
+    EXPECT_EQ(names, (std::vector<std::string>{"A", "B", "C"}));
 }
 
 TEST(AbrpImport, ReadsRequestsByKey)

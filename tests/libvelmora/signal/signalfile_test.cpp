@@ -105,6 +105,15 @@ TEST(SignalFile, ReadsAllThatASignalHas)
     EXPECT_EQ(pack.timeout, 400U);
 }
 
+TEST(SignalFile, WantsAnIdANameAndOneKindOfContent)
+{
+    EXPECT_EQ(mistakesIn("[[signal]]\nrequest = \"220100\"\n"),
+              (std::vector<std::string>{"f.toml:1: signal 1, id: is missing", "f.toml:1: signal 1, name: is missing",
+                                        "f.toml:1: signal 1, formula: each signal wants either a formula or a text"}));
+    EXPECT_EQ(mistakesIn(withSignal("formula = \"A\"\n")).size(), 1U) << "A is a byte of a reply";
+    EXPECT_TRUE(mistakesIn(withSignal("formula = \"1+1\"\n")).empty());
+}
+
 TEST(SignalFile, WritesWhatItReads)
 {
     SignalFile const file = readSignals(gearbox, "f.toml").file;

@@ -50,6 +50,9 @@ TEST(BuiltinPids, TellHowWellTheyAreKnown)
     EXPECT_EQ(listed.signal.name, "Current Vehicle Speed Limit (one source)");
     EXPECT_EQ(set.find("0xA6"), set.find("01a6"));
     EXPECT_EQ(set.find("9A").size(), 4U);
+    SignalEntry const& odometer = set[onlyOne(set, "ODOMETER")];
+    EXPECT_EQ(odometer.signal.min, 0.0);
+    EXPECT_NEAR(odometer.signal.max.value_or(0), 429496729.5, 0.1) << "four bytes of a tenth of a kilometre";
     for (BuiltinPid const& each : builtinPids()) {
         bool const decoded = each.standing != PidStanding::Unverified && each.standing != PidStanding::NameOnly;
         EXPECT_EQ(isDecoded(each), decoded) << each.signal.id;

@@ -1,6 +1,7 @@
 #include "libvelmora/signal/signalfile.h"
 #include "libvelmora/uds/identifierprobe.h"
 #include "libvelmora/uds/modulestore.h"
+#include "libvelmora/uds/signalboard.h"
 #include "tests/support/modulebench.h"
 #include "tests/support/temporaryfolder.h"
 
@@ -8,6 +9,7 @@
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
+#include <nlohmann/json.hpp>
 
 namespace velmora {
 
@@ -85,6 +87,34 @@ TEST_F(IdentifierProbeTest, ListsWhatAnswersWhatIsLockedAndWhatChanges)
     EXPECT_EQ(again.file.signals[1].id, "M7E0_22_F190");
 }
 
+TEST_F(IdentifierProbeTest, BeginsAtTheVeryFirstIdentifierAndTellsWhatChanges)
+{
+    m_state.task.from = 0x0000;
+    m_state.task.to = 0x0001;
+    m_bench.module("7E0", "220000", {"7E80462000005"}).module("7E0", "220001", {"7E80462000107"});
+    m_bench.module("7E0", "220001", {"7E80462000108"});
+    run();
+    ASSERT_EQ(m_state.told.size(), 2U);
+    nlohmann::ordered_json const json = toJsonValue(m_state);
+    EXPECT_EQ(json["told"][0]["id"], "0000");
+    EXPECT_EQ(json["told"][0]["changes"], false);
+    EXPECT_EQ(json["told"][1]["data"], "07");
+    EXPECT_EQ(json["told"][1]["changes"], true);
+}
+
+TEST_F(IdentifierProbeTest, TakesATextWhole)
+{
+    m_state.task.from = m_state.task.to = 0xF18C; // the serial number
+    m_bench.module("7E0", "22F18C", {"7E8100962F18C414243", "7E821444546"});
+    run();
+    SignalFile const file = toSignalFile(m_state);
+    ASSERT_EQ(file.signals.size(), 1U);
+    ASSERT_TRUE(file.signals[0].text);
+    EXPECT_EQ(file.signals[0].text->first, 0U);
+    EXPECT_EQ(file.signals[0].text->count, 0U) << "to the end";
+    EXPECT_EQ(textOf(*file.signals[0].text, {'A', 'B', 0x7F}), "AB") << "what can't be read at the end is filling";
+}
+
 TEST_F(IdentifierProbeTest, GoesOnWhereItWasInterruptedOnTheSameVehicleOnly)
 {
     testsupport::TemporaryFolder folder;
@@ -106,6 +136,12 @@ TEST_F(IdentifierProbeTest, GoesOnWhereItWasInterruptedOnTheSameVehicleOnly)
     run();
     EXPECT_EQ(m_bench.takeAsked().front(), "7E0 22F18A") << "nothing is asked twice";
     EXPECT_EQ(m_state.told.size(), 2U);
+    std::ofstream(folder.path() / "probe.json")
+        << R"({"next": 7, "told": {"F186": "01", "F1": "02", "F18701": "03", "xyz": "04", "F188": 5, "F189": "z"}})";
+    std::optional<ProbeState> const odd = store.load();
+    ASSERT_TRUE(odd);
+    EXPECT_THAT(odd->told, ElementsAre(Pair(0xF186U, ElementsAre(0x01))))
+        << "what is no identifier and no data is left out";
     std::ofstream(folder.path() / "probe.json") << "{\"next\": \"x\"";
     EXPECT_FALSE(store.load()) << "a broken file is as none";
     store.drop();

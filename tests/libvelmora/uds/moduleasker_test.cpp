@@ -45,6 +45,7 @@ TEST(ReadingOnly, KnowsWhatEachPurposeMaySend)
         {RequestPurpose::Signal, {0x21, 0x01}, nullptr},
         {RequestPurpose::Signal, {0x22, 0xF1, 0x90}, nullptr},
         {RequestPurpose::Signal, {0x22, 0xF1, 0x90, 0xF1, 0x87}, nullptr},
+        {RequestPurpose::Signal, {0x22, 0xF1, 0x90, 0xF1, 0x87, 0xF1, 0x88}, nullptr},
         {RequestPurpose::Signal, {0x22, 0xF1}, "wants 3 bytes"},
         {RequestPurpose::Signal, {0x22, 0xF1, 0x90, 0xF1}, "wants 3 bytes"},
         {RequestPurpose::Signal, {}, "empty"},

@@ -23,6 +23,7 @@ public:
     bool plugged = true;
     bool answers = true;
     bool engineless = false; // tells no engine speed
+    std::optional<double> odometer;
     double rpm = 0.0;
     double kmh = 0.0;
     double battery = 12.6;
@@ -75,6 +76,9 @@ public:
                     result.push_back(reading("RPM", rpm));
                 }
                 result.push_back(reading("SPEED", kmh));
+                if (odometer) {
+                    result.push_back(reading("CLEAR_DISTANCE", *odometer));
+                }
             }
         }
         given += static_cast<int>(result.size());

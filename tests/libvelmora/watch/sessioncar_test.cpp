@@ -107,4 +107,45 @@ TEST(SessionCar, LossesLeaveNothingBehind)
     std::cout << losses << " losses: " << before.heap << " to " << after.heap << " bytes\n";
 }
 
+// Waits for a reading of that sensor.
+bool comes(SessionCar& car, std::string const& sensor)
+{
+    for (int i = 0; i < 2000; ++i) {
+        car.wait(5ms);
+        for (velmora::Reading const& each : car.readings()) {
+            if (each.sensor == sensor) {
+                return true;
+            }
+        }
+    }
+    return false;
+}
+
+TEST(SessionCar, ReadsMoreOrOtherSensorsAsSoonAsItIsTold)
+{
+    testsupport::TemporaryFolder const folder;
+    velmora::SessionCarOptions options;
+    options.session.port = "sim:petrol-can11?instant";
+    options.session.settingsFile = folder.file("settings.toml");
+    options.vehicle = "van";
+    options.sensors = {"RPM"};
+    SessionCar car(options);
+    car.readAlso({"SPEED"}); // counts once there is a car
+    car.connect();
+    EXPECT_EQ(car.visits(), 1U);
+    EXPECT_EQ(car.sensors().sensors.size(), 2U);
+    car.startAsking();
+    EXPECT_TRUE(comes(car, "RPM"));
+    EXPECT_TRUE(comes(car, "SPEED"));
+    car.readAlso({"COOLANT_TEMP"});
+    EXPECT_TRUE(comes(car, "COOLANT_TEMP"));
+    car.readOnly({"THROTTLE_POS"});
+    EXPECT_EQ(car.sensors().sensors.size(), 1U);
+    EXPECT_TRUE(comes(car, "THROTTLE_POS"));
+    car.readings();
+    car.readOnly({});
+    EXPECT_TRUE(comes(car, "RPM"));
+    car.disconnect();
+}
+
 } // namespace

@@ -171,4 +171,17 @@ TEST(WatchEngine, AnEndKeepsTheTripUnderWay)
     EXPECT_NEAR(watch.trips.at(0).distanceKm, 10, 0.1);
 }
 
+TEST(WatchEngine, ConnectsAtOnceAndTakesTheOdometerForTheTrip)
+{
+    Watch watch;
+    watch.car.odometer = 4711;
+    watch.car.answers = true;
+    watch.step();
+    EXPECT_EQ(watch.car.connects, 1) << "no pause is over yet, for none was made";
+    watch.drive(20min);
+    watch.engine.finish(watch.time.now);
+    ASSERT_EQ(watch.trips.size(), 1U);
+    EXPECT_EQ(watch.trips[0].odometerKm, 0.0) << "told, and the same all the way";
+}
+
 } // namespace

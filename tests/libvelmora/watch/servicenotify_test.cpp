@@ -1,0 +1,98 @@
+#include "libvelmora/watch/servicenotify.h"
+#include "tests/support/temporaryfolder.h"
+
+#include <gtest/gtest.h>
+
+#include <cstddef>
+#include <cstring>
+#include <sys/socket.h>
+#include <sys/un.h>
+#include <unistd.h>
+
+namespace {
+
+using namespace std::chrono_literals;
+using velmora::ServiceNotify;
+
+// The service manager's end of the socket.
+class Manager
+{
+public:
+    explicit Manager(std::string const& name) : m_socket(::socket(AF_UNIX, SOCK_DGRAM | SOCK_CLOEXEC, 0))
+    {
+        sockaddr_un address{};
+        address.sun_family = AF_UNIX;
+        std::memcpy(address.sun_path, name.data(), name.size());
+        if (name.front() == '@') {
+            address.sun_path[0] = '\0';
+        }
+        auto const length = static_cast<socklen_t>(offsetof(sockaddr_un, sun_path) + name.size());
+        EXPECT_EQ(::bind(m_socket, reinterpret_cast<sockaddr*>(&address), length), 0);
+        ::setenv("NOTIFY_SOCKET", name.c_str(), 1);
+    }
+    ~Manager()
+    {
+        ::close(m_socket);
+        for (char const* const name : {"NOTIFY_SOCKET", "WATCHDOG_USEC", "WATCHDOG_PID"}) {
+            ::unsetenv(name);
+        }
+    }
+    Manager(Manager const&) = delete;
+    Manager& operator=(Manager const&) = delete;
+
+    // What has come, "-" for nothing.
+    std::string heard() const
+    {
+        char text[256];
+        ssize_t const count = ::recv(m_socket, text, sizeof(text), MSG_DONTWAIT);
+        return count < 0 ? "-" : std::string(text, static_cast<std::size_t>(count));
+    }
+
+private:
+    int m_socket;
+};
+
+TEST(ServiceNotify, TellsTheManagerByEitherKindOfSocket)
+{
+    testsupport::TemporaryFolder const folder;
+    for (std::string const& name : {folder.file("notify"), "@velmora-notify-" + std::to_string(::getpid())}) {
+        Manager const manager(name);
+        ServiceNotify const notify;
+        notify.tell("READY=1\nSTATUS=up");
+        EXPECT_EQ(manager.heard(), "READY=1\nSTATUS=up") << name;
+        EXPECT_EQ(manager.heard(), "-");
+    }
+    ServiceNotify().tell("READY=1"); // nobody listens
+    ::setenv("NOTIFY_SOCKET", std::string(200, 'x').c_str(), 1);
+    ServiceNotify().tell("READY=1"); // no socket has so long a name
+    ::unsetenv("NOTIFY_SOCKET");
+}
+
+TEST(ServiceNotify, TellsThatTheWorkGoesOnTwiceAPeriod)
+{
+    Manager const manager("@velmora-watchdog-" + std::to_string(::getpid()));
+    ::setenv("WATCHDOG_USEC", "2000000", 1);
+    ::setenv("WATCHDOG_PID", std::to_string(::getpid()).c_str(), 1);
+    ServiceNotify notify;
+    std::chrono::steady_clock::time_point const start(1h);
+    notify.alive(start);
+    EXPECT_EQ(manager.heard(), "WATCHDOG=1");
+    notify.alive(start + 999ms);
+    EXPECT_EQ(manager.heard(), "-");
+    notify.alive(start + 1s);
+    EXPECT_EQ(manager.heard(), "WATCHDOG=1");
+    for (char const* const period : {"0", "-1", "2x", ""}) {
+        ::setenv("WATCHDOG_USEC", period, 1);
+        ServiceNotify().alive(start);
+        EXPECT_EQ(manager.heard(), "-") << period;
+    }
+    ::setenv("WATCHDOG_USEC", "1", 1);
+    ::setenv("WATCHDOG_PID", "1", 1);
+    ServiceNotify().alive(start);
+    EXPECT_EQ(manager.heard(), "-") << "the watchdog is another process's";
+    ::unsetenv("WATCHDOG_PID");
+    ServiceNotify().alive(start);
+    EXPECT_EQ(manager.heard(), "WATCHDOG=1");
+}
+
+} // namespace
