@@ -105,6 +105,9 @@ def gives_lists_to_programs():
     files = json.loads(printed("--json", "signals", "list", "mine.toml"))
     check([each["id"] for each in files[0]["signals"]] == ["GEARBOX_TEMP", "OFF"], f"the signals: {files}")
     check(files[0]["signals"][1]["enabled"] is False and files[0]["maker"] == "Example", f"the signals: {files}")
+    report = json.loads(printed("--json", *CAR, "--ecu", "7E8", "scan", "--no-history"))
+    values = {each["pid"]: each for each in report["modules"][0]["values"]}
+    check(float(values["05"]["value"]) in values["05"]["samples"], f"whole degrees, and what they were made of: {values}")
     codes = json.loads(printed("--json", "dtc", "P0420", "P1105"))
     check([code["code"] for code in codes] == ["P0420", "P1105"], f"codes: {codes}")
     check(codes[0]["meaning"]["maker"] == "Generic" and codes[1]["meaning"] is None, f"their meanings: {codes}")
