@@ -1,7 +1,7 @@
 // How limits look in the chart: lines with their words, and another colour for what is beyond them.
 import { limitOf, limitText } from './limits.js';
 import { titleOf } from './store.js';
-import { convert } from './units.js';
+import { convert, turnsRound } from './units.js';
 
 function ends(sensor) {
   const { lowest, highest } = limitOf(sensor);
@@ -12,9 +12,11 @@ function ends(sensor) {
 export function segmentOf(sensor, colour) {
   if (ends(sensor).length === 0) return undefined;
   const { lowest, highest } = limitOf(sensor);
-  const top = highest == null ? Infinity : convert(sensor, highest);
-  const bottom = lowest == null ? -Infinity : convert(sensor, lowest);
-  const isBeyond = (y) => y > top || y < bottom;
+  const [low, high] = turnsRound(sensor) ? [highest, lowest] : [lowest, highest];
+  const top = high == null ? Infinity : convert(sensor, high);
+  const bottom = low == null ? -Infinity : convert(sensor, low);
+  const idles = (y) => y === 0 && turnsRound(sensor); // no number of miles
+  const isBeyond = (y) => !idles(y) && (y > top || y < bottom);
   return { borderColor: ({ p0, p1 }) => (isBeyond(p0.parsed.y) || isBeyond(p1.parsed.y) ? colour : undefined) };
 }
 

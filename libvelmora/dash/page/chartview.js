@@ -5,7 +5,7 @@ import { chosen, change, setting } from './layout.js';
 import { drawValue, makeValue } from './limits.js';
 import { getJson, programNow } from './link.js';
 import { sensors, takeHistory, titleOf } from './store.js';
-import { convert, unitOf } from './units.js';
+import { convert, inOrder, unitOf } from './units.js';
 
 // None of them is the red of what is beyond a limit.
 const light = ['#0b63bd', '#a3128b', '#176b41', '#7a3fb8', '#855300', '#0f6d78'];
@@ -168,7 +168,9 @@ function figures(from, to) {
     const { name, values, unit } = rows[index];
     setText(name, titleOf(sensor));
     setText(unit, unitOf(sensor));
-    summary(sensor.points, from, to).forEach((value, place) => drawValue(values[place], sensor, value));
+    const [lowest, mean, highest, last] = summary(sensor.points, from, to);
+    const [low, high] = inOrder(sensor, lowest, highest);
+    [low, mean, high, last].forEach((value, place) => drawValue(values[place], sensor, value));
   });
 }
 

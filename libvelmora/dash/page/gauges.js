@@ -1,9 +1,9 @@
 // The view that is read from afar: a dial and big digits for each chosen sensor.
 import { byId, button, element, setText, svg } from './tables.js';
 import { chosen, change } from './layout.js';
-import { limitNumber, limitOf, side, words } from './limits.js';
+import { limitNumber, limitOf, side, sideShown, words } from './limits.js';
 import { freshMs, sensors, titleOf } from './store.js';
-import { convert, rangeOf, show, unitOf } from './units.js';
+import { dialOf, rangeOf, show, unitOf } from './units.js';
 
 const arcPath = 'M 30.7 140 A 80 80 0 1 1 169.3 140'; // two thirds of a circle
 
@@ -122,18 +122,17 @@ function endsOf(sensor) {
 }
 
 function drawDial(parts, sensor, stale) {
-  const [low, high] = endsOf(sensor);
+  const dial = dialOf(sensor, endsOf(sensor));
   const numeric = typeof sensor.value === 'number';
-  const shareOf = (value) => Math.max(0, Math.min(1, (value - low) / (high - low)));
-  const share = numeric && !stale ? shareOf(sensor.value) : 0;
+  const share = numeric && !stale ? dial.at(sensor.value) : 0;
   parts.arc.setAttribute('stroke-dashoffset', String(Math.round(1000 - share * 1000) / 10));
   parts.arc.setAttribute('visibility', share > 0.002 ? 'visible' : 'hidden');
-  setText(parts.low, numeric ? String(Math.round(convert(sensor, low))) : '');
-  setText(parts.high, numeric ? String(Math.round(convert(sensor, high))) : '');
+  setText(parts.low, numeric ? String(Math.round(dial.low)) : '');
+  setText(parts.high, numeric ? String(Math.round(dial.high)) : '');
   const { lowest, highest } = limitOf(sensor);
   [lowest, highest].forEach((limit, index) => {
     parts.marks[index].setAttribute('visibility', limit == null || !numeric ? 'hidden' : 'visible');
-    if (limit != null) placeMark(parts.marks[index], shareOf(limit));
+    if (limit != null) placeMark(parts.marks[index], dial.at(limit));
   });
 }
 
@@ -142,7 +141,7 @@ function remark(sensor, stale, now) {
   if (stale) return ageText(now - sensor.time);
   const where = side(sensor, sensor.value);
   const { lowest, highest } = limitOf(sensor);
-  return where && `${where} ${limitNumber(sensor, where === 'above' ? highest : lowest)}`;
+  return where && `${sideShown(sensor, where)} ${limitNumber(sensor, where === 'above' ? highest : lowest)}`;
 }
 
 function draw(parts, sensor, now) {

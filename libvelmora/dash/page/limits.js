@@ -2,7 +2,7 @@
 // meaning is told by its colour alone.
 import { element, setText } from './tables.js';
 import { titleOf } from './store.js';
-import { isImperial, show, unitOf } from './units.js';
+import { isImperial, show, turnsRound, unitOf } from './units.js';
 
 const heldMs = 10000; // for how long the status line tells of a value that is back inside
 
@@ -28,6 +28,12 @@ export function side(sensor, value) {
   return lowest != null && value < lowest ? 'below' : '';
 }
 
+// The same of what is shown.
+export function sideShown(sensor, where) {
+  if (!turnsRound(sensor)) return where;
+  return where === 'above' ? 'below' : 'above';
+}
+
 // "6000", in the unit that is shown, and with the limit's own digits where that is the sensor's.
 export function limitNumber(sensor, limit) {
   return unitOf(sensor) === sensor.unit ? String(limit) : show(sensor, limit);
@@ -41,7 +47,7 @@ export function limitText(sensor, limit) {
 export function words(sensor, value) {
   const where = side(sensor, value);
   const { lowest, highest } = limitOf(sensor);
-  return where && `${where} its limit of ${limitText(sensor, where === 'above' ? highest : lowest)}`;
+  return where && `${sideShown(sensor, where)} its limit of ${limitText(sensor, where === 'above' ? highest : lowest)}`;
 }
 
 export function note(sensor, now) {

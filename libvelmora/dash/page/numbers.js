@@ -4,7 +4,7 @@ import { chosen } from './layout.js';
 import { ageText, isStale } from './gauges.js';
 import { drawValue, makeValue } from './limits.js';
 import { sensors, titleOf } from './store.js';
-import { show, unitOf } from './units.js';
+import { inOrder, show, unitOf } from './units.js';
 
 const heads = [['Sensor', null], ['Value', 'right'], ['Unit', null], ['Lowest', 'right'], ['Mean', 'right'], ['Highest', 'right'], ['Age', 'right']];
 const rows = new Map();
@@ -43,11 +43,12 @@ export function update(now) {
     const sensor = sensors.get(id);
     if (!sensor) continue;
     const { min, max, sum, count } = sensor.stats;
+    const [low, high] = inOrder(sensor, min, max);
     const stale = sensor.time > 0 && isStale(sensor, now);
     row.classList.toggle('stale', stale);
     drawValue(value, sensor, sensor.value);
-    const texts = [titleOf(sensor), null, unitOf(sensor), show(sensor, min),
-      show(sensor, count ? sum / count : null), show(sensor, max), sensor.time === 0 ? 'never' : stale ? ageText(now - sensor.time) : 'now'];
+    const texts = [titleOf(sensor), null, unitOf(sensor), show(sensor, low),
+      show(sensor, count ? sum / count : null), show(sensor, high), sensor.time === 0 ? 'never' : stale ? ageText(now - sensor.time) : 'now'];
     texts.forEach((text, index) => text !== null && setText(cells[index], text));
   }
 }

@@ -1,5 +1,9 @@
 // Values come in metric units; here alone value and label are turned into those that the user wants.
 
+// Of the US gallon. Under a litre it is an idling engine's, which would read as hundreds of miles.
+const milesPerGallon = (litres) => (Math.abs(litres) < 1 ? 0 : 235.214583 / litres);
+
+// The label, the conversion, and how many more digits it needs. Labels are those of <velmora/unitlabel.h>.
 const imperial = {
   'km/h': ['mph', (v) => v * 0.621371, 0],
   km: ['mi', (v) => v * 0.621371, 0],
@@ -11,6 +15,7 @@ const imperial = {
   Nm: ['lb-ft', (v) => v * 0.7375621, 0],
   kW: ['hp', (v) => v * 1.3410221, 0],
   mm: ['in', (v) => v / 25.4, 2],
+  'l/100 km': ['mpg', milesPerGallon, 0],
 };
 
 // Whether a sensor's own unit is one of those, which happens in recordings.
@@ -44,6 +49,18 @@ export function show(sensor, value) {
   return convert(sensor, value).toFixed(digits).replace(/^-(0(\.0+)?)$/, '$1');
 }
 
+// Whether what is more of the sensor is less of what is shown: the less fuel, the more miles.
+export function turnsRound(sensor) {
+  return rule(sensor.unit)?.[1] === milesPerGallon;
+}
+
+// The lowest and the highest, in the order that they have once they are converted. Null for a highest that is not known,
+// for of an idling engine nobody knows the miles.
+export function inOrder(sensor, low, high) {
+  if (!turnsRound(sensor) || low == null) return [low, high];
+  return convert(sensor, low) === 0 ? [low, null] : [high, low];
+}
+
 export function withUnit(sensor, value) {
   const unit = unitOf(sensor);
   return show(sensor, value) + (unit && value != null ? ` ${unit}` : '');
@@ -65,6 +82,12 @@ export function rangeOf(sensor) {
     high = Math.max(high, max);
   }
   return [low, nice(high, low)];
+}
+
+// A dial with these ends: its numbers as they are shown, and where a value stands on it, from 0 to 1.
+export function dialOf(sensor, ends = rangeOf(sensor)) {
+  const [low, high] = turnsRound(sensor) ? [0, 60] : ends.map((end) => convert(sensor, end));
+  return { low, high, at: (value) => Math.max(0, Math.min(1, (convert(sensor, value) - low) / (high - low))) };
 }
 
 function nice(high, low) {
