@@ -60,6 +60,16 @@ TEST(DialogueRecording, HasEachValueWhenItsReplyWasWhole)
     EXPECT_EQ(recording->sensors.at(0).about.unit, "rpm");
 }
 
+// The channel asks again by itself, and gets the reply that was recorded for the same.
+TEST(DialogueRecording, AReplyThatWasAskedForTwiceIsTakenOnce)
+{
+    std::optional<Recording> const recording = dialogueOf("-> 010C\n.. 100\n<- 7E8 04 41 0C 1A\\r\\r>\n"
+                                                          "-> 010C\n.. 100\n<- 7E8 04 41 0C 1A F8\\r\\r>\n"
+                                                          "-> 010C\n.. 1000\n<- 7E8 04 41 0C 1B 58\\r\\r>\n");
+    ASSERT_TRUE(recording);
+    EXPECT_EQ(valuesOf(*recording, "RPM"), "100=1726 1200=1750 ");
+}
+
 TEST(DialogueRecording, WithoutTimesIsNone)
 {
     EXPECT_FALSE(dialogueOf("-> 010C\n<- 7E8 04 41 0C 1A F8\\r\\r>\n-> 010C\n<- 7E8 04 41 0C 1B 58\\r\\r>\n"));
