@@ -12,7 +12,7 @@ using velmora::Error;
 using velmora::Reading;
 using velmora::ReadingOutput;
 
-Reading engineSpeed()
+Reading rpmOfNow()
 {
     Reading reading;
     reading.time = std::chrono::system_clock::now();
@@ -29,8 +29,8 @@ TEST(ReadingOutput, WritesUnderTheVehiclesName)
     {
         ReadingOutput named("ndjson:" + folder.file("named"), "van");
         ReadingOutput plain("ndjson:" + folder.file("plain"), "");
-        named.write(engineSpeed());
-        plain.write(engineSpeed());
+        named.write(rpmOfNow());
+        plain.write(rpmOfNow());
         EXPECT_EQ(named.counts().accepted, 1U);
         EXPECT_EQ(named.trouble(), "");
     }
