@@ -250,10 +250,10 @@ TEST(ClockRepair, OnlySoManyLinesWait)
 TEST(ClockRepair, AFailedWriteLosesNoRepair)
 {
     TemporaryFolder const folder;
-    std::filesystem::create_directory(folder.file("a"));
     YoungMachine machine;
     auto const output = velmora::makeOutput(velmora::parseOutputAddress("csv:" + folder.file("a")), machine.context());
     output->open();
+    std::filesystem::create_directory(folder.file("a"));
     output->write(records(machine.rpm(1.0, 0)));
     velmora::Reading const late = machine.rpm(2.0, 6900);
     machine.at(7000);
