@@ -2,6 +2,7 @@
 
 #include "tests/e2e/childprocess.h"
 #include "tests/support/jsonschema.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
@@ -81,7 +82,7 @@ TEST(Diagnostics, ReadsWhatAModuleOnAKLineAsksTimeFor)
 
 TEST(Diagnostics, AModuleThatRefusesToTellWhatItHasIsToldSo)
 {
-    std::string const file = testing::TempDir() + "velmora-refusing.toml";
+    std::string const file = testsupport::ownPath("refusing.toml");
     std::ofstream(file) << "name = 'refuses'\nprotocol = 6\n[[module]]\nid = '7E8'\nlive = '0C'\n"
                            "[[module]]\nid = '7E9'\n[module.raw]\n'0100' = '7F 01 22'\n";
     Outcome const outcome = runVelmora({"-q", "-p", "sim:" + file + "?instant", "sensors"});

@@ -1,6 +1,7 @@
 // Live values as a user meets them: in files, in pipes, and when the link goes.
 
 #include "tests/e2e/childprocess.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <gtest/gtest.h>
 
@@ -24,7 +25,7 @@ TEST(Live, LinkThatBreaksIsExitCodeEightAndKeepsTheRecording)
 {
     ChildProcess simulator(
         {"simulate", "--listen", "tcp://127.0.0.1:0", "--vehicle", "petrol-can11", "--fault", "loss@2500"});
-    std::string const file = testing::TempDir() + "velmora-live-e2e.csv";
+    std::string const file = testsupport::ownPath("live-e2e.csv");
     Outcome const outcome = runVelmora({"-v", "-p", simulator.readLine(), "live", "RPM", "SPEED", "13", "--csv", file});
     EXPECT_EQ(outcome.exitCode, 8) << outcome.err;
     EXPECT_NE(outcome.err.find("The link to the adapter broke"), std::string::npos) << outcome.err;
@@ -99,7 +100,7 @@ TEST(Live, EndsQuietlyWhenItsReaderHasGone)
 // What live and watch have written, live reads again.
 TEST(Live, PlaysItsOwnRecordings)
 {
-    std::string const csv = testing::TempDir() + "velmora-live-play.csv";
+    std::string const csv = testsupport::ownPath("live-play.csv");
     Outcome const recorded =
         runVelmora({"-q", "-p", "sim:petrol-can11?instant", "live", "RPM", "13", "--csv", csv, "-n", "3"});
     ASSERT_EQ(recorded.exitCode, 0) << recorded.err;

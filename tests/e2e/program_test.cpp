@@ -2,6 +2,7 @@
 
 #include "tests/e2e/childprocess.h"
 #include "tests/support/jsonschema.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
@@ -68,7 +69,7 @@ TEST(Program, PortThatDoesNotExistIsExitCodeThree)
 
 TEST(Program, SettingsFileThatIsBrokenIsToldWithItsLine)
 {
-    std::string const file = testing::TempDir() + "velmora-broken.toml";
+    std::string const file = testsupport::ownPath("broken.toml");
     FILE* const out = std::fopen(file.c_str(), "w");
     ASSERT_NE(out, nullptr);
     std::fputs("[common]\nunitsystem = \n", out);
@@ -212,7 +213,7 @@ TEST(Program, LinkThatBreaksWhileConnectingIsExitCodeEight)
 // The port takes what simulate takes.
 TEST(Program, SimulatedPortHasTheSimulatorsOptions)
 {
-    std::string const scenario = testing::TempDir() + "velmora-port.scenario";
+    std::string const scenario = testsupport::ownPath("port.scenario");
     std::ofstream(scenario) << "0 voltage 11.8\n";
     Outcome const outcome = runVelmora(
         {"-q", "-p", "sim:petrol-can11?instant&adapter=stn2120&fault=error:BUS BUSY@4&scenario=" + scenario, "console"},

@@ -1,6 +1,7 @@
 // Questions: what was typed before they stood there answers none of them.
 
 #include "tests/e2e/childprocess.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <gtest/gtest.h>
 
@@ -43,7 +44,7 @@ protected:
         return all;
     }
 
-    std::filesystem::path const m_folder = testing::TempDir() + "velmora-questions";
+    std::filesystem::path const m_folder = testsupport::ownPath("questions");
     int m_runs = 0;
 };
 

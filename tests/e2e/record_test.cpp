@@ -2,6 +2,7 @@
 
 #include "tests/e2e/childprocess.h"
 #include "tests/support/jsonschema.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>
@@ -31,7 +32,7 @@ protected:
     }
 
     std::string const m_file =
-        testing::TempDir() + "velmora-" + testing::UnitTest::GetInstance()->current_test_info()->name() + ".dialogue";
+        testsupport::ownPath(std::string(testing::UnitTest::GetInstance()->current_test_info()->name()) + ".dialogue");
 };
 
 } // namespace

@@ -1,6 +1,7 @@
 // What goes wrong in mid-session, files that have no end, and the terminal, in real time.
 
 #include "tests/e2e/childprocess.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <gtest/gtest.h>
 
@@ -110,7 +111,7 @@ TEST(Trouble, ReadersThatGoEarlyEndAllCommandsAlike)
 
 TEST(Trouble, FilesWithoutAnEndOrABeginningAreRefusedAtOnce)
 {
-    std::string const pipe = testing::TempDir() + "velmora-pipe";
+    std::string const pipe = testsupport::ownPath("pipe");
     std::remove(pipe.c_str());
     ASSERT_EQ(::mkfifo(pipe.c_str(), 0600), 0);
     auto const start = std::chrono::steady_clock::now();
@@ -161,7 +162,7 @@ TEST(Trouble, FilesWithoutAnEndOrABeginningAreRefusedAtOnce)
 
 TEST(Trouble, TheBundleReplacesNoFileUnlessItMay)
 {
-    std::string const file = testing::TempDir() + "velmora-bundle.txt";
+    std::string const file = testsupport::ownPath("bundle.txt");
     std::ofstream(file) << "keep me";
     Outcome const refused = runVelmora({"-p", "sim:petrol-can11?instant", "doctor", "--bundle", file});
     EXPECT_EQ(refused.exitCode, 2);
@@ -174,7 +175,7 @@ TEST(Trouble, TheBundleReplacesNoFileUnlessItMay)
 
 TEST(Trouble, SettingsSurviveAKillWhole)
 {
-    std::string const file = testing::TempDir() + "velmora-killed.toml";
+    std::string const file = testsupport::ownPath("killed.toml");
     ASSERT_EQ(runVelmora({"--settings", file, "settings", "weight", "1111"}).exitCode, 0);
     for (int i = 0; i < 30; ++i) {
         std::string const command = "timeout -s KILL 0.0" + std::to_string(10 + i) +
@@ -185,11 +186,6 @@ TEST(Trouble, SettingsSurviveAKillWhole)
         EXPECT_TRUE(text == "[common]\nvehicleweight = 1111\n" || text == "[common]\nvehicleweight = 2222\n") << text;
     }
     EXPECT_EQ(runVelmora({"--settings", file, "settings", "weight"}).exitCode, 0);
-    for (auto const& each : std::filesystem::directory_iterator(testing::TempDir())) {
-        if (each.path().filename().string().starts_with("velmora-killed.toml")) {
-            std::filesystem::remove(each.path());
-        }
-    }
 }
 
 TEST(Trouble, AFullDiskUnderTheSimulatorsTraceIsExitCodeOne)

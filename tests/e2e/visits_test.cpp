@@ -1,6 +1,7 @@
 // What one visit leaves for the next, and what is told of the adapter on the way.
 
 #include "tests/e2e/childprocess.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -35,7 +36,7 @@ protected:
         return {std::istreambuf_iterator<char>(in), {}};
     }
 
-    std::filesystem::path m_folder = std::filesystem::path(testing::TempDir()) / "velmora-visits-e2e";
+    std::filesystem::path m_folder = testsupport::ownPath("visits-e2e");
     std::string m_trace = m_folder / "trace.txt";
     // Listens for 300 ms behind each reply, whatever it agrees to.
     e2e::ChildProcess m_simulator{{"simulate", "--listen", "tcp://127.0.0.1:0", "--vehicle", "bench-can11", "--adapter",

@@ -3,6 +3,7 @@
 #include "simulator/serve/controlsocket.h"
 #include "simulator/simulatedcar.h"
 #include "tests/simulator/conversation.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <gtest/gtest.h>
 #include <obdsim/sim.h>
@@ -248,7 +249,7 @@ TEST(Scenario, linesAreReadAndMistakesNameTheirPlace)
 class ScenarioFile
 {
 public:
-    explicit ScenarioFile(std::string const& text) : m_path(testing::TempDir() + "control_test.scenario")
+    explicit ScenarioFile(std::string const& text) : m_path(testsupport::ownPath("control_test.scenario"))
     {
         std::ofstream(m_path) << text;
     }

@@ -4,6 +4,7 @@
 #include "simulator/serve/tracepeer.h"
 #include "simulator/simulation.h"
 #include "simulator/textfile.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <gtest/gtest.h>
 
@@ -28,8 +29,8 @@ protected:
         std::remove(m_pipe.c_str());
     }
 
-    std::string m_file = testing::TempDir() + "obdsim-text";
-    std::string m_pipe = testing::TempDir() + "obdsim-pipe";
+    std::string m_file = testsupport::ownPath("text");
+    std::string m_pipe = testsupport::ownPath("pipe");
 };
 
 TEST_F(TextFile, onlyPlainFilesOfABoundedSizeAreRead)

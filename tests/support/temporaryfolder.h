@@ -38,4 +38,11 @@ private:
     std::filesystem::path m_path;
 };
 
+// A path in a folder of this process's own, which is gone with it: two runs of the tests beside each other don't meet.
+inline std::string ownPath(std::string const& name)
+{
+    static TemporaryFolder const folder;
+    return folder.file(name);
+}
+
 } // namespace testsupport

@@ -2,6 +2,7 @@
 #include "libvelmora/doctor/commandmatrix.h"
 #include "libvelmora/doctor/doctor.h"
 #include "libvelmora/record/dialoguerecorder.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <gtest/gtest.h>
 
@@ -132,7 +133,7 @@ protected:
         });
     }
 
-    std::string m_settings = testing::TempDir() + "velmora-doctor.toml";
+    std::string m_settings = testsupport::ownPath("doctor.toml");
     std::string m_bundle;
 };
 

@@ -2,6 +2,7 @@
 #include "simulator/server.h"
 #include "simulator/simulation.h"
 #include "tests/libvelmora/port/scripteddevice.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <velmora/error.h>
 
@@ -62,7 +63,7 @@ TEST(SerialProbe, AModemSurvivesAndItsLineIsLeftAsItWas)
 
 std::string plainFile()
 {
-    std::string const file = testing::TempDir() + "velmora-no-port";
+    std::string const file = testsupport::ownPath("no-port");
     std::ofstream(file) << "text\n";
     return file;
 }

@@ -1,5 +1,6 @@
 #include "libvelmora/read/sensorlimits.h"
 #include "libvelmora/session/settingsstore.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <velmora/error.h>
 
@@ -37,7 +38,7 @@ TEST(SensorLimits, TheirSensorHasManyNames)
 
 TEST(SensorLimits, AreKeptInTheSettings)
 {
-    std::filesystem::path const file = testing::TempDir() + "velmora-limits.toml";
+    std::filesystem::path const file = testsupport::ownPath("limits.toml");
     std::ofstream(file) << "[limit]\nSPEED = 130\nMAF = \"nonsense\"\n";
     SettingsStore store(file);
     setLimit(store, "RPM", parseLimit("800..6000"));

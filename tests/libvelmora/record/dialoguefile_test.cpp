@@ -1,4 +1,5 @@
 #include "libvelmora/record/dialoguefile.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <velmora/error.h>
 
@@ -15,8 +16,7 @@ protected:
     void TearDown() override { std::filesystem::remove_all(m_folder); }
 
     std::filesystem::path const m_folder =
-        std::filesystem::path(testing::TempDir()) /
-        (std::string("dialoguefile-") + testing::UnitTest::GetInstance()->current_test_info()->name());
+        testsupport::ownPath(testing::UnitTest::GetInstance()->current_test_info()->name());
     std::filesystem::path const m_path = m_folder / "car.dialogue";
 };
 

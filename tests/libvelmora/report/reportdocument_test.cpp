@@ -1,6 +1,7 @@
 #include "libvelmora/report/document/htmlescape.h"
 #include "libvelmora/report/document/reportdocument.h"
 #include "libvelmora/report/document/reportfile.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <velmora/error.h>
 
@@ -227,7 +228,7 @@ TEST(ReportDocument, MasksTheVinEverywhere)
 
 TEST(ReportFile, WritesEachFormByItsEnding)
 {
-    std::filesystem::path const folder = std::filesystem::path(testing::TempDir()) / "velmora-reports";
+    std::filesystem::path const folder = testsupport::ownPath("reports");
     std::filesystem::create_directories(folder);
     auto const written = [&](char const* name) {
         std::string const path = (folder / name).string();

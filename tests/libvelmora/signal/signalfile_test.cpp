@@ -233,7 +233,7 @@ TEST(SignalFile, PairsRepliesAsIso15765Does)
 
 TEST(SignalFile, LoadsFilesThatAreSound)
 {
-    std::filesystem::path const path = std::filesystem::path(testing::TempDir()) / "velmora-signals.toml";
+    std::filesystem::path const path = testsupport::ownPath("signals.toml");
     std::ofstream(path) << gearbox;
     EXPECT_EQ(loadSignalFile(path.string()).signals.size(), 4U);
     std::ofstream(path) << "[[signal]]\n";

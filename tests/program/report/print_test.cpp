@@ -1,5 +1,7 @@
 // The texts and documents of the companion's face, which applications and the program print.
 
+#include "tests/support/temporaryfolder.h"
+
 #include <velmora/catalogue.h>
 #include <velmora/document.h>
 #include <velmora/error.h>
@@ -37,7 +39,7 @@ std::string contentOf(std::filesystem::path const& file)
 
 TEST(HandedReport, HidesTheVinInEachFormWhereThatIsWanted)
 {
-    std::filesystem::path const folder = std::filesystem::temp_directory_path() / "velmora-handedreport";
+    std::filesystem::path const folder = testsupport::ownPath("handedreport");
     std::filesystem::remove_all(folder);
     std::filesystem::create_directories(folder);
     DocumentOptions options;

@@ -2,6 +2,7 @@
 #include "simulator/car/drivemodel.h"
 #include "simulator/error.h"
 #include "tests/simulator/conversation.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <gtest/gtest.h>
 
@@ -52,7 +53,7 @@ TEST(Course, builtInDrivesGoAsTheirNamesSay)
 
 TEST(Course, columnsGoBeforeTheModel)
 {
-    auto const path = testing::TempDir() + "drive.csv";
+    auto const path = testsupport::ownPath("drive.csv");
     std::ofstream(path) << "seconds, speed, coolant\r\n0, 36, 80\r\n\r\n100, 36, 80\r\n";
     obdsim::SimulationOptions options;
     options.drive = path;

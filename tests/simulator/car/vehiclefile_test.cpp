@@ -1,6 +1,7 @@
 #include "simulator/car/monitornames.h"
 #include "simulator/car/vehiclefile.h"
 #include "simulator/car/vehiclelibrary.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <gtest/gtest.h>
 
@@ -262,7 +263,7 @@ TEST(VehicleLibrary, everyVehicleLoads)
 
 TEST(VehicleLibrary, readsAFileAndNamesAMissingOne)
 {
-    std::string const path = testing::TempDir() + "obdsim-vehicle.toml";
+    std::string const path = testsupport::ownPath("vehicle.toml");
     std::ofstream(path) << head;
     EXPECT_EQ(obdsim::loadVehicle(path).name, "Car");
     std::remove(path.c_str());
