@@ -23,26 +23,26 @@ namespace velmora::cli {
 // answers for too.
 struct LiveRow
 {
-    int uid;
-    unsigned int module;
+    int uid = 0;
+    unsigned int module = 0;
     std::string name; // with the module's id in front where there are several
     std::string unit;
     std::string metricUnit;
     std::string key; // of its sensor, for settings and recordings: "RPM", "LAMBDA_2", or a signal's own
-    bool isSignal;
+    bool isSignal = false;
     std::string request; // of a signal, hexadecimal
-    bool numeric;
+    bool numeric = false;
     std::string value;
     std::string minimum;
     std::string mean;
     std::string maximum;
-    std::string last;          // the value before it was gone; empty while there is one
-    std::deque<double> trend;  // means of LiveTable::trendStep, oldest first; NaN for one without readings
-    LiveTime updated;          // when a value came last
-    LiveTime trendTime;        // when the newest mean began
-    unsigned int trendCount;   // readings in it
-    LiveTime::duration period; // how far apart its readings are to be; 0 for as close as can be
-    SensorLimit limit;         // in the row's unit
+    std::string last;            // the value before it was gone; empty while there is one
+    std::deque<double> trend;    // means of LiveTable::trendStep, oldest first; NaN for one without readings
+    LiveTime updated;            // when a value came last
+    LiveTime trendTime;          // when the newest mean began
+    unsigned int trendCount = 0; // readings in it
+    LiveTime::duration period;   // how far apart its readings are to be; 0 for as close as can be
+    SensorLimit limit;           // in the row's unit
 
     bool isOutside() const;
 };
