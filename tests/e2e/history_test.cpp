@@ -47,7 +47,8 @@ protected:
             for (std::string const& car : cars) {
                 Outcome const kept = scan(car, {"--json", "--history", "--vehicle", name});
                 ASSERT_EQ(kept.exitCode, 0) << kept.err;
-                for (nlohmann::json const& module : nlohmann::json::parse(kept.out).at("modules")) {
+                nlohmann::json const report = nlohmann::json::parse(kept.out);
+                for (nlohmann::json const& module : report.at("modules")) {
                     whole = whole && module.at("codes").at("confirmed").at("answer") == "read" &&
                             module.at("codes").at("permanent").at("answer") == "read";
                 }
