@@ -28,6 +28,8 @@ SessionOptions sessionOptions(CarOptions const& options)
     result.settingsFile = options.settingsFile;
     result.signalFiles = options.signalFiles;
     result.onProgress = options.onProgress;
+    result.onDetail = options.onDetail;
+    result.onPhase = options.onPhase;
     result.openPort = options.openPort;
     return result;
 }
