@@ -1,4 +1,5 @@
 #include "tests/support/fakeclock.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <common/debuglogger.h>
 #include <common/localtime.h>
@@ -14,7 +15,6 @@
 #include <sstream>
 #include <stdexcept>
 #include <thread>
-#include <unistd.h>
 
 namespace {
 
@@ -34,16 +34,7 @@ std::time_t localSeconds(int year, int month, int day, int hour, int minute, int
 class Logger : public testing::Test
 {
 protected:
-    Logger()
-        : m_path(std::filesystem::temp_directory_path() /
-                 ("velmora-log-" + std::to_string(::getpid()) + "-" +
-                  testing::UnitTest::GetInstance()->current_test_info()->name()))
-    {}
-    ~Logger() override
-    {
-        tervex::LogSink = nullptr;
-        std::filesystem::remove(m_path);
-    }
+    ~Logger() override { tervex::LogSink = nullptr; }
 
     std::string content() const
     {
@@ -51,7 +42,8 @@ protected:
         return {std::istreambuf_iterator<char>(in), {}};
     }
 
-    std::filesystem::path m_path;
+    testsupport::TemporaryFolder const m_folder;
+    std::filesystem::path const m_path = m_folder.path() / "log";
     support::FakeClock m_clock{1000, localSeconds(2024, 3, 7, 9, 5, 2)};
 };
 

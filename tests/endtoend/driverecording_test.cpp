@@ -12,6 +12,7 @@
 #include "tests/support/dispatchloop.h"
 #include "tests/support/logcapture.h"
 #include "tests/support/memorysettings.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <obd/iconnectionmanager.h>
 #include <obd/iobdvelmora.h>
@@ -25,7 +26,6 @@
 
 #include <algorithm>
 #include <filesystem>
-#include <unistd.h>
 
 namespace {
 
@@ -109,7 +109,6 @@ protected:
     {
         m_obd->getConnectionManager()->closeConnection();
         m_loop.runPending();
-        std::filesystem::remove(m_file);
     }
 
     void record();
@@ -129,7 +128,8 @@ protected:
     support::DispatchLoop m_loop; // behind m_windows, which are to hear of a dispatch first
     obdsim::EngineData const m_engine = obdsim::loadVehicle(GetParam()).engine;
     KnownDrive m_drive{m_engine};
-    std::filesystem::path m_file = folder() / ("velmora-drive-" + std::to_string(::getpid()) + ".csv");
+    testsupport::TemporaryFolder const m_folder{folder()};
+    std::filesystem::path const m_file = m_folder.path() / "drive.csv";
     std::optional<RecordedDrive> m_recorded;
 };
 

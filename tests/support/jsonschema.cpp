@@ -1,12 +1,13 @@
 #include "tests/support/jsonschema.h"
 
+#include "tests/support/temporaryfolder.h"
+
 #include <gtest/gtest.h>
 
 #include <array>
 #include <cstdio>
 #include <filesystem>
 #include <fstream>
-#include <unistd.h>
 
 namespace support {
 
@@ -37,14 +38,11 @@ std::string quoted(std::filesystem::path const& path)
 std::string schemaErrors(std::string const& document, std::string const& definition)
 {
     std::filesystem::path const source = VELMORA_SOURCE_DIR;
-    std::filesystem::path const file =
-        std::filesystem::path(testing::TempDir()) / ("document-" + std::to_string(::getpid()) + ".json");
+    testsupport::TemporaryFolder const folder;
+    std::filesystem::path const file = folder.path() / "document.json";
     std::ofstream(file) << document;
-    std::string const errors =
-        outputOf("python3 " + quoted(source / "tests/support/validatejson.py") + " " +
-                 quoted(source / "docs/json.schema.json") + " " + definition + " " + quoted(file));
-    std::filesystem::remove(file);
-    return errors;
+    return outputOf("python3 " + quoted(source / "tests/support/validatejson.py") + " " +
+                    quoted(source / "docs/json.schema.json") + " " + definition + " " + quoted(file));
 }
 
 void expectValid(std::string const& document, std::string const& definition)

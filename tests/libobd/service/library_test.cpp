@@ -1,4 +1,5 @@
 #include "libobd/catalogue/dtcreader.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <common/logrecord.h>
 #include <obd/library.h>
@@ -11,11 +12,6 @@
 
 namespace {
 
-std::filesystem::path logPath()
-{
-    return std::filesystem::temp_directory_path() / ("velmora-library-" + std::to_string(::getpid()));
-}
-
 std::string content(std::filesystem::path const& path)
 {
     std::ifstream in(path);
@@ -24,13 +20,14 @@ std::string content(std::filesystem::path const& path)
 
 TEST(Library, OpenAndCloseAreLoggedAndLaterLinesAreDropped)
 {
-    EXPECT_TRUE(obd::LIBOBDOpen(logPath()));
-    EXPECT_TRUE(content(logPath()).ends_with(" INFO - Lib OBD init\n"));
+    testsupport::TemporaryFolder const folder;
+    std::filesystem::path const log = folder.path() / "log";
+    EXPECT_TRUE(obd::LIBOBDOpen(log));
+    EXPECT_TRUE(content(log).ends_with(" INFO - Lib OBD init\n"));
     obd::LIBOBDClose();
-    EXPECT_TRUE(content(logPath()).ends_with(" INFO - Lib OBD cleanup done\n"));
+    EXPECT_TRUE(content(log).ends_with(" INFO - Lib OBD cleanup done\n"));
     TERVEX_LOG(Info) << "after the end";
-    EXPECT_EQ(content(logPath()).find("after the end"), std::string::npos);
-    std::filesystem::remove(logPath());
+    EXPECT_EQ(content(log).find("after the end"), std::string::npos);
 }
 
 TEST(Library, OpenSucceedsWithoutALog)
@@ -42,7 +39,8 @@ TEST(Library, OpenSucceedsWithoutALog)
 
 TEST(Library, OpenSucceedsThoughTheFolderDoesNotExist)
 {
-    std::filesystem::path const missing = logPath() / "no" / "log.txt";
+    testsupport::TemporaryFolder const folder;
+    std::filesystem::path const missing = folder.path() / "no" / "log.txt";
     EXPECT_TRUE(obd::LIBOBDOpen(missing));
     EXPECT_FALSE(std::filesystem::exists(missing));
     obd::LIBOBDClose();
@@ -72,15 +70,19 @@ TEST(Library, OpenedTwiceItHasEachTextOnce)
 }
 
 tervex::ITraceLogger* sinkOfAWorker = nullptr;
+testsupport::TemporaryFolder* lastFolder = nullptr; // none ends by itself behind _exit
 
 // What was registered first runs last at an exit, behind the end of all that was made meanwhile.
 [[noreturn]] void exitWhileAWorkerLogs()
 {
     std::atexit([] {
         sinkOfAWorker->log("", 0, static_cast<int>(tervex::LogLevel::Info), "the last word");
-        ::_exit(content(logPath()).ends_with("the last word\n") ? 0 : 1);
+        bool const told = content(lastFolder->path() / "log").ends_with("the last word\n");
+        delete lastFolder;
+        ::_exit(told ? 0 : 1);
     });
-    obd::LIBOBDOpen(logPath());
+    lastFolder = new testsupport::TemporaryFolder;
+    obd::LIBOBDOpen(lastFolder->path() / "log");
     sinkOfAWorker = tervex::LogSink; // as a record has it that is about to end
     std::exit(2);
 }
@@ -89,7 +91,6 @@ TEST(LibraryDeathTest, TheLogTakesLinesUntilTheProcessHasEnded)
 {
     GTEST_FLAG_SET(death_test_style, "threadsafe");
     EXPECT_EXIT(exitWhileAWorkerLogs(), testing::ExitedWithCode(0), "");
-    std::filesystem::remove(logPath());
 }
 
 } // namespace

@@ -113,20 +113,19 @@ class PortHolderTest : public testing::Test
 protected:
     PortHolderTest()
     {
-        fs::remove_all(m_root);
         fs::create_directories(m_root / "locks");
         fs::create_directories(m_root / "proc/4711/fd");
         std::ofstream(m_root / "proc/4711/comm") << "minicom\n";
         std::ofstream(m_root / "ttyUSB0");
     }
-    ~PortHolderTest() override { fs::remove_all(m_root); }
 
     std::optional<std::string> holder() const
     {
         return velmora::findPortHolder(m_root / "ttyUSB0", {{m_root / "locks"}, m_root / "proc"});
     }
 
-    fs::path m_root = fs::canonical(fs::temp_directory_path()) / fmt::format("velmora-holder-{}", ::getpid());
+    testsupport::TemporaryFolder const m_folder;
+    fs::path const m_root = fs::canonical(m_folder.path());
 };
 
 TEST_F(PortHolderTest, IsFoundByItsOpenFile)

@@ -1,5 +1,6 @@
 #include "libvelmora/record/checkedfile.h"
 #include "libvelmora/record/traffictrace.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <velmora/error.h>
 
@@ -26,8 +27,8 @@ std::vector<unsigned char> bytesOf(std::string const& text)
 
 TEST(TrafficTrace, HasALineEachWayWithItsTime)
 {
-    std::filesystem::path const file =
-        std::filesystem::temp_directory_path() / ("velmora-trace-" + std::to_string(::getpid()));
+    testsupport::TemporaryFolder const folder;
+    std::filesystem::path const file = folder.path() / "trace";
     TrafficTrace trace(file);
     trace.onDataSent(bytesOf("010C\r"));
     trace.onDataReceived(bytesOf("41 0C\r\n>"));
@@ -38,7 +39,6 @@ TEST(TrafficTrace, HasALineEachWayWithItsTime)
         ASSERT_THAT(line, MatchesRegex("[0-9]{2}:[0-9]{2}:[0-9]{2}\\.[0-9]{3} .*"));
         lines.push_back(line.substr(line.find(' ') + 1));
     }
-    std::filesystem::remove(file);
     EXPECT_THAT(lines, testing::ElementsAre(">> 010C\\r", "<< 41 0C\\r\\n>", "<< \\\\ ~\\x7F\\x1F\\xFF"));
 }
 
@@ -49,8 +49,9 @@ TEST(TrafficTrace, AFileThatCannotBeWrittenIsTold)
 
 TEST(CheckedFile, IsNotWaitedForAndNotReadWithoutEnd)
 {
-    std::filesystem::path const folder = std::filesystem::path(testing::TempDir());
-    std::filesystem::path const pipe = folder / ("velmora-pipe-" + std::to_string(::getpid()));
+    testsupport::TemporaryFolder const own;
+    std::filesystem::path const& folder = own.path();
+    std::filesystem::path const pipe = folder / "pipe";
     ASSERT_EQ(::mkfifo(pipe.c_str(), 0600), 0);
     EXPECT_THROW(requireWritable(pipe, "log file"), Error) << "nobody reads it";
     EXPECT_EQ(whyUnreadable(pipe, 100), "it is no plain file");
@@ -63,7 +64,6 @@ TEST(CheckedFile, IsNotWaitedForAndNotReadWithoutEnd)
     EXPECT_EQ(whyUnreadable(pipe, 4), "it has 5 bytes; at most 4 are read");
     requireWritable(pipe, "log file");
     EXPECT_EQ(std::filesystem::file_size(pipe), 5U) << "looking at it changes nothing";
-    std::filesystem::remove(pipe);
     EXPECT_THROW(requireWritable(folder / "no" / "such", "log file"), Error);
 }
 

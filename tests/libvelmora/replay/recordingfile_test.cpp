@@ -1,5 +1,6 @@
 #include "libvelmora/output/database/sqliteoutput.h"
 #include "libvelmora/replay/recordingfile.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <velmora/error.h>
 
@@ -8,7 +9,6 @@
 #include <filesystem>
 #include <fstream>
 #include <sstream>
-#include <unistd.h>
 
 namespace {
 
@@ -117,8 +117,8 @@ TEST(Recordings, TellTheLineThatCannotBePlayed)
 
 TEST(Recordings, AreKnownByTheirBeginning)
 {
-    std::filesystem::path const folder = testing::TempDir() + "velmora-replay-" + std::to_string(::getpid());
-    std::filesystem::create_directories(folder);
+    testsupport::TemporaryFolder const own;
+    std::filesystem::path const& folder = own.path();
     std::ofstream(folder / "a") << "time,A\n2024-03-07T09:05:00.000Z,1\n";
     std::ofstream(folder / "b") << "{}\n";
     std::ofstream(folder / "c") << "# a dialogue\n";
@@ -151,7 +151,6 @@ TEST(Recordings, AreKnownByTheirBeginning)
     EXPECT_EQ(numberAt(recording, 0, 2), 800.5);
     EXPECT_TRUE(std::holds_alternative<std::monostate>(recording.sensors[0].values[1].value));
     EXPECT_EQ(recording.end - recording.begin, 1000);
-    std::filesystem::remove_all(folder);
 }
 
 TEST(RecordingPlayer, GoesOnAtItsSpeedAndJumps)

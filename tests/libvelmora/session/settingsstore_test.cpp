@@ -1,4 +1,5 @@
 #include "libvelmora/session/settingsstore.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <velmora/error.h>
 
@@ -21,9 +22,6 @@ using velmora::SettingsStore;
 class Settings : public testing::Test
 {
 protected:
-    Settings() { std::filesystem::create_directory(m_folder); }
-    ~Settings() override { std::filesystem::remove_all(m_folder); }
-
     void write(std::string const& text) const { std::ofstream(m_file) << text; }
     std::string content() const { return content(m_file); }
     static std::string content(std::filesystem::path const& file)
@@ -32,9 +30,9 @@ protected:
         return {std::istreambuf_iterator<char>(in), {}};
     }
 
-    std::filesystem::path m_folder =
-        std::filesystem::temp_directory_path() / ("velmora-settings-" + std::to_string(::getpid()));
-    std::filesystem::path m_file = m_folder / "settings.toml";
+    testsupport::TemporaryFolder const m_own;
+    std::filesystem::path const m_folder = m_own.path();
+    std::filesystem::path const m_file = m_folder / "settings.toml";
 };
 
 TEST_F(Settings, FileThatDoesNotExistIsAnEmptyStore)

@@ -2,6 +2,7 @@
 #include "program/live/livelayouts.h"
 #include "program/live/liverecord.h"
 #include "program/live/userfiles.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <velmora/error.h>
 
@@ -9,7 +10,6 @@
 
 #include <cstdlib>
 #include <fstream>
-#include <unistd.h>
 
 namespace {
 
@@ -19,10 +19,8 @@ using namespace velmora::cli;
 class LiveFiles : public testing::Test
 {
 protected:
-    LiveFiles() { std::filesystem::create_directories(folder); }
-    ~LiveFiles() override { std::filesystem::remove_all(folder); }
-
-    std::filesystem::path const folder = testing::TempDir() + "velmora-livefiles-" + std::to_string(::getpid());
+    testsupport::TemporaryFolder const own;
+    std::filesystem::path const& folder = own.path();
 };
 
 TEST_F(LiveFiles, LayoutsAreKeptByVehicle)

@@ -3,6 +3,7 @@
 #include "program/view/timetext.h"
 #include "tests/program/view/liveparameter.h"
 #include "tests/program/view/liverows.h"
+#include "tests/support/temporaryfolder.h"
 
 #include <velmora/error.h>
 
@@ -81,7 +82,6 @@ class LiveCsvFile : public testing::Test
 {
 protected:
     LiveCsvFile() { table.select({liveParameter(0x0C, "A"), liveParameter(0x0D, "B")}); }
-    ~LiveCsvFile() override { std::filesystem::remove(file); }
 
     std::vector<std::string> content() const
     {
@@ -94,8 +94,8 @@ protected:
     }
     void reading(int pid, std::string const& text) { table.update(pid, {liveValue(pid * 10, text)}, now); }
 
-    std::filesystem::path file =
-        std::filesystem::temp_directory_path() / ("velmora-live-" + std::to_string(::getpid()) + ".csv");
+    testsupport::TemporaryFolder const own;
+    std::filesystem::path const file = own.path() / "live.csv";
     LiveTime now = LiveTime() + seconds(1000);
     LiveCsv::WallTime const start{seconds(1709802302)}; // 2024-03-07T09:05:02Z
     LiveTable table;
