@@ -3,6 +3,8 @@
 
 #include <gtest/gtest.h>
 
+#include <chrono>
+
 namespace {
 
 using velmora::ClockJudge;
@@ -35,7 +37,12 @@ TEST(ClockJudge, TellsAWrongClockByItsWay)
     ClockJudge lost;
     lost.look({1000000, 300000, false, ""});
     EXPECT_EQ(lost.trust(), ClockJudge::Trust::Never);
-    EXPECT_GT(velmora::lookAtClocks().boot, 0);
+    velmora::ClockLook const now = velmora::lookAtClocks();
+    auto const wall =
+        std::chrono::duration_cast<std::chrono::milliseconds>(std::chrono::system_clock::now().time_since_epoch());
+    EXPECT_NEAR(static_cast<double>(now.wall), static_cast<double>(wall.count()), 60000.0);
+    EXPECT_GT(now.boot, 0);
+    EXPECT_LT(now.boot, now.wall);
     EXPECT_EQ(velmora::lookAtClocks().bootId.size(), 36U);
 }
 

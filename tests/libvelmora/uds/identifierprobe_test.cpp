@@ -115,6 +115,88 @@ TEST_F(IdentifierProbeTest, TakesATextWhole)
     EXPECT_EQ(textOf(*file.signals[0].text, {'A', 'B', 0x7F}), "AB") << "what can't be read at the end is filling";
 }
 
+TEST_F(IdentifierProbeTest, MakesASignalOfEachIdentifierByItsLength)
+{
+    m_state.told = {{0xF100, {}},
+                    {0xF101, {1}},
+                    {0xF102, {1, 2}},
+                    {0xF103, {1, 2, 3}},
+                    {0xF18A, {65, 66, 67, 68}},
+                    {0xF18B, {65, 66, 67, 68, 69}},
+                    {0xF104, {1, 2, 3, 4, 5}}};
+    m_state.task.extended = 0x07;
+    m_state.task.reply = "607";
+    m_state.vin = "VELMRAS1";
+    SignalFile const file = toSignalFile(m_state);
+    EXPECT_EQ(file.vin, "") << "too short to tell a model";
+    std::string all;
+    for (Signal const& each : file.signals) {
+        all += each.id + " | " + each.name + " | " + (each.formula ? toText(*each.formula) : "text") + "\n";
+        EXPECT_EQ(each.precision, each.formula ? 0 : 2);
+        EXPECT_EQ(each.reply, "607");
+        EXPECT_EQ(each.extendedAddress, 0x07);
+        EXPECT_EQ(each.reason, "found by a probe; what it means is not known");
+    }
+    EXPECT_EQ(all, "M7E0_22_F101 | Module 7E0, identifier F101 | A\n"
+                   "M7E0_22_F102 | Module 7E0, identifier F102 | int16(A, B)\n"
+                   "M7E0_22_F103 | Module 7E0, identifier F103 | int24(A, B, C)\n"
+                   "M7E0_22_F104 | Module 7E0, identifier F104 | A\n"
+                   "M7E0_22_F18A | Module 7E0, identifier F18A | int32(A, B, C, D)\n"
+                   "M7E0_22_F18B | Module 7E0, identifier F18B: ABCDE | text\n");
+    m_state.task.service = 0x21;
+    m_state.task.reply = "7E8";
+    m_state.told = {{0x0A, {65, 66, 67, 68, 69}}};
+    SignalFile const local = toSignalFile(m_state);
+    ASSERT_EQ(local.signals.size(), 1U);
+    EXPECT_EQ(local.signals[0].id, "M7E0_21_0A");
+    EXPECT_EQ(local.signals[0].request, (std::vector<unsigned char>{0x21, 0x0A}));
+    EXPECT_TRUE(local.signals[0].formula) << "what stands there is known of service 22 only";
+    EXPECT_EQ(local.signals[0].reply, "") << "which follows from the header";
+}
+
+TEST_F(IdentifierProbeTest, RefusesWhatIsNoRange)
+{
+    auto const problem = [](ProbeTask const& task) {
+        try {
+            checkProbe(task);
+        } catch (Error const& error) {
+            EXPECT_EQ(error.kind(), ErrorKind::WrongUse);
+            return error.what() + (" | " + error.hints().front());
+        }
+        return std::string();
+    };
+    EXPECT_EQ(problem({"7E0", "7E8", {}, 0x22, 0, 0xFFFF}), "");
+    EXPECT_EQ(problem({"7E0", "7E8", {}, 0x22, 0, 0x10000}),
+              "0 to 10000 is no range of identifiers of service 22 | they go from 0 to FFFF");
+    EXPECT_EQ(problem({"7E0", "7E8", {}, 0x1A, 5, 5}), "");
+    EXPECT_EQ(problem({"7E0", "7E8", {}, 0x21, 5, 4}),
+              "5 to 4 is no range of identifiers of service 21 | they go from 0 to FF");
+    EXPECT_EQ(problem({"7E0", "7E8", {}, 0x21, 0, 0x100}),
+              "0 to 100 is no range of identifiers of service 21 | they go from 0 to FF");
+    EXPECT_EQ(problem({"7E0", "7E8", {}, 0x01, 0, 1}),
+              "service 01 has no identifiers to probe | services 22, 21 and 1A can be probed");
+    m_bench.refuseAddress("ATFCSM1");
+    EXPECT_EQ(failure(), "The request 22F186 can't be asked by this adapter, which does not know ATFCSM1");
+    m_state.task.header = "18DA10F1";
+    EXPECT_THAT(failure(), HasSubstr("The module can't be asked: the header 18DA10F1 is none of this bus"));
+}
+
+TEST_F(IdentifierProbeTest, KeepsWhatItHasEachSixteenIdentifiers)
+{
+    m_state.task.from = 0x100;
+    m_state.task.to = 0x120;
+    std::vector<unsigned int> saved;
+    std::size_t shown = 0;
+    IdentifierProbe probe(
+        m_asker, [] {}, [&saved](ProbeState const& state) { saved.push_back(state.next); },
+        [&shown](ProbeState const& /*state*/) { ++shown; });
+    m_bench.module("7E0", "220100", {"7E80462010005"});
+    m_state.told[0xFF] = {1};
+    probe.run(m_state);
+    EXPECT_EQ(saved, (std::vector<unsigned int>{0x110, 0x120}));
+    EXPECT_EQ(shown, 0x21U);
+}
+
 TEST_F(IdentifierProbeTest, GoesOnWhereItWasInterruptedOnTheSameVehicleOnly)
 {
     testsupport::TemporaryFolder folder;

@@ -41,6 +41,11 @@ TEST(Vin, TellsModelYearAndCheckDigitByTheMarket)
         {"1M2GDM9A1KP042788", {1989, 2019}, YearBasis::Perhaps, Check::Wrong},
         {"7A3GDM9A1KP042788", {1989, 2019}, YearBasis::Perhaps, Check::NotJudged},
         {"11111111111111111", {2001}, YearBasis::Position, Check::Right},
+        {"7E3GDM9A1KP042788", {1989, 2019}, YearBasis::Perhaps, Check::NotJudged},
+        {"7F3GDM9A1KP042788", {1989}, YearBasis::Position, Check::Wrong},
+        {"73SGDM9A1KP042788", {1989}, YearBasis::Position, Check::Wrong},
+        {"5M8GDM9A1KP042788", {1989}, YearBasis::Position, Check::Wrong},
+        {"6M8GDM9A1KP042788", {1989, 2019}, YearBasis::Perhaps, Check::NotJudged},
     };
     for (VinCase const& each : cases) {
         VinFacts const facts = decodeVin(each.vin, yearOfTests);
@@ -115,6 +120,37 @@ TEST(Vin, IsReadAsTypedAndRefusedWithAReason)
         }
     }
     EXPECT_FALSE(isVin("1m8gdm9axkp042788"));
+}
+
+TEST(Vin, IsRefusedInWholeSentences)
+{
+    auto const problem = [](std::string const& text) {
+        try {
+            parseVin(text);
+        } catch (Error const& error) {
+            std::string all = error.what();
+            for (std::string const& hint : error.hints()) {
+                all += " | " + hint;
+            }
+            return all;
+        }
+        return std::string();
+    };
+    std::string const count = " | count the characters once more; blanks and hyphens do not matter";
+    EXPECT_EQ(problem("1M8GDM9AXKP04278"),
+              "\"1M8GDM9AXKP04278\" has 16 characters; a vehicle identification number has 17" + count +
+                  " | a vehicle older than 1981 may have a shorter number, which no standard describes");
+    EXPECT_EQ(problem("1M8GDM9AXKP0427888"),
+              "\"1M8GDM9AXKP0427888\" has 18 characters; a vehicle identification number has 17" + count);
+    EXPECT_EQ(problem("qM8"), "\"QM8\" is no vehicle identification number | Q is not used: is it a 0?");
+    EXPECT_EQ(problem("Im8"), "\"IM8\" is no vehicle identification number | I is not used: is it a 1?");
+    EXPECT_EQ(problem("a+"),
+              "\"A+\" is no vehicle identification number | it has the letters A to Z without I, O and Q, "
+              "and digits");
+    for (char const* const odd : {"@", "[", "/", ":"}) {
+        EXPECT_FALSE(isVin("1M8GDM9AXKP04278" + std::string(odd))) << odd;
+    }
+    EXPECT_TRUE(isVin("1M8GDM9AXKP04270") == false && isVin("1M8GDM9AXKP0427ZA") && isVin("1M8GDM9AXKP042709"));
 }
 
 TEST(Vin, IsToldAsJson)
