@@ -2,13 +2,8 @@
 
 namespace obd {
 
-CanResponse& CanModules::operator[](unsigned int id)
+CanResponse& CanModules::make(unsigned int id)
 {
-    for (Module& module : m_first) {
-        if (module.id == id) {
-            return module.message;
-        }
-    }
     return m_first.size() < mostModules ? m_first.emplace_back(id).message : m_more[id];
 }
 

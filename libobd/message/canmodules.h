@@ -17,7 +17,15 @@ public:
     CanModules() { m_first.reserve(mostModules); }
 
     // The message of the module, which is made if it is new. Stays where it is.
-    CanResponse& operator[](unsigned int id);
+    CanResponse& operator[](unsigned int id)
+    {
+        for (Module& module : m_first) {
+            if (module.id == id) {
+                return module.message;
+            }
+        }
+        return make(id);
+    }
 
     bool empty() const { return m_first.empty(); }
 
@@ -35,6 +43,8 @@ public:
 
 private:
     static constexpr std::size_t mostModules = 8;
+
+    CanResponse& make(unsigned int id);
 
     struct Module
     {

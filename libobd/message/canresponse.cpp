@@ -13,7 +13,6 @@ namespace {
 
 constexpr std::uint32_t firstFrameData = 6;
 constexpr std::uint32_t consecutiveFrameData = 7;
-constexpr std::uint32_t sequenceNumbers = 16;
 constexpr int rejected = -1;
 
 // What modules are known to fill a short frame up with.
@@ -34,26 +33,33 @@ std::uint32_t dividedUp(std::uint32_t dividend, std::uint32_t divisor)
     return (dividend + divisor - 1) / divisor;
 }
 
-// Slot arithmetic is modulo 2^32 on purpose: sequence number 0 stands before slot 0 and must not look like a low
-// offset.
+// Modulo 2^32, as the slots are counted.
 std::uint32_t slotOffset(std::uint32_t slot)
 {
     return firstFrameData + consecutiveFrameData * slot;
 }
 
-int notEnoughData()
+// A log record is large, and a function that holds one has its stack guarded and checked at each call. These stand
+// apart so that no frame pays for it that is as it should be.
+[[gnu::noinline]] int notEnoughData()
 {
     TERVEX_LOG(Error) << "Not enough data";
     return rejected;
 }
 
-} // namespace
-
-std::size_t CanResponse::reach(unsigned char pci)
+[[gnu::noinline]] int noFirstFrame()
 {
-    bool const isSingle = pci >> 4 == static_cast<int>(CanFrameType::Single);
-    return std::max<std::size_t>(FrameBytes, isSingle ? pci + 1U : 0U);
+    TERVEX_LOG(Error) << "Consecutive frame received before FF";
+    return rejected;
 }
+
+[[gnu::noinline]] int tooMuchData(std::uint32_t offset, std::uint32_t size)
+{
+    TERVEX_LOG(Error) << "Too much data incoming (" << offset << ") vs length info (" << size << ")";
+    return rejected;
+}
+
+} // namespace
 
 int CanResponse::parse(std::vector<unsigned char> const& frame)
 {
@@ -123,10 +129,7 @@ int CanResponse::parseFirst(ByteView frame)
     }
     std::uint32_t const expected = dividedUp(m_length - firstFrameData, consecutiveFrameData);
     tervex::TraceStream << "Expecting " << expected << " CAN CF frames";
-    m_slotsFilled.resize(expected);
-    m_futileTries.fill(0);
-    // Numbers repeat every 16 frames. The rounds are counted by 15, since number 0 spends its first try before slot 0.
-    m_sequenceRounds = dividedUp(expected, sequenceNumbers - 1);
+    m_slots.expect(expected);
     m_payload.resize(m_length);
     copyInto(m_payload, 0, slice(frame, 2, firstFrameData));
     m_received = firstFrameData;
@@ -136,14 +139,12 @@ int CanResponse::parseFirst(ByteView frame)
 int CanResponse::parseConsecutive(ByteView frame)
 {
     if (m_payload.empty()) {
-        TERVEX_LOG(Error) << "Consecutive frame received before FF";
-        return rejected;
+        return noFirstFrame();
     }
-    std::uint32_t const offset = claimOffset(lowNibble(byteAt(frame, 0)));
+    std::uint32_t const offset = slotOffset(m_slots.claim(lowNibble(byteAt(frame, 0))));
     auto const size = static_cast<std::uint32_t>(m_payload.size());
     if (size < offset) {
-        TERVEX_LOG(Error) << "Too much data incoming (" << offset << ") vs length info (" << size << ")";
-        return rejected;
+        return tooMuchData(offset, size);
     }
     std::uint32_t count = consecutiveFrameData;
     if (offset + count > size) {
@@ -156,22 +157,6 @@ int CanResponse::parseConsecutive(ByteView frame)
     copyInto(m_payload, offset, slice(frame, 1, count));
     m_received += count;
     return FrameBytes;
-}
-
-// Where the data of a consecutive frame belong: the first free slot whose number modulo 16 is right, which is marked as
-// filled. If none is free it is the last one tried.
-std::uint32_t CanResponse::claimOffset(unsigned char sequence)
-{
-    std::uint32_t const firstSlot = sequence - 1U;
-    for (unsigned char& tries = m_futileTries[sequence]; tries < m_sequenceRounds; ++tries) {
-        std::uint32_t const slot = firstSlot + sequenceNumbers * tries;
-        if (slot < m_slotsFilled.size() && !m_slotsFilled[slot]) {
-            m_slotsFilled[slot] = true;
-            return slotOffset(slot);
-        }
-    }
-    std::uint32_t const lastRound = std::max(m_sequenceRounds, 1U) - 1;
-    return slotOffset(firstSlot + sequenceNumbers * lastRound);
 }
 
 } // namespace obd

@@ -1,8 +1,9 @@
 #pragma once
 
 #include "libobd/bytes/bytes.h"
+#include "libobd/message/canslots.h"
 
-#include <array>
+#include <algorithm>
 #include <cstddef>
 #include <cstdint>
 #include <vector>
@@ -30,7 +31,11 @@ public:
     static constexpr std::size_t MaxFrameBytes = 16;
 
     // How many bytes a frame that begins with this PCI byte looks at: those of a CAN frame, unless it tells more.
-    static std::size_t reach(unsigned char pci);
+    static std::size_t reach(unsigned char pci)
+    {
+        bool const isSingle = pci >> 4 == static_cast<int>(CanFrameType::Single);
+        return isSingle ? std::max<std::size_t>(FrameBytes, pci + 1U) : FrameBytes;
+    }
 
     // Takes in the frame at the start of the bytes, which begin with its PCI byte and may go on with other frames.
     // Returns how many bytes the frame took, or -1, mostly with a log line, if it is none or does not fit.
@@ -47,18 +52,13 @@ private:
     int parseSingle(ByteView frame);
     int parseFirst(ByteView frame);
     int parseConsecutive(ByteView frame);
-    std::uint32_t claimOffset(unsigned char sequence);
     bool isComplete() const { return m_length == m_received; }
 
     CanFrameType m_frameType{};
     std::uint32_t m_length = 0;
     std::uint32_t m_received = 0; // a sum: a repeated frame counts again
     std::vector<unsigned char> m_payload;
-    std::vector<bool> m_slotsFilled;    // one for each consecutive frame expected
-    std::uint32_t m_sequenceRounds = 1; // how often a sequence number may be tried against the slots
-    // By sequence number: how many tries in a row are known to find no free slot, since nothing frees one but a new
-    // first frame. Without it each frame of a long message would try all rounds before its own.
-    std::array<unsigned char, 16> m_futileTries{};
+    CanSlots m_slots;
 };
 
 } // namespace obd
