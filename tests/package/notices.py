@@ -44,6 +44,10 @@ for name, folder in embedded:
     owner = subprocess.run(["dpkg", "-S", f"{folder}/{name}"], capture_output=True, text=True).stdout.split(":")[0]
     if owner not in told("Debian"):
         wrong.append(f"{folder}/{name} of the package \"{owner}\" is embedded, but no notice names it")
+    # What a script holds of others begins with a banner of theirs.
+    if name.endswith(".js"):
+        banners = re.findall(r"/\*!\s*\*?\s*(\S+)", pathlib.Path(folder, name).read_text()) or ["nobody's banner"]
+        wrong += [f"{folder}/{name} holds {part}, but no notice names it" for part in banners if f"\n{part}\n" not in notices]
 
 # The packages that the build wants, but for tools.
 lists = re.findall(r"^build_packages\+?=\(([^)]*)\)", (source / "scripts/lib.sh").read_text(), re.M)
