@@ -105,13 +105,28 @@ char const* betterCommand(int pid)
     }
 }
 
-[[noreturn]] void failNotOffered(int pid)
+[[noreturn]] void failNotOffered(int pid, Offered const& alike)
 {
     std::string const name = sensorNameOf(pid);
+    std::vector<std::string> hints;
+    for (OfferedSensor const& each : alike) {
+        hints.push_back(fmt::format("or is this meant? {}", describe(each)));
+    }
+    hints.insert(hints.end(), {betterCommand(pid), "another control module may offer it: --ecu ID"});
     throw Error(ErrorKind::NotSupported,
                 fmt::format("The vehicle does not offer the sensor {:02X}{}", pid,
                             name.empty() ? "" : fmt::format(" ({})", name)),
-                {betterCommand(pid), "another control module may offer it: --ecu ID"});
+                hints);
+}
+
+// A name of several words means one sensor, and so does one that came from another program's users: where the vehicle
+// lacks it, another whose title has the same words would give values of something else. A single word, such as "fuel",
+// is what people look for in titles, too.
+bool isLoose(std::string const& name)
+{
+    return splitWords(name).size() == 1 &&
+           std::any_of(sensorNames().begin(), sensorNames().end(),
+                       [&name](SensorName const& each) { return toUpper(name) == each.name; });
 }
 
 [[noreturn]] void failUnknown(std::string const& text)
@@ -139,6 +154,9 @@ Id chooseOne(std::string const& text, Offered const& offered)
         return toId(*known);
     }
     Offered const titles = isPid ? Offered() : findTitles(text, offered);
+    if (known && !isLoose(text)) {
+        failNotOffered(*known, titles);
+    }
     if (titles.size() == 1) {
         return titles.front().id;
     }
@@ -146,7 +164,7 @@ Id chooseOne(std::string const& text, Offered const& offered)
         failUnclear(text, titles);
     }
     if (known) {
-        failNotOffered(*known);
+        failNotOffered(*known, titles);
     }
     failUnknown(text);
 }

@@ -121,6 +121,24 @@ TEST(SensorChoice, AKnownSensorThatTheVehicleLacksIsNotSupported)
     EXPECT_STREQ(failure("5c").what(), "The vehicle does not offer the sensor 5C (OIL_TEMP)");
 }
 
+// Values of another sensor under the name that was asked for would be taken for what that name means.
+TEST(SensorChoice, ANameIsNotTakenForWordsOfAnotherTitle)
+{
+    std::vector<OfferedSensor> const alike = {sensor(0x03, "Fuel system status"), sensor(0x23, "Fuel rail pressure")};
+    for (char const* name : {"STATUS", "FUEL_PRESSURE", "fuel pressure"}) {
+        try {
+            chooseSensors({name}, alike);
+            ADD_FAILURE() << name;
+        } catch (Error const& error) {
+            EXPECT_EQ(error.kind(), ErrorKind::NotSupported) << name;
+            EXPECT_THAT(error.hints().front(), HasSubstr("or is this meant? ")) << name;
+        }
+    }
+    EXPECT_THAT(chooseSensors({"coolant"}, {sensor(0x67, "Engine Coolant Temperature")}),
+                ElementsAre(obd::ParameterIdentifier(0x67).id()))
+        << "a single word may stand in a title";
+}
+
 TEST(SensorChoice, AnUnknownWordIsWrongUseWithWhatIsNear)
 {
     Error const unknown = failure("rmp");
