@@ -10,6 +10,7 @@
 #include <velmora/longwatch.h>
 #include <velmora/offers.h>
 #include <velmora/ports.h>
+#include <velmora/settingsfile.h>
 #include <velmora/version.h>
 
 #include <fmt/format.h>
@@ -77,6 +78,19 @@ Completion troubleCodes(std::string const& begun)
     return completion;
 }
 
+// Those of the vehicle, and a limit for each sensor.
+Completion settingNames(std::string const& /*begun*/)
+{
+    Completion completion;
+    for (SettingsFile::Setting const& each : SettingsFile().settings()) {
+        completion.candidates.push_back({each.name, each.title});
+    }
+    for (SensorName const& each : sensorNames()) {
+        completion.candidates.push_back({fmt::format("limit.{}", each.name), "What its values should stay in"});
+    }
+    return completion;
+}
+
 // What addresses of the outputs of this build begin with.
 Completion outputs(std::string const& /*begun*/)
 {
@@ -113,8 +127,10 @@ manual::Sources sources()
             {"SYSTEM", fixed({"metric", "imperial", "imperial-uk"})},
             {"WHEN", fixed({"auto", "always", "never"})},
             {"KIND:TARGET", outputs},
-            {"--listen", fixed({"pty", "tcp://127.0.0.1:0"})},
-            {"--vehicle", vehicles},
+            {"SETTING", settingNames},
+            {"RULE", fixed({"us-epa", "us-california", "uk-mot", "de-au", "none"})},
+            {"ADDRESS", fixed({"pty", "tcp://127.0.0.1:0"})},
+            {"VEHICLE", vehicles},
             {"--adapter", adapters},
             {"--drive", drives},
             {"--scenario", files},

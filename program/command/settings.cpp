@@ -89,7 +89,7 @@ void list(SettingsFile const& file, GlobalOptions const& options)
     for (std::string const& sensor : limits.sensors()) {
         rows.push_back({{limitPrefix + sensor}, {limitText(limits.of(sensor))}, {}});
     }
-    printText(fmt::format("{}\n{}\n  velmora settings NAME explains one, velmora settings NAME VALUE sets it\n",
+    printText(fmt::format("{}\n{}\n  velmora settings SETTING explains one, velmora settings SETTING VALUE sets it\n",
                           file.path(), drawColumns(rows, "  ", outputStyle(options))));
 }
 
@@ -132,7 +132,7 @@ void addSettingsCommand(CommandLine& commandLine)
         commandLine.addCommand("settings", "List, explain and set the settings of the vehicle",
                                [chosen](GlobalOptions const& options) { return settings(*chosen, options); });
     command
-        ->add_option("NAME", chosen->name,
+        ->add_option("SETTING", chosen->name,
                      "Setting to explain, such as displacement, or limit.SENSOR; without, all are listed")
         ->type_name("");
     command->add_option("VALUE", chosen->value, "What to set it to, in the unit of the list, such as 1.6")

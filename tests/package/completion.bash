@@ -27,6 +27,12 @@ offers '* --fast *' 'velmora live --f' velmora live --f
 offers ' P0420 ' 'velmora dtc P0420' velmora dtc P0420
 offers '* Ford *' 'velmora dtc --make F' velmora dtc --make F
 offers ' mqtt:// mqtts:// ' 'velmora watch -o mq' velmora watch -o mq
+offers ' displacement ' 'velmora settings disp' velmora settings disp
+offers ' limit.RPM ' 'velmora settings limit.RP' velmora settings limit.RP
+offers ' us-epa us-california ' 'velmora scan --inspection us' velmora scan --inspection us
+offers ' pty ' 'velmora simulate --listen p' velmora simulate --listen p
+offers '  ' 'velmora dash --listen ' velmora dash --listen ''
+offers '  ' 'velmora diff --vehicle ' velmora diff --vehicle ''
 offers '* elm327-v1.5 *' 'obdsim --adapter el' obdsim --adapter el
 cd "$1" || exit 1
 offers '* share *' 'velmora --settings s' velmora --settings s
