@@ -29,9 +29,13 @@ holds libobd0 'libobd\.so\.0\.'
 holds libvelmora0 'libvelmora\.so\.0\.'
 holds libvelmora-dev '/obd/obd\.h$' '/velmora/velmora\.h$' 'pkgconfig/velmora\.pc$' 'velmoraConfig\.cmake$'
 holds libobdsim-dev '/obdsim/sim\.h$' 'libobdsim\.a$' 'velmoraSimTargets\.cmake$'
-holds velmora 'man1/velmora-scan\.1\.gz$' 'man5/velmora-signals\.5\.gz$' 'completions/velmora$' 'vendor-completions/_velmora$' \
+for page in "$(dirname "$0")"/../../packaging/manual/*.5; do
+    page=${page##*/}
+    holds "${page%%-*}" "man5/${page//./\\.}\\.gz$"
+done
+holds velmora 'man1/velmora-scan\.1\.gz$' 'completions/velmora$' 'vendor-completions/_velmora$' \
     'rules\.d/60-velmora\.rules$' 'velmora-watch\.service$'
-holds obdsim 'bin/obdsim$' 'man1/obdsim\.1\.gz$' 'man5/obdsim-files\.5\.gz$'
+holds obdsim 'bin/obdsim$' 'man1/obdsim\.1\.gz$'
 holds python3-velmora 'velmora/__init__\.py$' '_velmora\..*\.so$' 'py\.typed$'
 holds velmora-doc 'companion\.md' 'html/index\.html$' 'html/group__cface\.html$' 'examples/car/read\.cpp$'
 

@@ -4,6 +4,7 @@
 set -euo pipefail
 export LC_ALL=C.UTF-8
 stage=$(realpath "$1")
+source=$(realpath "$(dirname "$0")/../..")
 wrong=0
 
 complain() {
@@ -82,4 +83,27 @@ example velmora-dialogue 1 van
 works '' -p "replay:$work/van" info
 example velmora-settings 1 settings.toml
 works 1280 --settings "$work/settings.toml" settings
+works '..6000' --settings "$work/settings.toml" settings
+
+# They tell all keys that the program knows, and so does the example of the watch.
+tells() { # tells FILE KEY...: which of the keys it does not tell
+    local key text
+    text=$([[ $1 == *.5 ]] && man -l -Tutf8 "$1" | col -b || sed 's/^#//' "$1")
+    [[ $# -gt 8 ]] || complain "only $(($# - 1)) keys are found"
+    for key in "${@:2}"; do
+        grep -qE "^ *(\[*$key\b|[a-z_, ]*\b$key\b)" <<<"$text" || complain "${1##*/} does not tell $key"
+    done
+}
+printf 'nonsense = 1\n[battery]\nnonsense = 1\n' >"$work/nonsense.toml"
+mapfile -t keys < <("$stage/bin/velmora" watch --config "$work/nonsense.toml" --check-config 2>&1 |
+    sed -n 's/.*not known here; \(.*\) are$/\1/p' | tr -s ', ' '\n')
+tells "$stage/share/man/man5/velmora-watch.5" "${keys[@]}"
+tells "$stage/share/doc/velmora/examples/watch.toml" "${keys[@]}"
+sed 's/^#\([a-z\[]\)/\1/' "$stage/share/doc/velmora/examples/watch.toml" >"$work/whole.toml"
+works '' watch --config "$work/whole.toml" --check-config
+mapfile -t keys < <(python3 -c 'import json, sys
+print(*json.load(open(sys.argv[1]))["definitions"]["signal"]["properties"], sep="\n")' "$source/docs/signals.schema.json")
+tells "$stage/share/man/man5/velmora-signals.5" "${keys[@]}"
+mapfile -t keys < <("$stage/bin/velmora" --json settings | sed -n 's#.*"key": *"[a-z]*/\([a-z]*\)".*#\1#p')
+tells "$stage/share/man/man5/velmora-settings.5" "${keys[@]}"
 exit $wrong
