@@ -14,8 +14,8 @@ SignalField readField(TableReader& table, std::size_t size)
     field.bytes = static_cast<std::size_t>(table.integer("bytes", 1, mostBytes, 1));
     field.at = static_cast<std::size_t>(table.integer("at", 0, 0xFFF));
     field.value = table.text("value");
-    field.scale = table.number("scale", 1);
-    field.offset = table.number("offset", 0);
+    field.scale = table.number("scale", field.scale);
+    field.offset = table.number("offset", field.offset);
     if (field.at + field.bytes > size) {
         table.fail("at", "the field ends behind the data");
     }

@@ -116,4 +116,15 @@ TEST(Dialogue, everyRecordedOneIsReadAndWrittenBack)
     EXPECT_GT(count, 80);
 }
 
+TEST(Dialogue, whatItsHeaderLeavesOutIsNotKnown)
+{
+    Dialogue const dialogue = parseDialogue("vehicle: car\n\n-> ATZ\n.. 86400000\n<- \\t\\n\\\\\n", "a.dialogue");
+    EXPECT_EQ(dialogue.protocol, 0);
+    EXPECT_EQ(dialogue.adapter, "");
+    EXPECT_FALSE(dialogue.raw);
+    EXPECT_EQ(dialogue.exchanges[0].chunks[0].pause, Ms(86400000)) << "a day";
+    EXPECT_EQ(dialogue.exchanges[0].received(), "\t\n\\");
+    EXPECT_THROW(parseDialogue("vehicle: car\n\n-> ATZ\n.. 86400001\n<- OK\n", "x"), DialogueError);
+}
+
 } // namespace

@@ -41,16 +41,34 @@ TEST(Fault, textsAreRead)
     EXPECT_TRUE(plan.quirks.has(obdsim::Quirk::PromptLate));
     EXPECT_EQ(plan.seed, 7U);
     EXPECT_TRUE(parseFaults({"echo"}).empty());
+    auto const ends = parseFaults(
+        {"garbage=0", "nul=1", "baud=300", "seed=999999999", "command=0", "wait=7", "cut@1", "error:X@1", "stall@1:0"});
+    EXPECT_EQ(ends.faults[0].probability, 0);
+    EXPECT_EQ(ends.faults[1].probability, 1);
+    EXPECT_EQ(ends.faults[2].position, 1U);
+    EXPECT_EQ(ends.faults[3].word, "X");
+    EXPECT_EQ(ends.faults[4].duration, Ms(0));
+    EXPECT_EQ(ends.baud, 300);
+    EXPECT_EQ(ends.seed, 999999999U);
+    EXPECT_EQ(ends.command, Ms(0));
+    EXPECT_EQ(ends.wait, Ms(7));
+    EXPECT_EQ(parseFaults({"baud=4000000"}).baud, 4000000);
+    EXPECT_EQ(parseFaults({}).seed, 1U);
 }
 
 TEST(Fault, wrongTextIsToldWithTheFormsThereAre)
 {
     for (char const* text :
-         {"",         "garbage",  "garbage=", "garbage=2",      "garbage=-1", "garbage=x",  "garbage@5", "cut=3",
-          "cut@0",    "cut@x",    "cut@5:3",  "stall@5",        "stall=5",    "stall@5:x",  "slow=x",    "slow@5",
-          "loss=3",   "error@3",  "error:@3", "error:BUS BUSY", "error:X@",   "quirk:none", "silent",    "silent=1",
-          "silent@0", "reset",    "reset:@3", "reset:X",        "reset=1",    "seed=x",     "baud=9",    "baud",
-          "wait=x",   "command=", "fire=1",   "prompt"}) {
+         {"",          "garbage",        "garbage=",    "garbage=2",       "garbage=-1",  "garbage=x",
+          "garbage@5", "cut=3",          "cut@0",       "cut@x",           "cut@5:3",     "stall@5",
+          "stall=5",   "stall@5:x",      "slow=x",      "slow@5",          "loss=3",      "error@3",
+          "error:@3",  "error:BUS BUSY", "error:X@",    "quirk:none",      "silent",      "silent=1",
+          "silent@0",  "reset",          "reset:@3",    "reset:X",         "reset=1",     "seed=x",
+          "baud=9",    "baud",           "wait=x",      "command=",        "fire=1",      "prompt",
+          "cut=0.5",   "loss=0.5",       "silent=0",    "reset:X=0.5",     "slow@5:3",    "nul@5",
+          "nul@5:3",   "prompt@2:5",     "error:X@3:5", "garbage=0.5x",    "stall=0.5",   "stall@5:",
+          "baud=299",  "baud=4000001",   "baud=300x",   "seed=1234567890", "command=1.5", "garbage=1.01",
+          "loss@",     "loss@-1"}) {
         try {
             parseFaults({text});
             ADD_FAILURE() << text;
@@ -187,9 +205,37 @@ TEST(FaultyPeer, replayHasFaultsToo)
 TEST(Simulation, wrongNamesAreTold)
 {
     EXPECT_THROW(obdsim::simulate({"no-such-car", "elm327-v1.5", {}}), obdsim::SimulatorError);
-    EXPECT_THROW(obdsim::simulate({"petrol-can11", "no-such-adapter", {}}), obdsim::SimulatorError);
+    try {
+        obdsim::simulate({"petrol-can11", "no-such-adapter", {}});
+        ADD_FAILURE();
+    } catch (obdsim::SimulatorError const& error) {
+        std::string const begin =
+            "no adapter \"no-such-adapter\"; the adapters are elm327-v1.5, elm327-v1.2, elm327-v1.3a, elm327-v1.4, ";
+        EXPECT_EQ(std::string(error.what()).substr(0, begin.size()), begin);
+        EXPECT_TRUE(std::string(error.what()).ends_with(", unknown, silent")) << error.what();
+    }
     EXPECT_THROW(obdsim::simulate({"petrol-can11", "elm327-v1.5", {"fire=1"}}), obdsim::SimulatorError);
     EXPECT_THROW(obdsim::replay("/no/such/file"), obdsim::SimulatorError);
+}
+
+TEST(FaultyPeer, cutReplyIsLostToItsPromptAndNoFurther)
+{
+    std::string questions;
+    for (int i = 0; i < 10; ++i) {
+        questions += "?\r\r>";
+    }
+    EXPECT_EQ(faulty({"quirk:leftover-questions", "cut@3"}).ask("ATZ"), "AT" + questions);
+}
+
+TEST(FaultyPeer, whatWasUnderWayIsLostWithTheConnection)
+{
+    auto host = faulty({"slow=300"});
+    host.ask("ATE0");
+    host.peer().receive("ATI\r");
+    EXPECT_EQ((host.pass(Ms(10)), host.peer().nextOutput().has_value()), true);
+    host.peer().connect();
+    EXPECT_EQ(host.listen(), "");
+    EXPECT_EQ(host.ask("ATI"), "ELM327 v1.5\r\r>");
 }
 
 } // namespace

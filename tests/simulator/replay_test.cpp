@@ -205,4 +205,22 @@ TEST(Replay, realCarsComeUpWithTheCommandsOfADriver)
     }
 }
 
+TEST(Replay, eachRepeatedRequestHasItsOwnReply)
+{
+    auto host = replaying(kwp, "-> 010C\n<- AA\\r\\r>\n-> 010C\n<- BB\\r\\r>\n-> 010C\n<- CC\\r\\r>\n");
+    host.ask("ATE0");
+    for (char const* const reply : {"AA", "BB", "CC", "CC"}) {
+        EXPECT_EQ(host.ask("010C"), std::string(reply) + "\r\r>");
+    }
+}
+
+TEST(Replay, whatIsToldOfTheProtocolBehindTheSearchIsTheRecordings)
+{
+    auto host = replaying("adapter: ELM327 v2.2\nprotocol: 6\nheaders: off\n",
+                          "-> ATDP\n<- AUTO\\r\\r>\n-> 0100\n<- 4100BE3EA813\\r\\r>\n"
+                          "-> ATDP\n<- AUTO,ISO 15765-4\\r\\r>\n");
+    EXPECT_EQ(host.ask({"ATE0", "ATDP"}), "AUTO\r\r>");
+    EXPECT_EQ(host.ask({"0100", "ATDP"}), "AUTO,ISO 15765-4\r\r>");
+}
+
 } // namespace

@@ -43,7 +43,10 @@ public:
         char byte = 0;
         while (text.empty() || text.back() != '>') {
             pollfd wait{m_descriptor, POLLIN, 0};
-            if (::poll(&wait, 1, 2000) <= 0 || ::read(m_descriptor, &byte, 1) <= 0) {
+            if (::poll(&wait, 1, 2000) <= 0) {
+                break;
+            }
+            if (::read(m_descriptor, &byte, 1) <= 0) {
                 m_ended = true;
                 break;
             }
@@ -184,6 +187,10 @@ TEST(UnsentText, holdsWhatFitsAndTakesMoreWhenItIsRead)
     EXPECT_TRUE(text.empty());
     text.push("C");
     EXPECT_EQ(text.front(), "C");
+    text.push(std::string(obdsim::UnsentText::mostBytes - 1, 'D'));
+    EXPECT_EQ(text.size(), 65536U) << "to the last byte";
+    text.push("E");
+    EXPECT_EQ(text.size(), 65536U);
 }
 
 TEST(TcpServer, portInUseIsTold)
@@ -233,6 +240,29 @@ TEST(PtyServer, lostLinkTakesTheDeviceAway)
     std::string const rest = client.ask("ATI");
     EXPECT_EQ(rest, std::string("ELM").substr(0, rest.size())) << "the hang-up may take unread bytes with it";
     EXPECT_TRUE(client.ended());
+}
+
+TEST(TcpServer, aFleetNeedsAPortForEachCar)
+{
+    auto const said = [](std::size_t cars, std::uint16_t port) -> std::string {
+        try {
+            obdsim::Peers peers;
+            for (std::size_t i = 0; i < cars; ++i) {
+                peers.push_back(obdsim::simulate({}));
+            }
+            obdsim::serveTcp(peers, "127.0.0.1", port);
+        } catch (obdsim::ServerError const& error) {
+            return error.what();
+        }
+        return "";
+    };
+    EXPECT_EQ(said(2, 65535), "there are no 2 ports from 65535 on");
+    EXPECT_EQ(said(3, 65534), "there are no 3 ports from 65534 on");
+    for (std::size_t const cars : {1U, 2U}) {
+        std::string const what = said(cars, static_cast<std::uint16_t>(65536 - cars));
+        EXPECT_EQ(what.find("there are no"), std::string::npos) << what << ": at most one of them is in use";
+    }
+    EXPECT_EQ(said(3, 0), "") << "any free ones";
 }
 
 } // namespace

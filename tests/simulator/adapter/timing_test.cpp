@@ -257,4 +257,76 @@ TEST(LineRate, whatWasUnderWayIsLostWithTheConnection)
     EXPECT_EQ(host.ask("ATI"), "ELM327 v1.5\r\r>");
 }
 
+TEST(LineRate, aLineThatHasBegunIsLostWithTheConnection)
+{
+    auto host = simulated("petrol-can11", "elm327-v1.5", {"baud=9600"});
+    host.ask("ATE0");
+    host.peer().receive("AT");
+    host.pass(Ms(20));
+    host.peer().connect();
+    EXPECT_EQ(host.ask("ATI"), "ELM327 v1.5\r\r>");
+}
+
+TEST(Timing, aReplyTakesItsFramesTheModuleAndTheCommand)
+{
+    auto host = quiet(fastAndSlow);
+    host.ask("0100");
+    EXPECT_EQ(host.ask("010D1"), "7E803410D3700000000\r\r>");
+    EXPECT_EQ(host.lastWait(), Ms(4) + Ms(4) + 2 * std::chrono::microseconds(222)) << "to the microsecond";
+}
+
+TEST(Timing, aBusThatNobodyAnswersOnTakesItsProbe)
+{
+    struct Probe
+    {
+        char const* protocol;
+        char const* told;
+        int milliseconds;
+    };
+    for (auto const& each :
+         {Probe{"1", "NO DATA", 120}, Probe{"2", "NO DATA", 120}, Probe{"3", "BUS INIT: ...ERROR", 2500},
+          Probe{"4", "BUS INIT: ...ERROR", 2500}, Probe{"5", "BUS INIT: ERROR", 400}, Probe{"6", "CAN ERROR", 150},
+          Probe{"7", "CAN ERROR", 150}, Probe{"8", "CAN ERROR", 150}, Probe{"9", "CAN ERROR", 150},
+          Probe{"A", "CAN ERROR", 100}, Probe{"B", "CAN ERROR", 100}, Probe{"C", "CAN ERROR", 100}}) {
+        auto host = unplugged();
+        host.ask({"ATE0", ("ATSP" + std::string(each.protocol)).c_str()});
+        EXPECT_EQ(host.ask("0100"), std::string(each.told) + "\r\r>") << each.protocol;
+        EXPECT_EQ(host.lastWait(), Ms(4 + each.milliseconds)) << each.protocol;
+    }
+    auto host = unplugged();
+    EXPECT_EQ(host.ask({"ATE0", "ATSPD"}), "?\r\r>") << "there is none beyond C";
+    EXPECT_EQ(host.ask({"ATSPA", "ATDP"}), "SAE J1939 (CAN 29/250)\r\r>");
+    EXPECT_EQ(host.ask({"ATSPB", "ATDP"}), "USER1 (CAN 11/125)\r\r>");
+    EXPECT_EQ(host.ask({"ATSPC", "ATDP"}), "USER2 (CAN 11/50)\r\r>");
+    EXPECT_EQ(host.ask("ATDPN"), "C\r\r>");
+}
+
+TEST(Timing, framesOfALongMessageAreAsFarApartAsUsualOnTheirBus)
+{
+    struct Gap
+    {
+        int protocol;
+        char const* id;
+        int microsecondsOfTwoFrames; ///< between the first two lines of a message
+    };
+    for (auto const& each :
+         {Gap{6, "7E8", 222 + 2000 + 222 + 2 * 2000}, Gap{7, "18DAF110", 262 + 2000 + 262 + 2 * 2000},
+          Gap{8, "7E8", 444 + 3000 + 444 + 2 * 3000}, Gap{9, "18DAF110", 524 + 3000 + 524 + 2 * 3000},
+          Gap{1, "10", 10000 + 11 * 192}, Gap{2, "10", 20000 + 11 * 769}, Gap{5, "10", 30000 + 11 * 962}}) {
+        std::string const protocol = std::to_string(each.protocol);
+        auto host = withVehicle("name = \"x\"\nprotocol = " + protocol + "\n[[module]]\nid = \"" + each.id +
+                                    "\"\nlatency = 4\n[module.info]\nvin = \"WDX-SIM0019212345\"\n",
+                                "elm327-v2.3");
+        host.ask({"ATE0", "ATS0", "ATH1", "ATAT0", ("ATSP" + protocol).c_str()});
+        host.ask("0902");
+        host.pass(Ms(500));
+        host.ask("09021");
+        Time const first = host.lastWait();
+        host.pass(Ms(500));
+        host.ask("09022");
+        EXPECT_EQ((host.lastWait() - first).count(), each.microsecondsOfTwoFrames) << each.protocol;
+        host.pass(Ms(500));
+    }
+}
+
 } // namespace

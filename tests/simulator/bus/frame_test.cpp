@@ -176,4 +176,28 @@ TEST(Frame, requestWithoutPciByteIsNoFrame)
     EXPECT_FALSE(obdsim::unwrapSingleFrame({}));
 }
 
+TEST(Frame, longMessagesHaveTwelveBitsOfLengthAndFourOfNumber)
+{
+    Bytes const payload(0x12C, 0x55);
+    auto const frames = obdsim::frameReply(*findProtocol(6), 0x7E8, false, payload, std::uint8_t{0}, std::nullopt);
+    ASSERT_EQ(frames.size(), 1 + 42U);
+    EXPECT_EQ(frames[0].data, bytes("11 2C 55 55 55 55 55 55"));
+    EXPECT_EQ(frames[15].data[0], 0x2F);
+    EXPECT_EQ(frames[16].data[0], 0x20) << "and on from 0";
+    EXPECT_EQ(frames[42].data, bytes("2A 55 55 55 55 55 55 55"));
+    EXPECT_EQ(
+        obdsim::frameReply(*findProtocol(6), 0x7E8, false, Bytes(301, 0), std::uint8_t{0xAA}, std::nullopt).back().data,
+        bytes("2B 00 AA AA AA AA AA AA"));
+}
+
+TEST(Frame, ofAFunctionalKwpHeaderTheFirstTwoBitsTell)
+{
+    for (char const* const header : {"C0 11 F1", "C1 11 F1", "FF 11 F1"}) {
+        EXPECT_TRUE(obdsim::targetOf(*findProtocol(5), bytes(header))->everyone) << header;
+    }
+    for (char const* const header : {"80 11 F1", "BF 11 F1"}) {
+        EXPECT_FALSE(obdsim::targetOf(*findProtocol(5), bytes(header))->everyone) << header;
+    }
+}
+
 } // namespace
