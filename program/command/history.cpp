@@ -164,7 +164,7 @@ void addHistoryCommand(CommandLine& commandLine)
                                [options](GlobalOptions const& global) { return runHistory(*options, global); });
     command->require_subcommand(0, 1);
     options->show = command->add_subcommand("show", "Show the report of one scan");
-    options->show->add_option("N", options->number, "Its number")->required();
+    options->show->add_option("N", options->number, "Its number")->required()->type_name("");
     options->forget = command->add_subcommand("forget", "Drop all scans of a vehicle");
     options->forget->add_option("VIN", options->vehicle, "Its identification number, or name")->required();
     options->exporting = command->add_subcommand("export", "Write all scans to a file, one JSON object a line");

@@ -50,6 +50,65 @@ TEST(LineEditor, MendsALineInTheMiddle)
     EXPECT_EQ(editor.text(), "");
 }
 
+TEST(LineEditor, TheCursorStandsWhereTheNextCharacterGoes)
+{
+    struct Step
+    {
+        char const* typed;
+        char const* text;
+        std::size_t cursor;
+    };
+    LineEditor editor;
+    for (Step const& each : {Step{" ~", " ~", 2},
+                             {"\x01", " ~", 0},
+                             {"A", "A ~", 1},
+                             {"\x7F", " ~", 0},
+                             {"\x08", " ~", 0},
+                             {"\x05", " ~", 2},
+                             {"\x08", " ", 1},
+                             {"\x15", "", 0},
+                             {"B", "B", 1},
+                             {"\x02", "B", 1},
+                             {"\x1F", "B", 1}}) {
+        type(editor, each.typed);
+        EXPECT_EQ(editor.text(), each.text);
+        EXPECT_EQ(editor.cursor(), each.cursor) << each.text;
+    }
+    std::pair<Key, std::size_t> const moves[] = {{Key::Home, 0}, {Key::Left, 0},  {Key::Right, 1}, {Key::Right, 2},
+                                                 {Key::Left, 1}, {Key::End, 3},   {Key::Right, 3}, {Key::PageUp, 3},
+                                                 {Key::Left, 2}, {Key::Delete, 2}};
+    type(editor, "CD");
+    for (auto const& [key, cursor] : moves) {
+        EXPECT_EQ(editor.press(key), State::Typing);
+        EXPECT_EQ(editor.cursor(), cursor) << static_cast<int>(key);
+    }
+    EXPECT_EQ(editor.text(), "BC");
+    editor.press(Key::Delete);
+    EXPECT_EQ(editor.text(), "BC") << "nothing stands behind the end";
+    EXPECT_EQ(editor.press(static_cast<Key>(0x80)), State::Typing);
+    EXPECT_EQ(editor.text(), "BC");
+}
+
+TEST(LineEditor, AnEmptyLineIsNoneToComeBackTo)
+{
+    LineEditor editor;
+    enter(editor, "ATI");
+    enter(editor, "");
+    editor.press(Key::Up);
+    EXPECT_EQ(editor.text(), "ATI");
+    EXPECT_EQ(editor.press(Key::Enter), State::Entered);
+    EXPECT_EQ(editor.take(), "ATI");
+    type(editor, "new");
+    editor.press(Key::Up);
+    editor.press(Key::Up);
+    EXPECT_EQ(editor.text(), "ATI");
+    editor.press(Key::Down);
+    EXPECT_EQ(editor.text(), "new");
+    EXPECT_EQ(editor.cursor(), 3U);
+    editor.press(Key::Down);
+    EXPECT_EQ(editor.text(), "new");
+}
+
 TEST(LineEditor, KeysAtTheEndsOfALineDoNothing)
 {
     LineEditor editor;

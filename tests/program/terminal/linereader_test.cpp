@@ -1,53 +1,89 @@
 #include "program/terminal/linereader.h"
+#include "tests/program/terminal/terminalinput.h"
 
-#include <gtest/gtest.h>
-
-#include <poll.h>
-#include <pty.h>
-#include <unistd.h>
+#include <velmora/error.h>
 
 namespace {
 
-// A terminal in the place of standard input.
-class TerminalInput : public testing::Test
+using velmora::cli::LineReader;
+
+bool hasInput(int limitMs)
 {
-protected:
-    TerminalInput() : m_before(::dup(STDIN_FILENO))
-    {
-        EXPECT_EQ(::openpty(&m_keyboard, &m_terminal, nullptr, nullptr, nullptr), 0);
-        ::dup2(m_terminal, STDIN_FILENO);
-    }
-    ~TerminalInput() override
-    {
-        ::dup2(m_before, STDIN_FILENO);
-        for (int const descriptor : {m_before, m_terminal, m_keyboard}) {
-            ::close(descriptor);
-        }
-    }
+    pollfd input{STDIN_FILENO, POLLIN, 0};
+    return ::poll(&input, 1, limitMs) > 0;
+}
 
-    void type(std::string const& text) const
-    {
-        EXPECT_EQ(::write(m_keyboard, text.data(), text.size()), static_cast<ssize_t>(text.size()));
-    }
-    static bool hasInput(int limitMs)
-    {
-        pollfd input{STDIN_FILENO, POLLIN, 0};
-        return ::poll(&input, 1, limitMs) > 0;
-    }
-
-    int m_before;
-    int m_keyboard = -1;
-    int m_terminal = -1;
-};
-
-TEST_F(TerminalInput, ForgetsWhatWasTypedBeforeAQuestion)
+TEST(TerminalInput, ForgetsWhatWasTypedBeforeAQuestion)
 {
-    type("yes\n");
+    PseudoTerminal const terminal;
+    Replaced const input(STDIN_FILENO, terminal.terminal());
+    terminal.type("yes\n");
     ASSERT_TRUE(hasInput(5000));
     velmora::cli::dropTypedAhead();
     EXPECT_FALSE(hasInput(0));
-    type("no\n");
+    terminal.type("no\n");
     EXPECT_TRUE(hasInput(5000)) << "what is typed behind it counts";
+}
+
+class PipedInput : public testing::Test
+{
+protected:
+    PipedInput()
+    {
+        EXPECT_EQ(::pipe(m_pipe), 0);
+        m_input.emplace(STDIN_FILENO, m_pipe[0]);
+        ::close(m_pipe[0]);
+    }
+    ~PipedInput() override { end(); }
+
+    void write(std::string const& text) const
+    {
+        EXPECT_EQ(::write(m_pipe[1], text.data(), text.size()), static_cast<ssize_t>(text.size()));
+    }
+    void end()
+    {
+        if (m_pipe[1] >= 0) {
+            ::close(m_pipe[1]);
+        }
+        m_pipe[1] = -1;
+    }
+
+private:
+    int m_pipe[2] = {-1, -1};
+    std::optional<Replaced> m_input;
+};
+
+TEST_F(PipedInput, ComesLineByLine)
+{
+    std::string const longer(1500, 'x');
+    write("ATZ\n\n" + longer + "\nlast");
+    end();
+    int checks = 0;
+    LineReader reader([&checks] { ++checks; });
+    std::string line = "before";
+    for (std::string const& each : {std::string("ATZ"), std::string(), longer, std::string("last")}) {
+        EXPECT_TRUE(reader.read(line));
+        EXPECT_EQ(line, each);
+    }
+    EXPECT_GE(checks, 4) << "before each part that is read";
+    EXPECT_FALSE(reader.read(line)) << "the end of the input";
+    EXPECT_EQ(line, "");
+}
+
+TEST_F(PipedInput, IsNotAwaitedWhenTheProgramIsToEnd)
+{
+    int checks = 0;
+    LineReader reader([&checks] {
+        if (++checks == 2) {
+            throw velmora::Error(velmora::ErrorKind::Interrupted, "Interrupted");
+        }
+    });
+    std::string line;
+    write("first\n");
+    EXPECT_TRUE(reader.read(line));
+    EXPECT_EQ(checks, 1);
+    write("second\n");
+    EXPECT_THROW(reader.read(line), velmora::Error) << "though there is a line";
 }
 
 } // namespace

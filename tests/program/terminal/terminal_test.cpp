@@ -65,6 +65,23 @@ TEST(Keys, UnknownSequencesAreSkippedWhole)
     EXPECT_EQ(keys(""), std::vector<int>{});
 }
 
+TEST(Keys, ASequenceEndsWithALetterOrASignBesideThem)
+{
+    EXPECT_EQ(keys("\033[@q"), std::vector<int>{'q'});
+    EXPECT_EQ(keys("\033[~q"), std::vector<int>{'q'});
+    EXPECT_EQ(keys("\033[?q"), std::vector<int>{}) << "? stands in the middle of one";
+    EXPECT_EQ(keys("\033OH\033OFq"), (std::vector<int>{static_cast<int>(Key::Home), static_cast<int>(Key::End), 'q'}));
+    EXPECT_EQ(keys("\033Nq"), (std::vector<int>{static_cast<int>(Key::Escape), 'N', 'q'}));
+    EXPECT_EQ(keys("\033\033[A"), (std::vector<int>{static_cast<int>(Key::Escape), static_cast<int>(Key::Up)}));
+    EXPECT_EQ(keys("\xFF"), std::vector<int>{0xFF});
+    for (char const* const part : {"\033[?", "\033[\x7F", "\033[ "}) {
+        EXPECT_TRUE(velmora::cli::isUnfinished(part)) << part + 1;
+    }
+    for (char const* const whole : {"\033[@", "\033[~", "\033[?h", "\033N", "\033O~"}) {
+        EXPECT_FALSE(velmora::cli::isUnfinished(whole)) << whole + 1;
+    }
+}
+
 TEST(Spans, PartsOfALineHaveTheirLook)
 {
     using velmora::cli::Span;
@@ -78,6 +95,36 @@ TEST(Spans, PartsOfALineHaveTheirLook)
     EXPECT_EQ(spansOf("\033[1;31mc\033[m"), (std::vector<Span>{{"c", red}}));
     EXPECT_EQ(spansOf("x\033[2Jy\033["), (std::vector<Span>{{"x", {}}, {"y", {}}})) << "nothing else gets through";
     EXPECT_TRUE(spansOf("").empty());
+}
+
+TEST(Spans, EachLookHasItsNumber)
+{
+    using velmora::cli::SpanLook;
+    auto const lookOf = [](std::string const& codes) {
+        return velmora::cli::spansOf("\033[" + codes + "mx").front().look;
+    };
+    EXPECT_EQ(lookOf("1"), (SpanLook{true, false, false, -1}));
+    EXPECT_EQ(lookOf("2"), (SpanLook{false, true, false, -1}));
+    EXPECT_EQ(lookOf("7"), (SpanLook{false, false, true, -1}));
+    EXPECT_EQ(lookOf("2;7;1"), (SpanLook{true, true, true, -1}));
+    for (int color = 0; color < 8; ++color) {
+        EXPECT_EQ(lookOf("3" + std::to_string(color)), (SpanLook{false, false, false, color}));
+    }
+    for (char const* const other : {"", "0", "3", "6", "8", "29", "38", "40", "1;0", "1;", "31;0;"}) {
+        EXPECT_EQ(lookOf(other), SpanLook()) << other;
+    }
+    EXPECT_EQ(lookOf("0;1"), (SpanLook{true, false, false, -1}));
+    EXPECT_EQ(lookOf(";1"), (SpanLook{true, false, false, -1}));
+}
+
+TEST(Spans, WhatIsNoLookIsLeftOut)
+{
+    using velmora::cli::Span;
+    using velmora::cli::spansOf;
+    EXPECT_EQ(spansOf("a\033[1"), (std::vector<Span>{{"a", {}}}));
+    EXPECT_EQ(spansOf("a\033[31xb"), (std::vector<Span>{{"a", {}}, {"b", {}}}));
+    EXPECT_EQ(spansOf("a\033b"), (std::vector<Span>{{"a\033b", {}}})) << "no sequence begins there";
+    EXPECT_EQ(spansOf("\033[m\033[mb"), (std::vector<Span>{{"b", {}}}));
 }
 
 TEST(TerminalKinds, NewerOnesStandForWhatTheyUnderstand)

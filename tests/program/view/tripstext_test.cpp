@@ -74,4 +74,34 @@ TEST_F(TripsText, ConsumptionIsOfTheTripsThatToldTheirFuel)
         HasSubstr("2026-03-31T21:30:00.000Z,2026-03-31T22:00:00.000Z,van,trip,10.000,-,1800,0,0,1.000,-,-,-,-\n"));
 }
 
+TEST_F(TripsText, EachColumnHasItsUnitAndDigits)
+{
+    Trip trip = tripAt(1774992600000, 123.456, 10.055);
+    trip.durationS = 5430.4;
+    trip.idleS = 89.9;
+    trip.gapS = 12.6;
+    trip.odometerKm = 124.4;
+    trip.meanKmh = 81.84;
+    trip.maxKmh = 131.6;
+    trip.maxRpm = 3999.6;
+    trip.maxCoolantC = 91.4;
+    EXPECT_EQ(velmora::cli::tripsText({trip, m_trips[3]}),
+              R"(Begin              Vehicle             km   h:min    idle     max        l l/100 km
+2026-03-31 23:30   van              124.4    1:31    0:01     132    10.05      8.1
+2026-04-01 12:40   van                0.1    0:30    0:00       -     0.20        -  engine run
+
+Day                 Trips        km   h:min       l l/100 km
+2026-03-31              1     124.4    1:31    10.1      8.1
+
+Month               Trips        km   h:min       l l/100 km
+2026-03                 1     124.4    1:31    10.1      8.1
+)");
+    EXPECT_EQ(
+        velmora::cli::tripsCsv({trip, m_trips[3]}),
+        R"(begin,end,vehicle,kind,distance_km,odometer_km,duration_s,idle_s,gap_s,fuel_l,mean_kmh,max_kmh,max_rpm,max_coolant_c
+2026-03-31T21:30:00.000Z,2026-03-31T22:00:00.000Z,van,trip,123.456,124,5430,90,13,10.055,81.8,132,4000,91
+2026-04-01T10:40:00.000Z,2026-04-01T11:10:00.000Z,van,engine run,0.100,-,1800,0,0,0.200,-,-,-,-
+)");
+}
+
 } // namespace
