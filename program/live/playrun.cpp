@@ -50,13 +50,16 @@ void PlayRun::choose(std::vector<std::string> const& words)
 {
     std::vector<std::size_t> chosen;
     for (std::string const& word : words) {
-        std::size_t const before = chosen.size();
+        bool known = false;
         for (std::size_t i = 0; i < m_recording.sensors.size(); ++i) {
-            if (means(word, m_recording.sensors[i].about) && std::ranges::count(chosen, i) == 0) {
-                chosen.push_back(i);
+            if (means(word, m_recording.sensors[i].about)) {
+                known = true;
+                if (std::ranges::count(chosen, i) == 0) {
+                    chosen.push_back(i);
+                }
             }
         }
-        if (chosen.size() == before) {
+        if (!known) {
             throw Error(ErrorKind::NotSupported, "The recording has no sensor \"" + word + "\"",
                         {"without any, all of it is played"});
         }
