@@ -122,6 +122,13 @@ def serves_a_fleet(folder):
     second.ask("ATDPN\r", b">")
     reply = control.ask("requests\n", b"ok\n")
     check(re.match(r"6 in all\n(\d+ \w+\n)+ok\n$", reply) and "ATDPN" not in reply, f"what the first car was asked: {reply}")
+    long = Line(fleet.lines[2].split()[1])
+    check(long.ask("#" + "x" * 4094 + "\n", b"\n") == "ok\n", "a line of 4096 characters")
+    long.socket.sendall(b"#" + b"x" * 4095 + b"\n")
+    try:
+        check(long.socket.recv(64) == b"", "a longer one ends its client")
+    except ConnectionResetError:
+        pass
     check(fleet.type("\nhold speed 90") == "ok", "standard input")
     check(second.ask("ATRV\r", b">") == "12.2V\r\r>" and second.ask("010D1\r", b">") == "41 0D 5A \r\r>", "both take effect")
     fleet.process.stdin.write("nonsense\n")
