@@ -1,8 +1,5 @@
 // What the command line offers and takes, without a vehicle.
-#include "program/command/commands.h"
-#include "program/commandline.h"
-#include "program/terminal/interrupt.h"
-#include "tests/program/terminal/terminalinput.h"
+#include "tests/program/runline.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -17,36 +14,6 @@ using namespace velmora::cli;
 using testing::ElementsAreArray;
 using testing::HasSubstr;
 using testing::StartsWith;
-
-struct Ended
-{
-    ExitCode code;
-    std::string out;
-    std::string err;
-};
-
-Ended runLine(std::vector<std::string> const& words)
-{
-    std::vector<char const*> arguments = {"velmora"};
-    for (std::string const& word : words) {
-        arguments.push_back(word.c_str());
-    }
-    SignalsAsBefore const signals;
-    Interrupt const interrupt;
-    CommandLine commandLine;
-    addCommands(commandLine);
-    testing::internal::CaptureStdout();
-    testing::internal::CaptureStderr();
-    ExitCode const code = commandLine.run(static_cast<int>(arguments.size()), arguments.data());
-    std::string out = testing::internal::GetCapturedStdout();
-    return {code, std::move(out), testing::internal::GetCapturedStderr()};
-}
-
-std::vector<std::string> wordsOf(std::string const& text)
-{
-    std::istringstream in(text);
-    return {std::istream_iterator<std::string>(in), {}};
-}
 
 // What the help of a command lists below a title, by the first word of each entry.
 std::vector<std::string> listed(std::string const& help, std::string const& title)
