@@ -1,15 +1,17 @@
 #pragma once
 
 #include "libvelmora/channel/wire.h"
-#include "libvelmora/port/iport.h"
+#include "libvelmora/port/ipulledport.h"
 
+#include <atomic>
 #include <condition_variable>
 #include <memory>
 #include <mutex>
 
 namespace velmora {
 
-// An open port as a wire, with the system's clock. Starts the port, and closes it in the end.
+// An open port as a wire, with the system's clock. Starts the port, unless that can be read by who waits for its bytes,
+// and closes it in the end.
 class PortWire : public IWire
 {
 public:
@@ -29,13 +31,20 @@ public:
     bool lost() const;
 
 private:
+    void start();
+    std::string pull(WireTime until);
+    void lookAfterLink() const;
+    void endLink(bool lost) const;
+
     std::unique_ptr<IPort> m_port;
+    IPulledPort* const m_pulled; // the same, if it can be read so
+    mutable std::atomic<WireTime::rep> m_seenUp{0};
     mutable std::mutex m_mutex;
     std::condition_variable m_wake;
-    std::string m_incoming; // protected by m_mutex, as what follows
-    bool m_open = true;
+    std::string m_incoming; // of a port with a thread; protected by m_mutex, as what follows
+    mutable bool m_open = true;
     bool m_givenUp = false;
-    bool m_lost = false;
+    mutable bool m_lost = false;
 };
 
 } // namespace velmora

@@ -3,6 +3,7 @@
 #include "libvelmora/port/asioport.h"
 #include "libvelmora/port/serialport.h"
 
+#include <asio/buffer.hpp>
 #include <asio/local/connect_pair.hpp>
 #include <asio/local/stream_protocol.hpp>
 #include <gtest/gtest.h>
@@ -97,6 +98,27 @@ TEST(AsioPort, ASerialLineTakesItsTimeInTheSameOrder)
     EXPECT_TRUE(readAll(master, text.size()) == text);
     port->close();
     ::close(master);
+}
+
+TEST(AsioPort, WhatWaitsGoesOutWithTheReadingOfWhoPulls)
+{
+    SocketRig rig;
+    auto& port = dynamic_cast<velmora::IPulledPort&>(*rig.port);
+    std::string const text = numberedLines();
+    writeInPieces(port, text);
+    std::string sent;
+    std::string came;
+    for (int i = 0; i < 100000 && sent.size() < text.size(); ++i) {
+        std::string piece(rig.other.available(), ' ');
+        sent += piece.substr(0, rig.other.read_some(asio::buffer(piece)));
+        EXPECT_TRUE(port.pull(came, std::chrono::steady_clock::now() + std::chrono::milliseconds(1)));
+    }
+    EXPECT_TRUE(sent == text);
+    EXPECT_EQ(came, "");
+    rig.other.close();
+    EXPECT_FALSE(port.isUp());
+    EXPECT_FALSE(port.pull(came, velmora::IPulledPort::Moment::max()));
+    EXPECT_FALSE(port.pull(came, velmora::IPulledPort::Moment::max())) << "for good";
 }
 
 // A write to a socket whose other end is gone raises a signal that ends programs, unless it is told not to.
