@@ -51,10 +51,13 @@ bool FastChannel::receive(std::vector<unsigned char>& out, int timeoutMs)
     bool const hurries = m_vainGraces >= enoughGraces && m_habits[static_cast<std::size_t>(Habit::StaleReply)] == 0;
     WireTime const latency = m_pending ? std::exchange(m_pending->latency, WireTime(0)) : WireTime(0);
     WireTime const patience = !idle ? timeout + latency : hurries ? WireTime(0) : std::min(timeout, grace);
+    if (idle && !prepared && hurries && timeoutMs <= 0) {
+        return false; // the next command finds what was said meanwhile
+    }
     WireTime const end = m_wire->now() + patience;
     takeReplies();
     while (m_ready.empty() && isValid()) {
-        std::string const bytes = m_wire->read(m_pending ? std::min({end, remedyTime(), cutTime()}) : end);
+        std::string const bytes = listen(m_pending ? std::min({end, remedyTime(), cutTime()}) : end);
         hear(bytes);
         if (!bytes.empty()) {
             continue;
@@ -107,7 +110,9 @@ void FastChannel::send(std::vector<unsigned char> const& bytes)
         settle();
     }
     m_ready.clear();
-    begin(text);
+    if (isValid()) {
+        begin(text);
+    }
     publish();
 }
 

@@ -7,6 +7,7 @@
 #include "libvelmora/channel/learntstore.h"
 #include "libvelmora/channel/replyhealer.h"
 #include "libvelmora/channel/returnnote.h"
+#include "libvelmora/channel/silencewatch.h"
 #include "libvelmora/channel/turn.h"
 #include "libvelmora/channel/waitcutter.h"
 #include "libvelmora/channel/wire.h"
@@ -77,6 +78,8 @@ public:
     bool adapterFails() const { return m_lost; }
     // Whether that is because it reset itself again and again.
     bool adapterResets() const { return m_resets; }
+    // Whether that is because not a byte has come for seconds, to nothing at all.
+    bool adapterGone() const { return m_gone; }
 
 private:
     struct Pending
@@ -95,8 +98,7 @@ private:
         bool heard = false;
         bool askedAgain = false;
         bool woken = false;
-        bool verifying = false; // asked once more with the full wait
-        bool setUpAgain = false;
+        bool verifying = false;          // asked once more with the full wait
         bool cutTried = false;           // its wait is not cut (again)
         std::optional<WireTime> cutAt{}; // when its wait was cut
         std::thread::id asker{};
@@ -114,6 +116,8 @@ private:
     // One exchange.
     void begin(std::string const& text);
     void write(std::string const& text);
+    void writeLine(std::string const& text);
+    std::string listen(WireTime until);
     void writePending(std::string const& text);
     void drain();
     void hear(std::string const& bytes);
@@ -191,6 +195,7 @@ private:
     std::atomic<char> m_delimiter{'>'};
     std::atomic<bool> m_lost{false};
     std::atomic<bool> m_resets{false};
+    std::atomic<bool> m_gone{false};
     std::atomic<bool> m_sleepAnswered{false};
     std::atomic<bool> m_connected{false};
     ReturnNotes const m_returns;
@@ -209,6 +214,7 @@ private:
     ChannelStatistics m_working;
     bool m_echoChecked = false;
     bool m_echoStuck = false;
+    SilenceWatch m_silence;
     bool m_silent = false;    // it did not answer when it was woken
     WireTime m_silentFrom{0}; // where it is silent: the last it said, or was asked
     std::string m_trouble;

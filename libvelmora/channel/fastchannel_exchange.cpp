@@ -66,9 +66,24 @@ void FastChannel::begin(std::string const& text)
 void FastChannel::write(std::string const& text)
 {
     drain();
+    writeLine(text);
+}
+
+void FastChannel::writeLine(std::string const& text)
+{
     ++m_working.exchanges;
     m_wire->write(text + "\r");
+    m_silence.wrote(m_wire->now());
     tellSent(text + "\r");
+}
+
+std::string FastChannel::listen(WireTime until)
+{
+    std::string bytes = m_wire->read(until);
+    if (!bytes.empty()) {
+        m_silence.heard();
+    }
+    return bytes;
 }
 
 void FastChannel::writePending(std::string const& text)
@@ -85,7 +100,7 @@ void FastChannel::writePending(std::string const& text)
 // What was said since the last prompt is no answer to what comes now.
 void FastChannel::drain()
 {
-    m_buffer += m_wire->read(m_wire->now());
+    m_buffer += listen(m_wire->now());
     while (std::optional<std::string> const stale = cutReply()) {
         note(isBlank(*stale) ? Habit::EmptyReply : Habit::StaleReply);
     }
@@ -169,7 +184,7 @@ std::optional<std::string> FastChannel::awaitReply(WireTime until)
             note(Habit::EmptyReply);
             continue;
         }
-        std::string const bytes = m_wire->read(until);
+        std::string const bytes = listen(until);
         if (bytes.empty() && m_wire->now() >= until) {
             return std::nullopt;
         }

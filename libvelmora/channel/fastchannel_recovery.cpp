@@ -41,12 +41,16 @@ WireTime waitOf(std::string const& setting)
 
 } // namespace
 
-// When silence means that no prompt will come. A search for the bus, or a slow start of it, has no such time.
+// When silence means that no prompt will come. A search for the bus, or a slow start of it, has no such time; but one
+// that did not say who it is before is asked that again before it is taken for gone.
 WireTime FastChannel::remedyTime() const
 {
     Pending const& pending = *m_pending;
-    if (pending.woken || m_silent || pending.command.resets() || pending.command.monitors()) {
+    if (pending.woken || pending.command.resets() || pending.command.monitors()) {
         return never;
+    }
+    if (m_silent) {
+        return std::max(m_silence.end(), pending.sentAt + commandSilence + m_options.latency);
     }
     if (!pending.command.isRequest()) {
         return m_options.latency + (pending.heard ? pending.heardAt + commandQuiet : pending.sentAt + commandSilence);
@@ -94,7 +98,7 @@ void FastChannel::settle()
     WireTime const limit = m_wire->now() + (m_silent || m_pending->command.monitors() ? WireTime(0) : latePromptLimit);
     std::optional<std::string> late;
     while (!late && isValid() && m_wire->now() < std::min(limit, remedyTime())) {
-        std::string const bytes = m_wire->read(std::min(limit, remedyTime()));
+        std::string const bytes = listen(std::min(limit, remedyTime()));
         m_buffer += bytes;
         if (!bytes.empty()) {
             m_pending->heard = true;
@@ -126,9 +130,7 @@ bool FastChannel::wake(std::string& before)
     for (int i = 0; i < tries && isValid(); ++i) {
         before += m_buffer;
         m_buffer.clear();
-        ++m_working.exchanges;
-        m_wire->write("ATI\r");
-        tellSent("ATI\r");
+        writeLine("ATI");
         WireTime until = m_wire->now() + wakeLimit + m_options.latency;
         while (std::optional<std::string> const reply = awaitReply(until)) {
             if (isIdentity(*reply)) {
@@ -149,7 +151,7 @@ bool FastChannel::wake(std::string& before)
     return false;
 }
 
-// Notes whether it could be woken.
+// Notes whether it could be woken. One that is gone is not asked on and on.
 bool FastChannel::tryToWake(std::string& before)
 {
     bool const awake = wake(before);
@@ -158,6 +160,10 @@ bool FastChannel::tryToWake(std::string& before)
         m_trouble.clear();
     }
     m_silent = !awake;
+    if (!awake && m_silence.isGone(m_wire->now())) {
+        m_gone = true;
+        m_lost = true;
+    }
     return awake;
 }
 
@@ -202,7 +208,7 @@ bool FastChannel::setUpAgain(HealedReply const& reply)
         // LV RESET and ERR94 come before the adapter has started anew, and the supply may still be low. A banner in
         // this time is dropped below.
         m_buffer.clear();
-        m_wire->read(now + restartPause);
+        listen(now + restartPause);
     }
     if (m_state.protocol() == 0 && !reply.error.empty()) {
         // Behind LV RESET and ERR94 a search leaves CAN out until the adapter is told to forget them.

@@ -37,6 +37,8 @@ public:
     bool portLost() const { return m_wire->lost(); }
     // Whether the link is lost because the adapter reset itself again and again.
     bool adapterResets() const { return m_channel->adapterResets(); }
+    // Whether it is lost because the adapter says nothing at all any more.
+    bool adapterGone() const { return m_channel->adapterGone(); }
 
 private:
     std::shared_ptr<PortWire> m_wire;

@@ -27,6 +27,17 @@ Error silentAdapter(std::string const& port, std::optional<PortAddress> const& a
     return {ErrorKind::AdapterSilent, "Nothing on " + port + " answers like an ELM327 adapter", hints};
 }
 
+Error goneAdapter(std::string const& port, std::optional<PortAddress> const& address, OpeningWatch const& seen)
+{
+    if (seen.identification().empty()) {
+        return silentAdapter(port, address, seen);
+    }
+    return {ErrorKind::AdapterSilent,
+            seen.identification() + " answered on " + port +
+                ", then fell silent: it has said nothing for seconds, not even to ATI",
+            {"is it still in its socket, and in reach?", "pull the adapter and plug it in again"}};
+}
+
 Error headersMissing(std::string const& adapter, std::string const& port)
 {
     return {ErrorKind::VehicleSilent,

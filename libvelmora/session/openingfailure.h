@@ -15,6 +15,9 @@ namespace velmora::openingfailure {
 // application's own.
 Error silentAdapter(std::string const& port, std::optional<PortAddress> const& address, OpeningWatch const& seen);
 
+// The adapter had answered, and says nothing at all any more.
+Error goneAdapter(std::string const& port, std::optional<PortAddress> const& address, OpeningWatch const& seen);
+
 // Replies came, but without the headers that tell whose they are.
 Error headersMissing(std::string const& adapter, std::string const& port);
 

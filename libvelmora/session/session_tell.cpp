@@ -90,6 +90,9 @@ void Session::failOpening()
     if (m_link->adapterResets()) {
         throw openingfailure::resettingAdapter(port);
     }
+    if (m_link->adapterGone()) {
+        throw openingfailure::goneAdapter(port, m_address, m_opening);
+    }
     if (m_link->lost()) {
         throw Error(ErrorKind::LinkLost, "The link to the adapter on " + port + " broke while connecting",
                     {"is the adapter still plugged in and in reach?"});

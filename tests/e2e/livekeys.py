@@ -193,6 +193,20 @@ def changes_how_a_car_is_shown():
     until_seen("Ctrl-C ends it", "ended with (0|130)")
 
 
+def tells_the_rates_it_reaches():
+    begin(f"{program} -p 'sim:petrol-can11?instant' live RPM@5hz SPEED@2hz 05 --rate 1")
+    asked = {"RPM": 5, "SPEED": 2, "COOLANT_TEMP": 1}
+    end = time.monotonic() + 20
+    reached = {}
+    while not all(0.8 * hertz <= reached.get(sensor, 0) <= 1.2 * hertz for sensor, hertz in asked.items()):
+        check(time.monotonic() < end, f"all three at their rates in the title: {reached}")
+        time.sleep(0.1)
+        reached = {sensor: float(rate) for sensor, rate, hertz in
+                   re.findall(r"(\w+) ([\d.]+) of (\d+) Hz", screen()) if asked.get(sensor) == int(hertz)}
+    press("q")
+    until_seen("the end", "ended with 0")
+
+
 program = os.path.realpath(sys.argv[1])
 views = 0
 start = time.monotonic()
@@ -207,6 +221,7 @@ with tempfile.TemporaryDirectory() as place:
         chooses()
         plays_what_is_named()
         changes_how_a_car_is_shown()
+        tells_the_rates_it_reaches()
     finally:
         tmux("kill-server")
 print(f"all keys do what they should; {time.monotonic() - start:.1f} s")

@@ -73,6 +73,8 @@ TEST_F(OpeningWatchTest, AdviceFitsTheKindOfPort)
     EXPECT_NE(hints("/dev/ttyUSB0").find("--baud"), std::string::npos);
     EXPECT_EQ(hints("10.0.0.1:35000").find("--baud"), std::string::npos);
     EXPECT_EQ(hints("sim:").find("--baud"), std::string::npos);
+    EXPECT_STREQ(velmora::openingfailure::goneAdapter("sim:", std::nullopt, m_watch).what(),
+                 "Nothing on sim: answers like an ELM327 adapter");
     send("ATI");
     receive("ELM327 v1.5\r\r");
     send("ATE0");
@@ -80,6 +82,10 @@ TEST_F(OpeningWatchTest, AdviceFitsTheKindOfPort)
     velmora::Error const error = velmora::openingfailure::silentAdapter(toString(address), address, m_watch);
     EXPECT_EQ(std::string(error.what()), "ELM327 v1.5 answered on /dev/ttyUSB0 (38400 baud), but not to ATE0 in time");
     EXPECT_EQ(error.kind(), velmora::ErrorKind::AdapterSilent);
+    velmora::Error const gone = velmora::openingfailure::goneAdapter("sim:", std::nullopt, m_watch);
+    EXPECT_STREQ(gone.what(),
+                 "ELM327 v1.5 answered on sim:, then fell silent: it has said nothing for seconds, not even to ATI");
+    EXPECT_EQ(gone.kind(), velmora::ErrorKind::AdapterSilent);
 }
 
 TEST(OpeningFailure, ASilentVehicleIsToldWithTheAdaptersWord)
