@@ -71,6 +71,7 @@ struct History::Parts
     Parts(std::filesystem::path path, Access access);
 
     void prepare();
+    bool isEmpty() { return database->number("SELECT count(*) FROM sqlite_schema") == 0; }
 
     std::filesystem::path const file;
     std::unique_ptr<Database> database; // null where there is no file to look into
@@ -94,12 +95,13 @@ History::Parts::Parts(std::filesystem::path path, Access access) : file(std::mov
 
 void History::Parts::prepare()
 {
-    bool const empty = database->number("SELECT count(*) FROM sqlite_schema") == 0;
-    if (empty) {
+    if (isEmpty()) {
         Transaction transaction(*database);
-        database->execute(historySchema);
-        database->execute("PRAGMA application_id=" + std::to_string(historyApplicationId));
-        database->execute("PRAGMA user_version=" + std::to_string(historyVersion));
+        if (isEmpty()) { // still: another process may have kept its first scan meanwhile
+            database->execute(historySchema);
+            database->execute("PRAGMA application_id=" + std::to_string(historyApplicationId));
+            database->execute("PRAGMA user_version=" + std::to_string(historyVersion));
+        }
         transaction.commit();
     }
     if (database->number("PRAGMA application_id") != historyApplicationId) {

@@ -8,8 +8,10 @@
 
 #include <gtest/gtest.h>
 
+#include <latch>
 #include <sstream>
 #include <sys/stat.h>
+#include <thread>
 
 namespace {
 
@@ -54,6 +56,27 @@ TEST_F(HistoryTest, KeepsScansByVehicleAndSkipsDoubles)
     EXPECT_EQ(history.scan(2).time, firstTime + 5s);
     EXPECT_EQ(reportOf(history.scan(2)).toJson(), reportOf(scanOf(american, 5s)).toJson());
     EXPECT_THROW(history.scan(4), Error);
+}
+
+TEST_F(HistoryTest, SomeThatBeginItAtOnceShareIt)
+{
+    constexpr int programs = 4;
+    for (char const* name : {"first.db", "second.db"}) {
+        std::latch begin(programs);
+        std::vector<std::jthread> threads;
+        for (int number = 0; number < programs; ++number) {
+            threads.emplace_back([&, number] {
+                begin.arrive_and_wait();
+                try {
+                    open(name).add(scanOf(american, std::chrono::seconds(number)));
+                } catch (Error const& error) {
+                    ADD_FAILURE() << error.what();
+                }
+            });
+        }
+        threads.clear();
+        EXPECT_EQ(open(name).scans().size(), static_cast<std::size_t>(programs));
+    }
 }
 
 TEST_F(HistoryTest, IsForItsOwnerOnly)
