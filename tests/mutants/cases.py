@@ -20,10 +20,12 @@ TEST_PROGRAMS = {
 }
 WAITING = {"e2e/e2e_test"}  # in real time: their cases run side by side, and only if the others notice nothing
 VELMORA = [(f"python3 tests/e2e/{name}.py", ["program/velmora"]) for name in ("commandline", "commandtexts")]
+BLUETOOTH = ("/usr/bin/python3 tests/e2e/bluetooth/bluetooth_test.py",
+             ["program/velmora", "simulator/program/obdsim", "tests/e2e/bluetooth/home"])
 SCRIPTS = {  # tests that are no test program, and what of the build they are given
-    "libvelmora": VELMORA + [("/usr/bin/python3 tests/e2e/bluetooth/bluetooth_test.py",
-                              ["program/velmora", "simulator/program/obdsim", "tests/e2e/bluetooth/home"])],
-    "program": VELMORA + [("python3 tests/e2e/livekeys.py", ["program/velmora"]), ("bash tests/e2e/screen.sh", ["program/velmora"])],
+    "libvelmora": VELMORA + [BLUETOOTH],
+    "program": VELMORA + [("python3 tests/e2e/livekeys.py", ["program/velmora"]), ("bash tests/e2e/screen.sh", ["program/velmora"]),
+                          BLUETOOTH],
     "simulator": [(f"python3 tests/simulator/{name}.py", ["simulator/program/obdsim"])
                   for name in ("commandline", "outsideclient")],
 }
@@ -40,8 +42,8 @@ class Case(NamedTuple):
 
 def targets(room):
     named = [pathlib.Path(each).name for each in TEST_PROGRAMS[room]]
-    return named + {"libvelmora": ["velmora", "obdsimProgram"], "program": ["velmora"], "simulator": ["obdsimProgram"]}.get(
-        room, [])
+    both = ["velmora", "obdsimProgram"]
+    return named + {"libvelmora": both, "program": both, "simulator": both[1:]}.get(room, [])
 
 
 def hold_back():

@@ -68,12 +68,13 @@ class Code:
             index -= 1
         return 0
 
-    def right(self, place):
-        """Where it ends."""
+    def right(self, place, assigned=False):
+        """Where it ends; what is assigned ends with its statement."""
         index = next((i for i, token in enumerate(self.tokens) if token[0] >= place), len(self.tokens))
         while index < len(self.tokens):
             begin, _, kind = self.tokens[index]
-            if kind in ("stop", "close") or (kind == "greater" and index in self.partner):
+            within = assigned and self.code[begin] not in ";,"
+            if kind == "close" or (kind == "stop" and not within) or (kind == "greater" and index in self.partner):
                 return begin
             index = self.partner.get(index, index) + 1
         return len(self.code)
@@ -83,7 +84,7 @@ class Code:
         begin = self.starts[change.number] + change.begin
         end = self.starts[change.number] + change.end
         if not re.fullmatch(r"\d+|true|false|;", change.text):
-            begin, end = self.left(begin), self.right(end)
+            begin, end = self.left(begin), self.right(end, change.text in (" += ", " -= "))
         while self.code[begin] in " \n" + COMMENT:
             begin += 1
         while self.code[end - 1] in " \n" + COMMENT:
