@@ -60,6 +60,8 @@ def record():
         values = ",".join(str(second + 10 * i) for i in range(SENSORS))
         lines.append(f"2024-03-07T09:05:{second:02}.000Z,{values},{'first' if second < 30 else 'second'}")
     (folder / "drive.csv").write_text("\n".join(lines) + "\n")
+    subprocess.run([program, "settings", "limit.S30", "340"], check=True, stdout=subprocess.DEVNULL, timeout=20,
+                   env=os.environ | {"VELMORA_SETTINGS": str(folder / "settings.toml")})
 
 
 def row(sensor, value):
@@ -101,7 +103,7 @@ def moves_in_the_table():
         shown = min(first, 16)
         until_seen(f"{key} shows S{shown:02} first", rf"Unit.*\nS{shown:02} ")
     press("PageDown", "PageUp", "PageDown")
-    until_seen("the last line", "^Gear +second$", r"Unit.*\nS16 ")
+    until_seen("the last line", "^Gear +second$", r"Unit.*\nS16 ", r"^S30 +!349 V ")
     press("PageUp")
     until_seen("the first line", row("S01", 59))
 
@@ -171,12 +173,13 @@ def changes_how_a_car_is_shown():
         press(key)
         until_seen(f"{key} while a file is written", why)
     press("q")
-    until_seen("the end", "ended with 0")
+    text = until_seen("the end", "ended with 0")
+    check(re.search("^Engine RPM .*[▁▂▃▄▅▆▇█]", text, re.M), "the whole table with its trend below the prompt")
 
     begin(f"XDG_DATA_HOME={folder}/data {program} -p 'sim:petrol-can11?instant' live RPM SPEED")
     until_seen("metric", r"^Vehicle Speed Sensor +\d+ km/h ", r"^sim:petrol-can11\?instant, module 7E8 ECM, \d+ s, [\d.]+ readings/s")
-    press("u")
-    until_seen("imperial", r"^Vehicle Speed Sensor +\d+ mph ")
+    press("Down", "u")
+    until_seen("imperial, and all rows still there", r"Unit.*\nEngine RPM .*\nVehicle Speed Sensor +\d+ mph ")
     press("r")
     until_seen("anew", "The statistics begin anew")
     press("w")
@@ -189,6 +192,12 @@ def changes_how_a_car_is_shown():
     until_seen("no choice there", "Speed and engine speed alone are read here; p goes back to the values")
     press("p", "u")
     until_seen("metric again", r"^Vehicle Speed Sensor +\d+ km/h ")
+    until_seen("big digits", "[▀▄█]{3}")
+    press("b", "q")
+    until_seen("the end", "ended with 0")
+    begin(f"{program} -p 'sim:petrol-can11?instant' live")
+    until_seen("the sensors and the plain table of the last time", r"Unit.*\nEngine RPM .*\nVehicle Speed Sensor .*\n\n")
+    check(not re.search("[▀▄█]{3}", screen()), "no big digits")
     press("C-c")
     until_seen("Ctrl-C ends it", "ended with (0|130)")
 

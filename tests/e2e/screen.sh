@@ -112,6 +112,8 @@ kind=nobody-knows
 begin 80 24 C.UTF-8 "$live --duration 1"
 until_seen 'ended with 0' "an unknown terminal gets lines"
 stays '^Engine RPM: [0-9]+ rpm' "lines"
+tmux -L "$name" capture-pane -pS - | grep -q '^Nothing is known of this kind of terminal, so values come in lines' ||
+    fail "why there are lines"
 kind=screen-256color
 
 begin 80 24 C "$live"

@@ -68,7 +68,7 @@ Offered const offers[] = {
     {"record", "--vehicle --keep-vin", "FILE"},
     {"watch", watchOptions, "SENSOR"},
     {"trips", "--csv", "DB"},
-    {"settings", "", "NAME VALUE"},
+    {"settings", "", "SETTING VALUE"},
     {"signals", "", "", "import check list probe"},
     {"signals import", "", "FILE"},
     {"signals check", "", "FILE"},

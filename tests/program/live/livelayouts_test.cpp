@@ -42,6 +42,14 @@ TEST_F(LiveFiles, ALayoutThatNobodyCanReadIsNone)
     }
     std::ofstream(folder / "layouts.toml") << "[live]\nvehicle-1 = '{\"sensors\":[\"RPM\"]}'\n";
     EXPECT_TRUE(layouts.load("vehicle-1")) << "the same file with a text that is one";
+    EXPECT_TRUE(layouts.load("vehicle-1")->big) << "unless it says otherwise";
+    for (auto const& [sensors, letters, good] :
+         {std::tuple{300, 64, true}, std::tuple{301, 64, false}, std::tuple{300, 65, false}}) {
+        layouts.save("vehicle-2", {std::vector<std::string>(static_cast<std::size_t>(sensors),
+                                                            std::string(static_cast<std::size_t>(letters), 'A')),
+                                   true});
+        EXPECT_EQ(layouts.load("vehicle-2").has_value(), good) << sensors << " of " << letters;
+    }
 }
 
 TEST_F(LiveFiles, StandAmongTheUsersDataAndReplaceNothing)
@@ -52,6 +60,8 @@ TEST_F(LiveFiles, StandAmongTheUsersDataAndReplaceNothing)
     EXPECT_EQ(newUserFile("live", ".db", time), folder / "velmora" / "live" / "live-20240307-090502.db");
     std::ofstream(newUserFile("live", ".db", time)) << "x";
     EXPECT_EQ(newUserFile("live", ".db", time), folder / "velmora" / "live" / "live-20240307-090502-2.db");
+    std::ofstream(newUserFile("live", ".db", time)) << "x";
+    EXPECT_EQ(newUserFile("live", ".db", time), folder / "velmora" / "live" / "live-20240307-090502-3.db");
     EXPECT_EQ(std::filesystem::file_size(first), 4U);
     ::setenv("XDG_DATA_HOME", (first / "no folder").c_str(), 1);
     EXPECT_THROW(saveUserText("snapshot", ".txt", "x"), Error);

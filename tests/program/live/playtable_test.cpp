@@ -53,6 +53,16 @@ TEST_F(PlayTableTest, ShowsValuesWithTheirDigitsAndStatistics)
     EXPECT_FALSE(table.rows()[2].numeric);
 }
 
+TEST_F(PlayTableTest, StatisticsBeginWithTheFirstValue)
+{
+    for (double const number : {-5.0, -9.0, -7.0}) {
+        table.take(0, {recording.begin, number});
+    }
+    EXPECT_EQ(table.rows()[0].minimum, "-9");
+    EXPECT_EQ(table.rows()[0].mean, "-7");
+    EXPECT_EQ(table.rows()[0].maximum, "-5");
+}
+
 TEST_F(PlayTableTest, AValueGrowsOldByTheRecordingsTime)
 {
     play(3);

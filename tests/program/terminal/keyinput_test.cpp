@@ -20,7 +20,10 @@ TEST(KeyInput, TakesKeysSinglyAndLeavesTheTerminalAsItWas)
 {
     PseudoTerminal const terminal;
     Replaced const input(STDIN_FILENO, terminal.terminal());
-    termios const before = stateOf(terminal.terminal());
+    termios before = stateOf(terminal.terminal());
+    before.c_cc[VMIN] = 3;
+    before.c_cc[VTIME] = 7;
+    EXPECT_EQ(::tcsetattr(terminal.terminal(), TCSANOW, &before), 0);
     {
         KeyInput const keys;
         termios const raw = stateOf(terminal.terminal());

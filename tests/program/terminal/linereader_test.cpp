@@ -86,4 +86,16 @@ TEST_F(PipedInput, IsNotAwaitedWhenTheProgramIsToEnd)
     EXPECT_THROW(reader.read(line), velmora::Error) << "though there is a line";
 }
 
+TEST_F(PipedInput, IsAwaitedWithAnEyeOnTheEnd)
+{
+    int checks = 0;
+    LineReader reader([&checks] {
+        if (++checks == 2) {
+            throw velmora::Error(velmora::ErrorKind::Interrupted, "Interrupted");
+        }
+    });
+    std::string line;
+    EXPECT_THROW(reader.read(line), velmora::Error) << "nobody writes, and nobody ends the input";
+}
+
 } // namespace

@@ -1,4 +1,5 @@
 // The page of a terminal, by what a terminal is sent and what its keys send.
+#include "program/terminal/fatalrestore.h"
 #include "program/terminal/interrupt.h"
 #include "program/terminal/screen.h"
 #include "program/terminal/terminal.h"
@@ -122,6 +123,32 @@ TEST(TerminalScreen, TellsHowToLeaveThePage)
     EXPECT_THAT(see("vt100", false, "", "").leave, testing::MatchesRegex("\033\\[m\017[^$]*"))
         << "without the pauses that its description asks for";
     EXPECT_FALSE(see("nobody-knows", false, "", "").open);
+}
+
+// What a second Ctrl-C and a fault do before they end the program.
+TEST(FatalRestore, WritesItsTextAndBringsTheTerminalBack)
+{
+    for (bool const known : {true, false}) {
+        PseudoTerminal const terminal;
+        termios before{};
+        ::tcgetattr(terminal.terminal(), &before);
+        tcflag_t const flags = before.c_lflag;
+        tcflag_t after = 0;
+        std::string shown;
+        std::fflush(stdout);
+        {
+            Replaced const output(STDOUT_FILENO, terminal.terminal());
+            FatalRestore const restore("bye", known ? &before : nullptr);
+            termios raw = before;
+            raw.c_lflag &= ~static_cast<tcflag_t>(ICANON | ECHO);
+            ::tcsetattr(terminal.terminal(), TCSANOW, &raw);
+            restore.restore();
+            shown = terminal.shown();
+            after = localFlags(terminal);
+        }
+        EXPECT_EQ(shown, "bye");
+        EXPECT_EQ(after == flags, known) << "a state that could not be told is not made up";
+    }
 }
 
 } // namespace

@@ -210,4 +210,24 @@ p back to the values  e export the …
 )");
 }
 
+TEST(WholeFrames, ACurveWithoutRoomForItsBarHasNone)
+{
+    PerformanceRun run;
+    run.powers = {{1125, 12.4, 105.3}};
+    std::string const line = "   1125 rpm    12 kW   105 Nm ";
+    EXPECT_NE(drawPerformance({run, false, ""}, asciiOf(line.size(), 40)).find(line + "\n"), std::string::npos);
+    EXPECT_NE(drawPerformance({run, false, ""}, asciiOf(line.size() + 1, 40)).find(line + "=\n"), std::string::npos);
+}
+
+TEST(WholeFrames, DigitsGiveWayWhereTheUnitWouldNotFit)
+{
+    auto const firstLines = [](std::string const& unit) {
+        std::string const text = trimmed(drawBig({numberRow("A", "12345", unit)}, asciiOf(26, 24)));
+        return support::linesOf(text)[3];
+    };
+    EXPECT_EQ(firstLines("rpm"), " #  ###  ## ### ###") << "nineteen columns, a blank and three letters fill 24";
+    EXPECT_EQ(firstLines("rpm/"), " #  ###  ## ### ###");
+    EXPECT_EQ(firstLines("rpm/s"), "12345");
+}
+
 } // namespace
