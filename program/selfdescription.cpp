@@ -47,16 +47,17 @@ Completion names(std::vector<std::string> const& words)
     return completion;
 }
 
-Completion sensors(std::string const& /*begun*/)
+// Also behind a control module: "7E9:RPM".
+Completion sensors(std::string const& begun)
 {
+    std::string const module = begun.substr(0, begun.rfind(':') + 1);
     Completion completion;
-    for (SensorName const& each : sensorNames()) {
-        completion.candidates.push_back({each.name, fmt::format("PID {:02X}", each.pid)});
+    for (auto const& list : {sensorNames(), sensorAliases()}) {
+        for (SensorName const& each : list) {
+            completion.candidates.push_back({module + each.name, fmt::format("PID {:02X}", each.pid)});
+        }
     }
-    for (SensorName const& each : sensorAliases()) {
-        completion.candidates.push_back({each.name, fmt::format("PID {:02X}", each.pid)});
-    }
-    completion.candidates.push_back({"all", "All that a control module offers"});
+    completion.candidates.push_back({module + "all", "All that a control module offers"});
     return completion;
 }
 

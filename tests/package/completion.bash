@@ -23,6 +23,7 @@ offers ' imperial imperial-uk ' 'velmora --units=imp' velmora --units = imp
 offers '* petrol-can11 *' 'velmora -p sim:pe' velmora -p sim : pe
 offers ' auto ' 'velmora -p au' velmora -p au
 offers '* RPM *' 'velmora live R' velmora live R
+offers '* RPM *' 'velmora live 7E9:R' velmora live 7E9 : R
 offers '* --fast *' 'velmora live --f' velmora live --f
 offers ' P0420 ' 'velmora dtc P0420' velmora dtc P0420
 offers '* Ford *' 'velmora dtc --make F' velmora dtc --make F
