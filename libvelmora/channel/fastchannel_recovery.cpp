@@ -59,6 +59,9 @@ WireTime FastChannel::remedyTime() const
     std::size_t const digits = text.find_last_of('.');
     bool const starting = text.starts_with("BUSINIT") || text.ends_with(".") || text == "OK" ||
                           text.ends_with("...OK") || (digits == std::string::npos && text.starts_with("SEARCH"));
+    if (!pending.heard && m_busSpoke && isCanBus(m_state.shownBus())) {
+        return m_silence.end(); // there is nothing to search or to start any more
+    }
     if (!pending.heard || text.empty() || starting || text == pending.sent) {
         return never;
     }

@@ -153,18 +153,17 @@ bool StreamPort::waitFor(Moment until)
     }
 }
 
-StreamPort::Came StreamPort::take(std::string& bytes) const
+StreamPort::Came StreamPort::take(std::string& bytes)
 {
-    std::array<char, 4096> piece{};
     Came came = Came::Nothing;
     while (bytes.size() < mostAtOnce) {
-        ssize_t const count = ::read(m_descriptor, piece.data(), piece.size());
+        ssize_t const count = ::read(m_descriptor, m_piece.data(), m_piece.size());
         if (count <= 0) {
             return count == 0 || !wouldWait() ? Came::End : came;
         }
-        bytes.append(piece.data(), static_cast<std::size_t>(count));
+        bytes.append(m_piece.data(), static_cast<std::size_t>(count));
         came = Came::Bytes;
-        if (static_cast<std::size_t>(count) < piece.size()) {
+        if (static_cast<std::size_t>(count) < m_piece.size()) {
             break; // there was no more
         }
     }

@@ -3,6 +3,7 @@
 #include "libvelmora/port/doorbell.h"
 #include "libvelmora/port/ipulledport.h"
 
+#include <array>
 #include <atomic>
 #include <mutex>
 #include <string>
@@ -49,7 +50,7 @@ private:
 
     void run(Receiver const& onBytes, LossHandler const& onLost);
     bool waitFor(Moment until);
-    Came take(std::string& bytes) const;
+    Came take(std::string& bytes);
     std::size_t put(std::string_view bytes);
     void putRest();
     bool isOver();
@@ -58,6 +59,7 @@ private:
     int const m_descriptor;
     Kind const m_kind;
     Doorbell m_bell;
+    std::array<char, 4096> m_piece{}; // of who reads
     std::atomic<bool> m_interrupted{false};
     std::atomic<bool> m_ends{false};
 

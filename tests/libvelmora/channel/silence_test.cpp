@@ -59,8 +59,14 @@ TEST(Silence, TheHostsLimitOfASearchIsWaitedForButNotTwice)
     rig.wire->setSilent(true);
     rig.ask("ATRV", 500);
     EXPECT_THAT(millisUntilGone(rig, {"0100", 10000}), Optional(Le(10000)));
+    ChannelRig found; // its bus has spoken
+    found.connect();
+    found.wire->setSilent(true);
+    EXPECT_THAT(millisUntilGone(found, {"0100", 10000}), Optional(Le(10000)));
     ChannelRig searching;
-    searching.bringUp();
+    for (char const* command : {"ATI", "ATE0", "ATST64", "ATTP0"}) {
+        searching.ask(command);
+    }
     searching.wire->setSilent(true);
     EXPECT_THAT(millisUntilGone(searching, {"0100", 10000}), Optional(AllOf(Ge(15000), Le(17000))));
 }
