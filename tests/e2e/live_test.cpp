@@ -6,6 +6,7 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <cmath>
 #include <cstdio>
 #include <fstream>
 
@@ -82,35 +83,43 @@ TEST(Live, RatesAreToldAndWhatTheBusCanNotGiveIsShared)
     EXPECT_NE(all.out.find("7E9 Engine Coolant"), std::string::npos) << all.out;
 }
 
-// A busy machine may be late with some of them; a sensor's own rate goes before that of all others.
-TEST(Live, SensorsAreReadAsOftenAsTheyAreToBe)
+int linesOf(std::string const& text, std::string const& name)
 {
-    Outcome const outcome = runVelmora(
-        {"-v", "-p", "sim:petrol-can11?instant", "live", "RPM@5hz", "SPEED", "05", "--rate", "2", "--duration", "6"});
-    EXPECT_EQ(outcome.exitCode, 0) << outcome.err;
-    std::size_t const told = outcome.err.find("Reached: RPM ");
-    ASSERT_NE(told, std::string::npos) << outcome.err;
+    int lines = 0;
+    for (std::size_t at = text.find(name); at != std::string::npos; at = text.find(name, at + 1)) {
+        ++lines;
+    }
+    return lines;
+}
+
+// By what it tells, and by what it has written in six seconds.
+bool readsAtItsRates(Outcome const& outcome)
+{
     double rpm = 0.0;
     double speed = 0.0;
     double coolant = 0.0;
-    EXPECT_EQ(std::sscanf(outcome.err.c_str() + told,
-                          "Reached: RPM %lf of 5 Hz, SPEED %lf of 2 Hz, COOLANT_TEMP %lf of 2 Hz", &rpm, &speed,
-                          &coolant),
-              3)
-        << outcome.err;
-    EXPECT_NEAR(rpm, 5.0, 1.0);
-    EXPECT_NEAR(speed, 2.0, 0.4);
-    EXPECT_NEAR(coolant, 2.0, 0.4);
-    auto const written = [&outcome](std::string const& name) {
-        int lines = 0;
-        for (std::size_t at = outcome.out.find(name); at != std::string::npos; at = outcome.out.find(name, at + 1)) {
-            ++lines;
-        }
-        return lines;
-    };
-    EXPECT_NEAR(written("Engine RPM: "), 30, 8) << outcome.out;
-    EXPECT_NEAR(written("Vehicle Speed Sensor: "), 12, 4) << outcome.out;
-    EXPECT_EQ(outcome.err.find("More is asked for"), std::string::npos) << outcome.err;
+    std::size_t const told = outcome.err.find("Reached: RPM ");
+    bool const all =
+        told != std::string::npos &&
+        std::sscanf(outcome.err.c_str() + told, "Reached: RPM %lf of 5 Hz, SPEED %lf of 2 Hz, COOLANT_TEMP %lf of 2 Hz",
+                    &rpm, &speed, &coolant) == 3;
+    auto const isNear = [](double value, double wanted) { return std::abs(value - wanted) < 0.2 * wanted; };
+    return all && isNear(rpm, 5.0) && isNear(speed, 2.0) && isNear(coolant, 2.0) &&
+           isNear(linesOf(outcome.out, "Engine RPM: "), 31.0) &&
+           isNear(linesOf(outcome.out, "Vehicle Speed Sensor: "), 13.0) &&
+           outcome.err.find("More is asked for") == std::string::npos;
+}
+
+// A busy machine may be late, so there is more than one try.
+TEST(Live, SensorsAreReadAsOftenAsTheyAreToBe)
+{
+    Outcome outcome{};
+    for (int tries = 0; tries < 4 && !readsAtItsRates(outcome); ++tries) {
+        outcome = runVelmora({"-v", "-p", "sim:petrol-can11?instant", "live", "RPM@5hz", "SPEED", "05", "--rate", "2",
+                              "--duration", "6"});
+        ASSERT_EQ(outcome.exitCode, 0) << outcome.err;
+    }
+    EXPECT_TRUE(readsAtItsRates(outcome)) << outcome.err << outcome.out;
 }
 
 // What `velmora ... | head -1` needs: a reader that has gone ends it without a complaint.
