@@ -104,6 +104,9 @@ class Code:
         new = self.piece(begin, at + change.begin) + change.text + self.piece(at + change.end, end)
         if change.text == ";":
             text = f"{{ if (!::mutants::isOn({number})) {{ {old} }} }}"
+        elif not change.text:
+            # Without its "!" an optional would make an optional of the other side, too.
+            text = f"(::mutants::isOn({number}) ? static_cast<bool>({new}) : ({old}))"
         else:
             text = f"(::mutants::isOn({number}) ? ({new}) : ({old}))"
         return begin, end, text + "\n" * self.code.count("\n", begin, end)
