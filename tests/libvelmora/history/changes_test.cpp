@@ -3,6 +3,7 @@
 #include <velmora/history.h>
 
 #include <gtest/gtest.h>
+#include <nlohmann/json.hpp>
 
 #include <algorithm>
 
@@ -134,6 +135,58 @@ TEST(Changes, OfCountersSoftwareNumbersAndModules)
     ASSERT_EQ(more.size(), 1U);
     EXPECT_EQ(more[0].kind, "module-new");
     EXPECT_EQ(changesBetween(vehicleOf({older, gearbox}), vehicleOf({older})).at(0).kind, "module-gone");
+}
+
+// Everything that may change, as programs get it: one line each.
+TEST(Changes, AreToldWithWhatWasAndWhatIs)
+{
+    using enum LimitTest::Verdict;
+    ModuleReport older = soundModule();
+    ModuleReport newer = soundModule();
+    older.codes.lists[0] = readCodes(CodeKind::Confirmed, {"P0300"});
+    newer.codes.lists[0] = readCodes(CodeKind::Confirmed, {"P0420"});
+    newer.codes.lamp = true;
+    setIncomplete(newer, "Catalyst");
+    setIncomplete(older, "Misfire");
+    older.readiness.monitors[2].sinceCleared = ReadinessStatus::NotAvailable;
+    newer.readiness.monitors[2].sinceCleared = ReadinessStatus::NotComplete;
+    older.monitors = {TopicAnswer::Read,
+                      {{0x21,
+                        "Catalyst",
+                        {{0x80, "A", "1", "0", "2", "V", Passed},
+                         {0x80, "A", "5", "", "", "", Passed},
+                         {0x81, "B", "0", "", "", "V", NoResult},
+                         {0x82, "C", "1", "", "", "V", Passed}}}}};
+    newer.monitors = {TopicAnswer::Read,
+                      {{0x21,
+                        "Catalyst",
+                        {{0x80, "A", "1", "0", "2", "V", Passed},
+                         {0x80, "A", "6", "", "", "", Passed},
+                         {0x81, "B", "3", "", "2", "V", Failed},
+                         {0x82, "C", "1", "", "", "V", Passed}}}}};
+    older.oxygen.sensors = {{obd::OxygenSensorLocation::Bank1Sensor2, {{0x01, "D", "3", "", "", "V", Failed}}}};
+    newer.oxygen.sensors = {{obd::OxygenSensorLocation::Bank1Sensor2, {{0x01, "D", "2", "", "", "V", Passed}}}};
+    older.info.calibrations = {{"A", "1"}, {"B", ""}};
+    newer.info.calibrations = {{"A", "2"}};
+    std::string all;
+    for (nlohmann::json const& each :
+         nlohmann::json::parse(toJson(changesBetween(vehicleOf({older}), vehicleOf({newer}))))) {
+        all += each["kind"].get<std::string>() + " " + each["weight"].get<std::string>() + ": " +
+               each["module"].get<std::string>() + " | " + each["what"].get<std::string>() + " | " +
+               (each["name"].is_null() ? "-" : each["name"].get<std::string>()) + " | " +
+               each["before"].get<std::string>() + " | " + each["after"].get<std::string>() + "\n";
+    }
+    EXPECT_EQ(all,
+              "lamp-on worse: 7E8 ECM | lamp | - | off | on\n"
+              "code-new worse: 7E8 ECM | confirmed code | P0420 Meaning of P0420 | not there | there\n"
+              "code-gone better: 7E8 ECM | confirmed code | P0300 Meaning of P0300 | there | not there\n"
+              "monitor better: 7E8 ECM | monitor | Misfire | not complete | complete\n"
+              "monitor-incomplete worse: 7E8 ECM | monitor | Catalyst | complete | not complete\n"
+              "monitor neutral: 7E8 ECM | monitor | Evaporative System | not available | not complete\n"
+              "test-inside better: 7E8 ECM | within its limits | Bank 1 sensor 2, 01 D | 3 V (- to -) | 2 V (- to -)\n"
+              "test-value neutral: 7E8 ECM | test result | Catalyst, 80 A (2) | 5 (- to -) | 6 (- to -)\n"
+              "test-outside worse: 7E8 ECM | outside its limits | Catalyst, 81 B | - | 3 V (- to 2)\n"
+              "software neutral: 7E8 ECM | software | - | A 1, B | A 2\n");
 }
 
 } // namespace

@@ -54,6 +54,9 @@ TEST_F(HistoryTest, KeepsScansByVehicleAndSkipsDoubles)
     EXPECT_EQ(all[1].number, 2) << "the oldest first";
     EXPECT_EQ(history.scans(american).size(), 2U);
     EXPECT_EQ(history.scan(2).time, firstTime + 5s);
+    EXPECT_EQ(history.scan(2).program, "9.9");
+    EXPECT_EQ(history.scan(2).hash, scanOf(american).hash);
+    EXPECT_EQ(history.scan(2).document, scanOf(american).document);
     EXPECT_EQ(reportOf(history.scan(2)).toJson(), reportOf(scanOf(american, 5s)).toJson());
     EXPECT_THROW(history.scan(4), Error);
 }
@@ -174,6 +177,43 @@ TEST(KeptScanLine, RefusesWhatWasChanged)
         EXPECT_THROW(parseLine(wrong), Error) << wrong.substr(0, 100);
     }
     EXPECT_THROW(parseLine(std::string(1000000, '[')), Error) << "nested without end";
+}
+
+TEST(KeptScanLine, SaysWhatIsWrongWithIt)
+{
+    std::string const line = toLine(scanOf(american));
+    auto const why = [&line](std::string const& from, std::string const& to) {
+        std::string text = line;
+        try {
+            parseLine(from.empty() ? to : text.replace(text.find(from), from.size(), to));
+        } catch (Error const& error) {
+            return std::string(error.what());
+        }
+        return std::string();
+    };
+    std::string const no = "This is no line of an exported history: ";
+    std::string const name = "\"vehicle\":\"1M8GDM9AXKP042788\"";
+    EXPECT_EQ(why("", "{"), no + "it is no JSON");
+    EXPECT_EQ(why("\"version\":1", "\"version\":0"), no + "it is of another kind or version");
+    EXPECT_EQ(why("\"scan\"", "\"other\""), no + "it is of another kind or version");
+    EXPECT_EQ(why("13.8", "13.9"), no + "its report was changed since it was written");
+    EXPECT_EQ(why(name, "\"vehicle\":\"\""), no + "its vehicle has no name, or too long a one");
+    EXPECT_EQ(why(name, "\"vehicle\":\"" + std::string(101, 'x') + "\""),
+              no + "its vehicle has no name, or too long a one");
+    EXPECT_EQ(why(name, "\"vehicle\":\"" + std::string(100, 'x') + "\""), "");
+    std::string const time = "2026-05-01T10:00:00.123Z";
+    for (char const* const good : {"2024-02-29T23:59:59.999Z", "0001-01-01T00:00:00.000Z"}) {
+        EXPECT_EQ(why(time, good), "") << good;
+    }
+    for (char const* const odd : {"2026-05-01T24:00:00.123Z", "2026-05-01T10:60:00.123Z", "2026-05-01T10:00:60.123Z",
+                                  "2026-02-29T10:00:00.123Z", "2026/05-01T10:00:00.123Z", "2026-05/01T10:00:00.123Z",
+                                  "2026-05-01 10:00:00.123Z", "2026-05-01T10.00:00.123Z", "2026-05-01T10:00.00.123Z",
+                                  "2026-05-01T10:00:00,123Z", "2026-05-01T10:00:00.123z", "2026-05-01T10:00:00.123",
+                                  "2026-05-01T-1:00:00.123Z", "2026-05-01T10:00:00.1x3Z", "2026-13-01T10:00:00.123Z"}) {
+        EXPECT_EQ(why(time, odd), no + "\"" + odd + "\" is no time like 1970-01-01T00:00:00.000Z") << odd;
+    }
+    EXPECT_EQ(hashOf("foobar"), "85944171f73967e8") << "FNV-1a";
+    EXPECT_NE(why("", std::string(21, '[') + std::string(21, ']')), "") << "deeper than any report";
 }
 
 TEST(KeptScanLine, GoesByTheFirstRealVinElseByTheName)

@@ -2,6 +2,8 @@
 
 #include <gtest/gtest.h>
 
+#include <set>
+
 namespace {
 
 using velmora::cookieIn;
@@ -69,6 +71,43 @@ TEST(HttpGuard, FindsACookieAmongOthers)
     EXPECT_EQ(cookieIn(request, "c"), "3");
     EXPECT_EQ(cookieIn(request, "velmora_8"), std::nullopt);
     EXPECT_EQ(cookieIn(request, "elmora_80"), std::nullopt);
+}
+
+TEST(HttpGuard, KnowsItsOwnMachineAndTheBoundsOfNames)
+{
+    for (char const* const own : {"localhost", "::1", "127.0.0.1", "127.9.9.9"}) {
+        EXPECT_TRUE(velmora::isLoopback(own)) << own;
+    }
+    for (char const* const other : {"127.evil.test", "10.0.0.1", "::2", "", "Localhost"}) {
+        EXPECT_FALSE(velmora::isLoopback(other)) << other;
+    }
+    EXPECT_EQ(hostNameIn(std::string(253, 'a')), std::string(253, 'a'));
+    EXPECT_EQ(hostNameIn(std::string(254, 'a')), std::nullopt);
+    EXPECT_EQ(hostNameIn("a:12345"), "a");
+    EXPECT_EQ(hostNameIn("a_b-c.d:1"), "a_b-c.d");
+    HttpRequest const request = requestWith("GET", {{"cookie", "ab;a=;  b=x=y ;"}, {"other", "c=1"}});
+    EXPECT_EQ(cookieIn(request, "a"), "");
+    EXPECT_EQ(cookieIn(request, "b"), "x=y ");
+    EXPECT_EQ(cookieIn(request, "ab"), std::nullopt);
+    EXPECT_EQ(cookieIn(request, "c"), std::nullopt) << "in another header";
+    for (char const* const given : {"secreT", "Secret", "secre", "secrets", ""}) {
+        EXPECT_FALSE(velmora::sameSecret(given, "secret")) << given;
+    }
+}
+
+// Each of the 22 digits takes every one of its 64 forms now and then.
+TEST(HttpGuard, TokensUseAllTheirDigits)
+{
+    std::vector<std::set<char>> seen(22);
+    for (int i = 0; i < 1500; ++i) {
+        std::string const token = velmora::makeToken();
+        for (std::size_t place = 0; place < seen.size(); ++place) {
+            seen[place].insert(token.at(place));
+        }
+    }
+    for (std::size_t place = 0; place < seen.size(); ++place) {
+        EXPECT_EQ(seen[place].size(), 64U) << place;
+    }
 }
 
 TEST(HttpGuard, TokensAreLongAndNeverTheSame)

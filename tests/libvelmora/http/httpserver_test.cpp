@@ -6,6 +6,9 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <tuple>
+#include <unistd.h>
+
 namespace {
 
 using testing::HasSubstr;
@@ -154,6 +157,42 @@ TEST(HttpServer, AReaderThatStandsStillIsCutOff)
     }
     std::string const got = reader.readAll(); // ends, since the server has closed
     EXPECT_LT(got.size(), event.size() * 16000);
+}
+
+TEST(HttpServer, ASilentStreamIsKeptAliveAndAStuckReaderIsNot)
+{
+    HttpLimits limits;
+    limits.streamPing = std::chrono::milliseconds(5);
+    limits.streamStall = std::chrono::milliseconds(20);
+    limits.streamBacklog = std::size_t{64} << 20;
+    Rig rig(limits);
+    HttpClient reader(rig.server.port());
+    reader.send("GET /events HTTP/1.1\r\n\r\n");
+    reader.readUntil("first\n\n");
+    EXPECT_EQ(reader.readUntil(": \n\n"), ": \n\n");
+    EXPECT_EQ(reader.readUntil(": \n\n"), ": \n\n") << "and again";
+    EXPECT_EQ(rig.server.readers(), 1U);
+    rig.server.publish("/events", HttpServer::event("", std::string(std::size_t{32} << 20, 'x')));
+    for (int i = 0; i < 2000 && rig.server.readers() > 0; ++i) {
+        ::usleep(1000);
+    }
+    EXPECT_EQ(rig.server.readers(), 0U) << "who takes nothing";
+}
+
+TEST(HttpServer, WritesEventsAsBrowsersReadThem)
+{
+    EXPECT_EQ(HttpServer::event("n", "a\n\nb", "7"), "event: n\ndata: a\ndata: \ndata: b\nid: 7\n\n");
+    EXPECT_EQ(HttpServer::event("", ""), "data: \n\n");
+    EXPECT_EQ(HttpServer::event("", "a\n"), "data: a\ndata: \n\n");
+    for (auto const& [text, host, port] : std::vector<std::tuple<char const*, char const*, int>>{
+             {"[::]:1", "::", 1}, {"a:65535", "a", 65535}, {"a:0", "a", 0}, {"[x]:5", "x", 5}}) {
+        velmora::HttpPlace const place = velmora::parseHttpPlace(text);
+        EXPECT_EQ(place.host, host);
+        EXPECT_EQ(place.port, port);
+    }
+    for (char const* const wrong : {"[]:1", "a:65536", "[a:1", "a]:1", "a/b:1", "a:-1", "a:"}) {
+        EXPECT_THROW(velmora::parseHttpPlace(wrong), velmora::Error) << wrong;
+    }
 }
 
 TEST(HttpServer, APlaceThatCannotBeHadIsTold)

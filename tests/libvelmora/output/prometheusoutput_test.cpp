@@ -132,6 +132,49 @@ TEST(Prometheus, TellsItsOwnHealth)
     EXPECT_THAT(page, HasSubstr("velmora_output_dropped_total{output=\"sqlite:\\\"b\\\"\"} 3\n"));
 }
 
+TEST(Prometheus, HasALineForAllThatAWatchCounts)
+{
+    Health health;
+    health.state = "a\"b";
+    health.requests = 1;
+    health.errors = 2;
+    health.linkLosses = 3;
+    health.wakeRequests = 4;
+    velmora::OutputCounts counts;
+    counts.queued = 5;
+    counts.written = 6;
+    counts.dropped = 7;
+    counts.failures = 8;
+    counts.failing = true;
+    counts.state = {true, 9};
+    health.outputs = {{"o", counts}};
+    MetricsPage some;
+    some.take(inUnit("SPEED", 36.0, "km/h"), pageStart + std::chrono::milliseconds(500));
+    some.take(inUnit("RPM", 800.0, "rpm"), pageStart);
+    std::string lines;
+    std::istringstream in(some.render(pageStart, health));
+    for (std::string line; std::getline(in, line);) {
+        lines += line.starts_with('#') || line.starts_with("velmora_build_info") ? "" : line + "\n";
+    }
+    EXPECT_EQ(lines, "velmora_state_info{state=\"a\\\"b\"} 1\n"
+                     "velmora_link_up 0\n"
+                     "velmora_requests_total 1\n"
+                     "velmora_errors_total 2\n"
+                     "velmora_link_losses_total 3\n"
+                     "velmora_wake_requests_total 4\n"
+                     "velmora_output_queue_records{output=\"o\"} 5\n"
+                     "velmora_output_written_total{output=\"o\"} 6\n"
+                     "velmora_output_dropped_total{output=\"o\"} 7\n"
+                     "velmora_output_failures_total{output=\"o\"} 8\n"
+                     "velmora_output_failing{output=\"o\"} 1\n"
+                     "velmora_output_up{output=\"o\"} 1\n"
+                     "velmora_output_spool_records{output=\"o\"} 9\n"
+                     "velmora_rotation_revolutions_per_minute{vehicle=\"van\",module=\"7E8\",sensor=\"RPM\"} 800\n"
+                     "velmora_speed_meters_per_second{vehicle=\"van\",module=\"7E8\",sensor=\"SPEED\"} 10\n"
+                     "velmora_reading_age_seconds{vehicle=\"van\",module=\"7E8\",sensor=\"RPM\"} 0\n"
+                     "velmora_reading_age_seconds{vehicle=\"van\",module=\"7E8\",sensor=\"SPEED\"} 0\n");
+}
+
 TEST(Prometheus, ServesThePage)
 {
     velmora::PrometheusOutput output(velmora::parseOutputAddress("prometheus:127.0.0.1:0"), busyHealth);

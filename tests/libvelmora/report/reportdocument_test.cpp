@@ -168,6 +168,14 @@ TEST(ReportDocument, ReplacesWhatIsNoText)
             << testing::PrintToString(bytes);
         EXPECT_EQ(escapedHtml("a" + bytes + "b").back(), 'b');
     }
+    for (std::string const whole : {"\x7E", "\xC2\xA0", "\xDF\xBF", "\xE0\xA0\x80", "\xED\x9F\xBF", "\xEE\x80\x80",
+                                    "\xF0\x90\x80\x80", "\xF4\x8F\xBF\xBF", "\n", "\t", " "}) {
+        EXPECT_EQ(escapedHtml("a" + whole + "b"), "a" + whole + "b") << testing::PrintToString(whole);
+    }
+    for (std::string const broken : {"\xE0\x9F\xBF", "\xF0\x8F\xBF\xBF", "\xF4\x90\x80\x80", "\xC1\xBF", "\x80",
+                                     "\xC2\x9F", "\x1F", "\xF5\x80\x80\x80", "\xC2"}) {
+        EXPECT_TRUE(escapedHtml("a" + broken).starts_with("a\xEF\xBF\xBD")) << testing::PrintToString(broken);
+    }
     EXPECT_EQ(escapedHtml("\u00E9 \u20AC \U0001F697"), "\u00E9 \u20AC \U0001F697");
     EXPECT_EQ(escapedHtml("\"<&>'"), "&quot;&lt;&amp;&gt;'");
 }

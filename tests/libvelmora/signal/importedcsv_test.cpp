@@ -89,6 +89,14 @@ TEST(ImportedCsv, TakesRefusesAndNotesEachRowWhole)
         {"Gear,G,2101,Lookup(A-B::-1='Reverse':2='Dri:ve'),0,9,,",
          R"(id = "GEAR"; name = "Gear"; request = "2101"; formula = "A-B"; values = { -1 = "Reverse", 2 = "Dri:ve" }; )"
          "min = 0; max = 9; precision = 0; "},
+        {"A,a,2101,LOOKUP(),0,9,,\nB,b,2101,LOOKUP(A::1=x),0,9,,\nC,c,2101,LOOKUP(A::10=''),0,9,,\nD,d,2101,LOOKUP(A:),"
+         "0,9,,",
+         R"t(id = "C"; name = "C"; request = "2101"; formula = "A"; values = { 10 = "" }; min = 0; max = 9; precision = 0; )t"
+         R"t(refused f:1: A: equation "LOOKUP()": of LOOKUP only tables without a default are understood (at character 8); )t"
+         R"t(refused f:2: B: equation "LOOKUP(A::1=x)": of LOOKUP only a number = 'text' is understood, not "1=x" )t"
+         R"t((at character 8); )t"
+         R"t(refused f:4: D: equation "LOOKUP(A:)": of LOOKUP only tables without a default are understood )t"
+         R"t((at character 8); )t"},
         {"A,a,,val{B}*2,0,1,,\n\nB,b,2101,A,0,1,,\nC,c,,val{D},0,1,,",
          R"(id = "A"; name = "A"; formula = "value(\"B\")*2"; min = 0; max = 1; precision = 2; )"
          R"(id = "B"; name = "B"; request = "2101"; formula = "A"; min = 0; max = 1; precision = 2; )"

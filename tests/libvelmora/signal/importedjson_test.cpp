@@ -81,10 +81,10 @@ TEST(ImportedObdb, TakesRefusesAndNotesEachCommandWhole)
             {R"({"commands": [{"hdr": "FC00", "cmd": {"22": "1E3D"}, "rax": "17fe007b", "pri": "17", "tst": "7B",
                  "fcm1": true, "din": "03", "freq": 0, "tmo": "6464",
                  "signals": [{"id": "b c", "fmt": {"bix": 8, "len": 1, "map": {"1": {"value": "ON"}, "x": {"value": "Y"},
-                              "2": {"value": "V", "description": "D"}, "3": {}, "": {"value": "Z"}}}}]}]})",
+                              "10": {"value": "V", "description": "D"}, "3": {}, "": {"value": "Z"}}}}]}]})",
              R"(id = "B_C"; name = "b c"; header = "17FC007B"; reply = "17FE007B"; )"
              R"(flow = { header = "17FC007B", data = "300000" }; request = "221E3D"; formula = "B>>7&1"; )"
-             R"(values = { 1 = "ON", 2 = "D" }; precision = 0; enabled = false; )"
+             R"(values = { 1 = "ON", 10 = "D" }; precision = 0; enabled = false; )"
              R"(reason = "needs session 03, which is not opened"; )"},
             {obdbCommand(R"("hdr": "10F1", "cmd": {"22": "DDBC"}, "pri": "DA", "din": true)"),
              "refused f:1: a: header \"DA10F1F1\" is none whose reply could be told; "},

@@ -31,11 +31,11 @@ std::string mistakeOf(std::string const& lines)
     return linesOfMistakes("[[signal]]\nid = \"A\"\nname = \"a\"\n" + lines);
 }
 
-std::string const sound = "request = \"2101\"\nformula = \"A\"\n";
+std::string const soundLines = "request = \"2101\"\nformula = \"A\"\n";
 
 std::string keyMistake(std::string const& line)
 {
-    std::string const all = mistakeOf(line + "\n" + sound);
+    std::string const all = mistakeOf(line + "\n" + soundLines);
     std::string const front = "f:4: signal 1, " + line.substr(0, line.find(' ')) + ": ";
     return all.starts_with(front) && all.find('\n') + 1 == all.size()
                ? all.substr(front.size(), all.size() - front.size() - 1)
@@ -124,7 +124,7 @@ TEST(SignalKeys, HoldTogetherWhatTheyMay)
     std::string const whole = "must be a text of whole bytes in hexadecimal, such as \"220101\"";
     std::string const circle = "A, formula: it reads a signal that is not in this file, or itself in a circle\n";
     std::pair<std::string, std::string> const cases[] = {
-        {sound, ""},
+        {soundLines, ""},
         {"request = \"210\"\nformula = \"A\"", "f:4: signal 1, request: " + whole + "\n"},
         {"request = 21\nformula = \"A\"", "f:4: signal 1, request: " + whole + "\n"},
         {"request = \"22010\"\nformula = 1",
@@ -132,18 +132,19 @@ TEST(SignalKeys, HoldTogetherWhatTheyMay)
         {"request = \"2101\"\nformula = \"A+(\"",
          "f:5: signal 1, formula: the formula ends too early (at character 4)\n"},
         {"request = \"2101\"", "f:1: signal 1, formula: each signal wants either a formula or a text\n"},
-        {sound + "text = { first = 0 }", "f:1: signal 1, formula: each signal wants either a formula or a text\n"},
+        {soundLines + "text = { first = 0 }", "f:1: signal 1, formula: each signal wants either a formula or a text\n"},
         {"formula = \"A\"", "f:1: signal 1, request: is missing; only a formula of other signals' values needs none\n"},
         {"text = { first = 0 }",
          "f:1: signal 1, request: is missing; only a formula of other signals' values needs none\n"},
         {"formula = \"value(\\\"A\\\")\"", "f:1: " + circle},
         {"formula = \"value(\\\"B\\\")\"", "f:1: " + circle},
-        {sound + "header = \"726\"", "f:1: signal 1, reply: is missing; only 7E0 to 7E7 and 18DAxxF1 have replies that "
-                                     "follow from the header\n"},
-        {sound + "ext = \"07\"", "f:1: signal 1, ext: needs a header\n"},
-        {sound + "ext = \"07\"\nheader = \"7E0\"", ""},
-        {sound + "min = 2\nmax = 2", "f:1: signal 1, min: must be less than max\n"},
-        {sound + "min = 1.9\nmax = 2", ""},
+        {soundLines + "header = \"726\"",
+         "f:1: signal 1, reply: is missing; only 7E0 to 7E7 and 18DAxxF1 have replies that "
+         "follow from the header\n"},
+        {soundLines + "ext = \"07\"", "f:1: signal 1, ext: needs a header\n"},
+        {soundLines + "ext = \"07\"\nheader = \"7E0\"", ""},
+        {soundLines + "min = 2\nmax = 2", "f:1: signal 1, min: must be less than max\n"},
+        {soundLines + "min = 1.9\nmax = 2", ""},
     };
     for (auto const& [lines, wrong] : cases) {
         EXPECT_EQ(mistakeOf(lines), wrong) << lines;
@@ -152,7 +153,7 @@ TEST(SignalKeys, HoldTogetherWhatTheyMay)
 
 TEST(SignalKeys, StandInAFileOfTables)
 {
-    std::string const signal = "[[signal]]\nid = \"A\"\nname = \"a\"\n" + sound;
+    std::string const signal = "[[signal]]\nid = \"A\"\nname = \"a\"\n" + soundLines;
     std::string const known = "only maker and vin (texts) and models (a list of texts) are known here\n";
     std::pair<std::string, std::string> const cases[] = {
         {"", "f:1: there is no [[signal]] in it\n"},
@@ -263,9 +264,9 @@ TEST(SignalKeys, FindSignalsInASet)
 {
     testsupport::TemporaryFolder const folder;
     std::string const first = "[vehicle]\nvin = \"W*\"\n[[signal]]\nid = \"OIL\"\nname = \"Gearbox oil hot\"\n" +
-                              sound + "length = 4\n[[signal]]\nid = \"X\"\nname = \"Cold oil\"\n" + sound;
+                              soundLines + "length = 4\n[[signal]]\nid = \"X\"\nname = \"Cold oil\"\n" + soundLines;
     std::ofstream(folder.file("one.toml")) << first;
-    std::ofstream(folder.file("two.toml")) << "[[signal]]\nid = \"OIL\"\nname = \"Other\"\n" + sound;
+    std::ofstream(folder.file("two.toml")) << "[[signal]]\nid = \"OIL\"\nname = \"Other\"\n" + soundLines;
     std::ofstream(folder.file("ignored.txt")) << "x";
     SignalSet const set({folder.file("two.toml")}, folder.path(), {});
     std::size_t const builtIns = builtinPids().size();
@@ -274,6 +275,7 @@ TEST(SignalKeys, FindSignalsInASet)
     EXPECT_EQ(set.find("oil"), Found{0}) << "a named file goes first";
     EXPECT_EQ(set.find("GEARBOX oil hot"), Found{1});
     EXPECT_EQ(set.find("gearbox"), Found{});
+    EXPECT_EQ(set.find(builtinPids()[0].signal.name), Found{4}) << "a built-in one by its whole name";
     EXPECT_EQ(set.search("OIL cold"), Found{2});
     EXPECT_EQ(set.search("oil"), (Found{1, 2}));
     EXPECT_EQ(set.search("oil warm"), Found{});

@@ -56,6 +56,8 @@ TEST(BuiltinPids, TellHowWellTheyAreKnown)
     for (BuiltinPid const& each : builtinPids()) {
         bool const decoded = each.standing != PidStanding::Unverified && each.standing != PidStanding::NameOnly;
         EXPECT_EQ(isDecoded(each), decoded) << each.signal.id;
+        EXPECT_EQ(each.signal.request, (std::vector<unsigned char>{0x01, each.pid})) << each.signal.id;
+        EXPECT_TRUE(each.signal.unit.empty() || each.signal.values.empty()) << each.signal.id;
     }
 }
 
@@ -71,6 +73,40 @@ TEST(Identification, ReadsStandardIdentifiers)
     EXPECT_EQ(identifierText(0xF186, support::hexBytes("01")), "default session");
     EXPECT_EQ(identifierText(0xF186, support::hexBytes("60")), "60");
     EXPECT_EQ(identifierText(0xF183, support::hexBytes("41 42")), "4142");
+    std::pair<unsigned int, std::pair<char const*, char const*>> const cases[] = {
+        {0xF186, {"00", "00"}},
+        {0xF186, {"02", "programming session"}},
+        {0xF186, {"03", "extended session"}},
+        {0xF186, {"04", "safety system session"}},
+        {0xF186, {"05", "05"}},
+        {0xF186, {"01 01", "0101"}},
+        {0xF181, {"00 41 42", "AB"}},
+        {0xF181, {"1F 41 42", "AB"}},
+        {0xF181, {"20 41 42", "AB"}},
+        {0xF181, {"01", "01"}},
+        {0xF181, {"41", "A"}},
+        {0xF190, {"41 20 42", "A B"}},
+        {0xF190, {"7E", "~"}},
+        {0xF190, {"7F", "7F"}},
+        {0xF190, {"FF FF", ""}},
+        {0xF190, {"00 41 FF", "A"}},
+        {0xF18B, {"23 12 31", "2023-12-31"}},
+        {0xF18B, {"23 13 01", "231301"}},
+        {0xF18B, {"23 00 01", "230001"}},
+        {0xF18B, {"23 01 00", "230100"}},
+        {0xF18B, {"23 01 32", "230132"}},
+        {0xF18B, {"23 0A 01", "230A01"}},
+        {0xF18B, {"23 01", "2301"}},
+        {0xF18B, {"41 42 43", "ABC"}},
+        {0xFFFF, {"41 42", "4142"}},
+    };
+    for (auto const& [did, row] : cases) {
+        EXPECT_EQ(identifierText(did, support::hexBytes(row.first)), row.second) << std::hex << did << " " << row.first;
+    }
+    EXPECT_EQ(localIdentifierText(support::hexBytes("41 42 20")), "AB");
+    EXPECT_EQ(localIdentifierText(support::hexBytes("01 42")), "0142");
+    EXPECT_EQ(identifierName(0xF190), "Vehicle Identification Number");
+    EXPECT_EQ(identifierName(0x1A80), "Identification 80 by service 1A");
 }
 
 TEST(FailureType, HasANameOnlyWhereListsAgree)

@@ -73,6 +73,7 @@ TEST(ReadingOnly, KnowsWhatEachPurposeMaySend)
         {RequestPurpose::Codes, {0x19, 0x02, 0x8D}, nullptr},
         {RequestPurpose::Codes, {0x18, 0x00, 0xFF, 0x00}, nullptr},
         {RequestPurpose::Codes, {0x03}, nullptr},
+        {RequestPurpose::Codes, {0x19, 0x0A}, nullptr},
         {RequestPurpose::Codes, {0x19, 0x05, 0x00}, "no such report"},
         {RequestPurpose::Codes, {0x19}, "no such report"},
         {RequestPurpose::Codes, {0x14, 0xFF, 0xFF, 0xFF}, "clears"},
@@ -246,6 +247,13 @@ TEST(RequestState, DoesWithEachRefusalWhatItMeans)
     }
     busy.take(refusedBy(0x21), now);
     EXPECT_FALSE(busy.isDue(now + seconds(29)));
+    ModuleAnswer answered;
+    answered.kind = AnswerKind::Positive;
+    busy.take(answered, now);
+    for (int i = 0; i < 3; ++i) {
+        busy.take(refusedBy(0x21), now);
+        EXPECT_TRUE(busy.isDue(now + milliseconds(200))) << "an answer begins the count anew";
+    }
     RequestState split;
     split.take(refusedBy(0x14), now);
     EXPECT_TRUE(split.wantsSplit());
@@ -273,6 +281,10 @@ TEST(UdsCodes, AreReadWithFormatStatusAndCount)
     EXPECT_TRUE(isStandardFormat(report));
     EXPECT_EQ(report.count, 2U);
     ASSERT_EQ(report.codes.size(), 2U);
+    EXPECT_EQ(report.available, 0xFF);
+    EXPECT_EQ(report.format, 0);
+    EXPECT_EQ(report.codes[0].status, 0x2F);
+    EXPECT_EQ(report.codes[1].status, 0x08);
     EXPECT_EQ(report.codes[0].code(), "P0A1B");
     EXPECT_EQ(report.codes[1].hex(), "0AA61C");
     EXPECT_EQ(report.codes[1].failureType(), 0x1C);
@@ -281,10 +293,21 @@ TEST(UdsCodes, AreReadWithFormatStatusAndCount)
     EXPECT_THAT(statusWords(0x08, 0x08), ElementsAre("confirmed")) << "the module does not tell what is now";
     EXPECT_THAT(statusWords(0x84, 0xFF), ElementsAre("pending", "lamp"));
     EXPECT_THAT(statusWords(0xFF, 0x00), IsEmpty());
+    bench.module("7E5", "19018D", {"7ED065901FF040203"}).module("7E5", "19028D", {"7ED035902FF"});
+    UdsCodeReport const none = readUdsCodes(asker, moduleAt("7E5"));
+    EXPECT_EQ(none.format, 0x04);
+    EXPECT_TRUE(isStandardFormat(none));
+    EXPECT_EQ(none.count, 0x0203U);
+    EXPECT_TRUE(none.codes.empty());
+    EXPECT_EQ(none.answer, TopicAnswer::Read);
+    bench.module("7E6", "19018D", {"7EE065901FF010000"}).module("7E6", "19028D", {"7EE025902"});
+    EXPECT_FALSE(isStandardFormat(readUdsCodes(asker, moduleAt("7E6"))));
+    EXPECT_EQ(readUdsCodes(asker, moduleAt("7E6")).answer, TopicAnswer::Unreadable);
     bench.module("7E1", "19028D", {"7E9037F1911"});
     UdsCodeReport const refused = readUdsCodes(asker, moduleAt("7E1"));
     EXPECT_EQ(refused.answer, TopicAnswer::Refused);
     EXPECT_EQ(refused.format, std::nullopt);
+    EXPECT_EQ(refused.refusal, 0x11);
     EXPECT_EQ(readUdsCodes(asker, moduleAt("7E2")).answer, TopicAnswer::Silent);
     bench.module("7E3", "19028D", {"7EB055902FF0A1B"}); // a code that is cut
     EXPECT_EQ(readUdsCodes(asker, moduleAt("7E3")).answer, TopicAnswer::Unreadable);

@@ -19,7 +19,7 @@ request = "2101"
 formula = "A-1"
 unit = "V"
 precision = 1
-values = { 5 = "five" }
+values = { 5 = "five", 0 = "none" }
 
 [[signal]]
 id = "SLOW"
@@ -44,6 +44,13 @@ name = "Of four bytes"
 request = "2103"
 formula = "A"
 length = 4
+
+[[signal]]
+id = "HALF"
+name = "Half"
+request = "2105"
+formula = "A/2"
+values = { 0 = "zero", 1 = "one" }
 
 [[signal]]
 id = "WORD"
@@ -102,13 +109,15 @@ TEST_F(SignalBoardTest, GivesAValueWithItsReadingAndStatistics)
     EXPECT_EQ(reading.raw, (BoardBytes{0x61, 0x01, 3}));
     EXPECT_EQ(number(reading), 2.0);
     EXPECT_EQ(texts(take("A", {8})), "7.0 2.0 7.0 4.5");
-    EXPECT_EQ(texts(take("A", {1})), "0.0 0.0 7.0 3.0");
+    EXPECT_EQ(valueText(take("A", {1}).readings[0]), "none");
     PollResult const last = take("A", {3});
-    EXPECT_EQ(last.values[0]->statistics->count, 4U);
+    EXPECT_EQ(last.values[0]->statistics->count, 3U);
     EXPECT_EQ(last.values[0]->number, 2.0);
     PollResult const word = take("A", {6});
     EXPECT_EQ(std::get<std::string>(word.readings[0].value), "five");
     EXPECT_EQ(word.values[0]->value, "five");
+    EXPECT_EQ(valueText(take("HALF", {1}).readings[0]), "0.50") << "words are for whole numbers";
+    EXPECT_EQ(valueText(take("HALF", {2}).readings[0]), "one");
     EXPECT_TRUE(m_board->troubles().empty());
 }
 

@@ -105,6 +105,32 @@ TEST_F(SignalGroupTest, AsksTogetherWhatHasProvedItsLength)
     EXPECT_THAT(m_bench->takeAsked(), ElementsAre("7E4 2201010102"));
 }
 
+TEST_F(SignalGroupTest, AsksSinglyWhereAModuleLeavesIdentifiersOut)
+{
+    SignalGroup group(m_board, m_asker, addressOf("7E4", {}, {}, obd::ObdProtocolCan11).address);
+    group.add(chosen("ONE"), 0x7EC);
+    group.add(chosen("TWO"), 0x7EC);
+    m_bench->module("7E4", "220101", {"7EC0462010105"}).module("7E4", "220102", {"7EC056201020700"});
+    m_bench->module("7E4", "2201010102", {"7EC0462010108"}); // of two only one
+    turn(group);
+    m_bench->takeAsked();
+    EXPECT_EQ(turn(group), "ONE=5.00 TWO=12.00");
+    EXPECT_THAT(m_bench->takeAsked(), ElementsAre("7E4 2201010102", "7E4 220101", "7E4 220102"));
+    turn(group);
+    EXPECT_THAT(m_bench->takeAsked(), ElementsAre("7E4 220101", "7E4 220102"));
+
+    SignalGroup silent(m_board, m_asker, addressOf("7E5", {}, {}, obd::ObdProtocolCan11).address);
+    silent.add(chosen("ONE"), 0x7ED);
+    silent.add(chosen("TWO"), 0x7ED);
+    m_bench->module("7E5", "220101", {"7ED0462010105"}).module("7E5", "220102", {"7ED056201020700"});
+    turn(silent);
+    turn(silent);
+    m_bench->takeAsked();
+    turn(silent);
+    EXPECT_THAT(m_bench->takeAsked(), ElementsAre("7E5 2201010102", "7E5 220101", "7E5 220102"))
+        << "silence tells nothing of what the module can";
+}
+
 TEST_F(SignalGroupTest, LeavesAloneWhatWasRefused)
 {
     SignalGroup group(m_board, m_asker, addressOf("7E4", {}, {}, obd::ObdProtocolCan11).address);
