@@ -83,10 +83,15 @@ def ended(process, folder, command, said):
     return process.wait()
 
 
-def run(command, folder):
-    """Runs a command in a folder; None, or what is wrong."""
+def here(command):
+    """The command with what stands in for what is not here."""
     for pattern, instead in INSTEAD:
         command = re.sub(pattern, lambda _: instead, command)
+    return command
+
+
+def run(command, folder):
+    """Runs a command in a folder; None, or what is wrong."""
     for file in written_by(command, folder):
         file.unlink(missing_ok=True)
     with tempfile.NamedTemporaryFile("w") as out, tempfile.NamedTemporaryFile("w") as err:
@@ -114,9 +119,9 @@ def prepare(pool):
     (prepared / "pids.csv").write_text(PIDS)
     (prepared / "stands").write_text("0 hold speed 0\n")
     shutil.copy(source / "packaging/watch.toml", prepared)
-    scan = "velmora -p /dev/ttyUSB0 scan --history"
+    scan = "velmora scan --history"
     makers = ("record car.dialogue", "live RPM SPEED --csv drive.csv", "watch --output sqlite:car.db")
-    others = pool.map(lambda each: run(f"velmora -p /dev/ttyUSB0 {each}", prepared), makers)
+    others = pool.map(lambda each: run(f"velmora {each}", prepared), makers)
     report([run(scan, prepared), run(scan, prepared), *others])
 
 
@@ -128,9 +133,9 @@ def report(results):
 
 program, source = (pathlib.Path(path).resolve() for path in sys.argv[1:])
 guides = [source / "README.md", *sorted((source / "docs").glob("**/*.md"))]
-commands = list(dict.fromkeys(command for guide in guides for command in commands_of(guide)))
-assert len(commands) > 40, commands
-with tempfile.TemporaryDirectory() as name, concurrent.futures.ThreadPoolExecutor(8) as pool:
+commands = list(dict.fromkeys(here(command) for guide in guides for command in commands_of(guide)))
+assert len(commands) > 35, commands
+with tempfile.TemporaryDirectory() as name, concurrent.futures.ThreadPoolExecutor(12) as pool:
     prepared = pathlib.Path(name)
     prepare(pool)
     report(pool.map(run_apart, commands))
