@@ -74,25 +74,16 @@ private:
         } catch (FormulaError const& error) {
             return m_collector.refuse(m_number, name, std::string("equation: ") + error.what());
         }
-        readRange(signal, entry);
+        fillRange(signal, numberOf(entry, "minValue"), numberOf(entry, "maxValue"));
+        readMeanings(signal, entry);
         if (!m_setup.session.empty()) {
-            signal.enabled = false;
-            signal.reason = "needs session " + m_setup.session + ", which is not opened";
+            requireSession(signal, "session " + m_setup.session);
         }
-        signal.id = m_collector.newId(name);
-        if (!signal.reason.empty()) {
-            m_collector.note(m_number, name, signal.reason);
-        }
-        m_collector.add(m_number, std::move(signal));
+        m_collector.addNamed(m_number, std::move(signal));
     }
 
-    static void readRange(Signal& signal, json const& entry)
+    static void readMeanings(Signal& signal, json const& entry)
     {
-        signal.min = numberOf(entry, "minValue");
-        signal.max = numberOf(entry, "maxValue");
-        if (!signal.min || !signal.max || *signal.min >= *signal.max) {
-            signal.min = signal.max = std::nullopt;
-        }
         if (textOf(entry, "type") == "Boolean") {
             signal.precision = 0;
             signal.values = {{0, "no"}, {1, "yes"}};

@@ -71,7 +71,7 @@ private:
         m_line = record.line;
         m_name = cells[CsvColumn::Name];
         if (auto signal = read(cells)) {
-            m_collector.add(m_line, std::move(*signal));
+            m_collector.addNamed(m_line, std::move(*signal));
         }
     }
 
@@ -97,16 +97,11 @@ private:
         readRange(signal, cells);
         signal.unit = knownUnit(cells[CsvColumn::Unit]);
         if (!cells[CsvColumn::StartDiagnostic].empty()) {
-            signal.enabled = false;
-            signal.reason = "needs session " + cells[CsvColumn::StartDiagnostic] + ", which is not opened";
+            requireSession(signal, "session " + cells[CsvColumn::StartDiagnostic]);
         }
         if (auto const delay = numberCell(cells[CsvColumn::RefreshDelay]); delay && *delay > 0.0) {
             signal.rate = 1000.0 / *delay;
         }
-        if (!signal.reason.empty()) {
-            m_collector.note(m_line, m_name, signal.reason);
-        }
-        signal.id = m_collector.newId(m_name);
         return signal;
     }
 

@@ -79,6 +79,15 @@ void ImportCollector::add(std::size_t line, Signal signal)
     m_import.file.signals.push_back(std::move(signal));
 }
 
+void ImportCollector::addNamed(std::size_t line, Signal signal)
+{
+    signal.id = newId(signal.name);
+    if (!signal.reason.empty()) {
+        note(line, signal.name, signal.reason);
+    }
+    add(line, std::move(signal));
+}
+
 // One that goes takes those with it that read it.
 void ImportCollector::dropUnresolved()
 {
@@ -128,6 +137,19 @@ bool fillAddresses(Signal& signal, std::string const& header)
     }
     signal.reason = assumedReply;
     return !signal.reply.empty();
+}
+
+void requireSession(Signal& signal, std::string const& what)
+{
+    signal.enabled = false;
+    signal.reason = "needs " + what + ", which is not opened";
+}
+
+void fillRange(Signal& signal, std::optional<double> min, std::optional<double> max)
+{
+    bool const told = min && max && *min < *max;
+    signal.min = told ? min : std::nullopt;
+    signal.max = told ? max : std::nullopt;
 }
 
 std::string knownUnit(std::string const& unit)

@@ -20,6 +20,8 @@ public:
     void refuse(std::size_t line, std::string const& what, std::string const& why);
     void note(std::size_t line, std::string const& what, std::string const& why);
     void add(std::size_t line, Signal signal);
+    // The same for one that got no id yet, which is made of its name; what is to be told of it is noted.
+    void addNamed(std::size_t line, Signal signal);
     // A further name that formulas have for a signal.
     void call(std::string const& name, std::string const& id) { m_idOf.emplace(name, id); }
     bool knows(std::string const& name) const { return m_idOf.contains(name); }
@@ -39,6 +41,13 @@ private:
 // Fills in header and reply as a form without a reply filter leaves them open: nothing for pairs that follow from the
 // header, else what the next rule makes, which is told in reason. False for a header that is none.
 bool fillAddresses(Signal& signal, std::string const& header);
+
+// Leaves a signal out of what is read unasked, since its module answers in a session alone that nobody opens. What
+// names it: "session 03".
+void requireSession(Signal& signal, std::string const& what);
+
+// Its range, where a file tells both ends in their order; else none.
+void fillRange(Signal& signal, std::optional<double> min, std::optional<double> max);
 
 // The label that the program uses for a unit as such files spell it.
 std::string knownUnit(std::string const& unit);

@@ -106,9 +106,7 @@ private:
         }
         if (!memberOf(command, "din").is_null()) {
             std::string const session = textOf(command, "din");
-            signal.enabled = false;
-            signal.reason =
-                "needs " + (session.empty() ? "a session of its own" : "session " + session) + ", which is not opened";
+            requireSession(signal, session.empty() ? "a session of its own" : "session " + session);
         }
         return {};
     }
@@ -129,11 +127,7 @@ private:
         signal.formula = scaled(rawOf(field), format);
         signal.name = name;
         signal.unit = knownUnit(textOf(format, "unit"));
-        signal.min = numberOf(format, "min");
-        signal.max = numberOf(format, "max");
-        if (!signal.min || !signal.max || *signal.min >= *signal.max) {
-            signal.min = signal.max = std::nullopt;
-        }
+        fillRange(signal, numberOf(format, "min"), numberOf(format, "max"));
         readMeanings(signal, format);
         if (!memberOf(format, "nullmin").is_null() || !memberOf(format, "nullmax").is_null()) {
             m_collector.note(m_number, name, "the values that stand for none are not left out");

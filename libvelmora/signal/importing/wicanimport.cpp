@@ -113,11 +113,7 @@ private:
         if (!readFormula(signal, expression.get<std::string>(), *frames) || !readAddresses(signal, setup)) {
             return;
         }
-        signal.id = m_collector.newId(name);
-        if (!signal.reason.empty()) {
-            m_collector.note(m_number, name, signal.reason);
-        }
-        m_collector.add(m_number, std::move(signal));
+        m_collector.addNamed(m_number, std::move(signal));
     }
 
     bool readFormula(Signal& signal, std::string const& expression, ReplyFrames frames)
@@ -142,8 +138,7 @@ private:
             return false;
         }
         if (!setup.session.empty()) {
-            signal.enabled = false;
-            signal.reason = "needs session " + setup.session + ", which is not opened";
+            requireSession(signal, "session " + setup.session);
         }
         return true;
     }
