@@ -137,8 +137,8 @@ void CommandLine::addGlobalOptions()
             "--ecu",
             [this](std::string const& text) {
                 m_options.allEcus = text == "all";
-                m_options.ecu = parseEcuId(text);
-                if (!m_options.ecu && !m_options.allEcus) {
+                m_options.module = parseEcuId(text);
+                if (!m_options.module && !m_options.allEcus) {
                     throw CLI::ValidationError(
                         "\"" + text +
                         "\" is not understood; expected a control module id in hexadecimal, such as 7E8, or all");

@@ -8,17 +8,18 @@
 
 namespace velmora::cli {
 
-std::optional<obd::VehicleProtocol> parseProtocol(std::string const& text)
+std::optional<int> parseProtocol(std::string const& text)
 {
     if (text == "auto") {
-        return obd::VehicleProtocol::Automatic;
+        return static_cast<int>(obd::VehicleProtocol::Automatic);
     }
     std::string_view digits = text;
     if (digits.size() == 2 && (digits.front() == 'A' || digits.front() == 'a')) {
         digits.remove_prefix(1);
     }
-    auto const protocol = static_cast<obd::VehicleProtocol>(digits.empty() ? 0 : digits.front() - '0');
-    bool const known = digits.size() == 1 && obd::toObdProtocol(protocol) != obd::ObdProtocolUnknown;
+    int const protocol = digits.empty() ? 0 : digits.front() - '0';
+    bool const known = digits.size() == 1 &&
+                       obd::toObdProtocol(static_cast<obd::VehicleProtocol>(protocol)) != obd::ObdProtocolUnknown;
     return known ? std::optional(protocol) : std::nullopt;
 }
 

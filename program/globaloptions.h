@@ -1,11 +1,9 @@
 #pragma once
 
-#include <obd/vehicleprotocol.h>
-#include <velmora/units.h>
+#include <velmora/caroptions.h>
 
 #include <optional>
 #include <string>
-#include <vector>
 
 namespace velmora::cli {
 
@@ -16,31 +14,21 @@ enum class ColorMode
     Never,
 };
 
-// What the options before the command say, as given; the settings file fills what stays empty.
-struct GlobalOptions
+// What the options before the command say, as given: of a car, and of what is shown of it. The settings file fills what
+// stays empty.
+struct GlobalOptions : CarOptions
 {
-    std::string port;
-    std::optional<unsigned int> baud;
-    std::optional<obd::VehicleProtocol> protocol;
-    std::optional<Units> units;
-    std::optional<unsigned int> ecu; // control module id
-    bool allEcus = false;            // all of them, where one is the usual
+    bool allEcus = false; // all control modules, where one is the usual
     bool json = false;
-    std::string logFile;
-    std::string traceFile;
-    std::string settingsFile;
-    std::vector<std::string> signalFiles;
-    bool reset = false;
-    bool sleep = false;  // send the adapter to sleep at the end
-    bool forget = false; // drop what earlier visits have learnt
     bool yes = false;
     bool quiet = false;
     bool verbose = false;
     std::optional<ColorMode> color;
 };
 
-// "auto", "1" to "9", or as adapters print a protocol that they found, "A6". Nothing for any other text.
-std::optional<obd::VehicleProtocol> parseProtocol(std::string const& text);
+// "auto", "1" to "9", or as adapters print a protocol that they found, "A6": the number that CarOptions has. Nothing
+// for any other text.
+std::optional<int> parseProtocol(std::string const& text);
 
 // A control module id in hexadecimal, with or without 0x. Nothing for any other text.
 std::optional<unsigned int> parseEcuId(std::string const& text);

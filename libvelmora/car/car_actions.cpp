@@ -1,10 +1,10 @@
 // What a car can be made to do.
 
+#include "common/text/text.h"
 #include "libvelmora/car/carcore.h"
 #include "libvelmora/read/codeclearing.h"
 #include "libvelmora/read/modulereader.h"
 #include "libvelmora/read/routinereader.h"
-#include "libvelmora/text/text.h"
 
 #include <obd/iecu.h>
 #include <obd/isensorservice.h>

@@ -1,5 +1,6 @@
 // What a car tells, topic by topic.
 
+#include "common/text/text.h"
 #include "libvelmora/car/carcore.h"
 #include "libvelmora/car/carmodules.h"
 #include "libvelmora/car/caroffers.h"
@@ -11,7 +12,6 @@
 #include "libvelmora/read/makerreader.h"
 #include "libvelmora/read/modulereader.h"
 #include "libvelmora/read/vehiclereader.h"
-#include "libvelmora/text/text.h"
 
 #include <obd/iecu.h>
 #include <velmora/car.h>

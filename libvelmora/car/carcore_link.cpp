@@ -1,7 +1,6 @@
 // The link of a car: connecting, finding out that it is lost, and coming back.
 
 #include "libvelmora/car/carcore.h"
-#include "libvelmora/car/caroptions.h"
 #include "libvelmora/car/sessionend.h"
 #include "libvelmora/read/sensorchoice.h"
 #include "libvelmora/record/recorderparts.h"
@@ -23,7 +22,7 @@ constexpr std::chrono::seconds longestPause{16};
 
 void CarCore::connect()
 {
-    auto session = std::make_unique<Session>(sessionOptions(m_options));
+    auto session = std::make_unique<Session>(SessionOptions(m_options));
     {
         std::lock_guard const lock(m_mutex);
         m_session = std::move(session);

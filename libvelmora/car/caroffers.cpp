@@ -1,10 +1,10 @@
 #include "libvelmora/car/caroffers.h"
 
+#include "common/text/text.h"
 #include "libvelmora/read/oxygencurrent.h"
 #include "libvelmora/read/topicanswer.h"
 #include "libvelmora/report/unitlabel.h"
 #include "libvelmora/signal/builtinpids.h"
-#include "libvelmora/text/text.h"
 #include "libvelmora/vehicle/pidtitles.h"
 #include "libvelmora/vehicle/units.h"
 

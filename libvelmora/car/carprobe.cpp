@@ -1,7 +1,7 @@
 #include "libvelmora/car/carprobe.h"
 
+#include "common/text/text.h"
 #include "libvelmora/signal/signalhex.h"
-#include "libvelmora/text/text.h"
 #include "libvelmora/uds/moduleaddress.h"
 #include "libvelmora/uds/vehiclevin.h"
 

@@ -35,7 +35,7 @@ std::vector<AskedModule> modulesToAsk(Session& session)
             modules.push_back({*request, swappedReply(*request).value_or(identifierText(ecu->id())), ecu->name(), {}});
         }
     }
-    if (session.options().ecu) {
+    if (session.options().module) {
         return modules;
     }
     ModuleStore const store(ModuleStore::besides(session.settingsFile()));

@@ -1,9 +1,8 @@
 // The bare dialogue with an adapter; see <velmora/console.h>.
 
-#include "libvelmora/car/caroptions.h"
+#include "common/text/text.h"
 #include "libvelmora/car/onecar.h"
 #include "libvelmora/car/sessionend.h"
-#include "libvelmora/text/text.h"
 
 #include <obd/idataconnection.h>
 #include <velmora/console.h>
@@ -33,7 +32,7 @@ class ConsoleParts
 {
 public:
     explicit ConsoleParts(CarOptions const& options)
-        : session(sessionOptions(options)), end(session, options), connection(session.connectToPort())
+        : session(SessionOptions(options)), end(session, options), connection(session.connectToPort())
     {
         connection->setDelimiter('>');
     }

@@ -1,6 +1,5 @@
 // A dialogue as a recording; see <velmora/recording.h>.
 
-#include "libvelmora/car/caroptions.h"
 #include "libvelmora/car/onecar.h"
 #include "libvelmora/car/sessionend.h"
 #include "libvelmora/replay/readdialogue.h"
@@ -14,7 +13,7 @@ namespace {
 // The session of a car that is replayed, on its caller's thread.
 struct ReplayedCar
 {
-    explicit ReplayedCar(CarOptions const& options) : session(sessionOptions(options)), end(session, options) {}
+    explicit ReplayedCar(CarOptions const& options) : session(SessionOptions(options)), end(session, options) {}
 
     OneCar const place;
     Session session;

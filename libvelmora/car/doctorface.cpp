@@ -1,6 +1,5 @@
 // The examination as applications see it; see <velmora/doctor.h>.
 
-#include "libvelmora/car/caroptions.h"
 #include "libvelmora/car/onecar.h"
 #include "libvelmora/car/sessionend.h"
 #include "libvelmora/doctor/doctor.h"
@@ -21,7 +20,7 @@ class DoctorParts
 {
 public:
     explicit DoctorParts(CarOptions const& options)
-        : session(sessionOptions(options)), end(session, options), report(examine(session, recorder))
+        : session(SessionOptions(options)), end(session, options), report(examine(session, recorder))
     {}
 
     OneCar const place;

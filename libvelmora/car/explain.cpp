@@ -1,6 +1,6 @@
+#include "common/text/text.h"
 #include "libvelmora/report/troublecode.h"
 #include "libvelmora/session/libraryuse.h"
-#include "libvelmora/text/text.h"
 
 #include <obd/troublecodecatalogue.h>
 #include <velmora/catalogue.h>

@@ -1,12 +1,12 @@
 // What a probe found, as applications see it; see <velmora/probe.h>.
 
 #include "common/text/layout.h"
+#include "common/text/text.h"
 #include "libvelmora/car/carprobe.h"
 #include "libvelmora/report/json.h"
 #include "libvelmora/report/plain/reporttext.h"
 #include "libvelmora/signal/signalfile.h"
 #include "libvelmora/signal/signalhex.h"
-#include "libvelmora/text/text.h"
 #include "libvelmora/uds/identification.h"
 #include "libvelmora/uds/refusalcode.h"
 

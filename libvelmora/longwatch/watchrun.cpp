@@ -1,6 +1,5 @@
 #include "libvelmora/longwatch/watchrun.h"
 
-#include "libvelmora/car/caroptions.h"
 #include "libvelmora/output/opening/outputfactory.h"
 #include "libvelmora/output/valuetext.h"
 #include "libvelmora/session/settingsstore.h"
@@ -29,7 +28,7 @@ WatchTime timeNow()
 SessionCarOptions watchedCar(CarOptions const& options, WatchSettings const& settings, std::string const& vehicle)
 {
     SessionCarOptions result;
-    result.session = sessionOptions(options);
+    result.session = SessionOptions(options);
     result.session.port = options.port.empty() ? settings.port : options.port;
     result.session.units = Units::Metric;
     result.session.sleep = false;

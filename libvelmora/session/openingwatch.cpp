@@ -1,6 +1,6 @@
 #include "libvelmora/session/openingwatch.h"
 
-#include "libvelmora/text/text.h"
+#include "common/text/text.h"
 
 #include <vector>
 

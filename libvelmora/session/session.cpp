@@ -3,6 +3,7 @@
 #include "libvelmora/record/traffictrace.h"
 #include "libvelmora/session/link.h"
 #include "libvelmora/session/settingsstore.h"
+#include "libvelmora/vehicle/units.h"
 
 #include <obd/iconnectionmanager.h>
 #include <obd/iconnectionoptions.h>
@@ -68,7 +69,7 @@ IChannelControl& Session::channel() const
 
 std::vector<std::shared_ptr<obd::IEcu>> Session::selectedModules() const
 {
-    if (m_options.ecu) {
+    if (m_options.module) {
         return {m_obd->getEcuManager()->getCurrentEcu()};
     }
     return m_obd->getEcuManager()->getEcus();
@@ -106,7 +107,8 @@ Units Session::imperialUnits() const
 
 obd::VehicleProtocol Session::protocol() const
 {
-    return m_options.protocol.value_or(m_obd->getSettings()->connectionOptions()->protocol());
+    return m_options.protocol ? static_cast<obd::VehicleProtocol>(*m_options.protocol)
+                              : m_obd->getSettings()->connectionOptions()->protocol();
 }
 
 void Session::connect()
@@ -185,10 +187,10 @@ void Session::interrupt()
 
 void Session::selectEcu()
 {
-    if (!m_options.ecu) {
+    if (!m_options.module) {
         return;
     }
-    m_obd->getEcuManager()->setCurrentEcu(*m_options.ecu);
+    m_obd->getEcuManager()->setCurrentEcu(*m_options.module);
     if (m_obd->getEcuManager()->getCurrentEcu() != nullptr) {
         return;
     }
@@ -198,7 +200,7 @@ void Session::selectEcu()
     for (unsigned int const id : ids) {
         list += fmt::format("{}{:X}", list.empty() ? "" : ", ", id);
     }
-    throw Error(ErrorKind::NotSupported, fmt::format("The vehicle has no control module {:X}", *m_options.ecu),
+    throw Error(ErrorKind::NotSupported, fmt::format("The vehicle has no control module {:X}", *m_options.module),
                 {"these answer: " + list});
 }
 

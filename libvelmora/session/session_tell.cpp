@@ -1,10 +1,10 @@
 // What a session tells of its state and of what went wrong.
 
+#include "common/text/text.h"
 #include "libvelmora/record/traffictrace.h"
 #include "libvelmora/session/link.h"
 #include "libvelmora/session/openingfailure.h"
 #include "libvelmora/session/session.h"
-#include "libvelmora/text/text.h"
 
 #include <obd/idevice.h>
 #include <obd/iecu.h>

@@ -26,7 +26,7 @@ Permanent codes stay. Note codes and freeze frame down first if they may be need
 // Clearing is functional: the request reaches every module, whichever one is selected.
 void checkOptions(GlobalOptions const& options)
 {
-    if (options.ecu) {
+    if (options.module) {
         throw Error(ErrorKind::WrongUse, "Clearing reaches all control modules; it can't be held to one",
                     {"leave --ecu out to clear the codes of all"});
     }

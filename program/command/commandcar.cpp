@@ -38,21 +38,7 @@ InterruptStop::~InterruptStop()
 
 CarOptions carOptions(GlobalOptions const& options, std::stop_token stop)
 {
-    CarOptions result;
-    result.port = options.port;
-    result.baud = options.baud;
-    if (options.protocol) {
-        result.protocol = static_cast<int>(*options.protocol);
-    }
-    result.units = options.units;
-    result.module = options.ecu;
-    result.reset = options.reset;
-    result.sleep = options.sleep;
-    result.forget = options.forget;
-    result.logFile = options.logFile;
-    result.traceFile = options.traceFile;
-    result.settingsFile = options.settingsFile;
-    result.signalFiles = options.signalFiles;
+    CarOptions result = options;
     result.stop = std::move(stop);
     if (!options.quiet) {
         result.onProgress = tellText;

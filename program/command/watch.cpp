@@ -18,23 +18,6 @@ namespace velmora::cli {
 
 namespace {
 
-CarOptions carOf(GlobalOptions const& global)
-{
-    CarOptions car;
-    car.port = global.port;
-    car.baud = global.baud;
-    if (global.protocol) {
-        car.protocol = static_cast<int>(*global.protocol);
-    }
-    car.module = global.ecu;
-    car.reset = global.reset;
-    car.logFile = global.logFile;
-    car.traceFile = global.traceFile;
-    car.settingsFile = global.settingsFile;
-    car.signalFiles = global.signalFiles;
-    return car;
-}
-
 // A link that stands alone on standard output can be taken from there by another program.
 void tellPage(PageLink const& page, bool forPage)
 {
@@ -57,7 +40,7 @@ void tellPage(PageLink const& page, bool forPage)
 LongWatchOptions optionsOf(GlobalOptions const& global, WatchOptions const& chosen)
 {
     LongWatchOptions options;
-    options.car = carOf(global);
+    options.car = global;
     options.configFile = chosen.config;
     options.sensors = chosen.sensors;
     options.outputs = chosen.outputs;

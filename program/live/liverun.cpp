@@ -54,7 +54,7 @@ LiveWish LiveRun::wish(std::vector<std::string> const& sensors) const
     wish.rate = m_options.rate;
     wish.fast = m_options.fast;
     wish.pidsPerRequest = m_options.pidsPerRequest;
-    wish.allModules = m_car.options().ecu || m_car.options().allEcus;
+    wish.allModules = m_car.options().module || m_car.options().allEcus;
     return wish;
 }
 
