@@ -103,6 +103,35 @@ std::vector<std::string> splitWords(std::string const& text)
     return words;
 }
 
+std::string printableLine(std::string_view reply)
+{
+    std::string line;
+    for (char const each : reply) {
+        bool const printable = each > ' ' && each <= '~';
+        if (printable) {
+            line += each;
+        } else if (!line.empty() && line.back() != ' ') {
+            line += ' ';
+        }
+    }
+    if (line.ends_with(' ')) {
+        line.pop_back();
+    }
+    return line;
+}
+
+std::string csvField(std::string const& text)
+{
+    if (text.find_first_of(",\"\r\n") == std::string::npos) {
+        return text;
+    }
+    std::string result = "\"";
+    for (char const each : text) {
+        result += each == '"' ? std::string("\"\"") : std::string(1, each);
+    }
+    return result + "\"";
+}
+
 std::size_t editDistance(std::string const& left, std::string const& right)
 {
     std::vector<std::size_t> row(right.size() + 1);

@@ -37,6 +37,13 @@ std::size_t bytesOfWidth(std::string_view text, std::size_t width);
 // The text in exactly that many columns: filled with blanks, at the left for rightAligned, or cut with an ellipsis.
 std::string fitted(std::string const& text, std::size_t width, bool rightAligned = false);
 
+// What is printable in an adapter's reply, in one line: each run of other bytes becomes a blank, and none stands at
+// either end.
+std::string printableLine(std::string_view reply);
+
+// A cell of a CSV table: quoted when a reader of such needs it.
+std::string csvField(std::string const& text);
+
 // How many letters have to be typed, left out or changed to make one text of the other.
 std::size_t editDistance(std::string const& left, std::string const& right);
 

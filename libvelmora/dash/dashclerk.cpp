@@ -1,5 +1,6 @@
 #include "libvelmora/dash/dashclerk.h"
 
+#include "common/text/text.h"
 #include "libvelmora/dash/dashstate.h"
 #include "libvelmora/output/valuetext.h"
 #include "libvelmora/read/codeclearing.h"
@@ -8,7 +9,6 @@
 #include "libvelmora/read/freezereader.h"
 #include "libvelmora/read/makerreader.h"
 #include "libvelmora/report/clearreport.h"
-#include "libvelmora/text/text.h"
 #include "libvelmora/vehicle/vehiclekey.h"
 #include "libvelmora/vehicle/vin.h"
 #include "libvelmora/watch/watchsources.h"

@@ -1,7 +1,7 @@
 #include "libvelmora/dash/dashstate.h"
 
+#include "common/text/text.h"
 #include "libvelmora/output/valuetext.h"
-#include "libvelmora/text/text.h"
 
 #include <fmt/format.h>
 

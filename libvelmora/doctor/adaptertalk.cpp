@@ -1,5 +1,7 @@
 #include "libvelmora/doctor/adaptertalk.h"
 
+#include "common/text/text.h"
+
 #include <utility>
 
 namespace velmora {
@@ -63,19 +65,7 @@ std::string AdapterTalk::cleaned(std::string reply, std::string const& command)
     if (m_echoed) {
         reply.erase(0, command.size());
     }
-    std::string text;
-    for (char const each : reply) {
-        bool const printable = each > ' ' && each <= '~';
-        if (printable) {
-            text += each;
-        } else if (!text.empty() && text.back() != ' ') {
-            text += ' ';
-        }
-    }
-    while (text.ends_with(' ')) {
-        text.pop_back();
-    }
-    return text;
+    return printableLine(reply);
 }
 
 } // namespace velmora

@@ -1,8 +1,8 @@
 #include "libvelmora/doctor/vehiclecheck.h"
 
+#include "common/text/text.h"
 #include "libvelmora/channel/busline.h"
 #include "libvelmora/read/multireply.h"
-#include "libvelmora/text/text.h"
 
 #include <obd/iecu.h>
 #include <obd/parameterfactory.h>

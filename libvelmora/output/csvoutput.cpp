@@ -1,5 +1,6 @@
 #include "libvelmora/output/csvoutput.h"
 
+#include "common/text/text.h"
 #include "libvelmora/output/valuetext.h"
 
 #include <algorithm>

@@ -44,16 +44,4 @@ std::optional<double> numberOf(Reading const& reading)
     return number != nullptr && std::isfinite(*number) ? std::optional(*number) : std::nullopt;
 }
 
-std::string csvField(std::string const& text)
-{
-    if (text.find_first_of(",\"\r\n") == std::string::npos) {
-        return text;
-    }
-    std::string result = "\"";
-    for (char const each : text) {
-        result += each == '"' ? std::string("\"\"") : std::string(1, each);
-    }
-    return result + "\"";
-}
-
 } // namespace velmora

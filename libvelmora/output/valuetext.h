@@ -23,7 +23,4 @@ std::string moduleText(unsigned int id);
 // The number of a reading; nothing if it has none, or one that is not finite.
 std::optional<double> numberOf(Reading const& reading);
 
-// Quoted when a CSV reader needs it.
-std::string csvField(std::string const& text);
-
 } // namespace velmora

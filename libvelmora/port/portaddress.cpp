@@ -1,6 +1,6 @@
 #include "libvelmora/port/portaddress.h"
 
-#include "libvelmora/text/text.h"
+#include "common/text/text.h"
 
 #include <velmora/error.h>
 

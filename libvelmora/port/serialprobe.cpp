@@ -1,7 +1,8 @@
 #include "libvelmora/port/serialprobe.h"
 
+#include "common/text/text.h"
+
 #include <algorithm>
-#include <cctype>
 #include <cerrno>
 #include <chrono>
 #include <fcntl.h>
@@ -119,18 +120,8 @@ std::string cleaned(std::string answer)
     if (std::size_t const echo = answer.find("ATI\r"); echo != std::string::npos) {
         answer.erase(0, echo + question.size());
     }
-    std::string text;
-    for (char const each : answer) {
-        if (std::isprint(static_cast<unsigned char>(each)) != 0 && each != '>') {
-            text += each;
-        } else if (!text.empty() && text.back() != ' ') {
-            text += ' ';
-        }
-    }
-    while (text.ends_with(' ')) {
-        text.pop_back();
-    }
-    return text;
+    std::replace(answer.begin(), answer.end(), '>', ' ');
+    return printableLine(answer);
 }
 
 // An adapter's prompt stands in a line of its own, alone; a console's stands behind a name.

@@ -1,7 +1,7 @@
 #include "libvelmora/read/codeclearing.h"
 
+#include "common/text/text.h"
 #include "libvelmora/read/servicereplies.h"
-#include "libvelmora/text/text.h"
 
 #include <obd/iecumanager.h>
 

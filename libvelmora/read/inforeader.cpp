@@ -1,6 +1,6 @@
+#include "common/text/text.h"
 #include "libvelmora/read/diagnosticreaders.h"
 #include "libvelmora/report/unitlabel.h"
-#include "libvelmora/text/text.h"
 
 #include <obd/iecuservice.h>
 #include <obd/itroublecodeservice.h>

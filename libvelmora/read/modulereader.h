@@ -1,7 +1,7 @@
 #pragma once
 
+#include "common/text/text.h"
 #include "libvelmora/session/session.h"
-#include "libvelmora/text/text.h"
 
 #include <obd/iecu.h>
 #include <velmora/topics.h>

@@ -1,7 +1,7 @@
 #include "libvelmora/read/sensorchoice.h"
 
+#include "common/text/text.h"
 #include "libvelmora/read/sensornames.h"
-#include "libvelmora/text/text.h"
 
 #include <obd/parameterdescriptor.h>
 #include <velmora/error.h>

@@ -1,8 +1,8 @@
 #include "libvelmora/read/sensorlimits.h"
 
+#include "common/text/text.h"
 #include "libvelmora/read/sensornames.h"
 #include "libvelmora/session/settingsstore.h"
-#include "libvelmora/text/text.h"
 
 #include <velmora/error.h>
 

@@ -1,6 +1,6 @@
 #include "libvelmora/read/sensornames.h"
 
-#include "libvelmora/text/text.h"
+#include "common/text/text.h"
 
 #include <fmt/format.h>
 

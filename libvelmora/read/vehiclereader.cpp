@@ -1,11 +1,11 @@
 #include "libvelmora/read/vehiclereader.h"
 
+#include "common/text/text.h"
 #include "libvelmora/read/codereader.h"
 #include "libvelmora/read/diagnosticreaders.h"
 #include "libvelmora/read/freezereader.h"
 #include "libvelmora/read/topicanswer.h"
 #include "libvelmora/read/valuesreader.h"
-#include "libvelmora/text/text.h"
 
 #include <obd/iecu.h>
 #include <obd/sensorpids.h>

@@ -1,5 +1,5 @@
+#include "common/text/text.h"
 #include "libvelmora/replay/recordingfile.h"
-#include "libvelmora/text/text.h"
 
 #include <velmora/error.h>
 

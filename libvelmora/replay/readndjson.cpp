@@ -1,6 +1,6 @@
+#include "common/text/text.h"
 #include "libvelmora/replay/recordingfile.h"
 #include "libvelmora/report/json.h"
-#include "libvelmora/text/text.h"
 
 #include <velmora/error.h>
 

@@ -1,7 +1,7 @@
 #include "libvelmora/signal/signalset.h"
 
+#include "common/text/text.h"
 #include "libvelmora/signal/signalfile.h"
-#include "libvelmora/text/text.h"
 
 #include <velmora/error.h>
 

@@ -1,6 +1,6 @@
 #include "libvelmora/uds/moduleaddress.h"
 
-#include "libvelmora/text/text.h"
+#include "common/text/text.h"
 
 #include <obd/protocolfamily.h>
 

@@ -1,6 +1,6 @@
 #include "libvelmora/uds/modulescan.h"
 
-#include "libvelmora/text/text.h"
+#include "common/text/text.h"
 #include "libvelmora/uds/moduleaddress.h"
 #include "libvelmora/uds/standingguard.h"
 

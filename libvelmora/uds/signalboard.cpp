@@ -1,7 +1,7 @@
 #include "libvelmora/uds/signalboard.h"
 
+#include "common/text/text.h"
 #include "libvelmora/signal/signalhex.h"
-#include "libvelmora/text/text.h"
 
 #include <fmt/format.h>
 

@@ -1,6 +1,6 @@
 #include "libvelmora/vehicle/vin.h"
 
-#include "libvelmora/text/text.h"
+#include "common/text/text.h"
 #include "libvelmora/vehicle/wmitable.h"
 
 #include <velmora/error.h>

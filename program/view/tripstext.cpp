@@ -1,6 +1,6 @@
 #include "program/view/tripstext.h"
 
-#include "program/view/csvfield.h"
+#include "common/text/text.h"
 #include "program/view/timetext.h"
 
 #include <fmt/format.h>

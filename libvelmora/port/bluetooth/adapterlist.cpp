@@ -1,8 +1,8 @@
 #include "libvelmora/port/bluetooth/adapterlist.h"
 
+#include "common/text/text.h"
 #include "libvelmora/port/bluetooth/bluetootherror.h"
 #include "libvelmora/port/bluetooth/bluez.h"
-#include "libvelmora/text/text.h"
 
 #include <algorithm>
 #include <array>

@@ -1,6 +1,6 @@
 #include "program/view/live/livecsv.h"
 
-#include "program/view/csvfield.h"
+#include "common/text/text.h"
 #include "program/view/timetext.h"
 
 #include <velmora/error.h>

@@ -27,6 +27,22 @@ TEST(Text, ReadableShowsNoiseAsReplacementCharacters)
                                                 "b");
 }
 
+TEST(Text, AnAdaptersReplyIsOneLine)
+{
+    EXPECT_EQ(velmora::printableLine("\r\nELM327  v1.5\r\r"), "ELM327 v1.5");
+    EXPECT_EQ(velmora::printableLine(std::string_view("A\0B\x7F\xFC", 5)), "A B");
+    EXPECT_EQ(velmora::printableLine(" \t"), "");
+}
+
+TEST(Text, ACellOfATableIsQuotedWhereItHasTo)
+{
+    using velmora::csvField;
+    EXPECT_EQ(csvField("a b;c"), "a b;c");
+    EXPECT_EQ(csvField("a,\"b\""), "\"a,\"\"b\"\"\"");
+    EXPECT_EQ(csvField("a\nb"), "\"a\nb\"");
+    EXPECT_EQ(csvField("a\rb"), "\"a\rb\"");
+}
+
 TEST(Text, ANumberIsTheWholeText)
 {
     EXPECT_EQ(velmora::numberIn("-12.5"), -12.5);

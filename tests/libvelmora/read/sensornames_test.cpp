@@ -1,5 +1,5 @@
+#include "common/text/text.h"
 #include "libvelmora/read/sensornames.h"
-#include "libvelmora/text/text.h"
 
 #include <gtest/gtest.h>
 
