@@ -10,7 +10,7 @@
 #include "libvelmora/session/dispatchloop.h"
 #include "simulator/simulation.h"
 #include "tests/support/memorysettings.h"
-#include "tests/support/peerconnection.h"
+#include "tests/support/wire/peerconnection.h"
 
 #include <obd/iconnectionmanager.h>
 #include <obd/iobdvelmora.h>

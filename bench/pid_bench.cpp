@@ -5,7 +5,7 @@
 
 #include "bench/allocationcount.h"
 #include "tests/support/fakeecu.h"
-#include "tests/support/payload.h"
+#include "tests/support/payload/payload.h"
 
 #include <obd/parameterfactory.h>
 

@@ -12,7 +12,7 @@
 #include "libvelmora/port/opening/openport.h"
 #include "libvelmora/read/vehiclereader.h"
 #include "libvelmora/session/session.h"
-#include "tests/support/plainchannel.h"
+#include "tests/support/wire/plainchannel.h"
 
 #include <benchmark/benchmark.h>
 

@@ -3,7 +3,7 @@
 
 #include "bench/allocationcount.h"
 #include "libobd/module/obdproxy.h"
-#include "tests/support/fakedevice.h"
+#include "tests/support/wire/fakedevice.h"
 
 #include <obd/parameterfactory.h>
 #include <obd/powertrainparameter.h>

@@ -4,7 +4,7 @@
 // frame.
 
 #include "libvelmora/channel/fastchannel.h"
-#include "tests/support/timedwire.h"
+#include "tests/support/wire/timedwire.h"
 
 #include <algorithm>
 #include <cstdint>

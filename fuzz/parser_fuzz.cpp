@@ -10,7 +10,7 @@
 #include "libobd/adapter/elmtransport.h"
 #include "libobd/bytes/bytes.h"
 #include "libobd/message/messageparser.h"
-#include "tests/support/plaincanparser.h"
+#include "tests/support/payload/plaincanparser.h"
 
 #include <algorithm>
 #include <array>

@@ -5,7 +5,7 @@
 
 #include "libobd/powertrain/fueltrim.h"
 #include "tests/support/fakeecu.h"
-#include "tests/support/payloadproperty.h"
+#include "tests/support/payload/payloadproperty.h"
 
 #include <obd/parameterfactory.h>
 

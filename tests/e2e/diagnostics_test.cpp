@@ -1,7 +1,7 @@
 // The diagnostic results as a user reads them, of simulated cars on CAN and on a legacy bus.
 
 #include "tests/e2e/childprocess.h"
-#include "tests/support/jsonschema.h"
+#include "tests/support/json/jsonschema.h"
 #include "tests/support/temporaryfolder.h"
 
 #include <gtest/gtest.h>

@@ -1,7 +1,7 @@
 // The history by the program itself, in a file of the test's own.
 
 #include "tests/e2e/childprocess.h"
-#include "tests/support/jsonschema.h"
+#include "tests/support/json/jsonschema.h"
 #include "tests/support/temporaryfolder.h"
 
 #include <gtest/gtest.h>

@@ -2,7 +2,7 @@
 // it.
 
 #include "tests/e2e/childprocess.h"
-#include "tests/support/jsonschema.h"
+#include "tests/support/json/jsonschema.h"
 
 #include <gtest/gtest.h>
 

@@ -1,7 +1,7 @@
 // The program as a user runs it: against simulated and recorded cars, in real time.
 
 #include "tests/e2e/childprocess.h"
-#include "tests/support/jsonschema.h"
+#include "tests/support/json/jsonschema.h"
 #include "tests/support/temporaryfolder.h"
 
 #include <gtest/gtest.h>

@@ -1,7 +1,7 @@
 // What record saves gives the same report again, and live traffic can be watched.
 
 #include "tests/e2e/childprocess.h"
-#include "tests/support/jsonschema.h"
+#include "tests/support/json/jsonschema.h"
 #include "tests/support/temporaryfolder.h"
 
 #include <gtest/gtest.h>

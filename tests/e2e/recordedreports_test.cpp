@@ -2,8 +2,8 @@
 // whose modules can't be told apart, the simulator has cars that answer as they did.
 
 #include "tests/e2e/childprocess.h"
-#include "tests/support/jsonschema.h"
-#include "tests/support/recordeddialogue.h"
+#include "tests/support/dialogue/recordeddialogue.h"
+#include "tests/support/json/jsonschema.h"
 #include "tests/support/temporaryfolder.h"
 
 #include <gtest/gtest.h>

@@ -1,7 +1,7 @@
 // Modules beyond OBD as a user meets them: found, probed, their codes and signals read.
 
 #include "tests/e2e/childprocess.h"
-#include "tests/support/jsonschema.h"
+#include "tests/support/json/jsonschema.h"
 #include "tests/support/temporaryfolder.h"
 
 #include <gmock/gmock.h>

@@ -1,7 +1,7 @@
 // Trouble codes as a user reads and clears them: offline, and against simulated cars of every bus family.
 
 #include "tests/e2e/childprocess.h"
-#include "tests/support/jsonschema.h"
+#include "tests/support/json/jsonschema.h"
 
 #include <gtest/gtest.h>
 #include <nlohmann/json.hpp>

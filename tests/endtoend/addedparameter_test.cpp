@@ -12,7 +12,7 @@
 #include "tests/support/hexbytes.h"
 #include "tests/support/logcapture.h"
 #include "tests/support/memorysettings.h"
-#include "tests/support/peerconnection.h"
+#include "tests/support/wire/peerconnection.h"
 #include "tests/support/workerclock.h"
 
 #include <obd/iconnectionmanager.h>

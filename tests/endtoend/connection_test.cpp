@@ -5,10 +5,10 @@
 #include "libobd/query/freezeframeconfigurationquery.h"
 #include "simulator/simulation.h"
 #include "tests/support/dispatchloop.h"
-#include "tests/support/failingallocation.h"
 #include "tests/support/logcapture.h"
 #include "tests/support/memorysettings.h"
-#include "tests/support/peerconnection.h"
+#include "tests/support/process/failingallocation.h"
+#include "tests/support/wire/peerconnection.h"
 #include "tests/support/workerclock.h"
 
 #include <obd/databridge.h>

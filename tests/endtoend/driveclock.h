@@ -1,7 +1,7 @@
 #pragma once
 
 #include "tests/support/dispatchloop.h"
-#include "tests/support/peerconnection.h"
+#include "tests/support/wire/peerconnection.h"
 
 #include <common/clock.h>
 

@@ -1,7 +1,7 @@
 #include "libobd/adapter/elmscantool.h"
 #include "libobd/module/obdproxy.h"
 #include "simulator/simulation.h"
-#include "tests/support/peerconnection.h"
+#include "tests/support/wire/peerconnection.h"
 
 #include <gtest/gtest.h>
 

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "tests/support/peerconnection.h"
+#include "tests/support/wire/peerconnection.h"
 
 #include <obd/dispatcher.h>
 #include <obd/idataconnection.h>

@@ -1,7 +1,7 @@
 #pragma once
 
 #include "libobd/connection/connectionmanager.h"
-#include "tests/support/elmdialogue.h"
+#include "tests/support/dialogue/elmdialogue.h"
 #include "tests/support/fakeclock.h"
 #include "tests/support/logcapture.h"
 

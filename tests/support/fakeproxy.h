@@ -3,7 +3,7 @@
 #include "tests/support/fakeecu.h"
 #include "tests/support/gate.h"
 #include "tests/support/hexbytes.h"
-#include "tests/support/scriptedanswers.h"
+#include "tests/support/wire/scriptedanswers.h"
 
 #include <obd/iobdproxy.h>
 

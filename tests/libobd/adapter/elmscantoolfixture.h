@@ -1,7 +1,7 @@
 #pragma once
 
 #include "libobd/adapter/elmscantool.h"
-#include "tests/support/elmdialogue.h"
+#include "tests/support/dialogue/elmdialogue.h"
 #include "tests/support/logcapture.h"
 
 #include <gmock/gmock.h>

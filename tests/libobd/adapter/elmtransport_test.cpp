@@ -1,6 +1,6 @@
 #include "libobd/adapter/elmtransport.h"
 #include "tests/support/logcapture.h"
-#include "tests/support/scriptedchannel.h"
+#include "tests/support/wire/scriptedchannel.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>

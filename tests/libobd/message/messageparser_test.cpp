@@ -1,7 +1,7 @@
 #include "libobd/message/messageparser.h"
-#include "tests/support/failingallocation.h"
 #include "tests/support/hexbytes.h"
 #include "tests/support/logcapture.h"
+#include "tests/support/process/failingallocation.h"
 
 #include <gtest/gtest.h>
 

@@ -3,7 +3,7 @@
 #include "libobd/message/messageparser.h"
 #include "tests/support/hexbytes.h"
 #include "tests/support/logcapture.h"
-#include "tests/support/plaincanparser.h"
+#include "tests/support/payload/plaincanparser.h"
 
 #include <gtest/gtest.h>
 

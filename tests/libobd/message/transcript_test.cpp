@@ -1,9 +1,9 @@
 // Feeds every reply of the recorded dialogues that was printed with headers through the way that replies take in the
 // driver, and compares what comes out with payloads that were worked out by hand.
 
-#include "tests/support/dialoguefolder.h"
-#include "tests/support/payloadfile.h"
-#include "tests/support/recordedreply.h"
+#include "tests/support/dialogue/dialoguefolder.h"
+#include "tests/support/dialogue/recordedreply.h"
+#include "tests/support/payload/payloadfile.h"
 
 #include <gtest/gtest.h>
 

@@ -1,7 +1,7 @@
 #include "libobd/module/ecu.h"
 #include "libobd/module/obdproxy.h"
-#include "tests/support/fakedevice.h"
 #include "tests/support/logcapture.h"
+#include "tests/support/wire/fakedevice.h"
 
 #include <gtest/gtest.h>
 

@@ -2,9 +2,9 @@
 
 #include "libobd/module/obdproxy.h"
 #include "libobd/powertrain/fueltrim.h"
-#include "tests/support/fakedevice.h"
 #include "tests/support/hexbytes.h"
 #include "tests/support/logcapture.h"
+#include "tests/support/wire/fakedevice.h"
 
 #include <gtest/gtest.h>
 

@@ -6,7 +6,7 @@
 #include "tests/support/hexbytes.h"
 #include "tests/support/logcapture.h"
 #include "tests/support/parameterclasses.h"
-#include "tests/support/payload.h"
+#include "tests/support/payload/payload.h"
 #include "tests/support/tablefile.h"
 
 #include <obd/parameterfactory.h>

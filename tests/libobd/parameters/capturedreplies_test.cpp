@@ -6,7 +6,7 @@
 #include "libobd/parameters/identificationnumber.h"
 #include "libobd/parameters/monitortestresult.h"
 #include "tests/libobd/parameters/diagnosticsrig.h"
-#include "tests/support/dialoguefolder.h"
+#include "tests/support/dialogue/dialoguefolder.h"
 
 #include <gtest/gtest.h>
 

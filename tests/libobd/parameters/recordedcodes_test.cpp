@@ -4,11 +4,11 @@
 #include "libobd/parameters/cleartroublecodes.h"
 #include "libobd/parameters/dtcparameter.h"
 #include "libobd/powertrain/freezeframetroublecode.h"
-#include "tests/support/dialoguefolder.h"
+#include "tests/support/dialogue/dialoguefolder.h"
 #include "tests/support/dtcrows.h"
 #include "tests/support/fakeecu.h"
 #include "tests/support/hexbytes.h"
-#include "tests/support/payloadfile.h"
+#include "tests/support/payload/payloadfile.h"
 #include "tests/support/tablefile.h"
 
 #include <obd/protocolfamily.h>

@@ -8,9 +8,9 @@
 #include "libobd/parameters/identificationnumber.h"
 #include "libobd/parameters/monitortestresult.h"
 #include "libobd/parameters/performancetracking.h"
-#include "tests/support/dialoguefolder.h"
+#include "tests/support/dialogue/dialoguefolder.h"
+#include "tests/support/dialogue/recordedreply.h"
 #include "tests/support/fakeecu.h"
-#include "tests/support/recordedreply.h"
 #include "tests/support/tablefile.h"
 
 #include <obd/protocolfamily.h>

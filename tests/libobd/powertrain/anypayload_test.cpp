@@ -1,7 +1,7 @@
 #include "tests/support/fakeecu.h"
 #include "tests/support/parameterclasses.h"
-#include "tests/support/payload.h"
-#include "tests/support/payloadproperty.h"
+#include "tests/support/payload/payload.h"
+#include "tests/support/payload/payloadproperty.h"
 #include "tests/support/tablefile.h"
 
 #include <gtest/gtest.h>

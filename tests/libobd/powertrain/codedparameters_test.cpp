@@ -2,7 +2,7 @@
 #include "tests/support/fakeecu.h"
 #include "tests/support/hexbytes.h"
 #include "tests/support/logcapture.h"
-#include "tests/support/payload.h"
+#include "tests/support/payload/payload.h"
 
 #include <gtest/gtest.h>
 

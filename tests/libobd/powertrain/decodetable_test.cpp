@@ -1,7 +1,7 @@
 #include "tests/support/fakeecu.h"
 #include "tests/support/hexbytes.h"
 #include "tests/support/parameterclasses.h"
-#include "tests/support/payload.h"
+#include "tests/support/payload/payload.h"
 #include "tests/support/tablefile.h"
 
 #include <gtest/gtest.h>

@@ -3,8 +3,8 @@
 #include "libobd/powertrain/fuelconsumption.h"
 #include "libobd/powertrain/torque.h"
 #include "tests/support/fakeecu.h"
-#include "tests/support/payload.h"
-#include "tests/support/payloadproperty.h"
+#include "tests/support/payload/payload.h"
+#include "tests/support/payload/payloadproperty.h"
 
 #include <obd/sensorinfo.h>
 

@@ -3,7 +3,7 @@
 #include "tests/support/fakeclock.h"
 #include "tests/support/fakeproxy.h"
 #include "tests/support/logcapture.h"
-#include "tests/support/payload.h"
+#include "tests/support/payload/payload.h"
 
 #include <gtest/gtest.h>
 

@@ -1,7 +1,7 @@
 #include "libobd/powertrain/numericparameters.h"
 #include "tests/support/fakeecu.h"
 #include "tests/support/hexbytes.h"
-#include "tests/support/payload.h"
+#include "tests/support/payload/payload.h"
 
 #include <gtest/gtest.h>
 

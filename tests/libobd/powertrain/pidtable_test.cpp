@@ -1,6 +1,6 @@
 #include "tests/support/fakeecu.h"
 #include "tests/support/parameterclasses.h"
-#include "tests/support/payload.h"
+#include "tests/support/payload/payload.h"
 #include "tests/support/tablefile.h"
 
 #include <obd/sensorinfo.h>

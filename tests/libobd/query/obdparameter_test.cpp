@@ -1,6 +1,6 @@
 #include "libobd/module/obdproxy.h"
-#include "tests/support/fakedevice.h"
 #include "tests/support/logcapture.h"
+#include "tests/support/wire/fakedevice.h"
 
 #include <obd/nack.h>
 #include <obd/obdparameter.h>

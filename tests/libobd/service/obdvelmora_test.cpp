@@ -1,7 +1,7 @@
 #include "libobd/service/baseservice.h"
 #include "libobd/service/velmorainstance.h"
+#include "tests/support/dialogue/elmdialogue.h"
 #include "tests/support/dispatchloop.h"
-#include "tests/support/elmdialogue.h"
 #include "tests/support/fakeclock.h"
 #include "tests/support/logcapture.h"
 #include "tests/support/memorysettings.h"

@@ -1,5 +1,5 @@
 #include "tests/libobd/service/sensorservicefixture.h"
-#include "tests/support/failingallocation.h"
+#include "tests/support/process/failingallocation.h"
 
 #include <cstdlib>
 

@@ -2,7 +2,7 @@
 
 #include "simulator/simulation.h"
 #include "tests/libvelmora/channel/channelrig.h"
-#include "tests/support/peerwire.h"
+#include "tests/support/wire/peerwire.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>

@@ -1,7 +1,7 @@
 #pragma once
 
 #include "libvelmora/channel/fastchannel.h"
-#include "tests/support/scriptedwire.h"
+#include "tests/support/wire/scriptedwire.h"
 
 #include <algorithm>
 #include <memory>

@@ -4,12 +4,12 @@
 
 #include "libvelmora/channel/fastchannel.h"
 #include "simulator/simulation.h"
-#include "tests/support/dialoguefolder.h"
+#include "tests/support/dialogue/dialoguefolder.h"
+#include "tests/support/dialogue/recordeddialogue.h"
 #include "tests/support/fakeclock.h"
 #include "tests/support/memorysettings.h"
-#include "tests/support/peerconnection.h"
-#include "tests/support/peerwire.h"
-#include "tests/support/recordeddialogue.h"
+#include "tests/support/wire/peerconnection.h"
+#include "tests/support/wire/peerwire.h"
 
 #include <obd/iconnectionmanager.h>
 #include <obd/iecu.h>

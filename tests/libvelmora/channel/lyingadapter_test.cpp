@@ -5,7 +5,7 @@
 #include "libobd/message/messageparser.h"
 #include "libvelmora/channel/fastchannel.h"
 #include "tests/libvelmora/channel/channelrig.h"
-#include "tests/support/timedwire.h"
+#include "tests/support/wire/timedwire.h"
 
 #include <obd/obdprotocol.h>
 

@@ -1,5 +1,5 @@
 #include "libvelmora/channel/plainchannel.h"
-#include "tests/support/scriptedwire.h"
+#include "tests/support/wire/scriptedwire.h"
 
 #include <gtest/gtest.h>
 

@@ -3,9 +3,9 @@
 #include "libvelmora/channel/fastchannel.h"
 #include "simulator/simulation.h"
 #include "tests/libvelmora/channel/channelrig.h"
-#include "tests/support/dialoguefolder.h"
-#include "tests/support/peerwire.h"
-#include "tests/support/recordeddialogue.h"
+#include "tests/support/dialogue/dialoguefolder.h"
+#include "tests/support/dialogue/recordeddialogue.h"
+#include "tests/support/wire/peerwire.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>

@@ -5,11 +5,11 @@
 #include "libvelmora/read/vehiclereader.h"
 #include "simulator/simulatedcar.h"
 #include "simulator/simulation.h"
-#include "tests/support/dialoguefolder.h"
-#include "tests/support/peerwire.h"
-#include "tests/support/plainchannel.h"
-#include "tests/support/recordeddialogue.h"
+#include "tests/support/dialogue/dialoguefolder.h"
+#include "tests/support/dialogue/recordeddialogue.h"
 #include "tests/support/temporaryfolder.h"
+#include "tests/support/wire/peerwire.h"
+#include "tests/support/wire/plainchannel.h"
 #include "tests/support/workerclock.h"
 
 #include <velmora/error.h>

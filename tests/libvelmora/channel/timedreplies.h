@@ -1,6 +1,6 @@
 #pragma once
 
-#include "tests/support/scriptedwire.h"
+#include "tests/support/wire/scriptedwire.h"
 
 #include <string>
 

@@ -4,8 +4,8 @@
 #include "libvelmora/replay/recordingfile.h"
 #include "tests/libvelmora/dash/servedpage.h"
 #include "tests/support/fakeecu.h"
-#include "tests/support/httpclient.h"
 #include "tests/support/memorysettings.h"
+#include "tests/support/process/httpclient.h"
 #include "tests/support/temporaryfolder.h"
 
 #include <velmora/error.h>

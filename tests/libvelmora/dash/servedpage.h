@@ -1,7 +1,7 @@
 #pragma once
 
 #include "libvelmora/dash/dashoutput.h"
-#include "tests/support/httpclient.h"
+#include "tests/support/process/httpclient.h"
 #include "tests/support/temporaryfolder.h"
 
 #include <memory>

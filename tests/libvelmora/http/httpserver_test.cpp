@@ -1,5 +1,5 @@
 #include "libvelmora/http/httpserver.h"
-#include "tests/support/httpclient.h"
+#include "tests/support/process/httpclient.h"
 
 #include <velmora/error.h>
 

@@ -1,6 +1,6 @@
 #include "libvelmora/output/eventkinds.h"
 #include "libvelmora/output/mqtt/homestate.h"
-#include "tests/support/discoveryschema.h"
+#include "tests/support/json/discoveryschema.h"
 #include "tests/support/records.h"
 
 #include <gmock/gmock.h>

@@ -1,5 +1,5 @@
-#include "tests/support/broker.h"
-#include "tests/support/discoveryschema.h"
+#include "tests/support/json/discoveryschema.h"
+#include "tests/support/process/broker.h"
 
 #include <velmora/error.h>
 

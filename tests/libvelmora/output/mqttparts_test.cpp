@@ -3,7 +3,7 @@
 #include "libvelmora/output/mqtt/homestate.h"
 #include "libvelmora/output/mqtt/mqttsettings.h"
 #include "libvelmora/output/mqtt/spoolsender.h"
-#include "tests/support/broker.h"
+#include "tests/support/process/broker.h"
 
 #include <velmora/error.h>
 

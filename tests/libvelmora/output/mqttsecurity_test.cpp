@@ -1,4 +1,4 @@
-#include "tests/support/broker.h"
+#include "tests/support/process/broker.h"
 
 #include <velmora/error.h>
 

@@ -1,5 +1,5 @@
 #include "libvelmora/output/mqtt/mqttsettings.h"
-#include "tests/support/broker.h"
+#include "tests/support/process/broker.h"
 
 #include <velmora/error.h>
 

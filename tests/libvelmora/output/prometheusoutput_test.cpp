@@ -1,7 +1,7 @@
 #include "libvelmora/output/metricfamily.h"
 #include "libvelmora/output/prometheusoutput.h"
 #include "libvelmora/report/unitlabel.h"
-#include "tests/support/httpclient.h"
+#include "tests/support/process/httpclient.h"
 #include "tests/support/records.h"
 #include "tests/support/temporaryfolder.h"
 

@@ -1,7 +1,7 @@
 #include "libvelmora/output/mqtt/spoolsender.h"
 #include "libvelmora/output/mqtt/spooltext.h"
-#include "tests/support/broker.h"
-#include "tests/support/smalldisk.h"
+#include "tests/support/process/broker.h"
+#include "tests/support/process/smalldisk.h"
 
 #include <velmora/error.h>
 

@@ -1,6 +1,6 @@
 #include "libvelmora/output/database/sqliteoutput.h"
+#include "tests/support/process/smalldisk.h"
 #include "tests/support/records.h"
-#include "tests/support/smalldisk.h"
 #include "tests/support/temporaryfolder.h"
 
 #include <velmora/error.h>

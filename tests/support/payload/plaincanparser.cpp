@@ -1,4 +1,4 @@
-#include "tests/support/plaincanparser.h"
+#include "tests/support/payload/plaincanparser.h"
 
 #include "libobd/bytes/bytes.h"
 

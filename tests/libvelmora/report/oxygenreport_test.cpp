@@ -7,14 +7,13 @@ namespace {
 
 using namespace velmora;
 using obd::OxygenSensorLocation;
-using Verdict = LimitTest::Verdict;
 
 OxygenReport const oxygen{TopicAnswer::Read,
                           true,
                           false,
                           {{OxygenSensorLocation::Bank1Sensor1,
-                            {{1, "Threshold", "0.450", "", "", "V", Verdict::None},
-                             {5, "Switch time", "0.200", "0.000", "0.160", "s", Verdict::Failed}}},
+                            {{1, "Threshold", "0.450", "", "", "V", LimitTest::Verdict::None},
+                             {5, "Switch time", "0.200", "0.000", "0.160", "s", LimitTest::Verdict::Failed}}},
                            {OxygenSensorLocation::Bank4Sensor2, {}}}};
 
 TEST(OxygenReportView, ShowsSensorsAndTheirTests)

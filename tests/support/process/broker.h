@@ -1,8 +1,8 @@
 #pragma once
 
 #include "libvelmora/output/mqtt/mqttoutput.h"
+#include "tests/support/process/serverprocess.h"
 #include "tests/support/records.h"
-#include "tests/support/serverprocess.h"
 #include "tests/support/temporaryfolder.h"
 
 #include <gtest/gtest.h>

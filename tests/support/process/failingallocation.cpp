@@ -1,4 +1,4 @@
-#include "tests/support/failingallocation.h"
+#include "tests/support/process/failingallocation.h"
 
 #include <atomic>
 #include <cstdlib>

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "tests/support/timedwire.h"
+#include "tests/support/wire/timedwire.h"
 
 #include <deque>
 #include <map>

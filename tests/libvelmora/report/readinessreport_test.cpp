@@ -6,14 +6,14 @@
 namespace {
 
 using namespace velmora;
-using Status = obd::ReadinessMonitorDataModel;
+using Readiness = obd::ReadinessMonitorDataModel;
 
 ReadinessReport const readiness{TopicAnswer::Read,
                                 true,
-                                {{"Misfire", Status::Complete, Status::NotComplete},
-                                 {"Secondary Air System", Status::NotAvailable, Status::NotAvailable},
-                                 {"Catalyst", Status::NotComplete, Status::DisabledThisCycle},
-                                 {"Fuel System", Status::Complete, std::nullopt}}};
+                                {{"Misfire", Readiness::Complete, Readiness::NotComplete},
+                                 {"Secondary Air System", Readiness::NotAvailable, Readiness::NotAvailable},
+                                 {"Catalyst", Readiness::NotComplete, Readiness::DisabledThisCycle},
+                                 {"Fuel System", Readiness::Complete, std::nullopt}}};
 
 TEST(ReadinessReportView, ShowsTheVerdictAndWhatIsNotCompleteFirst)
 {
@@ -29,10 +29,10 @@ TEST(ReadinessReportView, ShowsTheVerdictAndWhatIsNotCompleteFirst)
 TEST(ReadinessReportView, IsReadyWhenAllThatTheVehicleHasIsComplete)
 {
     ReadinessReport const ready{
-        TopicAnswer::Read, false, {{"A", Status::Complete, {}}, {"B", Status::NotAvailable, {}}}};
+        TopicAnswer::Read, false, {{"A", Readiness::Complete, {}}, {"B", Readiness::NotAvailable, {}}}};
     EXPECT_EQ(isReady(ready), true);
     EXPECT_TRUE(toText(ready, Style(true)).find("Readiness      \033[32mready\033[0m\n") != std::string::npos);
-    ReadinessReport const nothing{TopicAnswer::Read, false, {{"B", Status::NotAvailable, {}}}};
+    ReadinessReport const nothing{TopicAnswer::Read, false, {{"B", Readiness::NotAvailable, {}}}};
     EXPECT_EQ(isReady(nothing), std::nullopt);
     EXPECT_EQ(toText(nothing, Style()), "  Lamp           off\n"
                                         "  Readiness      no monitors in this module\n");

@@ -9,7 +9,7 @@ namespace {
 
 using namespace velmora;
 
-TroubleCode const slow{"P0133", "Powertrain", {{"Generic", "Slow"}, {"Ford", "Slower"}}};
+TroubleCode const slowSensor{"P0133", "Powertrain", {{"Generic", "Slow"}, {"Ford", "Slower"}}};
 TroubleCode const lean{"P0171", "Powertrain", {{"Generic", "Lean"}}};
 
 ModuleReport module(unsigned int id, std::string const& name)
@@ -24,7 +24,7 @@ CodeList list(CodeKind kind, std::vector<TroubleCode> const& codes)
     return {kind, CodeList::Answer::Read, {}, codes};
 }
 
-LimitTest test(std::string const& description, LimitTest::Verdict verdict)
+LimitTest monitorTest(std::string const& description, LimitTest::Verdict verdict)
 {
     return {1, description, "1", "0", "2", "", verdict};
 }
@@ -40,7 +40,7 @@ TEST(Findings, AreNoneForAHealthyVehicle)
         {{"Catalyst", ReadinessStatus::Complete, {}}, {"EGR", ReadinessStatus::NotAvailable, {}}}};
     report.modules[0].monitors = {
         TopicAnswer::Read,
-        {{1, "A", {test("B", LimitTest::Verdict::Passed), test("C", LimitTest::Verdict::NoResult)}}}};
+        {{1, "A", {monitorTest("B", LimitTest::Verdict::Passed), monitorTest("C", LimitTest::Verdict::NoResult)}}}};
     EXPECT_TRUE(findings(report).empty());
     EXPECT_EQ(toText(findings(report), Style()), "Findings\n  none in what the vehicle told\n");
 }
@@ -49,10 +49,10 @@ TEST(Findings, TellACodeOnceWithItsKinds)
 {
     VehicleReport report;
     report.modules = {module(0x7E8, "ECM"), module(0x7E9, "")};
-    report.modules[0].codes = {
-        true,
-        {list(CodeKind::Confirmed, {slow, lean}), list(CodeKind::Pending, {lean}), list(CodeKind::Permanent, {slow})}};
-    report.modules[1].codes = {false, {list(CodeKind::Pending, {slow})}};
+    report.modules[0].codes = {true,
+                               {list(CodeKind::Confirmed, {slowSensor, lean}), list(CodeKind::Pending, {lean}),
+                                list(CodeKind::Permanent, {slowSensor})}};
+    report.modules[1].codes = {false, {list(CodeKind::Pending, {slowSensor})}};
     EXPECT_EQ(toText(findings(report), Style()), "Findings\n"
                                                  "  7E8 ECM  lamp                  the malfunction indicator is on\n"
                                                  "  7E8 ECM  confirmed, permanent  P0133 Slow\n"
@@ -67,12 +67,14 @@ TEST(Findings, TellFailedTestsAndWhatIsNotComplete)
     report.modules[0].readiness = {TopicAnswer::Read, false, {{"Catalyst", ReadinessStatus::NotComplete, {}}}};
     report.modules[0].monitors = {
         TopicAnswer::Read,
-        {{1, "Monitor", {test("Count", LimitTest::Verdict::Failed), test("C", LimitTest::Verdict::Passed)}}}};
+        {{1,
+          "Monitor",
+          {monitorTest("Count", LimitTest::Verdict::Failed), monitorTest("C", LimitTest::Verdict::Passed)}}}};
     report.modules[0].oxygen = {
         TopicAnswer::Read,
         true,
         false,
-        {{obd::OxygenSensorLocation::Bank1Sensor2, {test("Voltage", LimitTest::Verdict::Failed)}}}};
+        {{obd::OxygenSensorLocation::Bank1Sensor2, {monitorTest("Voltage", LimitTest::Verdict::Failed)}}}};
     EXPECT_EQ(toText(findings(report), Style()), "Findings\n"
                                                  "  10 ECM  failed test   Monitor: Count\n"
                                                  "  10 ECM  failed test   Bank 1 sensor 2: Voltage\n"
@@ -121,7 +123,7 @@ TEST(Findings, AreMarkedByWeight)
 {
     VehicleReport report;
     report.modules = {module(0x7E8, "ECM")};
-    report.modules[0].codes = {true, {list(CodeKind::Confirmed, {slow}), list(CodeKind::Pending, {lean})}};
+    report.modules[0].codes = {true, {list(CodeKind::Confirmed, {slowSensor}), list(CodeKind::Pending, {lean})}};
     std::vector<Finding> const found = findings(report);
     ASSERT_EQ(found.size(), 3U);
     EXPECT_EQ(found[0].severity, Severity::Bad);

@@ -1,4 +1,4 @@
-#include "tests/support/recordedreply.h"
+#include "tests/support/dialogue/recordedreply.h"
 
 #include "libobd/adapter/elmtransport.h"
 #include "libobd/adapter/proxyerror.h"

@@ -1,4 +1,4 @@
-#include "tests/support/jsonschema.h"
+#include "tests/support/json/jsonschema.h"
 
 #include "tests/support/temporaryfolder.h"
 
@@ -41,7 +41,7 @@ std::string schemaErrors(std::string const& document, std::string const& definit
     testsupport::TemporaryFolder const folder;
     std::filesystem::path const file = folder.path() / "document.json";
     std::ofstream(file) << document;
-    return outputOf("python3 " + quoted(source / "tests/support/validatejson.py") + " " +
+    return outputOf("python3 " + quoted(source / "tests/support/json/validatejson.py") + " " +
                     quoted(source / "docs/json.schema.json") + " " + definition + " " + quoted(file));
 }
 

@@ -7,7 +7,7 @@ namespace {
 
 using namespace velmora;
 
-InfoReport fullReport()
+InfoReport fullInfo()
 {
     InfoReport report;
     report.description = "Engine Control";
@@ -24,16 +24,16 @@ InfoReport fullReport()
 
 TEST(InfoReportView, ShowsWhatTheModuleTells)
 {
-    EXPECT_EQ(toText(fullReport(), Style()), "  Description    Engine Control\n"
-                                             "  Standard       EOBD\n"
-                                             "  Protocol       ISO 15765-4\n"
-                                             "  VIN            VELMRAS1MM0000001\n"
-                                             "  Calibration    VS16-MT-0420  verification 1791BC82\n"
-                                             "                 VS16-2\n"
-                                             "  Engine number  E123\n"
-                                             "  Type approval  R49\n"
-                                             "  With lamp on   engine ran 35 min\n"
-                                             "  Since cleared  640 km, engine ran 900 min\n");
+    EXPECT_EQ(toText(fullInfo(), Style()), "  Description    Engine Control\n"
+                                           "  Standard       EOBD\n"
+                                           "  Protocol       ISO 15765-4\n"
+                                           "  VIN            VELMRAS1MM0000001\n"
+                                           "  Calibration    VS16-MT-0420  verification 1791BC82\n"
+                                           "                 VS16-2\n"
+                                           "  Engine number  E123\n"
+                                           "  Type approval  R49\n"
+                                           "  With lamp on   engine ran 35 min\n"
+                                           "  Since cleared  640 km, engine ran 900 min\n");
 }
 
 TEST(InfoReportView, DashesStandForWhatIsNotTold)
@@ -63,7 +63,7 @@ TEST(InfoReportView, CalibrationsArePairedInTheirOrder)
 
 TEST(InfoReportView, JsonHasNullForWhatIsNotTold)
 {
-    EXPECT_EQ(toJsonValue(fullReport()), Json::parse(R"({
+    EXPECT_EQ(toJsonValue(fullInfo()), Json::parse(R"({
         "description": "Engine Control", "standard": "EOBD", "protocol": "ISO 15765-4", "vin": "VELMRAS1MM0000001",
         "calibrations": [{"id": "VS16-MT-0420", "verification": "1791BC82"}, {"id": "VS16-2", "verification": null}],
         "engineSerialNumber": "E123", "erotan": "R49",

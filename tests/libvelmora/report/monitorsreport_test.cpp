@@ -6,14 +6,14 @@
 namespace {
 
 using namespace velmora;
-using Verdict = LimitTest::Verdict;
 
-MonitorsReport const report{TopicAnswer::Read,
-                            {{0x01, "Sensor 1", {{0x81, "Amplitude", "0.450", "0.400", "", "V", Verdict::Passed}}},
-                             {0xA2,
-                              "Misfire",
-                              {{0x0B, "Average", "0", "", "", "", Verdict::NoResult},
-                               {0x0C, "Count", "900", "0", "80", "", Verdict::Failed}}}}};
+MonitorsReport const report{
+    TopicAnswer::Read,
+    {{0x01, "Sensor 1", {{0x81, "Amplitude", "0.450", "0.400", "", "V", LimitTest::Verdict::Passed}}},
+     {0xA2,
+      "Misfire",
+      {{0x0B, "Average", "0", "", "", "", LimitTest::Verdict::NoResult},
+       {0x0C, "Count", "900", "0", "80", "", LimitTest::Verdict::Failed}}}}};
 
 TEST(MonitorsReportView, ShowsFailedTestsFirst)
 {
@@ -30,7 +30,7 @@ TEST(MonitorsReportView, HeadingsOfNumbersStandOverTheirEnds)
 {
     MonitorsReport const wide{
         TopicAnswer::Read,
-        {{0x21, "A", {{0x81, "B", "1.00000000", "2.00000000", "3.00000000", "V", Verdict::Passed}}}}};
+        {{0x21, "A", {{0x81, "B", "1.00000000", "2.00000000", "3.00000000", "V", LimitTest::Verdict::Passed}}}}};
     EXPECT_EQ(toText(wide, Style()), "  Monitor tests  1 passed\n"
                                      "      Result  Test       Value     Minimum     Maximum  Unit  Description\n"
                                      "    21 A\n"

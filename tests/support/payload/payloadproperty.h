@@ -1,6 +1,6 @@
 #pragma once
 
-#include "tests/support/payload.h"
+#include "tests/support/payload/payload.h"
 
 #include <obd/sensorinfo.h>
 

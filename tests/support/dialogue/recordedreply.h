@@ -1,6 +1,6 @@
 #pragma once
 
-#include "tests/support/recordeddialogue.h"
+#include "tests/support/dialogue/recordeddialogue.h"
 
 #include <obd/obdprotocol.h>
 #include <obd/responsemap.h>

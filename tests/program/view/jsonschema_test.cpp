@@ -14,7 +14,7 @@
 #include "program/view/live/livelines.h"
 #include "program/view/timetext.h"
 #include "program/view/trafficlog.h"
-#include "tests/support/jsonschema.h"
+#include "tests/support/json/jsonschema.h"
 
 #include <gtest/gtest.h>
 

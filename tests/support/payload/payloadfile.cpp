@@ -1,4 +1,4 @@
-#include "tests/support/payloadfile.h"
+#include "tests/support/payload/payloadfile.h"
 
 #include "tests/support/hexbytes.h"
 

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "tests/support/scriptedchannel.h"
+#include "tests/support/wire/scriptedchannel.h"
 
 #include <string>
 

@@ -1,4 +1,4 @@
-#include "tests/support/recordeddialogue.h"
+#include "tests/support/dialogue/recordeddialogue.h"
 
 #include <fstream>
 #include <stdexcept>
