@@ -55,6 +55,12 @@ std::vector<std::string> const& outputForms()
     return hints;
 }
 
+bool writesFiles(std::string_view kind)
+{
+    static constexpr std::array<std::string_view, 5> kinds = {"csv", "csv-long", "ndjson", "influx", "sqlite"};
+    return std::ranges::find(kinds, kind) != kinds.end();
+}
+
 [[noreturn]] void rejectOutput(std::string const& text, std::string const& why)
 {
     throw Error(ErrorKind::WrongUse, "\"" + text + "\" is no output: " + why, outputForms());
@@ -106,6 +112,15 @@ OutputAddress parseOutputAddress(std::string const& text)
     return address;
 }
 
+// As an absolute path no name of a file reads as standard output, or as a host's.
+OutputAddress fileOutput(std::string const& kind, std::filesystem::path const& file)
+{
+    if (!writesFiles(kind)) {
+        throw Error(ErrorKind::WrongUse, "\"" + kind + "\" is no kind of output that writes files", outputForms());
+    }
+    return {kind, std::filesystem::absolute(file).string(), {}};
+}
+
 void addOption(OutputAddress& address, std::string const& key, std::string const& value)
 {
     std::vector<std::string_view> keys = findKind(address.kind)->keys;
@@ -131,10 +146,7 @@ std::string toString(OutputAddress const& address)
 
 void requirePlainTarget(OutputAddress const& address)
 {
-    static std::array<std::string_view, 5> const files = {"csv", "csv-long", "ndjson", "influx", "sqlite"};
-    bool const isFile = std::ranges::find(files, address.kind) != files.end() && address.target != "-" &&
-                        !address.target.starts_with("udp://");
-    if (isFile) {
+    if (writesFiles(address.kind) && address.target != "-" && !address.target.starts_with("udp://")) {
         requirePlainFile(address.target);
     }
 }

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <filesystem>
 #include <map>
 #include <string>
 
@@ -18,6 +19,9 @@ struct OutputAddress
 
 // Throws Error that tells what is wrong. Passwords are no options, so the text may be shown.
 OutputAddress parseOutputAddress(std::string const& text);
+
+// The address of a file, whatever characters its path has. Throws Error for a kind that writes no files.
+OutputAddress fileOutput(std::string const& kind, std::filesystem::path const& file);
 
 // Adds one more option. Throws Error if the kind does not know it.
 void addOption(OutputAddress& address, std::string const& key, std::string const& value);

@@ -47,6 +47,13 @@ void SettingsFile::set(std::string const& name, std::string const& value)
     m_store->sync();
 }
 
+std::vector<std::string> SettingsFile::unknownKeys() const
+{
+    std::vector<std::string> keys = m_store->keysBelow({});
+    std::erase_if(keys, isKnownKey);
+    return keys;
+}
+
 std::optional<std::string> SettingsFile::text(std::string const& key) const
 {
     std::string text;

@@ -186,6 +186,32 @@ void setSetting(VehicleSetting const& setting, std::string const& text, obd::ISe
     store.setInt(setting.key, *stored);
 }
 
+bool isKnownKey(std::string_view key)
+{
+    static constexpr std::string_view others[] = {
+        "common/language",
+        "connection/bt/address",
+        "connection/bt/name",
+        "connection/bt/port",
+        "connection/bus",
+        "connection/protocol",
+        "connection/serial/autobaudrate",
+        "connection/serial/baudrate",
+        "connection/serial/description",
+        "connection/serial/device",
+        "connection/serial/initialbaudrate",
+        "connection/tcp/address",
+        "connection/tcp/port",
+        "velmora/foundport",
+        "velmora/port",
+    };
+    static constexpr std::string_view groups[] = {"bluetooth/", "limit/"};
+    return std::ranges::find(others, key) != std::end(others) ||
+           std::ranges::find(allSettings, key, [](VehicleSetting const& each) { return std::string_view(each.key); }) !=
+               std::end(allSettings) ||
+           std::ranges::any_of(groups, [key](std::string_view group) { return key.starts_with(group); });
+}
+
 bool storedHundredths(std::string const& key, double number, int& value)
 {
     auto const* const found =

@@ -4,6 +4,7 @@
 
 #include <span>
 #include <string>
+#include <string_view>
 
 namespace velmora {
 
@@ -42,6 +43,9 @@ std::string storedRange(VehicleSetting const& setting);
 
 // Sets it from what a person typed, without bringing it to the disk. Throws Error that tells the range.
 void setSetting(VehicleSetting const& setting, std::string const& text, obd::ISettings& store);
+
+// Whether the library or the companion reads a key of the settings file. Others are mistyped, or an application's.
+bool isKnownKey(std::string_view key);
 
 // The hundredths that a number with a point stands for, where a key is stored in hundredths. False for any other key,
 // and for a number that no int holds.

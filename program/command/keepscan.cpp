@@ -29,9 +29,6 @@ void addKeepOptions(CLI::App& command, KeepWish& wish)
 
 namespace {
 
-constexpr char const* keepKey = "history/keep";
-constexpr char const* nameKey = "history/vehicle";
-
 bool hasTerminal()
 {
     return ::isatty(STDIN_FILENO) != 0 && ::isatty(STDERR_FILENO) != 0;
@@ -40,7 +37,7 @@ bool hasTerminal()
 void remember(SettingsFile& settings, bool keep)
 {
     try {
-        settings.setNumber(keepKey, keep ? 1 : 0);
+        settings.setNumber(historyKeepKey, keep ? 1 : 0);
     } catch (Error const& error) {
         tell(fmt::format("velmora: the answer is not remembered: {}\n", error.what()));
     }
@@ -71,9 +68,9 @@ bool decidesToKeep(KeepWish& wish, GlobalOptions const& options)
     }
     SettingsFile settings(options.settingsFile);
     if (wish.vehicle.empty()) {
-        wish.vehicle = settings.text(nameKey).value_or(std::string());
+        wish.vehicle = settings.text(historyNameKey).value_or(std::string());
     }
-    std::optional<int> const kept = settings.number(keepKey);
+    std::optional<int> const kept = settings.number(historyKeepKey);
     if (wish.keep || kept) {
         return wish.keep || *kept != 0;
     }

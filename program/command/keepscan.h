@@ -12,6 +12,10 @@
 
 namespace velmora::cli {
 
+// What the settings file keeps of it.
+inline constexpr char const* historyKeepKey = "history/keep";
+inline constexpr char const* historyNameKey = "history/vehicle";
+
 struct KeepWish
 {
     bool keep = false;

@@ -67,7 +67,8 @@ void addRecordCommand(CommandLine& commandLine)
     CLI::App* const command =
         commandLine.addCommand("record", "Make the report of scan and save the dialogue for replay:FILE",
                                [chosen](GlobalOptions const& options) { return record(*chosen, options); });
-    command->add_option("FILE", chosen->file, "File to write, which must not stand yet")->required();
+    command->add_option("FILE", chosen->file, "File to write once the connection is closed; it must not stand yet")
+        ->required();
     command->add_option("--vehicle", chosen->vehicle, "What to say of the vehicle in the file")->type_name("WORDS");
     command->add_flag("--keep-vin", chosen->keepVin,
                       "Keep the whole vehicle identification number; otherwise its last six characters become 0");

@@ -1,5 +1,6 @@
 #include "common/text/layout.h"
 #include "program/command/commands.h"
+#include "program/command/keepscan.h"
 #include "program/commandline.h"
 #include "program/terminal/output.h"
 #include "program/view/json.h"
@@ -68,6 +69,16 @@ std::string withUnit(Setting const& setting, std::string const& value)
     return setting.unit.empty() ? value : value + " " + setting.unit;
 }
 
+// A mistyped key looks as if it were set.
+void tellUnknownKeys(SettingsFile const& file, GlobalOptions const& options)
+{
+    std::vector<std::string> keys = file.unknownKeys();
+    std::erase_if(keys, [](std::string const& key) { return key == historyKeepKey || key == historyNameKey; });
+    if (!keys.empty() && !options.quiet) {
+        tellText(fmt::format("Nothing reads {} in {}\n", fmt::join(keys, ", "), file.path()));
+    }
+}
+
 void list(SettingsFile const& file, GlobalOptions const& options)
 {
     SensorLimits const limits(options.settingsFile);
@@ -110,6 +121,7 @@ ExitCode settings(SettingsOptions const& chosen, GlobalOptions const& options)
     SettingsFile file(options.settingsFile);
     if (chosen.name.empty()) {
         list(file, options);
+        tellUnknownKeys(file, options);
         return ExitCode::Done;
     }
     if (chosen.name.starts_with(limitPrefix)) {

@@ -15,7 +15,7 @@ public:
     // Begins it. vehicle: its name in the database. Throws Error if the file can't be written, and in a build without
     // the output sqlite.
     LiveRecord(std::filesystem::path file, std::string vehicle)
-        : m_file(std::move(file)), m_output("sqlite:" + m_file.string(), std::move(vehicle))
+        : m_file(std::move(file)), m_output("sqlite", m_file, std::move(vehicle))
     {}
 
     void take(Reading const& reading) { m_output.write(reading); }

@@ -193,6 +193,10 @@ TEST(Trouble, SettingsSurviveAKillWhole)
         EXPECT_TRUE(text == "[common]\nvehicleweight = 1111\n" || text == "[common]\nvehicleweight = 2222\n") << text;
     }
     EXPECT_EQ(runVelmora({"--settings", file, "settings", "weight"}).exitCode, 0);
+    std::ofstream(file) << "[common]\nvehicleweigth = 1111\n[history]\nkeep = 0\nvehicle = 'van'\nkept = 1\n";
+    Outcome const listed = runVelmora({"--settings", file, "settings"});
+    EXPECT_EQ(listed.exitCode, 0);
+    EXPECT_EQ(listed.err, "Nothing reads common/vehicleweigth, history/kept in " + file + "\n");
 }
 
 TEST(Trouble, AFullDiskUnderTheSimulatorsTraceIsExitCodeOne)

@@ -4,6 +4,7 @@
 #include <velmora/health.h>
 #include <velmora/reading.h>
 
+#include <filesystem>
 #include <memory>
 #include <string>
 
@@ -21,6 +22,9 @@ public:
     /// vehicle: its name in the output, in the place of that of the readings unless it is empty. Throws Error if the
     /// address makes no sense, names a kind that this build lacks or a page, or the output refuses its settings.
     ReadingOutput(std::string const& address, std::string vehicle);
+    /// The same for a file whatever its path holds: in an address a question mark would begin settings. kind is one
+    /// that writes files: "sqlite", "csv". Throws Error for any other.
+    ReadingOutput(std::string const& kind, std::filesystem::path const& file, std::string vehicle);
     /// Writes what is queued; an output that hangs is waited for.
     ~ReadingOutput();
     ReadingOutput(ReadingOutput const&) = delete;

@@ -47,6 +47,10 @@ public:
     /// From what a person typed. Throws Error that tells the names, or the range, or that the file can't be written.
     void set(std::string const& name, std::string const& value);
 
+    /// The keys of the file that neither library nor companion reads: mistyped ones, and what applications keep there
+    /// of their own.
+    std::vector<std::string> unknownKeys() const;
+
     /// What an application keeps there of its own, by keys such as "live/vehicle" that name a group and a value in it;
     /// nothing where there is none.
     std::optional<std::string> text(std::string const& key) const;

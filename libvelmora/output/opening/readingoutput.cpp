@@ -16,22 +16,28 @@ struct ReadingOutput::Parts
         std::string text; // protected by mutex
     };
 
+    Parts(OutputAddress const& address, std::string name) : vehicle(std::move(name))
+    {
+        auto const tell = [notice = notice](std::string const& text) {
+            std::lock_guard const lock(notice->mutex);
+            notice->text = text;
+        };
+        runner = std::make_unique<OutputRunner>(toString(address), makeOutput(address, {}), tell);
+        runner->start();
+    }
+
     std::string vehicle;
     std::shared_ptr<Notice> notice = std::make_shared<Notice>(); // the output's thread's, too
     std::unique_ptr<OutputRunner> runner;
 };
 
-ReadingOutput::ReadingOutput(std::string const& address, std::string vehicle) : m_parts(std::make_unique<Parts>())
-{
-    m_parts->vehicle = std::move(vehicle);
-    OutputAddress const parsed = parseOutputAddress(address);
-    auto const tell = [notice = m_parts->notice](std::string const& text) {
-        std::lock_guard const lock(notice->mutex);
-        notice->text = text;
-    };
-    m_parts->runner = std::make_unique<OutputRunner>(toString(parsed), makeOutput(parsed, {}), tell);
-    m_parts->runner->start();
-}
+ReadingOutput::ReadingOutput(std::string const& address, std::string vehicle)
+    : m_parts(std::make_unique<Parts>(parseOutputAddress(address), std::move(vehicle)))
+{}
+
+ReadingOutput::ReadingOutput(std::string const& kind, std::filesystem::path const& file, std::string vehicle)
+    : m_parts(std::make_unique<Parts>(fileOutput(kind, file), std::move(vehicle)))
+{}
 
 ReadingOutput::~ReadingOutput() = default;
 

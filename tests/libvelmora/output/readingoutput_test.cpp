@@ -38,6 +38,17 @@ TEST(ReadingOutput, WritesUnderTheVehiclesName)
     EXPECT_NE(folder.read("plain").find("\"vehicle\":\"unnamed\""), std::string::npos) << folder.read("plain");
 }
 
+TEST(ReadingOutput, AFileMayHaveAnyName)
+{
+    TemporaryFolder const folder;
+    for (std::string const name : {"a?rotate=day", "-", "udp:"}) {
+        ReadingOutput("ndjson", folder.file(name), "van").write(rpmOfNow());
+        EXPECT_NE(folder.read(name).find("\"vehicle\":\"van\""), std::string::npos) << name;
+    }
+    EXPECT_THROW(ReadingOutput("mqtt", folder.file("topic"), "van"), Error);
+    EXPECT_THROW(ReadingOutput("pigeon", folder.file("coop"), "van"), Error);
+}
+
 TEST(ReadingOutput, TellsWhatIsWrong)
 {
     EXPECT_NE(ReadingOutput("ndjson:/nowhere/at/all", "van").trouble(), "");

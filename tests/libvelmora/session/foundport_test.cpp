@@ -48,6 +48,24 @@ TEST(FoundPort, IsRememberedAndTriedFirstTheNextTime)
     EXPECT_THROW(findAdapterAgain(search, settings), Error) << "it is plugged in no more";
 }
 
+TEST(FoundPort, WhatIsNoPortIsToldAndReplaced)
+{
+    test::ScriptedDevice const adapter("ELM327 v1.5\r\r>", B38400);
+    testsupport::TemporaryFolder const folder;
+    std::filesystem::path const settings = folder.path() / "settings.toml";
+    std::ofstream(settings) << "[velmora]\nfoundport = \"nonsense here\"\n";
+    std::string told;
+    PortSearch search;
+    search.ports = {{adapter.path(), ""}};
+    search.tell = [&told](std::string const& line) { told += line; };
+    EXPECT_EQ(findAdapterAgain(search, settings), PortAddress(SerialAddress{adapter.path(), 38400}));
+    EXPECT_NE(told.find("settings.toml is left out: "), std::string::npos) << told;
+    EXPECT_NE(told.find("nonsense here"), std::string::npos) << told;
+    told.clear();
+    EXPECT_EQ(findAdapterAgain(search, settings), PortAddress(SerialAddress{adapter.path(), 38400}));
+    EXPECT_EQ(told, tryingText(adapter.path(), 38400)) << "the new one is remembered in its place";
+}
+
 TEST(FoundPort, WhatCanNotBeRememberedIsToldAndUsed)
 {
     test::ScriptedDevice const adapter("ELM327 v1.5\r\r>", B38400);

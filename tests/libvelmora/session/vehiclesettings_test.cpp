@@ -2,15 +2,19 @@
 #include "libvelmora/session/vehiclesettings.h"
 #include "libvelmora/vehicle/units.h"
 #include "tests/support/memorysettings.h"
+#include "tests/support/temporaryfolder.h"
 
+#include <obd/iconnectionoptions.h>
 #include <obd/iobdvelmora.h>
 #include <obd/ivelmorasettings.h>
 #include <obd/obdvelmorabuilder.h>
 #include <velmora/error.h>
 #include <velmora/settings.h>
+#include <velmora/settingsfile.h>
 
 #include <gtest/gtest.h>
 
+#include <fstream>
 #include <set>
 
 namespace {
@@ -110,6 +114,28 @@ TEST_F(VehicleSettings, WhatReadsAsTheDefaultShowsAsTheDefault)
     EXPECT_EQ(shown("ignition"), "spark");
     EXPECT_EQ(shown("displacement"), "50.00") << "which the library takes";
     EXPECT_FLOAT_EQ(m_library.engineDisplacement(), 50.0F);
+}
+
+// Whatever the library writes of itself is known, and what a finger slipped on is not.
+TEST_F(VehicleSettings, KeysThatNothingReadsAreFound)
+{
+    m_library.setLanguage(1);
+    m_library.connectionOptions()->addBluetoothDevice({"OBDII", "00:1D:A5:68:98:8B", 1});
+    m_library.connectionOptions()->save();
+    for (VehicleSetting const& setting : vehicleSettings()) {
+        m_store->setInt(setting.key, setting.lowest);
+    }
+    EXPECT_GT(m_store->writes().size(), 20U);
+    for (std::string const& write : m_store->writes()) {
+        EXPECT_TRUE(isKnownKey(write.substr(0, write.find('=')))) << write;
+    }
+    testsupport::TemporaryFolder const folder;
+    std::string const file = folder.file("settings.toml");
+    std::ofstream(file) << "displacement = 160\n[common]\nenginedisplacment = 160\nvehicleweight = 1400\n"
+                           "[connection]\nprotocl = 6\n[limit]\nRPM = 6000\n[velmora]\nport = 'sim:'\n";
+    EXPECT_EQ(SettingsFile(file).unknownKeys(),
+              (std::vector<std::string>{"common/enginedisplacment", "connection/protocl", "displacement"}));
+    EXPECT_TRUE(SettingsFile(folder.file("none.toml")).unknownKeys().empty());
 }
 
 } // namespace

@@ -79,11 +79,11 @@ TEST_F(LiveFiles, ARecordingIsADatabaseOfTheWatch)
     reading.value = 1726.0;
     reading.unit = "rpm";
     {
-        LiveRecord record(folder / "live.db", "vehicle-1");
+        LiveRecord record(folder / "li?ve.db", "vehicle-1");
         record.take(reading);
         EXPECT_EQ(record.trouble(), "");
     }
-    Database database((folder / "live.db").string());
+    Database database((folder / "li?ve.db").string());
     EXPECT_EQ(database.number("SELECT value FROM reading"), 1726);
     EXPECT_EQ(database.number("SELECT count(*) FROM sensor WHERE vehicle = 'vehicle-1' AND key = 'RPM'"), 1);
     EXPECT_NE(LiveRecord("/nowhere/at/all.db", "x").trouble(), "");
