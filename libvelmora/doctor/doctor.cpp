@@ -5,6 +5,7 @@
 #include "libvelmora/doctor/vehiclecheck.h"
 #include "libvelmora/port/opening/openport.h"
 #include "libvelmora/port/recordedport.h"
+#include "libvelmora/record/macmask.h"
 #include "libvelmora/record/vinmask.h"
 
 #include <velmora/error.h>
@@ -124,8 +125,9 @@ std::string makeBundle(DoctorReport const& report, Session const& session, Dialo
     if (!keepVin) {
         maskVins(dialogue);
     }
-    return fmt::format("Velmora {} on {}\n\n{}\nSettings\n\n{}\nDialogue\n\n{}", versionText, systemText(),
-                       toText(report), harmlessSettings(session.settingsFile()), obdsim::formatDialogue(dialogue));
+    return withoutMacs(fmt::format("Velmora {} on {}\n\n{}\nSettings\n\n{}\nDialogue\n\n{}", versionText, systemText(),
+                                   toText(report), harmlessSettings(session.settingsFile()),
+                                   obdsim::formatDialogue(dialogue)));
 }
 
 } // namespace velmora

@@ -10,6 +10,7 @@
 
 #include <algorithm>
 #include <iterator>
+#include <string_view>
 
 namespace velmora {
 
@@ -47,6 +48,35 @@ std::string joined(std::string const& name)
     return fmt::format("{}", fmt::join(catalogueWords(name), ""));
 }
 
+// What people call makers otherwise: short names, brands whose codes are their group's, and names whose letters with
+// accents no word of the catalogue has. As joined makes them.
+std::string_view otherName(std::string_view name)
+{
+    struct Other
+    {
+        std::string_view name;
+        std::string_view maker;
+    };
+    static constexpr Other names[] = {
+        {"alfa", "Alfa Romeo"},
+        {"benz", "Mercedes-Benz"},
+        {"chevrolet", "GM"},
+        {"chevy", "GM"},
+        {"citron", "Citroen"},
+        {"generalmotors", "GM"},
+        {"gmc", "GM"},
+        {"infiniti", "Infinity"},
+        {"koda", "Skoda"},
+        {"mb", "Mercedes-Benz"},
+        {"mercedes", "Mercedes-Benz"},
+        {"olds", "Oldsmobile"},
+        {"rangerover", "Land Rover"},
+        {"vw", "Volkswagen"},
+    };
+    auto const* const found = std::ranges::find(names, name, &Other::name);
+    return found != std::end(names) ? found->maker : name;
+}
+
 bool holdsAll(std::vector<std::string> const& words, std::vector<std::string> const& wanted)
 {
     return std::all_of(wanted.begin(), wanted.end(), [&words](std::string const& start) {
@@ -70,9 +100,9 @@ std::vector<std::string> catalogueMakers()
 std::string findMaker(std::string const& name)
 {
     std::vector<std::string> const names = catalogueMakers();
-    auto const found = std::find_if(names.begin(), names.end(), [&name](std::string const& candidate) {
-        return joined(candidate) == joined(name);
-    });
+    std::string const wanted = joined(std::string(otherName(joined(name))));
+    auto const found = std::find_if(names.begin(), names.end(),
+                                    [&wanted](std::string const& candidate) { return joined(candidate) == wanted; });
     if (found == names.end()) {
         throw Error(ErrorKind::WrongUse, "The catalogue has no maker \"" + name + "\"",
                     {fmt::format("these it has: {}", fmt::join(names, ", "))});

@@ -45,8 +45,8 @@ VELMORA_EXPORT TroubleCode explain(std::string const& code, std::string const& m
 
 /// The makers of the catalogue, as it writes them.
 VELMORA_EXPORT std::vector<std::string> catalogueMakers();
-/// The maker's name as the catalogue writes it, from one in any case and without its blanks or hyphens. Throws Error
-/// with the list of makers if there is none.
+/// The maker's name as the catalogue writes it, from one in any case and without its blanks or hyphens, or from a
+/// common other one: "VW", "Mercedes", "Chevy". Throws Error with the list of makers if there is none.
 VELMORA_EXPORT std::string findMaker(std::string const& name);
 
 /// The rows whose text or code has, for each of the words, a word that begins with it, in any order and case; all rows

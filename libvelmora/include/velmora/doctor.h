@@ -27,7 +27,8 @@ public:
     std::string toText() const; ///< the report for people
     std::string toJson() const; ///< the object of docs/json.md
     /// One text to attach to a question: the report, versions, settings without what is secret, and all that passed the
-    /// port, with zeros for the last six characters of a vehicle identification number unless keepVin.
+    /// port, with zeros for the last six characters of a vehicle identification number unless keepVin. Of Bluetooth
+    /// addresses it has the half that tells the maker.
     std::string bundle(bool keepVin = false) const;
 
     /// Whether saveBundle could write that file, which can be told before a minute is spent with the vehicle. Throws

@@ -163,12 +163,15 @@ TEST_F(DoctorTest, AHealthyChainIsMeasured)
 
 TEST_F(DoctorTest, TheBundleKeepsTheVinOnlyWhenTold)
 {
-    std::ofstream(m_settings) << "[mqtt]\npassword = \"hunter2\"\n[common]\nunitsystem = 1\n";
+    std::ofstream(m_settings) << "[mqtt]\npassword = \"hunter2\"\n[common]\nunitsystem = 1\n"
+                                 "[bluetooth.1]\naddress = \"00:1D:A5:68:98:8B\"\n";
     examine("sim:petrol-can11?instant", "masked");
     std::string const masked = m_bundle;
     examine("sim:petrol-can11?instant", "with VIN");
     EXPECT_EQ(masked.find("hunter2"), std::string::npos);
     EXPECT_NE(masked.find("unitsystem"), std::string::npos);
+    EXPECT_NE(masked.find("00:1D:A5:xx:xx:xx"), std::string::npos) << masked;
+    EXPECT_EQ(m_bundle.find("68:98:8B"), std::string::npos) << "whatever is told of the VIN";
     // The number ends in 000001.
     EXPECT_EQ(masked.find("303030303031"), std::string::npos);
     EXPECT_NE(masked.find("303030303030"), std::string::npos);

@@ -53,6 +53,16 @@ TEST(CatalogueSelection, FindsAMakerHoweverItIsWritten)
     EXPECT_EQ(findMaker("LANDROVER"), "Land Rover");
     EXPECT_EQ(findMaker("mercedes benz"), "Mercedes-Benz");
     EXPECT_EQ(findMaker("volvo"), "Volvo");
+    EXPECT_EQ(findMaker("VW"), "Volkswagen");
+    EXPECT_EQ(findMaker("Mercedes"), "Mercedes-Benz");
+    EXPECT_EQ(findMaker("chevy"), "GM");
+    EXPECT_EQ(findMaker("General Motors"), "GM");
+    EXPECT_EQ(findMaker("Infiniti"), "Infinity") << "as the catalogue has it";
+    EXPECT_EQ(findMaker("Citro\u00EBn"), "Citroen");
+    EXPECT_EQ(findMaker("\u0160koda"), "Skoda");
+    for (char const* const other : {"alfa", "benz", "Chevrolet", "GMC", "MB", "olds", "Range Rover"}) {
+        EXPECT_NO_THROW(findMaker(other)) << other;
+    }
 }
 
 TEST(CatalogueSelection, MakerThatIsNotThereIsWrongUseWithTheList)
