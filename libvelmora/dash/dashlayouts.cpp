@@ -62,7 +62,7 @@ Json DashLayouts::parse(std::string const& text)
         if (std::ranges::find(sensorLists, key) != std::end(sensorLists)) {
             layout[key] = idsOf(value);
         } else if (key == "units") {
-            layout[key] = wordOf(value, {"metric", "imperial"});
+            layout[key] = wordOf(value, {"metric", "imperial", "imperial-uk"});
         } else if (key == "theme") {
             layout[key] = wordOf(value, {"auto", "light", "dark"});
         } else if (key == "size") {

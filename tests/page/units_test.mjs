@@ -38,7 +38,25 @@ const speed = units.dialOf(sensor('km/h'), [0, 200]);
 assert.equal(Math.round(speed.high), 124);
 assert.equal(speed.at(100), 0.5);
 
+// Air by the height of a column, all else of pressure by its force; the whole parameter's key counts for its sensors.
+const pressure = (key) => ({ ...sensor('kPa', 0), sensor: key });
+assert.equal(units.withUnit(pressure('INTAKE_PRESSURE'), 100), '29.5 inHg');
+assert.equal(units.withUnit(pressure('PID_6F_2'), 100), '29.5 inHg');
+assert.equal(units.withUnit(pressure('FUEL_PRESSURE'), 100), '14.5 psi');
+assert.equal(units.withUnit(pressure('PID_53'), 100), '401 inH2O');
+assert.equal(units.withUnit({ ...sensor('V'), sensor: 'INTAKE_PRESSURE' }, 1), '1.0 V');
+
+// Those of the United Kingdom differ by their gallon alone.
+units.setSystem('imperial-uk');
+assert.equal(units.withUnit(consumption, 10), '28.2 mpg (UK)');
+assert.equal(units.withUnit(consumption, 0.9), '0.0 mpg (UK)');
+assert.deepEqual(units.inOrder(consumption, 5, 10), [10, 5]);
+assert.ok(labels.has('mpg') && units.isImperial('mpg (UK)') && !units.isImperial('l/100 km'));
+assert.equal(units.withUnit(sensor('km/h', 0), 100), '62 mph');
+assert.equal(units.withUnit(pressure('BAROMETRIC_PRESSURE'), 101), '29.8 inHg');
+
 units.setSystem('metric');
+assert.equal(units.withUnit(pressure('INTAKE_PRESSURE'), 100), '100 kPa');
 assert.ok(!units.turnsRound(consumption));
 assert.equal(units.withUnit(consumption, 10), '10.0 l/100 km');
 assert.deepEqual(units.inOrder(consumption, 5, 10), [5, 10]);

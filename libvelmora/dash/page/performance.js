@@ -7,7 +7,7 @@ let runs = null;
 let trouble = '';
 let drawn = '';
 
-const imperial = () => setting('units', 'metric') === 'imperial';
+const imperial = () => setting('units', 'metric') !== 'metric';
 const speedText = (kmh) => (imperial() ? `${Math.round(kmh * 0.621371)} mph` : `${Math.round(kmh)} km/h`);
 const powerText = (kw) => (imperial() ? `${Math.round(kw * 1.3410221)} hp` : `${Math.round(kw)} kW`);
 

@@ -1,7 +1,8 @@
 // Values come in metric units; here alone value and label are turned into those that the user wants.
 
-// Of the US gallon. Under a litre it is an idling engine's, which would read as hundreds of miles.
+// Under a litre it is an idling engine's, which would read as hundreds of miles.
 const milesPerGallon = (litres) => (Math.abs(litres) < 1 ? 0 : 235.214583 / litres);
+const milesPerUkGallon = (litres) => milesPerGallon(litres) * (4.54609 / 3.785411784);
 
 // The label, the conversion, and how many more digits it needs. Labels are those of <velmora/unitlabel.h>.
 const imperial = {
@@ -12,15 +13,23 @@ const imperial = {
   kPa: ['psi', (v) => v * 0.1450377, 1],
   Pa: ['inH2O', (v) => v * 0.00401463, 3],
   'g/s': ['lb/min', (v) => v * 0.1322774, 1],
-  Nm: ['lb-ft', (v) => v * 0.7375621, 0],
   kW: ['hp', (v) => v * 1.3410221, 0],
   mm: ['in', (v) => v / 25.4, 2],
   'l/100 km': ['mpg', milesPerGallon, 0],
 };
+const ukGallons = ['mpg (UK)', milesPerUkGallon, 0];
+
+// Of air and vapour, which the library shows by the height of a column. By the key of the parameter.
+const columns = {
+  INTAKE_PRESSURE: ['inHg', (v) => v / 3.386389, 1],
+  BAROMETRIC_PRESSURE: ['inHg', (v) => v / 3.386389, 1],
+  PID_6F: ['inHg', (v) => v / 3.386389, 1],
+  PID_53: ['inH2O', (v) => v * 4.01463, 0],
+};
 
 // Whether a sensor's own unit is one of those, which happens in recordings.
 export function isImperial(unit) {
-  return unit.startsWith('in') || Object.values(imperial).some(([label]) => label === unit);
+  return unit.startsWith('in') || unit === ukGallons[0] || Object.values(imperial).some(([label]) => label === unit);
 }
 
 let system = 'metric';
@@ -28,16 +37,18 @@ export function setSystem(name) {
   system = name;
 }
 
-function rule(unit) {
-  return system === 'imperial' ? imperial[unit] : undefined;
+function rule({ sensor, unit }) {
+  if (system === 'metric') return undefined;
+  if (system === 'imperial-uk' && unit === 'l/100 km') return ukGallons;
+  return (unit === 'kPa' && columns[sensor.replace(/_[0-9]$/, '')]) || imperial[unit];
 }
 
 export function unitOf(sensor) {
-  return rule(sensor.unit)?.[0] ?? sensor.unit;
+  return rule(sensor)?.[0] ?? sensor.unit;
 }
 
 export function convert(sensor, value) {
-  const found = rule(sensor.unit);
+  const found = rule(sensor);
   return found && typeof value === 'number' ? found[1](value) : value;
 }
 
@@ -45,13 +56,13 @@ export function convert(sensor, value) {
 export function show(sensor, value) {
   if (value == null) return '–';
   if (typeof value !== 'number') return String(value);
-  const digits = Math.min(6, (sensor.precision ?? 0) + (rule(sensor.unit)?.[2] ?? 0));
+  const digits = Math.min(6, (sensor.precision ?? 0) + (rule(sensor)?.[2] ?? 0));
   return convert(sensor, value).toFixed(digits).replace(/^-(0(\.0+)?)$/, '$1');
 }
 
 // Whether what is more of the sensor is less of what is shown: the less fuel, the more miles.
 export function turnsRound(sensor) {
-  return rule(sensor.unit)?.[1] === milesPerGallon;
+  return sensor.unit === 'l/100 km' && system !== 'metric';
 }
 
 // The lowest and the highest, in the order that they have once they are converted. Null for a highest that is not known,

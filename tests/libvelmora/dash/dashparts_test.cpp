@@ -41,8 +41,9 @@ TEST(DashLayouts, HoldNothingButWhatBelongsThere)
     EXPECT_EQ(DashLayouts::parse(whole), Json::parse(whole));
     EXPECT_THAT(DashLayouts::sensorsOf(DashLayouts::parse(whole)), ElementsAre("a", "b", "c")) << "each of them once";
     EXPECT_TRUE(DashLayouts::sensorsOf(Json()).empty());
-    for (char const* const good : {"{}", R"({"minutes":1})", R"({"units":"imperial"})", R"({"theme":"auto"})",
-                                   R"({"theme":"light"})", R"({"size":"small"})", R"({"size":"normal"})"}) {
+    for (char const* const good :
+         {"{}", R"({"minutes":1})", R"({"units":"imperial"})", R"({"units":"imperial-uk"})", R"({"theme":"auto"})",
+          R"({"theme":"light"})", R"({"size":"small"})", R"({"size":"normal"})"}) {
         EXPECT_EQ(whyNoLayout(good), "") << good;
     }
     for (char const* const odd : {R"({"minutes":0})", R"({"minutes":16})", R"({"minutes":1.5})", R"({"minute":1})"}) {
