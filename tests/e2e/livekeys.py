@@ -60,8 +60,9 @@ def record():
         values = ",".join(str(second + 10 * i) for i in range(SENSORS))
         lines.append(f"2024-03-07T09:05:{second:02}.000Z,{values},{'first' if second < 30 else 'second'}")
     (folder / "drive.csv").write_text("\n".join(lines) + "\n")
-    subprocess.run([program, "settings", "limit.S30", "340"], check=True, stdout=subprocess.DEVNULL, timeout=20,
-                   env=os.environ | {"VELMORA_SETTINGS": str(folder / "settings.toml")})
+    for sensor, limit in (("S30", "340"), ("S04", "1")):
+        subprocess.run([program, "settings", f"limit.{sensor}", limit], check=True, stdout=subprocess.DEVNULL, timeout=20,
+                       env=os.environ | {"VELMORA_SETTINGS": str(folder / "settings.toml")})
 
 
 def row(sensor, value):
@@ -70,7 +71,7 @@ def row(sensor, value):
 
 def moves_in_time():
     begin(f"{program} live --play {folder}/drive.csv --speed 0.125")
-    until_seen("the beginning", r"0:0\d \[.*\] 0:59 0.125x", "^drive.csv, 31 sensors, 2024-03-07T09:05:0")
+    until_seen("the beginning", r"0:0\d \[.*\] 0:59 0.125x", "^drive.csv, 31 sensors, 2024-03-07T09:05:0", "^S01.* ! S04")
     press("Space", "End")
     text = until_seen("the end", r"Paused 0:59 \[={20}\] 0:59 0.125x", row("S01", 59))
     check(re.search(r"^S01 +59 V +0 +30 +59", text, re.M), "least, mean and greatest of all")
@@ -178,8 +179,11 @@ def changes_how_a_car_is_shown():
 
     begin(f"XDG_DATA_HOME={folder}/data {program} -p 'sim:petrol-can11?instant' live RPM SPEED")
     until_seen("metric", r"^Vehicle Speed Sensor +\d+ km/h ", r"^sim:petrol-can11\?instant, module 7E8 ECM, \d+ s, [\d.]+ readings/s")
-    press("Down", "u")
-    until_seen("imperial, and all rows still there", r"Unit.*\nEngine RPM .*\nVehicle Speed Sensor +\d+ mph ")
+    press("u")
+    until_seen("imperial", r"^Vehicle Speed Sensor +\d+ mph ")
+    press("Down")
+    time.sleep(0.4)  # a frame later
+    until_seen("all rows are still there", r"Unit.*\nEngine RPM .*\nVehicle Speed Sensor +\d+ mph ")
     press("r")
     until_seen("anew", "The statistics begin anew")
     press("w")

@@ -89,6 +89,13 @@ TEST_F(CommandRun, SensorsThatStaySilentAreNamed)
     EXPECT_EQ(static_cast<int>(silent.code), 5);
     EXPECT_EQ(silent.err, "velmora: The vehicle gave none of the chosen values\n  - is the ignition on?\n"
                           "  - `velmora sensors` lists what the vehicle offers\n");
+    std::ofstream(m_folder.file("own.toml")) << "[[signal]]\nid = \"WRONG\"\nname = \"Wrong\"\nheader = \"7E0\"\n"
+                                                "request = \"22F190\"\nformula = \"A\"\n";
+    std::string const own = " --signals @F/own.toml live --duration 0.2 RPM WRONG";
+    EXPECT_EQ(run("-p sim:@F/refusing.toml?instant" + own).err,
+              "Connecting to sim:" + m_folder.file("refusing.toml") +
+                  "?instant ...\nWRONG is refused: Service Not Supported\nNo value came of: Wrong\n");
+    EXPECT_EQ(run("@R" + own).err, "");
     EXPECT_TRUE(std::regex_search(run("-v @B live -n 2 RPM").err, std::regex("\n2 readings, \\d+\\.\\d a second\n")));
 }
 
