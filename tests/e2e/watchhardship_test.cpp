@@ -1,4 +1,5 @@
 #include "tests/e2e/childprocess.h"
+#include "tests/support/sanitizer.h"
 #include "tests/support/temporaryfolder.h"
 
 #include <gtest/gtest.h>
@@ -20,11 +21,7 @@ using testsupport::TemporaryFolder;
 // time.
 void expectEnding(std::string const& name)
 {
-#ifdef __SANITIZE_THREAD__
-    std::string const slack = " 3";
-#else
-    std::string const slack = " 1";
-#endif
+    std::string const slack = testsupport::underThreadSanitizer ? " 3" : " 1";
     std::string const script = VELMORA_SOURCE_DIR "/tests/e2e/ending.py";
     EXPECT_EQ(std::system(("/usr/bin/python3 " + script + " " VELMORA_PROGRAM " " + name + slack).c_str()), 0);
 }

@@ -94,7 +94,9 @@ TEST(ParameterFactory, MakesEveryClassByItsOwnPid)
         ASSERT_NE(parameter, nullptr) << name;
         EXPECT_EQ(parameter->pid(), pid) << name;
         auto const expected = make(ObdMode::CurrentData, 0);
-        EXPECT_EQ(typeid(*parameter), typeid(*expected)) << name;
+        auto const& made = *parameter;
+        auto const& named = *expected;
+        EXPECT_EQ(typeid(made), typeid(named)) << name;
     }
 }
 

@@ -70,7 +70,7 @@ TEST(LiveReader, ReadsWithStatisticsAndOtherSensorsWhileItGoesOn)
     EXPECT_GT(reader->run().kilograms, 0);
     reader->endRuns();
     EXPECT_EQ(reader->picked(), std::vector<int>{0x05});
-    EXPECT_THROW(car.live({.sensors = {"NOSENSOR"}}), Error);
+    EXPECT_THROW(static_cast<void>(car.live({.sensors = {"NOSENSOR"}})), Error);
 }
 
 TEST(LiveReader, IsOverWithItsConnection)

@@ -5,6 +5,7 @@
 #include "libobd/message/messageparser.h"
 #include "libvelmora/channel/fastchannel.h"
 #include "tests/libvelmora/channel/channelrig.h"
+#include "tests/support/sanitizer.h"
 #include "tests/support/wire/timedwire.h"
 
 #include <obd/obdprotocol.h>
@@ -148,11 +149,7 @@ obd::ResponseMap valuesOf(std::string const& reply, unsigned int asked)
 TEST(LyingAdapter, NoValueEverStandsUnderTheWrongSensorInAHundredThousandFaults)
 {
     // One thread does it all, so that ThreadSanitizer has nothing to find that a tenth does not show.
-#ifdef __SANITIZE_THREAD__
-    constexpr int faultsInAll = 10000;
-#else
-    constexpr int faultsInAll = 100000;
-#endif
+    constexpr int faultsInAll = testsupport::underThreadSanitizer ? 10000 : 100000;
     constexpr int faultsEach = 500; // then a new adapter, since this one's counting is off by then
     // A prompt dropped one time in fifty, and the like; and adapters that are worse than any real one, which make many
     // faults in little time and meet two of them at once.
