@@ -4,7 +4,7 @@ if(VELMORA_SANITIZE)
     add_compile_options(-fsanitize=${VELMORA_SANITIZE} -fno-sanitize-recover=all)
     add_link_options(-fsanitize=${VELMORA_SANITIZE})
     if(VELMORA_SANITIZE MATCHES "thread" AND CMAKE_CXX_COMPILER_ID MATCHES Clang)
-        # Tests have an operator new of their own, which stands before that of clang's runtime.
+        # A test has an operator new of its own, behind that of clang's runtime.
         add_link_options(-Wl,--allow-multiple-definition)
     endif()
     find_program(VELMORA_MOLD mold) # links the large test programs four times as fast

@@ -39,10 +39,7 @@ void PortWire::start()
             }
             m_wake.notify_one(); // with the mutex free, so that who reads is not woken to wait for it
         },
-        [this] {
-            endLink(true);
-            m_wake.notify_one();
-        });
+        [this] { endLink(true); });
 }
 
 void PortWire::write(std::string_view bytes)
@@ -139,6 +136,7 @@ void PortWire::endLink(bool lost) const
     std::lock_guard const lock(m_mutex);
     m_lost = m_lost || (lost && m_open && !m_givenUp);
     m_open = false;
+    m_wake.notify_one(); // with the mutex held: who sees the link gone may end this object at once
 }
 
 } // namespace velmora

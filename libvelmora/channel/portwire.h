@@ -40,7 +40,7 @@ private:
     IPulledPort* const m_pulled; // the same, if it can be read so
     mutable std::atomic<WireTime::rep> m_seenUp{0};
     mutable std::mutex m_mutex;
-    std::condition_variable m_wake;
+    mutable std::condition_variable m_wake;
     std::string m_incoming; // of a port with a thread; protected by m_mutex, as what follows
     mutable bool m_open = true;
     bool m_givenUp = false;

@@ -2,6 +2,7 @@
 #include "tests/support/hexbytes.h"
 #include "tests/support/logcapture.h"
 #include "tests/support/process/failingallocation.h"
+#include "tests/support/sanitizer.h"
 
 #include <gtest/gtest.h>
 
@@ -52,6 +53,9 @@ TEST(MessageParser, EachFamilyReadsItsOwnFraming)
 
 TEST(MessageParser, AFailureInsideIsLoggedWithTheTextAndThrownOn)
 {
+    if (testsupport::underThreadSanitizer) {
+        GTEST_SKIP() << "its operator new stands in front of ours";
+    }
     LogCapture const log;
     ResponseMap responses;
     std::vector<unsigned char> text = replyText("7E8 02 41 0D");
@@ -68,6 +72,9 @@ TEST(MessageParser, AFailureInsideIsLoggedWithTheTextAndThrownOn)
 
 TEST(MessageParser, AFailureOnTheOlderBusesIsLoggedWithItsProtocol)
 {
+    if (testsupport::underThreadSanitizer) {
+        GTEST_SKIP() << "its operator new stands in front of ours";
+    }
     LogCapture const log;
     ResponseMap responses;
     std::vector<unsigned char> const text = replyText("AZ");
