@@ -32,7 +32,7 @@ public:
         : StreamPort(stream.native_handle(), isSerial<Stream> ? Kind::Line : Kind::Socket),
           m_context(std::move(context)), m_stream(std::move(stream))
     {}
-    ~AsioPort() override { close(); }
+    ~AsioPort() override { StreamPort::close(); }
     AsioPort(AsioPort const&) = delete;
     AsioPort& operator=(AsioPort const&) = delete;
 
