@@ -51,7 +51,7 @@ ProbeReport ask(ProbeOptions const& given, CommandCar& car)
     } catch (Error const& error) {
         if (error.kind() != ErrorKind::NotSupported && error.kind() != ErrorKind::WrongUse && !car.options().quiet) {
             tell(PromptReader::canRedraw() ? "\n" : "");
-            tell("What was found is kept: the same command goes on with it\n");
+            tell("What was found is kept: the same command goes on with it if the car tells its VIN\n");
         }
         throw;
     }

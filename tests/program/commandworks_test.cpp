@@ -66,8 +66,8 @@ TEST_F(CommandRun, AProbeWritesWhatItFinds)
     EXPECT_EQ(json::parse(run("--json " + line + " --force").out)["told"].size(), 1U);
     Ended const loud = run("-p sim:" + m_folder.file("bare.toml") +
                            "?instant signals probe --module 7E2 --from F187 --to F187 -o @F/q.toml");
-    EXPECT_THAT(loud.err,
-                HasSubstr("\nWhat was found is kept: the same command goes on with it\nvelmora: The module "));
+    EXPECT_THAT(loud.err, HasSubstr("\nWhat was found is kept: the same command goes on with it if the car tells its "
+                                    "VIN\nvelmora: The module "));
     std::ofstream(m_folder.file("bad.toml")) << "[[signal]]\nid = \"A B\"\n";
     Ended const bad = run("signals check @F/bad.toml");
     EXPECT_EQ(bad.code, ExitCode::WrongUse);

@@ -53,7 +53,7 @@ void checkReportPath(std::string const& path, bool replace)
         return;
     }
     if (!replace) {
-        throw Error(ErrorKind::Failed, "The report " + path + " exists already", {"--force replaces it"});
+        throw Error(ErrorKind::WrongUse, "The report " + path + " exists already", {"--force replaces it"});
     }
     requireWritable(path, "report");
 }
