@@ -229,6 +229,26 @@ TEST(KeptScanLine, GoesByTheFirstRealVinElseByTheName)
     EXPECT_EQ(timeText(firstTime), "2026-05-01T10:00:00.123Z");
 }
 
+TEST(KeptScan, AreListedUnderTheirVehicles)
+{
+    EXPECT_EQ(toText(std::vector<KeptScan>(), {}), "Nothing is kept yet; velmora scan --history keeps a scan\n");
+    KeptScan first = scanOf(american);
+    KeptScan second = scanOf(german, 1s);
+    KeptScan third = scanOf(american, 2s);
+    first.number = 1;
+    second.number = 2;
+    third.number = 30;
+    std::istringstream lines(toText({first, second, third}, {}));
+    std::vector<std::string> words;
+    for (std::string line; std::getline(lines, line);) {
+        std::istringstream rest(line);
+        std::string word;
+        rest >> word;
+        words.push_back(word);
+    }
+    EXPECT_EQ(words, (std::vector<std::string>{american, "1", "30", "", german, "2"}));
+}
+
 TEST(KeptScan, TellsLampAndCodesForLists)
 {
     ModuleReport module = soundModule();

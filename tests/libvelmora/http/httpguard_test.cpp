@@ -93,6 +93,7 @@ TEST(HttpGuard, KnowsItsOwnMachineAndTheBoundsOfNames)
     for (char const* const given : {"secreT", "Secret", "secre", "secrets", ""}) {
         EXPECT_FALSE(velmora::sameSecret(given, "secret")) << given;
     }
+    EXPECT_TRUE(velmora::sameSecret("secret", std::string_view("secrets", 6))) << "what stands behind is no part of it";
 }
 
 // Each of the 22 digits takes every one of its 64 forms now and then.

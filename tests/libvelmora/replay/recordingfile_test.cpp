@@ -37,8 +37,10 @@ TEST(Recordings, TimesAreReadToTheMillisecond)
 {
     EXPECT_EQ(timeIn("2024-03-07T09:05:00.000Z"), nine);
     EXPECT_EQ(timeIn("1970-01-01T00:00:00.007Z"), 7);
+    EXPECT_EQ(timeIn("2024-03-07T09:04:60.000Z"), nine) << "a second may be put in";
     for (char const* const text : {"", "2024-03-07 09:05:00.000Z", "2024-02-30T09:05:00.000Z",
-                                   "2024-03-07T24:05:00.000Z", "2024-03-07T09:05:00.000", "2024-03-07T09:05:0x.000Z"}) {
+                                   "2024-03-07T24:05:00.000Z", "2024-03-07T09:60:00.000Z", "2024-03-07T09:05:61.000Z",
+                                   "2024-03-07T09:05:00.000", "2024-03-07T09:05:0x.000Z"}) {
         EXPECT_FALSE(timeIn(text)) << text;
     }
 }

@@ -15,6 +15,7 @@
 #include <gtest/gtest.h>
 
 #include <fstream>
+#include <limits>
 #include <set>
 
 namespace {
@@ -136,6 +137,21 @@ TEST_F(VehicleSettings, KeysThatNothingReadsAreFound)
     EXPECT_EQ(SettingsFile(file).unknownKeys(),
               (std::vector<std::string>{"common/enginedisplacment", "connection/protocl", "displacement"}));
     EXPECT_TRUE(SettingsFile(folder.file("none.toml")).unknownKeys().empty());
+}
+
+TEST_F(VehicleSettings, OnlyTheirOwnKeysAreStoredInHundredths)
+{
+    int value = 7;
+    for (auto const& [key, number] : {std::pair<char const*, double>{settings::vehicleWeight, 1.0},
+                                      {settings::unitSystem, 1.0},
+                                      {"no such key", 1.0},
+                                      {settings::engineDisplacement, 1e9},
+                                      {settings::engineDisplacement, std::numeric_limits<double>::quiet_NaN()}}) {
+        EXPECT_FALSE(storedHundredths(key, number, value)) << key;
+        EXPECT_EQ(value, 7);
+    }
+    EXPECT_TRUE(storedHundredths(settings::engineDisplacement, 1.6, value));
+    EXPECT_EQ(value, 160);
 }
 
 } // namespace

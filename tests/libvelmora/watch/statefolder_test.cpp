@@ -6,6 +6,9 @@
 
 #include <gtest/gtest.h>
 
+#include <cstdlib>
+#include <filesystem>
+#include <optional>
 #include <sys/stat.h>
 
 namespace {
@@ -33,6 +36,36 @@ TEST(VehicleNames, AreMadeUpOnceForEachVehicle)
     ASSERT_EQ(::stat(folder.file("vehicles").c_str(), &rights), 0);
     EXPECT_EQ(rights.st_mode & 0777U, 0600U);
     EXPECT_THROW(VehicleNames("/proc/nowhere").last(), velmora::Error);
+}
+
+class ServiceFolder : public testing::Test
+{
+protected:
+    ServiceFolder()
+    {
+        if (char const* const before = std::getenv(name)) {
+            m_before = before;
+        }
+    }
+    ~ServiceFolder() override { m_before ? ::setenv(name, m_before->c_str(), 1) : ::unsetenv(name); }
+
+    static constexpr char const* name = "STATE_DIRECTORY";
+
+    std::optional<std::string> m_before;
+};
+
+TEST_F(ServiceFolder, IsTheFirstThatTheSystemNames)
+{
+    TemporaryFolder const folder;
+    ::setenv(name, (folder.file("own") + ":" + folder.file("other")).c_str(), 1);
+    EXPECT_TRUE(velmora::runsAsService());
+    EXPECT_EQ(velmora::stateFolder(), folder.file("own"));
+    EXPECT_TRUE(std::filesystem::is_directory(folder.file("own")));
+    EXPECT_FALSE(std::filesystem::exists(folder.file("other")));
+    ::setenv(name, "", 1);
+    EXPECT_FALSE(velmora::runsAsService());
+    ::unsetenv(name);
+    EXPECT_FALSE(velmora::runsAsService());
 }
 
 } // namespace
