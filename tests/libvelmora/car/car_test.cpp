@@ -6,6 +6,7 @@
 #include <obd/iobdproxy.h>
 #include <obd/iobdvelmora.h>
 #include <velmora/car.h>
+#include <velmora/print.h>
 
 #include <gtest/gtest.h>
 
@@ -146,6 +147,10 @@ TEST_F(CarTest, PrintsTopics)
     EXPECT_NE(printed(car.oxygen()[0]).find("Bank 1 sensor 1"), std::string::npos);
     EXPECT_EQ(printed(velmora::OxygenReport()), "not supported");
     EXPECT_EQ(printed(velmora::RoutinesReport{velmora::TopicAnswer::Silent, {}}), "no answer");
+    velmora::RoutinesReport const known{velmora::TopicAnswer::Read, {{1, "Leak test", "Closes the purge valve."}}};
+    std::vector<velmora::ModuleTopic<velmora::RoutinesReport>> const modules{{0x7E8, "ECM", known}};
+    std::string const lines = velmora::toText(modules, velmora::TextStyle());
+    EXPECT_NE(lines.find("Leak test\n    Closes the purge valve.\n"), std::string::npos) << lines;
 }
 
 TEST_F(CarTest, RunsARoutineOrSaysWhyNot)

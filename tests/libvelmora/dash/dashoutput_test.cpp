@@ -51,6 +51,8 @@ TEST(DashOutput, ServesThePageWithoutAnythingFromElsewhere)
     std::string const tag = packed.substr(packed.find("ETag: ") + 6, 18);
     EXPECT_THAT(page.get("/page/chart.min.js", "If-None-Match: " + tag + "\r\n"), StartsWith("HTTP/1.1 304"));
     EXPECT_THAT(page.get("/notices.txt"), HasSubstr("Permission is hereby granted"));
+    EXPECT_THAT(shell, HasSubstr("Content-Type: text/html; charset=utf-8\r\n"));
+    EXPECT_THAT(packed, HasSubstr("Content-Type: text/javascript; charset=utf-8\r\n"));
     EXPECT_THAT(page.get("/page/../dash.js"), StartsWith("HTTP/1.1 404"));
     EXPECT_THAT(page.link, StartsWith("http://127.0.0.1:"));
     EXPECT_EQ(page.token(), "");
@@ -290,11 +292,17 @@ TEST(DashPlay, TellsARecordingAsIfItCameNow)
 {
     std::istringstream in("time,7E8 RPM (rpm),7E8 MAP (kPa)\n2024-03-07T09:05:00.000Z,800,30.5\n"
                           "2024-03-07T09:05:01.000Z,900,31\n2024-03-07T09:05:09.000Z,1700,\n");
-    velmora::Recording const recording = velmora::readCsv(in);
+    velmora::Recording recording = velmora::readCsv(in);
+    recording.sensors.at(0).about.name = "Engine speed";
+    recording.sensors.at(0).about.pid = "010C";
     velmora::PlayDesk play(recording, 2.0);
     std::vector<std::string> told;
+    Reading first;
     DashDesk::Listener listener;
-    listener.reading = [&told](Reading const& each) { told.push_back(each.sensor + " " + valueText(each)); };
+    listener.reading = [&](Reading const& each) {
+        told.push_back(each.sensor + " " + valueText(each));
+        first = each.sensor == "RPM" ? each : first;
+    };
     listener.line = [](velmora::DashLine const&) {};
     listener.answer = [&told](velmora::DashAnswer const& each) { told.push_back(each.topic); };
     listener.vehicle = [&](velmora::DashVehicle const& each) {
@@ -309,6 +317,8 @@ TEST(DashPlay, TellsARecordingAsIfItCameNow)
     play.introduce();
     EXPECT_EQ(told, std::vector<std::string>{"MAP 2.0"});
     EXPECT_EQ(step(0.1), (std::vector<std::string>{"RPM 800", "MAP 30.5"}));
+    EXPECT_EQ(first.module, 0x7E8U);
+    EXPECT_EQ(first.name + " " + first.pid + " " + first.unit, "Engine speed 010C rpm");
     EXPECT_EQ(step(0.5), (std::vector<std::string>{"RPM 900", "MAP 31.0"}));
     play.desk()->ask({"play", velmora::PlayDesk::parse({{"paused", true}, {"other", 1}}).dump()});
     EXPECT_TRUE(step(100.0).empty());

@@ -6,7 +6,9 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <ctime>
 #include <latch>
+#include <thread>
 
 namespace {
 
@@ -111,6 +113,26 @@ TEST(OutputRunner, WritesInOrderAndClosesAtTheEnd)
     EXPECT_EQ(runner.counts().accepted, 2U);
     EXPECT_EQ(runner.counts().written, 2U);
     EXPECT_EQ(runner.counts().queued, 0U);
+}
+
+std::chrono::nanoseconds processorTime()
+{
+    timespec time{};
+    ::clock_gettime(CLOCK_PROCESS_CPUTIME_ID, &time);
+    return std::chrono::seconds(time.tv_sec) + std::chrono::nanoseconds(time.tv_nsec);
+}
+
+TEST(OutputRunner, CostsNothingWhileThereIsNothingToWrite)
+{
+    Witness witness;
+    OutputRunner runner("csv:a", std::make_unique<WitnessOutput>(witness), tellTo(witness), withoutWaiting());
+    runner.start();
+    pushValue(runner, 1.0);
+    witness.waitFor([&witness] { return !witness.values.empty(); });
+    auto const before = processorTime();
+    std::this_thread::sleep_for(std::chrono::milliseconds(200));
+    EXPECT_LT(processorTime() - before, std::chrono::milliseconds(10));
+    runner.stop();
 }
 
 TEST(OutputRunner, AFailedBatchComesAgainAsItWas)

@@ -1,5 +1,6 @@
 #include "libvelmora/report/finding/findings.h"
 #include "libvelmora/report/finding/testlimits.h"
+#include "libvelmora/report/troublecode.h"
 #include "tests/libvelmora/report/carbuilder.h"
 
 #include <gtest/gtest.h>
@@ -34,6 +35,16 @@ std::vector<std::string> kinds(VehicleReport const& report)
 }
 
 using Kinds = std::vector<std::string>;
+
+TEST(TroubleCodes, AreOfMakersByTheirBeginning)
+{
+    for (char const* const code : {"P1000", "P1F", "P3000", "P33FF", "B1000", "B2FFF", "C1234", "U2000"}) {
+        EXPECT_TRUE(isMakersCode(code)) << code;
+    }
+    for (char const* const code : {"P0420", "P2000", "P3400", "P3FFF", "B0001", "B3000", "C0100", "U3FFF", "P1", ""}) {
+        EXPECT_FALSE(isMakersCode(code)) << code;
+    }
+}
 
 TEST(Suggestions, AreNoneForASoundCar)
 {

@@ -229,6 +229,8 @@ TEST_F(IdentifierProbeTest, GoesOnWhereItWasInterruptedOnTheSameVehicleOnly)
     EXPECT_EQ(toJsonValue(whole)["locked"][0].dump(), R"({"id":"F187","code":"33","reason":"Security Access Denied"})");
     EXPECT_EQ(toJsonValue(whole)["service"], "21");
     EXPECT_THROW(ProbeStore("/dev/null/probe.json").save(whole), Error);
+    ProbeStore(folder.path() / "first" / "use.json").save(whole);
+    EXPECT_TRUE(std::filesystem::exists(folder.path() / "first" / "use.json"));
     m_state = *kept;
     m_checksLeft = 1000;
     m_bench.takeAsked();

@@ -93,6 +93,15 @@ TEST(TripMeter, GapsAreNotBridged)
     EXPECT_NEAR(trip.fuelL.value(), 6.0 * 198 / 3600, 0.005);
 }
 
+TEST(TripMeter, TheLongestGapIsBridgedStill)
+{
+    Driven car;
+    car.drive(100, 2000, 72);
+    car.time.pass(velmora::TripSettings().longestGap - 1s);
+    car.drive(100, 2000, 72);
+    EXPECT_NEAR(car.stop().gapS, 0, 1.01);
+}
+
 TEST(TripMeter, AShortOneIsAnEngineRun)
 {
     Driven car;
