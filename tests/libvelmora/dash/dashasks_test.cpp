@@ -58,12 +58,12 @@ TEST(DashOutput, StreamsTheTrafficAndHistoriesOfTheChart)
     Page page;
     page.desk->tell(velmora::DashLine{{}, true, "ATI"});
     page.output->write({});
+    page.desk->tell(velmora::DashLine{{}, false, "ELM327"});
     HttpClient traffic(page.output->port());
     traffic.send("GET /traffic HTTP/1.1\r\nHost: localhost\r\n\r\n");
-    EXPECT_EQ(nextEvent(traffic, "lines")[0][2], "ATI") << "what was before";
-    page.desk->tell(velmora::DashLine{{}, false, "ELM327"});
-    page.output->write({});
-    EXPECT_EQ(nextEvent(traffic, "lines").back()[2], "ELM327");
+    Json const lines = nextEvent(traffic, "lines");
+    EXPECT_EQ(lines.at(0).at(2), "ATI") << "what was before";
+    EXPECT_EQ(lines.back().at(2), "ELM327");
     for (int i = 0; i < 8; ++i) {
         page.desk->tell(dashReading("S" + std::to_string(i), i));
     }
