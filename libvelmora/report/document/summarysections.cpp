@@ -44,7 +44,7 @@ DocumentCell lampTile(VehicleReport const& report)
     return told ? DocumentCell{texts::off, DocumentMark::Good} : DocumentCell{texts::notTold, DocumentMark::Faint};
 }
 
-// Confirmed and permanent ones, each once a module; no number where not even one list was told.
+// Confirmed and permanent ones, each once a module; "0" only where a list of confirmed ones was told.
 DocumentCell codesTile(VehicleReport const& report)
 {
     std::set<std::pair<unsigned int, std::string>> codes;
@@ -52,13 +52,13 @@ DocumentCell codesTile(VehicleReport const& report)
     for (ModuleReport const& module : report.modules) {
         for (CodeKind const kind : {CodeKind::Confirmed, CodeKind::Permanent}) {
             CodeList const* const list = readList(module, kind);
-            told = told || list != nullptr;
+            told = told || (list != nullptr && kind == CodeKind::Confirmed);
             for (TroubleCode const& code : list != nullptr ? list->codes : std::vector<TroubleCode>()) {
                 codes.emplace(module.id, code.code);
             }
         }
     }
-    if (!told) {
+    if (!told && codes.empty()) {
         return {texts::notTold, DocumentMark::Faint};
     }
     return {std::to_string(codes.size()), codes.empty() ? DocumentMark::Good : DocumentMark::Bad};
