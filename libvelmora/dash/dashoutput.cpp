@@ -82,8 +82,10 @@ void DashOutput::addRoutes()
             return HttpServer::event("values", m_state.allValues()) +
                    HttpServer::event("performance", dumpedJson(m_context.desk->runs().state(false)));
         });
-    m_server.addStream(
-        trafficPath, [this](HttpRequest const& /*request*/) { return HttpServer::event("lines", m_state.allLines()); });
+    auto const allLines = [this](HttpRequest const& /*request*/) {
+        return HttpServer::event("lines", m_state.allLines());
+    };
+    m_server.addStream(trafficPath, allLines, allLines);
 }
 
 void DashOutput::listen()

@@ -88,7 +88,7 @@ void DashState::take(Reading const& reading)
 void DashState::take(DashLine const& line)
 {
     std::lock_guard const lock(m_mutex);
-    m_lines.push_back({toMillis(line.time), line.sent ? ">" : "<", readable(line.text)});
+    m_lines.push_back({toMillis(line.time), line.sent ? ">" : "<", readable(line.text), ++m_lineNumber});
     m_newLines = std::min(m_newLines + 1, mostLines);
     if (m_lines.size() > mostLines) {
         m_lines.pop_front();

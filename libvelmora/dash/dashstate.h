@@ -71,6 +71,7 @@ private:
     std::map<std::string, Json> m_answers;
     std::deque<Json> m_lines;
     std::size_t m_newLines = 0;
+    std::uint64_t m_lineNumber = 0; // of the last line; goes with it, so that nobody takes a line twice
 };
 
 // How a sensor is called between page and program: "7E8/RPM".

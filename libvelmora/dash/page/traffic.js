@@ -21,6 +21,13 @@ function draw() {
   if (atEnd) box.scrollTop = box.scrollHeight;
 }
 
+// Who was too slow, or comes again, gets lines a second time: each has a number, which begins anew with the program.
+function joined(known, told) {
+  const last = known.at(-1)?.[3] ?? 0;
+  if ((told.at(-1)?.[3] ?? 0) < last) return told;
+  return known.concat(told.filter(([, , , number]) => number > last)).slice(-most);
+}
+
 // A stream of its own, which only who looks pays for.
 export function follow(wanted) {
   if (!wanted || document.hidden) {
@@ -30,7 +37,7 @@ export function follow(wanted) {
     lines = [];
     source = new EventSource('/traffic');
     source.addEventListener('lines', (event) => {
-      lines = lines.concat(JSON.parse(event.data)).slice(-most);
+      lines = joined(lines, JSON.parse(event.data));
       draw();
     });
   }

@@ -223,6 +223,25 @@ TEST(DashOutput, AReaderWhoIsTooSlowGetsTheLatestValuesInTheEnd)
     EXPECT_LT(events, told); // the ones between were left out, not kept
 }
 
+TEST(DashOutput, AReaderOfTheTrafficWhoIsTooSlowGetsTheLastLinesInTheEnd)
+{
+    Page const page;
+    HttpClient stream(page.output->port());
+    stream.send("GET /traffic HTTP/1.1\r\nHost: localhost\r\n\r\n");
+    stream.readUntil("event: lines");
+    constexpr int bursts = 60;
+    constexpr int lines = 300; // as many as are kept, and with these texts far more than the buffers of both ends hold
+    for (int burst = 0; burst < bursts; ++burst) {
+        for (int i = 0; i < lines; ++i) {
+            page.desk->tell(velmora::DashLine{{}, true, std::string(700, 'x')});
+        }
+        page.output->write({});
+    }
+    std::string const all = stream.readUntil("," + std::to_string(bursts * lines) + "]]\n");
+    EXPECT_THAT(all, HasSubstr("," + std::to_string((bursts - 1) * lines + 1) + "]"));
+    EXPECT_LT(std::count(all.begin(), all.end(), 'v'), bursts) << "those between were left out, not kept";
+}
+
 TEST(DashOutput, EndsAtOnceWithBrowsersConnected)
 {
     Page page;

@@ -131,7 +131,7 @@ TEST(DashState, KeepsThreeHundredLinesOfTraffic)
     EXPECT_EQ(state.allLines(), "[]");
     state.take(DashLine{dashTime(5), true, "ATI\r"});
     state.take(DashLine{dashTime(6), false, "ELM327"});
-    EXPECT_EQ(state.takeLines(), R"([[5,">","ATI�"],[6,"<","ELM327"]])");
+    EXPECT_EQ(state.takeLines(), R"([[5,">","ATI�",1],[6,"<","ELM327",2]])");
     EXPECT_EQ(state.takeLines(), "");
     for (int i = 0; i < 299; ++i) {
         state.take(DashLine{dashTime(i), true, "x"});

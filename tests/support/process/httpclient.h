@@ -1,9 +1,12 @@
 #pragma once
 
+#include <algorithm>
 #include <arpa/inet.h>
+#include <chrono>
 #include <string>
 #include <sys/socket.h>
 #include <unistd.h>
+#include <utility>
 
 namespace testsupport {
 
@@ -33,30 +36,40 @@ public:
     // All up to the end of the connection.
     std::string readAll()
     {
-        std::string result;
-        char buffer[65536];
-        for (ssize_t count = 0; (count = ::recv(m_socket, buffer, sizeof(buffer), 0)) > 0;) {
-            result.append(buffer, static_cast<std::size_t>(count));
+        while (receive()) {
         }
-        return result;
+        return std::exchange(m_ahead, {});
     }
-    // All up to and with that text; less if the connection ends before.
+    // All up to and with that text; less if the connection ends before, or brings other things for two minutes.
     std::string readUntil(std::string const& text)
     {
-        std::string result;
-        for (char each = 0; ::recv(m_socket, &each, 1, 0) == 1;) {
-            result += each;
-            if (result.ends_with(text)) {
-                break;
+        auto const limit = std::chrono::steady_clock::now() + std::chrono::minutes(2);
+        std::size_t from = 0;
+        std::size_t at = 0;
+        while ((at = m_ahead.find(text, from)) == std::string::npos) {
+            from = m_ahead.size() - std::min(m_ahead.size(), text.size());
+            if (std::chrono::steady_clock::now() > limit || !receive()) {
+                return std::exchange(m_ahead, {});
             }
         }
-        return result;
+        std::string const rest = m_ahead.substr(at + text.size());
+        m_ahead.resize(at + text.size());
+        return std::exchange(m_ahead, rest);
     }
     std::string ask(std::string const& request) { return send(request) ? readAll() : std::string(); }
 
 private:
+    bool receive()
+    {
+        char buffer[65536];
+        ssize_t const count = ::recv(m_socket, buffer, sizeof(buffer), 0);
+        m_ahead.append(buffer, static_cast<std::size_t>(std::max<ssize_t>(count, 0)));
+        return count > 0;
+    }
+
     int m_socket;
     bool m_connected = false;
+    std::string m_ahead; // received, and not given away yet
 };
 
 inline std::string httpGet(unsigned short port, std::string const& path)
