@@ -8,4 +8,7 @@ export GTEST_SHARD_INDEX=$1 GTEST_TOTAL_SHARDS=$2
 if [[ ${GTEST_OUTPUT:-} == xml:*/ ]]; then
     GTEST_OUTPUT+=$(basename "$3").$1.xml
 fi
+# Ends that are measured run by themselves.
+[[ ${GTEST_FILTER:-} == *-* ]] && GTEST_FILTER+=: || GTEST_FILTER=${GTEST_FILTER:-}-
+export GTEST_FILTER+='Watch.EndsInTime*'
 exec "$3" --gtest_brief=1
