@@ -29,7 +29,7 @@ SCRIPTS = {  # tests that are no test program, and what of the build they are gi
     "simulator": [(f"python3 tests/simulator/{name}.py", ["simulator/program/obdsim"])
                   for name in ("commandline", "outsideclient")],
 }
-NUMBERS = 4096  # of changes, as in switch.h
+NUMBERS = 16384  # of changes, as in switch.h
 BATCH = 4  # seconds of cases in a batch, each run alone
 MOST_MEMORY = 8 << 30  # of a test program that a change has sent astray
 

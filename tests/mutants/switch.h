@@ -33,7 +33,7 @@
 
 namespace mutants {
 
-inline constexpr int most = 4096; // a page: the numbers that there may be
+inline constexpr int most = 16384; // whole pages: the numbers that there may be
 
 /// The number of the change to try.
 inline int chosen()
