@@ -20,6 +20,8 @@ SWAPS = [
 NUMBER = re.compile(r"(?<![\w.\"'])(\d+)(?![\w.'])")
 STATEMENT = re.compile(r"^\s+(?!return\b|using\b|case\b|throw\b|break\b|continue\b|default\b|goto\b)"
                        r"(?:\+\+|--)?[a-zA-Z_][\w.:>\[\]-]*(?:\(.*\)| [+-]?= .*|\+\+|--)?;$")
+RESERVE = re.compile(r"^[a-zA-Z_][\w.]*\.reserve\(.*\);$")
+HEAD = {"break;": re.compile(r"\bswitch$"), "continue;": re.compile(r"\b(?:for|while)$")}
 DECLARATION = re.compile(r"^\s*(?:static_assert|constexpr|#|using|namespace|template|extern|friend|typedef)\b")
 
 
@@ -62,6 +64,35 @@ def mask(lines):
     return [TEXT * len(line) if number in raw else masked(line) for number, line in enumerate(lines)]
 
 
+def head_of_block(code):
+    """What stands before the round brackets that lead to the last block that stays open; nothing where it has none."""
+    blocks = 0
+    for at in range(len(code) - 1, -1, -1):
+        blocks += {"}": 1, "{": -1}.get(code[at], 0)
+        if blocks < 0:
+            break
+    head = code[:at].rstrip() if blocks < 0 else ""
+    brackets = 0
+    for at in range(len(head) - 1, -1, -1):
+        brackets += {")": 1, "(": -1}.get(head[at], 0)
+        if brackets == 0:
+            return head[:at].rstrip()
+    return ""
+
+
+def ends_its_block(codes, number):
+    """Whether a line is a `break;` or a `continue;` alone, right before the closing brace of its own switch or loop,
+    where the way goes on all the same."""
+    word = codes[number].strip(COMMENT + " ")
+    if word not in HEAD:
+        return False
+    above = [code for code in (code.strip(COMMENT + " ") for code in codes[:number]) if code]
+    below = [code for code in (code.strip(COMMENT + " ") for code in codes[number + 1:]) if code]
+    if not above or above[-1][-1] not in ";:{}" or not below or below[0][0] != "}":
+        return False  # such as a break of a loop without braces
+    return bool(HEAD[word].search(head_of_block("\n".join(codes[:number]))))
+
+
 def changes_of(line, code):
     """All single changes of a line, as begin, end and new text."""
     if not code.strip(TEXT + COMMENT + " ") or DECLARATION.match(code):
@@ -74,7 +105,7 @@ def changes_of(line, code):
     for match in NUMBER.finditer(code):
         yield match.start(), match.end(), str(int(match.group()) + 1)
     statement = code.rstrip(TEXT + COMMENT + " ")
-    if STATEMENT.match(statement):
+    if STATEMENT.match(statement) and not RESERVE.match(statement.strip()):  # without it all but the time is the same
         yield len(line) - len(line.lstrip()), len(statement), ";"
 
 
@@ -85,7 +116,10 @@ def changes_in(root, room):
         if path.suffix not in (".cpp", ".h"):
             continue
         lines = path.read_text().splitlines()
-        for number, (line, code) in enumerate(zip(lines, mask(lines))):
+        codes = mask(lines)
+        for number, (line, code) in enumerate(zip(lines, codes)):
+            if ends_its_block(codes, number):
+                continue
             for begin, end, text in changes_of(line, code):
                 found.append(Change(path.relative_to(root), number, line, line[:begin] + text + line[end:], begin, end,
                                     text))
