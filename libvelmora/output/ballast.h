@@ -16,6 +16,8 @@ public:
     bool keep();
     // False if there was none.
     bool drop();
+    // Whether so many free bytes are enough to keep it.
+    bool fits(unsigned long long available) const { return available / 4 >= m_size; }
 
     std::filesystem::path const& file() const { return m_file; }
 

@@ -18,25 +18,9 @@ std::int64_t millisOf(clockid_t id)
 {
     timespec time{};
     ::clock_gettime(id, &time);
-    return std::int64_t{time.tv_sec} * 1000 + time.tv_nsec / 1000000;
-}
-
-bool knowsTimeServer()
-{
-    timex state{};
-    return ::adjtimex(&state) != -1 && (state.status & STA_UNSYNC) == 0;
-}
-
-bool hasBattery()
-{
-    std::error_code error;
-    for (auto const& each : std::filesystem::directory_iterator("/sys/class/rtc", error)) {
-        std::ifstream in(each.path() / "hctosys");
-        if (in.get() == '1') {
-            return true;
-        }
-    }
-    return false;
+    using std::chrono::milliseconds;
+    return std::chrono::floor<milliseconds>(std::chrono::seconds(time.tv_sec) + std::chrono::nanoseconds(time.tv_nsec))
+        .count();
 }
 
 std::string bootId()
@@ -53,8 +37,27 @@ ClockLook lookAtClocks()
 {
     // Never destroyed: at the process's end an output that hangs may still be at it.
     static auto const* const id = new std::string(bootId());
-    static bool const battery = hasBattery();
-    return {millisOf(CLOCK_REALTIME), millisOf(CLOCK_BOOTTIME), knowsTimeServer(), *id, battery};
+    static bool const battery = hasClockBattery("/sys/class/rtc");
+    timex state{};
+    bool const synced = knowsTimeServer(::adjtimex(&state), state.status);
+    return {millisOf(CLOCK_REALTIME), millisOf(CLOCK_BOOTTIME), synced, *id, battery};
+}
+
+bool knowsTimeServer(int result, int status)
+{
+    return result != -1 && (status & STA_UNSYNC) == 0;
+}
+
+bool hasClockBattery(std::filesystem::path const& clocks)
+{
+    std::error_code error;
+    for (auto const& each : std::filesystem::directory_iterator(clocks, error)) {
+        std::ifstream in(each.path() / "hctosys");
+        if (in.get() == '1') {
+            return true;
+        }
+    }
+    return false;
 }
 
 ClockStamp stampOf(ClockLook const& look)

@@ -2,6 +2,7 @@
 
 #include <chrono>
 #include <cstdint>
+#include <filesystem>
 #include <functional>
 #include <string>
 
@@ -33,6 +34,12 @@ std::int64_t stepBetween(std::int64_t offsetBefore, std::int64_t offset);
 
 // The machine's own.
 ClockLook lookAtClocks();
+
+// What adjtimex tells by its result and the status bits.
+bool knowsTimeServer(int result, int status);
+
+// Whether one of the clocks in that folder of the kernel's has set the system clock at the start.
+bool hasClockBattery(std::filesystem::path const& clocks);
 
 // Judges whether the wall clock can be believed, by its way beside the time since boot.
 class ClockJudge

@@ -50,9 +50,6 @@ void ClockKeeper::begin(IHeldRows& rows)
 // Stamped before the clock was set: then it lies nearer to where the clock would be without.
 SharedRecord ClockKeeper::dated(SharedRecord const& record) const
 {
-    if (m_step == 0) {
-        return record;
-    }
     std::int64_t const time = toMillis(timeOf(*record));
     bool const before = std::llabs(time - (m_look.wall - m_step)) < std::llabs(time - m_look.wall);
     return before ? std::make_shared<Record const>(shifted(*record, std::chrono::milliseconds(m_step))) : record;

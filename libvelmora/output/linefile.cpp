@@ -113,8 +113,8 @@ bool LineFile::openIfFits(std::filesystem::path const& file)
     while (m_size > 0 && ::pread(m_descriptor, &last, 1, static_cast<off_t>(m_size - 1)) == 1 && last != '\n') {
         --m_size;
     }
-    bool const same = ::pread(m_descriptor, begin.data(), begin.size(), 0) == static_cast<ssize_t>(begin.size()) &&
-                      begin == m_header && m_size >= begin.size();
+    bool const same =
+        ::pread(m_descriptor, begin.data(), begin.size(), 0) == static_cast<ssize_t>(begin.size()) && begin == m_header;
     if (!same) {
         close();
         return false;
@@ -133,10 +133,12 @@ void LineFile::rotateIfDue(WallTime now, std::size_t coming)
         return;
     }
     std::filesystem::path target = beside(m_base, compactTime(now));
-    for (int number = 2; std::filesystem::exists(target); ++number) {
+    std::error_code unknown; // what it is, renaming tells
+    for (int number = 2; std::filesystem::exists(target, unknown); ++number) {
         target = beside(m_base, compactTime(now) + "-" + std::to_string(number));
     }
-    if (::rename(m_file.c_str(), target.c_str()) != 0) {
+    // One that somebody has moved away already needs no other name.
+    if (::rename(m_file.c_str(), target.c_str()) != 0 && errno != ENOENT) {
         fail("rename");
     }
     close();

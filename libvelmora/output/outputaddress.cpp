@@ -155,19 +155,23 @@ unsigned long long parseSize(std::string const& text)
 {
     unsigned long long value = 0;
     auto const [end, error] = std::from_chars(text.data(), text.data() + text.size(), value);
-    std::string unit(end, text.data() + text.size());
-    std::ranges::transform(unit, unit.begin(), [](char c) { return c >= 'a' && c <= 'z' ? char(c - 'a' + 'A') : c; });
-    if (unit.size() == 2 && unit.back() == 'B') {
-        unit.pop_back();
+    std::string_view unit(end, text.data() + text.size());
+    if (unit.ends_with('B') || unit.ends_with('b')) {
+        unit.remove_suffix(1);
     }
-    std::string_view const units = "KMG";
-    std::size_t const power = unit.size() == 1 ? units.find(unit.front()) : std::string_view::npos;
-    bool const understood = unit.empty() || unit == "B" || power != std::string_view::npos;
-    unsigned int const shift = power == std::string_view::npos ? 0 : 10 * (static_cast<unsigned int>(power) + 1);
-    if (error != std::errc() || value == 0 || !understood || value > (~0ULL >> shift)) {
+    struct Power
+    {
+        std::string_view upper;
+        std::string_view lower;
+        unsigned int shift;
+    };
+    static constexpr Power powers[] = {{"", "", 0}, {"K", "k", 10}, {"M", "m", 20}, {"G", "g", 30}};
+    auto const* const power =
+        std::ranges::find_if(powers, [unit](Power const& each) { return unit == each.upper || unit == each.lower; });
+    if (error != std::errc() || value == 0 || power == std::end(powers) || value > (~0ULL >> power->shift)) {
         throw Error(ErrorKind::WrongUse, "\"" + text + "\" is no size", {"sizes are such as 500k, 10MB or 2G"});
     }
-    return value << shift;
+    return value << power->shift;
 }
 
 } // namespace velmora

@@ -6,6 +6,11 @@
 
 namespace velmora {
 
+std::chrono::milliseconds nextPause(std::chrono::milliseconds before, OutputLimits const& limits)
+{
+    return std::clamp(before * 2, limits.firstPause, limits.longestPause);
+}
+
 OutputWorker::OutputWorker(std::string name, std::unique_ptr<IOutput> output, Tell tell, OutputLimits const& limits)
     : m_name(std::move(name)), m_output(std::move(output)), m_tell(std::move(tell)), m_limits(limits)
 {}
@@ -147,7 +152,7 @@ void OutputWorker::onFailure(std::string const& what)
         m_counts.lastError = what;
         m_counts.queued = m_queue.size() + m_batch.size();
     }
-    m_pause = std::clamp(m_pause * 2, m_limits.firstPause, m_limits.longestPause);
+    m_pause = nextPause(m_pause, m_limits);
     if (first) {
         m_tell(m_name + ": " + what);
     }

@@ -23,6 +23,9 @@ struct OutputLimits
     std::chrono::milliseconds longestPause{60000};
 };
 
+// The pause after a failure, by the one after the failure before; 0 for the first.
+std::chrono::milliseconds nextPause(std::chrono::milliseconds before, OutputLimits const& limits);
+
 // An output's queue, and what its thread does. Shared by that thread and the runner, which it may outlive.
 class OutputWorker
 {

@@ -79,10 +79,9 @@ std::int64_t Database::number(std::string const& sql)
     return statement.next() ? statement.number(0) : 0;
 }
 
-bool Database::checkpoint()
+void Database::checkpoint()
 {
-    int const result = ::sqlite3_wal_checkpoint_v2(m_handle, nullptr, SQLITE_CHECKPOINT_TRUNCATE, nullptr, nullptr);
-    return result == SQLITE_OK;
+    ::sqlite3_wal_checkpoint_v2(m_handle, nullptr, SQLITE_CHECKPOINT_TRUNCATE, nullptr, nullptr);
 }
 
 Statement::Statement(Database& database, std::string const& sql) : m_database(database)

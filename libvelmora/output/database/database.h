@@ -31,8 +31,8 @@ public:
     // The first number of the first row. Throws Error.
     std::int64_t number(std::string const& sql);
 
-    // Moves what is committed out of the write-ahead file and empties that. False if it can't be done now.
-    bool checkpoint();
+    // Moves what is committed out of the write-ahead file and empties that, as far as it can be done now.
+    void checkpoint();
     // Whether the last failure was that no room is left.
     bool isFull() const { return m_full; }
 

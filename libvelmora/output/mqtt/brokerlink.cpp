@@ -13,7 +13,6 @@ namespace velmora {
 namespace {
 
 constexpr int withoutMqtt5 = 0x84;               // what a broker answers that has no MQTT 5
-constexpr int refusals = 0x80;                   // reasons from here on
 constexpr std::chrono::seconds connackLimit{15}; // a cluster that has lost a node takes 4 s and more
 constexpr int loopMillis = 100;
 constexpr std::chrono::milliseconds betweenNodes{1000}; // of a cluster; the pauses grow once all have failed
@@ -36,7 +35,7 @@ struct BrokerLink::Callbacks
     static void publish(mosquitto* /*client*/, void* object, int message, int reason, mosquitto_property const* /*p*/)
     {
         Listener& listener = of(object).m_listener;
-        if (reason >= refusals) {
+        if (isRefusal(reason)) {
             listener.onRefused(message, ::mosquitto_reason_string(reason));
         } else {
             listener.onDelivered(message);

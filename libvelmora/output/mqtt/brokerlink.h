@@ -15,6 +15,12 @@ struct mosquitto;
 
 namespace velmora {
 
+// Whether a reason of MQTT 5 says that something was not taken.
+constexpr bool isRefusal(int reason)
+{
+    return reason >= 0x80;
+}
+
 // Keeps a connection to a broker, on a thread of its own: tries again at growing pauses, with the next node
 // of a cluster, and with the older protocol where the broker has no MQTT 5. Each connection begins with nothing under
 // way.

@@ -185,7 +185,7 @@ void MqttOutput::close()
     while (m_link->isBusy() && steadyNow() < limit + lastWords) {
         std::this_thread::sleep_for(std::chrono::milliseconds(5));
     }
-    m_link->stop();
+    m_link->stop(); // while what it calls may still use it
     m_link.reset();
     std::lock_guard const lock(m_mutex);
     m_sender.reset();

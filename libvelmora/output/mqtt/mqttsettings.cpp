@@ -87,7 +87,7 @@ BrokerPlace brokerPlace(OutputAddress const& address, std::string host, int port
         }
         host.resize(colon);
     }
-    if (host.size() > 2 && host.front() == '[' && host.back() == ']') {
+    if (host.size() >= 2 && host.front() == '[' && host.back() == ']') {
         host = host.substr(1, host.size() - 2);
     }
     place.host = host;

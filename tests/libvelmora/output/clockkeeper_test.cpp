@@ -75,6 +75,9 @@ TEST_F(ClockKeeperTest, HoldsAndRepairsWhatAWrongClockDated)
     EXPECT_THAT(begin(), ElementsAre("shift " + std::to_string(step), "sure"));
     EXPECT_EQ(dated(1002000), 1002000 + step) << "stamped before the clock was set";
     EXPECT_EQ(dated(march - 1000), march - 1000) << "and behind that";
+    std::int64_t const middle = march - step / 2;
+    EXPECT_EQ(dated(middle), middle) << "as near to either";
+    EXPECT_EQ(dated(middle - 1), middle - 1 + step);
     m_keeper.done();
     m_look = {march + 5000, 24000, true, "one"};
     EXPECT_THAT(begin(), ElementsAre()) << "nothing is held any more";

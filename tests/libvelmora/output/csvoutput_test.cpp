@@ -1,4 +1,5 @@
 #include "libvelmora/output/csvoutput.h"
+#include "tests/support/openfiles.h"
 #include "tests/support/records.h"
 #include "tests/support/temporaryfolder.h"
 
@@ -120,6 +121,71 @@ TEST(CsvOutput, AFullDiskLosesNoRowAndRepeatsNone)
     late.write(batch);
     late.close();
     EXPECT_EQ(folder.read("a.csv"), header + "2026-03-01T08:15:00.250Z,1,\n2026-03-01T08:15:00.251Z,2,\n");
+}
+
+TEST(CsvOutput, ARowLastsASecond)
+{
+    TemporaryFolder const folder;
+    writeOnce("csv:" + folder.file("a.csv"),
+              records(reading("RPM", 1.0), reading("SPEED", 2.0, march + 999), reading("RPM", 3.0, march + 2000),
+                      reading("SPEED", 4.0, march + 3000), reading("RPM", 5.0, march + 3000),
+                      reading("RPM", 6.0, march + 4000), reading("SPEED", 7.0, march + 3999)));
+    EXPECT_EQ(folder.read("a.csv"), header + "2026-03-01T08:15:00.250Z,1,2\n"
+                                             "2026-03-01T08:15:02.250Z,3,\n"
+                                             "2026-03-01T08:15:03.250Z,5,4\n"
+                                             "2026-03-01T08:15:04.250Z,6,\n"
+                                             "2026-03-01T08:15:04.249Z,,7\n")
+        << "a clock that goes back begins a row, too";
+}
+
+TEST(CsvOutput, ARowEndsWhenNothingComesOrOtherSensorsDo)
+{
+    TemporaryFolder const folder;
+    CsvOutput output(parseOutputAddress("csv:" + folder.file("a.csv")));
+    output.write(speedAndRpm());
+    output.write(records(reading("RPM", 1.0), velmora::LampState{}));
+    EXPECT_EQ(folder.read("a.csv"), "");
+    output.write({});
+    output.write({});
+    EXPECT_EQ(folder.read("a.csv"), header + "2026-03-01T08:15:00.250Z,1,\n");
+    output.write(records(reading("RPM", 2.0)));
+    output.write(records(velmora::SensorList{{}, "van", {{0x7E9, "STATE", "0103", "State", ""}}}));
+    EXPECT_EQ(folder.read("a.csv"), header + "2026-03-01T08:15:00.250Z,1,\n2026-03-01T08:15:00.250Z,2,\n");
+    velmora::Reading text = reading("STATE", std::string("say \"a\", b"));
+    text.module = 0x7E9;
+    output.write(records(text));
+    EXPECT_TRUE(testsupport::isHeldOpen(folder.file("a.csv")));
+    output.close();
+    EXPECT_FALSE(testsupport::isHeldOpen(folder.file("a-2.csv")));
+    EXPECT_EQ(folder.read("a-2.csv"), "time,7E9 STATE\n2026-03-01T08:15:00.250Z,\"say \"\"a\"\", b\"\n");
+}
+
+TEST(CsvOutput, WhatCouldNotBeWrittenIsNotWrittenAtTheEndEither)
+{
+    TemporaryFolder const folder;
+    std::filesystem::create_directory(folder.file("a.csv"));
+    CsvOutput output(parseOutputAddress("csv:" + folder.file("a.csv")));
+    output.write(speedAndRpm());
+    EXPECT_THROW(output.write(records(reading("RPM", 1.0), reading("RPM", 2.0, march + 1))), velmora::Error);
+    std::filesystem::remove(folder.file("a.csv"));
+    output.close();
+    EXPECT_FALSE(std::filesystem::exists(folder.file("a.csv"))) << "that was counted as lost already";
+}
+
+TEST(CsvLongOutput, BeginsAnotherDayByItsLines)
+{
+    TemporaryFolder const folder;
+    velmora::CsvLongOutput output(parseOutputAddress("csv-long:" + folder.file("a.csv") + "?rotate=day"));
+    output.open();
+    output.write(records(reading("RPM", 1.0), velmora::LampState{}));
+    output.write(records(reading("RPM", 2.0, march + 86400000), velmora::LampState{}));
+    EXPECT_TRUE(testsupport::isHeldOpen(folder.file("a.csv")));
+    output.close();
+    EXPECT_FALSE(testsupport::isHeldOpen(folder.file("a.csv")));
+    std::string const head = "time,vehicle,module,pid,sensor,name,value,unit\n";
+    EXPECT_EQ(folder.read("a-20260302T081500Z.csv"),
+              head + "2026-03-01T08:15:00.250Z,van,7E8,010C,RPM,Name of RPM,1,rpm\n");
+    EXPECT_EQ(folder.read("a.csv"), head + "2026-03-02T08:15:00.250Z,van,7E8,010C,RPM,Name of RPM,2,rpm\n");
 }
 
 TEST(CsvLongOutput, HasALineAReading)

@@ -64,6 +64,43 @@ TEST(OutputAddress, TellsWhatIsWrong)
     EXPECT_THAT(outputComplaint("influx:udp://nowhere"), HasSubstr("needs a host and a port"));
 }
 
+TEST(OutputAddress, IsToldWithItsSettings)
+{
+    OutputAddress const address = parseOutputAddress("csv:a?rotate=&queue=5&");
+    EXPECT_EQ(address.options.size(), 2U);
+    EXPECT_EQ(address.option("rotate", "1"), "");
+    EXPECT_EQ(parseOutputAddress("csv:a?").options.size(), 0U);
+    EXPECT_EQ(velmora::toString({"tape", "x", {}}), "tape:x");
+    for (auto const& [text, known] : {std::pair("csv:a?x=1", "it knows rotate, queue"),
+                                      {"sqlite:a?x=1", "it knows ballast, queue"},
+                                      {"prometheus:a?x=1", "it knows queue"},
+                                      {"dash:a?x=1", "it knows allow_clear, allow_console, name, queue"},
+                                      {"mqtts://a?x=1", "it knows qos, ca, user_file, password_file, ack_topic, spool, "
+                                                        "spool_max, discovery, keep_alive, queue"}}) {
+        try {
+            parseOutputAddress(text);
+            ADD_FAILURE() << text;
+        } catch (velmora::Error const& error) {
+            EXPECT_EQ(error.hints(), std::vector<std::string>{known});
+        }
+    }
+}
+
+// In a folder where names that mean something else are those of folders, too.
+TEST(OutputFiles, AreNoHostsAndNoStandardOutput)
+{
+    testsupport::TemporaryFolder const folder;
+    auto const before = std::filesystem::current_path();
+    std::filesystem::current_path(folder.path());
+    std::filesystem::create_directories("udp:/127.0.0.1:9");
+    std::filesystem::create_directory("-");
+    for (char const* const text : {"ndjson:-", "influx:udp://127.0.0.1:9", "prometheus:-", "mqtt://-"}) {
+        EXPECT_NO_THROW(velmora::requirePlainTarget(parseOutputAddress(text))) << text;
+    }
+    EXPECT_THROW(velmora::requirePlainTarget(parseOutputAddress("csv:udp:")), velmora::Error);
+    std::filesystem::current_path(before);
+}
+
 TEST(OutputFiles, ArePlainOnes)
 {
     testsupport::TemporaryFolder const folder;
@@ -87,7 +124,17 @@ TEST(OutputAddress, SizesHaveBinaryUnits)
     EXPECT_EQ(parseSize("10k"), 10240U);
     EXPECT_EQ(parseSize("10MB"), 10485760U);
     EXPECT_EQ(parseSize("2G"), 2147483648U);
-    for (char const* const wrong : {"", "0", "-1", "1T", "k", "1kk", "99999999999999999999", "99999999999999G"}) {
+    for (char const* const ten : {"10", "10B", "10b"}) {
+        EXPECT_EQ(parseSize(ten), 10U);
+    }
+    for (char const* const one : {"1048576k", "1024M", "1G", "1GB", "1gb", "1Gb", "1024mB", "1048576K"}) {
+        EXPECT_EQ(parseSize(one), 1ULL << 30) << one;
+    }
+    EXPECT_EQ(parseSize("18446744073709551615"), ~0ULL);
+    EXPECT_EQ(parseSize("17179869183G"), 17179869183ULL << 30);
+    EXPECT_THROW(parseSize("17179869184G"), velmora::Error);
+    for (char const* const wrong :
+         {"", "0", "-1", "1T", "k", "1kk", "1BB", "1KBB", "1 k", "99999999999999999999", "99999999999999G"}) {
         EXPECT_THROW(parseSize(wrong), velmora::Error) << wrong;
     }
 }

@@ -60,12 +60,15 @@ MetricsPage fullPage()
     return page;
 }
 
-std::string const page = fullPage().render(pageStart + std::chrono::milliseconds(2000), busyHealth());
+std::string page()
+{
+    return fullPage().render(pageStart + std::chrono::milliseconds(2000), busyHealth());
+}
 
 TEST(Prometheus, TheToolThatChecksMetricsIsContent)
 {
     testsupport::TemporaryFolder const folder;
-    std::ofstream(folder.file("page")) << page;
+    std::ofstream(folder.file("page")) << page();
     std::string const command = "promtool check metrics <" + folder.file("page") + " >" + folder.file("out") + " 2>&1";
     EXPECT_EQ(std::system(command.c_str()), 0) << folder.read("out");
     EXPECT_EQ(folder.read("out"), "");
@@ -76,7 +79,7 @@ TEST(Prometheus, NoSeriesComesTwiceAndNoFamilyInTwoPlaces)
     std::set<std::string> series;
     std::set<std::string> families;
     std::string family;
-    std::istringstream in(page);
+    std::istringstream in(page());
     for (std::string line; std::getline(in, line);) {
         std::string const name = line.substr(0, line.find_first_of("{ "));
         if (line.starts_with("# TYPE ")) {
@@ -115,6 +118,8 @@ TEST(Prometheus, WhatIsOldOrWithoutANumberLeavesThePage)
     some.take(nothing, pageStart);
     nothing.value = {};
     some.take(nothing, pageStart);
+    nothing.unit = "Hz"; // of which there was never a number
+    some.take(nothing, pageStart);
     EXPECT_THAT(some.render(pageStart + std::chrono::milliseconds(60000), {}), HasSubstr("SPEED"));
     EXPECT_THAT(some.render(pageStart + std::chrono::milliseconds(60000), {}), Not(HasSubstr("OLD")));
     EXPECT_THAT(some.render(pageStart + std::chrono::milliseconds(60001), {}), Not(HasSubstr("SPEED")));
@@ -122,14 +127,15 @@ TEST(Prometheus, WhatIsOldOrWithoutANumberLeavesThePage)
 
 TEST(Prometheus, TellsItsOwnHealth)
 {
-    EXPECT_THAT(page, HasSubstr("velmora_link_up 1\n"));
-    EXPECT_THAT(page, HasSubstr("velmora_requests_total 17\n"));
-    EXPECT_THAT(page, HasSubstr("velmora_state_info{state=\"running\"} 1\n"));
-    EXPECT_THAT(page, HasSubstr("velmora_output_dropped_total{output=\"csv:a.csv\"} 3\n"));
-    EXPECT_THAT(page, HasSubstr("velmora_output_up{output=\"mqtt://b/c\"} 0\n"));
-    EXPECT_THAT(page, HasSubstr("velmora_output_spool_records{output=\"mqtt://b/c\"} 118800\n"));
-    EXPECT_THAT(page, testing::Not(HasSubstr("velmora_output_up{output=\"csv")));
-    EXPECT_THAT(page, HasSubstr("velmora_output_dropped_total{output=\"sqlite:\\\"b\\\"\"} 3\n"));
+    std::string const text = page();
+    EXPECT_THAT(text, HasSubstr("velmora_link_up 1\n"));
+    EXPECT_THAT(text, HasSubstr("velmora_requests_total 17\n"));
+    EXPECT_THAT(text, HasSubstr("velmora_state_info{state=\"running\"} 1\n"));
+    EXPECT_THAT(text, HasSubstr("velmora_output_dropped_total{output=\"csv:a.csv\"} 3\n"));
+    EXPECT_THAT(text, HasSubstr("velmora_output_up{output=\"mqtt://b/c\"} 0\n"));
+    EXPECT_THAT(text, HasSubstr("velmora_output_spool_records{output=\"mqtt://b/c\"} 118800\n"));
+    EXPECT_THAT(text, testing::Not(HasSubstr("velmora_output_up{output=\"csv")));
+    EXPECT_THAT(text, HasSubstr("velmora_output_dropped_total{output=\"sqlite:\\\"b\\\"\"} 3\n"));
 }
 
 TEST(Prometheus, HasALineForAllThatAWatchCounts)
@@ -185,7 +191,9 @@ TEST(Prometheus, ServesThePage)
     std::string const reply = testsupport::httpGet(output.port(), "/metrics");
     EXPECT_THAT(reply, HasSubstr("Content-Type: text/plain; version=0.0.4; charset=utf-8\r\n"));
     EXPECT_THAT(reply, HasSubstr("sensor=\"SPEED\"} 10\n"));
+    unsigned short const port = output.port();
     output.close();
+    EXPECT_EQ(testsupport::httpGet(port, "/metrics"), "") << "nobody listens any more";
 }
 
 } // namespace

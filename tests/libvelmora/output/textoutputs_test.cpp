@@ -1,6 +1,7 @@
 #include "libvelmora/output/influxoutput.h"
 #include "libvelmora/output/lineprotocol.h"
 #include "libvelmora/output/ndjsonoutput.h"
+#include "tests/support/openfiles.h"
 #include "tests/support/records.h"
 #include "tests/support/temporaryfolder.h"
 
@@ -47,6 +48,30 @@ TEST(NdjsonOutput, OneObjectAReadingAndAnEvent)
     EXPECT_EQ(lines[3]["event"], "lamp_on");
     EXPECT_EQ(lines[4]["event"], "code_cleared");
     EXPECT_EQ(lines[4]["code"], "P0301");
+}
+
+TEST(NdjsonOutput, TellsTripsAndNewCodesAndNoLists)
+{
+    TemporaryFolder const folder;
+    velmora::NdjsonOutput output(parseOutputAddress("ndjson:" + folder.file("a")));
+    output.open();
+    velmora::Trip trip;
+    trip.vehicle = "van";
+    trip.end = velmora::fromMillis(march);
+    output.write(records(velmora::ModuleInfo{}, velmora::SensorList{}, velmora::LampState{}));
+    output.write(records(trip, velmora::CodeChange{velmora::fromMillis(march), "van", 0x7E8, "P0301", "pending", "x"}));
+    EXPECT_TRUE(testsupport::isHeldOpen(folder.file("a")));
+    output.close();
+    EXPECT_FALSE(testsupport::isHeldOpen(folder.file("a")));
+    EXPECT_EQ(folder.read("a"),
+              R"({"time":"2026-03-01T08:15:00.250Z","event":"trip","begin":"1970-01-01T00:00:00.000Z",)"
+              R"("end":"2026-03-01T08:15:00.250Z","vehicle":"van","kind":"trip","distance_km":0,"odometer_km":null,)"
+              R"("duration_s":0,"idle_s":0,"gap_s":0,"fuel_l":null,"mean_kmh":null,"max_kmh":null,"max_rpm":null,)"
+              R"("max_coolant_c":null})"
+              "\n"
+              R"({"time":"2026-03-01T08:15:00.250Z","vehicle":"van","event":"code","module":"7E8","code":"P0301",)"
+              R"("kind":"pending","text":"x"})"
+              "\n");
 }
 
 TEST(NdjsonOutput, ADayIsOfItsLines)

@@ -1,6 +1,8 @@
 #include "libvelmora/output/ballast.h"
 #include "libvelmora/output/metricfamily.h"
 #include "libvelmora/output/recordtime.h"
+#include "tests/support/filelimit.h"
+#include "tests/support/openfiles.h"
 #include "tests/support/records.h"
 #include "tests/support/temporaryfolder.h"
 
@@ -10,6 +12,7 @@
 #include <nlohmann/json.hpp>
 
 #include <cmath>
+#include <fstream>
 
 namespace {
 
@@ -97,6 +100,23 @@ TEST(Ballast, IsAFileBesideTheDatabase)
     EXPECT_FALSE(std::filesystem::exists(folder.file("b.db-ballast")));
     Ballast nowhere(folder.file("no/such/folder.db"), 4096);
     EXPECT_FALSE(nowhere.keep());
+    EXPECT_TRUE(ballast.fits(4 * 4096));
+    EXPECT_FALSE(ballast.fits(4 * 4096 - 1));
+    EXPECT_FALSE(Ballast(folder.file("c.db"), 1ULL << 62).fits(1ULL << 62));
+    std::ofstream(folder.file("a.db-ballast")) << "x";
+    EXPECT_TRUE(ballast.keep()) << "what is there of it is too small";
+    EXPECT_EQ(std::filesystem::file_size(folder.file("a.db-ballast")), 4096U);
+    EXPECT_FALSE(testsupport::isHeldOpen(folder.file("a.db-ballast")));
+    unsigned long long const most = std::filesystem::space(folder.path()).available / 3;
+    Ballast large(folder.file("d.db"), most);
+    EXPECT_FALSE(large.keep());
+    std::ofstream(folder.file("d.db-ballast")).close();
+    std::filesystem::resize_file(folder.file("d.db-ballast"), most);
+    EXPECT_TRUE(large.keep()) << "one that is there counts, on a full disk, too";
+    testsupport::FileLimit const limit(2048);
+    Ballast half(folder.file("e.db"), 4096);
+    EXPECT_FALSE(half.keep());
+    EXPECT_FALSE(std::filesystem::exists(folder.file("e.db-ballast"))) << "half of one is none";
 }
 
 // What one of the unit is in the base unit of its family, by the definitions of the units.

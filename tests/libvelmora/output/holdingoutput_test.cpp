@@ -1,0 +1,99 @@
+// What stands before an output of lines while the clock may still be set.
+#include "libvelmora/output/holdingoutput.h"
+#include "tests/support/records.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+namespace {
+
+using testing::ElementsAre;
+using testing::IsEmpty;
+using testsupport::march;
+using testsupport::reading;
+using testsupport::records;
+using velmora::ClockLook;
+
+struct Held
+{
+    ClockLook look{march, 1000, false, "boot"};
+    std::vector<std::string> calls;
+    std::vector<std::string> told;
+    velmora::HoldingOutput output;
+
+    Held() : output(std::make_unique<Inner>(*this), velmora::parseOutputAddress("csv:a"), context()) {}
+
+    velmora::OutputContext context()
+    {
+        velmora::OutputContext context;
+        context.clocks = [this] { return look; };
+        context.tell = [this](std::string const& text) { told.push_back(text); };
+        return context;
+    }
+    std::vector<std::string> write(int count)
+    {
+        calls.clear();
+        std::vector<velmora::SharedRecord> batch;
+        for (int i = 0; i < count; ++i) {
+            batch.push_back(records(reading("RPM", 1.0, look.wall))[0]);
+        }
+        output.write(batch);
+        return calls;
+    }
+
+private:
+    struct Inner : velmora::IOutput
+    {
+        explicit Inner(Held& theHeld) : held(theHeld) {}
+        void open() override { held.calls.emplace_back("open"); }
+        void write(velmora::Records records) override
+        {
+            held.calls.push_back("write " + std::to_string(records.size()));
+        }
+        void close() override { held.calls.emplace_back("close"); }
+        velmora::OutputState state() override { return {true, 3}; }
+
+        Held& held;
+    };
+};
+
+TEST(HoldingOutput, KeepsTheOutputGoingWhileItHoldsLinesBack)
+{
+    Held held;
+    held.output.open();
+    EXPECT_THAT(held.calls, ElementsAre("open"));
+    EXPECT_EQ(held.output.state().waiting, 3U) << "its own";
+    EXPECT_THAT(held.write(2), ElementsAre("write 0")) << "what it does by time goes on";
+    EXPECT_EQ(held.output.state().waiting, 2U);
+    EXPECT_EQ(held.output.state().up, true);
+    held.look.synced = true;
+    EXPECT_THAT(held.write(1), ElementsAre("write 3"));
+    EXPECT_EQ(held.output.state().waiting, 3U);
+    EXPECT_THAT(held.write(0), ElementsAre("write 0"));
+    held.look.synced = false; // the time server is gone
+    EXPECT_THAT(held.write(1), ElementsAre("write 0"));
+    held.calls.clear();
+    held.output.close();
+    EXPECT_THAT(held.calls, ElementsAre("write 1", "close"));
+    EXPECT_EQ(held.output.state().waiting, 3U);
+    EXPECT_EQ(held.told.size(), 1U);
+}
+
+TEST(HoldingOutput, TellsOnceThatNobodySetsTheClock)
+{
+    Held held;
+    held.look = {1000, 1000, false, "boot"};
+    held.output.open();
+    held.look = {300000, 300000, false, "boot"};
+    EXPECT_THAT(held.told, IsEmpty());
+    EXPECT_THAT(held.write(1), ElementsAre("write 1"));
+    EXPECT_THAT(held.write(1), ElementsAre("write 1"));
+    EXPECT_THAT(held.told, ElementsAre("csv:a: the clock was not set since the machine's start; times are written as "
+                                       "it tells them"));
+    held.calls.clear();
+    held.output.close();
+    EXPECT_THAT(held.calls, ElementsAre("close")) << "nothing is left";
+    EXPECT_EQ(held.told.size(), 1U);
+}
+
+} // namespace

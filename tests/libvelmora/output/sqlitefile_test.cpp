@@ -1,0 +1,213 @@
+// The file of a database: who holds it, what lies beside it, how long it is waited for, and what exactly comes into it.
+#include "libvelmora/output/database/sqliteoutput.h"
+#include "tests/support/openfiles.h"
+#include "tests/support/records.h"
+#include "tests/support/temporaryfolder.h"
+
+#include <velmora/error.h>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <fstream>
+#include <thread>
+
+namespace {
+
+using testing::ElementsAre;
+using testsupport::isHeldOpen;
+using testsupport::march;
+using testsupport::reading;
+using testsupport::records;
+using testsupport::TemporaryFolder;
+using velmora::Database;
+using velmora::SqliteOutput;
+
+struct DatabaseFile
+{
+    TemporaryFolder folder;
+    std::string file = folder.file("a.db");
+
+    std::unique_ptr<SqliteOutput> output(std::string const& settings = "") const
+    {
+        auto result = std::make_unique<SqliteOutput>(velmora::parseOutputAddress("sqlite:" + file + settings));
+        result->open();
+        return result;
+    }
+    std::uintmax_t ahead() const
+    {
+        std::error_code error;
+        std::uintmax_t const size = std::filesystem::file_size(file + "-wal", error);
+        return error ? 0 : size;
+    }
+    std::vector<std::string> texts(std::string const& sql) const
+    {
+        Database database(file, Database::Access::ReadOnly);
+        velmora::Statement statement(database, sql);
+        std::vector<std::string> result;
+        while (statement.next()) {
+            result.push_back(statement.isNull(0) ? "-" : statement.text(0));
+        }
+        return result;
+    }
+};
+
+std::string databaseTrouble(std::string const& file, Database::Access access = Database::Access::Write)
+{
+    try {
+        Database(file, access).number("SELECT count(*) FROM sqlite_schema");
+    } catch (velmora::Error const& error) {
+        EXPECT_EQ(error.hints().size(),
+                  error.kind() == velmora::ErrorKind::WrongUse || access == Database::Access::Write)
+            << "what to do";
+        return error.what();
+    }
+    return "";
+}
+
+TEST(SqliteFile, IsLetGoOfWhateverHappens)
+{
+    DatabaseFile const at;
+    {
+        auto const output = at.output();
+        output->write(records(reading("RPM", 1.0)));
+        EXPECT_TRUE(isHeldOpen(at.file));
+        output->open(); // again, after a failure
+        output->write(records(reading("RPM", 2.0)));
+        output->close();
+        EXPECT_FALSE(isHeldOpen(at.file));
+        output->close();
+    }
+    {
+        auto const output = at.output();
+        output->write(records(reading("RPM", 3.0)));
+    }
+    EXPECT_FALSE(isHeldOpen(at.file)) << "without being closed";
+    std::ofstream(at.folder.file("none")) << std::string(5000, 'x');
+    EXPECT_EQ(databaseTrouble(at.folder.file("none")), at.folder.file("none") + " is no database");
+    EXPECT_FALSE(isHeldOpen(at.folder.file("none")));
+    EXPECT_EQ(databaseTrouble(at.folder.file("no/file")),
+              "Could not open " + at.folder.file("no/file") + ": No such file or directory");
+    EXPECT_EQ(databaseTrouble(at.folder.file("missing"), Database::Access::ReadOnly),
+              "Could not open " + at.folder.file("missing") + ": unable to open database file");
+    EXPECT_FALSE(std::filesystem::exists(at.folder.file("missing"))) << "who only reads makes no file";
+}
+
+TEST(SqliteFile, IsWaitedForWhileAnotherWrites)
+{
+    DatabaseFile const at;
+    auto const output = at.output();
+    Database other(at.file);
+    auto hold = std::make_unique<velmora::Transaction>(other);
+    std::thread holder([&hold] {
+        std::this_thread::sleep_for(std::chrono::milliseconds(30));
+        hold.reset();
+    });
+    EXPECT_NO_THROW(output->write(records(reading("RPM", 1.0))));
+    holder.join();
+    EXPECT_EQ(other.number("SELECT count(*) FROM reading"), 1);
+}
+
+TEST(SqliteFile, LiesWholeInOneFileAfterAMinuteWithoutRecords)
+{
+    DatabaseFile const at;
+    auto const output = at.output();
+    output->write(records(velmora::Event{velmora::fromMillis(march), "van", "x", {}, ""}));
+    auto const rest = [&](int calls) {
+        for (int i = 0; i < calls; ++i) {
+            output->write({});
+        }
+        return at.ahead();
+    };
+    bool const sure = velmora::lookAtClocks().synced || output->database().number("SELECT count(*) FROM clock") == 0;
+    if (!sure) {
+        GTEST_SKIP() << "this machine's clock may still be set, and each call follows it";
+    }
+    EXPECT_GT(rest(59), 0U);
+    EXPECT_EQ(rest(1), 0U);
+    output->write(records(reading("RPM", 1.0)));
+    EXPECT_GT(rest(30), 0U);
+    output->write(records(reading("RPM", 2.0)));
+    EXPECT_GT(rest(59), 0U) << "counted from the last record";
+    EXPECT_EQ(rest(1), 0U);
+    output->write(records(reading("RPM", 3.0)));
+    Database const reader(at.file, Database::Access::ReadOnly);
+    output->close();
+    EXPECT_EQ(at.ahead(), 0U) << "and at the end, though another reads";
+}
+
+TEST(SqliteFile, KeepsItsBallastWheneverThereIsRoom)
+{
+    DatabaseFile const at;
+    auto const output = at.output();
+    std::string const ballast = at.file + "-ballast";
+    EXPECT_EQ(std::filesystem::file_size(ballast), 2U << 20U);
+    std::filesystem::remove(ballast);
+    output->write(records(reading("RPM", 1.0)));
+    EXPECT_TRUE(std::filesystem::exists(ballast));
+    output->database().execute("CREATE TRIGGER no BEFORE INSERT ON event BEGIN SELECT RAISE(FAIL, 'no'); END");
+    EXPECT_THROW(output->write(records(velmora::Event{})), velmora::Error);
+    EXPECT_TRUE(std::filesystem::exists(ballast)) << "the disk is not full";
+    EXPECT_FALSE(output->database().isFull());
+}
+
+TEST(SqliteFile, TakesWhatComesBehindAFailureAsItIs)
+{
+    DatabaseFile const at;
+    auto const output = at.output();
+    output->database().execute("CREATE TRIGGER no BEFORE INSERT ON event BEGIN SELECT RAISE(FAIL, 'no'); END");
+    auto const event = [](char const* text) {
+        return records(velmora::Event{velmora::fromMillis(march), "van", "x", {}, text});
+    };
+    EXPECT_THROW(output->write(event("first")), velmora::Error);
+    output->database().execute("DROP TRIGGER no");
+    output->write(event("second"));
+    EXPECT_THAT(at.texts("SELECT text FROM event"), ElementsAre("second"));
+    velmora::Statement wrong(output->database(), "SELECT abs(?)");
+    wrong.bind(1, std::numeric_limits<std::int64_t>::min());
+    EXPECT_THROW(wrong.next(), velmora::Error) << "has no absolute value";
+    wrong.bind(1, std::int64_t{-5});
+    EXPECT_TRUE(wrong.next());
+    EXPECT_EQ(wrong.number(0), 5);
+}
+
+TEST(SqliteFile, HoldsWholeNumbersAsSuchAndNoOthers)
+{
+    DatabaseFile const at;
+    std::pair<double, char const*> const cases[] = {
+        {0.0, "integer 0"},       {-3.0, "integer -3"},
+        {-2.5, "real -2.5"},      {8999999999999999.0, "integer 8999999999999999"},
+        {9e15, "real 9.0e+15"},   {-8999999999999999.0, "integer -8999999999999999"},
+        {-9e15, "real -9.0e+15"}, {std::nan(""), "null -"},
+        {1e300, "real 1.0e+300"}, {HUGE_VAL, "null -"},
+    };
+    std::vector<velmora::SharedRecord> batch;
+    std::vector<std::string> expected;
+    for (auto const& [number, text] : cases) {
+        batch.push_back(records(reading("X", number, march + static_cast<long long>(batch.size())))[0]);
+        expected.emplace_back(text);
+    }
+    at.output()->write(batch);
+    EXPECT_EQ(at.texts("SELECT typeof(value) || ' ' || ifnull(value, '-') FROM reading ORDER BY time"), expected);
+}
+
+TEST(SqliteFile, KnowsASensorByItsUnitTooAndAModuleByItsLastWords)
+{
+    DatabaseFile const at;
+    auto const output = at.output();
+    velmora::Reading miles = reading("SPEED", 1.0, march + 1);
+    miles.unit = "mph";
+    output->write(
+        records(velmora::SensorList{{}, "van", {{1, "A", "0101", "First", "V"}, {1, "A", "0101", "First", "V"}}},
+                reading("SPEED", 2.0), miles, reading("SPEED", 3.0, march + 2),
+                velmora::ModuleInfo{velmora::fromMillis(march), "van", 1, "ECM", "Engine", ""}, velmora::LampState{}));
+    EXPECT_THAT(at.texts("SELECT key || ' ' || unit || ' ' || count(sensor) FROM sensor LEFT JOIN reading ON "
+                         "sensor.id = sensor GROUP BY id ORDER BY id"),
+                ElementsAre("A V 0", "SPEED rpm 2", "SPEED mph 1"));
+    EXPECT_THAT(at.texts("SELECT vin FROM module"), ElementsAre("-"));
+    EXPECT_THAT(at.texts("SELECT name FROM module"), ElementsAre("ECM"));
+    EXPECT_THAT(at.texts("SELECT seen FROM module"), ElementsAre(std::to_string(march)));
+}
+
+} // namespace
