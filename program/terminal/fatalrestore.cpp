@@ -1,6 +1,5 @@
 #include "program/terminal/fatalrestore.h"
 
-#include <algorithm>
 #include <array>
 #include <csignal>
 #include <unistd.h>
@@ -9,7 +8,12 @@ namespace velmora::cli {
 
 namespace {
 
-constexpr int fatalSignals[] = {SIGQUIT, SIGSEGV, SIGABRT, SIGBUS, SIGILL, SIGFPE};
+struct FatalSignal
+{
+    int const number;
+    struct sigaction before
+    {};
+};
 
 // What a handler may use: set before it is installed, and left alone as long as it is.
 struct Kept
@@ -18,7 +22,7 @@ struct Kept
     std::size_t length = 0;
     termios before{};
     bool hasBefore = false;
-    std::array<struct sigaction, std::size(fatalSignals)> actions{};
+    FatalSignal signals[6] = {{SIGQUIT}, {SIGSEGV}, {SIGABRT}, {SIGBUS}, {SIGILL}, {SIGFPE}};
 };
 
 Kept kept;
@@ -51,8 +55,8 @@ FatalRestore::FatalRestore(std::string const& text, termios const* before)
     {};
     action.sa_handler = restoreAndEnd;
     sigemptyset(&action.sa_mask);
-    for (std::size_t i = 0; i < std::size(fatalSignals); ++i) {
-        ::sigaction(fatalSignals[i], &action, &kept.actions[i]);
+    for (FatalSignal& each : kept.signals) {
+        ::sigaction(each.number, &action, &each.before);
     }
 }
 
@@ -63,8 +67,8 @@ void FatalRestore::restore() const
 
 FatalRestore::~FatalRestore()
 {
-    for (std::size_t i = 0; i < std::size(fatalSignals); ++i) {
-        ::sigaction(fatalSignals[i], &kept.actions[i], nullptr);
+    for (FatalSignal const& each : kept.signals) {
+        ::sigaction(each.number, &each.before, nullptr);
     }
 }
 

@@ -86,6 +86,14 @@ TEST_F(CommandRun, ValuesComeInLinesOrJson)
     EXPECT_EQ(lines, (std::vector<std::string>{",Vehicle Speed Sensor (km/h)", ",0", ",0"}));
 }
 
+// A round more of sensors that are read every ten seconds would take as long.
+TEST_F(CommandRun, AsManyReadingsAsWishedTakeNoLonger)
+{
+    auto const start = std::chrono::steady_clock::now();
+    EXPECT_EQ(run("@B live -n 1 SPEED --rate 0.1").out, "Vehicle Speed Sensor: 0 km/h\n");
+    EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(5));
+}
+
 // What a person reads on a terminal, where both ends of the program come together.
 TEST_F(CommandRun, WhatIsToldStandsBehindWhatWasPrintedBefore)
 {

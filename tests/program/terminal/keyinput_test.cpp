@@ -57,6 +57,27 @@ TEST(KeyInput, GivesOneKeyAtATime)
     EXPECT_FALSE(keys.ended());
 }
 
+TEST(KeyInput, WaitsForTheRestOfASequenceButNotLong)
+{
+    PseudoTerminal const terminal;
+    Replaced const input(STDIN_FILENO, terminal.terminal());
+    KeyInput keys;
+    terminal.type("\033");
+    EXPECT_EQ(keys.read(patience), std::nullopt) << "more may come";
+    terminal.type("[A");
+    EXPECT_EQ(keys.read(patience), Key::Up);
+    terminal.type("\033");
+    auto const start = std::chrono::steady_clock::now();
+    std::optional<Key> key;
+    while (!key) {
+        key = keys.read(patience);
+    }
+    auto const waited = std::chrono::steady_clock::now() - start;
+    EXPECT_EQ(key, Key::Escape) << "nothing came";
+    EXPECT_GE(waited, milliseconds(100));
+    EXPECT_LT(waited, patience / 2);
+}
+
 TEST(KeyInput, EndsWithItsTerminal)
 {
     PseudoTerminal terminal;

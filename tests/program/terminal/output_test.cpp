@@ -124,6 +124,20 @@ TEST(Output, ThatCannotBeWrittenIsTold)
     EXPECT_THAT(told, testing::ElementsAre(expected, expected, expected));
 }
 
+TEST(LinePrinter, PrintsALineWhenItComes)
+{
+    Pipe const pipe;
+    std::string content;
+    withOutput(pipe.ends[1], [&] {
+        LinePrinter printer;
+        printer.print("a line\n");
+        pollfd reader{pipe.ends[0], POLLIN, 0};
+        ::poll(&reader, 1, 5000);
+        content = pipe.content();
+    });
+    EXPECT_EQ(content, "a line\n") << "though more may follow";
+}
+
 TEST(LinePrinter, PrintsAllOfItInItsOrder)
 {
     std::string expected;

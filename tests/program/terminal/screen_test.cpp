@@ -151,4 +151,29 @@ TEST(FatalRestore, WritesItsTextAndBringsTheTerminalBack)
     }
 }
 
+TEST(FatalRestore, IsDoneForEachSignalThatNothingElseAnswers)
+{
+    int const signals[] = {SIGQUIT, SIGSEGV, SIGABRT, SIGBUS, SIGILL, SIGFPE};
+    auto const handlers = [&signals] {
+        std::vector<sighandler_t> list;
+        for (int const each : signals) {
+            struct sigaction action
+            {};
+            EXPECT_EQ(::sigaction(each, nullptr, &action), 0);
+            list.push_back(action.sa_handler);
+        }
+        return list;
+    };
+    std::vector<sighandler_t> const before = handlers();
+    {
+        FatalRestore const restore("", nullptr);
+        std::vector<sighandler_t> const meanwhile = handlers();
+        for (std::size_t i = 0; i < before.size(); ++i) {
+            EXPECT_NE(meanwhile[i], before[i]) << signals[i];
+            EXPECT_EQ(meanwhile[i], meanwhile[0]) << signals[i];
+        }
+    }
+    EXPECT_EQ(handlers(), before);
+}
+
 } // namespace
