@@ -15,20 +15,6 @@ using FrameBytes = std::vector<std::uint8_t>;
 constexpr std::size_t canFrameBytes = 8;
 constexpr std::size_t legacyHeaderBytes = 3;
 
-FrameBytes decodedDigits(std::string_view digits)
-{
-    FrameBytes bytes;
-    for (std::size_t i = 0; i + 1 < digits.size(); i += 2) {
-        int const high = hexDigitValue(digits[i]);
-        int const low = hexDigitValue(digits[i + 1]);
-        if (high < 0 || low < 0) {
-            return {};
-        }
-        bytes.push_back(static_cast<std::uint8_t>(high << 4 | low));
-    }
-    return bytes;
-}
-
 unsigned int numberOf(std::string_view digits)
 {
     unsigned int number = 0;
@@ -64,13 +50,13 @@ std::optional<BusLine> parseCanLine(BusKind bus, std::string_view digits, bool e
     std::size_t const headerDigits = bus == BusKind::Can11 ? 3 : 8;
     std::size_t const behind = headerDigits + (extended ? 2 : 0);
     std::size_t const frameBytes = canFrameBytes - (extended ? 1 : 0);
-    if (digits.size() < behind + 4 || (digits.size() - headerDigits) % 2 != 0) {
+    if (digits.size() < behind + 4) {
         return std::nullopt;
     }
     BusLine line;
     line.header = std::string(digits.substr(0, headerDigits));
     line.module = numberOf(line.header) & 0x1FFFFFFFU;
-    line.bytes = decodedDigits(digits.substr(behind));
+    line.bytes = digitBytes(digits.substr(behind));
     if (line.bytes.empty() || line.bytes.size() > frameBytes) {
         return std::nullopt;
     }
@@ -91,8 +77,8 @@ std::optional<BusLine> parseCanLine(BusKind bus, std::string_view digits, bool e
 // How a legacy frame divides.
 struct LegacyShape
 {
-    std::size_t header = legacyHeaderBytes;
-    std::size_t data = 0;
+    std::size_t header;
+    std::size_t data;
 };
 
 // The format byte of ISO 14230 holds the length in its low bits; for more than 63 bytes they are 0, and a byte of its
@@ -109,8 +95,8 @@ std::optional<LegacyShape> kwpShape(FrameBytes const& bytes)
 
 std::optional<BusLine> parseLegacyLine(BusKind bus, std::string_view digits)
 {
-    FrameBytes const bytes = decodedDigits(digits);
-    if (digits.size() % 2 != 0 || bytes.size() < legacyHeaderBytes + 2) {
+    FrameBytes const bytes = digitBytes(digits);
+    if (bytes.size() < legacyHeaderBytes + 2) {
         return std::nullopt;
     }
     LegacyShape shape{legacyHeaderBytes, bytes.size() - legacyHeaderBytes - 1};
@@ -157,10 +143,9 @@ BusKind busKindOf(obd::ObdProtocol protocol)
         return BusKind::Can11;
     case obd::ObdProtocolCan29:
         return BusKind::Can29;
-    case obd::ObdProtocolUnknown:
-        break;
+    default:
+        return BusKind::Unknown;
     }
-    return BusKind::Unknown;
 }
 
 BusKind busKindOf(int protocol)
@@ -183,8 +168,8 @@ std::optional<BusLine> parseBusLine(BusKind bus, std::string_view digits, bool e
 
 bool hasRightCheckByte(BusKind bus, std::string_view digits)
 {
-    FrameBytes bytes = decodedDigits(digits);
-    if (digits.size() % 2 != 0 || bytes.size() < 2) {
+    FrameBytes bytes = digitBytes(digits);
+    if (bytes.size() < 2) {
         return false;
     }
     std::uint8_t const told = bytes.back();

@@ -15,14 +15,13 @@ bool ModuleMessages::add(BusLine const& line, std::string const& digits, std::si
     if (line.kind == BusLine::Kind::Consecutive) {
         return addConsecutive(line, digits, place);
     }
-    ModuleMessage message;
-    message.module = line.module;
-    message.payload = line.payload;
-    message.places = {place};
-    message.headerDigits = line.header.size();
-    message.length = line.payload.size();
-    message.carried = m_carried;
-    message.lines = {digits};
+    ModuleMessage message{.module = line.module,
+                          .length = line.payload.size(),
+                          .carried = m_carried,
+                          .payload = line.payload,
+                          .lines = {digits},
+                          .places = {place},
+                          .headerDigits = line.header.size()};
     if (line.kind == BusLine::Kind::First) {
         ModuleMessage const* const before = open(line.module);
         if (before != nullptr && before->lines.size() == 1 && before->lines.front() == digits) {
@@ -53,7 +52,7 @@ bool ModuleMessages::addConsecutive(BusLine const& line, std::string const& digi
         note(Habit::OrphanFrame);
         return false;
     }
-    if (message->lines.size() > 1 && message->lines.back() == digits) {
+    if (message->lines.back() == digits) {
         note(Habit::RepeatedFrame);
         return false;
     }
@@ -64,7 +63,7 @@ bool ModuleMessages::addConsecutive(BusLine const& line, std::string const& digi
     // A number that this message does not reach is of another one.
     std::size_t const told = line.bytes[0] & 0x0FU;
     std::size_t const frames = message->length / m_carried;
-    if (frames < sequenceNumbers - 1 && (told == 0 || told > frames)) {
+    if (frames < sequenceNumbers && (told == 0 || told > frames)) {
         ++m_orphans[line.module];
         note(Habit::OrphanFrame);
         return false;

@@ -43,12 +43,12 @@ void CountLearner::learn(std::string const& request, FrameSet const& frames, Wir
     Entry& entry = m_entries[request];
     if (entry.equal >= enoughToLearn && entry.frames != frames) {
         clear(); // other modules than before: all that was learnt is in doubt
-        m_entries[request] = {frames, 1, took, WireTime(0), 0, false};
+        m_entries[request] = {.frames = frames, .equal = 1, .plain = took};
     } else if (entry.frames == frames) {
-        entry.plain = entry.equal == 0 ? took : std::min(entry.plain, took);
+        entry.plain = std::min(entry.plain, took);
         ++entry.equal;
     } else {
-        entry = {frames, 1, took, WireTime(0), 0, false};
+        entry = {.frames = frames, .equal = 1, .plain = took};
     }
     m_lastCheck = now;
 }
@@ -87,7 +87,7 @@ std::map<std::string, FrameSet> CountLearner::learnt() const
 
 void CountLearner::recall(std::string const& request, FrameSet const& frames)
 {
-    m_entries.try_emplace(request, Entry{frames, enoughToLearn, WireTime(0), WireTime(0), 0, false});
+    m_entries.try_emplace(request, Entry{.frames = frames, .equal = enoughToLearn});
 }
 
 } // namespace velmora

@@ -14,18 +14,6 @@ bool isOneOf(std::string const& text, std::array<std::string_view, N> const& wor
     return std::find(words.begin(), words.end(), text) != words.end();
 }
 
-std::vector<std::uint8_t> requestBytes(std::string const& text)
-{
-    std::vector<std::uint8_t> bytes;
-    if (text.size() % 2 != 0 || !std::all_of(text.begin(), text.end(), [](char c) { return hexDigitValue(c) >= 0; })) {
-        return bytes;
-    }
-    for (std::size_t i = 0; i + 1 < text.size(); i += 2) {
-        bytes.push_back(static_cast<std::uint8_t>(hexDigitValue(text[i]) << 4 | hexDigitValue(text[i + 1])));
-    }
-    return bytes;
-}
-
 } // namespace
 
 int hexDigitValue(char character)
@@ -39,6 +27,19 @@ int hexDigitValue(char character)
     return character >= 'a' && character <= 'f' ? character - 'a' + 10 : -1;
 }
 
+std::vector<std::uint8_t> digitBytes(std::string_view digits)
+{
+    std::vector<std::uint8_t> bytes;
+    bool const areDigits = std::all_of(digits.begin(), digits.end(), [](char c) { return hexDigitValue(c) >= 0; });
+    if (digits.size() % 2 != 0 || !areDigits) {
+        return bytes;
+    }
+    for (std::size_t i = 0; i < digits.size(); i += 2) {
+        bytes.push_back(static_cast<std::uint8_t>(hexDigitValue(digits[i]) << 4 | hexDigitValue(digits[i + 1])));
+    }
+    return bytes;
+}
+
 std::string compactText(std::string_view line)
 {
     std::string text;
@@ -50,7 +51,7 @@ std::string compactText(std::string_view line)
     return text;
 }
 
-ElmCommand::ElmCommand(std::string_view line) : m_text(compactText(line)), m_request(requestBytes(m_text)) {}
+ElmCommand::ElmCommand(std::string_view line) : m_text(compactText(line)), m_request(digitBytes(m_text)) {}
 
 bool ElmCommand::onlyReads() const
 {

@@ -47,6 +47,8 @@ private:
 
 // The value of a hexadecimal digit, or -1.
 int hexDigitValue(char character);
+// The bytes of hexadecimal digits; nothing where half a byte or anything else stands among them.
+std::vector<std::uint8_t> digitBytes(std::string_view digits);
 // Without white space, in upper case.
 std::string compactText(std::string_view line);
 

@@ -75,8 +75,7 @@ void LearntStore::load()
             }
         }
     } catch (toml::parse_error const&) {
-        m_adapters.clear();
-        m_vehicles.clear();
+        return; // before anything was taken
     }
 }
 

@@ -18,8 +18,6 @@ public:
         m_taken = true;
     }
 
-    bool try_lock() { return try_lock_for(std::chrono::milliseconds(0)); }
-
     template <typename Rep, typename Period>
     bool try_lock_for(std::chrono::duration<Rep, Period> const& limit)
     {

@@ -128,8 +128,9 @@ std::string cleaned(std::string answer)
 bool hasPrompt(std::string const& answer)
 {
     std::size_t const prompt = answer.find('>');
-    constexpr std::string_view lineEnds("\r\n\0", 3);
-    return prompt != std::string::npos && prompt != 0 && lineEnds.find(answer[prompt - 1]) != std::string_view::npos;
+    std::string_view const before = std::string_view(answer).substr(0, prompt);
+    bool const behindALine = before.ends_with('\r') || before.ends_with('\n') || before.ends_with('\0');
+    return prompt != std::string::npos && behindALine;
 }
 
 // A prompt is what no modem and no printer sends. What stood in the adapter's line before makes the first question an

@@ -30,7 +30,7 @@ int millisUntil(IPulledPort::Moment until)
 
 bool wouldWait()
 {
-    return errno == EAGAIN || errno == EWOULDBLOCK || errno == EINTR;
+    return errno == EAGAIN || errno == EINTR; // EWOULDBLOCK is the same as the first
 }
 
 } // namespace
@@ -118,7 +118,8 @@ bool StreamPort::isUp()
         return false;
     }
     pollfd link{m_descriptor, POLLRDHUP, 0};
-    return ::poll(&link, 1, 0) <= 0 || (link.revents & linkGone) == 0;
+    ::poll(&link, 1, 0);
+    return (link.revents & linkGone) == 0;
 }
 
 // Sends what waits meanwhile. False when there is nothing to read: the time is over, or somebody has interrupted.
@@ -189,9 +190,7 @@ std::size_t StreamPort::put(std::string_view bytes)
 void StreamPort::putRest()
 {
     std::lock_guard const lock(m_mutex);
-    if (!m_closed && !m_outgoing.empty()) {
-        m_outgoing.erase(0, put(m_outgoing));
-    }
+    m_outgoing.erase(0, put(m_outgoing));
 }
 
 void StreamPort::shut()

@@ -51,7 +51,6 @@ std::unique_ptr<IPort> openTcpPort(TcpAddress const& address, OpeningStop const&
         failConnect(address, error == asio::error::timed_out ? "no answer" : error.message());
     }
     socket.set_option(tcp::no_delay(true), error);
-    context->restart();
     return std::make_unique<AsioPort<tcp::socket>>(std::move(context), std::move(socket));
 }
 
