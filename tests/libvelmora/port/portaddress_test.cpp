@@ -35,6 +35,7 @@ TEST(PortAddress, UnderstandsEveryForm)
          SimulatorAddress{"a.toml", true, "stn2120", "town", "s.txt", {"garbage=0.01", "error:BUS BUSY@2"}}},
         {"replay:car.dialogue", ReplayAddress{"car.dialogue"}},
         {"bt://00:1d:a5:68:98:8b", velmora::BluetoothAddress{"00:1D:A5:68:98:8B", {}}},
+        {"bt://00:1D:A5:68:98:8B?channel=30", velmora::BluetoothAddress{"00:1D:A5:68:98:8B", 30}},
         {"bt://00:1D:A5:68:98:8B?channel=2", velmora::BluetoothAddress{"00:1D:A5:68:98:8B", 2}},
         {"ble://AA:BB:CC:DD:EE:FF", velmora::BleAddress{"AA:BB:CC:DD:EE:FF"}},
     };
@@ -50,44 +51,60 @@ TEST(PortAddress, BaudOptionHoldsWhereTheAddressNamesNone)
               PortAddress(SerialAddress{"/dev/ttyS0", 500000}));
 }
 
-TEST(PortAddress, RefusesWhatIsNoAddressAndTellsTheForms)
+TEST(PortAddress, RefusesWhatIsNoAddressAndTellsWhy)
 {
-    for (char const* text : {"",
-                             ":35000",
-                             "host:",
-                             "host:0",
-                             "host:65536",
-                             "host:12a",
-                             "[::1",
-                             "[::1]x",
-                             "ftp://host",
-                             "ftp:host:21",
-                             "fe80::1",
-                             "replay:",
-                             "serial://",
-                             "/dev/ttyUSB0?rate=1",
-                             "/dev/ttyUSB0?baud=x",
-                             "sim:x?",
-                             "sim:x?fast",
-                             "sim:x?drive=",
-                             "sim:x?adapter",
-                             "sim:x?instant&",
-                             "sim:x?speed=3",
-                             "two words",
-                             "bt://",
-                             "bt://00:1D:A5:68:98",
-                             "bt://00-1D-A5-68-98-8B",
-                             "bt://00:1D:A5:68:98:8B?channel=31",
-                             "bt://00:1D:A5:68:98:8B?channel=0",
-                             "ble://AA:BB:CC:DD:EE:FG",
-                             "ble://AA:BB:CC:DD:EE:FF?x"}) {
+    char const* const host = "the host is missing or holds what no host name holds";
+    char const* const number = "the port number must be from 1 to 65535";
+    char const* const option = "after ? only instant, adapter=NAME, drive=NAME, scenario=FILE and fault=FAULT are";
+    char const* const mac = "a Bluetooth address is six pairs of digits, such as 00:1D:A5:68:98:8B";
+    std::pair<char const*, char const*> const rows[] = {
+        {"", host},
+        {":35000", host},
+        {"two words", host},
+        {"[]:1", host},
+        {"host:", "the port number behind the colon is missing"},
+        {"host:0", number},
+        {"host:65536", number},
+        {"host:12a", number},
+        {"[::1]:0", number},
+        {"[::1", "the closing ] is missing"},
+        {"[::1]x", "after ] only :PORT is understood"},
+        {"[::1]1", "after ] only :PORT is understood"},
+        {"ftp://host", "the kind before :// is unknown"},
+        {"ftp:host:21", "only in brackets may a host hold colons, such as [fe80::1]:35000"},
+        {"fe80::1", "only in brackets may a host hold colons, such as [fe80::1]:35000"},
+        {"replay:", "the file is missing"},
+        {"serial://", "the device is missing"},
+        {"serial:?baud=9600", "the device is missing"},
+        {"/dev/ttyUSB0?rate=1", "after ? only baud=NUMBER is understood"},
+        {"/dev/ttyUSB0?baud=x", "after ? only baud=NUMBER is understood"},
+        {"/dev/ttyUSB0?baud=0", "after ? only baud=NUMBER is understood"},
+        {"sim:x?", option},
+        {"sim:x?fast", option},
+        {"sim:x?drive=", option},
+        {"sim:x?adapter", option},
+        {"sim:x?instant&", option},
+        {"sim:x?speed=3", option},
+        {"bt://", mac},
+        {"bt://00:1D:A5:68:98", mac},
+        {"bt://00:1D:A5:68:98:8B:", mac},
+        {"bt://00-1D-A5-68-98-8B", mac},
+        {"bt://G0:1D:A5:68:98:8B", mac},
+        {"ble://AA:BB:CC:DD:EE:FG", mac},
+        {"ble://AA:BB:CC:DD:EE:FF?x", mac},
+        {"bt://00:1D:A5:68:98:8B?channel=31", "after ? only channel=N is understood, from 1 to 30"},
+        {"bt://00:1D:A5:68:98:8B?channel=0", "after ? only channel=N is understood, from 1 to 30"},
+        {"bt://00:1D:A5:68:98:8B?port=1", "after ? only channel=N is understood, from 1 to 30"},
+    };
+    for (auto const& [text, why] : rows) {
         try {
             parsePortAddress(text);
             ADD_FAILURE() << text << " was taken";
         } catch (Error const& failure) {
             EXPECT_EQ(failure.kind(), ErrorKind::WrongUse);
-            EXPECT_NE(std::string(failure.what()).find("is no port"), std::string::npos) << text;
-            EXPECT_FALSE(failure.hints().empty());
+            std::string const what = failure.what();
+            EXPECT_NE(what.find(std::string(" is no port: ") + why), std::string::npos) << what;
+            EXPECT_EQ(failure.hints().size(), 5U) << "each form";
         }
     }
 }
@@ -96,6 +113,11 @@ TEST(PortAddress, PrintsItselfForMessages)
 {
     EXPECT_EQ(toString(parsePortAddress("/dev/ttyUSB0")), "/dev/ttyUSB0 (38400 baud)");
     EXPECT_EQ(toString(parsePortAddress("[::1]:1")), "[::1]:1");
+    EXPECT_EQ(toString(parsePortAddress("tcp:host:1")), "host:1");
+    EXPECT_EQ(toString(parsePortAddress("replay:a b")), "replay:a b");
+    EXPECT_EQ(toString(parsePortAddress("bt://00:1d:a5:68:98:8b?channel=3")), "bt://00:1D:A5:68:98:8B?channel=3");
+    EXPECT_EQ(toString(parsePortAddress("bt://00:1d:a5:68:98:8b")), "bt://00:1D:A5:68:98:8B");
+    EXPECT_EQ(toString(parsePortAddress("ble://00:1d:a5:68:98:8b")), "ble://00:1D:A5:68:98:8B");
     EXPECT_EQ(toString(parsePortAddress("sim:x")), "sim:x");
     EXPECT_EQ(toString(parsePortAddress("sim:x?instant")), "sim:x?instant");
     char const* const all = "sim:x?instant&adapter=stn2120&drive=town&scenario=s&fault=seed=7&fault=echo";

@@ -146,6 +146,28 @@ TEST_F(PortHolderTest, IsFoundByItsLockUnlessItHasGone)
     EXPECT_EQ(holder(), std::nullopt);
     std::ofstream(m_root / "locks/LCK..ttyUSB0") << "rubbish\n";
     EXPECT_EQ(holder(), std::nullopt);
+    fs::create_directories(m_root / "proc/0");
+    fs::create_directories(m_root / "proc/1");
+    fs::create_directories(m_root / "proc" / std::to_string(::getpid()));
+    std::ofstream(m_root / "locks/LCK..ttyUSB0") << "0\n";
+    EXPECT_EQ(holder(), std::nullopt);
+    std::ofstream(m_root / "locks/LCK..ttyUSB0") << ::getpid();
+    EXPECT_EQ(holder(), std::nullopt) << "its own lock stands in nobody's way";
+    std::ofstream(m_root / "locks/LCK..ttyUSB0") << "1\n";
+    EXPECT_EQ(holder(), "a program (process 1)") << "whose name is not readable";
+}
+
+TEST_F(PortHolderTest, IsAnotherProcess)
+{
+    for (std::string const& process : {std::string("self"), std::to_string(::getpid())}) {
+        fs::create_directories(m_root / "proc" / process / "fd");
+        fs::create_symlink(m_root / "ttyUSB0", m_root / "proc" / process / "fd/3");
+        EXPECT_EQ(holder(), std::nullopt) << process;
+    }
+    fs::create_symlink(m_root / "elsewhere", m_root / "proc/4711/fd/3");
+    EXPECT_EQ(holder(), std::nullopt) << "who has something else open";
+    fs::create_symlink(m_root / "ttyUSB0", m_root / "proc/4711/fd/4");
+    EXPECT_EQ(holder(), "minicom (process 4711)");
 }
 
 TEST(PortSearch, TriesTheLastGoodOneFirstAndPassesOthersBy)

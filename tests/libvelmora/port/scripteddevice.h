@@ -6,6 +6,7 @@
 #include <mutex>
 #include <poll.h>
 #include <string>
+#include <sys/ioctl.h>
 #include <termios.h>
 #include <thread>
 #include <unistd.h>
@@ -50,6 +51,25 @@ public:
         std::lock_guard const lock(m_mutex);
         return m_rates;
     }
+    // The settings of the line when it was asked last.
+    termios settingsWhenAsked() const
+    {
+        std::lock_guard const lock(m_mutex);
+        return m_asked;
+    }
+    // Says something that nobody has asked for.
+    void say(std::string const& text) const
+    {
+        [[maybe_unused]] ssize_t const written = ::write(m_master, text.data(), text.size());
+    }
+    // Each character of an answer comes once the one before it was read.
+    void spell() { m_spells = true; }
+    // The first answer, before the one that stays.
+    void answerFirst(std::string const& answer)
+    {
+        std::lock_guard const lock(m_mutex);
+        m_first = answer;
+    }
     termios settings() const
     {
         termios settings{};
@@ -74,8 +94,24 @@ private:
                 continue;
             }
             m_rates.push_back(::cfgetospeed(&now));
+            m_asked = now;
             if (m_speed == B0 || m_rates.back() == m_speed) {
-                [[maybe_unused]] ssize_t const written = ::write(m_master, m_answer.data(), m_answer.size());
+                answer(m_first.empty() ? m_answer : std::exchange(m_first, {}));
+            }
+        }
+    }
+    void answer(std::string const& text) const
+    {
+        if (!m_spells) {
+            say(text);
+            return;
+        }
+        for (char const each : text) {
+            say(std::string(1, each));
+            int unread = 1;
+            for (int i = 0; i < 500 && unread != 0; ++i) {
+                ::poll(nullptr, 0, 1);
+                ::ioctl(m_slave, FIONREAD, &unread);
             }
         }
     }
@@ -86,9 +122,12 @@ private:
     int m_master = -1;
     int m_slave = -1;
     std::atomic<bool> m_stop{false};
+    std::atomic<bool> m_spells{false};
     mutable std::mutex m_mutex;
     std::string m_received; // protected by m_mutex, as what follows
     std::vector<speed_t> m_rates;
+    termios m_asked{};
+    std::string m_first;
     std::thread m_thread;
 };
 

@@ -8,7 +8,9 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <chrono>
 #include <cstdlib>
+#include <thread>
 
 namespace {
 
@@ -105,12 +107,14 @@ TEST_F(BluetoothSearchTest, TriesTheOneOfLastTimeFirst)
     hints();
     EXPECT_EQ(m_told, "Trying ble://AA:BB:CC:DD:EE:03 ...\nTrying ble://AA:BB:CC:DD:EE:01 ...\n") << "no one twice";
     m_search.stop = [] { return true; };
+    m_told.clear();
     try {
         velmora::findAdapter(m_search);
         ADD_FAILURE() << "went on";
     } catch (velmora::Error const& error) {
         EXPECT_EQ(error.kind(), velmora::ErrorKind::Interrupted);
     }
+    EXPECT_EQ(m_told, "Trying ble://AA:BB:CC:DD:EE:03 ...\n") << "and no one else";
 }
 
 TEST(PortSearch, SaysWhenThereIsNothingToLookOn)
@@ -166,6 +170,37 @@ TEST(PortProbe, KnowsAnAdapterByItsPrompt)
     EXPECT_FALSE(answers(std::string(4097, 'x')));
     EXPECT_FALSE(answers("", [] { return true; }));
     EXPECT_EQ(written, "ATI\r.ATI\r.ATI\r.ATI\r.");
+    int asked = 0;
+    auto const patient = [&asked] { return ++asked > 1; };
+    EXPECT_FALSE(answers(std::string(4096, 'x'), patient));
+    EXPECT_EQ(asked, 2) << "there may be more of it";
+    EXPECT_FALSE(answers(std::string(4097, 'x'), patient));
+    EXPECT_EQ(asked, 2) << "that is nobody's answer";
+}
+
+// As ports do: on a thread of their own, and in pieces.
+TEST(PortProbe, WaitsForAnAnswerThatComesLater)
+{
+    class LaterPort : public velmora::IPort
+    {
+    public:
+        void start(Receiver onBytes, LossHandler /*onLost*/) override { m_onBytes = std::move(onBytes); }
+        void write(std::string_view /*bytes*/) override
+        {
+            m_thread = std::thread([this] {
+                m_onBytes("ELM327 ");
+                m_onBytes("v1.5\r\r>");
+            });
+        }
+        void close() override { m_thread.join(); }
+
+    private:
+        Receiver m_onBytes;
+        std::thread m_thread;
+    };
+    auto const start = std::chrono::steady_clock::now();
+    EXPECT_TRUE(velmora::answersAsAdapter(std::make_unique<LaterPort>(), {}));
+    EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(3));
 }
 
 // The known answers of FNV-1a with 64 bits.

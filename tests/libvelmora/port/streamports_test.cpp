@@ -12,9 +12,12 @@
 
 #include <arpa/inet.h>
 #include <cerrno>
+#include <chrono>
 #include <condition_variable>
 #include <cstring>
 #include <mutex>
+#include <netinet/in.h>
+#include <netinet/tcp.h>
 #include <sys/socket.h>
 #include <sys/stat.h>
 #include <unistd.h>
@@ -128,6 +131,28 @@ TEST(TcpPort, SendsInOrderHoweverMuchWaitsAndTellsTheLossOnce)
     port->write("nobody hears it");
     port->close();
     EXPECT_EQ(brought.losses, 1);
+}
+
+// A command is a few bytes, and waits for nothing that could go with it.
+TEST(TcpPort, SendsEachCommandAtOnce)
+{
+    Listener listener;
+    auto const start = std::chrono::steady_clock::now();
+    auto const port = velmora::openTcpPort(listener.address(), nullptr);
+    EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(5));
+    int found = 0;
+    for (int descriptor = 3; descriptor < 256; ++descriptor) {
+        sockaddr_in peer{};
+        socklen_t length = sizeof(peer);
+        int noDelay = 0;
+        socklen_t size = sizeof(noDelay);
+        if (::getpeername(descriptor, reinterpret_cast<sockaddr*>(&peer), &length) == 0 && peer.sin_family == AF_INET &&
+            ntohs(peer.sin_port) == listener.address().port &&
+            ::getsockopt(descriptor, IPPROTO_TCP, TCP_NODELAY, &noDelay, &size) == 0) {
+            found += noDelay;
+        }
+    }
+    EXPECT_EQ(found, 1);
 }
 
 TEST(TcpPort, AnEndOfItsOwnIsNoLoss)
