@@ -45,11 +45,11 @@ std::optional<std::string> dateText(std::vector<unsigned char> const& data)
     }
     std::string const whole = data.size() == 3 ? "20" + digits : digits;
     int const month = std::stoi(whole.substr(4, 2));
-    int const day = std::stoi(whole.substr(6, 2));
+    int const day = std::stoi(whole.substr(6));
     if (month < 1 || month > 12 || day < 1 || day > 31) {
         return std::nullopt;
     }
-    return whole.substr(0, 4) + "-" + whole.substr(4, 2) + "-" + whole.substr(6, 2);
+    return whole.substr(0, 4) + "-" + whole.substr(4, 2) + "-" + whole.substr(6);
 }
 
 std::optional<std::string> sessionText(std::vector<unsigned char> const& data)
@@ -103,6 +103,34 @@ std::vector<IdentifierRow> const& standardIdentifiers()
 
 namespace {
 
+// Some modules put the count of texts in front. Where it is 0 it is filling.
+std::optional<std::string> countedText(std::vector<unsigned char> const& data)
+{
+    bool const counted = data.size() > 1 && data.front() < ' ';
+    return plainText(counted ? std::vector<unsigned char>(data.begin() + 1, data.end()) : data);
+}
+
+// Nothing for data that is not what it should be, and for bytes.
+std::optional<std::string> wordsOf(IdentifierKind kind, std::vector<unsigned char> const& data)
+{
+    switch (kind) {
+    case IdentifierKind::CountedText:
+        return countedText(data);
+    case IdentifierKind::Text:
+    case IdentifierKind::Vin:
+        return plainText(data);
+    case IdentifierKind::Session:
+        return sessionText(data);
+    case IdentifierKind::Date: {
+        std::optional<std::string> const date = dateText(data);
+        return date ? date : plainText(data);
+    }
+    case IdentifierKind::Bytes:
+        return std::nullopt;
+    }
+    return std::nullopt;
+}
+
 // Null for any other identifier.
 IdentifierRow const* rowOfIdentifier(unsigned int did)
 {
@@ -115,29 +143,7 @@ IdentifierRow const* rowOfIdentifier(unsigned int did)
 std::string identifierText(unsigned int did, std::vector<unsigned char> const& data)
 {
     IdentifierRow const* const row = rowOfIdentifier(did);
-    std::optional<std::string> text;
-    switch (row != nullptr ? row->kind : IdentifierKind::Bytes) {
-    case IdentifierKind::CountedText:
-        if (data.size() > 1 && data.front() > 0 && data.front() < ' ') {
-            text = plainText({data.begin() + 1, data.end()});
-            break;
-        }
-        [[fallthrough]];
-    case IdentifierKind::Text:
-    case IdentifierKind::Vin:
-        text = plainText(data);
-        break;
-    case IdentifierKind::Session:
-        text = sessionText(data);
-        break;
-    case IdentifierKind::Date:
-        text = dateText(data);
-        text = text ? text : plainText(data);
-        break;
-    case IdentifierKind::Bytes:
-        break;
-    }
-    return text ? *text : hexText(data);
+    return wordsOf(row != nullptr ? row->kind : IdentifierKind::Bytes, data).value_or(hexText(data));
 }
 
 std::string localIdentifierText(std::vector<unsigned char> const& data)

@@ -29,8 +29,9 @@ KwpCodeReport readKwpCodes(ModuleAsker& asker, RequestAddress const& address)
         report.answer = topicAnswer(answer);
         report.reason = describe(answer);
         if (answer.kind == ModuleAnswer::Kind::Positive) {
-            std::size_t const count = answer.payload.size() < kwpLead ? 0 : answer.payload[1];
-            if (answer.payload.size() != kwpLead + count * kwpCodeBytes) {
+            std::size_t const size = answer.payload.size();
+            bool const whole = size >= kwpLead && size == kwpLead + answer.payload[1] * kwpCodeBytes;
+            if (!whole) {
                 report.answer = TopicAnswer::Unreadable;
                 report.reason = "is answered unreadably";
                 return report;

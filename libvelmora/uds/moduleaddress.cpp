@@ -69,7 +69,7 @@ AddressOrReason legacyAddress(std::string const& header, std::string const& repl
     if (extended) {
         return refused("only CAN has an address byte beside the header");
     }
-    if (!reply.empty() && (reply.size() != legacyHeader || reply.substr(4, 2) != header.substr(2, 2))) {
+    if (!reply.empty() && (reply.size() != legacyHeader || reply.substr(4) != header.substr(2, 2))) {
         return refused(
             fmt::format("the reply {} is not one of the module {}, which is asked", reply, header.substr(2, 2)));
     }

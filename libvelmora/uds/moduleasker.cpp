@@ -8,7 +8,6 @@
 #include <obd/nack.h>
 
 #include <algorithm>
-#include <utility>
 
 namespace velmora {
 
@@ -28,7 +27,7 @@ bool isEchoed(std::vector<unsigned char> const& request, std::vector<unsigned ch
     if (payload.empty() || payload.front() != obd::positiveReply(request.front())) {
         return false;
     }
-    if (request.front() == 0x22 && request.size() > 3) {
+    if (request.front() == 0x22 && request.size() != 3) {
         return payload.size() >= 3;
     }
     // Readers of codes repeat their sub-function only; those of KWP2000 a count instead.
@@ -43,7 +42,7 @@ bool isEchoed(std::vector<unsigned char> const& request, std::vector<unsigned ch
 // On SAE J1850 the request's own bytes stand between its service and the code.
 unsigned char refusalIn(std::vector<unsigned char> const& request, std::vector<unsigned char> const& payload)
 {
-    bool const repeats = payload.size() > 3 && request.size() > 1 && payload[2] == request[1];
+    bool const repeats = request.size() > 1 && payload[2] == request[1];
     return repeats ? payload.back() : payload[2];
 }
 
@@ -114,7 +113,6 @@ ReplyContent ModuleAsker::exchange(RequestAddress const& address, std::vector<un
     m_proxy.execute(hexText(request), ignored, exchangeLimitMs);
     AddressedReply const reply = m_control.takeReply();
     std::string const refused = m_control.refusedAddress();
-    trouble = {};
     if (!refused.empty()) {
         trouble = {ModuleAnswer::Kind::NotReached, 0, {}, 0, refused};
     } else if (!reply.answered) {
@@ -153,13 +151,10 @@ ModuleAnswer ModuleAsker::ask(RequestAddress const& address, std::vector<unsigne
     // Some modules put their own address in front of their frames, and the adapter drops what is not the tester's.
     if (answer.kind == ModuleAnswer::Kind::Silent && !used.extended.empty() && used.tester != used.extended &&
         request.front() != 0x3E) {
-        std::string const before = std::exchange(used.tester, used.extended);
-        ModuleAnswer const second = judged();
-        if (second.kind != ModuleAnswer::Kind::Silent) {
+        used.tester = used.extended;
+        answer = judged();
+        if (answer.kind != ModuleAnswer::Kind::Silent) {
             m_ownTester.insert(key);
-            answer = second;
-        } else {
-            used.tester = before;
         }
     }
     // The adapter has ended the exchange while the module was still at it.

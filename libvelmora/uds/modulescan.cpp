@@ -16,7 +16,6 @@ namespace {
 constexpr unsigned int listenMs = 3000;
 constexpr unsigned int replyWaitMs = 100; // modules begin within 50 ms (ISO 14229-2), gateways take a little longer
 constexpr unsigned int firstShort = 0x700;
-constexpr unsigned int lastShort = 0x7EF;
 constexpr unsigned int firstStandardReply = 0x7E8;
 constexpr unsigned int everyone = 0x7DF;
 constexpr unsigned int longPrefix = 0x18DA0000;
@@ -72,8 +71,8 @@ std::vector<unsigned int> ModuleScan::candidates(std::set<unsigned int> const& h
             ids.push_back(longPrefix | i << 8U | tester);
         }
     }
-    for (unsigned int id = firstShort; !m_long && id <= lastShort; ++id) {
-        if (id != everyone && id < firstStandardReply) {
+    for (unsigned int id = firstShort; !m_long && id < firstStandardReply; ++id) {
+        if (id != everyone) {
             ids.push_back(id);
         }
     }
@@ -81,24 +80,25 @@ std::vector<unsigned int> ModuleScan::candidates(std::set<unsigned int> const& h
     return ids;
 }
 
+namespace {
+
 // Any answer to "tester present" shows a module, a refusal too.
-std::optional<FoundModule> ModuleScan::ask(unsigned int id, ModuleAnswer::Kind& kind)
+bool isThere(ModuleAnswer const& answer)
 {
-    ModuleAnswer const answer =
+    return answer.kind == ModuleAnswer::Kind::Positive || answer.kind == ModuleAnswer::Kind::Refused;
+}
+
+} // namespace
+
+ModuleAnswer ModuleScan::ask(unsigned int id)
+{
+    ModuleAnswer answer =
         m_asker.ask(pattern(m_long, identifierText(id)), {statusService, 0x00}, RequestPurpose::Presence);
-    kind = answer.kind;
-    bool const there = answer.kind == ModuleAnswer::Kind::Positive || answer.kind == ModuleAnswer::Kind::Refused;
     if (answer.kind == ModuleAnswer::Kind::NotReached) {
         throw Error(ErrorKind::NotSupported, "The adapter does not know " + answer.detail,
                     {"it can't ask modules beyond OBD; one of level 1.4b or newer can"});
     }
-    if (!there) {
-        return std::nullopt;
-    }
-    FoundModule module;
-    module.request = identifierText(id);
-    module.reply = identifierText(answer.module);
-    return module;
+    return answer;
 }
 
 std::vector<FoundModule> ModuleScan::find()
@@ -124,12 +124,11 @@ std::vector<FoundModule> ModuleScan::find()
         if (used.contains(ids[i])) {
             continue; // a module that was found meanwhile answers by it
         }
-        ModuleAnswer::Kind kind = ModuleAnswer::Kind::Silent;
-        std::optional<FoundModule> module = ask(ids[i], kind);
-        guard.countTrouble(kind == ModuleAnswer::Kind::BusTrouble, "while it asked who is there");
-        if (module) {
-            used.insert(parseHex(module->reply, 0x1FFFFFFF).value_or(0));
-            found.push_back(std::move(*module));
+        ModuleAnswer const answer = ask(ids[i]);
+        guard.countTrouble(answer.kind == ModuleAnswer::Kind::BusTrouble, "while it asked who is there");
+        if (isThere(answer)) {
+            used.insert(answer.module);
+            found.push_back({identifierText(ids[i]), identifierText(answer.module), {}, {}, {}, {}});
         }
     }
     return found;

@@ -4,7 +4,6 @@
 #include "libvelmora/uds/moduleasker.h"
 
 #include <functional>
-#include <optional>
 #include <set>
 #include <string>
 #include <vector>
@@ -34,7 +33,7 @@ public:
 private:
     std::set<unsigned int> listen();
     std::vector<unsigned int> candidates(std::set<unsigned int> const& heard) const;
-    std::optional<FoundModule> ask(unsigned int id, ModuleAnswer::Kind& kind);
+    ModuleAnswer ask(unsigned int id);
 
     ModuleAsker& m_asker;
     std::function<void()> const m_check;

@@ -41,6 +41,10 @@ nlohmann::ordered_json toJsonValue(FoundModule const& module)
 
 nlohmann::json ModuleStore::read() const
 {
+    std::error_code ignored;
+    if (!std::filesystem::is_regular_file(m_file, ignored)) {
+        return nlohmann::json::object();
+    }
     std::ifstream in(m_file);
     nlohmann::json document = nlohmann::json::parse(in, nullptr, false);
     return document.is_object() ? document : nlohmann::json::object();

@@ -95,6 +95,10 @@ Document documentOf(ProbeState const& state)
 
 std::optional<ProbeState> ProbeStore::load() const
 {
+    std::error_code ignored;
+    if (!std::filesystem::is_regular_file(m_file, ignored)) {
+        return std::nullopt;
+    }
     std::ifstream in(m_file);
     nlohmann::json const document = nlohmann::json::parse(in, nullptr, false);
     if (!document.is_object() || !document.contains("next")) {

@@ -20,24 +20,26 @@ void RequestState::take(ModuleAnswer const& answer, Time now)
     switch (answer.kind) {
     case ModuleAnswer::Kind::Positive:
         *this = RequestState();
-        break;
+        return;
     case ModuleAnswer::Kind::Refused:
         m_silent = 0;
-        takeRefusal(answer.code, now);
-        break;
+        return takeRefusal(answer.code, now);
     case ModuleAnswer::Kind::NotReached:
     case ModuleAnswer::Kind::NotSent:
-        end();
-        break;
+        return end();
     case ModuleAnswer::Kind::Silent:
     case ModuleAnswer::Kind::Foreign:
     case ModuleAnswer::Kind::Unreadable:
     case ModuleAnswer::Kind::BusTrouble:
-        // Silence ends nothing, for the module may wake; but it must not hold up the others.
-        if (++m_silent >= mostSilent) {
-            m_notBefore = now + conditionsPause;
-        }
-        break;
+        return countSilence(now);
+    }
+}
+
+// Silence ends nothing, for the module may wake; but it must not hold up the others.
+void RequestState::countSilence(Time now)
+{
+    if (++m_silent >= mostSilent) {
+        m_notBefore = now + conditionsPause;
     }
 }
 
@@ -51,27 +53,29 @@ void RequestState::takeRefusal(unsigned char code, Time now)
     case RefusalAction::StopAbsent:
     case RefusalAction::StopLocked:
     case RefusalAction::StopSession:
-        end();
-        break;
+        return end();
     case RefusalAction::RetryLater:
-        m_notBefore = now + conditionsPause;
-        break;
-    case RefusalAction::RetrySoon:
-        m_notBefore = now + (++m_busy <= mostBusy ? std::chrono::milliseconds(busyPause)
-                                                  : std::chrono::milliseconds(conditionsPause));
-        m_busy = m_busy > mostBusy ? 0 : m_busy;
-        break;
-    case RefusalAction::Split:
-        m_split = true;
-        countFailure();
-        break;
     case RefusalAction::Wait: // even with the longest wait nothing came
         m_notBefore = now + conditionsPause;
-        break;
+        return;
+    case RefusalAction::RetrySoon:
+        return countBusy(now);
+    case RefusalAction::Split:
+        m_split = true;
+        return countFailure();
     case RefusalAction::StopAfterThree:
-        countFailure();
-        break;
+        return countFailure();
     }
+}
+
+void RequestState::countBusy(Time now)
+{
+    if (++m_busy <= mostBusy) {
+        m_notBefore = now + busyPause;
+        return;
+    }
+    m_notBefore = now + conditionsPause;
+    m_busy = 0;
 }
 
 void RequestState::countFailure()

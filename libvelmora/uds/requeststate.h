@@ -25,6 +25,8 @@ public:
 
 private:
     void takeRefusal(unsigned char code, Time now);
+    void countSilence(Time now);
+    void countBusy(Time now);
     void countFailure();
     void end() { m_ended = true; }
 

@@ -36,11 +36,9 @@ bool SignalChoice::choose(SensorWish const& wish, std::vector<unsigned int> cons
         return false;
     }
     // Of a PID with several values those are meant that can be told.
-    if (found.size() > 1) {
-        auto const undecoded = [&](std::size_t index) { return !set()[index].signal.formula; };
-        if (!std::all_of(found.begin(), found.end(), undecoded)) {
-            std::erase_if(found, undecoded);
-        }
+    auto const undecoded = [&](std::size_t index) { return !set()[index].signal.formula; };
+    if (!std::all_of(found.begin(), found.end(), undecoded)) {
+        std::erase_if(found, undecoded);
     }
     for (std::size_t const index : found) {
         add(index, wish, meant);

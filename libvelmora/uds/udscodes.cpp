@@ -3,6 +3,7 @@
 #include <fmt/format.h>
 
 #include <algorithm>
+#include <iterator>
 
 namespace velmora {
 
@@ -75,7 +76,7 @@ UdsCodeReport readUdsCodes(ModuleAsker& asker, RequestAddress const& address)
     report.available = listed.payload[2];
     for (std::size_t i = lead; i < listed.payload.size(); i += 4) {
         UdsCode code;
-        std::copy_n(listed.payload.begin() + static_cast<std::ptrdiff_t>(i), 3, code.bytes);
+        std::copy_n(listed.payload.begin() + static_cast<std::ptrdiff_t>(i), std::size(code.bytes), code.bytes);
         code.status = listed.payload[i + 3];
         report.codes.push_back(code);
     }

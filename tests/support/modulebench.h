@@ -32,6 +32,9 @@ public:
         return *this;
     }
 
+    // The adapter says nothing any more, not even that nobody answered.
+    void fallMute() { m_mute = true; }
+
     // "7E1 221E1C" of each request so far; forgets them.
     std::vector<std::string> takeAsked() { return std::exchange(m_asked, {}); }
     std::vector<velmora::RequestAddress> const& addresses() const { return m_addresses; }
@@ -45,7 +48,8 @@ public:
             return FakeProxy::execute(command, response, timeoutMs);
         }
         if (command == "ATI") {
-            return Status::Ok; // no request: what came before is still to be told
+            m_reply.lines = std::exchange(m_shown, {}); // what it showed of the bus until then
+            return Status::Ok;
         }
         m_asked.push_back(m_address->header + " " + command);
         m_addresses.push_back(*m_address);
@@ -53,13 +57,17 @@ public:
         if (!m_refused.empty()) {
             return Status::NoResponse;
         }
-        m_reply.answered = true;
+        m_reply.answered = !m_mute;
         auto const found = m_replies.find({m_address->header, command});
         if (found == m_replies.end()) {
             m_reply.error = "NODATA";
             return Status::NoResponse;
         }
         m_reply.lines = found->second.front();
+        if (command == "ATMA") {
+            m_shown = std::exchange(m_reply.lines, {});
+            return Status::NoResponse;
+        }
         if (found->second.size() > 1) {
             found->second.pop_front();
         }
@@ -82,6 +90,8 @@ private:
     std::map<std::pair<std::string, std::string>, std::deque<std::vector<std::string>>> m_replies;
     std::optional<velmora::RequestAddress> m_address;
     std::string m_refused;
+    bool m_mute = false;
+    std::vector<std::string> m_shown;
     velmora::AddressedReply m_reply;
     std::vector<std::string> m_asked;
     std::vector<velmora::RequestAddress> m_addresses;
