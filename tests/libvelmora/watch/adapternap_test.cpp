@@ -19,6 +19,8 @@ struct NapAdapter
     std::map<std::string, std::string> answers = {{"\r", ">"}};
     std::vector<std::string> written;
     bool reachable = true;
+    bool starts = true;
+    int closed = 0;
     velmora::IPort::Receiver say;
     velmora::IPort::LossHandler drop;
 
@@ -38,6 +40,9 @@ private:
         explicit Port(NapAdapter& theAdapter) : adapter(theAdapter) {}
         void start(Receiver onBytes, LossHandler onLost) override
         {
+            if (!adapter.starts) {
+                throw velmora::Error(velmora::ErrorKind::PortFailed, "breaks at once");
+            }
             adapter.say = std::move(onBytes);
             adapter.drop = std::move(onLost);
         }
@@ -46,7 +51,7 @@ private:
             adapter.written.emplace_back(bytes);
             adapter.say(adapter.answers[std::string(bytes)]);
         }
-        void close() override {}
+        void close() override { ++adapter.closed; }
 
         NapAdapter& adapter;
     };
@@ -77,9 +82,33 @@ TEST(AdapterNap, AWirelessOneCanBeReachedAgainWhenItWakes)
     adapter.drop();
     EXPECT_FALSE(nap.isOver());
     EXPECT_FALSE(nap.isOver());
+    EXPECT_EQ(adapter.closed, 1);
     adapter.reachable = true;
+    adapter.starts = false;
+    EXPECT_FALSE(nap.isOver());
+    EXPECT_FALSE(nap.isOver()) << "it did not come up";
+    adapter.starts = true;
     EXPECT_TRUE(nap.isOver());
     EXPECT_EQ(adapter.written.size(), 2U);
+}
+
+TEST(AdapterNap, LetsGoOfThePortAtItsEnd)
+{
+    NapAdapter adapter;
+    adapter.answers["STSLEEP\r"] = "OK\r\r>\r\n";
+    {
+        AdapterNap nap(adapter.opener(), 1ms);
+        EXPECT_TRUE(nap.sleeps());
+        EXPECT_FALSE(nap.isOver()) << "the rest of its answer wakes nobody";
+        EXPECT_EQ(adapter.closed, 0);
+    }
+    EXPECT_EQ(adapter.closed, 1);
+    {
+        AdapterNap nap(adapter.opener(), 1ms);
+        adapter.drop();
+        EXPECT_FALSE(nap.isOver());
+    }
+    EXPECT_EQ(adapter.closed, 2) << "that was closed already";
 }
 
 TEST(AdapterNap, OneThatKnowsNoSleepIsToldApart)
@@ -102,6 +131,24 @@ TEST(RequestCount, CountsWhatGoesToControlModules)
     count.onDataReceived(bytes("41 0C 1A F8\r\r>"));
     EXPECT_EQ(count.requests(), 2U);
     EXPECT_EQ(count.errors(), 1U);
+    for (char const* const told :
+         {"UNABLE TO CONNECT\r", "BUS ERROR\r", "NO DATA\rCAN ERROR\r", "UNABLE, ERROR", "OK"}) {
+        count.onDataReceived(bytes(told));
+    }
+    EXPECT_EQ(count.errors(), 5U) << "one each, but for OK";
+    count.onDataSent(bytes("5"));
+    EXPECT_EQ(count.requests(), 2U) << "half a byte asks nothing";
+}
+
+TEST(RequestCount, PassesTheDialogueOn)
+{
+    std::string dialogue;
+    velmora::RequestCount count(
+        [&dialogue](bool sent, std::string_view text) { dialogue += (sent ? ">" : "<") + std::string(text); });
+    count.onDataSent({'0', '1', '0', '0', '\r'});
+    count.onDataReceived({'N', 'O', ' ', 'D', 'A', 'T', 'A'});
+    EXPECT_EQ(dialogue, ">0100\r<NO DATA");
+    EXPECT_EQ(count.requests() + count.errors(), 2U);
 }
 
 } // namespace

@@ -52,6 +52,46 @@ TEST(CodeWatch, ALampThatIsOnAtFirstIsTold)
 {
     CodeWatch watch("van");
     EXPECT_THAT(news(watch, lookAt(true, {})), ElementsAre("lamp_on"));
+    EXPECT_THAT(news(watch, lookAt(true, {})), IsEmpty());
+    EXPECT_THAT(news(watch, lookAt(false, {})), ElementsAre("lamp_off"));
+    EXPECT_THAT(news(watch, lookAt(false, {})), IsEmpty());
+}
+
+TEST(CodeWatch, NamesVehicleModuleAndTimeInAllThatItTells)
+{
+    CodeWatch watch("van");
+    velmora::WallTime const time{std::chrono::hours(1)};
+    std::vector<std::string> told;
+    auto const take = [&](CodeLook const& look) {
+        told.clear();
+        for (velmora::Record const& each : watch.take(look, time)) {
+            if (auto const* const event = std::get_if<velmora::Event>(&each)) {
+                EXPECT_EQ(event->module, look.module);
+                EXPECT_EQ(event->vehicle, "van");
+                EXPECT_EQ(event->time, time);
+                told.push_back(event->text);
+            } else if (auto const* const change = std::get_if<velmora::CodeChange>(&each)) {
+                EXPECT_EQ(change->module, look.module);
+                EXPECT_EQ(change->vehicle, "van");
+                EXPECT_EQ(change->time, time);
+                told.push_back(change->code + (change->present ? " came: " : " went: ") + change->text);
+            } else {
+                auto const& lamp = std::get<velmora::LampState>(each);
+                EXPECT_EQ(lamp.vehicle + std::to_string(lamp.module), "van" + std::to_string(look.module));
+                EXPECT_EQ(lamp.time, time);
+            }
+        }
+        return told;
+    };
+    EXPECT_THAT(take({1, true, {{"pending", std::vector<CodeLook::Code>()}}, 2}),
+                ElementsAre("The malfunction lamp is on"));
+    EXPECT_THAT(take({1, false, {{"pending", {{{"P0301", "Misfire"}}}}}, 0}),
+                ElementsAre("The malfunction lamp is off", "P0301 came: Misfire", "P0301 (pending) Misfire",
+                            "All monitors have run"));
+    EXPECT_THAT(take({2, {}, {{"pending", {{{"P0301", "Misfire"}}}}}, 1}), ElementsAre("P0301 came: Misfire"))
+        << "another module, at its first look";
+    EXPECT_THAT(take({1, {}, {{"pending", std::vector<CodeLook::Code>()}}, 1}),
+                ElementsAre("P0301 went: Misfire", "P0301 (pending) Misfire", "Monitors have not run"));
 }
 
 TEST(CodeWatch, TellsTheLampAtEachLookThatKnowsIt)

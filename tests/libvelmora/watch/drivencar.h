@@ -23,7 +23,11 @@ public:
     bool plugged = true;
     bool answers = true;
     bool engineless = false; // tells no engine speed
+    bool voltless = false;   // nor does the adapter tell the voltage
     std::optional<double> odometer;
+    std::optional<double> moduleVolts;
+    std::optional<double> fuelRate;
+    std::optional<double> coolant;
     double rpm = 0.0;
     double kmh = 0.0;
     double battery = 12.6;
@@ -31,6 +35,8 @@ public:
     std::uint64_t asked = 0;
     int connects = 0;
     int voltLooks = 0;
+    int stops = 0;
+    int disconnects = 0;
     std::string number = "VIN-1";
     bool canNap = true;
     bool woken = false;
@@ -54,6 +60,7 @@ public:
     }
     void disconnect() override
     {
+        ++disconnects;
         m_up = false;
         m_asking = false;
     }
@@ -65,20 +72,18 @@ public:
         m_asking = true;
         m_next = m_time.steady();
     }
-    void stopAsking() override { m_asking = false; }
+    void stopAsking() override
+    {
+        m_asking = false;
+        ++stops;
+    }
     std::vector<Reading> readings() override
     {
         std::vector<Reading> result;
         for (; m_asking && plugged && m_next <= m_time.steady(); m_next += std::chrono::seconds(1)) {
             asked += 2;
             if (answers) {
-                if (!engineless) {
-                    result.push_back(reading("RPM", rpm));
-                }
-                result.push_back(reading("SPEED", kmh));
-                if (odometer) {
-                    result.push_back(reading("CLEAR_DISTANCE", *odometer));
-                }
+                addReadings(result);
             }
         }
         given += static_cast<int>(result.size());
@@ -97,7 +102,7 @@ public:
     {
         needLink();
         ++voltLooks;
-        return battery;
+        return voltless ? std::nullopt : std::optional(battery);
     }
     bool probe() override
     {
@@ -126,6 +131,21 @@ private:
             throw Error(ErrorKind::PortFailed, "no such device");
         }
     }
+    void addReadings(std::vector<Reading>& result) const
+    {
+        auto const add = [&](std::string const& sensor, std::optional<double> const& value, char const* unit = "") {
+            if (value) {
+                result.push_back(reading(sensor, *value));
+                result.back().unit = unit;
+            }
+        };
+        add("RPM", engineless ? std::nullopt : std::optional(rpm));
+        add("SPEED", kmh);
+        add("CLEAR_DISTANCE", odometer);
+        add("MODULE_VOLTAGE", moduleVolts);
+        add("FUEL_RATE", fuelRate, "l/h");
+        add("COOLANT_TEMP", coolant);
+    }
     Reading reading(std::string const& sensor, double value) const
     {
         Reading result;
@@ -148,6 +168,8 @@ struct DrivenWatch
     DrivenCar car{time};
     std::vector<std::string> events;
     std::vector<Trip> trips;
+    int modules = 0;
+    int sensorLists = 0;
     int readings = 0;
     WatchEngine engine;
 
@@ -166,6 +188,8 @@ struct DrivenWatch
         } else if (std::holds_alternative<Reading>(record)) {
             ++readings;
         }
+        modules += std::holds_alternative<ModuleInfo>(record) ? 1 : 0;
+        sensorLists += std::holds_alternative<SensorList>(record) ? 1 : 0;
     }
     void run(std::chrono::milliseconds duration)
     {

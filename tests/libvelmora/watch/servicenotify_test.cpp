@@ -1,4 +1,5 @@
 #include "libvelmora/watch/servicenotify.h"
+#include "tests/support/openfiles.h"
 #include "tests/support/temporaryfolder.h"
 
 #include <gtest/gtest.h>
@@ -63,6 +64,18 @@ TEST(ServiceNotify, TellsTheManagerByEitherKindOfSocket)
         EXPECT_EQ(manager.heard(), "-");
     }
     ServiceNotify().tell("READY=1"); // nobody listens
+    std::string longest = folder.file("");
+    longest += std::string(107 - longest.size(), 'x');
+    Manager const far(longest);
+    ServiceNotify().tell("READY=1");
+    EXPECT_EQ(far.heard(), "READY=1") << "as long as a name may be";
+    long const before = testsupport::openDescriptors();
+    ServiceNotify().tell("STOPPING=1");
+    EXPECT_EQ(testsupport::openDescriptors(), before);
+    ::setenv("NOTIFY_SOCKET", (longest + "x").c_str(), 1);
+    ServiceNotify().tell("READY=1");
+    EXPECT_EQ(far.heard(), "STOPPING=1");
+    EXPECT_EQ(far.heard(), "-") << "the name was another";
     ::setenv("NOTIFY_SOCKET", std::string(200, 'x').c_str(), 1);
     ServiceNotify().tell("READY=1"); // no socket has so long a name
     ::unsetenv("NOTIFY_SOCKET");

@@ -29,7 +29,7 @@ public:
         auto const found = m_answers.find(std::string(bytes));
         found == m_answers.end() ? m_onLost() : m_onBytes(found->second);
     }
-    void close() override {}
+    void close() override { m_written.emplace_back("closed"); }
 
 private:
     std::map<std::string, std::string> const m_answers;
@@ -47,7 +47,8 @@ TEST(VoltageProbe, AsksTheAdapterAndNobodyElse)
 {
     std::vector<std::string> written;
     EXPECT_EQ(probed({{"\r", "?\r\r>"}, {"ATRV\r", "ATRV\r12.6V\r\r>"}}, written), 12.6);
-    EXPECT_EQ(written, (std::vector<std::string>{"\r", "ATRV\r"}));
+    EXPECT_EQ(written, (std::vector<std::string>{"\r", "ATRV\r", "closed"}));
+    EXPECT_EQ(probed({{"\r", ">"}, {"ATRV\r", ">ATRV\r12.5V\r\r>"}}, written), 12.5) << "a prompt that came late";
     EXPECT_EQ(probed({{"\r", ">"}, {"ATRV\r", "?\r\r>"}}, written), std::nullopt);
     EXPECT_EQ(probed({{"\r", ""}, {"ATRV\r", ""}}, written), std::nullopt); // silent
     EXPECT_THROW(probed({{"\r", ">"}}, written), velmora::Error);
@@ -57,8 +58,14 @@ TEST(VoltageProbe, FindsVolts)
 {
     EXPECT_EQ(findVolts("ATRV\r13.8V\r"), 13.8);
     EXPECT_EQ(findVolts("12v"), 12.0);
+    EXPECT_EQ(findVolts("39.9V"), 39.9);
+    EXPECT_EQ(findVolts("0.1V"), 0.1);
+    EXPECT_EQ(findVolts("1.2.3V"), 3.0);
+    EXPECT_EQ(findVolts("12 13 V 14V"), 14.0);
+    EXPECT_EQ(findVolts("99V 12.1V"), 12.1);
     EXPECT_EQ(findVolts("ELM327 v1.5\r24.9V"), 24.9);
-    for (char const* const none : {"", "V", "12.6", "0.0V", "99.9V", "?", "ELM327 v1.5", "NO DATA"}) {
+    for (char const* const none :
+         {"", "V", "12.6", "0.0V", "99.9V", "40V", "12 V", "12A", "?", "ELM327 v1.5", "NO DATA"}) {
         EXPECT_FALSE(findVolts(none)) << none;
     }
 }

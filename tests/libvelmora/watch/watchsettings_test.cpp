@@ -123,6 +123,26 @@ TEST(WatchSettings, NamesSignalFilesFromItsOwnFolder)
     EXPECT_THAT(parseWatchSettings("signals = [\"mine.toml\"]", "w").signals, ElementsAre("mine.toml"));
 }
 
+TEST(WatchSettings, AreATextOfAMegabyteAtMost)
+{
+    testsupport::TemporaryFolder folder;
+    std::string const file = folder.file("watch.toml");
+    auto const trouble = [&file] {
+        try {
+            velmora::readWatchSettings(file);
+        } catch (velmora::Error const& error) {
+            EXPECT_EQ(error.kind(), velmora::ErrorKind::WrongUse);
+            return std::string(error.what());
+        }
+        return std::string();
+    };
+    EXPECT_EQ(trouble(), "Could not read " + file + ": there is no such file");
+    std::ofstream(file) << std::string(1 << 20, '#');
+    EXPECT_EQ(trouble(), "");
+    std::ofstream(file, std::ios::app) << "#";
+    EXPECT_EQ(trouble(), "Could not read " + file + ": it has 1048577 bytes; at most 1048576 are read");
+}
+
 TEST(WatchSettings, TimesHaveUnits)
 {
     EXPECT_EQ(parseDuration("250ms"), 250ms);
