@@ -32,6 +32,23 @@ double millisecondsSince(Clock::time_point start)
     return std::chrono::duration<double, std::milli>(Clock::now() - start).count();
 }
 
+// What modules answer, and what became of the request. Throws Error where the link has broken or somebody has
+// interrupted.
+Status askVehicle(Session& session, std::vector<unsigned char> const& request, obd::ResponseMap& responses)
+{
+    Status const status = session.proxy()->execute(request, responses, replyLimitMs);
+    session.check();
+    return status;
+}
+
+// The same of a text, such as a request with a count behind it; the reply as it came.
+Status askVehicle(Session& session, std::string const& request, std::string& reply)
+{
+    Status const status = session.proxy()->execute(request, reply, replyLimitMs);
+    session.check();
+    return status;
+}
+
 std::optional<std::size_t> lengthOf(unsigned char pid)
 {
     return obd::ParameterFactory::dataLength(obd::ParameterIdentifier(pid).id());
@@ -57,10 +74,9 @@ void measureLatency(Session& session, unsigned char pid, DoctorFigures& figures)
     for (int i = 0; i < measuredRequests; ++i) {
         obd::ResponseMap responses;
         Clock::time_point const start = Clock::now();
-        if (session.proxy()->execute({0x01, pid}, responses, replyLimitMs) == Status::Ok) {
+        if (askVehicle(session, {0x01, pid}, responses) == Status::Ok) {
             times.push_back(millisecondsSince(start));
         }
-        session.check();
     }
     figures.requests = times.size();
     if (times.empty()) {
@@ -79,8 +95,7 @@ std::size_t longestWholeReply(Session& session)
     constexpr unsigned char items[] = {0x02, 0x04, 0x06, 0x0A};
     for (unsigned char const id : items) {
         obd::ResponseMap responses;
-        session.proxy()->execute({0x09, id}, responses, replyLimitMs);
-        session.check();
+        askVehicle(session, {0x09, id}, responses);
         for (auto const& [module, payload] : responses) {
             longest = std::max(longest, payload.size());
         }
@@ -93,7 +108,7 @@ std::size_t longestWholeReply(Session& session)
 std::optional<bool> tryCount(Session& session, unsigned char pid, DoctorFigures const& figures)
 {
     obd::ResponseMap responses;
-    session.proxy()->execute({0x01, pid}, responses, replyLimitMs);
+    askVehicle(session, {0x01, pid}, responses);
     bool const usable = !responses.empty() && responses.size() <= mostCounted;
     if (!usable || session.proxy()->protocol() == obd::ObdProtocolJ1850) {
         return std::nullopt;
@@ -101,9 +116,9 @@ std::optional<bool> tryCount(Session& session, unsigned char pid, DoctorFigures 
     std::string const request = fmt::format("01{:02X}", pid);
     std::string plain;
     std::string counted;
-    session.proxy()->execute(request, plain, replyLimitMs);
+    askVehicle(session, request, plain);
     Clock::time_point const start = Clock::now();
-    Status const status = session.proxy()->execute(request + std::to_string(responses.size()), counted, replyLimitMs);
+    Status const status = askVehicle(session, request + std::to_string(responses.size()), counted);
     double const time = millisecondsSince(start);
     return status == Status::Ok && counted.size() == plain.size() && time < noticeableGain * figures.median;
 }
@@ -119,8 +134,7 @@ std::size_t tryMulti(Session& session, obd::IEcu const& ecu, std::vector<unsigne
         std::vector<unsigned char> request{0x01};
         request.insert(request.end(), asked.begin(), asked.end());
         obd::ResponseMap responses;
-        session.proxy()->execute(request, responses, replyLimitMs);
-        session.check();
+        askVehicle(session, request, responses);
         auto const parts = splitMultiReply(responses[ecu.id()], asked, lengthOf);
         if (!parts || parts->size() != count) {
             break;
@@ -147,7 +161,7 @@ double measureRate(Session& session, std::vector<unsigned char> const& pids, Doc
     std::vector<unsigned char> request(figures.pidsPerRequest + 1, 0x01);
     std::copy_n(pids.begin(), figures.pidsPerRequest, request.begin() + 1);
     obd::ResponseMap responses;
-    session.proxy()->execute(request, responses, replyLimitMs);
+    askVehicle(session, request, responses);
     std::size_t const frames = frameCountOf(responses);
     std::string text = frameDigits(request);
     if (figures.countWorks.value_or(false) && frames >= 1 && frames <= mostCounted) {
@@ -157,9 +171,8 @@ double measureRate(Session& session, std::vector<unsigned char> const& pids, Doc
     std::size_t values = 0;
     for (int i = 0; i < measuredRequests; ++i) {
         std::string reply;
-        bool const answered = session.proxy()->execute(text, reply, replyLimitMs) == Status::Ok;
+        bool const answered = askVehicle(session, text, reply) == Status::Ok;
         values += answered && !responses.empty() ? figures.pidsPerRequest : 0;
-        session.check();
     }
     return static_cast<double>(values) * 1000.0 / millisecondsSince(start);
 }

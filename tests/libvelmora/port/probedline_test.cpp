@@ -53,7 +53,7 @@ TEST(ProbedLine, IsAskedAgainWhereTheFirstQuestionWasNotUnderstood)
     device.answerFirst("?\r\r>"); // what had stood in its line made an unknown command of it
     EXPECT_EQ(velmora::probeSerialPort(device.path(), {38400}).text, "ELM327 v2.1");
     EXPECT_EQ(device.received(), "ATI\rATI\r");
-    ScriptedDevice const console("what?\r", B38400);
+    ScriptedDevice const console("what?>", B38400);
     EXPECT_EQ(velmora::probeSerialPort(console.path(), {38400}).text, "what?");
     EXPECT_EQ(console.received(), "ATI\r") << "only who has a prompt";
 }
@@ -67,7 +67,7 @@ TEST(ProbedLine, IsReadToThePromptHoweverItComes)
     stale.say("\r\r>\n");
     EXPECT_EQ(velmora::probeSerialPort(stale.path(), {38400}).text, "ELM327 v1.5") << "what was said before is dropped";
     ScriptedDevice flooding("", B38400);
-    flooding.answerFirst(std::string(3900, 'x'));
+    flooding.answerFirst(std::string(3900, 'x') + ">");
     EXPECT_EQ(velmora::probeSerialPort(flooding.path(), {38400}).text.size(), 3900U);
 }
 
@@ -166,7 +166,7 @@ TEST(ProbedLine, OfAModemOrOfBluetoothIsAskedAtOneRate)
 
 TEST(ProbedLine, IsToldByWhatAnsweredThere)
 {
-    ScriptedDevice const wordy(std::string(41, 'w') + "\r", B38400);
+    ScriptedDevice const wordy(std::string(41, 'w') + ">", B38400);
     ScriptedDevice const silent("", B38400);
     velmora::PortSearch search;
     search.ports = {{wordy.path(), ""}, {silent.path(), ""}};
