@@ -79,7 +79,7 @@ private:
     {
         std::string const mark = line.substr(0, 2);
         std::string const rest = line.size() > 3 ? line.substr(3) : "";
-        bool const spaced = line.size() == 2 || line[2] == ' ';
+        bool const spaced = line.size() <= 2 || line[2] == ' ';
         if (mark == "->" && spaced) {
             if (m_pause != Time(0)) {
                 fail("no received line follows the pause before");

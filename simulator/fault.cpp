@@ -1,9 +1,9 @@
 #include "simulator/fault.h"
 
+#include "simulator/textnumber.h"
+
 #include <algorithm>
 #include <iterator>
-#include <locale>
-#include <sstream>
 
 namespace obdsim {
 
@@ -63,14 +63,11 @@ std::optional<std::uint64_t> wholeNumber(std::string const& text)
 
 double probability(std::string const& fault, std::string const& text)
 {
-    std::istringstream stream(text);
-    stream.imbue(std::locale::classic());
-    double value = -1;
-    stream >> value;
-    if (!stream || !stream.eof() || value < 0 || value > 1) {
+    auto const value = parseDecimal(text);
+    if (!value || *value < 0 || *value > 1) {
         fail(fault, "a probability is a number from 0 to 1");
     }
-    return value;
+    return *value;
 }
 
 Time timeOf(std::string const& fault, std::string const& text)

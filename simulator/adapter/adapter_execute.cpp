@@ -107,14 +107,15 @@ void Adapter::executeRequest(std::string const& request)
     }
     bool const counted = request.size() % 2 != 0;
     auto const data = parseHex(counted ? request.substr(0, request.size() - 1) : request);
-    bool const countRefused = counted && (has(Quirk::NoCountDigit) || !knowsCount(m_profile));
+    auto const count = counted ? parseHexNumber(request.substr(request.size() - 1)) : std::nullopt;
+    bool const countRefused = counted && (!count || has(Quirk::NoCountDigit) || !knowsCount(m_profile));
     if (!data || data->empty() || data->size() > longestRequest(m_settings) || countRefused) {
         answer(refused());
         return;
     }
     BusRequest busRequest{*data, std::nullopt};
-    if (counted) {
-        busRequest.expected = static_cast<int>(parseHexNumber(request.substr(request.size() - 1)).value_or(1));
+    if (count) {
+        busRequest.expected = static_cast<int>(*count);
     }
     BusReply const reply = m_bus.request(busRequest, m_settings, m_now + m_profile.timing.command);
     for (auto const& part : reply.texts) {
@@ -122,8 +123,8 @@ void Adapter::executeRequest(std::string const& request)
     }
     m_state = State::Busy;
     m_stateUntil = m_now + m_profile.timing.command + reply.end;
-    bool const cutShort = !m_bus.isOpen() || reply.texts.empty() || reply.texts.back().text != "OK\r";
-    if (cutShort) {
+    bool const goesOn = has(Quirk::BusInitSplit) && !reply.texts.empty() && reply.texts.back().text == "OK\r";
+    if (!goesOn) {
         finish(m_profile.timing.command + reply.end);
     }
 }

@@ -11,9 +11,10 @@ namespace obdsim {
 
 namespace {
 
+// With its check byte.
 std::size_t serialBytes(Frame const& frame)
 {
-    return frame.header.size() + frame.data.size() + (frame.checksum ? 1 : 0);
+    return frame.header.size() + frame.data.size() + 1;
 }
 
 /// Frames of one message follow each other; on CAN those of several modules may
@@ -114,8 +115,7 @@ BusReply BusWire::exchange(BusRequest const& request, Settings const& settings, 
 /// When the adapter may begin to send: on a K line it leaves P3 behind the last byte.
 Time BusWire::free(Time at) const
 {
-    bool const waits = isKLine(m_vehicle->protocol()) && m_busyUntil != Time(0);
-    return waits ? std::max(at, m_busyUntil + requestGap) : at;
+    return isKLine(m_vehicle->protocol()) ? std::max(at, m_busyUntil + requestGap) : at;
 }
 
 /// Puts the request on the bus, and among the frames under way those that it brings. Returns the end of the request.

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cmath>
 #include <iterator>
+#include <limits>
 
 namespace obdsim {
 
@@ -23,7 +24,7 @@ struct Gear
     double rpmPerKmh;
 };
 
-constexpr Gear gears[] = {{18, 118}, {36, 68}, {56, 46}, {76, 35}, {400, 28.5}};
+constexpr Gear gears[] = {{18, 118}, {36, 68}, {56, 46}, {76, 35}, {std::numeric_limits<double>::infinity(), 28.5}};
 
 double smoothStep(double from, double to, double x)
 {
@@ -141,11 +142,8 @@ void DriveModel::addAir(DriveState& state) const
 {
     double const vacuumKpa = 24 + state.loadPercent * 0.78;
     double const boostKpa = 98 + state.loadPercent * (m_engine.compression ? 1.15 : 0.9);
-    if (m_engine.boosted) {
-        state.manifoldKpa = m_engine.compression || state.loadPercent > 70 ? boostKpa : vacuumKpa;
-    } else {
-        state.manifoldKpa = std::min(vacuumKpa, state.barometricKpa - 2);
-    }
+    bool const blown = m_engine.boosted && (m_engine.compression || state.loadPercent > 70);
+    state.manifoldKpa = blown ? boostKpa : vacuumKpa;
     // Four-stroke: half the displacement is filled at each turn.
     constexpr double airGramsPerLitre = 1.19;
     constexpr double filling = 0.82;

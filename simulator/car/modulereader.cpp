@@ -12,6 +12,7 @@ namespace {
 
 constexpr int largestWord = 0xFFFF;
 constexpr int longestDelayMs = 60000;
+constexpr int mostPidsOnCan = 6; // SAE J1979; one on the other buses
 
 void readMonitorNames(TableReader& table, std::string_view key, bool compression, bool incomplete, MonitorBits& bits)
 {
@@ -87,8 +88,8 @@ std::vector<std::uint8_t> readLive(TableReader& table)
 
 void readCodesOf(ModuleData& module, TableReader& table)
 {
-    module.lamp = table.flag("lamp", false);
-    module.clearsWhileRunning = table.flag("clears_while_running", true);
+    module.lamp = table.flag("lamp", module.lamp);
+    module.clearsWhileRunning = table.flag("clears_while_running", module.clearsWhileRunning);
     module.warmUps = table.integer("warm_ups", 0, 0xFF, module.warmUps);
     module.kilometresSinceCleared = table.number("kilometres_since_cleared", module.kilometresSinceCleared);
     module.hasStored = table.has("stored");
@@ -147,7 +148,7 @@ void readAddressOf(ModuleData& module, TableReader& table, Protocol const& proto
         module.address = table.byte("address");
         module.tester = table.has("tester") ? table.byte("tester") : module.tester;
     }
-    module.functional = table.flag("functional", true);
+    module.functional = table.flag("functional", module.functional);
 }
 
 MorePids readMorePids(TableReader& table, bool onCan)
@@ -168,13 +169,14 @@ MorePids readMorePids(TableReader& table, bool onCan)
 /// How the module answers: when, and what it makes of several PIDs in one request.
 void readMannersOf(ModuleData& module, TableReader& table, bool onCan)
 {
-    constexpr int pidsOnCan = 6; // SAE J1979; one on the other buses
-    module.latency = Ms(table.integer("latency", 0, longestDelayMs, 15));
+    if (table.has("latency")) {
+        module.latency = Ms(table.integer("latency", 0, longestDelayMs));
+    }
     if (table.has("frame_gap")) {
         module.frameGap = Ms(table.integer("frame_gap", 0, longestDelayMs));
     }
-    module.refuses = table.flag("refuses", false);
-    module.mostPids = table.integer("most_pids", 1, pidsOnCan, onCan ? pidsOnCan : 1);
+    module.refuses = table.flag("refuses", module.refuses);
+    module.mostPids = table.integer("most_pids", 1, mostPidsOnCan, onCan ? mostPidsOnCan : 1);
     module.morePids = readMorePids(table, onCan);
 }
 

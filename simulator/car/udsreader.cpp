@@ -11,7 +11,7 @@ SignalField readField(TableReader& table, std::size_t size)
 {
     constexpr int mostBytes = 4;
     SignalField field;
-    field.bytes = static_cast<std::size_t>(table.integer("bytes", 1, mostBytes, 1));
+    field.bytes = static_cast<std::size_t>(table.integer("bytes", 1, mostBytes, static_cast<int>(field.bytes)));
     field.at = static_cast<std::size_t>(table.integer("at", 0, 0xFFF));
     field.value = table.text("value");
     field.scale = table.number("scale", field.scale);
@@ -46,7 +46,7 @@ void readSignal(ModuleData& module, TableReader& table)
 
 void readUdsOf(ModuleData& module, TableReader& table)
 {
-    module.uds = table.flag("uds", false);
+    module.uds = table.flag("uds", module.uds);
     table.tables("signals", [&](TableReader& signal) { readSignal(module, signal); });
     table.tables("uds_codes", [&](TableReader& code) {
         std::uint16_t const number = readCode(code, "code", code.text("code"));

@@ -3,8 +3,6 @@
 #include "simulator/control/controlerror.h"
 #include "simulator/textnumber.h"
 
-#include <algorithm>
-
 namespace obdsim {
 
 namespace {
@@ -172,7 +170,7 @@ std::string Control::help(Words const& /*words*/, Time /*now*/)
     std::string text;
     for (auto const& each : forms()) {
         std::string form = each.form;
-        form.resize(std::max(column, form.size() + 1), ' ');
+        form.resize(column, ' '); // all forms are shorter
         text += form + each.help + "\n";
     }
     return text;

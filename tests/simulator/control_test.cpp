@@ -173,6 +173,15 @@ TEST(Control, mistakesNameTheWordAndWhatBelongsThere)
         {"hold speed fast", "word 3 is \"fast\"; here belongs a number, or free"},
         {"hold speed inf", "word 3 is \"inf\"; here belongs a number, or free"},
         {"voltage 100", "word 2 is \"100\"; here belongs a number of volts from 0 to 99"},
+        {"voltage 99.1", "word 2 is \"99.1\"; here belongs a number of volts from 0 to 99"},
+        {"voltage -0.1", "word 2 is \"-0.1\"; here belongs a number of volts from 0 to 99"},
+        {"voltage", "word 2 is missing; here belongs NUMBER"},
+        {"value 7E8 0C0D 30", "word 3 is \"0C0D\"; here belongs a PID of two hexadecimal digits"},
+        {"value 7F0 0C 30", "word 2 is \"7F0\"; here belongs a module: 7E8, 7E9"},
+        {"value 7G8 0C 30", "word 2 is \"7G8\"; here belongs a module: 7E8, 7E9"},
+        {"set P0420 stored 7E8 9", "word 5 is \"9\"; here belongs the end of the line"},
+        {"module 7E8 speak", "word 3 is \"speak\"; here belongs silent or speaks"},
+        {"hold speed", "word 3 is missing; here belongs NUMBER"},
     };
     auto const car = obdsim::simulateCar({});
     for (auto const& row : cases) {
@@ -224,7 +233,10 @@ TEST(Scenario, linesAreReadAndMistakesNameTheirPlace)
 {
     auto const lines = obdsim::parseScenario("# a drive\n0.5 ignition off\n\n 2\tvoltage 11.8 \n", "x");
     ASSERT_EQ(lines.size(), 2U);
-    EXPECT_EQ(obdsim::parseScenario("0 clear\n10000000 clear\n", "x").size(), 2U);
+    EXPECT_EQ(obdsim::parseScenario("0 clear\n10000000 clear\n10000000 clear\n", "x").size(), 3U) << "together";
+    EXPECT_EQ(obdsim::parseScenario("1.0000004 clear\n1.0000006 \t clear\n", "x")[1].time, obdsim::Time(1000001))
+        << "to the nearest microsecond";
+    EXPECT_EQ(obdsim::parseScenario(" 1.5  hold speed 3\r\n", "x")[0].command, " hold speed 3\r");
     EXPECT_EQ(lines[1].time, Ms(2000));
     EXPECT_EQ(obdsim::formatScenario(lines), "0.500000 ignition off\n2.000000 voltage 11.8 \n");
     MistakeCase const cases[] = {

@@ -127,4 +127,45 @@ TEST(Dialogue, whatItsHeaderLeavesOutIsNotKnown)
     EXPECT_THROW(parseDialogue("vehicle: car\n\n-> ATZ\n.. 86400001\n<- OK\n", "x"), DialogueError);
 }
 
+TEST(Dialogue, blankLinesReturnsAndPausesMayBeMany)
+{
+    Dialogue const dialogue =
+        parseDialogue("\n\n# first\nvehicle: car\r\nadapter: x\r\nprotocol: 9\r\nraw: no\r\n\r\n\n"
+                      "-> ATZ\r\n.. 5\n\n# on\n.. 7\n<- OK\n.. 0\n<- >\n",
+                      "x");
+    EXPECT_EQ(dialogue.protocol, 9);
+    EXPECT_EQ(dialogue.exchanges.at(0).sent, "ATZ");
+    ASSERT_EQ(dialogue.exchanges[0].chunks.size(), 1U);
+    EXPECT_EQ(dialogue.exchanges[0].chunks[0].pause, Ms(12));
+    EXPECT_EQ(dialogue.exchanges[0].chunks[0].bytes, "OK>");
+    EXPECT_EQ(parseDialogue("protocol: 0\n\n", "x").protocol, 0);
+    EXPECT_TRUE(parseDialogue("vehicle: a: b\n\n", "x").exchanges.empty());
+    EXPECT_EQ(parseDialogue("vehicle: a: b\n\n", "x").vehicle, "a: b");
+    EXPECT_EQ(parseDialogue(head + "->\n<-\n<- \n<- a\n", "x").exchanges[0].received(), "a");
+}
+
+TEST(Dialogue, aLineThatIsTooShortIsNone)
+{
+    for (char const* const line : {"x", "-", "<", "--", "-< x", "<> x", ".x 5", "->x", "<-x", "..5", "-> ATZ\n..",
+                                   "-> ATZ\n.. ", "-> ATZ\n.. 1234567890\n<- x", "-> ATZ\n.. 5x\n<- x",
+                                   "-> ATZ\n<- \\x4", "-> ATZ\n<- \\xG0", "-> ATZ\n<- \\x4G", "-> \\"}) {
+        EXPECT_THROW(parseDialogue(head + line + "\n", "x"), DialogueError) << line;
+    }
+    for (char const* const header : {"protocol: /\n\n", "protocol: :\n\n", "protocol: \n\n", "protocol: 66\n\n",
+                                     "raw: \n\n", "headers: \n\n", "vehicle:car\n\n"}) {
+        EXPECT_THROW(parseDialogue(header, "x"), DialogueError) << header;
+    }
+}
+
+TEST(Dialogue, repliesAreWrittenLineByLine)
+{
+    Dialogue dialogue;
+    dialogue.exchanges = {{" A ", {{Time(0), "\r\rA\r\nB\r>C"}, {Ms(1), ">"}, {Ms(2), "~\x7F!"}}}};
+    std::string const text = obdsim::formatDialogue(dialogue);
+    EXPECT_EQ(text, "vehicle: \nadapter: \nprotocol: 0\nheaders: off\n\n"
+                    "-> \\x20A\\x20\n<- \\r\\rA\\r\\n\n<- B\\r>\n<- C\n.. 1\n<- >\n.. 2\n<- ~\\x7F!\n");
+    dialogue.headers = DialogueHeaders::On;
+    EXPECT_NE(obdsim::formatDialogue(dialogue).find("\nheaders: on\n\n"), std::string::npos);
+}
+
 } // namespace

@@ -61,12 +61,12 @@ TEST_F(TextFile, traceToAPipeThatNobodyReadsIsRefusedAndAFullDiskIsNoted)
     full.write(obdsim::Time(0), 1, '>', "ATI\r");
     EXPECT_TRUE(full.failed());
     obdsim::TraceFile good(m_file);
-    good.write(obdsim::Time(1500), 2, '<', "OK\r\n\\\x01");
+    good.write(obdsim::Time(1500), 2, '<', "OK\r\n\\\x01 ~\x7F\xFF");
     EXPECT_FALSE(good.failed());
     std::ifstream in(m_file);
     std::string line;
     std::getline(in, line);
-    EXPECT_EQ(line, "0.001500 2 < OK\\r\\n\\\\\\x01");
+    EXPECT_EQ(line, "0.001500 2 < OK\\r\\n\\\\\\x01 ~\\x7F\\xFF");
 }
 
 } // namespace

@@ -200,4 +200,48 @@ TEST(Frame, ofAFunctionalKwpHeaderTheFirstTwoBitsTell)
     }
 }
 
+TEST(Frame, anAddressTakesAByteOfEach)
+{
+    auto const lines = [](char const* payload) {
+        std::vector<std::string> all;
+        for (auto const& frame :
+             frameReply(*findProtocol(6), 0x607, false, bytes(payload), std::uint8_t{0}, std::uint8_t{0xF1})) {
+            all.push_back(obdsim::hexText(frame.data, " "));
+        }
+        return all;
+    };
+    EXPECT_EQ(lines("01 02 03 04 05 06"), Lines{"F1 06 01 02 03 04 05 06"});
+    EXPECT_EQ(lines("01 02 03 04 05 06 07"), (Lines{"F1 10 07 01 02 03 04 05", "F1 21 06 07 00 00 00 00"}));
+    EXPECT_EQ(lines("01 02 03 04 05 06 07 08 09 0A 0B"), (Lines{"F1 10 0B 01 02 03 04 05", "F1 21 06 07 08 09 0A 0B"}));
+    EXPECT_EQ(lines("01 02 03 04 05 06 07 08 09 0A 0B 0C").size(), 3U);
+}
+
+TEST(Frame, theFormatByteTellsSixtyThreeBytes)
+{
+    auto const header = [](std::size_t size) {
+        return frameReply(*findProtocol(5), 0x10, true, Bytes(size, 0), std::nullopt)[0].header;
+    };
+    EXPECT_EQ(header(63), (Bytes{0xBF, 0xF1, 0x10}));
+    EXPECT_EQ(header(255), (Bytes{0x80, 0xF1, 0x10, 0xFF}));
+    EXPECT_EQ(header(1), (Bytes{0x81, 0xF1, 0x10}));
+}
+
+TEST(Frame, aHeaderHasTheLengthOfItsBus)
+{
+    for (auto const& [protocol, header] : {std::pair{6, "07"},
+                                           {6, "00 07 E0"},
+                                           {7, "DA 10 F1"},
+                                           {7, "07 E0"},
+                                           {5, "C0 33"},
+                                           {5, "C0 33 F1 00"},
+                                           {2, "07 E0"}}) {
+        EXPECT_FALSE(obdsim::targetOf(*findProtocol(protocol), bytes(header))) << header;
+    }
+    EXPECT_EQ(obdsim::targetOf(*findProtocol(6), bytes("07 DE"))->module, 0x7E6U);
+    EXPECT_EQ(obdsim::targetOf(*findProtocol(6), bytes("07 DE"))->identifier, 0x7DEU);
+    EXPECT_EQ(obdsim::targetOf(*findProtocol(7), bytes("18 DA 12 34"))->module, 0x18DA3412U);
+    EXPECT_FALSE(obdsim::targetOf(*findProtocol(3), bytes("68 10 F1"))->everyone);
+    EXPECT_FALSE(obdsim::targetOf(*findProtocol(3), bytes("48 6A F1"))->everyone);
+}
+
 } // namespace
