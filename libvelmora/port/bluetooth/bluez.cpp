@@ -14,7 +14,7 @@ namespace {
 
 constexpr std::chrono::milliseconds searchStep{500};
 
-using Value = std::variant<std::monostate, bool, std::int16_t, std::string, std::vector<std::string>>;
+using Value = std::variant<std::monostate, bool, std::string, std::vector<std::string>>;
 using Properties = std::map<std::string, Value>;
 
 std::vector<std::string> readTexts(sd_bus_message* message)
@@ -22,7 +22,7 @@ std::vector<std::string> readTexts(sd_bus_message* message)
     char** list = nullptr;
     checked(sd_bus_message_read_strv(message, &list));
     std::vector<std::string> texts;
-    for (char** each = list; each != nullptr && *each != nullptr; ++each) {
+    for (char** each = list; each != nullptr && *each != nullptr; ++each) { // no list at all is an empty one
         texts.emplace_back(*each);
         std::free(*each);
     }
@@ -40,11 +40,6 @@ Value readValue(sd_bus_message* message)
         int value = 0;
         checked(sd_bus_message_read(message, "v", "b", &value));
         return value != 0;
-    }
-    if (contents == "n") {
-        std::int16_t value = 0;
-        checked(sd_bus_message_read(message, "v", "n", &value));
-        return value;
     }
     if (contents == "s" || contents == "o") {
         char const* value = nullptr;

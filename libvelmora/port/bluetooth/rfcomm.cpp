@@ -1,8 +1,10 @@
 #include "libvelmora/port/bluetooth/rfcomm.h"
 
+#include <algorithm>
 #include <cerrno>
 #include <charconv>
 #include <chrono>
+#include <cstring>
 #include <poll.h>
 #include <sys/socket.h>
 #include <unistd.h>
@@ -32,18 +34,17 @@ int awaitConnected(int socket, OpeningStop const& stop)
     return ETIMEDOUT;
 }
 
-int connectSocket(int socket, RfcommSocketAddress const& address, OpeningStop const& stop)
+} // namespace
+
+int connectSocket(int socket, void const* address, std::size_t size, OpeningStop const& stop)
 {
     sockaddr_storage storage{};
-    static_assert(sizeof(address) <= sizeof(storage));
-    __builtin_memcpy(&storage, &address, sizeof(address));
-    if (::connect(socket, reinterpret_cast<sockaddr const*>(&storage), sizeof(address)) == 0) {
+    std::memcpy(&storage, address, std::min(size, sizeof(storage)));
+    if (::connect(socket, reinterpret_cast<sockaddr const*>(&storage), static_cast<socklen_t>(size)) == 0) {
         return 0;
     }
     return errno == EINPROGRESS || errno == EAGAIN ? awaitConnected(socket, stop) : errno;
 }
-
-} // namespace
 
 RfcommSocketAddress makeRfcommAddress(std::string const& mac, unsigned int channel)
 {
@@ -61,7 +62,8 @@ RfcommCall KernelRfcomm::dial(std::string const& mac, unsigned int channel, Open
     if (socket < 0) {
         return {-1, errno};
     }
-    int const error = connectSocket(socket, makeRfcommAddress(mac, channel), stop);
+    RfcommSocketAddress const address = makeRfcommAddress(mac, channel);
+    int const error = connectSocket(socket, &address, sizeof(address), stop);
     if (error != 0) {
         ::close(socket);
         return {-1, error};

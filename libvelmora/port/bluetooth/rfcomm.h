@@ -3,6 +3,7 @@
 #include "libvelmora/port/openingstop.h"
 
 #include <array>
+#include <cstddef>
 #include <cstdint>
 #include <string>
 
@@ -47,5 +48,8 @@ constexpr int bluetoothFamily = 31;
 constexpr int rfcommProtocol = 3;
 
 RfcommSocketAddress makeRfcommAddress(std::string const& mac, unsigned int channel);
+
+// Connects a socket that doesn't block. Returns 0 or an errno; ECANCELED when stop said so.
+int connectSocket(int socket, void const* address, std::size_t size, OpeningStop const& stop);
 
 } // namespace velmora

@@ -197,12 +197,11 @@ std::string valuesOf(char const* module, std::string const& pids)
                                         : pids.substr(i, 2) == "01" ? "00070000"
                                                                     : "50");
     }
-    std::vector<std::uint8_t> bytes = digitBytes(payload);
-    if (bytes.size() <= 7) {
-        return module + frameDigits({static_cast<std::uint8_t>(bytes.size())}) + payload;
+    auto const bytes = static_cast<std::uint8_t>(payload.size() / 2);
+    if (bytes <= 7) {
+        return module + frameDigits({bytes}) + payload;
     }
-    std::string lines =
-        module + ("10" + frameDigits({static_cast<std::uint8_t>(bytes.size())})) + payload.substr(0, 12);
+    std::string lines = module + ("10" + frameDigits({bytes})) + payload.substr(0, 12);
     int number = 1;
     for (std::size_t at = 12; at < payload.size(); at += 14) {
         std::string piece = payload.substr(at, 14);
