@@ -46,10 +46,6 @@ Session::Session(SessionOptions options)
 Session::~Session()
 {
     close();
-    if (m_trace != nullptr) {
-        m_obd->getConnectionManager()->removeLogger(m_trace.get());
-    }
-    m_obd.reset();
 }
 
 std::shared_ptr<obd::IObdProxy> Session::proxy() const

@@ -128,6 +128,7 @@ private:
     std::shared_ptr<SettingsStore> m_settings;
     LibraryUse const m_library;
     DispatchLoop m_loop;
+    std::unique_ptr<TrafficTrace> m_trace; // told by the library up to its end
     std::shared_ptr<obd::IObdVelmora> m_obd;
     std::optional<PortAddress> m_address; // once it is known
     std::unique_ptr<Link> m_link;
@@ -135,7 +136,6 @@ private:
     std::mutex m_phaseMutex;
     Phase m_phase = Phase::Closed; // protected by m_phaseMutex
     DialogueRecorder* m_recorder = nullptr;
-    std::unique_ptr<TrafficTrace> m_trace;
     OpeningWatch m_opening;
     std::shared_ptr<SignalSet const> m_signals; // null until they are wanted
 };
