@@ -146,9 +146,10 @@ TEST(Dialogue, blankLinesReturnsAndPausesMayBeMany)
 
 TEST(Dialogue, aLineThatIsTooShortIsNone)
 {
-    for (char const* const line : {"x", "-", "<", "--", "-< x", "<> x", ".x 5", "->x", "<-x", "..5", "-> ATZ\n..",
-                                   "-> ATZ\n.. ", "-> ATZ\n.. 1234567890\n<- x", "-> ATZ\n.. 5x\n<- x",
-                                   "-> ATZ\n<- \\x4", "-> ATZ\n<- \\xG0", "-> ATZ\n<- \\x4G", "-> \\"}) {
+    for (char const* const line :
+         {"x", "-", "<", "--", "-< x", "<> x", ".x 5", "->x", "<-x", "..5", "-> ATZ\n..", "-> ATZ\n.. ",
+          "-> ATZ\n.. 0000000005\n<- x", "-> ATZ\n.. 1234567890\n<- x", "-> ATZ\n.. 5x\n<- x", "-> ATZ\n<- \\x4",
+          "-> ATZ\n<- \\xG0", "-> ATZ\n<- \\x4G", "-> \\"}) {
         EXPECT_THROW(parseDialogue(head + line + "\n", "x"), DialogueError) << line;
     }
     for (char const* const header : {"protocol: /\n\n", "protocol: :\n\n", "protocol: \n\n", "protocol: 66\n\n",

@@ -242,6 +242,59 @@ TEST(PtyServer, lostLinkTakesTheDeviceAway)
     EXPECT_TRUE(client.ended());
 }
 
+std::uint16_t portOf(std::string const& address)
+{
+    return static_cast<std::uint16_t>(std::stoi(address.substr(address.rfind(':') + 1)));
+}
+
+TEST(TcpServer, aFleetHasPortsInARow)
+{
+    for (int tries = 0; tries < 50; ++tries) {
+        std::uint16_t const port = portOf(obdsim::serveTcp(obdsim::simulate({}), "127.0.0.1", 0)->address());
+        try {
+            auto const fleet =
+                obdsim::serveTcp({obdsim::simulate({}), obdsim::simulate({}), obdsim::simulate({})}, "127.0.0.1", port);
+            std::vector<std::string> const all = fleet->addresses();
+            ASSERT_EQ(all.size(), 3U);
+            EXPECT_EQ(fleet->address(), all[0]);
+            for (std::uint16_t i = 0; i < 3; ++i) {
+                EXPECT_EQ(portOf(all[i]), port + i);
+            }
+            return;
+        } catch (obdsim::ServerError const&) {
+            // Another program has one of them.
+        }
+    }
+    FAIL() << "no three ports in a row";
+}
+
+TEST(TcpServer, itsPortIsFreeAsSoonAsItHasGone)
+{
+    auto server =
+        obdsim::serveTcp(obdsim::simulate({"petrol-can11", "elm327-v1.5", {"loss@14"}}), "127.0.0.1", 0, fast);
+    std::uint16_t const port = portOf(server->address());
+    server->start();
+    Line client(connectTo(server->address()));
+    client.ask("ATE0");
+    EXPECT_EQ(client.ask("ATI"), "ELM");
+    EXPECT_TRUE(client.ended()) << "by the server, whose end of it lives on for a minute";
+    server.reset();
+    EXPECT_NO_THROW(obdsim::serveTcp(obdsim::simulate({}), "127.0.0.1", port));
+}
+
+TEST(TcpServer, aClockThatHasRunGoesOn)
+{
+    auto const peer = obdsim::simulate({});
+    peer->advanceTo(std::chrono::hours(1));
+    auto const server = obdsim::serveTcp(peer, "127.0.0.1", 0, fast);
+    server->start();
+    Line client(connectTo(server->address()));
+    EXPECT_EQ(client.ask("ATI"), "ATI\rELM327 v1.5\r\r>") << "no hour later";
+    server->stop();
+    EXPECT_GE(peer->now(), std::chrono::hours(1));
+    EXPECT_LT(peer->now(), std::chrono::hours(2));
+}
+
 TEST(TcpServer, aFleetNeedsAPortForEachCar)
 {
     auto const said = [](std::size_t cars, std::uint16_t port) -> std::string {

@@ -9,8 +9,10 @@
 #include <gtest/gtest.h>
 
 #include <cstdio>
+#include <fcntl.h>
 #include <fstream>
 #include <sys/stat.h>
+#include <unistd.h>
 
 namespace {
 
@@ -67,6 +69,35 @@ TEST_F(TextFile, traceToAPipeThatNobodyReadsIsRefusedAndAFullDiskIsNoted)
     std::string line;
     std::getline(in, line);
     EXPECT_EQ(line, "0.001500 2 < OK\\r\\n\\\\\\x01 ~\\x7F\\xFF");
+}
+
+/// Whether the end of this process that writes to the pipe waits for its reader.
+bool waitsForItsReader(std::string const& pipe)
+{
+    struct stat wanted
+    {};
+    EXPECT_EQ(::stat(pipe.c_str(), &wanted), 0);
+    for (int file = 3; file < 256; ++file) {
+        struct stat info
+        {};
+        bool const same = ::fstat(file, &info) == 0 && info.st_ino == wanted.st_ino && info.st_dev == wanted.st_dev;
+        int const flags = ::fcntl(file, F_GETFL);
+        if (same && (flags & O_ACCMODE) == O_WRONLY) {
+            return (flags & O_NONBLOCK) == 0;
+        }
+    }
+    ADD_FAILURE() << "nothing writes to " << pipe;
+    return false;
+}
+
+TEST_F(TextFile, traceToAPipeLosesNothingWhenItsReaderIsSlow)
+{
+    int const reader = ::open(m_pipe.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC);
+    {
+        obdsim::TraceFile const trace(m_pipe);
+        EXPECT_TRUE(waitsForItsReader(m_pipe));
+    }
+    ::close(reader);
 }
 
 } // namespace

@@ -309,10 +309,15 @@ TEST(Timing, framesOfALongMessageAreAsFarApartAsUsualOnTheirBus)
         char const* id;
         int microsecondsOfTwoFrames; ///< between the first two lines of a message
     };
-    for (auto const& each :
-         {Gap{6, "7E8", 222 + 2000 + 222 + 2 * 2000}, Gap{7, "18DAF110", 262 + 2000 + 262 + 2 * 2000},
-          Gap{8, "7E8", 444 + 3000 + 444 + 2 * 3000}, Gap{9, "18DAF110", 524 + 3000 + 524 + 2 * 3000},
-          Gap{1, "10", 10000 + 11 * 192}, Gap{2, "10", 20000 + 11 * 769}, Gap{5, "10", 30000 + 11 * 962}}) {
+    for (auto const& each : {Gap{6, "7E8", 222 + 2000 + 222 + 2 * 2000},
+                             Gap{7, "18DAF110", 262 + 2000 + 262 + 2 * 2000},
+                             Gap{8, "7E8", 444 + 3000 + 444 + 2 * 3000},
+                             Gap{9, "18DAF110", 524 + 3000 + 524 + 2 * 3000},
+                             Gap{1, "10", 10000 + 11 * 192},
+                             Gap{2, "10", 20000 + 11 * 769},
+                             {3, "10", 30000 + 11 * 962},
+                             {4, "10", 30000 + 11 * 962},
+                             Gap{5, "10", 30000 + 11 * 962}}) {
         std::string const protocol = std::to_string(each.protocol);
         auto host = withVehicle("name = \"x\"\nprotocol = " + protocol + "\n[[module]]\nid = \"" + each.id +
                                     "\"\nlatency = 4\n[module.info]\nvin = \"WDX-SIM0019212345\"\n",
