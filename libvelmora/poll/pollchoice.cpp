@@ -27,13 +27,14 @@ void add(Choices& choices, std::shared_ptr<obd::IEcu> const& ecu, SensorIds cons
     }
 }
 
-[[noreturn]] void failNoModule(unsigned int id, std::vector<ModuleOffer> const& offers)
+[[noreturn]] void failNoModule(std::optional<unsigned int> id, std::vector<ModuleOffer> const& offers)
 {
     std::string list;
     for (ModuleOffer const& offer : offers) {
         list += fmt::format("{}{:X}", list.empty() ? "" : ", ", offer.ecu->id());
     }
-    throw Error(ErrorKind::NotSupported, fmt::format("The vehicle has no control module {:X}", id),
+    throw Error(ErrorKind::NotSupported,
+                id ? fmt::format("The vehicle has no control module {:X}", *id) : "No control module is chosen",
                 {"these answer: " + list});
 }
 
@@ -62,7 +63,7 @@ void addWish(Choices& choices, SensorWish const& wish, std::vector<std::string> 
         }
     }
     if (!known) {
-        failNoModule(wish.module.value_or(0), offers);
+        failNoModule(wish.module, offers);
     }
     if (!found) {
         throw *failure;

@@ -18,7 +18,7 @@ PollCycle::PollCycle(std::shared_ptr<obd::IObdProxy> const& proxy, std::vector<P
 {
     for (PollSource const& source : sources) {
         if (source.guest != nullptr) {
-            m_guests.push_back({source.guest, source.hertz, source.guest->wishes(), 0});
+            m_guests.push_back({source.guest, source.hertz, source.guest->wishes(), {}});
             continue;
         }
         auto parameter = std::make_unique<PolledParameter>(m_wire, source.ecu, source.parameter, units);
@@ -57,7 +57,7 @@ std::chrono::milliseconds PollCycle::wait()
     PollTime const now = m_wire.now();
     std::optional<DeadlineScheduler::Turn> const turn = m_scheduler.next(now);
     PollTime const start = turn ? std::max(turn->start, m_notBefore) : now + silencePause;
-    return start > now ? std::chrono::ceil<std::chrono::milliseconds>(start - now) : std::chrono::milliseconds(0);
+    return std::max(std::chrono::ceil<std::chrono::milliseconds>(start - now), std::chrono::milliseconds::zero());
 }
 
 void PollCycle::step()

@@ -87,11 +87,9 @@ bool PollCycle::runDerived(std::size_t member)
     std::vector<unsigned char> const inputs = usualInputs(parameter);
     parameter.begin();
     std::size_t const limit = m_limits.at(parameter.module()).now();
-    if (limit > 1 && inputs.size() > 1) {
-        for (std::vector<unsigned char> const& group : evenGroups(inputs, limit)) {
-            if (group.size() > 1) {
-                lendGroup(parameter, group);
-            }
+    for (std::vector<unsigned char> const& group : evenGroups(inputs, limit)) {
+        if (group.size() > 1) {
+            lendGroup(parameter, group);
         }
     }
     finish(member);

@@ -12,7 +12,9 @@ namespace {
 
 constexpr std::chrono::milliseconds longestSleep{20}; // so that the end is not waited for
 
-PidLength lengths(std::vector<PollSource> const& sources)
+} // namespace
+
+PidLength pidLengths(std::vector<PollSource> const& sources)
 {
     bool const fourBanks = std::any_of(sources.begin(), sources.end(), [](PollSource const& source) {
         return source.ecu != nullptr && source.ecu->oxygenSensorBanks() == obd::OxygenSensorBank::Pid1D;
@@ -25,11 +27,9 @@ PidLength lengths(std::vector<PollSource> const& sources)
     };
 }
 
-} // namespace
-
 Poller::Poller(std::shared_ptr<obd::IObdProxy> const& proxy, std::vector<PollSource> const& sources,
                PollPace const& pace, Units units, PollCycle::Sink sink, IChannelControl* channel)
-    : m_cycle(proxy, sources, pace, lengths(sources), units, std::move(sink), channel), m_thread([this] { run(); })
+    : m_cycle(proxy, sources, pace, pidLengths(sources), units, std::move(sink), channel), m_thread([this] { run(); })
 {}
 
 Poller::~Poller()

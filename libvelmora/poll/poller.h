@@ -7,6 +7,9 @@
 
 namespace velmora {
 
+// How many bytes of data a PID has, as far as these modules can be told: nothing where only the reply tells it.
+PidLength pidLengths(std::vector<PollSource> const& sources);
+
 // Reads live values on a thread of its own, straight through the library's proxy, for as long as it lives. It goes on
 // over failed requests; whether the link still stands is for its owner to find out.
 class Poller

@@ -1,5 +1,7 @@
 #include "libvelmora/poll/pollpace.h"
 
+#include <obd/protocolfamily.h>
+
 namespace velmora {
 
 namespace {
@@ -12,24 +14,16 @@ constexpr int newJ1850Year = 2003; // the rule of April 2002 lets the next reque
 PollPace choosePace(PollWill const& will, obd::ObdProtocol protocol, int modelYear)
 {
     PollPace pace;
-    switch (protocol) {
-    case obd::ObdProtocolCan11:
-    case obd::ObdProtocolCan29:
-        if (will.fast) {
-            pace.floor = std::chrono::milliseconds(0);
-            pace.pidsPerRequest = will.pidsPerRequest;
-            pace.addresses = true;
-        }
-        break;
-    case obd::ObdProtocolJ1850:
-        if (modelYear < newJ1850Year) {
-            pace.gap = oldJ1850Gap;
-        } else if (will.fast) {
-            pace.floor = std::chrono::milliseconds(0);
-        }
-        break;
-    default:
-        break;
+    if (protocol == obd::ObdProtocolJ1850 && modelYear < newJ1850Year) {
+        pace.gap = oldJ1850Gap;
+        return pace;
+    }
+    if (will.fast && (obd::isCan(protocol) || protocol == obd::ObdProtocolJ1850)) {
+        pace.floor = std::chrono::milliseconds::zero();
+    }
+    if (will.fast && obd::isCan(protocol)) {
+        pace.pidsPerRequest = will.pidsPerRequest;
+        pace.addresses = true;
     }
     return pace;
 }

@@ -9,6 +9,7 @@
 #include <algorithm>
 #include <cctype>
 #include <charconv>
+#include <memory>
 #include <string_view>
 
 namespace velmora {
@@ -32,7 +33,7 @@ std::optional<unsigned int> parseModule(std::string_view text)
         return std::nullopt;
     }
     unsigned int id = 0;
-    std::from_chars(text.data(), text.data() + text.size(), id, 16);
+    std::from_chars(std::to_address(text.begin()), std::to_address(text.end()), id, 16);
     return id;
 }
 
@@ -48,8 +49,9 @@ std::optional<double> parseRate(std::string const& text)
         number.pop_back();
     }
     double hertz = 0.0;
-    auto const [end, error] = std::from_chars(number.data(), number.data() + number.size(), hertz);
-    bool const whole = error == std::errc() && end == number.data() + number.size();
+    char const* const last = std::to_address(number.end());
+    auto const [end, error] = std::from_chars(number.data(), last, hertz);
+    bool const whole = error == std::errc() && end == last;
     return whole && hertz >= slowest && hertz <= highestRate ? std::optional(hertz) : std::nullopt;
 }
 

@@ -3,7 +3,7 @@
 #include "libvelmora/signal/formulaparser.h"
 
 #include <algorithm>
-#include <charconv>
+#include <cctype>
 #include <iterator>
 #include <map>
 #include <string>
@@ -33,19 +33,14 @@ constexpr PidRow pidRows[] = {
 
 static_assert(std::size(pidRows) == 160);
 
-// "0 sustaining; 1 depleting"; nothing for a unit.
+// "0 sustaining; 1 depleting"; nothing for a unit, none of which begins with a digit.
 std::map<long, std::string> statesOf(std::string_view text)
 {
     std::map<long, std::string> states;
-    while (!text.empty()) {
+    while (!text.empty() && std::isdigit(static_cast<unsigned char>(text.front())) != 0) {
         std::size_t const end = std::min(text.find("; "), text.size());
-        std::string_view const part = text.substr(0, end);
-        long number = 0;
-        auto const [rest, error] = std::from_chars(part.data(), part.data() + part.size(), number);
-        if (error != std::errc() || rest == part.data() + part.size() || *rest != ' ') {
-            return {};
-        }
-        states[number] = std::string(part.substr(static_cast<std::size_t>(rest - part.data()) + 1));
+        std::string const part(text.substr(0, end));
+        states[std::stol(part)] = part.substr(part.find(' ') + 1);
         text.remove_prefix(std::min(end + 2, text.size()));
     }
     return states;

@@ -153,13 +153,11 @@ std::optional<std::uint64_t> joined(std::vector<double> const& bytes)
 
 Result listStep(FormulaStep step, std::vector<double> const& values)
 {
-    switch (step) {
-    case FormulaStep::Minimum:
+    if (step == FormulaStep::Minimum) {
         return *std::min_element(values.begin(), values.end());
-    case FormulaStep::Maximum:
+    }
+    if (step == FormulaStep::Maximum) {
         return *std::max_element(values.begin(), values.end());
-    default:
-        break;
     }
     auto const number = joined(values);
     if (!number) {
@@ -196,7 +194,6 @@ Result evaluateNode(FormulaNode const& node, FormulaInput const& input)
         return leaf(node, input);
     }
     std::vector<double> values;
-    values.reserve(node.operands.size());
     for (FormulaNode const& operand : node.operands) {
         Result const value = evaluateNode(operand, input);
         if (!value) {

@@ -3,9 +3,11 @@
 #include "libvelmora/signal/formula.h"
 #include "libvelmora/signal/formulawords.h"
 
+#include <algorithm>
 #include <cctype>
 #include <charconv>
 #include <cmath>
+#include <memory>
 
 namespace velmora {
 
@@ -21,13 +23,16 @@ bool isLetter(char each)
     return std::isalpha(static_cast<unsigned char>(each)) != 0;
 }
 
+bool isOfWord(char each)
+{
+    return isLetter(each) || isDigit(each) || each == '_';
+}
+
 } // namespace
 
 FormulaToken FormulaLexer::next()
 {
-    while (m_place < m_text.size() && std::isspace(static_cast<unsigned char>(m_text[m_place])) != 0) {
-        ++m_place;
-    }
+    m_place = std::min(m_text.find_first_not_of(" \t\n\v\f\r", m_place), m_text.size());
     if (m_place == m_text.size()) {
         return {FormulaToken::Kind::End, {}, 0.0, m_place};
     }
@@ -57,7 +62,7 @@ FormulaToken FormulaLexer::number()
         return hexadecimal();
     }
     FormulaToken token{FormulaToken::Kind::Number, {}, 0.0, m_place};
-    auto const [end, error] = std::from_chars(rest.data(), rest.data() + rest.size(), token.number);
+    auto const [end, error] = std::from_chars(std::to_address(rest.begin()), std::to_address(rest.end()), token.number);
     if (error != std::errc() || !std::isfinite(token.number)) {
         throw FormulaError("this number can't be read", m_place);
     }
@@ -70,7 +75,7 @@ FormulaToken FormulaLexer::hexadecimal()
 {
     std::string_view const rest = m_text.substr(m_place + 2);
     unsigned int value = 0;
-    auto const [end, error] = std::from_chars(rest.data(), rest.data() + rest.size(), value, 16);
+    auto const [end, error] = std::from_chars(std::to_address(rest.begin()), std::to_address(rest.end()), value, 16);
     if (error != std::errc()) {
         throw FormulaError("0x wants up to eight hexadecimal digits", m_place);
     }
@@ -83,13 +88,11 @@ FormulaToken FormulaLexer::hexadecimal()
 
 FormulaToken FormulaLexer::word()
 {
-    std::size_t end = m_place;
-    while (end < m_text.size() && (isLetter(m_text[end]) || isDigit(m_text[end]) || m_text[end] == '_')) {
-        ++end;
-    }
-    FormulaToken const token{FormulaToken::Kind::Word, std::string(m_text.substr(m_place, end - m_place)), 0.0,
+    std::string_view const rest = m_text.substr(m_place);
+    FormulaToken const token{FormulaToken::Kind::Word,
+                             std::string(rest.begin(), std::find_if_not(rest.begin(), rest.end(), isOfWord)), 0.0,
                              m_place};
-    m_place = end;
+    m_place += token.text.size();
     return token;
 }
 

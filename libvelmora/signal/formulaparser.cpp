@@ -60,12 +60,12 @@ private:
     }
 
     // An old file's x<8 shifts; what else a comparison means there is not agreed.
-    void checkShift(FormulaStep step, FormulaNode const& left) const
+    void checkShift(FormulaStep step, bool byLess, FormulaNode const& left) const
     {
         if (step == FormulaStep::Greater || step == FormulaStep::GreaterOrEqual || step == FormulaStep::LessOrEqual) {
             fail("comparisons mean different things in different versions of the apps");
         }
-        if (!m_shiftByLess) {
+        if (!byLess) {
             return;
         }
         bool const places = token().kind == FormulaToken::Kind::Number &&
@@ -75,6 +75,7 @@ private:
         }
     }
 
+    // Each operator nests the tree by one, also in a chain such as A+A+A: its depth is bounded by the text's length.
     FormulaNode binary(int level, std::size_t depth)
     {
         if (level > highestLevel) {
@@ -83,25 +84,15 @@ private:
         FormulaNode left = binary(level + 1, depth);
         for (FormulaOperator const* here = operatorHere(); here != nullptr && here->level == level;
              here = operatorHere()) {
-            m_shiftByLess = m_phone && at("<");
+            bool const byLess = at("<");
             advance();
             if (m_phone) {
-                checkShift(here->step, left);
+                checkShift(here->step, byLess, left);
             }
-            m_shiftByLess = false;
             FormulaNode right = binary(level + 1, depth);
             left = {here->step, 0.0, {}, {std::move(left), std::move(right)}};
-            countStep();
         }
         return left;
-    }
-
-    // Each operator nests the tree by one, also in a chain such as A+A+A.
-    void countStep()
-    {
-        if (++m_steps > longestFormula) {
-            fail("the formula has too many steps");
-        }
     }
 
     FormulaNode unary(std::size_t depth)
@@ -226,9 +217,7 @@ private:
     }
 
     bool m_phone;
-    bool m_bracketed = false;   // the last operand stood in brackets
-    bool m_shiftByLess = false; // the operator just passed was a single '<'
-    std::size_t m_steps = 0;
+    bool m_bracketed = false; // the last operand stood in brackets
 };
 
 } // namespace

@@ -48,10 +48,10 @@ std::string writeCall(FormulaNode const& node)
     FormulaFunction const* named = nullptr;
     for (FormulaFunction const& each : formulaFunctions()) {
         bool const fits = each.step == node.step && (each.bits == 0 || node.operands.back().number == each.bits);
-        if (fits && node.operands.size() - (each.bits != 0 ? 1 : 0) <= each.most &&
-            node.operands.size() - (each.bits != 0 ? 1 : 0) >= each.fewest) {
+        std::size_t const given = node.operands.size() - (each.bits != 0 ? 1 : 0);
+        if (fits && given >= each.fewest && given <= each.most) {
             named = &each;
-            shown = node.operands.size() - (each.bits != 0 ? 1 : 0);
+            shown = given;
         }
     }
     std::string text = named != nullptr ? std::string(named->name) : std::string();

@@ -29,7 +29,11 @@ std::vector<std::string> cutAtColons(std::string const& text)
     bool quoted = false;
     for (char const each : text) {
         quoted = each == '\'' ? !quoted : quoted;
-        depth += !quoted && (each == '(' || each == '{') ? 1 : !quoted && (each == ')' || each == '}') ? -1 : 0;
+        if (!quoted && (each == '(' || each == '{')) {
+            ++depth;
+        } else if (!quoted && (each == ')' || each == '}')) {
+            --depth;
+        }
         if (each == ':' && !quoted && depth == 0) {
             parts.emplace_back();
         } else {
@@ -43,7 +47,7 @@ std::vector<std::string> cutAtColons(std::string const& text)
 
 std::optional<LookupTable> parseLookup(std::string const& equation)
 {
-    if (equation.size() < opening + 1 || !isLookup(equation)) {
+    if (!isLookup(equation)) {
         return std::nullopt;
     }
     std::vector<std::string> const parts = cutAtColons(equation.substr(opening, equation.size() - opening - 1));

@@ -104,8 +104,9 @@ std::optional<std::string> refusalForSignal(RequestBytes const& request)
         return whyNot(request.front());
     }
     // Service 22 takes several identifiers of two bytes at once.
-    bool const several = request.front() == 0x22 && request.size() > row->length && request.size() % 2 == 1;
-    if (request.size() != row->length && !several) {
+    bool const fits = request.front() == 0x22 ? request.size() >= row->length && request.size() % 2 == 1
+                                              : request.size() == row->length;
+    if (!fits) {
         return named(request.front()) + " wants " + std::to_string(row->length) + " bytes, here are " +
                std::to_string(request.size());
     }

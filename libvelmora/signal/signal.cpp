@@ -14,31 +14,21 @@ namespace {
 struct ServiceRow
 {
     unsigned char service;
-    std::size_t requestLength;
-    std::size_t echoLength;
+    std::size_t length; // of a request for one identifier, which the reply repeats
 };
 
 // SAE J1979, ISO 14229-1 and ISO 14230-3: services that only read, with the bytes of one identifier.
 constexpr ServiceRow services[] = {
-    {0x01, 2, 2}, {0x02, 3, 3}, {0x05, 3, 3}, {0x06, 2, 2}, {0x09, 2, 2}, {0x1A, 2, 2}, {0x21, 2, 2}, {0x22, 3, 3},
+    {0x01, 2}, {0x02, 3}, {0x05, 3}, {0x06, 2}, {0x09, 2}, {0x1A, 2}, {0x21, 2}, {0x22, 3},
 };
-
-ServiceRow const* rowOf(std::vector<unsigned char> const& request)
-{
-    if (request.empty()) {
-        return nullptr;
-    }
-    auto const found = std::find_if(std::begin(services), std::end(services),
-                                    [&](ServiceRow const& row) { return row.service == request.front(); });
-    return found == std::end(services) ? nullptr : &*found;
-}
 
 } // namespace
 
 std::size_t echoLength(std::vector<unsigned char> const& request)
 {
-    ServiceRow const* const row = rowOf(request);
-    return row != nullptr ? row->echoLength : request.size();
+    auto const* const row = std::ranges::find_if(
+        services, [&](ServiceRow const& each) { return !request.empty() && each.service == request.front(); });
+    return row != std::end(services) ? row->length : request.size();
 }
 
 // A signal has one identifier: several are put together by who asks.
@@ -47,10 +37,9 @@ std::optional<std::string> refusalOf(std::vector<unsigned char> const& request)
     if (std::optional<std::string> const refusal = refusalFor(request, RequestPurpose::Signal)) {
         return refusal;
     }
-    ServiceRow const* const row = rowOf(request);
-    if (row == nullptr || request.size() != row->requestLength) {
-        return "service " + hexText({request.front()}) + " wants " +
-               std::to_string(row != nullptr ? row->requestLength : 0) + " bytes, here are " +
+    std::size_t const wanted = echoLength(request);
+    if (request.size() != wanted) {
+        return "service " + hexText({request.front()}) + " wants " + std::to_string(wanted) + " bytes, here are " +
                std::to_string(request.size());
     }
     return std::nullopt;

@@ -20,13 +20,12 @@ SignalReader::Reader SignalReader::text(std::string Signal::*field)
     };
 }
 
-SignalReader::Reader SignalReader::number(std::optional<double> Signal::*field, double lowest)
+SignalReader::Reader SignalReader::number(std::optional<double> Signal::*field, std::optional<double> lowest)
 {
     return [field, lowest](SignalReader& reader, toml::node const& node) {
         std::optional<double> const value = node.is_number() ? node.value<double>() : std::nullopt;
-        if (!value || !std::isfinite(*value) || *value < lowest) {
-            return reader.wrong(node,
-                                "must be a number" + (lowest > -1e300 ? " of at least " + std::to_string(lowest) : ""));
+        if (!value || !std::isfinite(*value) || (lowest && *value < *lowest)) {
+            return reader.wrong(node, "must be a number" + (lowest ? " of at least " + std::to_string(*lowest) : ""));
         }
         reader.m_signal.*field = value;
     };
@@ -104,10 +103,11 @@ void SignalReader::readFormula(toml::node const& node)
 
 void SignalReader::readText(toml::node const& node)
 {
-    toml::table const* const table = node.as_table();
-    auto const first = table != nullptr ? (*table)["first"].value<int64_t>() : std::nullopt;
-    auto const size = table != nullptr ? (*table)["count"].value_or(int64_t{0}) : 0;
-    if (!first || *first < 0 || *first > 701 || size < 0 || size > 702 || table->size() > 2) {
+    toml::table const none;
+    toml::table const& table = node.is_table() ? *node.as_table() : none;
+    auto const first = table["first"].value<int64_t>();
+    auto const size = table["count"].value_or(int64_t{0});
+    if (!first || *first < 0 || *first > 701 || size < 0 || size > 702 || table.size() > 2) {
         return wrong(node, "must be { first = BYTE, count = BYTES }, counted from 0 behind the echo");
     }
     m_signal.text = SignalText{static_cast<std::size_t>(*first), static_cast<std::size_t>(size)};
@@ -146,10 +146,11 @@ void SignalReader::readFlowControl(toml::node const& node)
 
 void SignalReader::readEnabled(toml::node const& node)
 {
-    if (!node.is_boolean()) {
+    auto const* const value = node.as_boolean();
+    if (value == nullptr) {
         return wrong(node, "must be true or false");
     }
-    m_signal.enabled = node.value_or(true);
+    m_signal.enabled = value->get();
 }
 
 void SignalReader::readVerified(toml::node const& node)
@@ -193,8 +194,8 @@ std::map<std::string, SignalReader::Reader, std::less<>> const& SignalReader::re
         {"length", count<std::size_t>(&Signal::length, 1, 702)},
         {"precision", count<int>(&Signal::precision, 0, 9)},
         {"timeout", count<unsigned int>(&Signal::timeout, 8, 10000)},
-        {"min", number(&Signal::min, -1e308)},
-        {"max", number(&Signal::max, -1e308)},
+        {"min", number(&Signal::min, {})},
+        {"max", number(&Signal::max, {})},
         {"rate", number(&Signal::rate, 0.001)},
         {"enabled", &SignalReader::readEnabled},
         {"verified", &SignalReader::readVerified},

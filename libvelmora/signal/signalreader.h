@@ -31,7 +31,7 @@ private:
     static std::map<std::string, Reader, std::less<>> const& readers();
 
     static Reader text(std::string Signal::*field);
-    static Reader number(std::optional<double> Signal::*field, double lowest);
+    static Reader number(std::optional<double> Signal::*field, std::optional<double> lowest);
     static Reader identifier(std::string Signal::*field);
     static Reader address(std::optional<unsigned char> Signal::*field);
     template <typename Number, typename Field>

@@ -60,9 +60,6 @@ void SignalReader::checkAddresses()
     if (m_signal.extendedAddress && m_signal.header.empty()) {
         missing("ext", "needs a header");
     }
-    if (m_signal.extendedAddress && m_signal.request.size() > 6) {
-        missing("request", "holds at most six bytes behind an extended address");
-    }
 }
 
 Signal readSignal(toml::table const& table, std::string const& place, std::vector<SignalMistake>& mistakes)

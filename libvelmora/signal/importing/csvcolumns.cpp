@@ -6,6 +6,7 @@
 #include <cctype>
 #include <charconv>
 #include <cmath>
+#include <memory>
 #include <utility>
 
 namespace velmora {
@@ -70,8 +71,9 @@ std::optional<std::string> requestCell(std::string const& cell)
 std::optional<double> numberCell(std::string const& cell)
 {
     double number = 0.0;
-    auto const [end, error] = std::from_chars(cell.data(), cell.data() + cell.size(), number);
-    bool const whole = error == std::errc() && end == cell.data() + cell.size() && std::isfinite(number);
+    char const* const last = std::to_address(cell.end());
+    auto const [end, error] = std::from_chars(cell.data(), last, number);
+    bool const whole = error == std::errc() && end == last && std::isfinite(number);
     return whole ? std::optional(number) : std::nullopt;
 }
 

@@ -3,6 +3,8 @@
 #include <velmora/error.h>
 
 #include <charconv>
+#include <cmath>
+#include <memory>
 
 namespace velmora {
 
@@ -14,9 +16,9 @@ std::optional<double> numberOf(nlohmann::json const& object, std::string const& 
     }
     std::string const text = textOf(object, key);
     double number = 0.0;
-    auto const [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
-    return !text.empty() && error == std::errc() && end == text.data() + text.size() ? std::optional(number)
-                                                                                     : std::nullopt;
+    char const* const last = std::to_address(text.end());
+    auto const [end, error] = std::from_chars(text.data(), last, number);
+    return error == std::errc() && end == last && std::isfinite(number) ? std::optional(number) : std::nullopt;
 }
 
 nlohmann::json parseJson(std::string_view text, std::string const& path)

@@ -26,7 +26,7 @@ inline std::string textOf(nlohmann::json const& object, std::string const& key)
     return member.is_string() ? member.get<std::string>() : std::string();
 }
 
-// A member that is a number, or a text that holds one; nothing for any other.
+// A member that is a finite number, or a text that holds one; nothing for any other.
 std::optional<double> numberOf(nlohmann::json const& object, std::string const& key);
 
 // The document of a text; throws Error (wrong use) for one that is no JSON.

@@ -114,6 +114,11 @@ private:
     void readSignal(Signal signal, json const& entry, std::string const& name)
     {
         json const& format = memberOf(entry, "fmt");
+        for (char const* const key : {"bix", "mul", "div", "add"}) {
+            if (!memberOf(format, key).is_null() && !numberOf(format, key)) {
+                return m_collector.refuse(m_number, name, std::string("its ") + key + " is no number");
+            }
+        }
         auto const length = numberOf(format, "len");
         auto const first = numberOf(format, "bix");
         if (!length || *length < 1 || *length > 64 || (first && (*first < 0 || *first > 5600))) {

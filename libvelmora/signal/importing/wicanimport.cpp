@@ -36,7 +36,7 @@ AdapterSetup readSetup(AdapterSetup setup, std::string commands)
         } else if (match[1] == "CRA") {
             setup.reply = match[2];
         } else if (match[1] == "CEA") {
-            setup.extended = match[2].length() > 0;
+            setup.extended = !match[2].str().empty();
         }
     }
     return setup;

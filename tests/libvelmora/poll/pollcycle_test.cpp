@@ -92,6 +92,7 @@ TEST_F(PollCycleTest, WhatAModuleLeavesOutIsAskedAlone)
     }
     m_proxy->answer("01 0C 0D", "41 0C 1A F8");
     m_proxy->answer("01 0C 05", "41 0C 1A F8");
+    m_proxy->answer("01 0D 05", "41 0D 50");
     m_proxy->answer("01 0C", "41 0C 1A F8");
     m_proxy->answer("01 0D", "41 0D 50");
     m_proxy->answer("01 05", "41 05 7B");
@@ -100,6 +101,7 @@ TEST_F(PollCycleTest, WhatAModuleLeavesOutIsAskedAlone)
     EXPECT_EQ(last(0x7E8, 0x0D), "80");
     EXPECT_EQ(last(0x7E8, 0x05), "83");
     EXPECT_LE(m_proxy->count("01 0C 0D") + m_proxy->count("01 0C 05"), 2);
+    EXPECT_EQ(m_proxy->count("01 0D 05"), 1) << "one answer tells that it leaves the second out";
 }
 
 TEST_F(PollCycleTest, ALostReplyDoesNotEndWhatIsProved)

@@ -316,7 +316,7 @@ TEST(SignalKeys, FitVehiclesByPatterns)
     }
     std::pair<char const*, char const*> const others[] = {{"WVW", "WVWZ"}, {"WVWZ", "WVW"}, {"?", ""},
                                                           {"*A", "BAB"},   {"A*B", "AC"},   {"A?", "A"},
-                                                          {"B*", "AB"},    {"a*?b", "AB"}};
+                                                          {"B*", "AB"},    {"a*?b", "AB"},  {"AB*B?", "ABX"}};
     for (auto const& [pattern, vin] : others) {
         EXPECT_FALSE(fitsVin(pattern, vin)) << pattern << " " << vin;
     }

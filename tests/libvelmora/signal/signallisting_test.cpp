@@ -36,6 +36,7 @@ TEST_F(SignalListingTest, TellsWhatIsInAFileAndWritesItAgain)
 {
     SignalListing const listing = listSignals(write(soundSignals));
     ASSERT_EQ(listing.signals.size(), 1U);
+    EXPECT_EQ(listing.path, m_folder.file("file.toml"));
     EXPECT_EQ(listing.signals[0].id, "GEAR");
     EXPECT_EQ(listing.signals[0].request, (std::vector<unsigned char>{0x22, 0x01, 0x02}));
     EXPECT_EQ(nlohmann::json::parse(listing.json)["signals"][0]["request"], "220102");
