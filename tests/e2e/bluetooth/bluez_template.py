@@ -3,7 +3,10 @@
 Each adapter is a bridge to a simulated ELM327 on a TCP port of this machine. Low Energy ones offer a serial service whose
 characteristics hand out sockets or speak by messages; classic ones are connected through a Profile1 object of the caller.
 """
+import os
 import socket
+import sys
+import time
 
 import dbus
 import dbus.lowlevel
@@ -12,6 +15,10 @@ from gi.repository import GLib
 from dbusmock import OBJECT_MANAGER_IFACE, mockobject
 from dbusmock.templates import bluez5
 from dbusmock.templates.bluez5 import *  # noqa: F401,F403  (its control methods become this object's)
+
+sys.path.insert(0, os.path.dirname(os.path.abspath(__file__)))
+from bluez_habits import *  # noqa: E402,F401,F403  (likewise)
+import bluez_habits  # noqa: E402
 
 BUS_NAME = 'org.bluez'
 MAIN_OBJ = '/'
@@ -39,6 +46,8 @@ def load(mock, parameters):
 def _note_sender(connection, message):
     """Who is calling, which the mock does not tell its methods."""
     state['sender'] = message.get_sender()
+    if bluez_habits.passes_over(message):
+        return dbus.lowlevel.HANDLER_RESULT_HANDLED
     return dbus.lowlevel.HANDLER_RESULT_NOT_YET_HANDLED
 
 
@@ -97,6 +106,7 @@ def _written(device, data):
         device.dropped += 1
         return
     device.sizes.append(len(data))
+    device.times.append(time.monotonic())
     if device.loses_after and len(device.sizes) >= device.loses_after:
         device.loses_after = 0
         lose(device)
@@ -138,6 +148,12 @@ def WriteValue(chrc, value, options):
         raise _error('NotPermitted', 'Write acquired')
     if 'write' not in chrc.props[CHRC]['Flags']:
         raise _error('NotSupported', 'Operation is not supported')
+    if options.get('type') != 'request':
+        raise _error('InvalidArguments', 'a request was wanted')
+    if device.refuses_writes:
+        device.refuses_writes -= 1
+        if device.refuses_writes == 0:
+            raise _error('Failed', 'not this one')
     _written(device, bytes(value))
 
 
@@ -171,7 +187,7 @@ def AcquireWrite(chrc, options):
 def AcquireNotify(chrc, options):
     device = _need_connected(chrc)
     if not device.gives_sockets:
-        raise _error('NotPermitted', 'Notify acquired')
+        raise dbus.exceptions.DBusException('Notify acquired', name=device.socket_error)
     device.notify_socket, fd = _socket_pair(device, False)
     return fd, dbus.UInt16(device.mtu)
 
@@ -239,6 +255,10 @@ def _prepare(device, port):
     device.connected = False
     device.bridge = device.write_socket = device.notify_socket = device.classic_socket = None
     device.gives_sockets = True
+    device.socket_error = 'org.bluez.Error.NotPermitted'
+    device.refuses_writes = 0
+    device.times = []
+    device.wanted_passkey = -1
     device.loses_after = device.loses_in_reply = device.dropped = 0
     device.failures = []
     device.sizes = []
@@ -263,6 +283,9 @@ def AddLowEnergy(self, adapter, address, name, service, notify, write, flags, mt
 # ---- classic
 
 def RegisterProfile(self, path, uuid, options):
+    wanted = {'Name': 'Velmora', 'Role': 'client', 'RequireAuthentication': False, 'AutoConnect': False}
+    if dict(options) != wanted:
+        raise _error('InvalidArguments', f'{options}')
     known = state['profiles'].get(str(uuid))
     if known and dbus.SystemBus().name_has_owner(known[0]):
         raise _error('AlreadyExists', 'Already Exists')
@@ -340,7 +363,10 @@ def Pair(device):
     if state['sender'] not in state['agents']:
         raise _error('AuthenticationRejected', 'no agent')
     agent = _caller(state['sender'], state['agents'][state['sender']], 'org.bluez.Agent1')
-    if device.wanted_pin:
+    if device.wanted_passkey >= 0:
+        if agent.RequestPasskey(dbus.ObjectPath(device.path), signature='o') != device.wanted_passkey:
+            raise _error('AuthenticationFailed', 'Authentication Failed')
+    elif device.wanted_pin:
         if agent.RequestPinCode(dbus.ObjectPath(device.path), signature='o') != device.wanted_pin:
             raise _error('AuthenticationFailed', 'Authentication Failed')
     else:
@@ -359,6 +385,12 @@ def WantPin(self, path, pin):
 def Fail(self, path, errors):
     """The next connections of a device fail: "Name:text" each, with | between."""
     mockobject.objects[path].failures = [tuple(each.split(':', 1)) for each in str(errors).split('|') if each]
+
+
+@dbus.service.method(MOCK, in_signature='o', out_signature='')
+def ConnectForAnother(self, path):
+    """Another program has connected the device."""
+    ConnectLowEnergy(mockobject.objects[path])
 
 
 @dbus.service.method(MOCK, in_signature='oi', out_signature='')
