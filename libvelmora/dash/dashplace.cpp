@@ -7,6 +7,7 @@
 #include <algorithm>
 #include <arpa/inet.h>
 #include <ifaddrs.h>
+#include <memory>
 #include <net/if.h>
 
 namespace velmora {
@@ -35,30 +36,36 @@ std::set<std::string> hostNamesOf(std::string_view list)
     return names;
 }
 
-std::string ownAddress()
+std::string addressAmong(ifaddrs const* list)
 {
-    std::string result = "127.0.0.1";
-    ifaddrs* all = nullptr;
-    if (::getifaddrs(&all) != 0) {
-        return result;
-    }
-    for (ifaddrs const* each = all; each != nullptr; each = each->ifa_next) {
+    for (ifaddrs const* each = list; each != nullptr; each = each->ifa_next) {
         bool const usable = each->ifa_addr != nullptr && each->ifa_addr->sa_family == AF_INET &&
-                            (each->ifa_flags & IFF_LOOPBACK) == 0 && (each->ifa_flags & IFF_UP) != 0;
+                            (each->ifa_flags & (IFF_LOOPBACK | IFF_UP)) == IFF_UP;
         if (usable) {
             char text[INET_ADDRSTRLEN] = {};
             ::inet_ntop(AF_INET, &reinterpret_cast<sockaddr_in const*>(each->ifa_addr)->sin_addr, text, sizeof(text));
-            result = text;
-            break;
+            return text;
         }
     }
-    ::freeifaddrs(all);
-    return result;
+    return "127.0.0.1";
 }
 
-std::string dumpedJson(Json const& value)
+std::string ownAddress()
 {
-    return value.dump(-1, ' ', false, Json::error_handler_t::replace);
+    ifaddrs* all = nullptr;
+    if (::getifaddrs(&all) != 0) {
+        return addressAmong(nullptr);
+    }
+    std::unique_ptr<ifaddrs, decltype(&::freeifaddrs)> const freed(all, ::freeifaddrs);
+    return addressAmong(all);
+}
+
+std::string pageLink(std::string const& place, unsigned short port, std::string const& token)
+{
+    std::string const host = place == "0.0.0.0" || place == "::" ? ownAddress() : place;
+    bool const six = host.find(':') != std::string::npos;
+    return "http://" + (six ? "[" + host + "]" : host) + ":" + std::to_string(port) + "/" +
+           (token.empty() ? "" : "#t=" + token);
 }
 
 } // namespace velmora

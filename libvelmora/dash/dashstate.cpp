@@ -15,11 +15,6 @@ namespace {
 constexpr std::size_t mostEvents = 50;
 constexpr std::int64_t closestMs = 100; // points of a history
 
-std::string dumped(Json const& value)
-{
-    return value.dump(-1, ' ', false, Json::error_handler_t::replace);
-}
-
 // With the digits that the value is good for.
 Json valueOf(Reading const& reading)
 {
@@ -165,7 +160,7 @@ Json DashState::valuesOf(std::set<std::string> const& ids, std::set<std::string>
 std::string DashState::takeValues()
 {
     std::lock_guard const lock(m_mutex);
-    std::string const text = m_changed.empty() ? std::string() : dumped(valuesOf(m_changed, m_new));
+    std::string const text = m_changed.empty() ? std::string() : dumpedJson(valuesOf(m_changed, m_new));
     m_changed.clear();
     m_new.clear();
     return text;
@@ -178,7 +173,7 @@ std::string DashState::allValues() const
     for (auto const& [id, sensor] : m_sensors) {
         ids.insert(id);
     }
-    return dumped(valuesOf(ids, ids));
+    return dumpedJson(valuesOf(ids, ids));
 }
 
 std::string DashState::takeLines()
@@ -186,13 +181,13 @@ std::string DashState::takeLines()
     std::lock_guard const lock(m_mutex);
     std::size_t const count = std::exchange(m_newLines, 0);
     return count == 0 ? std::string()
-                      : dumped(Json(std::vector<Json>(m_lines.end() - static_cast<long>(count), m_lines.end())));
+                      : dumpedJson(Json(std::vector<Json>(m_lines.end() - static_cast<long>(count), m_lines.end())));
 }
 
 std::string DashState::allLines() const
 {
     std::lock_guard const lock(m_mutex);
-    return dumped(Json(m_lines));
+    return dumpedJson(Json(m_lines));
 }
 
 bool DashState::takeNews()

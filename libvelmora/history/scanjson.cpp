@@ -65,11 +65,6 @@ std::string vinOf(VehicleReport const& report)
     return {};
 }
 
-std::string compact(Json const& document)
-{
-    return document.dump(-1, ' ', false, Json::error_handler_t::replace);
-}
-
 Json parsedLine(std::string_view line)
 {
     // Nothing that a report has lies deeper; what is nested without end would exhaust the stack.
@@ -110,7 +105,7 @@ std::string timeText(ScanTime time)
 KeptScan makeScan(VehicleReport const& report, std::string const& vehicle, ScanTime time, std::string const& program)
 {
     std::string const vin = vinOf(report);
-    KeptScan scan{0, vin.empty() ? vehicle : vin, time, program, {}, compact(toJsonValue(report))};
+    KeptScan scan{0, vin.empty() ? vehicle : vin, time, program, {}, dumpedJson(toJsonValue(report))};
     if (scan.vehicle.empty()) {
         throw Error(ErrorKind::Failed, "The vehicle does not tell its identification number, so it needs a name",
                     {"--vehicle NAME gives it one, such as --vehicle golf"});
@@ -133,7 +128,7 @@ std::string toLine(KeptScan const& scan)
                        {"program", scan.program},
                        {"hash", scan.hash},
                        {"report", parsedLine(scan.document)}};
-    return compact(line) + "\n";
+    return dumpedJson(line) + "\n";
 }
 
 KeptScan parseLine(std::string_view line)
@@ -153,7 +148,7 @@ KeptScan parseLine(std::string_view line)
         refuse("its vehicle has no name, or too long a one");
     }
     root.at("report");
-    scan.document = compact(document.at("report"));
+    scan.document = dumpedJson(document.at("report"));
     if (hashOf(scan.document) != scan.hash) {
         refuse("its report was changed since it was written");
     }

@@ -28,4 +28,10 @@ inline std::string printed(Json const& document)
     return document.dump(2, ' ', false, Json::error_handler_t::replace) + "\n";
 }
 
+// The same on one line, without blanks and without its end.
+inline std::string dumpedJson(Json const& document)
+{
+    return document.dump(-1, ' ', false, Json::error_handler_t::replace);
+}
+
 } // namespace velmora

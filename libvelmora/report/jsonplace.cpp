@@ -42,7 +42,6 @@ std::vector<JsonPlace> JsonPlace::elements() const
         fail("list");
     }
     std::vector<JsonPlace> list;
-    list.reserve(m_value.size());
     for (std::size_t i = 0; i < m_value.size(); ++i) {
         list.emplace_back(m_value[i], m_path + "/" + std::to_string(i));
     }
@@ -85,8 +84,8 @@ double JsonPlace::number() const
 
 std::uint32_t JsonPlace::whole(std::uint32_t largest) const
 {
-    if (!m_value.is_number_integer() || (!m_value.is_number_unsigned() && m_value.get<std::int64_t>() < 0) ||
-        m_value.get<std::uint64_t>() > largest) {
+    // What is below 0 becomes more than any.
+    if (!m_value.is_number_integer() || m_value.get<std::uint64_t>() > largest) {
         fail("whole number up to " + std::to_string(largest));
     }
     return m_value.get<std::uint32_t>();
@@ -97,7 +96,7 @@ std::uint32_t JsonPlace::hex() const
     std::string const digits = text();
     std::uint32_t number = 0;
     auto const [end, error] = std::from_chars(digits.data(), digits.data() + digits.size(), number, 16);
-    if (digits.empty() || error != std::errc() || end != digits.data() + digits.size()) {
+    if (error != std::errc() || end != digits.data() + digits.size()) {
         fail("hexadecimal number");
     }
     return number;

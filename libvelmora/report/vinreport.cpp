@@ -24,10 +24,9 @@ Json yearBasis(VinFacts::YearBasis basis)
         return "position 7";
     case VinFacts::YearBasis::Perhaps:
         return "perhaps";
-    case VinFacts::YearBasis::None:
-        break;
+    default:
+        return nullptr;
     }
-    return nullptr;
 }
 
 Json codeList(VinFacts const& facts)

@@ -79,12 +79,9 @@ DocumentCell listCell(CodeList const& list)
     case CodeList::Answer::Unreadable:
         return {texts::cantBeRead, DocumentMark::Faint};
     default:
-        break;
+        return list.codes.empty() ? DocumentCell{texts::noneStored, DocumentMark::Good}
+                                  : DocumentCell{std::to_string(list.codes.size()), markOf(list.kind)};
     }
-    if (list.codes.empty()) {
-        return {texts::noneStored, DocumentMark::Good};
-    }
-    return {std::to_string(list.codes.size()), markOf(list.kind)};
 }
 
 std::string makerLine(MakerChoice const& maker)

@@ -10,9 +10,8 @@ namespace velmora {
 namespace {
 
 constexpr double fewWarmUps = 5;
-constexpr double mostWarmUps = 255; // and more, or not kept
 constexpr double shortDistanceKm = 80;
-constexpr double longestDistanceKm = 65535;
+constexpr double mostMinutes = 65535; // and more, or not kept
 constexpr std::size_t manyIncomplete = 2;
 
 // What speaks for codes that were cleared not long ago, in one module.
@@ -37,8 +36,8 @@ struct ClearSigns
         }
     }
 
-    bool hasFewWarmUps() const { return warmUps && *warmUps <= fewWarmUps && *warmUps < mostWarmUps; }
-    bool isNear() const { return distanceKm && *distanceKm <= shortDistanceKm && *distanceKm < longestDistanceKm; }
+    bool hasFewWarmUps() const { return warmUps && *warmUps <= fewWarmUps; }
+    bool isNear() const { return distanceKm && *distanceKm <= shortDistanceKm; }
     bool hasManyIncomplete() const { return incomplete.size() >= manyIncomplete; }
     int count() const { return int(hasFewWarmUps()) + int(isNear()) + int(hasManyIncomplete()); }
 };
@@ -81,7 +80,7 @@ std::vector<Evidence> clearEvidence(ModuleReport const& module, ClearSigns const
     if (!signs.permanentAlone.empty()) {
         list.push_back(permanentEvidence(module, signs));
     }
-    if (std::optional<double> const minutes = numberOf(module, 0x4E); minutes && *minutes < longestDistanceKm) {
+    if (std::optional<double> const minutes = numberOf(module, 0x4E); minutes && *minutes < mostMinutes) {
         list.push_back({DataTopic::Values, module.id, fmt::format(texts::finding::runTime, shownValue(module, 0x4E))});
     }
     if (hasNoResults(module)) {

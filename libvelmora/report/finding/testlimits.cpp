@@ -59,12 +59,12 @@ bool isTemperatureEnd(double limit)
 
 bool isUpperEnd(double limit)
 {
-    return limit > 0.0 && (isMultiple(limit, 65535.0) || isMultiple(limit, 32767.0) || isTemperatureEnd(limit));
+    return isMultiple(limit, 65535.0) || isMultiple(limit, 32767.0) || isTemperatureEnd(limit);
 }
 
 bool isLowerEnd(double limit)
 {
-    return limit == 0.0 || (limit < 0.0 && (isMultiple(-limit, 32768.0) || limit == -40.0));
+    return limit == 0.0 || isMultiple(-limit, 32768.0) || limit == -40.0;
 }
 
 bool isClose(double distance, double measure)

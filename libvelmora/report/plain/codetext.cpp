@@ -24,13 +24,9 @@ std::string summary(CodeList const& list)
         return texts::noAnswer;
     case CodeList::Answer::Unreadable:
         return texts::cantBeRead;
-    case CodeList::Answer::Read:
-        break;
+    default:
+        return list.codes.empty() ? texts::noneStored : counted(list.codes.size(), texts::plain::codeNoun);
     }
-    if (list.codes.empty()) {
-        return texts::noneStored;
-    }
-    return counted(list.codes.size(), texts::plain::codeNoun);
 }
 
 Mark mark(CodeList const& list)
@@ -53,10 +49,9 @@ std::string makerText(MakerChoice const& choice)
         return fmt::format(texts::plain::listByVin, choice.maker);
     case MakerChoice::By::Guess:
         return fmt::format(texts::plain::listByGuess, choice.maker);
-    case MakerChoice::By::Nothing:
-        break;
+    default:
+        return texts::plain::noList;
     }
-    return texts::plain::noList;
 }
 
 } // namespace

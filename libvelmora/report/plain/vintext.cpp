@@ -30,10 +30,9 @@ std::string checkText(VinFacts const& facts, Style const& style)
         return style.paint(Mark::Good, texts::plain::checkRight);
     case VinFacts::CheckDigit::Wrong:
         return style.paint(Mark::Bad, fmt::format(texts::plain::checkWrong, facts.computedCheck));
-    case VinFacts::CheckDigit::NotJudged:
-        break;
+    default:
+        return texts::plain::checkUnused;
     }
-    return texts::plain::checkUnused;
 }
 
 std::string codesText(VinFacts const& facts)
@@ -43,10 +42,9 @@ std::string codesText(VinFacts const& facts)
         return fmt::format(texts::plain::codesByDefault, facts.codes);
     case VinFacts::CodesBasis::Guess:
         return fmt::format(texts::plain::codesPerhaps, facts.codes);
-    case VinFacts::CodesBasis::None:
-        break;
+    default:
+        return facts.maker.empty() ? "" : texts::plain::codesUnknown;
     }
-    return facts.maker.empty() ? "" : texts::plain::codesUnknown;
 }
 
 } // namespace
