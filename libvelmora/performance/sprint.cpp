@@ -16,10 +16,10 @@ double metresBetween(SpeedPoint const& a, SpeedPoint const& b)
     return (a.kmh + b.kmh) * 0.5 * metrePerSecond * (b.seconds - a.seconds);
 }
 
+// Where a speed lies on the way from a to b, which rises and meets it.
 SpeedPoint atSpeed(SpeedPoint const& a, SpeedPoint const& b, double kmh)
 {
-    double const share = b.kmh > a.kmh ? std::clamp((kmh - a.kmh) / (b.kmh - a.kmh), 0.0, 1.0) : 0.0;
-    return {a.seconds + share * (b.seconds - a.seconds), kmh};
+    return {a.seconds + (kmh - a.kmh) / (b.kmh - a.kmh) * (b.seconds - a.seconds), kmh};
 }
 
 // Where so many metres of the way from a to b lie behind; the speed changes evenly.
@@ -29,11 +29,12 @@ SpeedPoint atDistance(SpeedPoint const& a, SpeedPoint const& b, double metres)
     double const speed = a.kmh * metrePerSecond;
     double const acceleration = (b.kmh - a.kmh) * metrePerSecond / duration;
     double const root = std::sqrt(std::max(0.0, speed * speed + 2.0 * acceleration * metres));
-    double const time = speed + root > 0.0 ? 2.0 * metres / (speed + root) : duration;
+    double const time = 2.0 * metres / (speed + root);
     return {a.seconds + time, a.kmh + (b.kmh - a.kmh) * time / duration};
 }
 
-// Where the run meets a speed for the last time before `end`, rising; the start for a speed of 0.
+// Where the run leaves a speed for the last time before `end`, rising, so that a speed that was held before does not
+// count; the start for a speed of 0.
 std::optional<SpeedPoint> lastRise(std::vector<SpeedPoint> const& run, double kmh, double end)
 {
     if (kmh <= 0.0) {
@@ -41,7 +42,7 @@ std::optional<SpeedPoint> lastRise(std::vector<SpeedPoint> const& run, double km
     }
     std::optional<SpeedPoint> found;
     for (std::size_t i = 1; i < run.size(); ++i) {
-        if (run[i - 1].kmh < kmh && run[i].kmh >= kmh) {
+        if (run[i - 1].kmh <= kmh && run[i].kmh > kmh) {
             SpeedPoint const point = atSpeed(run[i - 1], run[i], kmh);
             found = point.seconds <= end ? std::optional(point) : found;
         }
@@ -61,9 +62,12 @@ std::optional<SpeedPoint> firstRise(std::vector<SpeedPoint> const& run, double k
 
 std::optional<SpeedPoint> afterMetres(std::vector<SpeedPoint> const& run, double metres)
 {
+    if (metres <= 0.0) {
+        return std::nullopt;
+    }
     for (std::size_t i = 1; i < run.size(); ++i) {
         double const part = metresBetween(run[i - 1], run[i]);
-        if (part > 0.0 && part >= metres) {
+        if (part >= metres) {
             return atDistance(run[i - 1], run[i], metres);
         }
         metres -= part;
