@@ -42,13 +42,12 @@ KeptScan scanAt(Statement const& row)
 
 constexpr char const* scanColumns = "SELECT number, vehicle, time, program, hash, document FROM scan ";
 
-void makeFolder(std::filesystem::path const& file)
+void makeFolder(std::filesystem::path const& folder)
 {
     std::error_code error;
-    std::filesystem::create_directories(file.parent_path(), error);
+    std::filesystem::create_directories(folder, error);
     if (error) {
-        throw Error(ErrorKind::Failed,
-                    "Could not make the folder " + file.parent_path().string() + ": " + error.message(),
+        throw Error(ErrorKind::Failed, "Could not make the folder " + folder.string() + ": " + error.message(),
                     {"VELMORA_HISTORY=FILE names another place"});
     }
 }
@@ -82,8 +81,8 @@ History::Parts::Parts(std::filesystem::path path, Access access) : file(std::mov
     if (access == Access::Look && !stands(file)) {
         return;
     }
-    if (access == Access::Keep && file.has_parent_path()) {
-        makeFolder(file);
+    if (access == Access::Keep) {
+        makeFolder(std::filesystem::absolute(file).parent_path());
     }
     database = std::make_unique<Database>(file.string(), access == Access::Keep ? Database::Access::Write
                                                                                 : Database::Access::ReadOnly);
@@ -157,9 +156,7 @@ KeptScan History::scan(std::int64_t number) const
         Statement rows(*m_parts->database, std::string(scanColumns) + "WHERE number = ?");
         rows.bind(1, number);
         if (rows.next()) {
-            KeptScan const found = scanAt(rows);
-            rows.reset();
-            return found;
+            return scanAt(rows);
         }
     }
     throw Error(ErrorKind::WrongUse, "There is no scan " + std::to_string(number) + " in " + m_parts->file.string(),

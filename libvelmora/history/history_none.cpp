@@ -6,9 +6,9 @@ namespace velmora {
 
 namespace {
 
-[[noreturn]] void refuseHistory()
+Error noHistory()
 {
-    throw Error(ErrorKind::WrongUse, "This build keeps no history", {"velmora --version tells what it has"});
+    return {ErrorKind::WrongUse, "This build keeps no history", {"velmora --version tells what it has"}};
 }
 
 } // namespace
@@ -20,39 +20,39 @@ History::History(Access access) : History(defaultFile(), access) {}
 
 History::History(std::string const& /*file*/, Access /*access*/)
 {
-    refuseHistory();
+    throw noHistory();
 }
 
 History::~History() = default;
 
 std::optional<std::int64_t> History::add(KeptScan const& /*scan*/)
 {
-    refuseHistory();
+    throw noHistory();
 }
 
 std::vector<KeptScan> History::scans(std::string const& /*vehicle*/) const
 {
-    refuseHistory();
+    throw noHistory();
 }
 
 KeptScan History::scan(std::int64_t /*number*/) const
 {
-    refuseHistory();
+    throw noHistory();
 }
 
 std::size_t History::forget(std::string const& /*vehicle*/)
 {
-    refuseHistory();
+    throw noHistory();
 }
 
 std::size_t History::exportTo(std::ostream& /*out*/) const
 {
-    refuseHistory();
+    throw noHistory();
 }
 
 History::Imported History::importFrom(std::istream& /*in*/)
 {
-    refuseHistory();
+    throw noHistory();
 }
 
 std::string History::defaultFile()

@@ -20,7 +20,7 @@ std::optional<std::vector<std::string>> fieldsOf(std::string const& line)
     bool quoted = false;
     for (std::size_t i = 0; i < line.size(); ++i) {
         char const each = line[i];
-        if (quoted && each == '"' && i + 1 < line.size() && line[i + 1] == '"') {
+        if (quoted && each == '"' && line[i + 1] == '"') { // behind the last one stands a 0
             fields.back() += '"';
             ++i;
         } else if (each == '"') {
@@ -47,8 +47,8 @@ SensorEntry sensorOfTitle(std::string const& title)
     std::size_t const blank = entry.name.find(' ');
     std::optional<unsigned int> const module =
         blank != std::string::npos ? parseHex(entry.name.substr(0, blank), 0x1FFFFFFF) : std::nullopt;
-    bool const plain = entry.name.find_first_not_of("ABCDEFGHIJKLMNOPQRSTUVWXYZ0123456789_",
-                                                    blank == std::string::npos ? 0 : blank + 1) == std::string::npos;
+    bool const plain = entry.name.find_first_not_of("ABCDEFGHIJKLMNOPQRSTUVWXYZ0123456789_", blank + 1) ==
+                       std::string::npos; // without a blank, that is from the beginning on
     entry.sensor = entry.name;
     if (module && plain) {
         entry.module = *module;

@@ -28,8 +28,8 @@ constexpr unsigned int replayLimitMs = 1500;
 // A request for live values.
 struct LiveRequest
 {
-    std::int64_t time = 0; // of its reply, ms
-    std::string key;       // without the digit that tells how many replies to wait for
+    std::int64_t time; // of its reply, ms
+    std::string key;   // without the digit that tells how many replies to wait for
     std::vector<unsigned char> pids;
 };
 
@@ -47,7 +47,7 @@ std::vector<unsigned char> livePids(std::string const& key)
 {
     std::optional<obdsim::Bytes> bytes = obdsim::parseHex(key);
     bool const live =
-        bytes && bytes->size() > 1 && bytes->front() == liveData &&
+        bytes && !bytes->empty() && bytes->front() == liveData &&
         std::none_of(bytes->begin() + 1, bytes->end(), [](unsigned char pid) { return pid % maskDistance == 0; });
     return live ? std::vector<unsigned char>(bytes->begin() + 1, bytes->end()) : std::vector<unsigned char>();
 }

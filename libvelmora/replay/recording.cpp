@@ -29,19 +29,17 @@ std::optional<double> finiteIn(std::string_view text)
 {
     double number = 0.0;
     auto const [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
-    bool const whole = !text.empty() && error == std::errc() && end == text.data() + text.size();
+    bool const whole = error == std::errc() && end == text.data() + text.size();
     return whole && std::isfinite(number) ? std::optional(number) : std::nullopt;
 }
 
-std::optional<int> digitsIn(std::string_view text, std::size_t at, std::size_t count)
+int numberOf(std::string_view digits)
 {
-    if (at + count > text.size()) {
-        return std::nullopt;
-    }
     int number = 0;
-    auto const [end, error] = std::from_chars(text.data() + at, text.data() + at + count, number);
-    return error == std::errc() && end == text.data() + at + count && number >= 0 ? std::optional(number)
-                                                                                  : std::nullopt;
+    for (char const digit : digits) {
+        number = number * 10 + (digit - '0');
+    }
+    return number;
 }
 
 } // namespace
@@ -49,15 +47,14 @@ std::optional<int> digitsIn(std::string_view text, std::size_t at, std::size_t c
 std::optional<std::int64_t> timeIn(std::string_view text)
 {
     constexpr std::string_view form = "0000-00-00T00:00:00.000Z";
-    bool fits = text.size() == form.size();
-    for (std::size_t i = 0; fits && i < form.size(); ++i) {
-        fits = form[i] == '0' ? text[i] >= '0' && text[i] <= '9' : text[i] == form[i];
-    }
+    bool const fits = std::ranges::equal(text, form, [](char given, char wanted) {
+        return wanted == '0' ? given >= '0' && given <= '9' : given == wanted;
+    });
     if (!fits) {
         return std::nullopt;
     }
     using namespace std::chrono;
-    auto const part = [text](std::size_t at, std::size_t count) { return *digitsIn(text, at, count); };
+    auto const part = [text](std::size_t at, std::size_t count) { return numberOf(text.substr(at, count)); };
     year_month_day const date{year(part(0, 4)), month(static_cast<unsigned int>(part(5, 2))),
                               std::chrono::day(static_cast<unsigned int>(part(8, 2)))};
     if (!date.ok() || part(11, 2) > 23 || part(14, 2) > 59 || part(17, 2) > 60) {
@@ -73,7 +70,7 @@ std::size_t RecordingMaker::sensor(SensorEntry const& about)
     auto const known = m_numbers.find(key);
     if (known != m_numbers.end() || m_recording.sensors.size() >= mostSensors) {
         m_recording.cut |= known == m_numbers.end();
-        return known != m_numbers.end() ? known->second : mostSensors;
+        return known != m_numbers.end() ? known->second : noRoom;
     }
     m_recording.sensors.push_back({about, 0, true, {}});
     return m_numbers[key] = m_recording.sensors.size() - 1;
@@ -81,11 +78,12 @@ std::size_t RecordingMaker::sensor(SensorEntry const& about)
 
 bool RecordingMaker::add(std::size_t sensor, std::int64_t time, std::string const& text)
 {
+    if (sensor == noRoom) {
+        return true;
+    }
     if (std::optional<double> const number = finiteIn(text)) {
-        if (sensor < m_recording.sensors.size()) {
-            int& decimals = m_recording.sensors[sensor].decimals;
-            decimals = std::max(decimals, decimalsOf(text));
-        }
+        int& decimals = m_recording.sensors[sensor].decimals;
+        decimals = std::max(decimals, decimalsOf(text));
         return add(sensor, time, Reading::Value(*number));
     }
     return add(sensor, time, text.empty() || text == "-" ? Reading::Value() : Reading::Value(text));
@@ -93,10 +91,10 @@ bool RecordingMaker::add(std::size_t sensor, std::int64_t time, std::string cons
 
 bool RecordingMaker::add(std::size_t sensor, std::int64_t time, Reading::Value value)
 {
-    if (sensor >= m_recording.sensors.size() || time < 0 || time > latestTime) {
+    if (sensor == noRoom || time < 0 || time > latestTime) {
         return true; // left out: a sensor that found no room, or a time that can't be
     }
-    if (m_values == mostValues) {
+    if (m_values == m_mostValues) {
         m_recording.cut = true;
         return false;
     }

@@ -14,10 +14,13 @@ namespace velmora {
 class RecordingMaker
 {
 public:
-    static constexpr std::size_t mostValues = 2000000;
     static constexpr std::size_t mostSensors = 2000;
+    static constexpr std::size_t noRoom = std::string::npos;
 
-    // The sensor's number, new or known.
+    // mostValues: what it takes, of all sensors together.
+    explicit RecordingMaker(std::size_t mostValues = 2000000) : m_mostValues(mostValues) {}
+
+    // The sensor's number, new or known; noRoom if there are too many already.
     std::size_t sensor(SensorEntry const& about);
     // A text that is a number is one. False if nothing more fits.
     bool add(std::size_t sensor, std::int64_t time, std::string const& text);
@@ -27,6 +30,7 @@ public:
     Recording finish();
 
 private:
+    std::size_t const m_mostValues;
     Recording m_recording;
     std::map<std::string, std::size_t> m_numbers; // by module, key and unit
     std::size_t m_values = 0;
