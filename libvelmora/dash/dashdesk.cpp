@@ -12,14 +12,13 @@ constexpr std::size_t mostAsks = 16;
 
 std::shared_ptr<void> DashDesk::listen(Listener listener)
 {
-    auto shared = std::make_shared<Listener>(std::move(listener));
     std::lock_guard const lock(m_listenersMutex);
-    std::erase_if(m_listeners, [](std::weak_ptr<Listener> const& each) { return each.expired(); });
-    m_listeners.push_back(shared);
+    void* const mine = m_listeners.emplace_back(std::make_unique<Listener>(std::move(listener))).get();
     // Whoever lets go waits for a call that is under way.
-    return {shared.get(), [this, shared](void* /*listener*/) mutable {
+    return {mine, [this](void* gone) {
                 std::lock_guard const last(m_listenersMutex);
-                shared.reset();
+                std::erase_if(m_listeners,
+                              [gone](std::unique_ptr<Listener> const& each) { return each.get() == gone; });
             }};
 }
 
@@ -59,10 +58,9 @@ template <typename Member, typename Value>
 void DashDesk::hand(Member member, Value const& value)
 {
     std::lock_guard const lock(m_listenersMutex);
-    for (std::weak_ptr<Listener> const& each : m_listeners) {
-        std::shared_ptr<Listener> const listener = each.lock();
-        if (listener != nullptr && (*listener).*member) {
-            ((*listener).*member)(value);
+    for (std::unique_ptr<Listener> const& each : m_listeners) {
+        if ((*each).*member) {
+            ((*each).*member)(value);
         }
     }
 }

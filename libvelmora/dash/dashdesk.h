@@ -6,6 +6,7 @@
 
 #include <deque>
 #include <functional>
+#include <memory>
 #include <mutex>
 #include <optional>
 #include <string>
@@ -59,7 +60,7 @@ public:
         std::function<void(DashVehicle const&)> vehicle;
     };
 
-    // From then on until the token goes.
+    // From then on until the token goes, which the desk must outlive.
     std::shared_ptr<void> listen(Listener listener);
 
     // False if too many wishes wait already. One that waits in the same words is not taken twice.
@@ -84,7 +85,7 @@ private:
     std::mutex m_asksMutex;
     std::deque<DashAsk> m_asks; // protected by m_asksMutex
     std::mutex m_listenersMutex;
-    std::vector<std::weak_ptr<Listener>> m_listeners; // protected by m_listenersMutex
+    std::vector<std::unique_ptr<Listener>> m_listeners; // protected by m_listenersMutex
 };
 
 } // namespace velmora

@@ -21,10 +21,7 @@ constexpr std::size_t chartAtFirst = 6; // sensors whose history comes without b
 
 HttpLimits serverLimits()
 {
-    HttpLimits limits;
-    limits.connections = 64;
-    limits.time = std::chrono::seconds(5);
-    return limits;
+    return {.connections = 64, .time = std::chrono::seconds(5)};
 }
 
 // Browsers tell it when they connect again by themselves; the page does it where it makes a stream anew.
@@ -51,11 +48,7 @@ DashOutput::DashOutput(OutputAddress const& address, DashContext context)
     addRoutes();
 }
 
-DashOutput::~DashOutput()
-{
-    m_listening.reset();
-    m_server.stop();
-}
+DashOutput::~DashOutput() = default;
 
 // All replies carry the page's headers.
 void DashOutput::addHandler(std::string const& method, std::string const& path, HttpHandler handler)
@@ -116,11 +109,7 @@ void DashOutput::open()
 
 std::string DashOutput::link() const
 {
-    bool const any = m_place.host == "0.0.0.0" || m_place.host == "::";
-    std::string const host = any ? ownAddress() : m_place.host;
-    bool const six = host.find(':') != std::string::npos;
-    return "http://" + (six ? "[" + host + "]" : host) + ":" + std::to_string(port()) + "/" +
-           (m_access.token().empty() ? "" : "#t=" + m_access.token());
+    return pageLink(m_place.host, port(), m_access.token());
 }
 
 void DashOutput::write(Records records)
@@ -138,7 +127,7 @@ void DashOutput::write(Records records)
         m_server.publishLatest(trafficPath, HttpServer::event("lines", lines));
     }
     publishRuns();
-    auto const now = std::chrono::steady_clock::now();
+    auto const now = m_context.now();
     if (now - m_lastBeat >= beat) {
         m_lastBeat = now;
         m_server.publish(streamPath, HttpServer::event("beat", dumpedJson(beatNow())));
@@ -149,7 +138,7 @@ void DashOutput::write(Records records)
 void DashOutput::publishRuns()
 {
     RunBoard& runs = m_context.desk->runs();
-    auto const now = std::chrono::steady_clock::now();
+    auto const now = m_context.now();
     if (now - m_lastRuns >= runsStep && runs.takeChange()) {
         m_lastRuns = now;
         m_server.publishLatest(streamPath, HttpServer::event("performance", dumpedJson(runs.state(false))));

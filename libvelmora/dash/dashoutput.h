@@ -24,6 +24,7 @@ struct DashContext
     std::function<Json()> playState; // where a recording is played; empty for a vehicle
     std::string token;               // where one is needed; empty: made up
     bool mustListen = false;         // a port that can't be had ends all, rather than being tried again
+    std::function<std::chrono::steady_clock::time_point()> now = std::chrono::steady_clock::now; // set by tests alone
     // Where the page is, and what to know about it. Called by open.
     std::function<void(std::string const& link, std::string const& remark)> onLink = [](auto const&, auto const&) {};
 };
@@ -79,8 +80,8 @@ private:
     std::chrono::steady_clock::time_point m_lastBeat;
     std::chrono::steady_clock::time_point m_lastRuns;
     std::atomic<std::chrono::steady_clock::time_point> m_lastSeen{}; // a reader, or the wish to time runs
-    HttpServer m_server;
-    std::shared_ptr<void> m_listening;
+    HttpServer m_server;                                             // goes before all that its replies are made of
+    std::shared_ptr<void> m_listening;                               // goes first, so that nobody calls any more
 };
 
 } // namespace velmora

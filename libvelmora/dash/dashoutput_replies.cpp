@@ -78,7 +78,7 @@ HttpResponse DashOutput::takeRuns(Json const& wish)
     if (!begins && !ends) {
         return plainResponse(400, "Runs begin or end");
     }
-    m_lastSeen = std::chrono::steady_clock::now();
+    m_lastSeen = m_context.now();
     HttpResponse const accepted = plainResponse(202, "Asked");
     return m_context.desk->ask({"performance", begins ? "begin" : "end"})
                ? accepted

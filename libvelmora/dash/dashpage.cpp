@@ -4,6 +4,8 @@
 
 #include <fmt/format.h>
 
+#include <span>
+
 namespace velmora {
 
 namespace {
@@ -24,8 +26,8 @@ std::string typeOf(std::string const& name)
 std::string tagOf(DashAsset const& asset)
 {
     std::uint64_t hash = 0xCBF29CE484222325;
-    for (std::size_t i = 0; i < asset.packedSize; ++i) {
-        hash = (hash ^ asset.packed[i]) * 0x100000001B3;
+    for (unsigned char const byte : std::span(asset.packed, asset.packedSize)) {
+        hash = (hash ^ byte) * 0x100000001B3;
     }
     return fmt::format("\"{:016x}\"", hash);
 }

@@ -68,7 +68,7 @@ std::optional<std::string> cookieIn(HttpRequest const& request, std::string_view
             std::string_view part = rest.substr(0, rest.find(';'));
             rest.remove_prefix(std::min(part.size() + 1, rest.size()));
             part.remove_prefix(std::min(part.find_first_not_of(' '), part.size()));
-            if (part.size() > name.size() && part.starts_with(name) && part[name.size()] == '=') {
+            if (part.starts_with(name) && part.substr(name.size()).starts_with('=')) {
                 return std::string(part.substr(name.size() + 1));
             }
         }

@@ -7,10 +7,11 @@ namespace velmora {
 
 namespace {
 
-bool fitsPath(HttpRoutes::Route const& route, std::string const& path)
+// Whether the route's path ends with a star, and stands for the path as well.
+bool fitsOpenly(HttpRoutes::Route const& route, std::string const& path)
 {
-    bool const open = !route.path.empty() && route.path.back() == '*';
-    return open ? path.starts_with(std::string_view(route.path).substr(0, route.path.size() - 1)) : path == route.path;
+    std::string_view const own = route.path;
+    return own.ends_with('*') && path.starts_with(own.substr(0, own.size() - 1));
 }
 
 HttpResponse wrongMethod(HttpRoutes::Route const& route)
@@ -51,7 +52,10 @@ HttpRoutes::Route const* HttpRoutes::find(std::string const& path) const
 {
     Route const* best = nullptr;
     for (Route const& each : m_routes) {
-        if (fitsPath(each, path) && (best == nullptr || each.path.size() > best->path.size())) {
+        if (each.path == path) {
+            return &each;
+        }
+        if (fitsOpenly(each, path) && (best == nullptr || each.path.size() > best->path.size())) {
             best = &each;
         }
     }

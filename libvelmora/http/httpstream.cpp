@@ -35,7 +35,6 @@ void HttpStream::close()
 {
     StreamErrorCode ignored;
     m_ping.cancel();
-    m_socket.shutdown(boost::asio::ip::tcp::socket::shutdown_both, ignored);
     m_socket.close(ignored);
     if (m_core.streams.erase(shared_from_this()) > 0) {
         --m_core.readers;
@@ -111,7 +110,7 @@ void HttpStream::schedulePing()
 // A reader says nothing more; when reading ends, it has gone.
 void HttpStream::watchForEnd()
 {
-    m_socket.async_read_some(boost::asio::buffer(&m_ignored, 1),
+    m_socket.async_read_some(boost::asio::buffer(m_ignored),
                              [self = shared_from_this()](StreamErrorCode const& error, std::size_t) {
                                  if (error) {
                                      self->close();

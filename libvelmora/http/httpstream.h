@@ -4,6 +4,7 @@
 
 #include <boost/asio/steady_timer.hpp>
 
+#include <array>
 #include <chrono>
 #include <string>
 
@@ -41,7 +42,7 @@ private:
     std::chrono::steady_clock::time_point m_writingSince;
     bool m_behind = false;            // has missed some of publishLatest
     boost::asio::steady_timer m_ping; // until the next one
-    char m_ignored = 0;
+    std::array<char, 64> m_ignored{};
 };
 
 } // namespace velmora

@@ -24,7 +24,8 @@ HttpPlace parseHttpPlace(std::string const& text)
     if (colon == std::string::npos || colon == 0) {
         rejectPlace(text);
     }
-    HttpPlace place{text.substr(0, colon), 0};
+    HttpPlace place;
+    place.host = text.substr(0, colon);
     char const* const end = text.data() + text.size();
     auto const [stop, error] = std::from_chars(text.data() + colon + 1, end, place.port);
     if (error != std::errc() || stop != end) {

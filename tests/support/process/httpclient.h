@@ -33,6 +33,8 @@ public:
     {
         return ::send(m_socket, text.data(), text.size(), MSG_NOSIGNAL) == static_cast<ssize_t>(text.size());
     }
+    // Says that nothing more comes from here.
+    void endSending() const { ::shutdown(m_socket, SHUT_WR); }
     // All up to the end of the connection.
     std::string readAll()
     {
