@@ -1,3 +1,5 @@
+#include "libvelmora/output/database/database.h"
+#include "tests/libvelmora/watch/servicemanager.h"
 #include "tests/support/temporaryfolder.h"
 
 #include <velmora/error.h>
@@ -6,10 +8,14 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <atomic>
 #include <condition_variable>
 #include <cstdlib>
+#include <fstream>
+#include <map>
 #include <mutex>
 #include <thread>
+#include <unistd.h>
 
 namespace {
 
@@ -47,7 +53,21 @@ protected:
     LongWatchTest()
     {
         ::setenv("STATE_DIRECTORY", m_folder.path().c_str(), 1);
-        m_options.car.port = "sim:petrol-can11?instant";
+        std::ofstream(m_folder.file("car.toml")) << R"(name = "a car that tells little, and at once"
+protocol = 6
+[[module]]
+id = "7E8"
+[module.raw]
+"0100" = "41 00 80 10 00 00"
+"0101" = "41 01 00 07 21 00"
+"010C" = "41 0C 0F A0"
+"03" = "43 00"
+"07" = "47 00"
+"0A" = "4A 00"
+"0900" = "49 00 40 00 00 00"
+"0902" = "49 02 01 56 45 4C 4D 52 41 53 31 4D 4D 30 30 30 30 30 30 31"
+)";
+        m_options.car.port = "sim:" + m_folder.file("car.toml") + "?instant";
         m_options.car.settingsFile = m_folder.file("settings.toml");
         m_options.outputs = {"ndjson:" + m_folder.file("watch.ndjson")};
         m_options.vehicle = "van";
@@ -83,6 +103,78 @@ TEST_F(LongWatchTest, WritesUntilItsEndAndGoesOnOverAReload)
     ASSERT_EQ(health.outputs.size(), 1U);
     EXPECT_GT(health.outputs[0].second.accepted, 0U);
     EXPECT_NE(m_folder.read("watch.ndjson").find("\"vehicle\":\"van\""), std::string::npos);
+}
+
+TEST_F(LongWatchTest, TellsItsServiceManagerAndEndsTheTripUnderWay)
+{
+    velmora::test::Manager const manager("@velmora-longwatch-" + std::to_string(::getpid()));
+    ::setenv("WATCHDOG_USEC", "2000", 1);
+    m_options.outputs.push_back("csv-long:" + m_folder.file("watch.csv"));
+    LongWatch watch(m_options);
+    std::atomic<bool> done = false;
+    std::map<std::string, int> heard;
+    std::thread listener([&] { // for what nobody takes is lost
+        for (bool last = false; !last;) {
+            last = done;
+            for (std::string text = manager.heard(); text != "-"; text = manager.heard()) {
+                ++heard[text];
+            }
+            std::this_thread::sleep_for(std::chrono::milliseconds(1));
+        }
+    });
+    std::thread runner([&watch] { watch.run(); });
+    EXPECT_TRUE(m_told.hold("engine_start: The engine runs"));
+    EXPECT_TRUE(m_told.hold("running"));
+    watch.reload();
+    EXPECT_TRUE(m_told.hold("running", 2));
+    watch.end();
+    runner.join();
+    done = true;
+    listener.join();
+    EXPECT_EQ(heard["READY=1"], 2);
+    EXPECT_EQ(heard["RELOADING=1"], 1);
+    EXPECT_EQ(heard["STOPPING=1"], 1);
+    EXPECT_EQ(heard["STATUS=running"], 2);
+    EXPECT_GE(heard["WATCHDOG=1"], 2);
+    EXPECT_NE(m_folder.read("watch.ndjson").find("\"event\":\"engine_run\""), std::string::npos)
+        << "too short for a trip";
+    EXPECT_TRUE(m_told.hold("engine_run: ", 2));
+    EXPECT_NE(m_folder.read("watch.csv").find(",RPM,"), std::string::npos);
+    EXPECT_TRUE(watch.abandon()) << "there is no run any more";
+    EXPECT_EQ(manager.heard(), "STOPPING=1");
+}
+
+TEST_F(LongWatchTest, GivesAnotherVehicleANameOfItsOwn)
+{
+    m_options.vehicle.clear();
+    std::ofstream(m_folder.file("vehicle-name")) << "bus\n";
+    std::ofstream(m_folder.file("vehicles")) << "ANOTHERVIN bus\n";
+    LongWatch watch(m_options);
+    std::thread runner([&watch] { watch.run(); });
+    EXPECT_TRUE(m_told.hold("another vehicle answers: its values get a name of their own"));
+    EXPECT_TRUE(m_told.hold("running"));
+    watch.end();
+    runner.join();
+    std::string const name = m_folder.read("vehicle-name");
+    EXPECT_TRUE(name.starts_with("car-")) << name;
+    std::string const written = m_folder.read("watch.ndjson");
+    EXPECT_NE(written.find("\"vehicle\":\"" + name.substr(0, name.size() - 1) + "\""), std::string::npos);
+    EXPECT_EQ(written.find("\"vehicle\":\"bus\""), std::string::npos) << "none of it is the bus's";
+}
+
+// Another program holds the database: its output waits for that, and the end does not wait for the output.
+TEST_F(LongWatchTest, LeavesAnOutputThatHangsBehind)
+{
+    std::string const file = m_folder.file("watch.db");
+    m_options.outputs = {"sqlite:" + file};
+    LongWatch watch(m_options);
+    std::thread runner([&watch] { watch.run(); });
+    EXPECT_TRUE(m_told.hold("running"));
+    velmora::Database other(file);
+    auto const hold = std::make_unique<velmora::Transaction>(other);
+    watch.end();
+    runner.join();
+    EXPECT_TRUE(m_told.hold("sqlite:" + file + ": hangs, and is not waited for"));
 }
 
 TEST_F(LongWatchTest, RefusesWhatMakesNoSense)

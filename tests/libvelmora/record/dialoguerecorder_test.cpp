@@ -2,6 +2,8 @@
 
 #include <gtest/gtest.h>
 
+#include <thread>
+
 using namespace velmora;
 
 TEST(DialogueRecorder, takesDownEachCommandWithItsReply)
@@ -51,6 +53,32 @@ TEST(DialogueRecorder, keepsAMegabyteOfAReplyThatHasNoEnd)
     obdsim::Dialogue const dialogue = recorder.dialogue();
     EXPECT_EQ(dialogue.exchanges[0].received().size(), megabyte);
     EXPECT_EQ(dialogue.exchanges[1].received(), "OK\r\r>");
+}
+
+TEST(DialogueRecorder, takesDownPausesFromTheCommandOn)
+{
+    DialogueRecorder recorder;
+    auto const rest = [] { std::this_thread::sleep_for(std::chrono::milliseconds(22)); };
+    recorder.onSent("ATI\r");
+    rest();
+    recorder.onReceived("ELM");
+    recorder.onReceived("327\r\r>");
+    rest();
+    recorder.onSent("ATE0\r");
+    recorder.onReceived("OK\r");
+    rest();
+    recorder.onReceived("\r>");
+    auto const& exchanges = recorder.dialogue().exchanges;
+    ASSERT_EQ(exchanges.size(), 2U);
+    ASSERT_EQ(exchanges[0].chunks.size(), 1U) << "what comes at once stands together";
+    EXPECT_GE(exchanges[0].chunks[0].pause, obdsim::Ms(22));
+    EXPECT_EQ(exchanges[0].chunks[0].bytes, "ELM327\r\r>");
+    ASSERT_EQ(exchanges[1].chunks.size(), 2U);
+    EXPECT_LT(exchanges[1].chunks[0].pause, obdsim::Ms(22)) << "the pause before the command is the host's";
+    EXPECT_GE(exchanges[1].chunks[1].pause, obdsim::Ms(22));
+    EXPECT_EQ(recorder.sentFrom(1), std::vector<std::string>{"ATE0"});
+    EXPECT_EQ(recorder.sentFrom(0).size(), 2U);
+    EXPECT_TRUE(recorder.sentFrom(2).empty());
 }
 
 TEST(DialogueRecorder, tellsProtocolAndHeadersFromTheBytes)

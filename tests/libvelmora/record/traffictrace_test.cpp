@@ -42,6 +42,31 @@ TEST(TrafficTrace, HasALineEachWayWithItsTime)
     EXPECT_THAT(lines, testing::ElementsAre(">> 010C\\r", "<< 41 0C\\r\\n>", "<< \\\\ ~\\x7F\\x1F\\xFF"));
 }
 
+TEST(TrafficTrace, TellsTheTimeToTheMillisecond)
+{
+    testsupport::TemporaryFolder const folder;
+    TrafficTrace trace(folder.path() / "trace");
+    auto const millis = [] {
+        auto const now = std::chrono::system_clock::now().time_since_epoch();
+        return std::chrono::floor<std::chrono::milliseconds>(now).count();
+    };
+    auto const begin = millis();
+    trace.onDataSent(bytesOf("A"));
+    auto const end = millis();
+    std::string const line = folder.read("trace");
+    bool found = false;
+    for (auto at = begin; at <= end; ++at) {
+        std::time_t const seconds = at / 1000;
+        std::tm fields{};
+        ::localtime_r(&seconds, &fields);
+        char text[32] = {};
+        std::strftime(text, sizeof(text), "%H:%M:%S.", &fields);
+        std::string const fraction = std::to_string(1000 + at % 1000).substr(1);
+        found = found || line.starts_with(text + fraction + " >> A");
+    }
+    EXPECT_TRUE(found) << line << " is not between " << begin << " and " << end;
+}
+
 TEST(TrafficTrace, AFileThatCannotBeWrittenIsTold)
 {
     EXPECT_THROW(TrafficTrace("/nowhere/at/all"), velmora::Error);

@@ -102,6 +102,23 @@ TEST(VinMask, leavesOtherRepliesAlone)
     EXPECT_EQ(masked(6, "010C", "7E804410C4902\r\r>"), "7E804410C4902\r\r>") << "an engine speed that looks like one";
 }
 
+TEST(VinMask, blanksFramesOfTheNumbersOwnMessageAlone)
+{
+    std::string const first = "7E81014490201314E34\r";
+    std::string const rest = "7E821414C3341503744\r7E82243313233343536\r";
+    std::string const blanked = "7E821414C3341503744\r7E82243303030303030\r";
+    for (char const* const other : {"7E8027E00\r",       // a single frame of the same module
+                                    "7E83000\r",         // flow control
+                                    "7E9224331323334\r", // another module's
+                                    "7E8\r", "7E82\r", "7E820414243444546\r", "7E8\r\r", "7E82441424344454647\r"}) {
+        EXPECT_EQ(masked(6, "0904", first + other + rest + ">"), first + other + blanked + ">") << other;
+    }
+    EXPECT_EQ(masked(6, "0904", first + "7E8211449024142434\r7E82243313233343536\r>"),
+              first + "7E8211449024142434\r7E82243303030303030\r>")
+        << "characters that read like the beginning of another";
+    EXPECT_EQ(masked(6, "0904", "7E8104902\r7E810144902\r>"), "7E8104902\r7E810144902\r>") << "too short for any";
+}
+
 TEST(VinMask, keepsThePiecesInWhichBytesCame)
 {
     obdsim::Dialogue dialogue =

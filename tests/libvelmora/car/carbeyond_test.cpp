@@ -1,0 +1,291 @@
+// A car beyond its standard sensors: offers, probes, live values with signals, silent files, an adapter that is cut
+// off.
+#include "libvelmora/car/carprobe.h"
+#include "libvelmora/port/opening/openport.h"
+#include "libvelmora/uds/identifierprobe.h"
+#include "tests/support/temporaryfolder.h"
+
+#include <velmora/car.h>
+#include <velmora/console.h>
+#include <velmora/error.h>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <fstream>
+
+namespace {
+
+using testing::ElementsAre;
+using testing::HasSubstr;
+using testing::IsEmpty;
+using velmora::Car;
+using velmora::CarOptions;
+using velmora::Error;
+using velmora::ErrorKind;
+using velmora::ProbeRequest;
+
+class CarBeyond : public testing::Test
+{
+protected:
+    CarOptions options(std::string const& vehicle = "petrol-can11") const
+    {
+        CarOptions options;
+        options.port = "sim:" + vehicle + "?instant";
+        options.settingsFile = m_folder.file("settings.toml");
+        options.units = velmora::Units::Metric;
+        return options;
+    }
+    // A car of raw replies.
+    CarOptions raw(std::string const& modules) const
+    {
+        std::ofstream(m_folder.file("car.toml")) << "name = \"a car of raw replies\"\nprotocol = 6\n" << modules;
+        return options(m_folder.file("car.toml"));
+    }
+
+    testsupport::TemporaryFolder m_folder;
+};
+
+std::string probeComplaint(ProbeRequest const& request)
+{
+    try {
+        velmora::probeTask(request);
+    } catch (Error const& error) {
+        EXPECT_EQ(error.kind(), ErrorKind::WrongUse);
+        return error.what();
+    }
+    return "";
+}
+
+TEST_F(CarBeyond, AProbeIsTakenAtItsWordOrRefused)
+{
+    velmora::ProbeTask const usual = velmora::probeTask({});
+    EXPECT_EQ(usual.header + " " + usual.reply, "7E0 7E8");
+    EXPECT_EQ(usual.extended, std::nullopt);
+    EXPECT_EQ(usual.service, 0x22);
+    EXPECT_EQ(usual.from, 0xF100U);
+    EXPECT_EQ(usual.to, 0xF1FFU);
+    velmora::ProbeTask const own =
+        velmora::probeTask({.module = "18da10f1", .extended = "07", .service = "1A", .from = "80", .to = "9F"});
+    EXPECT_EQ(own.header + " " + own.reply, "18DA10F1 18DAF110");
+    EXPECT_EQ(own.extended, 0x07);
+    EXPECT_EQ(own.service, 0x1A);
+    EXPECT_EQ(own.from, 0x80U);
+    EXPECT_EQ(own.to, 0x9FU);
+    EXPECT_EQ(velmora::probeTask({.module = "743", .reply = "763"}).reply, "763");
+    EXPECT_EQ(velmora::probedModule({.module = "7e1"}), "7E1");
+    EXPECT_EQ(probeComplaint({.module = "x"}), "\"x\" is no identifier of a module");
+    EXPECT_EQ(probeComplaint({.module = "743"}),
+              "The identifier of this module's replies has to be told, with --reply");
+    EXPECT_EQ(probeComplaint({.extended = "100"}), "\"100\" is no hexadecimal number for --ext");
+    EXPECT_EQ(probeComplaint({.extended = "FF"}), "");
+    EXPECT_EQ(probeComplaint({.service = "100"}), "\"100\" is no hexadecimal number for --service");
+    EXPECT_EQ(probeComplaint({.from = "10000"}), "\"10000\" is no hexadecimal number for --from");
+    EXPECT_EQ(probeComplaint({.to = "g"}), "\"g\" is no hexadecimal number for --to");
+    EXPECT_EQ(probeComplaint({.to = "FFFF"}), "");
+}
+
+TEST_F(CarBeyond, AProbeAsksFromItsFirstIdentifierAndGoesOnWhereItWasLeft)
+{
+    ProbeRequest request{.module = "7E1", .from = "1E31", .to = "1E32"};
+    velmora::ProbeTask const task = velmora::probeTask(request);
+    velmora::ProbeStore const store(velmora::ProbeStore::besides(m_folder.file("settings.toml"), task));
+    std::vector<std::string> resumed;
+    auto const noteResumed = [&resumed](std::string const& at) { resumed.push_back(at); };
+    std::vector<std::string> phases;
+    CarOptions chosen = options("petrol-can11-modules");
+    chosen.onPhase = [&phases](std::string const& phase) { phases.push_back(phase); };
+    Car car(chosen);
+    phases.clear();
+    velmora::ProbeReport const report = car.probe(request, noteResumed);
+    EXPECT_EQ(report.told(), 0U);
+    EXPECT_EQ(report.toText({}), "There, but locked:\n  1E31  Security Access Denied\n"
+                                 "There, but not under these conditions:\n  1E32  Conditions Not Correct\n");
+    EXPECT_THAT(resumed, IsEmpty());
+    ASSERT_FALSE(phases.empty());
+    EXPECT_EQ(phases.back(), "") << "the line is taken away";
+    EXPECT_TRUE(phases.front().starts_with("Asked up to 1E3")) << phases.front();
+    EXPECT_FALSE(store.load()) << "what is finished is not gone on with";
+
+    velmora::ProbeState left;
+    left.task = task;
+    left.vin = "VELMRAS1M60000022";
+    left.next = 0x1E32;
+    store.save(left);
+    EXPECT_EQ(car.probe(request, noteResumed).toText({}),
+              "There, but not under these conditions:\n  1E32  Conditions Not Correct\n");
+    EXPECT_THAT(resumed, ElementsAre("1E32"));
+    for (std::string const vin : {"", "VELMRAS1M60000099"}) {
+        left.vin = vin;
+        store.save(left);
+        try {
+            car.probe(request, noteResumed);
+            ADD_FAILURE() << "another vehicle's";
+        } catch (Error const& error) {
+            EXPECT_EQ(std::string(error.what()), "An interrupted probe of this module is of another vehicle (" +
+                                                     (vin.empty() ? "no VIN" : vin) +
+                                                     ", this one is VELMRAS1M60000022)");
+        }
+    }
+    request.fresh = true;
+    EXPECT_THAT(car.probe(request, noteResumed).toText({}), HasSubstr("1E31"));
+    EXPECT_EQ(resumed.size(), 1U);
+    left.vin = "VELMRAS1M60000022";
+    left.task.to = 0x1E33;
+    store.save(left);
+    request.fresh = false;
+    EXPECT_THAT(car.probe(request, noteResumed).toText({}), HasSubstr("1E31")) << "another range begins anew";
+}
+
+TEST_F(CarBeyond, OffersNameWhatTheLibraryDoesNotDecode)
+{
+    Car car(raw(R"([[module]]
+id = "7E8"
+[module.raw]
+"0100" = "41 00 00 10 00 01"
+"0120" = "41 20 00 00 00 01"
+"0140" = "41 40 00 00 00 01"
+"0160" = "41 60 00 00 00 01"
+"0180" = "41 80 00 00 00 01"
+"01A0" = "41 A0 04 00 00 01"
+"01C0" = "41 C0 40 00 00 00"
+"0600" = "46 00 80 00 00 00"
+"0900" = "49 00 40 00 00 00"
+)"));
+    auto const offers = car.offers();
+    ASSERT_EQ(offers.size(), 1U);
+    std::vector<std::string> services;
+    for (auto const& each : offers[0].services) {
+        services.push_back(std::to_string(each.number) + ":" + std::to_string(each.identifiers.size()) +
+                           (each.answer == velmora::TopicAnswer::Read ? " read" : " not"));
+    }
+    EXPECT_THAT(services, ElementsAre("1:6 read", "6:1 read", "8:0 not", "9:1 read"));
+    ASSERT_FALSE(offers[0].further.empty());
+    std::vector<unsigned int> further;
+    for (auto const& each : offers[0].further) {
+        further.push_back(each.pid);
+    }
+    EXPECT_THAT(further, testing::Contains(0xC2U));
+    EXPECT_THAT(further, testing::Not(testing::Contains(0xC0U))) << "only tells of the next range";
+    EXPECT_THAT(further, testing::Not(testing::Contains(0x0CU)));
+    EXPECT_EQ(offers[0].further.back().name, "PID C2");
+}
+
+TEST_F(CarBeyond, ReadingsAreOfTheModuleThatWasAsked)
+{
+    Car car(raw(R"([[module]]
+id = "7E8"
+[module.raw]
+"0100" = "41 00 08 18 00 00"
+"0105" = "41 05 5A"
+"010C" = "41 0C 0F A0"
+[[module]]
+id = "7E9"
+[module.raw]
+"0100" = "41 00 08 10 00 00"
+"0105" = "41 05 64"
+)"));
+    auto const readings = car.read({"7E9:COOLANT_TEMP", "7E8:COOLANT_TEMP", "7E9:RPM", "RPM"});
+    ASSERT_EQ(readings.size(), 4U);
+    EXPECT_EQ(velmora::number(readings[0]), 60.0);
+    EXPECT_EQ(velmora::number(readings[1]), 50.0);
+    EXPECT_EQ(readings[2].module, 0x7E9U);
+    EXPECT_EQ(velmora::number(readings[2]), std::nullopt) << "claimed, and never told";
+    EXPECT_EQ(readings[2].sensor, "RPM");
+    EXPECT_EQ(readings[2].name, "RPM");
+    EXPECT_EQ(velmora::number(readings[3]), 1000.0);
+    std::vector<std::string> keys;
+    for (velmora::Sensor const& each : car.sensors()) {
+        keys.push_back(each.key + " " + each.pid);
+    }
+    EXPECT_THAT(keys, testing::IsSupersetOf({"COOLANT_TEMP 0105", "RPM 010C", "SPEED 010D"}));
+    try {
+        car.read({"7EA:RPM"});
+        ADD_FAILURE();
+    } catch (Error const& error) {
+        EXPECT_STREQ(error.what(), "The vehicle has no control module 7EA");
+    }
+}
+
+TEST_F(CarBeyond, LiveValuesMayBeSignalsOfOnesOwn)
+{
+    std::ofstream(m_folder.file("own.toml")) << R"([[signal]]
+id = "GEARBOX_TEMP"
+name = "Gearbox oil"
+header = "7E1"
+request = "221E1C"
+formula = "(A*256+B)/16"
+unit = "°C"
+)";
+    CarOptions chosen = options("petrol-can11-modules");
+    chosen.signalFiles = {m_folder.file("own.toml")};
+    std::unique_ptr<velmora::LiveReader> reader;
+    Car car(chosen);
+    try {
+        reader = car.live({.sensors = {"GEARBOX_TEMP@20hz", "RPM"}, .rate = "5hz"});
+    } catch (Error const& error) {
+        FAIL() << error;
+    }
+    auto const parameters = reader->parameters();
+    ASSERT_EQ(parameters.size(), 2U);
+    velmora::LiveSensor const& own = parameters[1][0];
+    EXPECT_TRUE(own.isSignal);
+    EXPECT_EQ(own.key, "GEARBOX_TEMP");
+    EXPECT_EQ(own.name, "Gearbox oil");
+    EXPECT_EQ(own.request, "221E1C");
+    EXPECT_EQ(own.unit + own.metricUnit, "°C°C");
+    EXPECT_EQ(own.hertz, 20.0);
+    EXPECT_TRUE(own.numeric);
+    EXPECT_EQ(own.uid, own.id * 10) << "as values name it";
+    EXPECT_EQ(parameters[0][0].hertz, 5.0) << "the rate of those that have none of their own";
+    EXPECT_EQ(reader->words(), std::vector<std::string>{"7E8:0C@5"});
+    EXPECT_EQ(reader->signalTroubles(), "");
+    EXPECT_TRUE(reader->isConnected());
+    EXPECT_EQ(reader->units(), velmora::Units::Metric);
+    EXPECT_NO_THROW(reader->checkAdapter());
+    EXPECT_GT(reader->offers().size(), 5U);
+    EXPECT_EQ(reader->run().kilograms, 0) << "no run was begun";
+    reader->beginRuns();
+    EXPECT_GT(reader->run().kilograms, 0);
+    EXPECT_EQ(reader->parameters().size(), 2U) << "speed and engine speed";
+    reader->endRuns();
+    EXPECT_EQ(reader->run().kilograms, 0);
+    EXPECT_EQ(reader->parameters().size(), 2U);
+    EXPECT_TRUE(reader->parameters()[1][0].isSignal);
+    car.reconnect();
+    for (auto const& call : std::vector<std::function<void()>>{
+             [&] { reader->units(); }, [&] { reader->isConnected(); }, [&] { reader->setMetric(true); },
+             [&] { reader->words(); }, [&] { reader->offers(); }, [&] { reader->beginRuns(); },
+             [&] { reader->checkAdapter(); }, [&] { reader->signalTroubles(); }}) {
+        EXPECT_THROW(call(), Error) << "its connection is over";
+    }
+    EXPECT_EQ(reader->run().kilograms, 0);
+}
+
+TEST_F(CarBeyond, ALogThatCouldNotBeWrittenIsTold)
+{
+    std::vector<std::string> unwritten;
+    CarOptions chosen = options();
+    chosen.logFile = "/dev/full";
+    chosen.onUnwritten = [&unwritten](std::string const& file) { unwritten.push_back(file); };
+    {
+        Car const car(chosen);
+    }
+    EXPECT_THAT(unwritten, ElementsAre("/dev/full"));
+}
+
+TEST_F(CarBeyond, ANameThatNoModuleHasIsToldWithThoseThereAre)
+{
+    CarOptions chosen = options();
+    chosen.module = 0x7EB;
+    try {
+        Car const car(chosen);
+        ADD_FAILURE();
+    } catch (Error const& error) {
+        EXPECT_STREQ(error.what(), "The vehicle has no control module 7EB");
+        EXPECT_EQ(error.kind(), ErrorKind::NotSupported);
+        EXPECT_THAT(error.hints(), ElementsAre("these answer: 7E8, 7E9"));
+    }
+}
+
+} // namespace
