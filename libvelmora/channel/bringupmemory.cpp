@@ -15,6 +15,7 @@ void BringUpMemory::start()
 void BringUpMemory::stop()
 {
     m_on = false;
+    m_replies.clear();
 }
 
 void BringUpMemory::remember(ElmCommand const& command, HealedReply const& reply)

@@ -77,8 +77,8 @@ std::optional<BusLine> parseCanLine(BusKind bus, std::string_view digits, bool e
 // How a legacy frame divides.
 struct LegacyShape
 {
-    std::size_t header;
-    std::size_t data;
+    std::size_t header = legacyHeaderBytes;
+    std::size_t data = 0;
 };
 
 // The format byte of ISO 14230 holds the length in its low bits; for more than 63 bytes they are 0, and a byte of its
@@ -143,9 +143,10 @@ BusKind busKindOf(obd::ObdProtocol protocol)
         return BusKind::Can11;
     case obd::ObdProtocolCan29:
         return BusKind::Can29;
-    default:
-        return BusKind::Unknown;
+    case obd::ObdProtocolUnknown:
+        break;
     }
+    return BusKind::Unknown;
 }
 
 BusKind busKindOf(int protocol)

@@ -12,13 +12,13 @@ namespace velmora {
 // One message of a module in a reply, and the lines that bring it.
 struct ModuleMessage
 {
-    unsigned int module;
-    std::size_t length;  // bytes that it is to have
-    std::size_t carried; // bytes of a consecutive frame
+    unsigned int module = 0;
+    std::size_t length = 0;  // bytes that it is to have
+    std::size_t carried = 7; // bytes of a consecutive frame
     std::vector<std::uint8_t> payload;
     std::vector<std::string> lines;  // as they are handed on
     std::vector<std::size_t> places; // of the lines in the reply
-    std::size_t headerDigits;        // in front of each line
+    std::size_t headerDigits = 3;    // in front of each line
     bool broken = false;             // two frames claim the same place: nothing of it can be trusted
     bool inOrder = true;
 

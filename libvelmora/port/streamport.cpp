@@ -190,7 +190,9 @@ std::size_t StreamPort::put(std::string_view bytes)
 void StreamPort::putRest()
 {
     std::lock_guard const lock(m_mutex);
-    m_outgoing.erase(0, put(m_outgoing));
+    if (!m_closed && !m_outgoing.empty()) {
+        m_outgoing.erase(0, put(m_outgoing));
+    }
 }
 
 void StreamPort::shut()

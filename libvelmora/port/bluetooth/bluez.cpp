@@ -22,7 +22,7 @@ std::vector<std::string> readTexts(sd_bus_message* message)
     char** list = nullptr;
     checked(sd_bus_message_read_strv(message, &list));
     std::vector<std::string> texts;
-    for (char** each = list; each != nullptr && *each != nullptr; ++each) { // no list at all is an empty one
+    for (char** each = list; each != nullptr && *each != nullptr; ++each) {
         texts.emplace_back(*each);
         std::free(*each);
     }

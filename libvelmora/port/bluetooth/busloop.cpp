@@ -1,5 +1,6 @@
 #include "libvelmora/port/bluetooth/busloop.h"
 
+#include <algorithm>
 #include <chrono>
 #include <limits>
 #include <poll.h>
@@ -76,8 +77,14 @@ void BusLoop::waitForTimeout()
     if (sd_bus_get_timeout(m_bus, &due) < 0 || due == std::numeric_limits<std::uint64_t>::max()) {
         return;
     }
+    auto const longest = std::chrono::duration_cast<std::chrono::microseconds>(std::chrono::hours(24));
+    auto const sinceBoot = std::min<std::uint64_t>(
+        due, static_cast<std::uint64_t>((std::chrono::duration_cast<std::chrono::microseconds>(
+                                             std::chrono::steady_clock::now().time_since_epoch()) +
+                                         longest)
+                                            .count()));
     m_timer.expires_at(
-        std::chrono::steady_clock::time_point(std::chrono::microseconds(static_cast<std::int64_t>(due))));
+        std::chrono::steady_clock::time_point(std::chrono::microseconds(static_cast<std::int64_t>(sinceBoot))));
     m_timer.async_wait([this](asio::error_code const& error) {
         if (!error) {
             pump();

@@ -1,10 +1,8 @@
 #include "libvelmora/port/bluetooth/rfcomm.h"
 
-#include <algorithm>
 #include <cerrno>
 #include <charconv>
 #include <chrono>
-#include <cstring>
 #include <poll.h>
 #include <sys/socket.h>
 #include <unistd.h>
@@ -36,11 +34,9 @@ int awaitConnected(int socket, OpeningStop const& stop)
 
 } // namespace
 
-int connectSocket(int socket, void const* address, std::size_t size, OpeningStop const& stop)
+int connectSocket(int socket, sockaddr_storage const& address, socklen_t size, OpeningStop const& stop)
 {
-    sockaddr_storage storage{};
-    std::memcpy(&storage, address, std::min(size, sizeof(storage)));
-    if (::connect(socket, reinterpret_cast<sockaddr const*>(&storage), static_cast<socklen_t>(size)) == 0) {
+    if (::connect(socket, reinterpret_cast<sockaddr const*>(&address), size) == 0) {
         return 0;
     }
     return errno == EINPROGRESS || errno == EAGAIN ? awaitConnected(socket, stop) : errno;
@@ -63,7 +59,10 @@ RfcommCall KernelRfcomm::dial(std::string const& mac, unsigned int channel, Open
         return {-1, errno};
     }
     RfcommSocketAddress const address = makeRfcommAddress(mac, channel);
-    int const error = connectSocket(socket, &address, sizeof(address), stop);
+    sockaddr_storage storage{};
+    static_assert(sizeof(address) <= sizeof(storage));
+    __builtin_memcpy(&storage, &address, sizeof(address));
+    int const error = connectSocket(socket, storage, sizeof(address), stop);
     if (error != 0) {
         ::close(socket);
         return {-1, error};

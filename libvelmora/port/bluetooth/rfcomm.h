@@ -3,9 +3,9 @@
 #include "libvelmora/port/openingstop.h"
 
 #include <array>
-#include <cstddef>
 #include <cstdint>
 #include <string>
+#include <sys/socket.h>
 
 namespace velmora {
 
@@ -50,6 +50,6 @@ constexpr int rfcommProtocol = 3;
 RfcommSocketAddress makeRfcommAddress(std::string const& mac, unsigned int channel);
 
 // Connects a socket that doesn't block. Returns 0 or an errno; ECANCELED when stop said so.
-int connectSocket(int socket, void const* address, std::size_t size, OpeningStop const& stop);
+int connectSocket(int socket, sockaddr_storage const& address, socklen_t size, OpeningStop const& stop);
 
 } // namespace velmora
