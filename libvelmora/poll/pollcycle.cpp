@@ -18,7 +18,7 @@ PollCycle::PollCycle(std::shared_ptr<obd::IObdProxy> const& proxy, std::vector<P
 {
     for (PollSource const& source : sources) {
         if (source.guest != nullptr) {
-            m_guests.push_back({source.guest, source.hertz, source.guest->wishes(), {}});
+            m_guests.push_back({source.guest, source.hertz, source.guest->wishes(), 0});
             continue;
         }
         auto parameter = std::make_unique<PolledParameter>(m_wire, source.ecu, source.parameter, units);

@@ -32,7 +32,7 @@ CodeList toCodeList(CodeKind kind, Codes const& outcome)
     case TopicAnswer::Unreadable:
         return {kind, CodeList::Answer::Unreadable, {}, {}};
     case TopicAnswer::Silent:
-        break;
+        return {kind, CodeList::Answer::Silent, {}, {}};
     }
     return {kind, CodeList::Answer::Silent, {}, {}};
 }

@@ -4,6 +4,7 @@
 #include <obd/idiagnosticsservice.h>
 
 #include <charconv>
+#include <memory>
 
 namespace velmora {
 
@@ -12,7 +13,7 @@ namespace {
 unsigned int toNumber(std::string const& digits)
 {
     unsigned int number = 0;
-    std::from_chars(digits.data(), digits.data() + digits.size(), number);
+    std::from_chars(std::to_address(digits.begin()), std::to_address(digits.end()), number);
     return number;
 }
 

@@ -16,7 +16,7 @@ LimitTest::Verdict toVerdict(obd::DiagnosticTestDataModel::Status status)
     case obd::DiagnosticTestDataModel::Status::Passed:
         return LimitTest::Verdict::Passed;
     case obd::DiagnosticTestDataModel::Status::NoResult:
-        break;
+        return LimitTest::Verdict::NoResult;
     }
     return LimitTest::Verdict::NoResult;
 }

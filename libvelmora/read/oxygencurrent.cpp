@@ -3,6 +3,7 @@
 #include <fmt/format.h>
 
 #include <charconv>
+#include <memory>
 
 namespace velmora {
 
@@ -35,8 +36,9 @@ std::string shownText(int uid, std::string const& text)
         return text;
     }
     double number = 0.0;
-    auto const [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
-    if (error != std::errc() || end != text.data() + text.size()) {
+    char const* const last = std::to_address(text.end());
+    auto const [end, error] = std::from_chars(std::to_address(text.begin()), last, number);
+    if (error != std::errc() || end != last) {
         return text;
     }
     std::size_t const point = text.find('.');

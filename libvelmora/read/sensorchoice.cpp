@@ -10,6 +10,7 @@
 
 #include <algorithm>
 #include <charconv>
+#include <memory>
 #include <optional>
 #include <string_view>
 
@@ -46,8 +47,9 @@ std::optional<int> parsePid(std::string const& text)
         digits.remove_prefix(2);
     }
     int pid = 0;
-    auto const [end, error] = std::from_chars(digits.data(), digits.data() + digits.size(), pid, 16);
-    bool const whole = error == std::errc() && end == digits.data() + digits.size() && digits.front() != '-';
+    char const* const last = std::to_address(digits.end());
+    auto const [end, error] = std::from_chars(std::to_address(digits.begin()), last, pid, 16);
+    bool const whole = error == std::errc() && end == last && digits.front() != '-';
     bool const length = digits.size() == 2 || (prefixed && digits.size() == 1);
     return whole && length ? std::optional(pid) : std::nullopt;
 }

@@ -11,6 +11,7 @@
 #include <algorithm>
 #include <charconv>
 #include <cmath>
+#include <memory>
 #include <string_view>
 
 namespace velmora {
@@ -26,8 +27,9 @@ std::optional<double> endOf(std::string_view text)
         return std::nullopt;
     }
     double number = 0.0;
-    auto const [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
-    if (error != std::errc() || end != text.data() + text.size() || !std::isfinite(number)) {
+    char const* const last = std::to_address(text.end());
+    auto const [end, error] = std::from_chars(std::to_address(text.begin()), last, number);
+    if (error != std::errc() || end != last || !std::isfinite(number)) {
         throw Error(ErrorKind::WrongUse, fmt::format("\"{}\" is no limit", text),
                     {"give the highest value, such as 6000, or a range: 11.8..14.8, 11.8.. or ..14.8"});
     }

@@ -20,7 +20,7 @@ TopicAnswer toAnswer(obd::Verdict const& verdict)
         return TopicAnswer::NotOffered;
     case obd::OutcomeKind::ModuleSilent:
     case obd::OutcomeKind::NotConnected:
-        break;
+        return TopicAnswer::Silent;
     }
     return TopicAnswer::Silent;
 }

@@ -194,6 +194,7 @@ Result evaluateNode(FormulaNode const& node, FormulaInput const& input)
         return leaf(node, input);
     }
     std::vector<double> values;
+    values.reserve(node.operands.size());
     for (FormulaNode const& operand : node.operands) {
         Result const value = evaluateNode(operand, input);
         if (!value) {

@@ -34,7 +34,7 @@ std::string ModuleIdentity::text(RequestAddress const& address, unsigned int did
                                              static_cast<unsigned char>(did & 0xFFU)};
     ModuleAnswer const answer = ask(address, request);
     m_serviceMissing = answer.kind == ModuleAnswer::Kind::Refused && isServiceMissing(answer.code);
-    if (answer.kind != ModuleAnswer::Kind::Positive) {
+    if (answer.kind != ModuleAnswer::Kind::Positive || answer.payload.size() <= request.size()) {
         return {};
     }
     return identifierText(did, {answer.payload.begin() + 3, answer.payload.end()});

@@ -19,7 +19,7 @@ constexpr int deepestReference = 16;
 
 std::string fixedText(double number, int precision)
 {
-    std::string const text = fmt::format("{:.{}f}", number, precision);
+    std::string const text = fmt::format("{:.{}f}", number, std::clamp(precision, 0, 9));
     bool const zero = text.find_first_not_of("-0.") == std::string::npos;
     return zero && text.starts_with('-') ? text.substr(1) : text;
 }

@@ -34,6 +34,18 @@ TEST(CatalogueSelection, WordMatchesByItsBeginningOnly)
     EXPECT_TRUE(selectWords(rows(), {"catalyst", "monitor"}).empty());
 }
 
+TEST(CatalogueSelection, WordsAreLettersAndDigits)
+{
+    CatalogueRows const odd = {
+        std::make_shared<obd::DtcDataModel>("P0001", "AZ@az[x1`y2{09/z3:w4", "Powertrain", "Generic")};
+    for (char const* const word : {"AZ", "az", "x1", "y2", "09", "z3", "W4", "p0001", "09/z3", "AZ@AZ"}) {
+        EXPECT_EQ(selectWords(odd, {word}).size(), 1U) << word;
+    }
+    for (char const* const word : {"z", "1", "azx", "9"}) {
+        EXPECT_EQ(selectWords(odd, {word}).size(), word[0] == 'z' ? 1U : 0U) << word;
+    }
+}
+
 TEST(CatalogueSelection, NoWordsSelectAll)
 {
     EXPECT_EQ(selectWords(rows(), {}).size(), 3U);

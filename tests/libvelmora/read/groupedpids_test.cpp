@@ -68,6 +68,26 @@ TEST(GroupedPids, WhatDoesNotDivideExactlyIsDroppedAndNothingIsGroupedAgain)
     }
 }
 
+TEST(GroupedPids, LeaveOutWhatHasNoKnownLengthAndEndWhereNobodyAnswers)
+{
+    GroupedRig rig;
+    rig.proxy->answer("01 05 0C", "41 05 40 0C 1A F8");
+    rig.fetch({0x05, 0xC2, 0x0C, 0xC2});
+    EXPECT_EQ(rig.read(0x05), "410540");
+    EXPECT_EQ(rig.proxy->count(), 1);
+    obd::ResponseMap responses;
+    EXPECT_EQ(rig.pids.execute({0x02, 0x05}, responses, 1000), Status::NoResponse) << "of a freeze frame";
+    EXPECT_EQ(rig.pids.execute({0x01, 0x05, 0x0C, 0x0D}, responses, 1000), Status::NoResponse);
+    EXPECT_EQ(rig.proxy->count(), 3) << "neither is what was fetched";
+    obd::AdapterNote note = obd::AdapterNote::ReplyLost;
+    EXPECT_EQ(rig.pids.executeNoted({0x01, 0x05}, responses, 1000, note), Status::Ok);
+    EXPECT_EQ(note, obd::AdapterNote::None);
+    GroupedRig silent;
+    silent.fetch({0x05, 0x0C});
+    silent.fetch({0x05, 0x0C});
+    EXPECT_EQ(silent.proxy->count(), 1) << "who does not answer two at once is not asked so again";
+}
+
 TEST(GroupedPids, AreForCanAndForMoreThanOne)
 {
     GroupedRig alone;

@@ -149,6 +149,27 @@ TEST(SensorChoice, AnUnknownWordIsWrongUseWithWhatIsNear)
     }
 }
 
+TEST(SensorChoice, SuggestsWhatIsNearAndWhereToLook)
+{
+    std::string const list = "`velmora sensors` lists what the vehicle offers";
+    std::string const ways = "a sensor is named by its PID (0C), its name (RPM) or words of its title (coolant)";
+    EXPECT_THAT(failure("rmp").hints(), ElementsAre("did you mean MAP (0B)?", "did you mean RPM (0C)?", list, ways));
+    EXPECT_THAT(failure("coolantt_tem").hints(), ElementsAre("did you mean COOLANT_TEMP (05)?", list, ways))
+        << "two letters away";
+    EXPECT_THAT(failure("coolanttt_tem").hints(), ElementsAre(list, ways)) << "three";
+    EXPECT_THAT(failure("rm").hints(), ElementsAre("did you mean RPM (0C)?", list, ways)) << "one of two letters";
+    EXPECT_THAT(failure("rq").hints(), ElementsAre(list, ways));
+    for (char const* const word : {"5", "C", "0x0105C"}) {
+        EXPECT_EQ(failure(word).kind(), ErrorKind::WrongUse) << word;
+    }
+    std::string const other = "another control module may offer it: --ecu ID";
+    EXPECT_THAT(failure("01").hints(), ElementsAre("`velmora readiness` shows lamp and monitors", other));
+    EXPECT_THAT(failure("41").hints(), ElementsAre("`velmora readiness` shows lamp and monitors", other));
+    EXPECT_THAT(failure("02").hints(),
+                ElementsAre("`velmora freeze` shows the code that froze values, and the values", other));
+    EXPECT_THAT(failure("5C").hints(), ElementsAre(list, other));
+}
+
 TEST(SensorChoice, AModuleWithoutSensorsIsNotSupported)
 {
     EXPECT_THROW(chooseSensors({}, {}), Error);

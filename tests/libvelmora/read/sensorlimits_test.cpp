@@ -36,6 +36,36 @@ TEST(SensorLimits, TheirSensorHasManyNames)
     EXPECT_THROW(limitKey(""), Error);
 }
 
+TEST(SensorLimits, SayWhatTheyLack)
+{
+    auto const problem = [](std::string const& text) {
+        try {
+            parseLimit(text);
+        } catch (Error const& error) {
+            return std::string(error.what());
+        }
+        return std::string("none");
+    };
+    EXPECT_EQ(problem(".."), "\"..\" is no limit: it has no end");
+    EXPECT_EQ(problem("5..4"), "\"5..4\" is no limit: no value can meet it");
+    EXPECT_EQ(problem("5..5"), "none") << "one value meets it";
+    EXPECT_EQ(problem("x..4"), "\"x\" is no limit");
+    EXPECT_EQ(limitText({}), "");
+    EXPECT_EQ(limitText({5.0, {}}), "5..");
+    EXPECT_EQ(limitText({{}, 5.5}), "..5.5");
+    EXPECT_EQ(limitKey("XY"), "XY") << "two letters that are no number";
+    EXPECT_EQ(limitKey("01F"), "01F") << "three digits are no PID";
+    EXPECT_EQ(limitKey("FF"), "PID_FF");
+    EXPECT_EQ(limitKey("010D"), "SPEED");
+    EXPECT_EQ(limitKey("020D"), "020D") << "of another service";
+    EXPECT_EQ(limitKey("AZaz_09-."), "AZaz_09-.");
+    EXPECT_EQ(limitKey(std::string(64, 'x')), std::string(64, 'x'));
+    for (std::string const& id : {std::string(65, 'x'), std::string("a@"), std::string("a["), std::string("a`"),
+                                  std::string("a{"), std::string("a/"), std::string("a:")}) {
+        EXPECT_THROW(limitKey(id), Error) << id;
+    }
+}
+
 TEST(SensorLimits, AreKeptInTheSettings)
 {
     std::filesystem::path const file = testsupport::ownPath("limits.toml");

@@ -1,0 +1,237 @@
+// What the readers of single topics tell of a simulated car, and how soon they end when they are told to.
+#include "libvelmora/read/codeclearing.h"
+#include "libvelmora/read/codereader.h"
+#include "libvelmora/read/diagnosticreaders.h"
+#include "libvelmora/read/freezereader.h"
+#include "libvelmora/read/groupedpids.h"
+#include "libvelmora/read/modulereader.h"
+#include "libvelmora/read/routinereader.h"
+#include "libvelmora/read/valuesreader.h"
+#include "libvelmora/read/vehiclereader.h"
+#include "tests/libvelmora/read/readersfixture.h"
+
+#include <velmora/error.h>
+
+#include <algorithm>
+
+namespace velmora {
+
+namespace {
+
+using test::ReadersTest;
+using Read = std::function<void(Session& session, obd::IEcu const& ecu)>;
+
+class InterruptedReaders : public ReadersTest
+{
+protected:
+    // How many requests a reader makes if it is told to end during one of these.
+    std::string requestsUntilTheEnd(std::string const& vehicle, std::vector<std::size_t> const& during,
+                                    Read const& read)
+    {
+        std::string text;
+        for (std::size_t const at : during) {
+            connect(vehicle);
+            m_stopAt = at;
+            try {
+                read(*m_session, module());
+                ADD_FAILURE() << vehicle << ": it went on to its end";
+            } catch (Error const& error) {
+                EXPECT_EQ(error.kind(), ErrorKind::Interrupted);
+            }
+            text += (text.empty() ? "" : " ") + std::to_string(m_asked.size());
+        }
+        return text;
+    }
+};
+
+// What is on its way comes to its end: a question of the library may take several requests.
+TEST_F(InterruptedReaders, AskForNothingMoreThanWhatTheyAreAt)
+{
+    EXPECT_EQ(requestsUntilTheEnd("petrol-can11", {1, 4, 5, 6}, [](auto& s, auto& e) { readFreeze(s, e, 0); }),
+              "3 4 5 6");
+    EXPECT_EQ(requestsUntilTheEnd("bench-can11", {1, 2, 3}, [](auto& s, auto& e) { readReadiness(s, e); }), "1 2 4");
+    EXPECT_EQ(requestsUntilTheEnd("bench-can11", {1, 2, 3, 4, 5}, [](auto& s, auto& e) { readInfo(s, e); }),
+              "1 2 3 4 5");
+    EXPECT_EQ(
+        requestsUntilTheEnd("bench-can11", {1, 2, 4},
+                            [](auto& s, auto& e) {
+                                CodeReader(s).read(e, {CodeKind::Confirmed, CodeKind::Pending, CodeKind::Permanent});
+                            }),
+        "1 2 4");
+    EXPECT_EQ(requestsUntilTheEnd("petrol-iso9141", {1, 2, 6}, [](auto& s, auto& e) { readOxygen(s, e); }), "1 5 7");
+    EXPECT_EQ(requestsUntilTheEnd("bench-can11", {1, 3},
+                                  [](auto& s, auto& e) {
+                                      auto const bus = std::make_shared<GroupedPids>(s.proxy(), e.id());
+                                      std::vector<LiveValue> values = readValues(s, e, bus);
+                                      readValuesAgain(s, e, bus, values);
+                                  }),
+              "2 3");
+    EXPECT_EQ(requestsUntilTheEnd("petrol-can11", {1}, [](auto& s, auto& e) { readCounters(s, e); }), "1");
+    EXPECT_EQ(requestsUntilTheEnd("petrol-can11", {1}, [](auto& s, auto&) { clearCodes(s); }), "1");
+    EXPECT_EQ(requestsUntilTheEnd("petrol-can11", {1}, [](auto& s, auto& e) { runRoutine(s, e, {1, "", ""}); }), "1");
+}
+
+class ReadersOfTopics : public ReadersTest
+{
+protected:
+    static std::string problem(std::function<void()> const& act)
+    {
+        try {
+            act();
+        } catch (Error const& error) {
+            return error.what();
+        }
+        return "none";
+    }
+};
+
+TEST_F(ReadersOfTopics, TellAVehicleWithTheMeaningsOfAMaker)
+{
+    connect("petrol-can11");
+    VehicleReport const report = readVehicle(*m_session, "Ford");
+    ASSERT_EQ(report.modules.size(), 2U);
+    ModuleReport const& engine = report.modules[0];
+    EXPECT_EQ(engine.codes.maker.by, MakerChoice::By::Option);
+    ASSERT_TRUE(engine.freeze.frame);
+    EXPECT_EQ(engine.freeze.frame->code.code, "P0133");
+    EXPECT_EQ(engine.freeze.frame->readings.size(), 16U);
+    EXPECT_EQ(report.protocol.number, 6);
+    EXPECT_NEAR(report.adapter.volts.value_or(0), 12.4F, 2.5F);
+    std::size_t samples = 0;
+    for (LiveValue const& each : engine.values) {
+        bool const moving =
+            each.pid == 0x05 || each.pid == 0x06 || each.pid == 0x07 || each.pid == 0x0C || each.pid == 0x42;
+        EXPECT_EQ(each.samples.size(), each.samples.empty() ? 0U : moving ? 2U : 1U) << each.name;
+        samples += each.samples.size();
+    }
+    EXPECT_GT(samples, 15U);
+    auto const sensors = report.modules[1].supported;
+    EXPECT_EQ(sensors, (std::vector<unsigned int>{0x05, 0x0C, 0x0D, 0x1C, 0x41, 0x42, 0xF4, 0xF5, 0xF6}));
+    m_car->control("voltage 0");
+    EXPECT_EQ(readAdapter(*m_session).volts, std::nullopt) << "no adapter runs on no voltage";
+}
+
+TEST_F(ReadersOfTopics, TellTestsWithTheirVerdicts)
+{
+    connect("petrol-can11");
+    MonitorsReport const monitors = readMonitors(*m_session, module());
+    std::string verdicts;
+    for (OnBoardMonitor const& monitor : monitors.monitors) {
+        for (LimitTest const& test : monitor.tests) {
+            verdicts += test.verdict == LimitTest::Verdict::Passed   ? 'p'
+                        : test.verdict == LimitTest::Verdict::Failed ? 'f'
+                                                                     : '-';
+        }
+    }
+    EXPECT_EQ(verdicts, "pfpp-ppp");
+    CountersReport const counters = readCounters(*m_session, module());
+    std::string numbers;
+    for (auto const& each : counters.counters) {
+        numbers += std::to_string(each.value) + " ";
+    }
+    EXPECT_EQ(numbers.substr(0, 16), "412 655 388 412 ");
+    connect("petrol-iso9141");
+    OxygenReport const oxygen = readOxygen(*m_session, module());
+    EXPECT_EQ(oxygen.answer, TopicAnswer::Read);
+    EXPECT_FALSE(oxygen.onCan);
+    std::string sensors;
+    for (OxygenSensor const& sensor : oxygen.sensors) {
+        for (LimitTest const& test : sensor.tests) {
+            sensors += test.verdict == LimitTest::Verdict::Passed   ? 'p'
+                       : test.verdict == LimitTest::Verdict::Failed ? 'f'
+                       : test.verdict == LimitTest::Verdict::None   ? 'c'
+                                                                    : '-';
+        }
+        sensors += ' ';
+    }
+    EXPECT_EQ(sensors, "ccpp cp ") << "constants, and what passed";
+    EXPECT_EQ(oxygen.complete.has_value(), true);
+}
+
+TEST_F(ReadersOfTopics, TellSerialAndTravel)
+{
+    connect("diesel-can29");
+    InfoReport const info = readInfo(*m_session, module());
+    EXPECT_EQ(info.engineSerialNumber, "VELMD200000000042");
+    EXPECT_FALSE(info.description.empty());
+    EXPECT_FALSE(info.standard.empty());
+    EXPECT_FALSE(info.protocol.empty());
+    EXPECT_EQ(readVin(*m_session, module()), info.vin);
+    connect("petrol-can11");
+    std::vector<LiveValue> const values = {{0x21, 0, "a", "17", "km", {}}, {0x4D, 0, "b", "18", "min", {}}};
+    InfoReport const beside = readInfoBeside(*m_session, module(), values);
+    EXPECT_EQ(beside.withLamp.distance->value, "17") << "what is known is not asked for";
+    EXPECT_EQ(beside.withLamp.runTime->value, "18");
+    EXPECT_EQ(beside.withLamp.runTime->unit, "min");
+    EXPECT_TRUE(beside.sinceCleared.distance);
+    EXPECT_TRUE(beside.sinceCleared.runTime);
+    EXPECT_EQ(std::count(m_asked.begin(), m_asked.end(), "0121"), 0);
+}
+
+TEST_F(ReadersOfTopics, TellWhichRoutinesCanBeRun)
+{
+    connect("petrol-can11");
+    RoutinesReport const offered = readRoutines(*m_session, module());
+    EXPECT_EQ(offered.answer, TopicAnswer::Read);
+    ASSERT_EQ(offered.routines.size(), 2U);
+    EXPECT_EQ(offered.routines[1].id, 2);
+    EXPECT_EQ(readRoutines(*m_session, module(1)).answer, TopicAnswer::Silent);
+    EXPECT_EQ(findRoutine(*m_session, 1).ecu->id(), 0x7E8U);
+    EXPECT_EQ(problem([this] { findRoutine(*m_session, 3); }), "No control module offers a known routine 03");
+    Routine const routine{1, "Leak", ""};
+    EXPECT_EQ(runRoutine(*m_session, module(), routine).result, RoutineRun::Result::Accepted);
+    RoutineRun const refused = runRoutine(*m_session, module(), {2, "", ""});
+    EXPECT_EQ(refused.result, RoutineRun::Result::Refused);
+    EXPECT_EQ(problem([&] { requireAccepted(refused); }),
+              "The vehicle refused to run routine 02: conditions not correct (22)");
+    EXPECT_EQ(problem([&] {
+                  requireAccepted({routine, RoutineRun::Result::Refused, ""});
+              }),
+              "The vehicle refused to run routine 01");
+    EXPECT_EQ(problem([&] {
+                  requireAccepted({routine, RoutineRun::Result::Unreadable, ""});
+              }),
+              "What the vehicle said to routine 01 can't be read");
+    EXPECT_EQ(problem([&] {
+                  requireAccepted({routine, RoutineRun::Result::NoAnswer, ""});
+              }),
+              "The vehicle did not say whether it runs routine 01");
+    EXPECT_EQ(problem([&] { requireAccepted({routine, RoutineRun::Result::Accepted, ""}); }), "none");
+    std::string const file = m_folder.file("unknown.toml");
+    std::filesystem::copy_file(VELMORA_SOURCE_DIR "/simulator/vehicles/bench-can11.toml", file);
+    std::ofstream(file, std::ios::app) << "\n[[module.routines]]\nid = \"1F\"\n";
+    connect(file);
+    EXPECT_EQ(readRoutines(*m_session, module()).answer, TopicAnswer::NotOffered) << "nobody knows what 1F does";
+}
+
+TEST_F(ReadersOfTopics, ForgetFreezeFramesThatWereErased)
+{
+    connect("petrol-can11");
+    EXPECT_TRUE(readFreeze(*m_session, module(), 0).frame);
+    auto const cleared = clearCodes(*m_session);
+    ASSERT_EQ(cleared.size(), 2U);
+    EXPECT_EQ(cleared[0].name, "ECM");
+    FreezeReport const erased = readFreeze(*m_session, module(), 0);
+    EXPECT_FALSE(erased.frame);
+    EXPECT_EQ(erased.answer, TopicAnswer::Read) << "there is none, and the module says so";
+    m_car->control("ignition off");
+    auto const silent = clearCodes(*m_session);
+    ASSERT_EQ(silent.size(), 2U) << "modules that are known and say nothing are told of, too";
+    for (auto const& each : silent) {
+        EXPECT_EQ(each.report.result, ClearReport::Result::NoAnswer);
+    }
+    EXPECT_EQ(problem([&] { requireCleared(silent); }), "No control module confirmed that it cleared its codes");
+    auto mixed = silent;
+    mixed[1].report = {ClearReport::Result::Refused, "conditions not correct (22)"};
+    std::string const refusal = "Control module 7E9 refused to clear its codes: conditions not correct (22)";
+    EXPECT_EQ(problem([&] { requireCleared(mixed); }), refusal);
+    mixed[0].report.result = ClearReport::Result::Cleared;
+    EXPECT_EQ(problem([&] { requireCleared(mixed); }), "none");
+    EXPECT_EQ(problem([&] { requireAllCleared(mixed); }), refusal);
+    mixed[1].report.result = ClearReport::Result::NoAnswer;
+    EXPECT_EQ(problem([&] { requireAllCleared(mixed); }), "none") << "silence is no refusal where another cleared";
+}
+
+} // namespace
+
+} // namespace velmora
