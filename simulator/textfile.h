@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <cstdio>
 #include <optional>
 #include <string>
 
@@ -16,5 +17,13 @@ std::optional<std::string> readTextFile(std::string const& path, std::uintmax_t 
 
 /// Why readTextFile gives nothing, such as "it is no plain file".
 std::string whyNoText(std::string const& path, std::uintmax_t largest = largestDescription);
+
+/// Opens a file for writing, without what stood in it; but what standard output or standard error are redirected to is
+/// written on behind what stands there. A pipe that nobody reads is refused rather than waited for. Null, with errno
+/// set, if it can't be opened.
+std::FILE* openForWriting(std::string const& path);
+
+/// Whether openForWriting will do, without changing what stands there; a file that is missing is made. Sets errno.
+bool canWrite(std::string const& path);
 
 } // namespace obdsim

@@ -3,7 +3,6 @@
 #include "libvelmora/record/checkedfile.h"
 
 #include <fmt/chrono.h>
-#include <fmt/ostream.h>
 
 #include <chrono>
 #include <ctime>
@@ -34,10 +33,11 @@ std::string escaped(std::vector<unsigned char> const& data)
 
 } // namespace
 
-TrafficTrace::TrafficTrace(std::filesystem::path const& file)
+TrafficTrace::TrafficTrace(std::filesystem::path const& file) : m_out(nullptr, &std::fclose)
 {
     requireWritable(file, "trace file");
-    m_out.open(file);
+    m_out.reset(openForWriting(file));
+    m_failed = m_out == nullptr;
 }
 
 void TrafficTrace::onDataSent(std::vector<unsigned char> const& data)
@@ -55,10 +55,16 @@ void TrafficTrace::write(std::string_view arrow, std::vector<unsigned char> cons
     auto const now = std::chrono::system_clock::now();
     auto const ms = std::chrono::duration_cast<std::chrono::milliseconds>(now.time_since_epoch()).count() % 1000;
     std::lock_guard const lock(m_mutex);
-    m_out << fmt::format("{:%H:%M:%S}.{:03d} {} {}\n", fmt::localtime(std::chrono::system_clock::to_time_t(now)), ms,
-                         arrow, escaped(data));
-    m_out.flush();
-    m_failed = m_failed || !m_out;
+    if (m_out == nullptr) {
+        return;
+    }
+    std::string const line =
+        fmt::format("{:%H:%M:%S}.{:03d} {} {}\n", fmt::localtime(std::chrono::system_clock::to_time_t(now)), ms, arrow,
+                    escaped(data));
+    bool const written = std::fputs(line.c_str(), m_out.get()) >= 0;
+    if (std::fflush(m_out.get()) != 0 || !written) {
+        m_failed = true;
+    }
 }
 
 } // namespace velmora

@@ -3,8 +3,9 @@
 #include <obd/idataconnection.h>
 
 #include <atomic>
+#include <cstdio>
 #include <filesystem>
-#include <fstream>
+#include <memory>
 #include <mutex>
 #include <string_view>
 
@@ -28,7 +29,7 @@ private:
 
     std::atomic<bool> m_failed{false};
     std::mutex m_mutex;
-    std::ofstream m_out; // protected by m_mutex
+    std::unique_ptr<std::FILE, int (*)(std::FILE*)> m_out; // protected by m_mutex
 };
 
 } // namespace velmora

@@ -4,9 +4,12 @@
 #include "simulator/serve/tracepeer.h"
 #include "simulator/serverloop.h"
 #include "simulator/simulatedcar.h"
+#include "simulator/textfile.h"
 
+#include <cerrno>
 #include <charconv>
-#include <fstream>
+#include <cstdio>
+#include <cstring>
 
 namespace obdsim {
 
@@ -57,6 +60,9 @@ public:
     explicit Impl(SessionOptions const& options) : m_written(options.written)
     {
         m_server = listenAt(options.listen, peers(options));
+        if (!m_written.empty() && !canWrite(m_written)) {
+            refuseScenario(); // now rather than at the end
+        }
         auto const handler = [this](std::string const& line) { return follow(line); };
         asio::io_context& context = static_cast<ServerLoop&>(*m_server).context();
         if (options.control) {
@@ -77,17 +83,24 @@ public:
         if (m_written.empty() || m_cars.empty()) {
             return;
         }
-        std::ofstream file(m_written, std::ios::binary);
-        file << formatScenario(m_cars.front()->typed());
-        file.close();
-        if (!file) {
-            throw SimulatorError(m_written + ": the scenario cannot be written");
+        std::FILE* const file = openForWriting(m_written);
+        if (file == nullptr) {
+            refuseScenario();
+        }
+        bool const written = std::fputs(formatScenario(m_cars.front()->typed()).c_str(), file) >= 0;
+        if (std::fclose(file) != 0 || !written) {
+            refuseScenario();
         }
     }
 
     bool traceFailed() const { return m_trace != nullptr && m_trace->failed(); }
 
 private:
+    [[noreturn]] void refuseScenario() const
+    {
+        throw SimulatorError(m_written + ": the scenario cannot be written: " + std::strerror(errno));
+    }
+
     Peers peers(SessionOptions const& options)
     {
         if (options.fleet == 0 || options.fleet > largestFleet) {

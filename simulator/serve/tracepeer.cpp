@@ -2,11 +2,10 @@
 
 #include "simulator/bytes.h"
 #include "simulator/error.h"
+#include "simulator/textfile.h"
 
 #include <cerrno>
 #include <cstring>
-#include <fcntl.h>
-#include <unistd.h>
 
 namespace obdsim {
 
@@ -31,20 +30,9 @@ std::string escaped(std::string_view bytes)
     return text;
 }
 
-/// A pipe that nobody reads is refused rather than waited for.
-std::FILE* openForTrace(std::string const& path)
-{
-    int const handle = ::open(path.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC | O_NONBLOCK, 0666);
-    if (handle < 0) {
-        return nullptr;
-    }
-    ::fcntl(handle, F_SETFL, 0);
-    return ::fdopen(handle, "w");
-}
-
 } // namespace
 
-TraceFile::TraceFile(std::string const& path) : m_path(path), m_file(openForTrace(path))
+TraceFile::TraceFile(std::string const& path) : m_path(path), m_file(openForWriting(path))
 {
     if (m_file == nullptr) {
         throw SimulatorError(path + ": the trace cannot be written: " + std::strerror(errno));

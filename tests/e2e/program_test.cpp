@@ -192,6 +192,24 @@ TEST(Program, FullDiskUnderTraceAndLogIsToldOnce)
     }
 }
 
+// The user has redirected a stream and named no file.
+TEST(Program, WhatStandardErrorIsRedirectedToIsNeverTruncated)
+{
+    std::string const file = testsupport::ownPath("day.log");
+    for (std::string const option :
+         {"-q -p sim:petrol-can11?instant info --trace", "-q -p sim:petrol-can11?instant info --log",
+          "simulate --listen tcp://256.1.1.1:1 --trace"}) {
+        std::ofstream(file) << "yesterday\n";
+        std::string const command = VELMORA_PROGRAM " " + option + " /dev/stderr >/dev/null 2>>" + file;
+        std::system(command.c_str());
+        std::ifstream in(file);
+        std::string const text{std::istreambuf_iterator<char>(in), {}};
+        EXPECT_TRUE(text.starts_with("yesterday\n")) << option << text.substr(0, 80);
+        EXPECT_GT(text.size(), 30U) << option;
+    }
+    std::remove(file.c_str());
+}
+
 TEST(Program, InterruptEndsWithinASecond)
 {
     ChildProcess simulator({"simulate", "--listen", "tcp://127.0.0.1:0", "--adapter", "silent"});

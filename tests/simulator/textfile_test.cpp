@@ -56,6 +56,20 @@ TEST_F(TextFile, carsRecordingsAndScenariosAreTextFiles)
     }
 }
 
+TEST_F(TextFile, isOpenedForWritingWithoutWaitingAndLookedAtWithoutAChange)
+{
+    EXPECT_FALSE(obdsim::canWrite(m_pipe));
+    EXPECT_EQ(obdsim::openForWriting(m_pipe), nullptr);
+    EXPECT_FALSE(obdsim::canWrite("/no/such/folder/file"));
+    EXPECT_TRUE(obdsim::canWrite(m_file));
+    EXPECT_EQ(obdsim::readTextFile(m_file), "12345");
+    std::FILE* const file = obdsim::openForWriting(m_file);
+    ASSERT_NE(file, nullptr);
+    std::fputs("6", file);
+    std::fclose(file);
+    EXPECT_EQ(obdsim::readTextFile(m_file), "6");
+}
+
 TEST_F(TextFile, traceToAPipeThatNobodyReadsIsRefusedAndAFullDiskIsNoted)
 {
     EXPECT_THROW(obdsim::TraceFile{m_pipe}, obdsim::SimulatorError);
