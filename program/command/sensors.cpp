@@ -9,6 +9,7 @@
 #include <velmora/offers.h>
 
 #include <fmt/format.h>
+#include <fmt/ostream.h>
 
 #include <memory>
 
@@ -127,8 +128,11 @@ Json laterJson(ModuleOffers::LaterParameter const& later)
 Json offerJson(ModuleOffers const& module)
 {
     Json supported;
+    Json answers;
     for (Service const& service : module.services) {
-        supported[std::string(serviceTitle(service.number), 2)] = identifiers(service);
+        std::string const number(serviceTitle(service.number), 2);
+        supported[number] = identifiers(service);
+        answers[number] = fmt::format("{}", fmt::streamed(service.answer));
     }
     Json parameters = Json::array();
     for (ModuleOffers::Parameter const& parameter : module.parameters) {
@@ -145,6 +149,7 @@ Json offerJson(ModuleOffers const& module)
             {"name", textOrNull(module.name)},
             {"description", textOrNull(module.description)},
             {"supported", supported},
+            {"answers", answers},
             {"parameters", parameters},
             {"undecoded", rest}};
 }

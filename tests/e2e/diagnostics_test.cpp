@@ -90,6 +90,11 @@ TEST(Diagnostics, AModuleThatRefusesToTellWhatItHasIsToldSo)
     ASSERT_NE(second, std::string::npos) << outcome.out;
     EXPECT_FALSE(holds(outcome.out.substr(0, second), "refused")) << outcome.out;
     EXPECT_TRUE(holds(outcome.out.substr(second), "F6 (not known in full: refused)\n")) << outcome.out;
+    auto const json =
+        nlohmann::json::parse(runVelmora({"-q", "--json", "-p", "sim:" + file + "?instant", "sensors"}).out);
+    EXPECT_EQ(json[0]["answers"]["01"], "read");
+    EXPECT_EQ(json[0]["answers"]["06"], "no answer");
+    EXPECT_EQ(json[1]["answers"]["01"], "refused");
     std::remove(file.c_str());
 }
 
