@@ -94,13 +94,14 @@ bool FastChannel::setAddress(Pending& pending)
     } else if (refused.empty() && !address->stays) {
         refused = takeOn(changes);
     }
-    noteRefusal(refused);
     if (!refused.empty()) {
         m_addressFailures += onlySavesTime ? 1 : 0;
         endStay();
         restoreAddress();
+        noteRefusal(isValid() ? refused : std::string()); // one that says nothing has refused nothing
         return onlySavesTime && isValid();
     }
+    noteRefusal({});
     pending.addressed = true;
     pending.extended = !address->extended.empty();
     bool const replyIsKnown = address->waitMs == 0 && !address->reply.empty();
@@ -138,6 +139,7 @@ void FastChannel::restoreAddress()
                           (!step.otherwise.empty() && confirms(step.otherwise, addressLimit)) ||
                           (wake(ignored) && confirms(step.command, addressLimit));
         if (!done) {
+            m_gone = m_gone || (m_wire->isUp() && m_silence.isUnheard());
             m_lost = m_lost || m_wire->isUp();
             return;
         }

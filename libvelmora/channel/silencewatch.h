@@ -17,6 +17,8 @@ public:
 
     // When the silence will have been long enough; slow clones pause for a second or two.
     WireTime end() const { return m_unheard == 0 ? WireTime::max() : m_from + longestPause; }
+    // Whether a command and both questions of who it is went unheard, however short that was.
+    bool isUnheard() const { return m_unheard >= fewestLines; }
     // For who has just asked in vain whether it is there.
     bool isGone(WireTime now) const { return m_unheard >= fewestLines && now >= end(); }
 

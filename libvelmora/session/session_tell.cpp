@@ -127,7 +127,7 @@ void Session::check() const
         throw openingfailure::resettingAdapter(port());
     }
     // A channel that can't take an address back gives up, too; the cause is the silence.
-    if (adapterSilent() && !m_link->portLost()) {
+    if (m_link != nullptr && (adapterSilent() || m_link->adapterGone()) && !m_link->portLost()) {
         throw Error(ErrorKind::AdapterSilent, "The adapter on " + port() + " no longer answers",
                     {"is it still in its socket, and in reach?", "pull the adapter and plug it in again"});
     }

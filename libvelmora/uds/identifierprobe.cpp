@@ -144,7 +144,7 @@ void IdentifierProbe::run(ProbeState& state)
     if (!reached.address) {
         throw Error(ErrorKind::WrongUse, "The module can't be asked: " + reached.reason);
     }
-    StandingGuard guard(m_asker.proxy());
+    StandingGuard guard(m_asker.proxy(), m_check);
     state.next = std::max(state.next, state.task.from);
     try {
         for (; state.next <= state.task.to; ++state.next) {

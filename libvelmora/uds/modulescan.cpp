@@ -108,7 +108,7 @@ std::vector<FoundModule> ModuleScan::find()
                     "The bus of this vehicle is no CAN: modules beyond OBD can't be looked for",
                     {"on legacy buses each module needs a start of its own, which would end the connection"});
     }
-    StandingGuard guard(m_asker.proxy());
+    StandingGuard guard(m_asker.proxy(), m_check);
     guard.check();
     std::set<unsigned int> used = listen();
     std::vector<unsigned int> const ids = candidates(used);

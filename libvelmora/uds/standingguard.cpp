@@ -42,6 +42,7 @@ void StandingGuard::check()
     replies.clear();
     m_proxy.execute(std::vector<unsigned char>{0x01, 0x00}, replies, guardLimitMs);
     if (replies.empty()) {
+        m_checkLink();
         throw Error(ErrorKind::VehicleSilent, "The vehicle no longer answers its standard requests",
                     {"is the ignition still on?"});
     }
@@ -50,6 +51,9 @@ void StandingGuard::check()
 void StandingGuard::countTrouble(bool trouble, char const* what)
 {
     m_troubles = trouble ? m_troubles + 1 : 0;
+    if (trouble) {
+        m_checkLink();
+    }
     if (m_troubles >= mostTroubles) {
         throw Error(ErrorKind::Failed, fmt::format("The adapter tells trouble on the bus, again and again: {}", what),
                     {"`velmora doctor` looks for the reason"});

@@ -3,7 +3,9 @@
 #include <obd/iobdproxy.h>
 
 #include <cstdint>
+#include <functional>
 #include <optional>
+#include <utility>
 
 namespace velmora {
 
@@ -12,8 +14,10 @@ namespace velmora {
 class StandingGuard
 {
 public:
-    // proxy must outlive it.
-    explicit StandingGuard(obd::IObdProxy& proxy) : m_proxy(proxy) {}
+    // proxy must outlive it. checkLink throws where adapter or link are the reason that nobody answers.
+    StandingGuard(obd::IObdProxy& proxy, std::function<void()> checkLink)
+        : m_proxy(proxy), m_checkLink(std::move(checkLink))
+    {}
 
     // Asks for the speed once each 10 s, and at the first call. Throws Error if the vehicle moves, or does not answer.
     void check();
@@ -22,6 +26,7 @@ public:
 
 private:
     obd::IObdProxy& m_proxy;
+    std::function<void()> m_checkLink;
     std::optional<std::uint32_t> m_checked; // by the library's clock
     int m_troubles = 0;
 };

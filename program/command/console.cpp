@@ -78,17 +78,21 @@ ExitCode console(GlobalOptions const& options)
     AdapterConsole dialogue(carOptions(options, stop.token()));
     CommandSource commands(dialogue, options);
     std::string command;
-    bool asked = false;
+    bool silent = false; // to the last command
     bool answered = false;
     while (commands.read(command) && command != "exit" && command != "quit") {
         if (!command.empty()) {
             Answer const answer = dialogue.ask(command);
             print(command, answer, options.json);
-            asked = true;
+            silent = !answer.complete;
             answered = answered || answer.complete;
         }
     }
-    if (asked && !answered) {
+    if (silent && answered) {
+        throw Error(ErrorKind::AdapterSilent, "The adapter on " + dialogue.port() + " no longer answers",
+                    {"is it still in its socket, and in reach?", "pull the adapter and plug it in again"});
+    }
+    if (silent) {
         throw Error(ErrorKind::AdapterSilent, "Nothing on " + dialogue.port() + " answered any command",
                     {"is it the right port, and the right --baud?", "pull the adapter and plug it in again"});
     }

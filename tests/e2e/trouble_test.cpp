@@ -47,14 +47,18 @@ private:
 
 TEST(Trouble, AnAdapterThatFallsSilentIsExitCodeFourInEveryCommand)
 {
-    std::vector<std::vector<std::string>> const commands = {{"info"}, // while it is brought up
-                                                            {"scan"},
-                                                            {"codes"},
-                                                            {"info"},
-                                                            {"monitors"},
-                                                            {"clear"},
-                                                            {"live", "RPM", "--duration", "60"},
-                                                            {"log", "RPM", "--duration", "60"}};
+    std::vector<std::vector<std::string>> const commands = {
+        {"info"}, // while it is brought up
+        {"scan"},
+        {"codes"},
+        {"info"},
+        {"monitors"},
+        {"clear"},
+        {"live", "RPM", "--duration", "60"},
+        {"log", "RPM", "--duration", "60"},
+        {"modules"},
+        {"codes", "--uds"},
+        {"signals", "probe", "--service", "22", "--from", "F190", "--to", "F191", "--module", "7E0"}};
     auto const start = std::chrono::steady_clock::now();
     std::vector<FaultyCar> cars;
     std::vector<std::unique_ptr<ChildProcess>> running; // at once: each mostly waits
@@ -64,10 +68,15 @@ TEST(Trouble, AnAdapterThatFallsSilentIsExitCodeFourInEveryCommand)
         cars.emplace_back(std::vector<std::string>{bringUp                      ? "silent@8"
                                                    : command.front() == "clear" ? "silent@37"
                                                                                 : "silent@38"});
-        std::vector<std::string> arguments = {"-q", "-y", "-p", cars.back().port()};
+        std::vector<std::string> arguments = {
+            "-q", "-y", "-p", cars.back().port(), "--settings", testsupport::ownPath("silent.toml")};
         arguments.insert(arguments.end(), command.begin(), command.end());
         running.push_back(std::make_unique<ChildProcess>(arguments));
     }
+    FaultyCar const bare({"silent@2"});
+    Outcome const console = runVelmora({"-q", "-p", bare.port(), "console"}, "ATI\nATRV\n");
+    EXPECT_EQ(console.exitCode, 4) << console.err;
+    EXPECT_TRUE(contains(console.err, "no longer answers")) << console.err;
     for (std::size_t i = 0; i < commands.size(); ++i) {
         EXPECT_EQ(running[i]->wait(), 4) << commands[i].front();
     }
@@ -156,7 +165,8 @@ TEST(Trouble, FilesWithoutAnEndOrABeginningAreRefusedAtOnce)
                                                       {"signals", "probe", "--service", "22", "--from", "F190", "--to",
                                                        "F190", "--module", "7E0", "--force", "--output", html},
                                                       {"history", "export", html},
-                                                      {"simulate", "--trace", html}}) {
+                                                      {"simulate", "--trace", html},
+                                                      {"simulate", "--write-scenario", html}}) {
         std::vector<std::string> all = {"-p", "sim:petrol-can11?instant"};
         all.insert(all.end(), arguments.begin(), arguments.end());
         Outcome const outcome = runVelmora(all);

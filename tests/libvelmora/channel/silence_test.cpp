@@ -84,6 +84,19 @@ TEST(Silence, ASlowSearchWithoutAWordIsNoSilence)
     EXPECT_TRUE(rig.channel.isValid());
 }
 
+// A request to one module is not refused by an adapter that says nothing, and it is the silence that is told.
+TEST(Silence, AnAddressThatIsNotTakenInSilenceIsNoRefusal)
+{
+    ChannelRig rig;
+    rig.connect();
+    rig.wire->setSilent(true);
+    AddressedModule const scope(rig.channel, {.header = "7B3", .reply = "7BB"});
+    rig.ask("221E1C");
+    EXPECT_EQ(rig.channel.refusedAddress(), "");
+    EXPECT_TRUE(rig.channel.adapterFails());
+    EXPECT_TRUE(rig.channel.adapterGone());
+}
+
 TEST(Silence, WhoeverSaysAnythingIsThere)
 {
     for (char const* word : {"\r", "?", "."}) { // never a prompt

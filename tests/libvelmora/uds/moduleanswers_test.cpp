@@ -16,6 +16,8 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <functional>
+
 namespace velmora {
 
 namespace {
@@ -181,7 +183,7 @@ protected:
     std::string problem()
     {
         try {
-            StandingGuard(m_bench).check();
+            StandingGuard(m_bench, m_link).check();
         } catch (Error const& error) {
             return error.what();
         }
@@ -190,12 +192,13 @@ protected:
 
     support::FakeClock m_clock;
     ModuleBench m_bench;
+    std::function<void()> m_link = [] {};
 };
 
 TEST_F(StandingGuardTest, AsksForTheSpeedEachTenSeconds)
 {
     m_bench.answer("01 0D", "41 0D 00");
-    StandingGuard guard(m_bench);
+    StandingGuard guard(m_bench, m_link);
     guard.check();
     guard.check();
     EXPECT_EQ(m_bench.count("01 0D"), 1);
@@ -225,15 +228,31 @@ TEST_F(StandingGuardTest, TakesOnlyASpeedForASpeed)
 
 TEST_F(StandingGuardTest, EndsAtTheThirdTroubleInARow)
 {
-    StandingGuard guard(m_bench);
+    StandingGuard guard(m_bench, m_link);
     for (bool const trouble : {true, true, false, true, true}) {
         EXPECT_NO_THROW(guard.countTrouble(trouble, "a test"));
     }
     EXPECT_THROW(guard.countTrouble(true, "a test"), Error);
-    StandingGuard second(m_bench);
+    StandingGuard second(m_bench, m_link);
     EXPECT_NO_THROW(second.countTrouble(true, "a test"));
     EXPECT_NO_THROW(second.countTrouble(true, "a test"));
     EXPECT_THROW(second.countTrouble(true, "a test"), Error);
+}
+
+TEST_F(StandingGuardTest, AsksTheLinkWhetherItIsTheReason)
+{
+    int asked = 0;
+    m_link = [&asked] {
+        ++asked;
+        throw Error(velmora::ErrorKind::AdapterSilent, "the adapter", {});
+    };
+    EXPECT_EQ(problem(), "the adapter") << "nobody answers";
+    StandingGuard guard(m_bench, m_link);
+    EXPECT_NO_THROW(guard.countTrouble(false, "a test"));
+    EXPECT_EQ(asked, 1);
+    EXPECT_THROW(guard.countTrouble(true, "a test"), Error) << "at the first trouble";
+    m_bench.answer("01 00", "41 00 BE 1F A8 13");
+    EXPECT_EQ(problem(), "none");
 }
 
 TEST(VehicleVin, IsTheFirstWholeOneOfAnyModule)
