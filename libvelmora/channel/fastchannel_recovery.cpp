@@ -223,6 +223,7 @@ bool FastChannel::setUpAgain(HealedReply const& reply)
     m_waitSteps = 0;
     m_restore.clear(); // a reset has taken it back
     m_staying.reset();
+    m_stayChanges.clear();
     m_learner.clear();
     ElmCommand const& command = m_pending->command;
     if (command.isRequest() && !command.onlyReads()) {
