@@ -48,7 +48,11 @@ DashOutput::DashOutput(OutputAddress const& address, DashContext context)
     addRoutes();
 }
 
-DashOutput::~DashOutput() = default;
+DashOutput::~DashOutput()
+{
+    m_listening.reset();
+    m_server.stop();
+}
 
 // All replies carry the page's headers.
 void DashOutput::addHandler(std::string const& method, std::string const& path, HttpHandler handler)

@@ -80,8 +80,8 @@ private:
     std::chrono::steady_clock::time_point m_lastBeat;
     std::chrono::steady_clock::time_point m_lastRuns;
     std::atomic<std::chrono::steady_clock::time_point> m_lastSeen{}; // a reader, or the wish to time runs
-    HttpServer m_server;                                             // goes before all that its replies are made of
-    std::shared_ptr<void> m_listening;                               // goes first, so that nobody calls any more
+    HttpServer m_server;
+    std::shared_ptr<void> m_listening;
 };
 
 } // namespace velmora

@@ -84,7 +84,9 @@ void HttpConnection::read()
 
 void HttpConnection::close()
 {
+    HttpErrorCode ignored;
     m_delay.cancel();
+    m_stream.socket().shutdown(boost::asio::ip::tcp::socket::shutdown_both, ignored);
     m_stream.close();
     m_core.connections.erase(shared_from_this());
 }

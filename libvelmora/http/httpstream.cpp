@@ -35,6 +35,7 @@ void HttpStream::close()
 {
     StreamErrorCode ignored;
     m_ping.cancel();
+    m_socket.shutdown(boost::asio::ip::tcp::socket::shutdown_both, ignored);
     m_socket.close(ignored);
     if (m_core.streams.erase(shared_from_this()) > 0) {
         --m_core.readers;

@@ -92,7 +92,7 @@ std::int64_t RecordingPlayer::position() const
 
 bool RecordingPlayer::atEnd() const
 {
-    return m_parts->next == m_parts->order.size();
+    return m_parts->next == m_parts->order.size() && position() >= m_parts->recording.end;
 }
 
 } // namespace velmora

@@ -20,7 +20,7 @@ std::optional<std::vector<std::string>> fieldsOf(std::string const& line)
     bool quoted = false;
     for (std::size_t i = 0; i < line.size(); ++i) {
         char const each = line[i];
-        if (quoted && each == '"' && line[i + 1] == '"') { // behind the last one stands a 0
+        if (quoted && each == '"' && i + 1 < line.size() && line[i + 1] == '"') {
             fields.back() += '"';
             ++i;
         } else if (each == '"') {

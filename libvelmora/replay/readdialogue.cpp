@@ -28,8 +28,8 @@ constexpr unsigned int replayLimitMs = 1500;
 // A request for live values.
 struct LiveRequest
 {
-    std::int64_t time; // of its reply, ms
-    std::string key;   // without the digit that tells how many replies to wait for
+    std::int64_t time = 0; // of its reply, ms
+    std::string key;       // without the digit that tells how many replies to wait for
     std::vector<unsigned char> pids;
 };
 

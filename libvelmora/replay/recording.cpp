@@ -78,12 +78,11 @@ std::size_t RecordingMaker::sensor(SensorEntry const& about)
 
 bool RecordingMaker::add(std::size_t sensor, std::int64_t time, std::string const& text)
 {
-    if (sensor == noRoom) {
-        return true;
-    }
     if (std::optional<double> const number = finiteIn(text)) {
-        int& decimals = m_recording.sensors[sensor].decimals;
-        decimals = std::max(decimals, decimalsOf(text));
+        if (sensor < m_recording.sensors.size()) {
+            int& decimals = m_recording.sensors[sensor].decimals;
+            decimals = std::max(decimals, decimalsOf(text));
+        }
         return add(sensor, time, Reading::Value(*number));
     }
     return add(sensor, time, text.empty() || text == "-" ? Reading::Value() : Reading::Value(text));
@@ -91,7 +90,7 @@ bool RecordingMaker::add(std::size_t sensor, std::int64_t time, std::string cons
 
 bool RecordingMaker::add(std::size_t sensor, std::int64_t time, Reading::Value value)
 {
-    if (sensor == noRoom || time < 0 || time > latestTime) {
+    if (sensor >= m_recording.sensors.size() || time < 0 || time > latestTime) {
         return true; // left out: a sensor that found no room, or a time that can't be
     }
     if (m_values == m_mostValues) {

@@ -42,6 +42,7 @@ std::vector<JsonPlace> JsonPlace::elements() const
         fail("list");
     }
     std::vector<JsonPlace> list;
+    list.reserve(m_value.size());
     for (std::size_t i = 0; i < m_value.size(); ++i) {
         list.emplace_back(m_value[i], m_path + "/" + std::to_string(i));
     }

@@ -24,9 +24,10 @@ Json yearBasis(VinFacts::YearBasis basis)
         return "position 7";
     case VinFacts::YearBasis::Perhaps:
         return "perhaps";
-    default:
-        return nullptr;
+    case VinFacts::YearBasis::None:
+        break;
     }
+    return nullptr;
 }
 
 Json codeList(VinFacts const& facts)

@@ -79,9 +79,12 @@ DocumentCell listCell(CodeList const& list)
     case CodeList::Answer::Unreadable:
         return {texts::cantBeRead, DocumentMark::Faint};
     default:
-        return list.codes.empty() ? DocumentCell{texts::noneStored, DocumentMark::Good}
-                                  : DocumentCell{std::to_string(list.codes.size()), markOf(list.kind)};
+        break;
     }
+    if (list.codes.empty()) {
+        return {texts::noneStored, DocumentMark::Good};
+    }
+    return {std::to_string(list.codes.size()), markOf(list.kind)};
 }
 
 std::string makerLine(MakerChoice const& maker)

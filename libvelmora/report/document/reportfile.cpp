@@ -71,7 +71,7 @@ void writeReport(std::string const& path, VehicleReport const& report, ReportFac
 {
     checkReportPath(path, replace);
     std::string const content = contentOf(reportFormOf(path), report, facts, text);
-    std::ofstream file(path, std::ios::binary);
+    std::ofstream file(path, std::ios::binary | std::ios::trunc);
     file << content << std::flush;
     if (!file) {
         throw Error(ErrorKind::Failed, "Could not write the report " + path + ": " + std::strerror(errno),

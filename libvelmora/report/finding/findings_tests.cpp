@@ -26,16 +26,21 @@ std::string valueWithUnit(std::string const& value, std::string const& unit)
 void addNearTest(std::vector<Evidence>& list, ModuleReport const& module, DataTopic topic, std::string const& what,
                  LimitTest const& test)
 {
-    Closeness const closeness = closenessOf(test);
-    if (closeness == Closeness::Far) {
+    std::string const value = valueWithUnit(test.value, test.unit);
+    switch (closenessOf(test)) {
+    case Closeness::NearMinimum:
+        list.push_back({topic, module.id,
+                        fmt::format(texts::finding::nearMin, what, test.description, value,
+                                    valueWithUnit(test.minimum, test.unit))});
+        return;
+    case Closeness::NearMaximum:
+        list.push_back({topic, module.id,
+                        fmt::format(texts::finding::nearMax, what, test.description, value,
+                                    valueWithUnit(test.maximum, test.unit))});
+        return;
+    case Closeness::Far:
         return;
     }
-    bool const low = closeness == Closeness::NearMinimum;
-    std::string const value = valueWithUnit(test.value, test.unit);
-    std::string const limit = valueWithUnit(low ? test.minimum : test.maximum, test.unit);
-    list.push_back({topic, module.id,
-                    low ? fmt::format(texts::finding::nearMin, what, test.description, value, limit)
-                        : fmt::format(texts::finding::nearMax, what, test.description, value, limit)});
 }
 
 bool isMisfireCount(OnBoardMonitor const& monitor, LimitTest const& test)

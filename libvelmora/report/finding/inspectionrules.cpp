@@ -237,6 +237,7 @@ void judgeInspection(VehicleReport const& vehicle, InspectionReport& report)
     default:
         tellDeAu(judge, state);
         report.verdict = InspectionReport::Verdict::Unknown; // the exhaust decides
+        break;
     }
 }
 

@@ -24,9 +24,13 @@ std::string summary(CodeList const& list)
         return texts::noAnswer;
     case CodeList::Answer::Unreadable:
         return texts::cantBeRead;
-    default:
-        return list.codes.empty() ? texts::noneStored : counted(list.codes.size(), texts::plain::codeNoun);
+    case CodeList::Answer::Read:
+        break;
     }
+    if (list.codes.empty()) {
+        return texts::noneStored;
+    }
+    return counted(list.codes.size(), texts::plain::codeNoun);
 }
 
 Mark mark(CodeList const& list)
@@ -49,9 +53,10 @@ std::string makerText(MakerChoice const& choice)
         return fmt::format(texts::plain::listByVin, choice.maker);
     case MakerChoice::By::Guess:
         return fmt::format(texts::plain::listByGuess, choice.maker);
-    default:
-        return texts::plain::noList;
+    case MakerChoice::By::Nothing:
+        break;
     }
+    return texts::plain::noList;
 }
 
 } // namespace

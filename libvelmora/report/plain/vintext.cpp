@@ -30,9 +30,10 @@ std::string checkText(VinFacts const& facts, Style const& style)
         return style.paint(Mark::Good, texts::plain::checkRight);
     case VinFacts::CheckDigit::Wrong:
         return style.paint(Mark::Bad, fmt::format(texts::plain::checkWrong, facts.computedCheck));
-    default:
-        return texts::plain::checkUnused;
+    case VinFacts::CheckDigit::NotJudged:
+        break;
     }
+    return texts::plain::checkUnused;
 }
 
 std::string codesText(VinFacts const& facts)
@@ -42,9 +43,10 @@ std::string codesText(VinFacts const& facts)
         return fmt::format(texts::plain::codesByDefault, facts.codes);
     case VinFacts::CodesBasis::Guess:
         return fmt::format(texts::plain::codesPerhaps, facts.codes);
-    default:
-        return facts.maker.empty() ? "" : texts::plain::codesUnknown;
+    case VinFacts::CodesBasis::None:
+        break;
     }
+    return facts.maker.empty() ? "" : texts::plain::codesUnknown;
 }
 
 } // namespace

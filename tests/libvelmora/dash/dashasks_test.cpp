@@ -32,6 +32,9 @@ TEST(DashOutput, RefusesWhatCantBeAskedInWords)
     EXPECT_EQ(said(R"({"topic":"play","paused":true})"), "400 This can't be asked of what is shown\n");
     EXPECT_EQ(said(R"({"topic":"console","text":")" + std::string(200, 'x') + "\"}"), "202 Asked\n");
     EXPECT_EQ(page.desk->next()->text.size(), 200U);
+    EXPECT_EQ(said(R"({"topic":"console","text":"AT SP ~"})"), "202 Asked\n");
+    EXPECT_EQ(page.desk->next()->text, "AT SP ~") << "all that can be printed";
+    EXPECT_EQ(said(R"({"topic":"console","text":""})"), "400 This is no command\n");
     for (int i = 0; i < 16; ++i) {
         EXPECT_EQ(said(R"({"topic":"console","text":"AT)" + std::to_string(i) + "\"}"), "202 Asked\n");
     }

@@ -81,6 +81,24 @@ TEST(DashClerkEdges, EndsRunsThoughTheLinkIsGone)
     EXPECT_FALSE(rig.desk.runs().isActive());
 }
 
+// P1131 has a meaning with each maker, and the number names Ford.
+TEST(DashClerkEdges, GivesCodesAndFrameTheMakersMeaning)
+{
+    testsupport::TemporaryFolder const folder;
+    std::ofstream(folder.file("car.toml")) << "name = \"a car\"\nprotocol = 6\n[engine]\nfuel = \"petrol\"\n"
+                                              "[[module]]\nid = \"7E8\"\nstored = [\"P1131\"]\n"
+                                              "live = \"04 05 0C 0D\"\n[[module.frames]]\nnumber = 0\n"
+                                              "code = \"P1131\"\ntaken_at = 1.5\npids = \"04 05\"\n[module.info]\n"
+                                              "vin = \"1FTEX1C85AF000001\"\n";
+    ClerkRig rig("sim:" + folder.file("car.toml") + "?instant");
+    rig.car.connect();
+    EXPECT_EQ(rig.ask("codes", "").substr(0, 4), "done");
+    Json const module = rig.answers.at(0).data.at(0);
+    EXPECT_EQ(module["codes"]["maker"]["name"], "Ford");
+    EXPECT_EQ(module["codes"]["confirmed"]["codes"][0]["meaning"]["maker"], "Ford");
+    EXPECT_EQ(module["freeze"]["freeze"]["code"]["meaning"]["maker"], "Ford") << module.dump();
+}
+
 TEST(DashClerkEdges, BreaksOffWhenTheUserWantsAnEnd)
 {
     for (char const* const topic : {"codes", "info"}) {

@@ -83,6 +83,7 @@ TEST(DashOutput, TellsABrowserAllAtFirstAndThenWhatChanges)
     page.desk->tell(velmora::DashAnswer{"info", true, Json::array({1})});
     EXPECT_EQ(nextEvent(stream, "answer")["data"], Json::array({1}));
     EXPECT_THAT(page.get("/history?7E8/RPM"), HasSubstr(R"({"id":"7E8/RPM","t":[1000,2000],"v":[800,900]})"));
+    EXPECT_THAT(page.get("/history?none"), HasSubstr("Content-Type: application/json\r\n"));
 }
 
 TEST(DashOutput, KeepsALayoutForItsVehicle)
@@ -203,6 +204,10 @@ TEST(DashOutput, AReaderWhoIsTooSlowGetsTheLatestValuesInTheEnd)
     HttpClient stream(page.output->port());
     stream.send("GET /events HTTP/1.1\r\nHost: localhost\r\n\r\n");
     stream.readUntil("event: hello");
+    auto const ecu = std::make_shared<support::FakeEcu>(0x7E8);
+    ecu->setSupported(obd::ObdMode::CurrentData, {0x0C, 0x0D});
+    obd::VelmoraSettings const settings(std::make_shared<support::MemorySettings>());
+    page.desk->runs().begin(ecu, settings);
     constexpr int sensors = 100;
     constexpr int rounds = 1500; // far more than the buffers of both ends hold
     std::size_t told = 0;
@@ -216,6 +221,9 @@ TEST(DashOutput, AReaderWhoIsTooSlowGetsTheLatestValuesInTheEnd)
     std::string const last = "\"7E8/S99\"," + std::to_string(1000 + rounds - 1) + ",";
     std::string const all = stream.readUntil(last);
     EXPECT_THAT(all, testing::EndsWith(last));
+    Json const runs = nextEvent(stream, "performance");
+    EXPECT_TRUE(runs.contains("goals"));
+    EXPECT_FALSE(runs.contains("speed"));
     std::size_t events = 0;
     for (std::size_t at = all.find("event: values"); at != std::string::npos; at = all.find("event: values", at + 1)) {
         ++events;
@@ -284,7 +292,9 @@ TEST(DashOutput, TellsOfTimedRunsAndGivesThemAway)
     page.desk->runs().begin(ecu, settings);
     HttpClient stream(page.output->port());
     stream.send("GET /events HTTP/1.1\r\nHost: localhost\r\n\r\n");
-    EXPECT_EQ(nextEvent(stream, "hello")["performance"]["active"], true);
+    Json const hello = nextEvent(stream, "hello");
+    EXPECT_EQ(hello["performance"]["active"], true);
+    EXPECT_FALSE(hello["performance"].contains("speed"));
     page.get("/");
     for (unsigned char kmh = 0; kmh <= 130; ++kmh) {
         Reading reading = dashReading("SPEED", kmh, 1000 + kmh * 100);
@@ -323,7 +333,9 @@ TEST(DashPlay, TellsARecordingAsIfItCameNow)
         first = each.sensor == "RPM" ? each : first;
     };
     listener.line = [](velmora::DashLine const&) {};
-    listener.answer = [&told](velmora::DashAnswer const& each) { told.push_back(each.topic); };
+    listener.answer = [&told](velmora::DashAnswer const& each) {
+        told.push_back(each.topic + (each.done ? "" : " not"));
+    };
     listener.vehicle = [&](velmora::DashVehicle const& each) {
         told.push_back(each.offered.at(1).sensor + " " + play.state()["speed"].dump());
     };
@@ -337,6 +349,7 @@ TEST(DashPlay, TellsARecordingAsIfItCameNow)
     EXPECT_EQ(told, std::vector<std::string>{"MAP 2.0"});
     EXPECT_EQ(step(0.1), (std::vector<std::string>{"RPM 800", "MAP 30.5"}));
     EXPECT_EQ(first.module, 0x7E8U);
+    EXPECT_LT(std::chrono::system_clock::now() - first.time, std::chrono::minutes(1)) << "whenever it was recorded";
     EXPECT_EQ(first.name + " " + first.pid + " " + first.unit, "Engine speed 010C rpm");
     EXPECT_EQ(step(0.5), (std::vector<std::string>{"RPM 900", "MAP 31.0"}));
     play.desk()->ask({"play", velmora::PlayDesk::parse({{"paused", true}, {"other", 1}}).dump()});
@@ -346,7 +359,13 @@ TEST(DashPlay, TellsARecordingAsIfItCameNow)
     EXPECT_EQ(step(0.0), (std::vector<std::string>{"RPM 1700", "MAP 31.0"})) << "what stands there";
     EXPECT_EQ(play.state()["position"], recording.end);
     play.desk()->ask({"codes", ""});
-    EXPECT_EQ(step(0.0), std::vector<std::string>{"codes"}) << "there is no vehicle to ask";
+    EXPECT_EQ(step(0.0), std::vector<std::string>{"codes not"}) << "there is no vehicle to ask";
+    play.desk()->ask({"sensors", "x"});
+    EXPECT_TRUE(step(0.0).empty()) << "all are told anyway";
+    play.desk()->ask({"play", velmora::PlayDesk::parse({{"speed", 5}, {"paused", false}}).dump()});
+    step(0.0);
+    EXPECT_EQ(play.state()["speed"], 5.0);
+    EXPECT_EQ(play.state()["paused"], false);
     EXPECT_TRUE(velmora::PlayDesk::parse({{"speed", "fast"}}).is_null());
     EXPECT_THAT(Page().post("/ask", R"({"topic":"play","paused":true})"), StartsWith("HTTP/1.1 400"));
 }

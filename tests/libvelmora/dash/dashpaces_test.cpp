@@ -152,6 +152,10 @@ TEST(DashPaces, EndTimedRunsThatNobodyLooksAt)
     page.writeAfter(60000ms);
     EXPECT_FALSE(page.desk->next()) << "somebody looks";
     page.stream.reset();
+    for (int i = 0; i < 30; ++i) {
+        page.writeAfter(0ms); // while the server notices
+        EXPECT_FALSE(page.desk->next()) << "he has just gone";
+    }
     for (int i = 0; i < 1000 && !page.desk->next(); ++i) {
         page.writeAfter(40000ms); // until the server has noticed
     }

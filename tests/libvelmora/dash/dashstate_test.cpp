@@ -121,6 +121,11 @@ TEST(DashState, ThinsRunsToTheirEndsAndPeaks)
     EXPECT_EQ(six["v"], Json({5, 9, 1, 5, 2, 7}));
     EXPECT_EQ(state.history("7E8/RPM", 0)["t"], Json({0, 100, 200, 1100})) << "one run of twelve";
     EXPECT_EQ(state.history("7E8/RPM", 48)["t"].size(), 12U);
+    double const ties[] = {5, 1, 3, 1, 9, 3, 9, 5};
+    for (int i = 0; i < 8; ++i) {
+        state.take(stateReading("TIES", ties[i], 100 * i));
+    }
+    EXPECT_EQ(state.history("7E8/TIES", 4)["t"], Json({0, 100, 600, 700})) << "the first lowest, the last highest";
     EXPECT_EQ(state.history("none", 8), Json({{"id", "none"}, {"t", Json::array()}, {"v", Json::array()}}));
 }
 
@@ -163,6 +168,8 @@ TEST(DashState, ForgetsWithTheVehicle)
     state.take(DashVehicle{"car", {}});
     EXPECT_EQ(state.takeValues(), "");
     EXPECT_EQ(state.allValues(), R"({"v":[]})");
+    state.take(stateReading("SPEED", 2.0, 1001));
+    EXPECT_EQ(jsonOf(state.takeValues())["sensors"].size(), 1U) << "what was new of the other is none of this one's";
     EXPECT_EQ(state.answers(), Json::object());
     for (char const* const topic : {"console", "clear", "performance", "codes"}) {
         state.take(velmora::DashAnswer{topic, false, "why"});

@@ -58,6 +58,8 @@ TEST(HttpGuard, APostNamesItsOwnOrigin)
         EXPECT_EQ(statusOf(requestWith("GET", {{"host", "localhost:1"}, {"origin", foreign}})), 403U) << foreign;
     }
     EXPECT_EQ(statusOf(requestWith("GET", {{"host", "localhost:1"}})), 200U);
+    EXPECT_EQ(statusOf(requestWith("HEAD", {{"host", "localhost:1"}})), 200U);
+    EXPECT_EQ(statusOf(requestWith("PUT", {{"host", "localhost:1"}})), 403U);
     EXPECT_EQ(statusOf(requestWith(
                   "POST", {{"host", "localhost:1"}, {"origin", "http://localhost:1"}, {"origin", "http://evil.test"}})),
               403U);
@@ -84,6 +86,8 @@ TEST(HttpGuard, KnowsItsOwnMachineAndTheBoundsOfNames)
     EXPECT_EQ(hostNameIn(std::string(253, 'a')), std::string(253, 'a'));
     EXPECT_EQ(hostNameIn(std::string(254, 'a')), std::nullopt);
     EXPECT_EQ(hostNameIn("a:12345"), "a");
+    EXPECT_EQ(hostNameIn("[::1]x80"), std::nullopt);
+    EXPECT_EQ(hostNameIn("[::1]"), "::1");
     EXPECT_EQ(hostNameIn("a_b-c.d:1"), "a_b-c.d");
     HttpRequest const request = requestWith("GET", {{"cookie", "ab;a=;  b=x=y ;"}, {"other", "c=1"}});
     EXPECT_EQ(cookieIn(request, "a"), "");

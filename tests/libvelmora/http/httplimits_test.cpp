@@ -181,6 +181,28 @@ TEST(HttpServer, TakesAPlaceAgainAtOnce)
     EXPECT_THAT(httpGet(port, "/a"), StartsWith("HTTP/1.1 404")) << "the one that failed before";
 }
 
+TEST(HttpRoutes, GoByTheWholePathThenByTheLongestThatFits)
+{
+    velmora::HttpRoutes routes;
+    for (char const* const path : {"/*", "/files/*", "/files/x", "/files/x/*", "/files*"}) {
+        routes.add("POST", path, [path](HttpRequest const&) { return answerOf(path); });
+    }
+    auto const answer = [&routes](char const* method, char const* path) {
+        HttpRequest request;
+        request.method = method;
+        request.path = path;
+        HttpResponse const response = routes.answer(request);
+        return response.status == 200 ? response.body : std::to_string(response.status);
+    };
+    EXPECT_EQ(answer("POST", "/files/x"), "/files/x");
+    EXPECT_EQ(answer("POST", "/files/y"), "/files/*");
+    EXPECT_EQ(answer("POST", "/files/x/y"), "/files/x/*");
+    EXPECT_EQ(answer("POST", "/files"), "/files*");
+    EXPECT_EQ(answer("POST", "/"), "/*");
+    EXPECT_EQ(answer("POST", ""), "404");
+    EXPECT_EQ(answer("HEAD", "/"), "405") << "there is no GET whose head could be told";
+}
+
 TEST(HttpStreams, HoldForASlowReaderUpToTheirLimit)
 {
     HttpLimits limits;

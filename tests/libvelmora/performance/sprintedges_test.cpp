@@ -286,4 +286,31 @@ TEST(PowerModelReadings, GiveNoPowerWithoutAnEngineSpeed)
     }
 }
 
+// The library keeps the last speeds of a module; those of a run before are none of the next.
+TEST(PowerModelReadings, BeginAnewWithEachModel)
+{
+    support::FakeClock clock;
+    auto const ecu = std::make_shared<support::FakeEcu>(0x7E8);
+    ecu->setSupported(obd::ObdMode::CurrentData, {0x0C, 0x0D});
+    obd::VelmoraSettings const settings{std::make_shared<support::MemorySettings>()};
+    int millis = 1000000;
+    auto const outputs = [&](unsigned char end) {
+        PowerModel model(ecu, settings);
+        std::string text;
+        for (unsigned char kmh = 36; kmh < end; ++kmh) {
+            clock.advance(100);
+            millis += 100;
+            model.take(boardReading(0x7E8, {0x41, 0x0C, 0x2E, 0xE0}, millis));
+            if (auto const output = model.take(boardReading(0x7E8, {0x41, 0x0D, kmh}, millis))) {
+                text += std::to_string(std::lround(output->kilowatt)) + "/" +
+                        std::to_string(std::lround(output->newtonMetre)) + " ";
+            }
+        }
+        return text;
+    };
+    std::string const first = outputs(70);
+    EXPECT_NE(first, "");
+    EXPECT_EQ(outputs(70), first) << "though it was at 70 km/h a moment ago";
+}
+
 } // namespace

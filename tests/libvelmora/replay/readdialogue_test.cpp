@@ -75,6 +75,14 @@ TEST(DialogueRecording, WithoutTimesIsNone)
     EXPECT_FALSE(dialogueOf("-> 010C\n<- 7E8 04 41 0C 1A F8\\r\\r>\n-> 010C\n<- 7E8 04 41 0C 1B 58\\r\\r>\n"));
     EXPECT_FALSE(dialogueOf("-> 03\n.. 500\n<- 7E8 02 43 00\\r\\r>\n")) << "no values at all";
     EXPECT_THROW(dialogueOf("-- 010C\n"), velmora::Error);
+    testsupport::TemporaryFolder const folder;
+    std::ofstream(folder.file("car.dialogue")) << dialogueHead
+                                               << "-> 0120\n<- 7E8 06 41 20 80 00 00 00\\r\\r>\n-> 01\n"
+                                                  "<- NO DATA\\r\\r>\n";
+    EXPECT_FALSE(velmora::readDialogue(folder.file("car.dialogue"), []() -> std::shared_ptr<velmora::Session> {
+        ADD_FAILURE() << "nothing is opened for a dialogue that holds no values, but only what there would be";
+        return nullptr;
+    }));
 }
 
 } // namespace

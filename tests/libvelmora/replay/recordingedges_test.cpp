@@ -247,6 +247,13 @@ TEST(RecordingPlayer, EndsWhenAllHasBeenTold)
     EXPECT_TRUE(player.atEnd());
     player.setSpeed(-1.0);
     EXPECT_EQ(player.speed(), RecordingPlayer::slowest);
+    Recording longer = one;
+    longer.end += 500;
+    RecordingPlayer waiting(longer);
+    waiting.advance(0.0, [](std::size_t, RecordedValue const&) {});
+    EXPECT_FALSE(waiting.atEnd()) << "its last moments tell nothing";
+    waiting.advance(0.5, [](std::size_t, RecordedValue const&) {});
+    EXPECT_TRUE(waiting.atEnd());
     Recording const none;
     EXPECT_TRUE(RecordingPlayer(none).atEnd());
 }

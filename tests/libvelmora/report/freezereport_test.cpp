@@ -35,6 +35,22 @@ TEST(FreezeReportView, ShowsCodeThenNamesValuesAndUnits)
                                         "  Freeze frame   2: unreadable\n");
 }
 
+TEST(FreezeReportView, GivesTheCodeThatSetItTheMakersMeaning)
+{
+    FreezeReport report{0, TopicAnswer::Read,
+                        FreezeFrame{{"P1105", "Powertrain", {{"Acura", "A"}, {"Ford", "F"}}}, {}}};
+    auto const text = [&report](MakerChoice const& maker) {
+        applyMaker(report, maker);
+        return toText(report, Style());
+    };
+    EXPECT_EQ(text({MakerChoice::By::Vin, "Ford"}), "  Freeze frame   0\n    P1105  Ford           F\n");
+    EXPECT_EQ(text({MakerChoice::By::Guess, "Ford"}),
+              "  Freeze frame   0\n    P1105  -              maker-specific, 2 meanings\n");
+    FreezeReport none{0, TopicAnswer::Silent, std::nullopt};
+    applyMaker(none, {MakerChoice::By::Vin, "Ford"});
+    EXPECT_FALSE(none.frame);
+}
+
 TEST(FreezeReportView, JsonHasNullForWhatIsMissing)
 {
     auto const json = nlohmann::json::parse(toJson(modules));

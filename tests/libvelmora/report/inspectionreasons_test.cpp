@@ -100,6 +100,7 @@ TEST(InspectionReasons, OfEurope)
     EXPECT_EQ(reasonsOf({codedModule(false)}, InspectionRule::DeAu),
               (Reasons{"the lamp is not commanded on", "2 confirmed codes: P0420, P0300", free}));
     EXPECT_EQ(reasonsOf({soundModule()}, InspectionRule::DeAu), (Reasons{"the lamp is not commanded on", free}));
+    EXPECT_FALSE(inspected({soundModule()}, InspectionRule::UkMot).yearByVin);
     EXPECT_FALSE(inspected({soundModule()}, InspectionRule::UkMot, 2012).modelYear) << "it does not go by the year";
 }
 

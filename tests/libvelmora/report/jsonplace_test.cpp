@@ -117,6 +117,18 @@ TEST(ReportParser, TakesNumbersUpToTheirEnds)
     }
 }
 
+TEST(ReportParser, KeepsWhyALampWasNotTold)
+{
+    ModuleReport module = soundModule();
+    module.codes.lamp.reset();
+    for (TopicAnswer const answer : {TopicAnswer::Silent, TopicAnswer::NotOffered, TopicAnswer::Unreadable}) {
+        module.codes.lampAnswer = answer;
+        VehicleReport const report = vehicleOf({module});
+        EXPECT_EQ(parseReport(Json::parse(report.toJson())).toJson(), report.toJson());
+        EXPECT_EQ(Json::parse(report.toJson())["modules"][0]["codes"]["lampAnswer"], answerWord(answer));
+    }
+}
+
 TEST(ReportParser, TakesCodesOfAListThatWasReadAlone)
 {
     Json const codes = Json::parse(R"([{"code": "P0420", "system": "Powertrain", "meanings": []}])");

@@ -176,6 +176,16 @@ TEST(ReportDocument, ReplacesWhatIsNoText)
                                      "\xC2\x9F", "\x1F", "\xF5\x80\x80\x80", "\xC2"}) {
         EXPECT_TRUE(escapedHtml("a" + broken).starts_with("a\xEF\xBF\xBD")) << testing::PrintToString(broken);
     }
+    std::string const sign = "\xEF\xBF\xBD";
+    EXPECT_EQ(escapedHtml("\x80\x80"), sign + sign) << "bytes that go on with nothing";
+    EXPECT_EQ(escapedHtml("\xC3"
+                          "A"),
+              sign + "A");
+    EXPECT_EQ(escapedHtml("\xE2\x82"
+                          "A"),
+              sign + sign + "A");
+    EXPECT_EQ(escapedHtml("\xFF&"), sign + "&amp;");
+    EXPECT_EQ(escapedHtml("\x01\x02<"), sign + sign + "&lt;");
     EXPECT_EQ(escapedHtml("\u00E9 \u20AC \U0001F697"), "\u00E9 \u20AC \U0001F697");
     EXPECT_EQ(escapedHtml("\"<&>'"), "&quot;&lt;&amp;&gt;'");
 }

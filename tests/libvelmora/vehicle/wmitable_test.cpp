@@ -52,6 +52,22 @@ TEST(WmiTable, TakesTheLongestRowAndNoneOfSmallMakers)
     EXPECT_EQ(countryOfWmi("V"), "");
 }
 
+TEST(WmiTable, TellsTheRegionByTheFirstCharacter)
+{
+    std::string const characters = "0123456789ABCDEFGHIJKLMNOPQRSTUVWXYZ";
+    std::string regions;
+    for (char const first : characters) {
+        regions += regionOfWmi(std::string(1, first)).substr(0, 2);
+        regions += ",";
+    }
+    EXPECT_EQ(regions,
+              ",No,No,No,No,No,Oc,No,So,So,Af,Af,Af,,,,,As,,As,As,As,As,As,As,As,As,As,Eu,Eu,Eu,Eu,Eu,Eu,Eu,Eu,");
+    EXPECT_EQ(regionOfWmi(""), "");
+    EXPECT_EQ(countryOfWmi("WV"), "Germany");
+    EXPECT_EQ(countryOfWmi("4A"), "United States");
+    EXPECT_EQ(countryOfWmi("LZ"), "China");
+}
+
 TEST(PidTitles, NameWhatTheStandardNamesAndNumberTheRest)
 {
     EXPECT_EQ(pidTitle(0xA6), "Odometer");
