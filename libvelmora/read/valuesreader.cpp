@@ -133,10 +133,10 @@ void readValuesAgain(Session& session, obd::IEcu const& ecu, std::shared_ptr<Gro
         });
         if (known == values.end()) {
             values.push_back(std::move(later));
-            continue;
+        } else {
+            known->value = later.value;
+            known->samples.insert(known->samples.end(), later.samples.begin(), later.samples.end());
         }
-        known->value = later.value;
-        known->samples.insert(known->samples.end(), later.samples.begin(), later.samples.end());
     }
 }
 

@@ -153,6 +153,62 @@ TEST_F(PollGuestTest, InputsThatCameTogetherAreAsFreshAsOthers)
     EXPECT_TRUE(m_results.back().readings.front().raw.empty()) << "it has no reply of its own";
 }
 
+TEST_F(PollGuestTest, InputsOfTheLastTurnAreNotThoseOfThis)
+{
+    want(obd::ParameterIdentifier::Torque);
+    m_proxy->answer("01 0C", "41 0C 1A F8");
+    m_proxy->answer("01 0D", "41 0D 50");
+    m_proxy->answer("01 0C 0D", "41 0C 1A F8 0D 50");
+    run(fastSix, 240);
+    for (char const* const request : {"01 0C", "01 0D", "01 0C 0D"}) {
+        m_proxy->fail(request, FakeProxy::Status::NoResponse);
+    }
+    std::size_t const told = count(0x7E8, obd::ParameterIdentifier::Torque);
+    run(fastSix, 480);
+    EXPECT_EQ(count(0x7E8, obd::ParameterIdentifier::Torque), told);
+}
+
+TEST_F(PollGuestTest, InputsThatAModuleLeavesOutAreAskedForAlone)
+{
+    want(obd::ParameterIdentifier::Torque);
+    m_proxy->answer("01 0C", "41 0C 1A F8");
+    m_proxy->answer("01 0D", "41 0D 50");
+    m_proxy->answer("01 0C 0D", "41 0C 1A F8"); // an adapter that cuts the request after its first PID
+    run(fastSix, 480);
+    EXPECT_EQ(m_proxy->count("01 0C 0D"), 1);
+    EXPECT_GT(count(0x7E8, obd::ParameterIdentifier::Torque), 15U);
+    m_proxy->forgetRequests();
+    m_proxy->fail("01 0C", FakeProxy::Status::NoResponse);
+    run(fastSix, 30);
+    EXPECT_EQ(m_proxy->count("01 0C"), m_proxy->count("01 0D")) << "each once a turn";
+}
+
+// What a value keeps is of its own drive.
+TEST_F(PollGuestTest, ValuesBeginAnewWithEachPoller)
+{
+    want(obd::ParameterIdentifier::BoostPressure);
+    m_proxy->answer("01 0B", "41 0B C8");
+    m_proxy->answer("01 33", "41 33 64");
+    run(careful, 200);
+    EXPECT_NEAR(std::stod(last(0x7E8, obd::ParameterIdentifier::BoostPressure)), 100.0, 1.0);
+    m_cycle.reset();
+    m_results.clear();
+    m_proxy->answer("01 0B", "41 0B 65");
+    run(careful, 40);
+    EXPECT_NEAR(std::stod(last(0x7E8, obd::ParameterIdentifier::BoostPressure)), 1.0, 1.0) << "no mean with those";
+}
+
+TEST_F(PollGuestTest, TimesThatComeAsTextsAreNumbers)
+{
+    want(0x1F);
+    want(0x1C);
+    m_proxy->answer("01 1F", "41 1F 01 00");
+    m_proxy->answer("01 1C", "41 1C 06");
+    run(careful, 100);
+    EXPECT_EQ(std::get<double>(m_results[0].readings[0].value), 256.0);
+    EXPECT_TRUE(std::holds_alternative<std::string>(m_results[1].readings[0].value)) << "a standard's name";
+}
+
 TEST_F(PollGuestTest, ReadingsSayWithHowManyDigitsTheyAreTold)
 {
     want(0x34);

@@ -86,6 +86,19 @@ TEST(PollOrder, RatesGoFirstAndEachFourthTurnBelongsToTheRest)
     EXPECT_EQ(order, "111011101");
 }
 
+TEST(PollOrder, WhatIsReleasedAtThisMomentMayGo)
+{
+    DeadlineScheduler scheduler;
+    for (int i = 0; i < 4; ++i) {
+        scheduler.add(1000.0, at(0));
+    }
+    scheduler.add({}, at(100));
+    for (std::size_t i = 0; i < 3; ++i) {
+        scheduler.started(i, at(100));
+    }
+    EXPECT_EQ(scheduler.next(at(100))->task, 4U);
+}
+
 TEST(PollOrder, ANewRateBeginsAtOnce)
 {
     RateMeter two;

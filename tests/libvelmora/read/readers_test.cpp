@@ -1,15 +1,18 @@
 // What the readers of single topics tell of a simulated car, and how soon they end when they are told to.
+#include "libvelmora/poll/vehiclepoll.h"
 #include "libvelmora/read/codeclearing.h"
 #include "libvelmora/read/codereader.h"
 #include "libvelmora/read/diagnosticreaders.h"
 #include "libvelmora/read/freezereader.h"
 #include "libvelmora/read/groupedpids.h"
+#include "libvelmora/read/makerreader.h"
 #include "libvelmora/read/modulereader.h"
 #include "libvelmora/read/routinereader.h"
 #include "libvelmora/read/valuesreader.h"
 #include "libvelmora/read/vehiclereader.h"
 #include "tests/libvelmora/read/readersfixture.h"
 
+#include <obd/iecumanager.h>
 #include <velmora/error.h>
 
 #include <algorithm>
@@ -84,6 +87,19 @@ protected:
         return "none";
     }
 };
+
+TEST_F(InterruptedReaders, DoNotBeginTheNextModule)
+{
+    Session& session = connect("petrol-can11");
+    int read = 0;
+    EXPECT_THROW(readModules(session,
+                             [&read](Session& each, obd::IEcu const& /*ecu*/) {
+                                 each.interrupt();
+                                 return ++read;
+                             }),
+                 Error);
+    EXPECT_EQ(read, 1);
+}
 
 TEST_F(ReadersOfTopics, TellAVehicleWithTheMeaningsOfAMaker)
 {
@@ -166,6 +182,64 @@ TEST_F(ReadersOfTopics, TellSerialAndTravel)
     EXPECT_TRUE(beside.sinceCleared.distance);
     EXPECT_TRUE(beside.sinceCleared.runTime);
     EXPECT_EQ(std::count(m_asked.begin(), m_asked.end(), "0121"), 0);
+}
+
+TEST_F(ReadersOfTopics, AskForTheVinOnce)
+{
+    connect("petrol-can11");
+    readMaker(*m_session, "");
+    EXPECT_EQ(std::count_if(m_asked.begin(), m_asked.end(), [](auto const& each) { return each.starts_with("0902"); }),
+              1)
+        << "the first module told it";
+    m_asked.clear();
+    EXPECT_EQ(readMaker(*m_session, "Ford").maker, "Ford");
+    EXPECT_TRUE(m_asked.empty());
+}
+
+TEST_F(ReadersOfTopics, AddValuesThatWereNotThereAtFirst)
+{
+    connect("petrol-can11");
+    auto const bus = std::make_shared<GroupedPids>(m_session->proxy(), module().id());
+    std::vector<LiveValue> values;
+    readValuesAgain(*m_session, module(), bus, values);
+    ASSERT_GT(values.size(), 5U);
+    std::size_t const all = values.size();
+    std::string const first = values[0].value;
+    values[0].value = "?";
+    readValuesAgain(*m_session, module(), bus, values);
+    EXPECT_EQ(values.size(), all);
+    EXPECT_EQ(values[0].value, first) << "the last reading";
+    auto const rpm = std::find_if(values.begin(), values.end(), [](auto const& each) { return each.pid == 0x0C; });
+    ASSERT_NE(rpm, values.end());
+    EXPECT_EQ(rpm->samples.size(), 2U);
+    EXPECT_EQ(rpm->name, "Engine RPM");
+    EXPECT_EQ(rpm->unit, "rpm");
+    EXPECT_EQ(rpm->part, 0);
+}
+
+// The poller's pace depends on the model year where old modules must not be asked too often.
+TEST_F(ReadersOfTopics, LeaveTheModuleThatWasCurrent)
+{
+    connect("petrol-can11");
+    obd::IEcuManager& manager = *m_session->obd().getEcuManager();
+    manager.setCurrentEcu(0x7E9);
+    std::vector<ModuleOffer> offers = moduleOffers(m_session->obd(), {});
+    ASSERT_EQ(offers.size(), 2U);
+    EXPECT_FALSE(offers[0].meant);
+    EXPECT_TRUE(offers[1].meant) << "the current one";
+    EXPECT_GT(offers[0].sensors.size(), offers[1].sensors.size());
+    EXPECT_EQ(manager.getCurrentEcu()->id(), 0x7E9U);
+    offers = moduleOffers(m_session->obd(), {0x7E8});
+    EXPECT_TRUE(offers[0].meant);
+    EXPECT_FALSE(offers[1].meant);
+    auto const asksForTheVin = [this] {
+        m_asked.clear();
+        pollVehicle(m_session->obd(), {}, {}, Units::Metric, [](PollResult const& /*result*/) {}).reset();
+        return std::any_of(m_asked.begin(), m_asked.end(), [](auto const& each) { return each.starts_with("0902"); });
+    };
+    EXPECT_FALSE(asksForTheVin());
+    connect("petrol-vpw");
+    EXPECT_TRUE(asksForTheVin());
 }
 
 TEST_F(ReadersOfTopics, TellWhichRoutinesCanBeRun)

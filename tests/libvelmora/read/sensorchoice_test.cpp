@@ -149,6 +149,13 @@ TEST(SensorChoice, AnUnknownWordIsWrongUseWithWhatIsNear)
     }
 }
 
+TEST(SensorChoice, AWholeTitleGoesBeforeOneThatHoldsIt)
+{
+    std::vector<OfferedSensor> const speeds = {sensor(0x5D, "Wheel Speed"), sensor(0x5E, "Wheel Speed Limit")};
+    EXPECT_THAT(chooseSensors({"wheel speed"}, speeds), ElementsAre(obd::ParameterIdentifier(0x5D).id()));
+    EXPECT_THAT(chooseSensors({"speed limit"}, speeds), ElementsAre(obd::ParameterIdentifier(0x5E).id()));
+}
+
 TEST(SensorChoice, SuggestsWhatIsNearAndWhereToLook)
 {
     std::string const list = "`velmora sensors` lists what the vehicle offers";

@@ -3,6 +3,7 @@
 #include "tests/support/temporaryfolder.h"
 
 #include <velmora/error.h>
+#include <velmora/settingsfile.h>
 
 #include <gtest/gtest.h>
 
@@ -64,6 +65,19 @@ TEST(SensorLimits, SayWhatTheyLack)
                                   std::string("a{"), std::string("a/"), std::string("a:")}) {
         EXPECT_THROW(limitKey(id), Error) << id;
     }
+}
+
+TEST(SettingsFile, IsOnTheDiskAfterEachChange)
+{
+    testsupport::TemporaryFolder const folder;
+    std::string const path = folder.file("settings.toml");
+    SettingsFile(path).setText("own/word", "text");
+    EXPECT_EQ(SettingsFile(path).text("own/word"), "text");
+    SettingsFile file(path);
+    file.setNumber("own/number", 7);
+    EXPECT_EQ(SettingsFile(path).number("own/number"), 7);
+    file.set("displacement", "1.6");
+    EXPECT_EQ(SettingsFile(path).setting("displacement").value, "1.60");
 }
 
 TEST(SensorLimits, AreKeptInTheSettings)

@@ -68,9 +68,16 @@ TEST(ModuleAnswers, AreWaitedForByTheAdapterAlone)
     asker.ask(canModule("7E4"), {0x22, 1, 6});
     EXPECT_EQ(bench.takeAsked().size(), 1U) << "longer than that nobody can wait";
     EXPECT_FALSE(bench.addresses().back().adaptive);
+    auto const isBare = [](ModuleAnswer const& answer) {
+        return answer.module == 0 && answer.code == 0 && answer.payload.empty() && !answer.detail.empty();
+    };
+    EXPECT_TRUE(isBare(asker.ask(canModule("7E4"), {0x2E, 1, 6, 0}))) << "it is not sent";
     bench.fallMute();
+    EXPECT_TRUE(isBare(asker.ask(canModule("7E4"), {0x22, 1, 6})));
     EXPECT_EQ(describe(asker.ask(canModule("7E4"), {0x22, 1, 6})),
               "brings trouble on the bus: the adapter does not answer");
+    bench.refuseAddress("ATFCSM1");
+    EXPECT_TRUE(isBare(asker.ask(canModule("7E4"), {0x22, 1, 6})));
 }
 
 TEST(ModuleAnswers, MayBeInPiecesOrOutOfOrder)
