@@ -24,8 +24,8 @@ inline std::vector<std::string> wordsOf(std::string const& text)
     return {std::istream_iterator<std::string>(in), {}};
 }
 
-// Runs the program's main, but for its locale, with nobody at the keyboard.
-inline velmora::cli::ExitCode runMain(std::vector<std::string> const& words)
+// Runs the program's main, but for its locale.
+inline velmora::cli::ExitCode runMainAsItIs(std::vector<std::string> const& words)
 {
     std::vector<char const*> arguments = {"velmora"};
     for (std::string const& word : words) {
@@ -33,12 +33,18 @@ inline velmora::cli::ExitCode runMain(std::vector<std::string> const& words)
     }
     SignalsAsBefore const signals;
     velmora::cli::Interrupt const interrupt;
-    int const nobody = ::open("/dev/null", O_RDONLY | O_CLOEXEC);
-    Replaced const input(STDIN_FILENO, nobody);
-    ::close(nobody);
     velmora::cli::CommandLine commandLine;
     velmora::cli::addCommands(commandLine);
     return commandLine.run(static_cast<int>(arguments.size()), arguments.data());
+}
+
+// The same with nobody at the keyboard.
+inline velmora::cli::ExitCode runMain(std::vector<std::string> const& words)
+{
+    int const nobody = ::open("/dev/null", O_RDONLY | O_CLOEXEC);
+    Replaced const input(STDIN_FILENO, nobody);
+    ::close(nobody);
+    return runMainAsItIs(words);
 }
 
 inline Ended runLine(std::vector<std::string> const& words)

@@ -68,4 +68,21 @@ TEST_F(PlayedLines, OfJsonHaveTheRecordingsTime)
               "\"value\":1000,\"unit\":\"rpm\",\"minimum\":800,\"mean\":900,\"maximum\":1000,\"sensor\":\"RPM\"}\n");
 }
 
+TEST_F(PlayedLines, OfARecordingThatIsCutOrHasNoDateSaySo)
+{
+    std::istringstream in("time,7E8 RPM (rpm)\n2024-03-07T09:05:00.000Z,800\n");
+    Recording recording = readCsv(in);
+    recording.cut = true;
+    recording.dated = false;
+    GlobalOptions options;
+    options.json = true;
+    PlayRun run(options, "drive.csv", recording, {}, 1.0);
+    testing::internal::CaptureStdout();
+    testing::internal::CaptureStderr();
+    run.run();
+    EXPECT_EQ(testing::internal::GetCapturedStderr(),
+              "The recording holds more than can be played; its end is left out\n");
+    EXPECT_EQ(testing::internal::GetCapturedStdout().substr(0, 27), "{\"time\":null,\"module\":\"7E8\"");
+}
+
 } // namespace

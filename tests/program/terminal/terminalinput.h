@@ -58,6 +58,12 @@ public:
         }
         m_keyboard = -1;
     }
+    // Whether anything is written to it within a time.
+    bool hasOutput(int milliseconds) const
+    {
+        pollfd output{m_keyboard, POLLIN, 0};
+        return ::poll(&output, 1, milliseconds) > 0;
+    }
     // What was written to the terminal up to now.
     std::string shown() const
     {
