@@ -194,6 +194,8 @@ def changes_how_a_car_is_shown():
     until_seen("performance", "0 to 60 mph")
     press("s")
     until_seen("no choice there", "Speed and engine speed alone are read here; p goes back to the values")
+    press("e")
+    until_seen("nothing to export", "There is no run yet")
     press("p", "u")
     until_seen("metric again", r"^Vehicle Speed Sensor +\d+ km/h ")
     until_seen("big digits", "[▀▄█]{3}")

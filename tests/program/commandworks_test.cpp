@@ -3,6 +3,7 @@
 
 #include <nlohmann/json.hpp>
 
+#include <set>
 #include <sys/stat.h>
 
 namespace {
@@ -110,6 +111,44 @@ TEST_F(CommandRun, TheTrafficIsShownAndWritten)
     EXPECT_EQ(run("@B --log @F/log --trace @F/trace info").code, ExitCode::Done);
     EXPECT_TRUE(std::regex_search(m_folder.read("trace"), std::regex("^\\d\\d:\\d\\d:\\d\\d\\.\\d{3} >> ATI\\\\r\n")));
     EXPECT_GT(m_folder.read("log").size(), 500U);
+}
+
+TEST_F(CommandRun, TheTrafficEndsWithWhatWasAskedFor)
+{
+    std::string const told = run("@B --sleep log --duration 0.1").out;
+    EXPECT_THAT(told, HasSubstr(" >> ATI\n"));
+    EXPECT_THAT(told, testing::Not(HasSubstr(" >> ATLP"))) << "how the connection is ended is nobody's question";
+    std::string const lines = run("@B --json log -n 1 RPM").out;
+    EXPECT_EQ(json::parse(lines.substr(0, lines.find('\n')))["direction"], "sent");
+}
+
+TEST_F(CommandRun, ADialogueIsRecorded)
+{
+    Ended const loud = run("-p sim:@F/bare.toml?instant record @F/a.dialogue");
+    EXPECT_TRUE(std::regex_search(
+        loud.err, std::regex("\nRecorded [1-9]\\d+ requests and commands to " + m_folder.file("a.dialogue") + "\n$")))
+        << loud.err;
+    EXPECT_THAT(loud.out, StartsWith("Adapter\n  Device         ELM327 v1.5\n"));
+    EXPECT_EQ(run("@B record @F/b.dialogue").err, "");
+    EXPECT_GT(m_folder.read("b.dialogue").size(), 500U);
+    Ended const none = run("-p sim:no-such-car record @F/c.dialogue");
+    EXPECT_EQ(static_cast<int>(none.code), 3);
+    EXPECT_THAT(none.err, testing::Not(HasSubstr("Recorded"))) << "there was nothing";
+}
+
+TEST_F(CommandRun, OfSeveralModulesTheChosenOnesAreRead)
+{
+    auto const modules = [this](std::string const& choice) {
+        std::set<std::string> all;
+        std::istringstream lines(run("-q -p sim:petrol-can11?instant " + choice + " --json live -n 2 05").out);
+        for (std::string line; std::getline(lines, line);) {
+            all.insert(json::parse(line)["module"]);
+        }
+        return all;
+    };
+    EXPECT_THAT(modules(""), ElementsAre("7E8"));
+    EXPECT_THAT(modules("--ecu 7E9"), ElementsAre("7E9"));
+    EXPECT_THAT(modules("--ecu all"), ElementsAre("7E8", "7E9"));
 }
 
 TEST_F(CommandRun, WhatIsOfferedIsListed)
