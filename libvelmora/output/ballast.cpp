@@ -12,11 +12,11 @@ Ballast::Ballast(std::filesystem::path const& database, unsigned long long size)
 bool Ballast::keep()
 {
     std::error_code error;
-    if (std::filesystem::file_size(m_file, error) == m_size) {
+    if (std::filesystem::file_size(m_file, error) == m_size && !error) {
         return true;
     }
     std::filesystem::space_info const space = std::filesystem::space(m_file.parent_path() / ".", error);
-    if (!fits(space.available)) {
+    if (error || !fits(space.available)) {
         return false;
     }
     int const descriptor = ::open(m_file.c_str(), O_WRONLY | O_CREAT | O_CLOEXEC, 0600);

@@ -113,8 +113,8 @@ bool LineFile::openIfFits(std::filesystem::path const& file)
     while (m_size > 0 && ::pread(m_descriptor, &last, 1, static_cast<off_t>(m_size - 1)) == 1 && last != '\n') {
         --m_size;
     }
-    bool const same =
-        ::pread(m_descriptor, begin.data(), begin.size(), 0) == static_cast<ssize_t>(begin.size()) && begin == m_header;
+    bool const same = ::pread(m_descriptor, begin.data(), begin.size(), 0) == static_cast<ssize_t>(begin.size()) &&
+                      begin == m_header && m_size >= begin.size();
     if (!same) {
         close();
         return false;

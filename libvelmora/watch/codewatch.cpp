@@ -11,6 +11,7 @@ void CodeWatch::tell(std::string const& kind, unsigned int module, std::string c
 
 std::vector<Record> CodeWatch::take(CodeLook const& look, WallTime now)
 {
+    m_news.clear();
     Known& known = m_modules[look.module];
     if (look.lamp) {
         m_news.emplace_back(LampState{now, m_vehicle, look.module, *look.lamp});

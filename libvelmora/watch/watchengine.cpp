@@ -122,7 +122,6 @@ void WatchEngine::onConnected(WatchTime const& now)
     m_sink(m_car.sensors());
     m_judge.wake(now.steady);
     m_fresh = true;
-    m_lastReading = now.steady;
     lookAtCodes(now);
 }
 

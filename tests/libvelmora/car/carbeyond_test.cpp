@@ -1,8 +1,11 @@
 // A car beyond its standard sensors: offers, probes, live values with signals, silent files, an adapter that is cut
 // off.
 #include "libvelmora/car/carprobe.h"
+#include "libvelmora/car/livestate.h"
 #include "libvelmora/port/opening/openport.h"
+#include "libvelmora/session/session.h"
 #include "libvelmora/uds/identifierprobe.h"
+#include "libvelmora/uds/modulestore.h"
 #include "tests/support/temporaryfolder.h"
 
 #include <velmora/car.h>
@@ -260,6 +263,112 @@ unit = "°C"
         EXPECT_THROW(call(), Error) << "its connection is over";
     }
     EXPECT_EQ(reader->run().kilograms, 0);
+}
+
+TEST_F(CarBeyond, LiveValuesAreOfOneModuleOrTheOneThatTellsBoth)
+{
+    CarOptions chosen = raw(R"([[module]]
+id = "7E8"
+[module.raw]
+"0100" = "41 00 08 08 00 00"
+"0105" = "41 05 5A"
+"010D" = "41 0D 10"
+[[module]]
+id = "7E9"
+[module.raw]
+"0100" = "41 00 00 18 00 00"
+"010C" = "41 0C 0F A0"
+"010D" = "41 0D 10"
+)");
+    std::ofstream(m_folder.file("own.toml")) << "[[signal]]\nid = \"OWN\"\nname = \"Own\"\nheader = \"7E0\"\n"
+                                                "request = \"0105\"\nformula = \"Z\"\n";
+    chosen.signalFiles = {m_folder.file("own.toml")};
+    Car car(chosen);
+    std::unique_ptr<velmora::LiveReader> reader = car.live({.sensors = {"SPEED"}, .allModules = true});
+    EXPECT_EQ(reader->parameters().size(), 2U);
+    EXPECT_THAT(reader->modulesText(), testing::MatchesRegex("modules 7E8 .* and 7E9 .*"));
+    try {
+        reader->picked();
+        ADD_FAILURE();
+    } catch (Error const& error) {
+        EXPECT_STREQ(error.what(), "Sensors of several modules are chosen on the command line");
+    }
+    reader->beginRuns();
+    for (auto const& parameter : reader->parameters()) {
+        EXPECT_EQ(parameter[0].module, 0x7E9U) << "the other one has no engine speed";
+    }
+    EXPECT_EQ(reader->parameters().size(), 2U);
+    reader = car.live({.sensors = {"OWN"}});
+    EXPECT_EQ(reader->parameters().size(), 1U);
+    EXPECT_EQ(reader->modulesText(), "modules ");
+    EXPECT_TRUE(reader->words().empty());
+    try {
+        reader->offers();
+        ADD_FAILURE();
+    } catch (Error const& error) {
+        EXPECT_STREQ(error.what(), "Signals are chosen on the command line");
+    }
+    std::string troubles;
+    for (int i = 0; i < 1000 && troubles.empty(); ++i) {
+        reader->wait(std::chrono::milliseconds(5));
+        reader->take();
+        troubles = reader->signalTroubles();
+    }
+    EXPECT_TRUE(troubles.starts_with("OWN: replies without a value: ") || troubles.starts_with("OWN ")) << troubles;
+}
+
+TEST_F(CarBeyond, AFeedThatWasStoppedBringsNothingMore)
+{
+    velmora::Session session{velmora::SessionOptions(options())};
+    session.connect();
+    velmora::LiveState state(session, {.sensors = {"RPM"}});
+    std::shared_ptr<velmora::LiveFeed> const feed = state.feed();
+    EXPECT_TRUE(feed->wait(std::chrono::seconds(20)));
+    feed->stop();
+    feed->take();
+    EXPECT_FALSE(feed->wait(std::chrono::milliseconds(150)));
+    EXPECT_EQ(feed->rates().size(), 1U) << "as they were";
+    feed->stop();
+    state.drop();
+    state.drop();
+}
+
+TEST_F(CarBeyond, ModulesThatAreRememberedAreAskedWithoutASearch)
+{
+    std::string const vin = "VELMRAS1M60000022";
+    velmora::ModuleStore const store(velmora::ModuleStore::besides(m_folder.file("settings.toml")));
+    store.keep(vin, {{"743", "763", "", "", "", {}}, {"7D6", "7DE", "", "", "", {}}});
+    std::string progress;
+    CarOptions chosen = options("petrol-can11-modules");
+    chosen.onProgress = [&progress](std::string const& lines) { progress += lines; };
+    Car car(chosen);
+    progress.clear();
+    std::vector<velmora::FoundModule> const found = car.findModules({false, true});
+    EXPECT_EQ(progress, "These are remembered of this vehicle; --scan looks anew\n");
+    ASSERT_EQ(found.size(), 2U);
+    EXPECT_EQ(found[0].part, "28400-S1004");
+    EXPECT_EQ(found[0].software, "BCM-0023");
+    EXPECT_EQ(found[0].identifiers.at(0xF187), "28400-S1004");
+    EXPECT_EQ(found[1].codes, 1U);
+    EXPECT_EQ(store.find(vin).value_or(std::vector<velmora::FoundModule>()).at(0).part, "28400-S1004");
+    EXPECT_TRUE(car.findModules({})[0].identifiers.empty()) << "nobody asked for them";
+
+    std::vector<velmora::UdsModuleReport> const codes = car.udsCodes();
+    ASSERT_EQ(codes.size(), 4U) << "those of the connection, and those that are remembered";
+    EXPECT_EQ(codes[0].module, "7E8");
+    ASSERT_EQ(codes[0].codes.size(), 1U);
+    EXPECT_EQ(codes[0].codes[0].code, "P0133");
+    EXPECT_EQ(codes[0].codes[0].status, 0xAF);
+    EXPECT_FALSE(codes[0].codes[0].states.empty());
+    EXPECT_TRUE(codes[0].available) << "which of the states it tells";
+    EXPECT_TRUE(codes[0].format);
+    EXPECT_FALSE(codes[0].byService18);
+    EXPECT_EQ(codes[3].module, "7DE");
+    EXPECT_TRUE(codes[3].byService18);
+    ASSERT_EQ(codes[3].codes.size(), 1U);
+    EXPECT_EQ(codes[3].codes[0].hex, "4155");
+    EXPECT_EQ(codes[3].codes[0].status, 0x60);
+    EXPECT_EQ(car.identifiers()[0].report.at(0xF190), vin);
 }
 
 TEST_F(CarBeyond, ALogThatCouldNotBeWrittenIsTold)

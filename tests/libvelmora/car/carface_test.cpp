@@ -163,9 +163,9 @@ TEST(CarFace, IsRecordedWithoutItsVinAndWithoutItsEnd)
         vin = car.info()[0].report.vin;
         car.askSensors();
     }
-    EXPECT_GT(recorder->save("test\ncar"), 20U);
+    EXPECT_GT(recorder->save(std::string("te\0st\ncar", 9)), 20U);
     std::string const text = wholeFile(file);
-    EXPECT_NE(text.find("test car"), std::string::npos) << "on one line";
+    EXPECT_NE(text.find("te st car"), std::string::npos) << "on one line";
     EXPECT_NE(text.find("ELM327"), std::string::npos) << "the adapter names itself";
     EXPECT_EQ(text.find("ATLP"), std::string::npos) << "closing is no part of it";
 
@@ -218,6 +218,19 @@ TEST(CarFace, TellsOfAFileThatItCouldNotWrite)
     {
         Car const car(options);
     }
+    EXPECT_EQ(unwritten, std::vector<std::string>{"/dev/full"});
+}
+
+TEST(CarFace, TellsAFileThatItCouldNotWriteOfACarThatDidNotAnswer)
+{
+    testsupport::TemporaryFolder const folder;
+    std::ofstream(folder.file("silent.toml"))
+        << "name = \"a car that is silent\"\nprotocol = 6\n[[module]]\nid = \"7E8\"\n";
+    std::vector<std::string> unwritten;
+    CarOptions options = instantCar(folder.file("silent.toml"));
+    options.traceFile = "/dev/full";
+    options.onUnwritten = [&unwritten](std::string const& file) { unwritten.push_back(file); };
+    EXPECT_EQ(kindThrown([&] { Car const car(options); }), ErrorKind::VehicleSilent);
     EXPECT_EQ(unwritten, std::vector<std::string>{"/dev/full"});
 }
 

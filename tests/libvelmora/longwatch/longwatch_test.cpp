@@ -110,6 +110,12 @@ TEST_F(LongWatchTest, TellsItsServiceManagerAndEndsTheTripUnderWay)
     velmora::test::Manager const manager("@velmora-longwatch-" + std::to_string(::getpid()));
     ::setenv("WATCHDOG_USEC", "2000", 1);
     m_options.outputs.push_back("csv-long:" + m_folder.file("watch.csv"));
+    m_options.outputs.push_back("dash:127.0.0.1:0?allow_clear=yes");
+    std::vector<velmora::PageLink> links;
+    m_options.onPage = [this, &links](velmora::PageLink const& link) {
+        links.push_back(link); // read when all outputs have ended
+        m_told.add("page");
+    };
     LongWatch watch(m_options);
     std::atomic<bool> done = false;
     std::map<std::string, int> heard;
@@ -125,12 +131,23 @@ TEST_F(LongWatchTest, TellsItsServiceManagerAndEndsTheTripUnderWay)
     std::thread runner([&watch] { watch.run(); });
     EXPECT_TRUE(m_told.hold("engine_start: The engine runs"));
     EXPECT_TRUE(m_told.hold("running"));
+    EXPECT_TRUE(m_told.hold("page"));
     watch.reload();
     EXPECT_TRUE(m_told.hold("running", 2));
+    EXPECT_TRUE(m_told.hold("page", 2));
     watch.end();
     runner.join();
     done = true;
     listener.join();
+    ASSERT_EQ(links.size(), 2U);
+    EXPECT_TRUE(links[0].outputIsFree);
+    EXPECT_TRUE(links[0].link.starts_with("http://127.0.0.1:")) << links[0].link;
+    auto const tokenOf = [](velmora::PageLink const& page) {
+        std::size_t const at = page.link.find("#t=");
+        return at == std::string::npos ? std::string() : page.link.substr(at);
+    };
+    EXPECT_NE(tokenOf(links[0]), "");
+    EXPECT_EQ(tokenOf(links[0]), tokenOf(links[1])) << "a reload leaves links good";
     EXPECT_EQ(heard["READY=1"], 2);
     EXPECT_EQ(heard["RELOADING=1"], 1);
     EXPECT_EQ(heard["STOPPING=1"], 1);

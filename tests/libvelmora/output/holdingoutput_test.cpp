@@ -1,5 +1,6 @@
 // What stands before an output of lines while the clock may still be set.
 #include "libvelmora/output/holdingoutput.h"
+#include "libvelmora/output/recordtime.h"
 #include "tests/support/records.h"
 
 #include <gmock/gmock.h>
@@ -19,6 +20,7 @@ struct Held
     ClockLook look{march, 1000, false, "boot"};
     std::vector<std::string> calls;
     std::vector<std::string> told;
+    std::vector<std::int64_t> times;
     velmora::HoldingOutput output;
 
     Held() : output(std::make_unique<Inner>(*this), velmora::parseOutputAddress("csv:a"), context()) {}
@@ -49,6 +51,9 @@ private:
         void write(velmora::Records records) override
         {
             held.calls.push_back("write " + std::to_string(records.size()));
+            for (velmora::SharedRecord const& each : records) {
+                held.times.push_back(velmora::toMillis(velmora::timeOf(*each)));
+            }
         }
         void close() override { held.calls.emplace_back("close"); }
         velmora::OutputState state() override { return {true, 3}; }
@@ -77,6 +82,19 @@ TEST(HoldingOutput, KeepsTheOutputGoingWhileItHoldsLinesBack)
     EXPECT_THAT(held.calls, ElementsAre("write 1", "close"));
     EXPECT_EQ(held.output.state().waiting, 3U);
     EXPECT_EQ(held.told.size(), 1U);
+}
+
+TEST(HoldingOutput, RepairsNothingOnceTheClockIsRight)
+{
+    Held held;
+    held.output.open();
+    held.write(1);
+    held.look.synced = true;
+    held.write(1);
+    held.look.wall += 3600000; // summer time, by somebody's mistake
+    auto const stamped = records(reading("RPM", 1.0, march));
+    held.output.write(stamped);
+    EXPECT_THAT(held.times, ElementsAre(march, march, march));
 }
 
 TEST(HoldingOutput, TellsOnceThatNobodySetsTheClock)

@@ -93,6 +93,41 @@ TEST(LineFiles, KeepAHeaderAloneUntilItHasLines)
     EXPECT_EQ(folder.read("a"), "head\n44\n");
 }
 
+TEST(LineFiles, TakeALineOfNothing)
+{
+    TemporaryFolder const folder;
+    LineFile file(parseOutputAddress("ndjson:" + folder.file("a")));
+    EXPECT_EQ(lineTrouble(file, "\n"), "");
+    EXPECT_EQ(folder.read("a"), "\n");
+}
+
+TEST(LineFiles, MayBeStandardOutputWhichStaysOpen)
+{
+    TemporaryFolder const folder;
+    std::cout.flush();
+    std::fflush(stdout);
+    int const before = ::dup(STDOUT_FILENO);
+    int const own = ::open(folder.file("out").c_str(), O_WRONLY | O_CREAT | O_CLOEXEC, 0600);
+    ::dup2(own, STDOUT_FILENO);
+    std::string trouble;
+    {
+        LineFile file(parseOutputAddress("ndjson:-?rotate=1"));
+        file.setHeader("head\n");
+        trouble += lineTrouble(file, "1\n");
+        trouble += lineTrouble(file, "2\n");
+        file.close();
+        trouble += lineTrouble(file, "3\n");
+    }
+    bool const open = ::write(STDOUT_FILENO, "end\n", 4) == 4;
+    ::dup2(before, STDOUT_FILENO);
+    ::close(before);
+    ::close(own);
+    EXPECT_EQ(trouble, "");
+    EXPECT_TRUE(open);
+    EXPECT_EQ(folder.read("out"), "head\n1\n2\nhead\n3\nend\n");
+    EXPECT_FALSE(std::filesystem::exists("-"));
+}
+
 TEST(LineFiles, BeginAgainWhereSomebodyHasMovedThemAway)
 {
     TemporaryFolder const folder;
@@ -145,14 +180,18 @@ TEST(LineFiles, HoldNoHalfLineOfAFullDisk)
 
 int pipeEnd = -1;
 std::atomic<int> interruptions = 0;
+char drained[40000];
+std::size_t drainedSize = 0;
 
 // Makes room in the pipe from the second interruption on.
 void onInterruption(int /*signal*/)
 {
-    char buffer[4096];
-    if (++interruptions > 1) {
-        while (::read(pipeEnd, buffer, sizeof(buffer)) > 0) {
-        }
+    if (++interruptions < 2) {
+        return;
+    }
+    for (ssize_t count = 1; count > 0;) {
+        count = ::read(pipeEnd, drained + drainedSize, sizeof(drained) - drainedSize);
+        drainedSize += count > 0 ? static_cast<std::size_t>(count) : 0;
     }
 }
 
@@ -183,11 +222,17 @@ TEST(LineFiles, MayBePipes)
             ::pthread_kill(writer, SIGUSR1);
         }
     });
-    EXPECT_EQ(lineTrouble(file, std::string(20000, 'x') + "\n"), "");
+    std::string lengthy;
+    while (lengthy.size() < 20000) {
+        lengthy += std::to_string(lengthy.size()) + "\n";
+    }
+    EXPECT_EQ(lineTrouble(file, lengthy), "");
     done = true;
     interrupter.join();
     ::sigaction(SIGUSR1, &before, nullptr);
     EXPECT_GT(interruptions, 1);
+    onInterruption(0);
+    EXPECT_EQ(std::string(drained, drainedSize), lengthy);
     ::close(pipeEnd);
 }
 

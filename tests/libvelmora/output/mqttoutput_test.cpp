@@ -6,6 +6,9 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <atomic>
+#include <mutex>
+
 namespace {
 
 using testsupport::brokerContext;
@@ -129,12 +132,100 @@ TEST(MqttOutput, FallsBackToTheOldProtocolForABrokerThatHasNoOther)
     std::ofstream(folder.file("nats.conf"))
         << "server_name: one\nlisten: \"127.0.0.1:" << testsupport::freePort() << "\"\njetstream { store_dir: \""
         << folder.file("js") << "\" }\nmqtt { listen: \"127.0.0.1:" << port << "\" }\n";
-    ServerProcess const broker({"/usr/sbin/nats-server", "-c", folder.file("nats.conf")}, port);
-    MqttOutput output(velmora::parseOutputAddress(brokerText(port) + "?discovery=off"), brokerContext(folder));
+    auto broker = std::make_unique<ServerProcess>(
+        std::vector<std::string>{"/usr/sbin/nats-server", "-c", folder.file("nats.conf")}, port);
+    velmora::OutputContext context = brokerContext(folder);
+    std::atomic<int> losses = 0;
+    context.tell = [&losses](std::string const& text) { losses += text.find("no connection") != std::string::npos; };
+    MqttOutput output(velmora::parseOutputAddress(brokerText(port) + "?discovery=off"), context);
     output.open();
     output.write(records(reading("RPM", 800.0)));
     EXPECT_TRUE(isEmptied(folder));
+    EXPECT_EQ(losses, 0) << "the other protocol is no loss";
+    broker.reset();
+    EXPECT_TRUE(testsupport::comesTrue([&] { return losses == 1; }));
     output.close();
+}
+
+TEST(MqttOutput, AnswersAHomeServerThatWasStartedAndSaysGoodbye)
+{
+    TemporaryFolder const folder;
+    unsigned short const port = testsupport::freePort();
+    ServerProcess const broker(mosquittoCommand(folder, port), port);
+    std::string const publish =
+        "mosquitto_pub -h 127.0.0.1 -p " + std::to_string(port) + " -t homeassistant/status -m ";
+    {
+        MqttOutput output(velmora::parseOutputAddress(brokerText(port)), brokerContext(folder));
+        output.open();
+        output.write(records(velmora::SensorList{{}, "van", {{0x7E8, "SPEED", "010D", "Speed", "km/h"}}},
+                             reading("SPEED", 50.0)));
+        ASSERT_TRUE(isEmptied(folder));
+        EXPECT_EQ(output.state().up, true);
+        EXPECT_EQ(output.state().waiting, 0U);
+        Subscriber subscriber(port, "-t homeassistant/device/# -t homeassistant/status", 4);
+        EXPECT_TRUE(subscriber.readLine().starts_with("homeassistant/device/velmora_van/config "));
+        ASSERT_EQ(std::system((publish + "offline").c_str()), 0);
+        EXPECT_EQ(subscriber.readLine(), "homeassistant/status offline");
+        ASSERT_EQ(std::system((publish + "online").c_str()), 0);
+        EXPECT_EQ(subscriber.readLine(), "homeassistant/status online");
+        EXPECT_TRUE(subscriber.readLine().starts_with("homeassistant/device/velmora_van/config ")) << "told again";
+    }
+    EXPECT_EQ(Subscriber(port, "-t cars/van/status", 1).lines(), std::vector<std::string>{"cars/van/status offline"})
+        << "by its destruction, too";
+}
+
+TEST(MqttOutput, TellsALossInTheStreamAndWhatRefusesOnce)
+{
+    TemporaryFolder const folder;
+    std::vector<std::string> told;
+    std::mutex mutex;
+    velmora::OutputContext context = brokerContext(folder);
+    context.tell = [&](std::string const& text) {
+        std::lock_guard const lock(mutex);
+        told.push_back(text);
+    };
+    unsigned short const port = testsupport::freePort();
+    MqttOutput output(velmora::parseOutputAddress(brokerText(port) + "?discovery=off&spool_max=60k"), context);
+    output.open();
+    std::string const row(200, 'x');
+    std::vector<velmora::SharedRecord> const many(400, records(reading(row, 1.0))[0]);
+    output.write(many);
+    EXPECT_EQ(output.state().up, false);
+    EXPECT_EQ(output.state().waiting, 400U);
+    velmora::Database spool(folder.file("spool-van.db"));
+    spool.execute("CREATE TRIGGER no BEFORE INSERT ON row BEGIN SELECT RAISE(FAIL, 'no'); END");
+    EXPECT_THROW(output.write(records(reading("RPM", 1.0))), velmora::Error);
+    EXPECT_EQ(spool.number("SELECT min(seq) FROM row"), 42) << "a tenth had to go";
+    spool.execute("DROP TRIGGER no");
+    output.write(records(reading("RPM", 1.0)));
+    auto const gaps = [&spool] {
+        velmora::Statement select(spool, "SELECT text FROM row WHERE text LIKE '%gap%' ORDER BY seq");
+        std::vector<nlohmann::json> result;
+        while (select.next()) {
+            result.push_back(nlohmann::json::parse(select.text(0)));
+        }
+        return result;
+    };
+    ASSERT_EQ(gaps().size(), 1U);
+    EXPECT_EQ(gaps()[0]["event"], "gap");
+    EXPECT_EQ(gaps()[0]["from"], 1) << "from the first that was not told yet";
+    EXPECT_EQ(gaps()[0]["to"], spool.number("SELECT min(seq) FROM row") - 1);
+    EXPECT_NEAR(gaps()[0]["time"].get<double>(), static_cast<double>(velmora::lookAtClocks().wall), 60000.0);
+    for (int i = 0; i < 9; ++i) {
+        output.write({});
+    }
+    std::size_t const all = gaps().size();
+    output.write({});
+    EXPECT_EQ(gaps().size(), all) << "nothing is lost any more";
+    output.close();
+    output.close();
+    auto const times = [&](std::string const& part) {
+        return std::ranges::count_if(told,
+                                     [&](std::string const& each) { return each.find(part) != std::string::npos; });
+    };
+    EXPECT_LE(times("the spool is full: its oldest readings were dropped"), 2);
+    EXPECT_EQ(times("; readings wait in " + folder.file("spool-van.db")), 1);
+    EXPECT_TRUE(told[0].starts_with("mqtt 127.0.0.1: ")) << told[0];
 }
 
 // The machine starts in 1970, and a time server sets its clock a while later.

@@ -189,6 +189,7 @@ TEST(OutputRunner, TheEndWaitsForNoPauseAndTellsWhatIsLeft)
     EXPECT_TRUE(witness.values.empty());
     EXPECT_THAT(witness.told,
                 ElementsAre("csv:a: disk full", HasSubstr("1 records could not be written before the end")));
+    EXPECT_EQ(witness.failWrites, 999998) << "once before the pause, once at the end";
     EXPECT_TRUE(runner.counts().failing);
     EXPECT_EQ(runner.counts().lastError, "disk full");
 }

@@ -184,6 +184,21 @@ TEST(SpoolSending, ForgetsNothingThatIsKeptByALaterDelivery)
     EXPECT_EQ(sending.sent[3]["stored"], 1);
 }
 
+TEST(SpoolSending, KnowsNothingOfTheBatchesOfAConnectionThatBroke)
+{
+    Sending sending(false);
+    sending.spool.add({"[1]"});
+    sending.up();
+    sending.sender.onDown();
+    sending.spool.add({"[2]"});
+    sending.up();
+    ASSERT_EQ(sending.sent.size(), 2U);
+    EXPECT_EQ(sending.sent[1]["last"], 2) << "both at once";
+    sending.sender.onDelivered(2, sending.now);
+    EXPECT_EQ(sending.spool.rows(), 0);
+    EXPECT_FALSE(sending.sender.isUnderway());
+}
+
 TEST(SpoolSending, HasPatienceFromEachDeliveryOn)
 {
     Sending sending(false);

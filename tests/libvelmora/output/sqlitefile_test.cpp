@@ -192,6 +192,22 @@ TEST(SqliteFile, HoldsWholeNumbersAsSuchAndNoOthers)
     EXPECT_EQ(at.texts("SELECT typeof(value) || ' ' || ifnull(value, '-') FROM reading ORDER BY time"), expected);
 }
 
+TEST(SqliteFile, RepairsNothingOnceTheClockIsRight)
+{
+    DatabaseFile const at;
+    velmora::ClockLook look{march, 1000, false, "boot"};
+    SqliteOutput output(velmora::parseOutputAddress("sqlite:" + at.file), [&look] { return look; });
+    output.open();
+    output.write(records(reading("RPM", 1.0)));
+    look.synced = true;
+    output.write(records(reading("RPM", 2.0, march + 1)));
+    look.wall += 3600000;
+    output.write(records(reading("RPM", 3.0, march + 2)));
+    EXPECT_THAT(at.texts("SELECT time - " + std::to_string(march) + " FROM reading ORDER BY time"),
+                ElementsAre("0", "1", "2"));
+    EXPECT_THAT(at.texts("SELECT count(*) FROM undated"), ElementsAre("0"));
+}
+
 TEST(SqliteFile, KnowsASensorByItsUnitTooAndAModuleByItsLastWords)
 {
     DatabaseFile const at;

@@ -103,6 +103,7 @@ TEST(Ballast, IsAFileBesideTheDatabase)
     EXPECT_TRUE(ballast.fits(4 * 4096));
     EXPECT_FALSE(ballast.fits(4 * 4096 - 1));
     EXPECT_FALSE(Ballast(folder.file("c.db"), 1ULL << 62).fits(1ULL << 62));
+    EXPECT_FALSE(Ballast(folder.file("none.db"), ~0ULL).keep()) << "a size that also says that there is none";
     std::ofstream(folder.file("a.db-ballast")) << "x";
     EXPECT_TRUE(ballast.keep()) << "what is there of it is too small";
     EXPECT_EQ(std::filesystem::file_size(folder.file("a.db-ballast")), 4096U);

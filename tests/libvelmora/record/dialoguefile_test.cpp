@@ -1,9 +1,13 @@
 #include "libvelmora/record/dialoguefile.h"
+#include "tests/support/filelimit.h"
+#include "tests/support/openfiles.h"
 #include "tests/support/temporaryfolder.h"
 
 #include <velmora/error.h>
 
 #include <gtest/gtest.h>
+
+#include <sys/stat.h>
 
 using namespace velmora;
 
@@ -53,6 +57,27 @@ TEST_F(DialogueFileTest, replacesNoFile)
         EXPECT_NE(std::string(failure.what()).find("exists already"), std::string::npos);
     }
     EXPECT_TRUE(std::filesystem::exists(m_path));
+}
+
+TEST_F(DialogueFileTest, isAPlainFileThatIsHeldUntilItIsSaved)
+{
+    ASSERT_EQ(::mkfifo((m_folder / "pipe").c_str(), 0600), 0);
+    try {
+        DialogueFile const file(m_folder / "pipe");
+        FAIL() << "opened";
+    } catch (Error const& failure) {
+        EXPECT_EQ(std::string(failure.what()), (m_folder / "pipe").string() + " is a pipe, no plain file");
+    }
+    DialogueFile file(m_path);
+    EXPECT_TRUE(testsupport::isHeldOpen(m_path.string()));
+    obdsim::Dialogue dialogue;
+    dialogue.exchanges.push_back({"ATI", {{obdsim::Time(0), std::string(100, 'x') + ">"}}});
+    {
+        testsupport::FileLimit const limit(20);
+        EXPECT_THROW(file.save(dialogue), Error) << "a full disk";
+    }
+    EXPECT_FALSE(testsupport::isHeldOpen(m_path.string()));
+    EXPECT_TRUE(std::filesystem::exists(m_path)) << "what is there is cut off, and said to be";
 }
 
 TEST_F(DialogueFileTest, tellsAFolderThatIsNotThere)

@@ -16,6 +16,7 @@
 
 #include <atomic>
 #include <mutex>
+#include <thread>
 
 namespace {
 
@@ -208,6 +209,28 @@ TEST_F(SessionParts, SendsTheAdapterToSleepAtItsEndIfItIsTold)
     }
     EXPECT_LT(std::chrono::steady_clock::now() - begin, std::chrono::milliseconds(2500))
         << "half a second, and what connecting took";
+}
+
+TEST_F(SessionParts, AnInterruptionEndsTheWaitForASilentAdapter)
+{
+    Session session{SessionOptions(m_options)};
+    session.connect();
+    m_line.silent = true;
+    auto const begin = std::chrono::steady_clock::now();
+    std::thread interrupter([&session] {
+        std::this_thread::sleep_for(std::chrono::milliseconds(5));
+        session.interrupt();
+    });
+    EXPECT_FALSE(asks(session, 0x0C));
+    interrupter.join();
+    EXPECT_LT(std::chrono::steady_clock::now() - begin, std::chrono::milliseconds(1900)) << "half a second";
+    EXPECT_TRUE(session.interrupted());
+    try {
+        session.check();
+        ADD_FAILURE();
+    } catch (Error const& error) {
+        EXPECT_EQ(error.kind(), velmora::ErrorKind::Interrupted);
+    }
 }
 
 TEST_F(SessionParts, ABrokenLinkIsTold)

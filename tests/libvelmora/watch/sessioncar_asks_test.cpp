@@ -194,6 +194,21 @@ TEST_F(AskedCar, WithoutWishesReadsWhatTripsNeed)
     EXPECT_EQ(kindOf([&] { wrong.connect(); }), ErrorKind::WrongUse) << "a wish of the settings has to be known";
 }
 
+TEST_F(AskedCar, NumbersTheSensorsOfAParameterThatHasSeveral)
+{
+    m_options.sensors = {"14", "RPM"};
+    SessionCar car(m_options);
+    car.connect();
+    std::vector<std::string> keys;
+    for (velmora::SensorEntry const& each : car.sensors().sensors) {
+        if (each.pid == "0114") {
+            keys.push_back(each.sensor + " " + each.unit);
+            EXPECT_THAT(each.name, testing::HasSubstr(": "));
+        }
+    }
+    EXPECT_THAT(keys, ElementsAre("O2_B1S1_1 V", "O2_B1S1_2 %"));
+}
+
 TEST_F(AskedCar, ANapIsTakenByAnAdapterThatKnowsIt)
 {
     m_options.session.port += "&adapter=obdlink";

@@ -32,22 +32,39 @@ TEST(WatchEngineBounds, StepsAsOftenAsItHasWork)
 
 TEST(WatchEngineBounds, ASilentCarHasTenSecondsAndThenAMinute)
 {
+    EXPECT_EQ(velmora::WatchRules().silence, 10s);
+    EXPECT_EQ(velmora::WatchRules().silentCar, 60s);
+    EXPECT_EQ(velmora::WatchRules().codesEvery, 10min);
     Watch watch;
     watch.drive(1min);
     watch.events.clear();
-    watch.car.answers = false;
-    watch.run(8900ms);
+    watch.car.answers = false; // a minute after the start came its last reading
+    watch.run(9900ms);
     EXPECT_TRUE(watch.events.empty());
-    watch.run(1200ms);
+    watch.time.pass(100ms);
+    watch.step();
     EXPECT_THAT(watch.events, ElementsAre("ignition_off"));
     EXPECT_TRUE(watch.engine.health().linkUp);
-    watch.run(48500ms);
+    watch.run(49900ms);
     EXPECT_THAT(watch.events, Not(Contains("asleep"))) << "not a minute yet";
-    watch.run(1600ms);
+    watch.time.pass(100ms);
+    watch.step();
     EXPECT_THAT(watch.events, ElementsAre("ignition_off", "engine_stop", "asleep"));
     EXPECT_FALSE(watch.engine.health().linkUp);
     EXPECT_EQ(watch.engine.state(), "settling");
     EXPECT_EQ(watch.car.stops, 1);
+}
+
+TEST(WatchEngineBounds, IsConnectingDuringEachAttempt)
+{
+    Watch watch;
+    std::vector<std::string> states;
+    watch.car.plugged = false;
+    watch.car.onAttempt = [&] { states.push_back(watch.engine.state()); };
+    watch.run(5s);
+    EXPECT_GE(states.size(), 3U);
+    EXPECT_THAT(states, testing::Each("connecting"));
+    EXPECT_EQ(watch.engine.state(), "no link");
 }
 
 TEST(WatchEngineBounds, TakesFuelTemperatureAndVoltageFromReadings)
