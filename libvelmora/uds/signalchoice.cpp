@@ -100,6 +100,19 @@ void SignalChoice::checkVehicle(SignalEntry const& entry)
     }
 }
 
+// What can't be reached on this bus must not be asked of all modules in its place.
+void SignalChoice::checkAddress(SignalEntry const& entry) const
+{
+    if (entry.signal.request.empty() || isBroadcast(entry.signal)) {
+        return;
+    }
+    AddressOrReason const reached = addressOf(entry.signal, m_session.proxy()->protocol());
+    if (!reached.address) {
+        throw Error(ErrorKind::NotSupported,
+                    fmt::format("The signal {} can't be asked for: {}", entry.signal.id, reached.reason));
+    }
+}
+
 void SignalChoice::addOwn(std::size_t index, SensorWish const& wish)
 {
     SignalEntry const& entry = set()[index];
@@ -109,13 +122,7 @@ void SignalChoice::addOwn(std::size_t index, SensorWish const& wish)
                     {"its file " + entry.path + " says so (enabled = false)"});
     }
     checkVehicle(entry);
-    if (!entry.signal.request.empty() && !isBroadcast(entry.signal)) {
-        AddressOrReason const reached = addressOf(entry.signal, m_session.proxy()->protocol());
-        if (!reached.address) {
-            throw Error(ErrorKind::NotSupported,
-                        fmt::format("The signal {} can't be asked for: {}", entry.signal.id, reached.reason));
-        }
-    }
+    checkAddress(entry);
     std::optional<unsigned int> const module = isBroadcast(entry.signal) ? wish.module : std::optional<unsigned int>();
     addOnce({index, module, wish.hertz ? wish.hertz : entry.signal.rate, true});
     addInputs(index, wish.hertz);
@@ -133,6 +140,7 @@ void SignalChoice::addInputs(std::size_t index, std::optional<double> hertz)
             throw Error(ErrorKind::NotSupported, fmt::format("{} is worked out of {}, which is switched off or missing",
                                                              set()[index].signal.id, id));
         }
+        checkAddress(set()[*other]);
         bool const known = std::any_of(m_chosen.begin(), m_chosen.end(),
                                        [&](ChosenSignal const& each) { return each.index == *other; });
         if (!known) {

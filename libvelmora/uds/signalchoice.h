@@ -40,6 +40,7 @@ private:
     void addBuiltIn(std::size_t index, SensorWish const& wish, std::vector<unsigned int> const& meant);
     void addOnce(ChosenSignal const& signal);
     void checkVehicle(SignalEntry const& entry);
+    void checkAddress(SignalEntry const& entry) const;
     unsigned int moduleOf(ChosenSignal const& signal) const;
     std::optional<double> rateOf(ChosenSignal const& signal, bool alone) const;
     SignalSet const& set() const { return *m_session.signals(); }

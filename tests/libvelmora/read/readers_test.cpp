@@ -182,6 +182,16 @@ TEST_F(ReadersOfTopics, TellSerialAndTravel)
     EXPECT_TRUE(beside.sinceCleared.distance);
     EXPECT_TRUE(beside.sinceCleared.runTime);
     EXPECT_EQ(std::count(m_asked.begin(), m_asked.end(), "0121"), 0);
+    for (char const* const each : {"21 00 07", "31 00 09", "4D 00 0B", "4E 00 0D"}) {
+        m_car->control("value 7E8 " + std::string(each));
+    }
+    InfoReport const own = readInfo(*m_session, module());
+    EXPECT_EQ(own.withLamp.distance->value, "7");
+    EXPECT_EQ(own.sinceCleared.distance->value, "9");
+    EXPECT_EQ(own.withLamp.runTime->value + " " + own.withLamp.runTime->unit, "11 min");
+    EXPECT_EQ(own.sinceCleared.runTime->value + " " + own.sinceCleared.runTime->unit, "13 min");
+    ASSERT_EQ(own.calibrations.size(), 1U);
+    EXPECT_EQ(own.calibrations[0].verification, "1791BC82");
 }
 
 TEST_F(ReadersOfTopics, AskForTheVinOnce)

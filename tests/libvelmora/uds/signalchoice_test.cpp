@@ -70,6 +70,16 @@ request = "221E1C"
 formula = "A"
 
 [[signal]]
+id = "OF_ELSEWHERE"
+name = "Worked out of one on another bus"
+formula = "value(\"ELSEWHERE\")"
+
+[[signal]]
+id = "TWICE_THE_SUM"
+name = "Twice"
+formula = "value(\"SUM\")*2"
+
+[[signal]]
 id = "OFF"
 name = "Switched off"
 header = "7E1"
@@ -187,6 +197,9 @@ TEST_F(SignalChoiceTest, AsksAtTheRateOfTheFileOrTheWish)
     EXPECT_EQ(rows(), "0 SUM   number -1\n") << "what it is worked out of is not shown";
     EXPECT_EQ(sources(false), "4:\n1: 0/SUM\n");
     m_choice.emplace(*m_session);
+    EXPECT_TRUE(choose("TWICE_THE_SUM"));
+    EXPECT_EQ(sources(false), "4:\n1: 0/TWICE_THE_SUM\n") << "what the sum needs is read, too";
+    m_choice.emplace(*m_session);
     EXPECT_TRUE(choose("GEARBOX"));
     EXPECT_TRUE(choose("SUM@2hz"));
     EXPECT_EQ(rows(), "7E9 GEARBOX 221E1C °C number 4\n0 SUM   number 2\n") << "the rate that was there stays";
@@ -219,6 +232,7 @@ TEST_F(SignalChoiceTest, TellsWhyASignalCantBeChosen)
     EXPECT_EQ(problem("OF_OFF"), "OF_OFF is worked out of OFF, which is switched off or missing");
     EXPECT_EQ(problem("ELSEWHERE"), "The signal ELSEWHERE can't be asked for: the header 18DA10F1 is none of this bus, "
                                     "whose identifiers have 3 digits");
+    EXPECT_EQ(problem("OF_ELSEWHERE"), problem("ELSEWHERE")) << "nor may all modules be asked in its place";
     EXPECT_EQ(problem("STRANGE"), "STRANGE is for vehicles WEX*, and this one is VELMRAS1M60000022 | the file " +
                                       m_folder.file("other.toml") + " says so; take its key vin out if it is wrong");
     EXPECT_EQ(problem("body of"), "\"body of\" fits several signals | choose by id: PART, STATE");
