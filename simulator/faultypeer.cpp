@@ -138,6 +138,7 @@ void FaultyPeer::connect()
     m_byte = 0;
     m_command = 0;
     m_dropping = false;
+    m_promptLost = false;
     m_silent = false;
     m_linkUp = true;
 }

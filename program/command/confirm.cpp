@@ -8,7 +8,7 @@
 
 #include <fmt/format.h>
 
-#include <poll.h>
+#include <functional>
 #include <unistd.h>
 
 namespace velmora::cli {
@@ -20,23 +20,19 @@ bool isYes(std::string const& answer)
     return answer == "y" || answer == "Y" || answer == "yes";
 }
 
-// A line of standard input, without its line feed. Throws Error on Ctrl-C.
-std::string readAnswer()
+// check throws what ends the waiting.
+bool asked(std::string const& warning, std::string const& question, std::function<void()> const& check)
 {
-    std::string line;
-    while (true) {
-        pollfd input{STDIN_FILENO, POLLIN, 0};
-        bool const ready = ::poll(&input, 1, 100) > 0;
-        if (Interrupt::instance().raised()) {
-            throw Error(ErrorKind::Interrupted, "Interrupted");
-        }
-        char byte = 0;
-        if (ready && (::read(STDIN_FILENO, &byte, 1) <= 0 || byte == '\n')) {
-            return line;
-        }
-        if (ready) {
-            line += byte;
-        }
+    dropTypedAhead();
+    tellText(fmt::format("{}{} [y/N] ", warning, question));
+    std::string answer;
+    return LineReader(check).read(answer) && isYes(answer);
+}
+
+void requireNoInterrupt()
+{
+    if (Interrupt::instance().raised()) {
+        throw Error(ErrorKind::Interrupted, "Interrupted");
     }
 }
 
@@ -52,23 +48,12 @@ void requireConsent(GlobalOptions const& options, std::string const& action, std
 
 bool confirmed(CommandCar& car, std::string const& warning, std::string const& question)
 {
-    if (car.options().yes) {
-        return true;
-    }
-    dropTypedAhead();
-    tellText(fmt::format("{}{} [y/N] ", warning, question));
-    std::string answer;
-    return LineReader([&car] { car.check(); }).read(answer) && isYes(answer);
+    return car.options().yes || asked(warning, question, [&car] { car.check(); });
 }
 
 bool confirmed(GlobalOptions const& options, std::string const& warning, std::string const& question)
 {
-    if (options.yes) {
-        return true;
-    }
-    dropTypedAhead();
-    tellText(fmt::format("{}{} [y/N] ", warning, question));
-    return isYes(readAnswer());
+    return options.yes || asked(warning, question, requireNoInterrupt);
 }
 
 } // namespace velmora::cli

@@ -15,6 +15,8 @@ struct FatalSignal
     {};
 };
 
+FatalSignal fatalSignals[] = {{SIGQUIT}, {SIGSEGV}, {SIGABRT}, {SIGBUS}, {SIGILL}, {SIGFPE}};
+
 // What a handler may use: set before it is installed, and left alone as long as it is.
 struct Kept
 {
@@ -22,7 +24,6 @@ struct Kept
     std::size_t length = 0;
     termios before{};
     bool hasBefore = false;
-    FatalSignal signals[6] = {{SIGQUIT}, {SIGSEGV}, {SIGABRT}, {SIGBUS}, {SIGILL}, {SIGFPE}};
 };
 
 Kept kept;
@@ -55,7 +56,7 @@ FatalRestore::FatalRestore(std::string const& text, termios const* before)
     {};
     action.sa_handler = restoreAndEnd;
     sigemptyset(&action.sa_mask);
-    for (FatalSignal& each : kept.signals) {
+    for (FatalSignal& each : fatalSignals) {
         ::sigaction(each.number, &action, &each.before);
     }
 }
@@ -67,7 +68,7 @@ void FatalRestore::restore() const
 
 FatalRestore::~FatalRestore()
 {
-    for (FatalSignal const& each : kept.signals) {
+    for (FatalSignal const& each : fatalSignals) {
         ::sigaction(each.number, &each.before, nullptr);
     }
 }

@@ -1,6 +1,7 @@
 #include "program/terminal/keyinput.h"
 
 #include <algorithm>
+#include <iterator>
 #include <poll.h>
 #include <unistd.h>
 
@@ -105,8 +106,8 @@ void KeyInput::restore() const
 
 void KeyInput::take(std::chrono::milliseconds limit)
 {
-    pollfd input{STDIN_FILENO, POLLIN, 0};
-    if (m_active && ::poll(&input, 1, static_cast<int>(limit.count())) > 0) {
+    pollfd input[] = {{STDIN_FILENO, POLLIN, 0}};
+    if (m_active && ::poll(input, std::size(input), static_cast<int>(limit.count())) > 0) {
         char bytes[64];
         ssize_t const count = ::read(STDIN_FILENO, bytes, sizeof bytes);
         m_ended = count <= 0;

@@ -23,8 +23,6 @@ bool isPrintable(Key key)
 LineEditor::State LineEditor::press(Key key)
 {
     switch (key) {
-    case Key::Enter:
-        return State::Entered;
     case Key::Up:
         recall(m_entry > 0 ? m_entry - 1 : 0);
         break;
@@ -46,6 +44,8 @@ LineEditor::State LineEditor::press(Key key)
     case Key::Delete:
         erase(m_cursor);
         break;
+    case Key::Enter:
+        return State::Entered;
     default:
         if (isPrintable(key)) {
             insert(static_cast<char>(key));
@@ -63,14 +63,8 @@ LineEditor::State LineEditor::control(char character)
     case controlA:
         m_cursor = 0;
         break;
-    case controlD:
-        return m_text.empty() ? State::Ended : State::Typing;
     case controlE:
         m_cursor = m_text.size();
-        break;
-    case controlU:
-        m_text.clear();
-        m_cursor = 0;
         break;
     case backspace:
     case rubout:
@@ -78,6 +72,12 @@ LineEditor::State LineEditor::control(char character)
             erase(--m_cursor);
         }
         break;
+    case controlU:
+        m_text.clear();
+        m_cursor = 0;
+        break;
+    case controlD:
+        return m_text.empty() ? State::Ended : State::Typing;
     default:
         break;
     }

@@ -1,11 +1,18 @@
 #include "program/terminal/linereader.h"
 
+#include <iterator>
 #include <poll.h>
 #include <termios.h>
 #include <unistd.h>
 #include <utility>
 
 namespace velmora::cli {
+
+namespace {
+
+constexpr int lookMs = 100; // how often is looked whether the waiting is over
+
+} // namespace
 
 bool LineReader::read(std::string& line)
 {
@@ -25,8 +32,8 @@ bool LineReader::read(std::string& line)
 
 bool LineReader::fill()
 {
-    pollfd input{STDIN_FILENO, POLLIN, 0};
-    while (::poll(&input, 1, 100) <= 0) {
+    pollfd input[] = {{STDIN_FILENO, POLLIN, 0}};
+    while (::poll(input, std::size(input), lookMs) <= 0) {
         m_check();
     }
     m_check();

@@ -61,7 +61,7 @@ std::string BusLink::description() const
         return "AUTO";
     }
     Protocol const* chosen = findProtocol(m_number);
-    std::string const name = chosen != nullptr ? chosen->name : others[m_number - 10];
+    std::string const name = chosen != nullptr ? chosen->name : others[(m_number - 10) % 3];
     std::string const comma = m_quirks.has(Quirk::TightDescription) ? "," : ", ";
     return m_automatic ? "AUTO" + comma + name : name;
 }
@@ -163,7 +163,7 @@ BusReply BusLink::wake(BusInit init)
 {
     Protocol const* chosen = protocol();
     BusReply reply;
-    if (chosen == nullptr || chosen->init == BusInit::None) {
+    if (chosen == nullptr || isCan(*chosen) || chosen->init == BusInit::None) {
         reply.texts.push_back({Time(0), "?\r"});
         return reply;
     }
@@ -193,8 +193,8 @@ void BusLink::fail(BusReply& reply) const
 {
     Protocol const* chosen = protocol();
     bool const canOrOther = chosen == nullptr || isCan(*chosen);
-    bool const sameRate =
-        chosen != nullptr && m_vehicle && m_vehicle->isAwake() && m_vehicle->protocol().kilobaud == chosen->kilobaud;
+    bool const sameRate = chosen != nullptr && m_vehicle && m_vehicle->isAwake() && isCan(m_vehicle->protocol()) &&
+                          m_vehicle->protocol().kilobaud == chosen->kilobaud;
     reply.end += chosen == nullptr ? Ms(100) : chosen->probe;
     reply.texts.push_back({reply.end, canOrOther && !sameRate ? "CAN ERROR\r" : "NO DATA\r"});
 }

@@ -11,10 +11,9 @@ namespace obdsim {
 
 namespace {
 
-// With its check byte.
 std::size_t serialBytes(Frame const& frame)
 {
-    return frame.header.size() + frame.data.size() + 1;
+    return frame.header.size() + frame.data.size() + (frame.checksum ? 1 : 0);
 }
 
 /// Frames of one message follow each other; on CAN those of several modules may
@@ -115,7 +114,8 @@ BusReply BusWire::exchange(BusRequest const& request, Settings const& settings, 
 /// When the adapter may begin to send: on a K line it leaves P3 behind the last byte.
 Time BusWire::free(Time at) const
 {
-    return isKLine(m_vehicle->protocol()) ? std::max(at, m_busyUntil + requestGap) : at;
+    bool const waits = isKLine(m_vehicle->protocol()) && m_busyUntil != Time(0);
+    return waits ? std::max(at, m_busyUntil + requestGap) : at;
 }
 
 /// Puts the request on the bus, and among the frames under way those that it brings. Returns the end of the request.

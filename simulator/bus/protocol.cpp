@@ -46,7 +46,7 @@ bool isKLine(Protocol const& protocol)
 Time sendingTime(Protocol const& protocol, std::size_t bytes)
 {
     constexpr microseconds p4{5200}; // of an ELM327 (data sheet v2.1, page 71, programmable parameter 14)
-    auto const gaps = static_cast<Time::rep>(isKLine(protocol) ? bytes - 1 : 0);
+    auto const gaps = static_cast<Time::rep>(isKLine(protocol) && bytes > 0 ? bytes - 1 : 0);
     return receivingTime(protocol, bytes) + gaps * p4;
 }
 

@@ -47,8 +47,8 @@ bool isCan(Protocol const& protocol);
 /// ISO 9141-2 and ISO 14230-4.
 bool isKLine(Protocol const& protocol);
 
-/// How long a message of an adapter, of one byte at least, keeps a bus other than CAN busy. On a K line the adapter
-/// leaves P4 between its bytes.
+/// How long a message of an adapter keeps a bus other than CAN busy. On a K line the adapter leaves P4 between its
+/// bytes.
 Time sendingTime(Protocol const& protocol, std::size_t bytes);
 
 /// The same for a message of a module, which leaves no gap.

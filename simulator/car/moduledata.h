@@ -31,8 +31,8 @@ struct Monitors
 /// What a module kept of the moment at which a code was stored (service 02).
 struct FreezeFrame
 {
-    std::uint8_t number{};
-    std::uint16_t code{};                 ///< 0: empty, for the codes were cleared
+    std::uint8_t number = 0;
+    std::uint16_t code = 0;               ///< 0: empty, for the codes were cleared
     Time takenAt{};                       ///< moment of the drive, for the live PIDs
     std::vector<std::uint8_t> pids;       ///< taken from the drive model or the fixed values
     std::map<std::uint8_t, Bytes> values; ///< given byte for byte
@@ -41,8 +41,8 @@ struct FreezeFrame
 /// One result of service 05; the buses without CAN only.
 struct SensorTest
 {
-    std::uint8_t test{};
-    std::uint8_t sensor{};
+    std::uint8_t test = 0;
+    std::uint8_t sensor = 0;
     Bytes value; ///< the value alone for a constant, or value, minimum, maximum
 };
 
@@ -50,9 +50,9 @@ struct SensorTest
 /// within it; on the other buses `id` is the test and `test` the component.
 struct MonitorTest
 {
-    std::uint8_t id{};
-    std::uint8_t test{};
-    std::uint8_t scaling{};           ///< CAN only
+    std::uint8_t id = 0;
+    std::uint8_t test = 0;
+    std::uint8_t scaling = 0;         ///< CAN only
     std::vector<std::uint16_t> words; ///< CAN: value, minimum, maximum; else value, limit
 };
 
@@ -79,8 +79,8 @@ struct VehicleInfo
 /// A request whose answer is announced by 7F xx 78 first.
 struct Pending
 {
-    int times{};  ///< 0: it is only late
-    Time delay{}; ///< before each further message
+    int times = 1;        ///< 0: it is only late
+    Time delay = Ms(100); ///< before each further message
 };
 
 /// What a module makes of a request of service 01 for more PIDs than it takes.
@@ -94,7 +94,7 @@ enum class MorePids : int
 /// A value of the drive within the data of a signal: value * scale + offset, high byte first.
 struct SignalField
 {
-    std::size_t at{}; ///< first byte of it
+    std::size_t at = 0; ///< first byte of it
     std::size_t bytes = 1;
     std::string value; ///< a name of Drive::value()
     double scale = 1;
@@ -111,30 +111,30 @@ struct SignalData
 /// A trouble code of service 19 (ISO 14229-1): two bytes as in service 03, the failure type, the status.
 struct UdsCode
 {
-    std::uint16_t code{};
-    std::uint8_t failureType{};
-    std::uint8_t status{};
+    std::uint16_t code = 0;
+    std::uint8_t failureType = 0;
+    std::uint8_t status = 0;
 };
 
 /// A trouble code of service 18 (ISO 14230-3): two bytes and a status of the maker's.
 struct KwpCode
 {
-    std::uint16_t code{};
-    std::uint8_t status{};
+    std::uint16_t code = 0;
+    std::uint8_t status = 0;
 };
 
 /// All that a vehicle file says of one control module.
 struct ModuleData
 {
-    std::uint32_t id{};                   ///< CAN identifier of its replies, or its address
+    std::uint32_t id = 0;                 ///< CAN identifier of its replies, or its address
     std::optional<std::uint32_t> request; ///< CAN identifier that it listens to; else the usual one of id
     std::optional<std::uint8_t> address;  ///< extended address: first byte of the frames to it
     std::uint8_t tester = 0xF1;           ///< with an extended address: first byte of its own frames
     bool functional = true;               ///< answers requests to all modules
     Time latency = Ms(15);
     std::optional<Time> frameGap; ///< between the frames of a long message on CAN; else as usual on that bus
-    int mostPids{};               ///< in one request of service 01
-    MorePids morePids{};
+    int mostPids = 6;             ///< in one request of service 01
+    MorePids morePids = MorePids::First;
     bool refuses = false; ///< answers requests it does not know with 7F
     bool lamp = false;
     bool clearsWhileRunning = true;
@@ -143,9 +143,9 @@ struct ModuleData
     std::vector<std::uint8_t> live;
     std::map<std::uint8_t, Bytes> fixed;
     std::optional<Monitors> monitors;
-    bool hasStored{}; ///< answers service 03; likewise the next two
-    bool hasPending{};
-    bool hasPermanent{};
+    bool hasStored = false; ///< answers service 03; likewise the next two
+    bool hasPending = false;
+    bool hasPermanent = false;
     std::vector<std::uint16_t> stored;
     std::vector<std::uint16_t> pending;
     std::vector<std::uint16_t> permanent;
@@ -160,7 +160,7 @@ struct ModuleData
     std::map<Bytes, SignalData> signals;    ///< by request: service 22 with identifier, 21 or 1A with local identifier
     bool uds = false;                       ///< answers services 3E and 19
     std::vector<UdsCode> udsCodes;
-    bool hasKwpCodes{}; ///< answers service 18
+    bool hasKwpCodes = false; ///< answers service 18
     std::vector<KwpCode> kwpCodes;
 };
 
@@ -171,7 +171,7 @@ constexpr Time shortestAddressPause = Ms(25);
 struct VehicleData
 {
     std::string name;
-    int protocol{};
+    int protocol = 6;
     std::optional<double> volts; ///< fixed adapter voltage; else that of the drive
     Padding padding;
     Time addressPause = shortestAddressPause; ///< see Vehicle::addressPause

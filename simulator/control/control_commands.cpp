@@ -3,6 +3,8 @@
 #include "simulator/control/controlerror.h"
 #include "simulator/textnumber.h"
 
+#include <algorithm>
+
 namespace obdsim {
 
 namespace {
@@ -170,7 +172,7 @@ std::string Control::help(Words const& /*words*/, Time /*now*/)
     std::string text;
     for (auto const& each : forms()) {
         std::string form = each.form;
-        form.resize(column, ' '); // all forms are shorter
+        form.resize(std::max(column, form.size() + 1), ' ');
         text += form + each.help + "\n";
     }
     return text;

@@ -188,6 +188,16 @@ TEST_F(CommandRun, TheProgramDescribesItself)
 {
     EXPECT_EQ(run("__complete sc").out, "scan\tReport on the adapter and all control modules\n");
     EXPECT_THAT(run("__complete live RP").out, StartsWith("RPM\tPID 0C\n"));
+    std::istringstream codes(run("__complete dtc p042").out);
+    std::set<std::string> different;
+    int lines = 0;
+    for (std::string line; std::getline(codes, line); ++lines) {
+        EXPECT_THAT(line, StartsWith("P042"));
+        different.insert(line.substr(0, line.find('\t')));
+    }
+    EXPECT_GE(lines, 16);
+    EXPECT_EQ(different.size(), static_cast<std::size_t>(lines)) << "each code once";
+    EXPECT_EQ(run("__complete dtc P0").out, "") << "too many";
     std::filesystem::create_directory(m_folder.path() / "pages");
     EXPECT_EQ(run("__manual @F/pages").code, ExitCode::Done);
     EXPECT_THAT(m_folder.read("pages/velmora-scan.1"), HasSubstr(".TH"));

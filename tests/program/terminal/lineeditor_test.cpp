@@ -30,6 +30,53 @@ TEST(LineEditor, TakesWhatIsTyped)
     EXPECT_EQ(editor.cursor(), 0U);
 }
 
+TEST(LineEditor, EachKeyDoesItsOwnAlone)
+{
+    struct Press
+    {
+        Key key;
+        State state;
+        char const* text;
+        std::size_t cursor;
+    };
+    auto const control = [](char character) { return static_cast<Key>(character); };
+    for (Press const& each : {Press{Key::Left, State::Typing, "abc", 1},
+                              {Key::Right, State::Typing, "abc", 3},
+                              {Key::Home, State::Typing, "abc", 0},
+                              {Key::End, State::Typing, "abc", 3},
+                              {Key::Delete, State::Typing, "ab", 2},
+                              {Key::Up, State::Typing, "before", 6},
+                              {Key::Down, State::Typing, "abc", 2},
+                              {Key::Enter, State::Entered, "abc", 2},
+                              {control(0x01), State::Typing, "abc", 0},
+                              {control(0x05), State::Typing, "abc", 3},
+                              {control(0x08), State::Typing, "ac", 1},
+                              {control(0x7F), State::Typing, "ac", 1},
+                              {control(0x15), State::Typing, "", 0},
+                              {control(0x04), State::Typing, "abc", 2},
+                              {control(0x02), State::Typing, "abc", 2},
+                              {Key::Escape, State::Typing, "abc", 2},
+                              {Key::PageUp, State::Typing, "abc", 2},
+                              {static_cast<Key>(0x80), State::Typing, "abc", 2}}) {
+        LineEditor editor;
+        enter(editor, "before");
+        type(editor, "abc");
+        editor.press(Key::Left);
+        EXPECT_EQ(editor.press(each.key), each.state) << static_cast<int>(each.key);
+        EXPECT_EQ(editor.text(), each.text) << static_cast<int>(each.key);
+        EXPECT_EQ(editor.cursor(), each.cursor) << static_cast<int>(each.key);
+    }
+    for (Key const key : {Key::Left, Key::Right, Key::Home, Key::End, Key::Delete, Key::Up, Key::Down, control(0x01),
+                          control(0x05), control(0x08), control(0x7F), control(0x15)}) {
+        LineEditor editor;
+        EXPECT_EQ(editor.press(key), State::Typing) << static_cast<int>(key);
+        EXPECT_EQ(editor.text(), "");
+        EXPECT_EQ(editor.cursor(), 0U);
+    }
+    LineEditor editor;
+    EXPECT_EQ(editor.press(control(0x04)), State::Ended);
+}
+
 TEST(LineEditor, MendsALineInTheMiddle)
 {
     LineEditor editor;

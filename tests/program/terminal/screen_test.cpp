@@ -26,10 +26,12 @@ struct Seen
     std::string leave;
     std::pair<std::size_t, std::size_t> size;
     std::pair<std::size_t, std::size_t> resized;
+    std::pair<std::size_t, std::size_t> smallest;
     std::vector<int> keys;
     tcflag_t local = 0;
     tcflag_t localBefore = 0;
     tcflag_t localAfter = 0;
+    bool signalsAsUsual = true;
 };
 
 tcflag_t localFlags(PseudoTerminal const& terminal)
@@ -64,9 +66,19 @@ Seen see(std::string const& kind, bool coloured, std::string const& frame, std::
         for (std::optional<Key> key = screen.readKey(); key; key = screen.readKey()) {
             seen.keys.push_back(static_cast<int>(*key));
         }
-        winsize const other{12, 60, 0, 0};
-        ::ioctl(terminal.terminal(), TIOCSWINSZ, &other);
-        seen.resized = screen.size();
+        for (winsize const& other : {winsize{12, 60, 0, 0}, {0, 50, 0, 0}, {11, 0, 0, 0}}) {
+            ::ioctl(terminal.terminal(), TIOCSWINSZ, &other);
+            seen.resized = screen.size(); // one that tells nothing changes nothing
+        }
+        winsize const smallest{1, 1, 0, 0};
+        ::ioctl(terminal.terminal(), TIOCSWINSZ, &smallest);
+        seen.smallest = screen.size();
+        for (int const each : {SIGWINCH, SIGTSTP, SIGINT, SIGTERM}) {
+            struct sigaction action
+            {};
+            ::sigaction(each, nullptr, &action);
+            seen.signalsAsUsual = seen.signalsAsUsual && action.sa_handler == SIG_DFL;
+        }
     }
     seen.localAfter = localFlags(terminal);
     return seen;
@@ -80,6 +92,8 @@ TEST(TerminalScreen, DrawsLinesWithTheirLooks)
     ASSERT_TRUE(seen.open);
     EXPECT_EQ(seen.size, (std::pair<std::size_t, std::size_t>(40, 10)));
     EXPECT_EQ(seen.resized, (std::pair<std::size_t, std::size_t>(60, 12)));
+    EXPECT_EQ(seen.smallest, (std::pair<std::size_t, std::size_t>(1, 1)));
+    EXPECT_TRUE(seen.signalsAsUsual) << "they are the program's own business";
     EXPECT_THAT(seen.shown, HasSubstr("\033[?1049h")) << "a page of its own";
     EXPECT_THAT(seen.shown, HasSubstr("\033[?25l")) << "without a cursor";
     EXPECT_THAT(seen.shown, HasSubstr("\033[0;1mbold"));
