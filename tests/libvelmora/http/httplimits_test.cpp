@@ -119,6 +119,7 @@ TEST(HttpLimits, CarryWhatBrowsersAreToKnowInEachReply)
 TEST(HttpLimits, AnswerNothingToWhoLeavesBeforeTheEnd)
 {
     LimitRig const rig;
+    auto const begin = std::chrono::steady_clock::now();
     HttpClient half(rig.server.port());
     half.send("GET /a HTT");
     half.endSending();
@@ -132,6 +133,7 @@ TEST(HttpLimits, AnswerNothingToWhoLeavesBeforeTheEnd)
     std::string const all = once.readAll();
     EXPECT_THAT(all, StartsWith("HTTP/1.1 200"));
     EXPECT_EQ(all.find("HTTP/1.1", 1), std::string::npos) << all;
+    EXPECT_LT(std::chrono::steady_clock::now() - begin, 5s) << "and keeps nothing open";
 }
 
 TEST(HttpLimits, OfTimeDoNotHoldForAReplyThatIsToBeLate)
