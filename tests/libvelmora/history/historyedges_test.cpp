@@ -154,6 +154,17 @@ TEST(KeptScanEdges, ALineHoldsAReportWhateverItsHash)
     EXPECT_NE(toLine(scan).find("\"report\":\"\u00E9\""), std::string::npos) << "letters stay as they are";
 }
 
+TEST(KeptScanEdges, KeepTheirTimeToTheMillisecond)
+{
+    KeptScan const scan = edgeScan("golf", 1777629600123ms + 1h + 2min + 3s);
+    KeptScan const parsed = parseLine(toLine(scan));
+    EXPECT_EQ(timeText(parsed.time), "2026-05-01T11:02:03.123Z");
+    EXPECT_EQ(parsed.time, scan.time);
+    EXPECT_EQ(parsed.program, "9.9");
+    EXPECT_EQ(parsed.vehicle, "golf");
+    EXPECT_EQ(parsed.hash, scan.hash);
+}
+
 TEST(KeptScanEdges, TellALampThatIsOff)
 {
     ModuleReport silent = soundModule(0x7E9);

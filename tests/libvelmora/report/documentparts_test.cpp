@@ -10,6 +10,8 @@
 
 #include <gtest/gtest.h>
 
+#include <ctime>
+
 namespace {
 
 using namespace velmora;
@@ -184,6 +186,35 @@ TEST(HtmlDocument, HasHeadingsOfFiveLevelsAndHeadsOfWideTables)
         << "those of level 1 alone";
     document.sections[1].anchor.clear();
     EXPECT_NE(toHtml(document).find("<ul>\n</ul>"), std::string::npos) << "and only what has an anchor";
+}
+
+TEST(ReportFile, GoesByTheDayOnWhichItWasMade)
+{
+    std::tm day{};
+    day.tm_year = 126;
+    day.tm_mon = 5;
+    day.tm_mday = 7;
+    day.tm_hour = 8;
+    day.tm_min = 9;
+    day.tm_isdst = -1;
+    DocumentOptions options;
+    options.made = std::chrono::system_clock::from_time_t(std::mktime(&day));
+    options.port = "/dev/ttyUSB3";
+    options.vehicle = "my van";
+    ModuleReport module = soundModule();
+    module.info.vin = "WVWZZZ1JZWW000001"; // 1998, or 2028
+    module.codes.lamp = true;
+    TemporaryFolder const folder;
+    for (char const* const name : {"car.md", "car.txt"}) {
+        writeDocument(folder.file(name), vehicleOf({module}), options);
+    }
+    std::string const text = folder.read("car.md");
+    EXPECT_NE(text.find("| Date | 2026-06-07 08:09 |"), std::string::npos) << text;
+    EXPECT_NE(text.find("| Model year | 1998, if this maker codes it |"), std::string::npos) << "2028 is still to come";
+    EXPECT_NE(text.find("| Port | /dev/ttyUSB3 |"), std::string::npos);
+    EXPECT_NE(text.find("| Name | my van |"), std::string::npos);
+    EXPECT_EQ(folder.read("car.txt").find('\x1B'), std::string::npos) << "a file has no colours";
+    EXPECT_NE(toText(vehicleOf({module}), options, TextStyle{true}).find('\x1B'), std::string::npos);
 }
 
 TEST(ReportFile, IsReplacedOnlyWhereThatIsWanted)

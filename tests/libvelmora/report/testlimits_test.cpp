@@ -43,12 +43,13 @@ TEST(TestLimits, AreNoneWithoutAResultAValueOrSense)
 // SAE J1979, appendix E: a test with one limit sends the end of the range for the other.
 TEST(TestLimits, LimitNothingAtTheEndOfTheRange)
 {
-    for (char const* const end :
-         {"65535", "6553.5", "655.35", "65.535", "32767", "327.67", "3276.7", "16383.75", "32767.5", "3276.75",
-          "655350", "40721.56", "117963", "9505.04", "6513.5", "6513.4", "11756.3", "1.99997"}) {
+    for (char const* const end : {"65535",    "6553.5",  "655.35",  "65.535",  "32767",    "327.67", "3276.7",
+                                  "16383.75", "32767.5", "3276.75", "655350",  "40721.56", "117963", "9505.04",
+                                  "6513.5",   "6513.4",  "11756.3", "1.99997", "2",        "4",      "20"}) {
         EXPECT_EQ(boundsOf(boundTest("2", "1", end)), "1..") << end;
     }
-    for (char const* const end : {"0", "-32768", "-327.68", "-3276.8", "-8192", "-40", "-58982.4"}) {
+    EXPECT_FALSE(limitsOf(boundTest("0.7", "0.5", "0.99997"))->max);
+    for (char const* const end : {"0", "-1", "-2", "-10", "-32768", "-327.68", "-3276.8", "-8192", "-40", "-58982.4"}) {
         EXPECT_EQ(boundsOf(boundTest("2", end, "7")), "..7") << end;
     }
     for (char const* const limit : {"65533", "65537", "6513.0", "6514.0", "11755.0", "12000", "32000"}) {
