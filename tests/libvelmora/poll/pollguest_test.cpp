@@ -81,6 +81,13 @@ TEST_F(PollGuestTest, TakesTurnsAtItsRateAndIsToldOf)
     EXPECT_EQ(rates[3].silent, m_guest->turns);
     m_cycle->stop();
     EXPECT_TRUE(m_guest->stopped);
+    m_guest->told = {resultOf(0x763, 0x10002)};
+    int const before = m_guest->turns;
+    run(careful, 4000);
+    EXPECT_NEAR(m_cycle->rates()[3].reached, 10.0, 0.5) << "now it tells the other";
+    EXPECT_EQ(m_cycle->rates()[3].silent, 0);
+    EXPECT_EQ(m_cycle->rates()[2].silent, m_guest->turns - before);
+    EXPECT_LT(m_cycle->rates()[2].reached, 10.0);
 }
 
 TEST_F(PollGuestTest, AloneIsTimedByItsOwnTurns)
@@ -114,6 +121,35 @@ TEST_F(PollGuestTest, SensorsArePausedAfterThreeFailuresInARow)
     }
     run(careful, 450);
     EXPECT_GE(m_proxy->count("01 0C"), 20) << "two in a row are no silence";
+}
+
+TEST_F(PollGuestTest, EachGuestHasRatesOfItsOwn)
+{
+    auto const second = std::make_shared<FakeGuest>(&m_clock);
+    wantGuest(10.0);
+    m_sources.push_back({nullptr, nullptr, 2.0, second});
+    m_guest->told = {resultOf(0x763, 0x10002)};
+    second->told = {resultOf(0x763, 0x10001)};
+    run(careful, 3000);
+    std::vector<PollRate> const rates = m_cycle->rates();
+    ASSERT_EQ(rates.size(), 4U);
+    EXPECT_EQ(rates[0].reached, 0.0);
+    EXPECT_NEAR(rates[1].reached, 10.0, 0.5);
+    EXPECT_NEAR(rates[2].reached, 2.0, 0.2);
+    EXPECT_EQ(rates[3].reached, 0.0);
+    EXPECT_EQ(rates[3].silent, second->turns);
+}
+
+TEST_F(PollGuestTest, AnEmptyReplyIsNone)
+{
+    want(0x0C);
+    want(0x0D);
+    m_proxy->answer("01 0C 0D", "");
+    m_proxy->answer("01 0C", "41 0C 1A F8");
+    m_proxy->answer("01 0D", "41 0D 50");
+    run(fastSix, 240);
+    EXPECT_EQ(m_proxy->count("01 0C 0D"), 3) << "the third in a row tells that they can't be asked together";
+    EXPECT_GT(count(0x7E8, 0x0C), 5U);
 }
 
 TEST_F(PollGuestTest, NothingToAskIsWaitedForInPeace)

@@ -50,8 +50,7 @@ protected:
 // What is on its way comes to its end: a question of the library may take several requests.
 TEST_F(InterruptedReaders, AskForNothingMoreThanWhatTheyAreAt)
 {
-    EXPECT_EQ(requestsUntilTheEnd("petrol-can11", {1, 4, 5, 6}, [](auto& s, auto& e) { readFreeze(s, e, 0); }),
-              "3 4 5 6");
+    EXPECT_EQ(requestsUntilTheEnd("petrol-can11", {1, 4, 5}, [](auto& s, auto& e) { readFreeze(s, e, 0); }), "3 4 5");
     EXPECT_EQ(requestsUntilTheEnd("bench-can11", {1, 2, 3}, [](auto& s, auto& e) { readReadiness(s, e); }), "1 2 4");
     EXPECT_EQ(requestsUntilTheEnd("bench-can11", {1, 2, 3, 4, 5}, [](auto& s, auto& e) { readInfo(s, e); }),
               "1 2 3 4 5");
@@ -69,9 +68,40 @@ TEST_F(InterruptedReaders, AskForNothingMoreThanWhatTheyAreAt)
                                       readValuesAgain(s, e, bus, values);
                                   }),
               "2 3");
+    EXPECT_EQ(requestsUntilTheEnd(
+                  "petrol-iso9141", {1, 2},
+                  [](auto& s, auto& e) { readValues(s, e, std::make_shared<GroupedPids>(s.proxy(), e.id())); }),
+              "1 2");
     EXPECT_EQ(requestsUntilTheEnd("petrol-can11", {1}, [](auto& s, auto& e) { readCounters(s, e); }), "1");
     EXPECT_EQ(requestsUntilTheEnd("petrol-can11", {1}, [](auto& s, auto&) { clearCodes(s); }), "1");
     EXPECT_EQ(requestsUntilTheEnd("petrol-can11", {1}, [](auto& s, auto& e) { runRoutine(s, e, {1, "", ""}); }), "1");
+}
+
+// Whoever was it before.
+TEST_F(InterruptedReaders, MakeTheirModuleTheCurrentOne)
+{
+    connect("petrol-can11");
+    obd::IEcuManager& manager = *m_session->obd().getEcuManager();
+    std::pair<char const*, Read> const readers[] = {
+        {"freeze", [](auto& s, auto& e) { readFreeze(s, e, 0); }},
+        {"readiness", [](auto& s, auto& e) { readReadiness(s, e); }},
+        {"info", [](auto& s, auto& e) { readInfo(s, e); }},
+        {"vin", [](auto& s, auto& e) { readVin(s, e); }},
+        {"counters", [](auto& s, auto& e) { readCounters(s, e); }},
+        {"monitors", [](auto& s, auto& e) { readMonitors(s, e); }},
+        {"oxygen", [](auto& s, auto& e) { readOxygen(s, e); }},
+        {"codes", [](auto& s, auto& e) { CodeReader(s).read(e, {CodeKind::Pending}); }},
+        {"routines", [](auto& s, auto& e) { readRoutines(s, e); }},
+        {"routine",
+         [](auto& s, auto& e) {
+             runRoutine(s, e, {1, "", ""});
+         }},
+    };
+    for (auto const& [name, read] : readers) {
+        manager.setCurrentEcu(0x7E8);
+        read(*m_session, module(1));
+        EXPECT_EQ(manager.getCurrentEcu()->id(), 0x7E9U) << name;
+    }
 }
 
 class ReadersOfTopics : public ReadersTest
@@ -225,6 +255,14 @@ TEST_F(ReadersOfTopics, AddValuesThatWereNotThereAtFirst)
     EXPECT_EQ(rpm->name, "Engine RPM");
     EXPECT_EQ(rpm->unit, "rpm");
     EXPECT_EQ(rpm->part, 0);
+}
+
+TEST_F(ReadersOfTopics, TakeNoAnswerOfAnotherModule)
+{
+    connect("petrol-can11");
+    m_car->control("module 7E9 silent");
+    auto const bus = std::make_shared<GroupedPids>(m_session->proxy(), module(1).id());
+    EXPECT_TRUE(readValues(*m_session, module(1), bus).empty()) << "the engine answered for itself";
 }
 
 // The poller's pace depends on the model year where old modules must not be asked too often.

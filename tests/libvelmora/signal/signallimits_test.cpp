@@ -1,6 +1,7 @@
 // Signal files and imports at the limits of what they may hold.
 #include "libvelmora/signal/builtinpids.h"
 #include "libvelmora/signal/importing/csvcolumns.h"
+#include "libvelmora/signal/importing/importedrow.h"
 #include "libvelmora/signal/importing/jsonsource.h"
 #include "libvelmora/signal/importing/wicanformula.h"
 #include "libvelmora/signal/readingonly.h"
@@ -216,6 +217,14 @@ TEST(SignalLimits, ImportsTakeOnlyWhatIsThere)
         << "only a request of four digits opens a session";
     EXPECT_THROW(importSignals("", "f"), Error);
     EXPECT_THROW(importSignals(" \n", "f"), Error);
+    EXPECT_EQ(ImportCollector("f").newId("(x)"), "X");
+    EXPECT_EQ(testsupport::importedText(importSignalCsv("A,a,2101,A", "f")),
+              R"(id = "A"; name = "A"; request = "2101"; formula = "A"; precision = 2; )")
+        << "a row may end early";
+    EXPECT_EQ(testsupport::importedText(importSignalCsv("A,a,,val{Z},0,1,,\nB,b,2101,A+,0,1,,\n", "f")),
+              "refused f:1: A: its formula reads a value that is not in this file, or its own; "
+              "refused f:2: B: equation \"A+\": the formula ends too early (at character 3); ")
+        << "in the order of the file, though the first is found out last";
     EXPECT_EQ(numberCell("inf"), std::nullopt);
     EXPECT_EQ(numberCell("1e3"), 1000.0);
 }
