@@ -25,8 +25,9 @@ template <typename Number>
 std::optional<Number> readNumber(std::string_view text)
 {
     Number value{};
-    auto const [end, error] = std::from_chars(text.data(), text.data() + text.size(), value);
-    return error == std::errc() && end == text.data() + text.size() && value != 0 ? std::optional(value) : std::nullopt;
+    char const* const last = text.data() + text.size();
+    auto const [end, error] = std::from_chars(text.data(), last, value);
+    return error == std::errc() && end == last && value != 0 ? std::optional(value) : std::nullopt;
 }
 
 bool takePrefix(std::string_view& text, std::string_view prefix)

@@ -7,15 +7,6 @@
 
 namespace velmora {
 
-namespace {
-
-OpeningStop stopOf(StopAsked const& stop)
-{
-    return stop ? stop : [] { return false; };
-}
-
-} // namespace
-
 std::vector<SerialPortEntry> serialPorts()
 {
     return listSerialPorts();
@@ -23,7 +14,7 @@ std::vector<SerialPortEntry> serialPorts()
 
 std::vector<BluetoothEntry> bluetoothAdapters(std::chrono::seconds search, StopAsked const& stop)
 {
-    return listBluetoothAdapters(search, stopOf(stop));
+    return listBluetoothAdapters(search, stop);
 }
 
 std::string pairBluetooth(std::string const& device, std::function<void(std::string const& line)> const& tell,
@@ -33,7 +24,7 @@ std::string pairBluetooth(std::string const& device, std::function<void(std::str
                              : device.starts_with("ble://") ? device.substr(6)
                                                             : device;
     std::string mac = parseBluetoothMac(text);
-    pairDevice(mac, tell, stopOf(stop));
+    pairDevice(mac, tell, stop);
     return mac;
 }
 

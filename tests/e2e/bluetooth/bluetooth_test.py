@@ -27,7 +27,9 @@ class Bluetooth(Rig):
     def test_low_energy_by_messages_where_no_socket_is_given(self):
         path = self.add_ble(flags=('write',), notify=WRITE, write=WRITE)
         self.control.GiveSockets(path, False)
+        start = time.monotonic()
         self.expect(['-p', f'ble://{BLE}', 'info'], 0, 'VIN')
+        self.assertLess(time.monotonic() - start, 15, 'it ends without waiting for what was answered')
 
     def test_low_energy_of_an_unknown_service_and_swapped_names(self):
         self.add_ble(service='12345678-0000-1000-8000-00805f9b34fb', notify=WRITE, write=NOTIFY)
@@ -143,6 +145,9 @@ class Bluetooth(Rig):
         code, _, said = run('-p', f'ble://{BLE}', 'info', environment={'DBUS_SYSTEM_BUS_ADDRESS': 'unix:path=/nonexistent'})
         self.assertEqual(code, 3)
         self.assertIn('no system bus', said)
+        code, _, said = run('-p', f'bt://{CLASSIC}', 'info', environment={'DBUS_SYSTEM_BUS_ADDRESS': 'unix:path=/nonexistent'})
+        self.assertEqual(code, 3)
+        self.assertIn(f'Could not connect to {CLASSIC} by Bluetooth: ', said, "the kernel's own socket needs no bus")
         self.service.send_signal(signal.SIGTERM)
         self.service.wait(10)
         self.expect(['-p', f'ble://{BLE}', 'info'], 3, 'bluetoothd')

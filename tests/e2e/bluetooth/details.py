@@ -1,4 +1,5 @@
 """What the program asks of the Bluetooth service, call by call, and what it makes of odd answers."""
+import resource
 import socket
 import subprocess
 import time
@@ -81,6 +82,7 @@ class Details(Rig):
         self.control.Hide(self.add_ble())
         self.expect(['-p', f'ble://{BLE}', 'info'], 0)
         self.assertEqual(self.calls('SetDiscoveryFilter', 'StartDiscovery', 'StopDiscovery'), [1, 1, 1])
+        self.assertLess(self.calls('GetManagedObjects')[0], 20, 'it looks twice a second')
 
     def test_ports_listens_and_an_absent_device_is_told(self):
         self.control.Listen()
@@ -91,6 +93,7 @@ class Details(Rig):
         self.assertEqual(self.calls('StartDiscovery'), [0], 'what is known needs no listening')
         self.control.Hide(self.add_ble())
         listing = subprocess.Popen(command('ports'), stdout=subprocess.PIPE, stderr=subprocess.PIPE, text=True)
+        before = resource.getrusage(resource.RUSAGE_CHILDREN)
         absent = subprocess.Popen(command('-p', f'ble://{OTHER}', 'info'), stderr=subprocess.PIPE, text=True)
         start = time.monotonic()
         self.expect(['ports', 'pair', OTHER], 3, f'No Bluetooth device {OTHER} is in reach', f'Looking for {OTHER} ...')
@@ -99,6 +102,8 @@ class Details(Rig):
         self.assertEqual(absent.returncode, 3, told)
         self.assertIn(f'No Bluetooth device {OTHER} is in reach\n  - is the ignition on', told)
         found, said = listing.communicate(timeout=20)
+        after = resource.getrusage(resource.RUSAGE_CHILDREN)
+        self.assertLess(after.ru_utime + after.ru_stime - before.ru_utime - before.ru_stime, 6, 'seconds of the processor')
         self.assertIn('Listening for Bluetooth adapters nearby, 11 s ...', said)
         self.assertLess(found.index(f'bt://{CLASSIC}  OBDII, paired\n'),
                         found.index(f'ble://{BLE}  OBDBLE, nearby, not paired\n'), 'the paired one first')

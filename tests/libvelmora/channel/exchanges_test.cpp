@@ -266,6 +266,7 @@ TEST(OwnExchange, TakesAReplyInTheLastMomentAndBehindABlankOne)
         AddressedModule const engine(rig.channel, 0x7E8);
         EXPECT_THAT(rig.ask("010C"), Optional(rpmReply));
         EXPECT_THAT(rig.wire->takeCommands(), ElementsAre("ATSH7E0", "010C", "ATSH7DF"));
+        EXPECT_EQ(rig.met(Habit::EmptyReply), reply.front().bytes.starts_with("OK") ? 0U : 1U);
     }
     ChannelRig late;
     late.connect();

@@ -183,8 +183,9 @@ TEST(HealedReplies, DropNothingButWhatStandsBehindDataOrAnAnswer)
     };
     for (Row const& row :
          {Row{"hello\rNO DATA\r", "hello\rNO DATA\r"}, Row{"hello\r7E804410C1AF8\r", "7E804410C1AF8\r"},
-          Row{"7E8037F0112\rCAN ERROR\r", "7E8037F0112\rCAN ERROR\r"}, Row{"7E804410C1AF8\r?\r", "7E804410C1AF8\r"},
-          Row{"SEARCHING...\rhello\r", "SEARCHING...\rhello\r"},
+          Row{"7E8037F0112\rCAN ERROR\r", "7E8037F0112\rCAN ERROR\r"},
+          Row{"7E8037F0112\r7E804410C1AF8\r", "7E8037F0112\r7E804410C1AF8\r"},
+          Row{"7E804410C1AF8\r?\r", "7E804410C1AF8\r"}, Row{"SEARCHING...\rhello\r", "SEARCHING...\rhello\r"},
           Row{"SEARCHING...\rUNABLE TO CONNECT\r", "SEARCHING...\rUNABLE TO CONNECT\r"}}) {
         EXPECT_EQ(healedOnce(row.raw, {"010C"}).text(), row.text);
     }

@@ -177,6 +177,42 @@ TEST_F(SecondVisit, FallsBackWhereTheBusOfTheLastIsNotTheVehicles)
     EXPECT_THAT(rig.wire->takeCommands(), ElementsAre("ATI", "ATTP6", "ATTP0")) << "it is tried once";
 }
 
+// The adapter that does not let itself be told to search is asked no second time in vain.
+TEST_F(SecondVisit, WithoutASearchTakesTheSilenceOfTheFirstBus)
+{
+    m_store->setProtocol(m_adapter, 6);
+    ChannelRig rig(m_store, m_options);
+    rig.wire->on("ATI", "ELM327 v1.5").on("0100", "NO DATA").on("ATTP0", "?");
+    for (char const* command : {"ATI", "ATTP0", "0100"}) {
+        rig.ask(command);
+    }
+    EXPECT_THAT(rig.wire->takeCommands(), ElementsAre("ATI", "ATTP6", "0100", "ATTP0"));
+}
+
+// A wait that is recalled is cut once the vehicle has said something whole.
+TEST_F(SecondVisit, CutsTheFirstWaitBehindAWholeLine)
+{
+    using Said = support::ScriptedWire::Reply;
+    std::pair<Said, bool> const rows[] = {
+        {{{"4100BE3EA813\r", WireTime(20)}, {"\r>", WireTime(400)}}, true},
+        {{{"SEARCHING...\r", WireTime(20)}, {"4100BE3EA813\r\r>", WireTime(400)}}, false},
+        {{{"4100BE3EA813", WireTime(20)}, {"\r\r>", WireTime(400)}}, false},
+        {{{"CAN ERROR\r", WireTime(20)}, {"\r>", WireTime(400)}}, false},
+        {{{"4100BE3EA813\rCAN ERROR\r", WireTime(20)}, {"\r>", WireTime(400)}}, false},
+    };
+    for (auto const& [reply, isCut] : rows) {
+        m_store->setProtocol(m_adapter, 6);
+        m_store->setWait(m_adapter, {25, true});
+        ChannelRig rig(m_store, m_options);
+        rig.wire->on("ATI", "ELM327 v1.5").on("0100", reply);
+        rig.wire->onInterrupt({{"STOPPED\r\r>", WireTime(4)}});
+        for (char const* command : {"ATI", "ATE0", "ATST64", "ATTP0", "0100"}) {
+            rig.ask(command, 2000);
+        }
+        EXPECT_EQ(rig.channel.statistics().waitsCut, isCut ? 1U : 0U) << reply.front().bytes;
+    }
+}
+
 TEST_F(SecondVisit, RecallsAWaitOnCanWhereItIsShorter)
 {
     struct Row

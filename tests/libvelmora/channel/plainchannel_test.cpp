@@ -65,9 +65,13 @@ TEST_F(PlainChannelTest, LoggersSeeBothWays)
     m_channel.setDelimiter('O');
     send("ATI\r");
     EXPECT_EQ(receive(), "");
+    EXPECT_EQ(tap.seen, "ATI\r");
+    m_channel.setDelimiter('>');
+    EXPECT_EQ(receive(), "K\r\r");
+    EXPECT_EQ(tap.seen, "ATI\rK\r\r");
     m_channel.removeLogger(&tap);
     send("ATI\r");
-    EXPECT_EQ(tap.seen, "ATI\r");
+    EXPECT_EQ(tap.seen, "ATI\rK\r\r");
 }
 
 } // namespace

@@ -133,6 +133,9 @@ TEST(PortWire, WhoeverAsksFindsOutThatASocketIsGone)
     EXPECT_TRUE(rig.wire->lost()) << "though nobody reads";
     EXPECT_FALSE(rig.wire->isUp());
     EXPECT_FALSE(rig.wire->resume());
+    SocketWire resumed;
+    resumed.other.close();
+    EXPECT_FALSE(resumed.wire->resume()) << "whoever asks first";
     SocketWire read;
     EXPECT_TRUE(read.wire->isUp());
     read.other.close();

@@ -11,6 +11,7 @@
 #include <gtest/gtest.h>
 
 #include <fstream>
+#include <grp.h>
 #include <sys/file.h>
 #include <sys/stat.h>
 
@@ -66,10 +67,14 @@ TEST(DoctorPort, WhoElseStandsThereIsTold)
                       HasSubstr("end that program")));
     ::close(other);
     ASSERT_EQ(::chmod(console.path().c_str(), 0), 0);
-    auto const tellsTheGroup = [&console] {
+    struct stat status = {};
+    ASSERT_EQ(::stat(console.path().c_str(), &status), 0);
+    group const* const owners = ::getgrgid(status.st_gid);
+    std::string const name = owners != nullptr ? owners->gr_name : "";
+    auto const tellsTheGroup = [&console, &name] {
         std::string const text = lineText(checkPort(SerialAddress{console.path(), 38400}));
         bool const told = text.find("not yours to open") != std::string::npos &&
-                          text.find("add your user to the group ") != std::string::npos;
+                          text.find("add your user to the group " + name + " and") != std::string::npos;
         return told ? 0 : 1;
     };
     EXPECT_EQ(test::asUser(console.path(), false, tellsTheGroup), 0);

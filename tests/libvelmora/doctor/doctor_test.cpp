@@ -45,6 +45,9 @@ TEST(CommandMatrix, TellsTheLevelAndWhatIsMissing)
     EXPECT_EQ(clone.missing, (std::vector<std::string>{"ATAMC", "ATCTM1"}));
     EXPECT_TRUE(matrixOf(until14, "ELM327 v1.5").claimIsMadeUp);
     EXPECT_TRUE(matrixOf(until14, "OBDII by somebody").claimed.empty());
+    EXPECT_EQ(matrixOf(until14, "ELM327 v1.4b (by somebody)").claimed, "1.4b");
+    EXPECT_EQ(matrixOf(until14, "ELM327 v1.4a").level, "1.4b");
+    EXPECT_TRUE(matrixOf(until14, "ELM327 v1.4a").claimIsMadeUp);
     EXPECT_EQ(matrixOf({"1.0"}, "ELM327 v1.0").level, "1.0");
     EXPECT_EQ(matrixOf({}, "ELM327 v1.0").level, "");
 }
