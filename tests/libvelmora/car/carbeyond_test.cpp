@@ -326,11 +326,20 @@ TEST_F(CarBeyond, AFeedThatWasStoppedBringsNothingMore)
     EXPECT_TRUE(feed->wait(std::chrono::seconds(20)));
     feed->stop();
     feed->take();
-    EXPECT_FALSE(feed->wait(std::chrono::milliseconds(150)));
+    EXPECT_FALSE(feed->wait(std::chrono::milliseconds(120)));
     EXPECT_EQ(feed->rates().size(), 1U) << "as they were";
     feed->stop();
+    state.restart();
+    std::shared_ptr<velmora::LiveFeed> const next = state.feed();
+    EXPECT_NE(next, feed);
+    EXPECT_TRUE(next->wait(std::chrono::seconds(20)));
     state.drop();
+    next->take();
+    EXPECT_FALSE(next->wait(std::chrono::milliseconds(120))) << "its session may be gone";
     state.drop();
+    EXPECT_THROW(state.choice(), Error);
+    EXPECT_THROW(state.session(), Error);
+    EXPECT_THROW(state.restart(), Error);
 }
 
 TEST_F(CarBeyond, ModulesThatAreRememberedAreAskedWithoutASearch)
@@ -368,6 +377,8 @@ TEST_F(CarBeyond, ModulesThatAreRememberedAreAskedWithoutASearch)
     ASSERT_EQ(codes[3].codes.size(), 1U);
     EXPECT_EQ(codes[3].codes[0].hex, "4155");
     EXPECT_EQ(codes[3].codes[0].status, 0x60);
+    EXPECT_EQ(codes[3].codes[0].type, 0) << "service 18 has none";
+    EXPECT_EQ(codes[3].codes[0].code, "");
     EXPECT_EQ(car.identifiers()[0].report.at(0xF190), vin);
 }
 

@@ -185,6 +185,21 @@ TEST(CarFace, IsRecordedWithoutItsVinAndWithoutItsEnd)
     EXPECT_FALSE(std::filesystem::exists(unsaved));
 }
 
+TEST(CarFace, IsRecordedAcrossAReconnection)
+{
+    testsupport::TemporaryFolder const folder;
+    auto const recorder = std::make_shared<velmora::Recorder>(folder.file("car.dialogue"));
+    {
+        CarOptions options = instantCar("petrol-can11");
+        options.recorder = recorder;
+        Car car(options);
+        car.reconnect();
+        EXPECT_EQ(car.read({"FUEL_LEVEL"}).size(), 1U);
+    }
+    EXPECT_GT(recorder->save("car"), 20U);
+    EXPECT_NE(wholeFile(folder.file("car.dialogue")).find("012F"), std::string::npos) << "what came behind it, too";
+}
+
 TEST(CarFace, TellsItsTrafficUpToTheClosing)
 {
     std::mutex mutex;

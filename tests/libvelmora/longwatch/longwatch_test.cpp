@@ -185,7 +185,9 @@ TEST_F(LongWatchTest, LeavesAnOutputThatHangsBehind)
     std::string const file = m_folder.file("watch.db");
     m_options.outputs = {"sqlite:" + file};
     LongWatch watch(m_options);
+    watch.reload(); // a wish that comes before the beginning counts, too
     std::thread runner([&watch] { watch.run(); });
+    EXPECT_TRUE(m_told.hold("The settings were read again"));
     EXPECT_TRUE(m_told.hold("running"));
     velmora::Database other(file);
     auto const hold = std::make_unique<velmora::Transaction>(other);

@@ -1,8 +1,10 @@
 // What a run of the watch makes of what it was told.
 #include "libvelmora/longwatch/runsetup.h"
 #include "libvelmora/longwatch/watchorder.h"
+#include "libvelmora/longwatch/watchrun.h"
 #include "libvelmora/session/settingsstore.h"
 #include "libvelmora/watch/statefolder.h"
+#include "tests/support/openfiles.h"
 #include "tests/support/temporaryfolder.h"
 
 #include <velmora/error.h>
@@ -114,6 +116,26 @@ TEST_F(RunSetup, AStrangerIsAVehicleThatIsKnownByAnotherName)
     EXPECT_EQ(velmora::vehicleName(settings), "van");
     EXPECT_FALSE(velmora::rulesOf(settings, "van").isStranger("VIN-2")) << "its name was chosen";
     EXPECT_NE(velmora::rulesOf(settings, "van").seed, velmora::rulesOf(settings, "van").seed);
+}
+
+TEST_F(RunSetup, OutputsAreEndedOnceWhoeverDoesIt)
+{
+    LongWatchOptions options;
+    options.car.port = "sim:petrol-can11?instant";
+    WatchSettings settings;
+    settings.vehicle = "van";
+    settings.outputs = {velmora::parseOutputAddress("csv-long:" + m_folder.file("a.csv") + "?queue=7")};
+    velmora::ServiceNotify notify;
+    velmora::WatchRun run(options, settings, notify);
+    EXPECT_FALSE(run.health().linkUp);
+    EXPECT_TRUE(testsupport::isHeldOpen(m_folder.file("a.csv")));
+    EXPECT_TRUE(run.endOutputs());
+    EXPECT_FALSE(testsupport::isHeldOpen(m_folder.file("a.csv")));
+    EXPECT_FALSE(run.endOutputs()) << "somebody else has done that";
+    run.finish();
+    run.finish();
+    options.car.port.clear();
+    EXPECT_THROW(velmora::WatchRun(options, settings, notify), velmora::Error) << "no port is named";
 }
 
 // What the options and the file say together.

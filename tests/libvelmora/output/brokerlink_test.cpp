@@ -97,6 +97,7 @@ TEST(BrokerLink, DeliversPassesOnAndComesBack)
     ASSERT_TRUE(kept);
     EXPECT_THAT(noted.until("delivered " + std::to_string(*kept)),
                 testing::Contains("delivered " + std::to_string(*kept)));
+    EXPECT_TRUE(testsupport::comesTrue([&link] { return !link.isBusy(); })) << "all is written";
     publishFrom(port, "-t t/back -m 'hello you'");
     EXPECT_THAT(noted.until("message"), testing::Contains("message t/back hello you"));
 

@@ -128,6 +128,17 @@ TEST(LineFiles, MayBeStandardOutputWhichStaysOpen)
     EXPECT_FALSE(std::filesystem::exists("-"));
 }
 
+TEST(LineFiles, AreNotRenamedBeforeTheyHaveLines)
+{
+    for (char const* const head : {"", "head\n"}) {
+        TemporaryFolder const folder;
+        LineFile file(parseOutputAddress("ndjson:" + folder.file("a") + "?rotate=day"));
+        file.setHeader(head);
+        EXPECT_EQ(lineTrouble(file, "1\n"), "");
+        EXPECT_EQ(std::distance(std::filesystem::directory_iterator(folder.path()), {}), 1) << head;
+    }
+}
+
 TEST(LineFiles, BeginAgainWhereSomebodyHasMovedThemAway)
 {
     TemporaryFolder const folder;

@@ -3,6 +3,7 @@
 #include "libvelmora/output/mqtt/homestate.h"
 #include "libvelmora/output/mqtt/mqttsettings.h"
 #include "libvelmora/output/mqtt/spoolsender.h"
+#include "libvelmora/output/mqtt/spooltext.h"
 #include "tests/support/process/broker.h"
 
 #include <velmora/error.h>
@@ -94,6 +95,29 @@ TEST(MqttParts, SettingsHaveTheirBoundsAndMessages)
     EXPECT_EQ(other.spoolMax, 1024U);
     EXPECT_FALSE(velmora::storedMark(R"({"spool":"ab"})", "ab"));
     EXPECT_FALSE(velmora::storedMark(R"({"seq":1})", "ab"));
+}
+
+// What is not told is nothing, and no value that somebody could take for one.
+TEST(MqttParts, RecordsAndRowsBeginWithNothing)
+{
+    EXPECT_EQ(velmora::ModuleInfo().id, 0U);
+    EXPECT_EQ(velmora::CodeChange().module, 0U);
+    EXPECT_TRUE(velmora::CodeChange().present);
+    EXPECT_EQ(velmora::LampState().module, 0U);
+    EXPECT_FALSE(velmora::LampState().on);
+    EXPECT_EQ(velmora::ClockLook().wall + velmora::ClockLook().boot, 0);
+    EXPECT_FALSE(velmora::ClockLook().synced || velmora::ClockLook().battery);
+    EXPECT_EQ(velmora::ClockStamp().offset, 0);
+    EXPECT_EQ(velmora::Spool::Row().seq, 0);
+    EXPECT_EQ(velmora::Spool::Row().time, velmora::Spool::Time::Sure);
+    EXPECT_EQ(velmora::Spool::Gap().first + velmora::Spool::Gap().last, 0);
+    EXPECT_EQ(velmora::BatchHead().after + velmora::BatchHead().stored, 0);
+    velmora::MqttSettings const settings;
+    EXPECT_EQ(settings.qos, 1);
+    EXPECT_EQ(settings.keepAlive, 30s);
+    EXPECT_EQ(settings.spoolMax, 0U);
+    EXPECT_FALSE(settings.tls);
+    EXPECT_EQ(velmora::BrokerPlace().port, 1883);
 }
 
 TEST(MqttParts, HomeServersAreToldOfEachKindOfSensor)

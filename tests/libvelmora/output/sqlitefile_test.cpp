@@ -192,6 +192,18 @@ TEST(SqliteFile, HoldsWholeNumbersAsSuchAndNoOthers)
     EXPECT_EQ(at.texts("SELECT typeof(value) || ' ' || ifnull(value, '-') FROM reading ORDER BY time"), expected);
 }
 
+TEST(SqliteFile, RepairsWhatWasStampedBetweenItsOpeningAndTheFirstRecords)
+{
+    DatabaseFile const at;
+    velmora::ClockLook look{1000000, 1000, false, "boot"};
+    SqliteOutput output(velmora::parseOutputAddress("sqlite:" + at.file), [&look] { return look; });
+    output.open();
+    look = {march, 2000, true, "boot"}; // by a time server
+    output.write(records(reading("RPM", 1.0, 1000500), reading("RPM", 2.0, march - 100)));
+    EXPECT_THAT(at.texts("SELECT " + std::to_string(march) + " - time FROM reading ORDER BY time"),
+                ElementsAre("500", "100"));
+}
+
 TEST(SqliteFile, RepairsNothingOnceTheClockIsRight)
 {
     DatabaseFile const at;

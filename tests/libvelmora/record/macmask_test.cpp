@@ -15,6 +15,21 @@ TEST(MacMask, KeepsTheMakersHalfAlone)
     EXPECT_EQ(withoutMacs("00:1D:A5:68:98:8B00:1D:A5:68:98:8B"), "00:1D:A5:xx:xx:xx00:1D:A5:xx:xx:xx");
 }
 
+TEST(MacMask, KnowsItsDigits)
+{
+    for (char const* const known : {"09:AF:af:00:00:00", "99:FF:ff:90:09:Fa"}) {
+        std::string const text = known;
+        EXPECT_EQ(withoutMacs(text), text.substr(0, 9) + "xx:xx:xx") << text;
+        for (char const odd : {'/', '@', 'G', '`', 'g', ' '}) {
+            for (std::size_t at = 0; at < text.size(); ++at) {
+                std::string other = text;
+                other[at] = odd;
+                EXPECT_EQ(withoutMacs(other), other);
+            }
+        }
+    }
+}
+
 TEST(MacMask, LeavesAllElse)
 {
     for (char const* const text : {"", "00:1D:A5:68:98", "00:1D:A5:68:98:8", "00:1D-A5:68:98:8B", "12:34:56",

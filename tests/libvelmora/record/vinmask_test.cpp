@@ -119,6 +119,24 @@ TEST(VinMask, blanksFramesOfTheNumbersOwnMessageAlone)
     EXPECT_EQ(masked(6, "0904", "7E8104902\r7E810144902\r>"), "7E8104902\r7E810144902\r>") << "too short for any";
 }
 
+TEST(VinMask, readsLegacyLinesWithoutTheirCheckByte)
+{
+    EXPECT_EQ(masked(5, "0902",
+                     "87F11049020100000057\r87F11049020241555A5A\r87F11049020338515034\r"
+                     "87F11049020436413132\r87F11049020533343536\r\r>"),
+              "87F11049020100000057\r87F11049020241555A5A\r87F11049020338515034\r"
+              "87F11049020436413030\r87F11049020530303030\r\r>");
+    EXPECT_EQ(masked(5, "0902", "87F11049020100000057\r87F11049020241555A5A\r87F11049020338515034\r\r>"),
+              "NO DATA\r\r>")
+        << "its end may stand in another reply";
+}
+
+TEST(VinMask, readsNoLineThatHoldsWords)
+{
+    EXPECT_EQ(masked(6, "0902", "7E81014490201314E34 <DATA ERROR\r7E821414C3341503744\r7E82243313233343536\r\r>"),
+              "NO DATA\r\r>");
+}
+
 TEST(VinMask, keepsThePiecesInWhichBytesCame)
 {
     obdsim::Dialogue dialogue =

@@ -116,6 +116,11 @@ TEST(AdapterNap, OneThatKnowsNoSleepIsToldApart)
     NapAdapter adapter;
     adapter.answers["STSLEEP\r"] = adapter.answers["ATLP\r"] = "?\r\r>";
     EXPECT_FALSE(AdapterNap(adapter.opener(), 1ms).sleeps());
+    auto const begin = std::chrono::steady_clock::now();
+    NapAdapter silent;
+    silent.answers.clear();
+    EXPECT_FALSE(AdapterNap(silent.opener(), 1ms).sleeps());
+    EXPECT_LT(std::chrono::steady_clock::now() - begin, 290ms) << "no longer than the limit";
     adapter.reachable = false;
     EXPECT_THROW(AdapterNap(adapter.opener(), 1ms), velmora::Error);
 }

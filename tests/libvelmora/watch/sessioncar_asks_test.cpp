@@ -194,6 +194,21 @@ TEST_F(AskedCar, WithoutWishesReadsWhatTripsNeed)
     EXPECT_EQ(kindOf([&] { wrong.connect(); }), ErrorKind::WrongUse) << "a wish of the settings has to be known";
 }
 
+TEST_F(AskedCar, WithoutSpeedItReadsWhatThereIs)
+{
+    make("[[module]]\nid = \"7E8\"\n[module.raw]\n\"0100\" = \"41 00 08 10 00 00\"\n");
+    for (std::vector<std::string> const& wishes : {std::vector<std::string>(), {"COOLANT_TEMP"}}) {
+        m_options.sensors = wishes;
+        SessionCar car(m_options);
+        car.connect();
+        std::vector<std::string> keys;
+        for (velmora::SensorEntry const& each : car.sensors().sensors) {
+            keys.push_back(each.sensor);
+        }
+        EXPECT_THAT(keys, testing::UnorderedElementsAre("RPM", "COOLANT_TEMP"));
+    }
+}
+
 TEST_F(AskedCar, NumbersTheSensorsOfAParameterThatHasSeveral)
 {
     m_options.sensors = {"14", "RPM"};

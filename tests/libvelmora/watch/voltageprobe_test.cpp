@@ -1,3 +1,4 @@
+#include "libvelmora/watch/portinbox.h"
 #include "libvelmora/watch/voltageprobe.h"
 
 #include <velmora/error.h>
@@ -5,6 +6,7 @@
 #include <gtest/gtest.h>
 
 #include <map>
+#include <thread>
 
 namespace {
 
@@ -43,6 +45,40 @@ std::optional<double> probed(std::map<std::string, std::string> const& answers, 
     return velmora::probeVoltage(std::make_unique<AnsweringPort>(answers, written), std::chrono::milliseconds(1));
 }
 
+TEST(PortInbox, GivesUpToEachPrompt)
+{
+    velmora::PortInbox inbox;
+    auto const now = std::chrono::steady_clock::now();
+    EXPECT_FALSE(inbox.hasText());
+    EXPECT_FALSE(inbox.isLost());
+    EXPECT_EQ(inbox.takeUntilPrompt(now), "");
+    inbox.add("one>two>th");
+    EXPECT_EQ(inbox.takeUntilPrompt(now), "one");
+    EXPECT_TRUE(inbox.hasText());
+    EXPECT_EQ(inbox.takeUntilPrompt(now), "two");
+    EXPECT_EQ(inbox.takeUntilPrompt(now), "th") << "what there is when the time runs out";
+    EXPECT_FALSE(inbox.hasText());
+    inbox.add("four");
+    inbox.clear();
+    EXPECT_FALSE(inbox.hasText());
+    for (bool const loses : {false, true}) {
+        std::thread sender([&inbox, loses] {
+            std::this_thread::sleep_for(std::chrono::milliseconds(2));
+            loses ? inbox.lose() : inbox.add("five>");
+        });
+        try {
+            EXPECT_EQ(inbox.takeUntilPrompt(now + std::chrono::hours(1)), "five");
+            EXPECT_FALSE(loses);
+        } catch (velmora::Error const& error) {
+            EXPECT_TRUE(loses);
+            EXPECT_STREQ(error.what(), "The link to the adapter broke");
+            EXPECT_EQ(error.kind(), velmora::ErrorKind::LinkLost);
+        }
+        sender.join();
+    }
+    EXPECT_TRUE(inbox.isLost());
+}
+
 TEST(VoltageProbe, AsksTheAdapterAndNobodyElse)
 {
     std::vector<std::string> written;
@@ -50,7 +86,9 @@ TEST(VoltageProbe, AsksTheAdapterAndNobodyElse)
     EXPECT_EQ(written, (std::vector<std::string>{"\r", "ATRV\r", "closed"}));
     EXPECT_EQ(probed({{"\r", ">"}, {"ATRV\r", ">ATRV\r12.5V\r\r>"}}, written), 12.5) << "a prompt that came late";
     EXPECT_EQ(probed({{"\r", ">"}, {"ATRV\r", "?\r\r>"}}, written), std::nullopt);
+    auto const begin = std::chrono::steady_clock::now();
     EXPECT_EQ(probed({{"\r", ""}, {"ATRV\r", ""}}, written), std::nullopt); // silent
+    EXPECT_LT(std::chrono::steady_clock::now() - begin, std::chrono::milliseconds(450)) << "no longer than the limit";
     EXPECT_THROW(probed({{"\r", ">"}}, written), velmora::Error);
 }
 
