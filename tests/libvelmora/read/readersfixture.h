@@ -1,6 +1,7 @@
 #pragma once
 
 #include "libvelmora/channel/fastchannel.h"
+#include "libvelmora/session/libraryuse.h"
 #include "libvelmora/session/session.h"
 #include "simulator/simulatedcar.h"
 #include "simulator/simulation.h"
@@ -89,6 +90,7 @@ protected:
         }
     }
 
+    LibraryUse const m_catalogue{std::string()}; // so that no session has to load it anew
     support::WorkerClock m_clock;
     testsupport::TemporaryFolder const m_folder;
     std::shared_ptr<obdsim::SimulatedCar> m_car;
