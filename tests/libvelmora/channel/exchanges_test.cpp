@@ -276,6 +276,24 @@ TEST(OwnExchange, TakesAReplyInTheLastMomentAndBehindABlankOne)
     EXPECT_THAT(late.wire->takeCommands(), testing::Contains("ATSH7DF")) << "by broadcast";
 }
 
+TEST(Statistics, OfAFreshChannelAreNone)
+{
+    ChannelRig rig;
+    for (bool const asked : {false, true}) {
+        ChannelStatistics const now = rig.channel.statistics();
+        EXPECT_EQ(now.habits, HabitCounts{});
+        EXPECT_EQ(now.exchanges, asked ? 1U : 0U);
+        EXPECT_EQ(now.counted + now.fromMemory + now.waitsCut + now.slowestReplyMs, 0U);
+        EXPECT_FALSE(now.adapterSilent || now.unanswered || now.countingWorks || now.countingOff);
+        EXPECT_EQ(now.trouble, "");
+        EXPECT_EQ(now.waitMs, std::nullopt);
+        rig.ask("ATE0");
+    }
+    EXPECT_FALSE(rig.channel.takeReply().answered);
+    EXPECT_FALSE(rig.channel.takeReply().broken);
+    EXPECT_FALSE(rig.channel.adapterFails() || rig.channel.adapterResets() || rig.channel.adapterGone());
+}
+
 TEST(Statistics, TellOfExchangesAndTheSlowestReply)
 {
     ChannelRig rig;

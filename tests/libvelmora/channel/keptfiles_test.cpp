@@ -89,6 +89,8 @@ TEST_F(LearntFile, KeepsAllFromVisitToVisit)
         store.setCanCount("x", false);
         store.setWait("x", {25, true});
         store.setProtocol("y", 3);
+        store.setWait("z", {30, false});
+        EXPECT_EQ(store.protocol("z"), 0);
         store.setCounts("VIN", {{"010C", {{0x7E8, 1}, {0x7E9, 2}}}, {"0902", {{0x7E8, 3}}}});
         EXPECT_EQ(store.counts("VIN").size(), 2U);
         store.save();

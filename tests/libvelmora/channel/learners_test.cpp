@@ -48,6 +48,9 @@ TEST(CountLearner, CountsUpToNine)
     EXPECT_THAT(learntOf({{1, 4}, {2, 5}}).countFor("010C", late100s), Optional(9U));
     EXPECT_EQ(learntOf({{1, 5}, {2, 5}}).countFor("010C", late100s), std::nullopt);
     EXPECT_EQ(learntOf({}).countFor("010C", late100s), std::nullopt);
+    CountLearner once;
+    once.learn("010C", {}, WireTime(100), late100s);
+    EXPECT_TRUE(once.learnt().empty());
 }
 
 TEST(CountLearner, AsksPlainlyHalfAMinuteAfterTheLastPlainReply)
