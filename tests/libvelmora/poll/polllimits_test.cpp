@@ -215,6 +215,12 @@ TEST_F(LentProxyTest, OnlyWholeAnswersAreNoted)
     obd::ResponseMap responses;
     m_wire.execute({2, 0x0C}, responses, 100);
     EXPECT_FALSE(m_wire.notes().last(0x7E8, 0x0C)) << "of a freeze frame";
+    m_proxy->answer("02 0C", "41 0C 00 01");
+    m_wire.execute({2, 0x0C}, responses, 100);
+    EXPECT_FALSE(m_wire.notes().last(0x7E8, 0x0C)) << "of a request before";
+    m_proxy->answer("01 0C 0D", "41 0C 00 01 0D");
+    m_wire.execute({1, 0x0C, 0x0D}, responses, 100);
+    EXPECT_FALSE(m_wire.notes().last(0x7E8, 0x0C)) << "who takes the reply apart notes what came whole";
     PollWire gapped(m_proxy, milliseconds(100));
     unsigned int const start = m_clock.millis();
     for (int i = 0; i < 3; ++i) {

@@ -80,6 +80,11 @@ TEST(PollPlan, WhoTakesNoSeveralIsAskedSingly)
               "13,of 1 | 166,of 3 | 12,4,of 0 2");
 }
 
+TEST(PollPlan, AModuleWithoutALimitTakesOnePid)
+{
+    EXPECT_EQ(plan({{0x7EA, 12, {}}, {0x7EA, 13, {}}}, limits(6)), "12,of 0 | 13,of 1");
+}
+
 TEST(PollPlan, DerivedValuesStandAlone)
 {
     EXPECT_EQ(plan({{0x7E8, 12, {}}, {0x7E8, 0xF0, 1.0, true}, {0x7E8, 13, {}}}, limits(6)),

@@ -100,6 +100,11 @@ TEST(MultiLimit, OnlyTheThirdMissInARowCounts)
     EXPECT_EQ(limit.now(), 6U);
     limit.missed(6);
     EXPECT_EQ(limit.now(), 3U);
+    limit.missed(3);
+    limit.missed(3);
+    EXPECT_EQ(limit.now(), 3U) << "counted anew";
+    limit.missed(3);
+    EXPECT_EQ(limit.now(), 1U);
 }
 
 } // namespace

@@ -54,6 +54,7 @@ TEST_F(InterruptedReaders, AskForNothingMoreThanWhatTheyAreAt)
     EXPECT_EQ(requestsUntilTheEnd("bench-can11", {1, 2, 3}, [](auto& s, auto& e) { readReadiness(s, e); }), "1 2 4");
     EXPECT_EQ(requestsUntilTheEnd("bench-can11", {1, 2, 3, 4, 5}, [](auto& s, auto& e) { readInfo(s, e); }),
               "1 2 3 4 5");
+    EXPECT_EQ(requestsUntilTheEnd("petrol-can11", {5, 7}, [](auto& s, auto& e) { readInfo(s, e); }), "5 7");
     EXPECT_EQ(
         requestsUntilTheEnd("bench-can11", {1, 2, 4},
                             [](auto& s, auto& e) {
@@ -138,6 +139,7 @@ TEST_F(ReadersOfTopics, TellAVehicleWithTheMeaningsOfAMaker)
     ASSERT_EQ(report.modules.size(), 2U);
     ModuleReport const& engine = report.modules[0];
     EXPECT_EQ(engine.codes.maker.by, MakerChoice::By::Option);
+    EXPECT_NE(m_progress.find("Reading 7E8 ECM ...\nReading 7E9 "), std::string::npos) << m_progress;
     ASSERT_TRUE(engine.freeze.frame);
     EXPECT_EQ(engine.freeze.frame->code.code, "P0133");
     EXPECT_EQ(engine.freeze.frame->readings.size(), 16U);
@@ -203,6 +205,12 @@ TEST_F(ReadersOfTopics, TellSerialAndTravel)
     EXPECT_FALSE(info.standard.empty());
     EXPECT_FALSE(info.protocol.empty());
     EXPECT_EQ(readVin(*m_session, module()), info.vin);
+    std::ifstream plain(VELMORA_SOURCE_DIR "/simulator/vehicles/bench-can11.toml");
+    std::string text(std::istreambuf_iterator<char>(plain), {});
+    text.replace(text.find("VS10-MT-0001"), 12, "VS10-\\u0001T-0001");
+    std::ofstream(m_folder.file("odd.toml")) << text;
+    connect(m_folder.file("odd.toml"));
+    EXPECT_EQ(readInfo(*m_session, module()).calibrations.at(0).id, "VS10-\uFFFDT-0001");
     connect("petrol-can11");
     std::vector<LiveValue> const values = {{0x21, 0, "a", "17", "km", {}}, {0x4D, 0, "b", "18", "min", {}}};
     InfoReport const beside = readInfoBeside(*m_session, module(), values);
@@ -343,6 +351,10 @@ TEST_F(ReadersOfTopics, ForgetFreezeFramesThatWereErased)
         EXPECT_EQ(each.report.result, ClearReport::Result::NoAnswer);
     }
     EXPECT_EQ(problem([&] { requireCleared(silent); }), "No control module confirmed that it cleared its codes");
+    connect("petrol-can11", "module 7E9 silent");
+    EXPECT_EQ(m_session->selectedModules().size(), 1U);
+    m_car->control("module 7E9 speaks");
+    EXPECT_EQ(clearCodes(*m_session).size(), 2U) << "who answers is told of, known or not";
     auto mixed = silent;
     mixed[1].report = {ClearReport::Result::Refused, "conditions not correct (22)"};
     std::string const refusal = "Control module 7E9 refused to clear its codes: conditions not correct (22)";

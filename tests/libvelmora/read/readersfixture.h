@@ -60,11 +60,13 @@ protected:
         void close() override {}
     };
 
-    Session& connect(std::string const& vehicle, std::vector<std::string> const& faults = {})
+    // With something told to the car before, such as "module 7E9 silent".
+    Session& connect(std::string const& vehicle, std::string const& before = "engine stop")
     {
         m_session.reset();
-        m_car = obdsim::simulateCar({vehicle, "elm327-v1.5", faults});
+        m_car = obdsim::simulateCar({vehicle, "elm327-v1.5", {}});
         m_car->control("engine stop");
+        m_car->control(before);
         SessionOptions options;
         options.port = "a car";
         options.settingsFile = (m_folder.path() / "settings.toml").string();
@@ -74,6 +76,7 @@ protected:
                 std::make_shared<WatchedWire>(m_car, [this](std::string const& request) { onRequest(request); });
             return std::make_shared<FastChannel>(wire, ChannelOptions(), nullptr);
         };
+        options.onProgress = [this](std::string const& text) { m_progress += text; };
         m_stopAt = 0;
         m_session.emplace(options);
         m_session->connect();
@@ -95,7 +98,8 @@ protected:
     testsupport::TemporaryFolder const m_folder;
     std::shared_ptr<obdsim::SimulatedCar> m_car;
     std::vector<std::string> m_asked; // since the connection stands
-    std::size_t m_stopAt = 0;         // which request ends the session; 0: none
+    std::string m_progress;
+    std::size_t m_stopAt = 0; // which request ends the session; 0: none
     std::optional<Session> m_session;
 };
 

@@ -166,7 +166,7 @@ TEST(SensorChoice, SuggestsWhatIsNearAndWhereToLook)
     EXPECT_THAT(failure("coolanttt_tem").hints(), ElementsAre(list, ways)) << "three";
     EXPECT_THAT(failure("rm").hints(), ElementsAre("did you mean RPM (0C)?", list, ways)) << "one of two letters";
     EXPECT_THAT(failure("rq").hints(), ElementsAre(list, ways));
-    for (char const* const word : {"5", "C", "0x0105C"}) {
+    for (char const* const word : {"5", "C", "0x0105C", "020C", "5G", "G5"}) {
         EXPECT_EQ(failure(word).kind(), ErrorKind::WrongUse) << word;
     }
     std::string const other = "another control module may offer it: --ecu ID";
