@@ -115,11 +115,6 @@ void Drive::startEngine(Time now)
     m_stoppedAt.reset();
 }
 
-bool Drive::engineRuns() const
-{
-    return !m_stoppedAt;
-}
-
 bool Drive::hold(std::string const& name, std::optional<double> value)
 {
     bool const known =

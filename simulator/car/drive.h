@@ -24,7 +24,6 @@ public:
     /// odometer that it has reached.
     void stopEngine(Time now);
     void startEngine(Time now);
-    bool engineRuns() const;
 
     /// Keeps a value whatever the drive does; false if there is none of that name. Nothing lets it go.
     bool hold(std::string const& name, std::optional<double> value);

@@ -57,7 +57,11 @@ TEST_F(Silence, IsToldAndEndsWhatCannotBeDone)
     auto falling = begin(half({"live", "RPM", "-n", "100000"}, "scenario=" + m_folder.file("falling")));
     auto never = begin(half({"live", "SPEED", "-n", "1"}));
     auto console = begin(half({"-q", "console"}, "instant&adapter=silent"), "ATI\n");
+    auto old = std::async(std::launch::async, [&] {
+        return runOnTerminal(half({"-q", "live", "RPM"}, "scenario=" + m_folder.file("falling")), "", " s ago", "q");
+    });
     Outcome const screen = runOnTerminal(half({"-q", "live", "SPEED"}), "", "No answer from the vehicle", "q");
+    EXPECT_EQ(old.get().exitCode, 0) << "a value that is gone tells its age";
     EXPECT_EQ(screen.exitCode, 0) << screen.out;
 
     Outcome const woken = waking.get();

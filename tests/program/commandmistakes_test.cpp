@@ -117,6 +117,13 @@ TEST_F(CommandRun, WishesThatMakeNoSense)
          "velmora: Nothing is kept of NOBODY\n  - velmora history lists the vehicles\n"},
         {"history forget NOBODY", 2, "",
          "velmora: Forgetting must be confirmed, and there is no terminal to ask\n  - --yes forgets without asking\n"},
+        {"@R clear", 2, "",
+         "velmora: Clearing must be confirmed, and there is no terminal to ask\n  - --yes clears without asking\n"},
+        {"@R -y --ecu 7E8 clear", 2, "",
+         "velmora: Clearing reaches all control modules; it can't be held to one\n"
+         "  - leave --ecu out to clear the codes of all\n"},
+        {"watch --check-config -o csv:@F/a.csv RPM SPEED", 0, "", "The settings make sense\n"},
+        {"-p sim:no-such-car scan --report @F/x.pdf", 2, "", "velmora: The ending of @F/x.pdf names no form"},
         {"@R routines --run 01", 2, "",
          "velmora: Running a routine must be confirmed, and there is no terminal to ask\n"
          "  - --yes runs it without asking\n"},

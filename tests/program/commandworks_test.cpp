@@ -117,9 +117,54 @@ TEST_F(CommandRun, TheTrafficEndsWithWhatWasAskedFor)
 {
     std::string const told = run("@B --sleep log --duration 0.1").out;
     EXPECT_THAT(told, HasSubstr(" >> ATI\n"));
+    std::string const asked = run("@B log --duration 0.2 RPM").out;
+    EXPECT_NE(asked.find(" >> 010C"), asked.rfind(" >> 010C")) << "as often as there is time";
     EXPECT_THAT(told, testing::Not(HasSubstr(" >> ATLP"))) << "how the connection is ended is nobody's question";
     std::string const lines = run("@B --json log -n 1 RPM").out;
     EXPECT_EQ(json::parse(lines.substr(0, lines.find('\n')))["direction"], "sent");
+}
+
+TEST_F(CommandRun, WhatGotWorseIsToldAndAnExitCodeIfItIsAsked)
+{
+    for (char const* const codes : {"[]", "[\"P0133\"]"}) {
+        std::ofstream(m_folder.file("coded.toml"))
+            << "name = \"Car\"\nprotocol = 6\n[[module]]\nid = \"7E8\"\nlive = \"0C\"\nstored = " << codes << "\n";
+        EXPECT_EQ(run("-q -p sim:@F/coded.toml?instant scan --history --vehicle van").err, "");
+    }
+    EXPECT_EQ(run("diff").code, ExitCode::Done);
+    EXPECT_EQ(run("diff --check").code, ExitCode::Findings);
+    EXPECT_EQ(json::parse(run("--json diff").out)["worse"], true);
+    EXPECT_EQ(run("@R scan").err, "") << "without a terminal nothing is asked";
+    EXPECT_EQ(json::parse(run("--json history").out).size(), 2U) << "and nothing kept";
+}
+
+TEST_F(CommandRun, AReportTellsWhatWasSaidOfTheVehicle)
+{
+    Ended const scan = run("@R scan --no-history --vehicle van --report @F/a.html");
+    EXPECT_EQ(scan.code, ExitCode::Done);
+    EXPECT_THAT(m_folder.read("a.html"), HasSubstr("van"));
+    EXPECT_EQ(run("@R scan --no-history --report @F/a.html").code, ExitCode::WrongUse) << "it stands already";
+    EXPECT_EQ(run("@R scan --no-history --force --report @F/a.html").code, ExitCode::Done);
+    EXPECT_NE(run("@R scan --no-history --inspection us-epa --model-year 1999").out,
+              run("@R scan --no-history --inspection us-epa --model-year 2005").out);
+}
+
+TEST_F(CommandRun, ARecordingThatHasOtherColumnsStays)
+{
+    std::ofstream(m_folder.file("a.csv")) << "time,Other\n";
+    Ended const refused = run("@B live -n 1 SPEED --csv @F/a.csv");
+    EXPECT_EQ(refused.code, ExitCode::WrongUse);
+    EXPECT_THAT(refused.err, HasSubstr("exists already, and has other columns\n  - --force replaces it\n"));
+    EXPECT_EQ(m_folder.read("a.csv"), "time,Other\n");
+    EXPECT_EQ(run("@B live -n 1 SPEED --force --csv @F/a.csv").code, ExitCode::Done);
+    EXPECT_THAT(m_folder.read("a.csv"), StartsWith("time,Vehicle Speed Sensor (km/h)\n"));
+}
+
+TEST_F(CommandRun, OneReadingIsMoreThanNone)
+{
+    Ended const one = run("@B live --duration 0.2 SPEED --rate 0.1");
+    EXPECT_EQ(one.code, ExitCode::Done);
+    EXPECT_EQ(one.out, "Vehicle Speed Sensor: 0 km/h\n");
 }
 
 TEST_F(CommandRun, ADialogueIsRecorded)
@@ -188,6 +233,11 @@ TEST_F(CommandRun, TheProgramDescribesItself)
 {
     EXPECT_EQ(run("__complete sc").out, "scan\tReport on the adapter and all control modules\n");
     EXPECT_THAT(run("__complete live RP").out, StartsWith("RPM\tPID 0C\n"));
+    EXPECT_THAT(run("__complete live 7E9:RP").out, StartsWith("7E9:RPM\tPID 0C\n"));
+    EXPECT_THAT(run("__complete live 7E9:al").out, HasSubstr("\n7E9:all\t"));
+    Ended const all = run("__complete");
+    EXPECT_EQ(all.code, ExitCode::Done);
+    EXPECT_EQ(all.err, "");
     std::istringstream codes(run("__complete dtc p042").out);
     std::set<std::string> different;
     int lines = 0;

@@ -45,6 +45,9 @@ protected:
         Shown shown{};
         std::fflush(stdout);
         std::thread person([&] {
+            sigset_t all; // which are the program's to hear
+            sigfillset(&all);
+            pthread_sigmask(SIG_BLOCK, &all, nullptr);
             std::size_t from = 0;
             auto deed = deeds.begin();
             auto const end = std::chrono::steady_clock::now() + std::chrono::seconds(20);
@@ -187,6 +190,30 @@ TEST_F(TerminalRun, AChoiceIsKeptAsSoonAsItIsMade)
                                   {"", "q"}});
     EXPECT_EQ(chosen.code, 0);
     EXPECT_TRUE(kept) << "while it runs, with the plain table";
+}
+
+TEST_F(TerminalRun, ALayoutThatTheVehicleNoLongerOffersIsNone)
+{
+    std::string const car = "@B live";
+    Shown const first = at(car, {{"q quit", "bq"}});
+    EXPECT_EQ(first.code, 0);
+    std::string const layouts = m_folder.read("layouts.toml");
+    std::string const other = std::regex_replace(layouts, std::regex("\\[\"7E8[^\\]]*\\]"), "[\"7E8:99\"]");
+    ASSERT_NE(other, layouts) << layouts;
+    std::ofstream(m_folder.file("layouts.toml")) << other;
+    Shown const second = at(car, {{"q quit", "q"}});
+    EXPECT_EQ(second.code, 0) << second.text;
+    EXPECT_THAT(second.text, HasSubstr("Vehicle Speed Sensor"));
+}
+
+TEST_F(TerminalRun, AnInterruptEndsLiveValuesAtOnce)
+{
+    auto const start = std::chrono::steady_clock::now();
+    Shown const ended = at("@B live SPEED", {{"km/h", "", [] { ::kill(::getpid(), SIGINT); }}});
+    EXPECT_EQ(ended.code, 130);
+    EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(2));
+    EXPECT_THAT(ended.text.substr(ended.text.rfind("\033[?1049l")), HasSubstr("\nVehicle Speed Sensor       0 km/h "))
+        << "what was read stays";
 }
 
 TEST_F(TerminalRun, WhoAsksTooMuchIsWarnedAtTheBottom)

@@ -74,7 +74,8 @@ def tells_of_itself():
         section = told[told.index(title + ":\n"):].split("\n")[1:]
         members = [each.strip() for each in section[:next((i for i, each in enumerate(section) if each[:1] != " "))]]
         check(code == 0 and any(each.startswith(member) for each in members), f"{title} of the list: {members}")
-    check("--vehicle\t" in run("__complete", "--ve")[1], "completion of an option")
+    code, told, err = run("__complete", "--ve")
+    check(code == 0 and "--vehicle\t" in told and not err, "completion of an option")
     for option, word in (("--drive", "motorway"), ("--vehicle", "petrol-can11"), ("--adapter", "stn2120"), ("--listen", "pty")):
         check(word in run("__complete", option, "")[1].split("\n"), f"completion behind {option}")
     with tempfile.TemporaryDirectory() as folder:

@@ -66,4 +66,33 @@ TEST(ControlLimits, modulesAreNamedByTheirIdOnTheBus)
     }
 }
 
+TEST(ControlLimits, allThatChangesSomethingIsWrittenDown)
+{
+    Simulator car;
+    std::string written;
+    for (char const* const line :
+         {"ignition off", "ignition on", "engine stop", "engine start", "set P0420 pending", "clear",
+          "value 7E8 0C 3000", "hold speed 90", "voltage 11.8", "fault none", "loss", "module 7E9 silent"}) {
+        car.control(line);
+        written += "0.000000 " + std::string(line) + "\n";
+        EXPECT_EQ(car.scenario(), written) << line;
+    }
+    car.control("requests");
+    car.control("help");
+    car.control(" # a remark");
+    EXPECT_EQ(car.scenario(), written);
+}
+
+TEST(ControlLimits, clearingReachesPendingCodes)
+{
+    Simulator car;
+    for (char const* const line : {"ATE0", "ATS0", "ATSP6", "ATSH7E0", "0100"}) {
+        car.ask(line);
+    }
+    car.control("set P0420 pending");
+    EXPECT_NE(car.ask("07").find("0420"), std::string::npos);
+    EXPECT_EQ(car.ask("04"), "44\r\r>");
+    EXPECT_EQ(car.ask("07"), "4700\r\r>");
+}
+
 } // namespace

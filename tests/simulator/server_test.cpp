@@ -230,6 +230,31 @@ TEST(PtyServer, stopsAtOnceAndTakesItsDeviceAway)
     EXPECT_NE(::access(path.c_str(), F_OK), 0);
 }
 
+TEST(PtyServer, whoNeverReadsHoldsNobodyUp)
+{
+    auto const server = obdsim::servePseudoTerminal(obdsim::simulate({}), 1e4);
+    server->start();
+    Line const client(::open(server->address().c_str(), O_RDWR | O_NOCTTY));
+    for (int i = 0; i < 400; ++i) {
+        client.send("ATPPS\r");
+        std::this_thread::sleep_for(std::chrono::microseconds(100)); // each is read, and answered with 450 bytes
+    }
+    EXPECT_LT(timeOf([&] { server->stop(); }), milliseconds(1000));
+}
+
+TEST(PtyServer, itsDevicesAreNotInherited)
+{
+    auto const server = obdsim::servePseudoTerminal(obdsim::simulate({}), fast);
+    int devices = 0;
+    for (int file = 3; file < 256; ++file) {
+        if (::isatty(file) != 0) {
+            ++devices;
+            EXPECT_NE(::fcntl(file, F_GETFD) & FD_CLOEXEC, 0) << file;
+        }
+    }
+    EXPECT_EQ(devices, 2) << "both ends";
+}
+
 TEST(PtyServer, lostLinkTakesTheDeviceAway)
 {
     auto const peer = obdsim::simulate({"petrol-can11", "elm327-v1.5", {"loss@14"}});

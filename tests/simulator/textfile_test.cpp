@@ -111,7 +111,19 @@ TEST_F(TextFile, traceToAPipeLosesNothingWhenItsReaderIsSlow)
         obdsim::TraceFile const trace(m_pipe);
         EXPECT_TRUE(waitsForItsReader(m_pipe));
     }
+    char byte = 0;
+    EXPECT_EQ(::read(reader, &byte, 1), 0) << "its end is the pipe's";
     ::close(reader);
+}
+
+TEST_F(TextFile, traceTakesThePlaceOfTheOneBefore)
+{
+    std::ofstream(m_file) << std::string(1000, 'x');
+    {
+        obdsim::TraceFile trace(m_file);
+        trace.write(obdsim::Time(0), 1, '>', "ATI\r");
+    }
+    EXPECT_EQ(obdsim::readTextFile(m_file), "0.000000 1 > ATI\\r\n");
 }
 
 } // namespace

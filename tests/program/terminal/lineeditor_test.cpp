@@ -75,6 +75,11 @@ TEST(LineEditor, EachKeyDoesItsOwnAlone)
     }
     LineEditor editor;
     EXPECT_EQ(editor.press(control(0x04)), State::Ended);
+    type(editor, "abc");
+    for (Key const key : {Key::Up, Key::Down}) {
+        EXPECT_EQ(editor.press(key), State::Typing);
+        EXPECT_EQ(editor.text(), "abc") << "there are no lines before";
+    }
 }
 
 TEST(LineEditor, MendsALineInTheMiddle)

@@ -70,6 +70,20 @@ TEST_F(PipedInput, ComesLineByLine)
     EXPECT_EQ(line, "");
 }
 
+TEST_F(PipedInput, MayComeByteByByte)
+{
+    LineReader reader([] {});
+    std::string line = "before";
+    write("\n");
+    EXPECT_TRUE(reader.read(line));
+    EXPECT_EQ(line, "");
+    write("A");
+    end();
+    EXPECT_TRUE(reader.read(line));
+    EXPECT_EQ(line, "A");
+    EXPECT_FALSE(reader.read(line));
+}
+
 TEST_F(PipedInput, IsNotAwaitedWhenTheProgramIsToEnd)
 {
     int checks = 0;
