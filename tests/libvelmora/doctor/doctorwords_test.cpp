@@ -85,7 +85,9 @@ TEST(AdapterTalk, GivesPlainWordsWithoutTheEcho)
     EXPECT_TRUE(talk.echoed());
     EXPECT_EQ(talk.ask("B", std::chrono::seconds(9)), "AB");
     EXPECT_FALSE(talk.echoed());
+    talk.ask("A", std::chrono::seconds(9));
     EXPECT_EQ(talk.ask("C", std::chrono::milliseconds(1)), std::nullopt);
+    EXPECT_FALSE(talk.echoed()) << "of a reply that did not come";
     EXPECT_FALSE(talk.lost());
 }
 
