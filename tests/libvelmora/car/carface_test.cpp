@@ -120,7 +120,7 @@ TEST(CarFace, TellsWhatEachModuleOffers)
     auto const speed =
         std::find_if(parameters.begin(), parameters.end(), [](auto const& each) { return each.pid == 0x0D; });
     ASSERT_NE(speed, parameters.end());
-    EXPECT_TRUE(speed->offered);
+    EXPECT_TRUE(std::all_of(parameters.begin(), parameters.end(), [](auto const& each) { return each.offered; }));
     ASSERT_EQ(speed->values.size(), 1U);
     EXPECT_EQ(speed->values[0].unit, "km/h");
     EXPECT_EQ(speed->values[0].maximum, 255);

@@ -39,7 +39,7 @@ struct LimitRig
     explicit LimitRig(HttpLimits const& limits = {}) : server(limits)
     {
         server.addRoute("GET", "/a", [](HttpRequest const& request) { return answerOf(request.header("x-az")); });
-        server.addRoute("GET", "/late", [](HttpRequest const&) { return answerOf("late", 150ms); });
+        server.addRoute("GET", "/late", [](HttpRequest const&) { return answerOf("late", 400ms); });
         server.addRoute("GET", "/never", [](HttpRequest const&) { return answerOf("never", 60s); });
         server.addRoute("GET", "/big",
                         [](HttpRequest const&) { return answerOf(std::string(std::size_t{32} << 20, 'x'), 1ms); });
@@ -139,7 +139,7 @@ TEST(HttpLimits, AnswerNothingToWhoLeavesBeforeTheEnd)
 TEST(HttpLimits, OfTimeDoNotHoldForAReplyThatIsToBeLate)
 {
     HttpLimits limits;
-    limits.time = 50ms;
+    limits.time = 250ms;
     limits.connections = 1;
     LimitRig const rig(limits);
     EXPECT_EQ(httpBody(httpGet(rig.server.port(), "/late")), "late");
