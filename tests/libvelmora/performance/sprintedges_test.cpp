@@ -96,6 +96,19 @@ TEST(SprintEdges, WaysAreMeasuredUnderTheSpeeds)
                 3.6 * std::sqrt(25.0 + 2 * 0.5 * 10));
 }
 
+// The points behind its end, which were dropped, are no part of a run.
+TEST(SprintEdges, EndWithTheRun)
+{
+    auto const without = [](SprintRun run) {
+        run.pop_back();
+        return run;
+    };
+    EXPECT_FALSE(timed(speedGoal(0, 100), without({{0, 0}, {1, 90}, {2, 130}})));
+    expectTimed(speedGoal(80, 120), without({{0, 0}, {1, 130}, {2, 50}, {-5, 130}}), 40.0 / 130.0, 120);
+    EXPECT_FALSE(timed({"", 0.0, {}, 10.0}, without({{0, 0}, {1, 36}, {9, 36}})));
+    EXPECT_NEAR(distanceOf(without({{0, 0}, {1, 36}, {9, 36}})), 5.0, sprintError);
+}
+
 TEST(SprintEdges, TellHowWrongTheyMayBe)
 {
     std::optional<SprintTime> const time = timeOf(speedGoal(0, 100), {{0, 0}, {4, 100}}, 0.2);
@@ -220,7 +233,7 @@ Reading boardReading(unsigned int module, std::vector<unsigned char> const& raw,
 
 TEST(RunBoard, ShowsTheRunsOfOneModuleAfterTheOther)
 {
-    support::FakeClock const clock;
+    support::FakeClock clock;
     auto const ecu = [](unsigned int id) {
         auto made = std::make_shared<support::FakeEcu>(id);
         made->setSupported(obd::ObdMode::CurrentData, {0x0C, 0x0D});
@@ -246,17 +259,24 @@ TEST(RunBoard, ShowsTheRunsOfOneModuleAfterTheOther)
     EXPECT_EQ(board.state(false)["kmh"], 50);
     EXPECT_EQ(board.state(false)["weight_kg"], 1500);
     EXPECT_EQ(board.state(false)["active"], true);
+    for (int i = 1; i <= 20; ++i) {
+        clock.advance(500);
+        board.take(boardReading(0x7E8, {0x41, 0x0C, 0x2E, 0xE0}, 1000 + i * 500));
+        board.take(boardReading(0x7E8, {0x41, 0x0D, static_cast<unsigned char>(50 + i)}, 1000 + i * 500));
+    }
+    EXPECT_EQ(board.state(false)["power"][0]["rpm"], 3125.0) << board.state(false).dump();
     board.takeChange();
     board.end();
     EXPECT_TRUE(board.takeChange());
     EXPECT_EQ(board.state(false)["active"], false);
-    board.take(boardReading(0x7E8, {0x41, 0x0D, 60}, 2000));
-    EXPECT_EQ(board.state(false)["kmh"], 50) << "it has ended";
+    board.take(boardReading(0x7E8, {0x41, 0x0D, 60}, 20000));
+    EXPECT_EQ(board.state(false)["kmh"], 70) << "it has ended";
     board.begin(ecu(0x7E9), settings);
     EXPECT_EQ(board.state(false)["kmh"], 0) << "forgets what was before";
     EXPECT_EQ(board.state(false)["state"], "stand still to be ready");
-    board.take(boardReading(0x7E9, {0x41, 0x0D, 70}, 3000));
-    EXPECT_EQ(board.state(false)["kmh"], 70);
+    EXPECT_TRUE(board.state(false)["power"].empty());
+    board.take(boardReading(0x7E9, {0x41, 0x0D, 71}, 30000));
+    EXPECT_EQ(board.state(false)["kmh"], 71);
 }
 
 TEST(PowerModelReadings, AreWholeRepliesOfTheirPid)

@@ -56,6 +56,10 @@ TEST(FindingLimits, OfFuelTrims)
     EXPECT_EQ(suggestedBy(slowAlone), "");
     ModuleReport unread = trimmedModule({}, {15, 15});
     EXPECT_EQ(suggestedBy(unread), "") << "a value without samples";
+    ModuleReport shortened = trimmedModule({15, 15, -99}, {0, 0, 0});
+    shortened.values[2].samples.pop_back();
+    shortened.values[3].samples.pop_back();
+    EXPECT_EQ(suggestedBy(shortened), "fuel-trim note") << "readings that were dropped don't count";
     ModuleReport coolantless = trimmedModule({15, 15}, {0, 0});
     coolantless.values.erase(coolantless.values.begin() + 1);
     EXPECT_EQ(suggestedBy(coolantless), "") << "nobody knows whether it is warm";

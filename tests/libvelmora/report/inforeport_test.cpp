@@ -59,6 +59,12 @@ TEST(InfoReportView, CalibrationsArePairedInTheirOrder)
     EXPECT_EQ(pairs[0].verification, "1");
     EXPECT_EQ(pairs[1].id, "");
     EXPECT_EQ(pairs[1].verification, "2");
+    std::vector<std::string> ids = {"A", "B"};
+    ids.pop_back();
+    EXPECT_EQ(pairCalibrations(ids, {"1", "2"}).at(1).id, "") << "a name that was dropped";
+    std::vector<std::string> numbers = {"1", "2"};
+    numbers.pop_back();
+    EXPECT_EQ(pairCalibrations({"A", "B"}, numbers).at(1).verification, "");
 }
 
 TEST(InfoReportView, JsonHasNullForWhatIsNotTold)
