@@ -219,6 +219,15 @@ TEST(HttpStreams, HoldForASlowReaderUpToTheirLimit)
     rig.server.publish("/events", HttpServer::event("", std::string(1000 - 7, 'x')));
     EXPECT_EQ(exact->readAll(), "") << "one byte more";
     EXPECT_TRUE(rig.waitForReaders(0));
+
+    LimitRig usual;
+    auto const reader = readerOf(usual.server);
+    reader->readUntil("first\n\n");
+    std::string const most = HttpServer::event("", std::string(256 * 1024 - 8, 'x'));
+    usual.server.publish("/events", most);
+    EXPECT_EQ(reader->readUntil("x\n\n").size(), 256U * 1024U);
+    usual.server.publish("/events", HttpServer::event("", std::string(256 * 1024 - 7, 'x')));
+    EXPECT_EQ(reader->readAll(), "");
 }
 
 TEST(HttpStreams, KeepLittleThatIsOldForASlowReader)
