@@ -41,13 +41,19 @@ std::string writeOperator(FormulaNode const& node, FormulaOperator const& here)
     return left + std::string(here.sign) + right;
 }
 
+// A byte has a number, too, which is its place.
+bool isNumber(FormulaNode const& node, int number)
+{
+    return node.step == FormulaStep::Number && node.number == number;
+}
+
 // The shortest name of the function; a Signed of a usual width has one of its own.
 std::string writeCall(FormulaNode const& node)
 {
     std::size_t shown = node.operands.size();
     FormulaFunction const* named = nullptr;
     for (FormulaFunction const& each : formulaFunctions()) {
-        bool const fits = each.step == node.step && (each.bits == 0 || node.operands.back().number == each.bits);
+        bool const fits = each.step == node.step && (each.bits == 0 || isNumber(node.operands.back(), each.bits));
         std::size_t const given = node.operands.size() - (each.bits != 0 ? 1 : 0);
         if (fits && given >= each.fewest && given <= each.most) {
             named = &each;

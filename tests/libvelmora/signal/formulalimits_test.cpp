@@ -110,6 +110,10 @@ TEST(FormulaLimits, FunctionsTakeAsManyOperandsAsTheGuideSays)
               "\"<\" is read as a shift only of a byte or a bracket, by 8, 16 or 24")
         << "a bracket further ahead is not the one that is shifted";
     EXPECT_EQ(written("A 0x1F"), "\"0x1F\" is left over");
+    for (char const* const bits : {"I", "Q", "Y", "AG", "8+0"}) {
+        std::string const text = std::string("signed(A, ") + bits + ")";
+        EXPECT_EQ(written(text), text) << "as many bits as that byte says, which is the ninth, and so on";
+    }
 }
 
 TEST(FormulaLimits, NestsSixtyFourLevelsInEachWay)

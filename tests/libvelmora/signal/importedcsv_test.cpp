@@ -123,6 +123,7 @@ TEST(ImportedCsv, SaysWhatATextIsThatIsNoTable)
     EXPECT_EQ(csvError(",,,,,,,\n"), none);
     EXPECT_EQ(csvError("Name,ModeAndPID,Equation\n"), none);
     EXPECT_EQ(csvError("a;b;c;d"), spreadsheet);
+    EXPECT_EQ(csvError(";b;c;"), spreadsheet);
     EXPECT_EQ(csvError("a;b,c;d,e;f\nA,a,2101,A,0,1,V,"), spreadsheet);
     EXPECT_NE(csvError("a;b,c;d,e;f,g"), spreadsheet);
     EXPECT_NE(csvError("a;b;c"), spreadsheet);

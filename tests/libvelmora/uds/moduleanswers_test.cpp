@@ -41,7 +41,9 @@ TEST(ModuleAnswers, OfAModuleWithAnAddressByteAreLookedForUnderBothTesters)
     EXPECT_EQ(bench.takeAsked().size(), 1U) << "a module without one is asked once";
     RequestAddress const tires = canModule("750", "758", 0x2A);
     bench.module("750", "2130", {"758066130999A9D9C"});
-    EXPECT_EQ(asker.ask(tires, {0x21, 0x30}).kind, ReplyKind::Positive);
+    ModuleAnswer const good = asker.ask(tires, {0x21, 0x30});
+    EXPECT_EQ(good.kind, ReplyKind::Positive);
+    EXPECT_EQ(good.code, 0) << "which is of refusals";
     EXPECT_EQ(bench.takeAsked().size(), 1U) << "it answers at once";
     EXPECT_EQ(asker.ask(tires, {0x21, 0x31}).kind, ReplyKind::Silent);
     EXPECT_EQ(bench.takeAsked().size(), 2U);

@@ -99,6 +99,15 @@ TEST(ModuleIdentity, TakesNoEmptyTextForOne)
     FoundModule older{"7E1", "7E9", {}, {}, {}, {}};
     ModuleIdentity(asker, [] {}).identify(older);
     EXPECT_THAT(older.identifiers, ElementsAre(Pair(0x1A90U, "A")));
+    bench.module("7E2", "22F197", {"7EA037F2231"}).module("7E2", "22F187", {"7EA0562F1874142"});
+    ModuleIdentity identity(asker, [] {});
+    identity.identify(older);
+    FoundModule next{"7E2", "7EA", {}, {}, {}, {}};
+    identity.identify(next);
+    EXPECT_EQ(next.part, "AB") << "one identifier is missing, not the service; nor does the module before matter";
+    identity.identify(older);
+    identity.readIdentifiers(next);
+    EXPECT_EQ(next.identifiers.at(0xF187), "AB");
     FoundModule elsewhere{"18DA10F1", "", {}, {}, {}, {}};
     ModuleIdentity(asker, [] {}).readIdentifiers(elsewhere);
     EXPECT_TRUE(elsewhere.identifiers.empty()) << "no module of this bus";

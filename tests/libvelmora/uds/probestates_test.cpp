@@ -144,6 +144,30 @@ TEST_F(ProbeStateTest, LooksAgainOnlyAtWhatItHasNotSeenTwice)
     EXPECT_TRUE(m_bench.takeAsked().empty());
 }
 
+TEST_F(ProbeStateTest, KeepsWhatItHasWhereverItBegan)
+{
+    m_state.task.from = 0xF103;
+    m_state.task.to = 0xF116;
+    answer(0xF103, "7E80462F10309");
+    int left = 17;
+    m_check = [&left] {
+        if (left-- == 0) {
+            throw std::logic_error("no end of its own");
+        }
+    };
+    IdentifierProbe probe(
+        m_asker, m_check,
+        [this](ProbeState const& state) {
+            if (!m_saved) {
+                m_saved = state;
+            }
+        },
+        [](ProbeState const& /*state*/) {});
+    EXPECT_THROW(probe.run(m_state), std::logic_error);
+    EXPECT_EQ(m_saved->next, 0xF113U) << "behind the sixteenth";
+    EXPECT_EQ(m_state.next, 0xF114U);
+}
+
 TEST_F(ProbeStateTest, MakesSignalsThatAskTheSameModuleTheSame)
 {
     m_state.told = {{0xF190, {1, 2}}};
