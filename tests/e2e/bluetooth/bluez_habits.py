@@ -8,7 +8,7 @@ ADAPTER = 'org.bluez.Adapter1'
 DEVICE = 'org.bluez.Device1'
 MOCK = 'org.bluez.Mock'
 
-habits = {'calls': {}, 'hidden': {}, 'deaf': ''}
+habits = {'calls': {}, 'hidden': {}, 'deaf': '', 'late': 0}
 
 
 def passes_over(message):
@@ -63,6 +63,12 @@ def SetPowered(self, powered):
 def Calls(self, member):
     """How often that was called since the last time."""
     return habits['calls'].pop(member, 0)
+
+
+@dbus.service.method(MOCK, in_signature='', out_signature='i')
+def LateCalls(self):
+    """How often something was asked of a device that was gone."""
+    return habits['late']
 
 
 @dbus.service.method(MOCK, in_signature='s', out_signature='')

@@ -137,6 +137,7 @@ def _device_of(chrc):
 
 def _need_connected(chrc):
     if not _device_of(chrc).connected:
+        bluez_habits.habits['late'] += 1
         raise _error('Failed', 'Not connected')
     return _device_of(chrc)
 

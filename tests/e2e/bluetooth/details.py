@@ -77,6 +77,12 @@ class Details(Rig):
         self.expect(['-p', f'ble://{BLE}', 'info'], 0)
         self.assertEqual(self.control.Writes(other)[0], 0, 'though that of the other one is the more usual')
 
+    def test_a_paired_device_that_says_nothing_is_told(self):
+        somebody = socket.create_server(('127.0.0.1', 0))
+        self.addCleanup(somebody.close)
+        self.control.SetPaired(self.add_ble(port=somebody.getsockname()[1]), True)
+        self.expect(['-p', 'auto', 'info'], 3, f'ble://{BLE} does not answer as an adapter does')
+
     def test_a_device_that_is_not_known_is_listened_for(self):
         self.control.Listen()
         self.control.Hide(self.add_ble())

@@ -116,6 +116,18 @@ TEST(HastyWait, ThatWasAsLongAsTheLibrarysAlreadyIsNotAskedFor)
     EXPECT_THAT(writing.wire->takeCommands(), ElementsAre("04")) << "what changes the vehicle is not asked twice";
 }
 
+// The adapter is still at a request, so that the farewell can't be answered by giving the wait back.
+TEST(HastyWait, IsLeftInForceWhereSomethingIsUnderWay)
+{
+    ChannelRig rig;
+    hasten(rig);
+    rig.wire->on("010C", Pieces{});
+    for (std::string const line : {"010C\r", "ATLP\r"}) {
+        rig.channel.send({line.begin(), line.end()});
+    }
+    EXPECT_THAT(rig.wire->takeCommands(), ElementsAre("010C"));
+}
+
 // Adapters that agree to a shorter wait and do not keep to it.
 void bringUpDeaf(ChannelRig& rig)
 {

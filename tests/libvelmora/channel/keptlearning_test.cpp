@@ -1,4 +1,4 @@
-// When counts are unlearnt, and what is kept from visit to visit.
+// What is kept from visit to visit.
 
 #include "libvelmora/channel/canmessagelist.h"
 #include "libvelmora/channel/learntstore.h"
@@ -26,72 +26,6 @@ void learnSpeed(ChannelRig& rig)
     rig.ask("010C");
     rig.ask("010C");
     rig.wire->takeCommands();
-}
-
-TEST(Counts, AreUnlearntByWhatChangesTheAdapterAlone)
-{
-    struct Row
-    {
-        char const* command;
-        bool unlearns;
-    };
-    for (auto const& [command, unlearns] :
-         {Row{"ATRV", false}, Row{"ATI", false}, Row{"ATCRA7E8", true}, Row{"ATH1", true}, Row{"ATD0", true}}) {
-        ChannelRig rig;
-        rig.connect();
-        learnSpeed(rig);
-        rig.ask(command);
-        rig.wire->takeCommands();
-        rig.ask("010C");
-        EXPECT_THAT(rig.wire->takeCommands(), ElementsAre(unlearns ? "010C" : "010C1")) << command;
-    }
-}
-
-TEST(Counts, AreThoseOfTheirAddress)
-{
-    ChannelRig rig;
-    rig.connect();
-    learnSpeed(rig);
-    auto const sentTo = [&rig](RequestAddress const& address) {
-        AddressedModule const scope(rig.channel, address);
-        rig.ask("010C");
-        auto const sent = rig.wire->takeCommands();
-        return *std::find_if(sent.begin(), sent.end(), [](auto const& each) { return each.starts_with("010C"); });
-    };
-    RequestAddress const engine{.header = "7E0"};
-    RequestAddress const body{.header = "6F1", .extended = "07"};
-    RequestAddress const door{.header = "6F1", .extended = "08"};
-    EXPECT_EQ(sentTo(engine), "010C");
-    EXPECT_EQ(sentTo(engine), "010C");
-    EXPECT_EQ(sentTo(engine), "010C1");
-    rig.wire->on("010C", "607F104410C1AF8").on("010C", "607F104410C1AF8");
-    for (int i = 0; i < 2; ++i) {
-        sentTo(body);
-    }
-    EXPECT_EQ(sentTo(body), "010C1");
-    EXPECT_EQ(sentTo(door), "010C");
-}
-
-TEST(Counts, OfASilentVehicleAreNone)
-{
-    ChannelRig rig;
-    rig.bringUp(); // not yet connected
-    learnSpeed(rig);
-    rig.ask("010C");
-    EXPECT_THAT(rig.wire->takeCommands(), Not(Contains("010C1")));
-    ChannelRig headersOff;
-    headersOff.ask("ATE0");
-    headersOff.channel.onConnected();
-    headersOff.wire->on("010C", saidPlainly("41 0C 1A F8"));
-    for (int i = 0; i < 3; ++i) {
-        headersOff.ask("010C");
-    }
-    EXPECT_THAT(headersOff.wire->takeCommands(), ElementsAre("ATE0", "010C", "010C", "010C"));
-    ChannelRig off(nullptr, {.port = {}, .counting = false});
-    off.connect();
-    learnSpeed(off);
-    off.ask("010C");
-    EXPECT_THAT(off.wire->takeCommands(), ElementsAre("010C"));
 }
 
 class SecondVisit : public testing::Test

@@ -139,6 +139,12 @@ TEST(StubbornWait, OfAnAdapterThatIsNotInterruptedIsWaitedOut)
     breaking.ask("03");
     EXPECT_THAT(breaking.wire->takeCommands(), ElementsAre("03", " ", "03", "03")) << "asked again, and left in peace";
 
+    ChannelRig late; // the word for it is not the end
+    late.wire->onInterrupt({{"STOPPED\r7E8024300\r\r>", WireTime(4)}});
+    bringUpStubborn(late);
+    EXPECT_THAT(late.ask("03"), Optional(std::string("7E80243007E9024300")));
+    EXPECT_THAT(late.wire->takeCommands(), ElementsAre("03", " ", "03"));
+
     ChannelRig starting;
     starting.wire->onInterrupt({{"ELM327 v1.5\r\r>", WireTime(4)}});
     bringUpStubborn(starting);

@@ -135,6 +135,20 @@ TEST(AddressRestored, AtTheEndThoughItCouldNotBeBefore)
     EXPECT_FALSE(wire->isUp()) << "and then it is left";
 }
 
+TEST(RefusedAddress, OfTheOneBeforeEndsTheLink)
+{
+    ChannelRig rig;
+    rig.connect();
+    sentTo(rig, flowing, "222801");
+    rig.wire->on("ATFCSM0", "?");
+    AddressedModule const scope(rig.channel, {.header = "7E1", .reply = "7E9", .stays = true});
+    rig.ask("221E1C");
+    EXPECT_FALSE(rig.channel.isValid()) << "the other module would be heard in its place";
+    auto const sent = rig.wire->takeCommands();
+    EXPECT_THAT(sent, Contains("ATFCSM0"));
+    EXPECT_THAT(sent, testing::AllOf(Not(Contains("ATSH7E1")), Not(Contains("221E1C"))));
+}
+
 TEST(RefusedAddress, OfSomebodySaysNothingOfModules)
 {
     ChannelRig rig;

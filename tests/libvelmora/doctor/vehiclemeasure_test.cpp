@@ -21,12 +21,12 @@ using testing::Contains;
 using testing::ElementsAre;
 
 // What the played adapter says, and after how long; "gone" breaks the link.
-struct Said
+struct VehicleSaid
 {
     std::string lines;
     int millis = 0;
 };
-using Player = std::function<std::optional<Said>(std::string const& command, int times)>;
+using Player = std::function<std::optional<VehicleSaid>(std::string const& command, int times)>;
 
 class PlayedVehicle : public IPort
 {
@@ -43,7 +43,7 @@ public:
         std::string const command(bytes.substr(0, bytes.find('\r')));
         m_asked.push_back(command);
         int const times = static_cast<int>(std::count(m_asked.begin(), m_asked.end(), command));
-        Said const said = m_player(command, times).value_or(usual(command));
+        VehicleSaid const said = m_player(command, times).value_or(usual(command));
         std::this_thread::sleep_for(std::chrono::milliseconds(said.millis));
         if (said.lines == "gone") {
             m_onLost();
@@ -54,7 +54,7 @@ public:
     void close() override {}
 
 private:
-    static Said usual(std::string const& command)
+    static VehicleSaid usual(std::string const& command)
     {
         bool const request = command.find_first_not_of("0123456789ABCDEF") == std::string::npos;
         return {command == "ATI"     ? "ELM327 v1.5"
@@ -82,7 +82,7 @@ protected:
         options.openPort = [&, this] {
             return std::make_unique<PlayedVehicle>(
                 [&, mask](std::string const& command, int times) {
-                    return command == "0100" ? std::optional(Said{std::string("7E8064100") + mask})
+                    return command == "0100" ? std::optional(VehicleSaid{std::string("7E8064100") + mask})
                                              : player(command, times);
                 },
                 m_asked);
@@ -140,12 +140,13 @@ std::string replyTo(std::string const& command)
 
 TEST_F(VehicleMeasure, TellsTheTimesOfTwentyRequestsInTheirOrder)
 {
-    auto const figures = measure(sixPids, [](std::string const& command, int times) -> std::optional<Said> {
+    auto const figures = measure(sixPids, [](std::string const& command, int times) -> std::optional<VehicleSaid> {
         if (command == "0902") {
-            return Said{"7E8101449020156454C\r7E8214D524153314D4D\r7E82230303030303031"};
+            return VehicleSaid{"7E8101449020156454C\r7E8214D524153314D4D\r7E82230303030303031"};
         }
         bool const slow = command == "0104" && (times == 3 || times == 7);
-        return command.starts_with("01") ? std::optional(Said{replyTo(command), slow ? 10 * times : 0}) : std::nullopt;
+        return command.starts_with("01") ? std::optional(VehicleSaid{replyTo(command), slow ? 10 * times : 0})
+                                         : std::nullopt;
     });
     ASSERT_TRUE(figures);
     EXPECT_EQ(figures->requests, 20U);
@@ -164,8 +165,8 @@ TEST_F(VehicleMeasure, TellsTheTimesOfTwentyRequestsInTheirOrder)
 
 TEST_F(VehicleMeasure, TellsWhatWasNotAnswered)
 {
-    auto const figures = measure(sixPids, [](std::string const& command, int times) -> std::optional<Said> {
-        return command == "0104" && times > 3 ? std::optional(Said{replyTo(command)}) : std::nullopt;
+    auto const figures = measure(sixPids, [](std::string const& command, int times) -> std::optional<VehicleSaid> {
+        return command == "0104" && times > 3 ? std::optional(VehicleSaid{replyTo(command)}) : std::nullopt;
     });
     ASSERT_TRUE(figures);
     EXPECT_EQ(figures->requests, 17U);
@@ -182,14 +183,14 @@ TEST_F(VehicleMeasure, TellsWhatWasNotAnswered)
 
 TEST_F(VehicleMeasure, NeedsAValueThatCanBeRead)
 {
-    EXPECT_FALSE(measure("00000001", [](std::string const& command, int) -> std::optional<Said> {
-        return command == "0120" ? std::optional(Said{"7E806412000000000"}) : std::nullopt;
+    EXPECT_FALSE(measure("00000001", [](std::string const& command, int) -> std::optional<VehicleSaid> {
+        return command == "0120" ? std::optional(VehicleSaid{"7E806412000000000"}) : std::nullopt;
     }));
     EXPECT_THAT(findings(), Contains("modules: the first module offers no value to measure by|"));
 }
 
 // The replies of one module to requests for its values, each of one byte.
-std::string valuesOf(char const* module, std::string const& pids)
+std::string valueLines(char const* module, std::string const& pids)
 {
     std::string payload = "41";
     for (std::size_t i = 0; i < pids.size(); i += 2) {
@@ -214,20 +215,20 @@ std::string valuesOf(char const* module, std::string const& pids)
 // An adapter that needs some time more without a count than with one, and takes so many values in a request.
 Player countingAdapter(std::vector<char const*> const& modules, std::size_t most, int millis = 4)
 {
-    return [modules, most, millis](std::string const& command, int) -> std::optional<Said> {
+    return [modules, most, millis](std::string const& command, int) -> std::optional<VehicleSaid> {
         if (!command.starts_with("01") || command == "0120") {
             return std::nullopt;
         }
         bool const counted = command.size() % 2 != 0;
         std::string const pids = command.substr(2, (command.size() - 2) / 2 * 2);
         if (pids.size() / 2 > most) {
-            return Said{"?"};
+            return VehicleSaid{"?"};
         }
         std::string lines;
         for (char const* module : modules) {
-            lines += (lines.empty() ? "" : "\r") + valuesOf(module, pids);
+            lines += (lines.empty() ? "" : "\r") + valueLines(module, pids);
         }
-        return Said{lines, counted ? 0 : millis};
+        return VehicleSaid{lines, counted ? 0 : millis};
     };
 }
 
@@ -274,9 +275,9 @@ TEST_F(VehicleMeasure, CountsTheFramesOfAllModules)
 TEST_F(VehicleMeasure, ACountThatBringsLessOrNothingDoesNotWork)
 {
     for (char const* counted : {"NO DATA", "7E8034104", "?"}) {
-        auto const figures = measure(sixPids, [&](std::string const& command, int) -> std::optional<Said> {
-            return command == "0104"    ? std::optional(Said{"7E803410480", 2})
-                   : command == "01041" ? std::optional(Said{counted})
+        auto const figures = measure(sixPids, [&](std::string const& command, int) -> std::optional<VehicleSaid> {
+            return command == "0104"    ? std::optional(VehicleSaid{"7E803410480", 2})
+                   : command == "01041" ? std::optional(VehicleSaid{counted})
                                         : std::nullopt;
         });
         EXPECT_THAT(figures->countWorks, testing::Optional(false)) << counted;
@@ -291,7 +292,7 @@ TEST_F(VehicleMeasure, EndsWhereTheLinkBreaks)
         auto const breaking = [&](std::string const& command, int times) {
             bool const measuring = (command == "0104051" && times == 7) || (command == "010405" && times == 9);
             bool const here = place == "rate" ? measuring : command + "#" + std::to_string(times) == place;
-            return here ? std::optional(Said{"gone"}) : two(command, times);
+            return here ? std::optional(VehicleSaid{"gone"}) : two(command, times);
         };
         EXPECT_THROW(measure(sixPids, breaking), Error) << place;
         std::string const last = place == "rate" ? "010405" : place.substr(0, place.find('#'));

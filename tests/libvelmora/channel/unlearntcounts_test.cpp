@@ -1,0 +1,97 @@
+// When counts are unlearnt, and where there are none.
+
+#include "tests/libvelmora/channel/channelrig.h"
+#include "tests/libvelmora/channel/timedreplies.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+namespace velmora {
+
+namespace {
+
+using test::ChannelRig;
+using test::saidCounted;
+using test::saidPlainly;
+using test::speedLine;
+using testing::Contains;
+using testing::ElementsAre;
+using testing::Not;
+
+void teachSpeed(ChannelRig& rig)
+{
+    rig.wire->on("010C", saidPlainly(speedLine)).on("010C1", saidCounted(speedLine));
+    rig.ask("010C");
+    rig.ask("010C");
+    rig.wire->takeCommands();
+}
+
+TEST(Counts, AreUnlearntByWhatChangesTheAdapterAlone)
+{
+    struct Row
+    {
+        char const* command;
+        bool unlearns;
+    };
+    for (auto const& [command, unlearns] :
+         {Row{"ATRV", false}, Row{"ATI", false}, Row{"ATCRA7E8", true}, Row{"ATH1", true}, Row{"ATD0", true}}) {
+        ChannelRig rig;
+        rig.connect();
+        teachSpeed(rig);
+        rig.ask(command);
+        rig.wire->takeCommands();
+        rig.ask("010C");
+        EXPECT_THAT(rig.wire->takeCommands(), ElementsAre(unlearns ? "010C" : "010C1")) << command;
+    }
+}
+
+TEST(Counts, AreThoseOfTheirAddress)
+{
+    ChannelRig rig;
+    rig.connect();
+    teachSpeed(rig);
+    auto const sentTo = [&rig](RequestAddress const& address) {
+        AddressedModule const scope(rig.channel, address);
+        rig.ask("010C");
+        auto const sent = rig.wire->takeCommands();
+        return *std::find_if(sent.begin(), sent.end(), [](auto const& each) { return each.starts_with("010C"); });
+    };
+    RequestAddress const engine{.header = "7E0"};
+    RequestAddress const body{.header = "6F1", .extended = "07"};
+    RequestAddress const door{.header = "6F1", .extended = "08"};
+    EXPECT_EQ(sentTo(engine), "010C");
+    EXPECT_EQ(sentTo(engine), "010C");
+    EXPECT_EQ(sentTo(engine), "010C1");
+    rig.wire->on("010C", "607F104410C1AF8").on("010C", "607F104410C1AF8");
+    for (int i = 0; i < 2; ++i) {
+        sentTo(body);
+    }
+    EXPECT_EQ(sentTo(body), "010C1");
+    EXPECT_EQ(sentTo(door), "010C");
+}
+
+TEST(Counts, OfASilentVehicleAreNone)
+{
+    ChannelRig rig;
+    rig.bringUp(); // not yet connected
+    teachSpeed(rig);
+    rig.ask("010C");
+    EXPECT_THAT(rig.wire->takeCommands(), Not(Contains("010C1")));
+    ChannelRig headersOff;
+    headersOff.ask("ATE0");
+    headersOff.channel.onConnected();
+    headersOff.wire->on("010C", saidPlainly("41 0C 1A F8"));
+    for (int i = 0; i < 3; ++i) {
+        headersOff.ask("010C");
+    }
+    EXPECT_THAT(headersOff.wire->takeCommands(), ElementsAre("ATE0", "010C", "010C", "010C"));
+    ChannelRig off(nullptr, {.port = {}, .counting = false});
+    off.connect();
+    teachSpeed(off);
+    off.ask("010C");
+    EXPECT_THAT(off.wire->takeCommands(), ElementsAre("010C"));
+}
+
+} // namespace
+
+} // namespace velmora
