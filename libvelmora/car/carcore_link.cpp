@@ -78,7 +78,10 @@ void CarCore::noteEnd() const
 // one every five seconds.
 void CarCore::keepAsking(std::vector<std::string> const& sensors)
 {
-    call([this, &sensors](Session& /*session*/) {
+    call([this, &sensors](Session& session) {
+        if (!session.options().module) {
+            session.select(*session.proxy()->firstEcu()); // a reading of all modules leaves the last one selected
+        }
         if (sensors.empty()) {
             obd::TroubleCodeServiceBuilder::createTroubleCodeService()->askMilStatus();
             return;

@@ -4,6 +4,7 @@
 #include "libvelmora/poll/sensorwish.h"
 
 #include <obd/iecu.h>
+#include <obd/iobdproxy.h>
 #include <obd/ivelmorasettings.h>
 #include <obd/parameterdescriptor.h>
 #include <obd/parameterfactory.h>
@@ -20,13 +21,15 @@ namespace velmora {
 
 namespace {
 
+// By words that name none. Not the one that is selected: each reading of all modules leaves its last one so.
 std::vector<unsigned int> modulesMeant(Session const& session, LiveWish const& wish)
 {
+    if (!wish.allModules && !session.options().module) {
+        return {session.proxy()->firstEcu()->id()};
+    }
     std::vector<unsigned int> ids;
-    if (wish.allModules) {
-        for (std::shared_ptr<obd::IEcu> const& ecu : session.selectedModules()) {
-            ids.push_back(ecu->id());
-        }
+    for (std::shared_ptr<obd::IEcu> const& ecu : session.selectedModules()) {
+        ids.push_back(ecu->id());
     }
     return ids;
 }

@@ -3,11 +3,13 @@
 #include "libvelmora/car/carprobe.h"
 #include "libvelmora/car/livestate.h"
 #include "libvelmora/port/opening/openport.h"
+#include "libvelmora/session/libraryuse.h"
 #include "libvelmora/session/session.h"
 #include "libvelmora/uds/identifierprobe.h"
 #include "libvelmora/uds/modulestore.h"
 #include "tests/support/temporaryfolder.h"
 
+#include <obd/messagedatamodel.h>
 #include <velmora/car.h>
 #include <velmora/console.h>
 #include <velmora/error.h>
@@ -15,7 +17,9 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <atomic>
 #include <fstream>
+#include <thread>
 
 namespace {
 
@@ -46,6 +50,7 @@ protected:
         return options(m_folder.file("car.toml"));
     }
 
+    velmora::LibraryUse const m_library{""}; // keeps the catalogue from car to car
     testsupport::TemporaryFolder m_folder;
 };
 
@@ -149,7 +154,7 @@ id = "7E8"
 "0120" = "41 20 00 00 00 01"
 "0140" = "41 40 00 00 00 01"
 "0160" = "41 60 00 00 00 01"
-"0180" = "41 80 00 00 00 01"
+"0180" = "41 80 00 00 00 09"
 "01A0" = "41 A0 04 00 00 01"
 "01C0" = "41 C0 40 00 00 00"
 "0600" = "46 00 80 00 00 00"
@@ -162,7 +167,7 @@ id = "7E8"
         services.push_back(std::to_string(each.number) + ":" + std::to_string(each.identifiers.size()) +
                            (each.answer == velmora::TopicAnswer::Read ? " read" : " not"));
     }
-    EXPECT_THAT(services, ElementsAre("1:6 read", "6:1 read", "8:0 not", "9:1 read"));
+    EXPECT_THAT(services, ElementsAre("1:7 read", "6:1 read", "8:0 not", "9:1 read"));
     ASSERT_FALSE(offers[0].further.empty());
     std::vector<unsigned int> further;
     for (auto const& each : offers[0].further) {
@@ -172,6 +177,12 @@ id = "7E8"
     EXPECT_THAT(further, testing::Not(testing::Contains(0xC0U))) << "only tells of the next range";
     EXPECT_THAT(further, testing::Not(testing::Contains(0x0CU)));
     EXPECT_EQ(offers[0].further.back().name, "PID C2");
+    EXPECT_TRUE(offers[0].further.back().values.empty());
+    EXPECT_EQ(offers[0].further.front().pid, 0x9DU);
+    ASSERT_EQ(offers[0].further.front().values.size(), 2U);
+    EXPECT_EQ(offers[0].further.front().values[0].sensor, "ENGINE_FUEL_RATE_MASS");
+    EXPECT_EQ(offers[0].further.front().values[0].unit, "g/s");
+    EXPECT_NE(offers[0].further.front().values[0].standing, "");
 }
 
 TEST_F(CarBeyond, ReadingsAreOfTheModuleThatWasAsked)
@@ -207,6 +218,109 @@ id = "7E9"
         ADD_FAILURE();
     } catch (Error const& error) {
         EXPECT_STREQ(error.what(), "The vehicle has no control module 7EA");
+    }
+}
+
+TEST_F(CarBeyond, CodesThatNobodyToldAreAnErrorThatSaysWhy)
+{
+    auto const trouble = [this](std::string const& reply) {
+        Car car(raw("[[module]]\nid = \"7E8\"\n[module.raw]\n\"0100\" = \"41 00 80 00 00 00\"\n" + reply));
+        try {
+            EXPECT_TRUE(car.codes().empty());
+        } catch (Error const& error) {
+            EXPECT_EQ(error.kind(), reply.empty() ? ErrorKind::NotSupported : ErrorKind::Refused);
+            return std::string(error.what());
+        }
+        return std::string();
+    };
+    EXPECT_EQ(trouble(""), "No control module reported its trouble codes");
+    EXPECT_EQ(trouble("\"03\" = \"7F 03 22\"\n"), "The vehicle refused to report its trouble codes");
+    EXPECT_EQ(trouble("\"03\" = \"43 00\"\n"), "");
+}
+
+TEST_F(CarBeyond, EachSensorIsReadOnceAndSignalsBehindThem)
+{
+    std::ofstream(m_folder.file("own.toml")) << "[[signal]]\nid = \"GEARBOX_TEMP\"\nname = \"Gearbox oil\"\n"
+                                                "header = \"7E1\"\nrequest = \"221E1C\"\n"
+                                                "formula = \"(A*256+B)/16\"\nunit = \"°C\"\n";
+    CarOptions chosen = options("petrol-can11-modules");
+    chosen.signalFiles = {m_folder.file("own.toml")};
+    Car car(chosen);
+    auto const keys = [&car](std::vector<std::string> const& words) {
+        std::vector<std::string> result;
+        for (velmora::Reading const& each : car.read(words)) {
+            result.push_back(each.sensor);
+            EXPECT_LT(std::chrono::abs(std::chrono::system_clock::now() - each.time), std::chrono::minutes(1));
+        }
+        return result;
+    };
+    EXPECT_THAT(keys({"RPM", "0C", "7E8:RPM", "SPEED"}), ElementsAre("RPM", "SPEED"));
+    EXPECT_THAT(keys({"GEARBOX_TEMP", "RPM"}), ElementsAre("RPM", "GEARBOX_TEMP"));
+    EXPECT_THAT(keys({"gearbox oil"}), ElementsAre("GEARBOX_TEMP"));
+    EXPECT_EQ(keys({}).size(), 5U) << "the usual ones";
+    std::unique_ptr<velmora::LiveReader> const reader =
+        car.live({.sensors = {"GEARBOX_TEMP", "COOLANT_TEMP"}, .rate = "5hz"});
+    EXPECT_EQ(reader->parameters().at(1).at(0).hertz, 5.0) << "of those that have none of their own";
+    EXPECT_EQ(reader->parameters().at(0).at(0).module, 0x7E8U) << "the first one, though another was read last";
+    car.codeReports();
+    EXPECT_NO_THROW(car.keepAsking({"COOLANT_TEMP"})) << "which the first one has alone";
+
+    EXPECT_EQ(car.probe({.module = "743", .reply = "763", .from = "F187", .to = "F187"}).toText({}),
+              "  F187  32383430302D5331303034  28400-S1004\n");
+}
+
+TEST_F(CarBeyond, AWatchEndsWithTheObjectThatHoldsItAndSoDoesItsAsking)
+{
+    std::atomic<int> asked = 0;
+    std::atomic<int> first = 0;
+    std::atomic<int> second = 0;
+    CarOptions chosen = options();
+    chosen.onTraffic = [&asked](obd::MessageDataModel const& entry) {
+        asked += entry.direction == obd::MessageDataModel::Sent ? 1 : 0;
+    };
+    Car car(chosen);
+    auto const waitFor = [](std::atomic<int> const& count, int number) {
+        for (int i = 0; i < 10000 && count < number; ++i) {
+            std::this_thread::sleep_for(std::chrono::milliseconds(1));
+        }
+        return count >= number;
+    };
+    velmora::Watch silent = car.watch({"SPEED"}, nullptr);
+    velmora::Watch watch = car.watch({"RPM"}, [&first](velmora::Reading const&) { ++first; });
+    EXPECT_TRUE(waitFor(first, 2));
+    watch = car.watch({"RPM"}, [&second](velmora::Reading const&) { ++second; });
+    int const before = first;
+    EXPECT_TRUE(waitFor(second, 2));
+    EXPECT_EQ(first, before) << "the one that it held has ended";
+    watch = std::move(watch);
+    int const now = second;
+    EXPECT_TRUE(waitFor(second, now + 1)) << "itself it does not end";
+    watch.end();
+    silent = velmora::Watch();
+    car.read({"COOLANT_TEMP"}); // behind what was under way
+    std::this_thread::sleep_for(std::chrono::milliseconds(120));
+    int const after = asked;
+    std::this_thread::sleep_for(std::chrono::milliseconds(150));
+    EXPECT_EQ(asked, after) << "nobody wants a reading any more";
+    car.keepAsking({});
+    EXPECT_TRUE(waitFor(asked, after + 1)) << "the lamp, which keeps the connection up";
+}
+
+TEST_F(CarBeyond, ServicesOfTheMakersAreForSomeBusesAndModules)
+{
+    CarOptions chosen = options("petrol-can11-modules");
+    chosen.module = 0x7E8;
+    {
+        Car car(chosen);
+        EXPECT_EQ(car.udsCodes().size(), 1U) << "the one that was named";
+    }
+    Car legacy(options("petrol-pwm"));
+    try {
+        legacy.udsCodes();
+        ADD_FAILURE();
+    } catch (Error const& error) {
+        EXPECT_STREQ(error.what(), "Services 19 and 18 are asked on CAN and ISO 14230 only");
+        EXPECT_EQ(error.kind(), ErrorKind::NotSupported);
     }
 }
 

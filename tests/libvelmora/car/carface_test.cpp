@@ -125,6 +125,13 @@ TEST(CarFace, TellsWhatEachModuleOffers)
     EXPECT_EQ(speed->values[0].unit, "km/h");
     EXPECT_EQ(speed->values[0].maximum, 255);
     EXPECT_GT(car.offers(true)[0].parameters.size(), parameters.size());
+    EXPECT_EQ(speed->values[0].minimum, 0);
+    auto const coolant =
+        std::find_if(parameters.begin(), parameters.end(), [](auto const& each) { return each.pid == 0x05; });
+    ASSERT_NE(coolant, parameters.end());
+    EXPECT_EQ(coolant->values.at(0).minimum, -40);
+    EXPECT_EQ(coolant->values.at(0).maximum, 215);
+    EXPECT_LT(offers[1].parameters.size(), parameters.size()) << "another module's are its own";
 }
 
 TEST(CarFace, TellsTheModulesOfAKLineByIso14230)
@@ -273,6 +280,8 @@ TEST(DoctorFace, ExaminesAndBundlesWithoutTheVin)
     EXPECT_NO_THROW(velmora::Doctor::checkBundle(file, true));
     EXPECT_EQ(wholeFile(file), doctor.bundle());
     EXPECT_NE(doctor.bundle(true), doctor.bundle()) << "the VIN";
+    EXPECT_EQ(kindThrown([&] { doctor.saveBundle("/dev/full"); }), ErrorKind::Failed);
+    EXPECT_EQ(kindThrown([&] { velmora::Doctor::checkBundle(folder.file("no/such/folder")); }), ErrorKind::Failed);
 }
 
 TEST(ConsoleFace, GivesWhatTheAdapterSays)

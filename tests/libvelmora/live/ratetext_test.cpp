@@ -16,6 +16,8 @@ TEST(RateText, AskedAndReachedStandSideBySide)
     rates.push_back({0x7E9, 0x0C, 0.2, 0.2, 0});
     EXPECT_EQ(reachedRates(rates), "7E8 RPM 9.87 of 10 Hz, 7E8 PID_C2 2.5 of 5 Hz, 7E9 RPM 0.2 of 0.2 Hz");
     EXPECT_EQ(reachedRates({}), "");
+    EXPECT_EQ(missedRates({{0x7E8, 0x0C, 10.0, 9.0, 0}}), "") << "just not missed";
+    EXPECT_EQ(missedRates({{0x7E8, 0x0C, 10.0, 8.99, 0}}), "RPM 8.99 of 10 Hz");
 }
 
 } // namespace

@@ -1,3 +1,4 @@
+#include "libvelmora/http/httpserver.h"
 #include "libvelmora/output/database/database.h"
 #include "tests/libvelmora/watch/servicemanager.h"
 #include "tests/support/temporaryfolder.h"
@@ -59,7 +60,7 @@ protocol = 6
 id = "7E8"
 [module.raw]
 "0100" = "41 00 80 10 00 00"
-"0101" = "41 01 00 07 21 00"
+"0101" = "41 01 80 07 21 00"
 "010C" = "41 0C 0F A0"
 "03" = "43 00"
 "07" = "47 00"
@@ -94,7 +95,7 @@ TEST_F(LongWatchTest, WritesUntilItsEndAndGoesOnOverAReload)
     EXPECT_TRUE(m_told.hold("running", 2));
     std::ofstream(m_options.configFile) << "nonsense = 1\n";
     watch.reload();
-    EXPECT_TRUE(m_told.hold("The settings stay as they were: "));
+    EXPECT_TRUE(m_told.hold("The settings stay as they were: " + m_options.configFile + ":1: nonsense: "));
     EXPECT_TRUE(m_told.hold("running", 3));
     EXPECT_TRUE(watch.health().linkUp);
     watch.end();
@@ -130,6 +131,7 @@ TEST_F(LongWatchTest, TellsItsServiceManagerAndEndsTheTripUnderWay)
     });
     std::thread runner([&watch] { watch.run(); });
     EXPECT_TRUE(m_told.hold("engine_start: The engine runs"));
+    EXPECT_TRUE(m_told.hold("lamp_on (7E8): The malfunction lamp is on"));
     EXPECT_TRUE(m_told.hold("running"));
     EXPECT_TRUE(m_told.hold("page"));
     watch.reload();
@@ -194,6 +196,16 @@ TEST_F(LongWatchTest, LeavesAnOutputThatHangsBehind)
     watch.end();
     runner.join();
     EXPECT_TRUE(m_told.hold("sqlite:" + file + ": hangs, and is not waited for"));
+}
+
+TEST_F(LongWatchTest, APageThatTheWatchIsForHasToBeServed)
+{
+    velmora::HttpServer taken;
+    taken.start(velmora::parseHttpPlace("127.0.0.1:0"));
+    m_options.outputs = {"dash:127.0.0.1:" + std::to_string(taken.port())};
+    m_options.forPage = true;
+    EXPECT_THROW(LongWatch(m_options).run(), velmora::Error);
+    taken.stop();
 }
 
 TEST_F(LongWatchTest, RefusesWhatMakesNoSense)

@@ -118,6 +118,32 @@ TEST_F(RunSetup, AStrangerIsAVehicleThatIsKnownByAnotherName)
     EXPECT_NE(velmora::rulesOf(settings, "van").seed, velmora::rulesOf(settings, "van").seed);
 }
 
+TEST_F(RunSetup, APageHearsTheCarAndTellsWhetherStandardOutputIsFree)
+{
+    LongWatchOptions options;
+    std::vector<velmora::PageLink> links;
+    options.onPage = [&links](velmora::PageLink const& link) { links.push_back(link); };
+    velmora::OutputAddress const dash = velmora::parseOutputAddress("dash:127.0.0.1:0");
+    EXPECT_TRUE(velmora::WatchPage::is(dash));
+    for (bool const free : {true, false}) {
+        std::vector<velmora::OutputAddress> outputs = {dash};
+        if (!free) {
+            outputs.push_back(velmora::parseOutputAddress("ndjson:-"));
+        }
+        velmora::WatchPage const page(outputs, "van", options);
+        velmora::SessionCarOptions const tapped = page.withTaps({});
+        EXPECT_TRUE(tapped.onReading && tapped.onTraffic);
+        auto const output = page.makeOutput(
+            dash, [] { return velmora::Health(); }, m_folder.file("settings.toml"));
+        output->open();
+        output->close();
+        ASSERT_FALSE(links.empty());
+        EXPECT_EQ(links.back().outputIsFree, free);
+    }
+    velmora::WatchPage const none({velmora::parseOutputAddress("csv:a")}, "van", options);
+    EXPECT_FALSE(none.withTaps({}).onReading || none.withTaps({}).onTraffic) << "nobody listens";
+}
+
 TEST_F(RunSetup, OutputsAreEndedOnceWhoeverDoesIt)
 {
     LongWatchOptions options;
@@ -201,6 +227,9 @@ TEST_F(RunSetup, EachWrongOptionIsNamed)
     std::string const twice = complaint([&bad](auto& each) { each.car.signalFiles = {bad, bad}; });
     EXPECT_EQ(std::ranges::count(twice, '\n'), 1) << twice;
     EXPECT_NE(complaint([](auto& each) { each.sensors = {"RPM", "RPM@x"}; }), "");
+    std::ofstream(m_folder.file("watch.toml")) << "signals = [\"bad.toml\"]\n";
+    EXPECT_NE(complaint([this](auto& each) { each.configFile = m_folder.file("watch.toml"); }).find("bad.toml:1"),
+              std::string::npos);
 }
 
 } // namespace

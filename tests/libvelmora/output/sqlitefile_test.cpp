@@ -126,6 +126,16 @@ TEST(SqliteFile, LiesWholeInOneFileAfterAMinuteWithoutRecords)
     }
     EXPECT_GT(rest(59), 0U);
     EXPECT_EQ(rest(1), 0U);
+    {
+        DatabaseFile const fresh;
+        auto const unused = fresh.output();
+        for (int i = 0; i < 59; ++i) {
+            unused->write({});
+        }
+        EXPECT_GT(fresh.ahead(), 0U) << "its tables";
+        unused->write({});
+        EXPECT_EQ(fresh.ahead(), 0U);
+    }
     output->write(records(reading("RPM", 1.0)));
     EXPECT_GT(rest(30), 0U);
     output->write(records(reading("RPM", 2.0)));
@@ -218,6 +228,63 @@ TEST(SqliteFile, RepairsNothingOnceTheClockIsRight)
     EXPECT_THAT(at.texts("SELECT time - " + std::to_string(march) + " FROM reading ORDER BY time"),
                 ElementsAre("0", "1", "2"));
     EXPECT_THAT(at.texts("SELECT count(*) FROM undated"), ElementsAre("0"));
+}
+
+TEST(SqliteFile, HasEachRowWhole)
+{
+    DatabaseFile const at;
+    using namespace velmora;
+    auto const time = [](int millis) { return fromMillis(march + millis); };
+    Reading bus = reading("SPEED", 2.0, march + 1);
+    bus.vehicle = "bus";
+    bus.module = 0x7E9;
+    bus.pid = "010D";
+    bus.unit = "km/h";
+    Reading other = reading("RPM", 3.0, march + 2);
+    other.vehicle = "bus";
+    at.output()->write(records(
+        reading("RPM", 1.0), bus, other, Event{time(3), "van", "lamp_on", 1, "On"},
+        Event{time(4), "bus", "parked", {}, "It stands"}, ModuleInfo{time(5), "van", 1, "ECM", "Engine", "V1"},
+        ModuleInfo{time(6), "bus", 2, "TCM", "Gearbox", ""}, CodeChange{time(7), "van", 1, "P1", "pending", "A"},
+        CodeChange{time(8), "van", 1, "P1", "confirmed", "B"}, CodeChange{time(9), "van", 1, "P2", "pending", "C"},
+        CodeChange{time(10), "van", 2, "P1", "pending", "D"}, CodeChange{time(11), "bus", 1, "P1", "pending", "E"},
+        CodeChange{time(12), "van", 1, "P1", "pending", "again"},
+        CodeChange{time(20), "van", 1, "P1", "pending", "F", false}));
+    std::string const since = " - " + std::to_string(march);
+    auto const rows = [&at](std::vector<std::string> const& columns, std::string const& from) {
+        std::string joined;
+        for (std::string const& each : columns) {
+            joined += (joined.empty() ? "" : " || '|' || ") + ("ifnull(" + each + ", '-')");
+        }
+        return at.texts("SELECT " + joined + " FROM " + from);
+    };
+    EXPECT_THAT(rows({"vehicle", "module", "key", "pid", "name", "unit", "time" + since, "value"},
+                     "reading JOIN sensor ON sensor.id = sensor ORDER BY time"),
+                ElementsAre("van|2024|RPM|010C|Name of RPM|rpm|0|1", "bus|2025|SPEED|010D|Name of SPEED|km/h|1|2",
+                            "bus|2024|RPM|010C|Name of RPM|rpm|2|3"));
+    EXPECT_THAT(rows({"time" + since, "vehicle", "module", "kind", "text"}, "event ORDER BY id"),
+                ElementsAre("3|van|1|lamp_on|On", "4|bus|-|parked|It stands"));
+    EXPECT_THAT(rows({"vehicle", "id", "name", "description", "vin", "seen" + since}, "module ORDER BY seen"),
+                ElementsAre("van|1|ECM|Engine|V1|5", "bus|2|TCM|Gearbox|-|6"));
+    EXPECT_THAT(
+        rows({"vehicle", "module", "code", "kind", "text", "since" + since, "gone" + since}, "code ORDER BY since"),
+        ElementsAre("van|1|P1|pending|A|7|20", "van|1|P1|confirmed|B|8|-", "van|1|P2|pending|C|9|-",
+                    "van|2|P1|pending|D|10|-", "bus|1|P1|pending|E|11|-"));
+}
+
+TEST(SqliteFile, AStatementIsReadyAgainBehindItsLastRow)
+{
+    DatabaseFile const at;
+    auto const output = at.output();
+    velmora::Statement statement(output->database(), "SELECT ? UNION ALL SELECT 9");
+    for (std::int64_t const number : {1, 2}) {
+        statement.bind(1, number);
+        std::vector<std::int64_t> numbers;
+        while (statement.next()) {
+            numbers.push_back(statement.number(0));
+        }
+        EXPECT_THAT(numbers, ElementsAre(number, 9));
+    }
 }
 
 TEST(SqliteFile, KnowsASensorByItsUnitTooAndAModuleByItsLastWords)

@@ -36,7 +36,9 @@ TEST(FoundPort, IsRememberedAndTriedFirstTheNextTime)
 
     told.clear();
     search.baud.reset();
+    std::filesystem::last_write_time(settings, std::filesystem::file_time_type());
     EXPECT_EQ(findAdapterAgain(search, settings), address);
+    EXPECT_EQ(std::filesystem::last_write_time(settings), std::filesystem::file_time_type()) << "it is known already";
     EXPECT_EQ(told, tryingText(adapter.path(), 115200)) << "at its rate, and nobody else is asked";
     EXPECT_EQ(console.received(), "ATI\r");
     std::ifstream in(settings);

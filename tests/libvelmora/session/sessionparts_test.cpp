@@ -4,6 +4,7 @@
 #include "libvelmora/port/opening/openport.h"
 #include "libvelmora/record/dialoguerecorder.h"
 #include "libvelmora/session/cyclemeter.h"
+#include "libvelmora/session/libraryuse.h"
 #include "libvelmora/session/session.h"
 #include "tests/support/temporaryfolder.h"
 
@@ -15,6 +16,7 @@
 #include <gtest/gtest.h>
 
 #include <atomic>
+#include <fstream>
 #include <mutex>
 #include <thread>
 
@@ -94,6 +96,7 @@ protected:
         return !replies.empty();
     }
 
+    velmora::LibraryUse const m_library{""}; // keeps the catalogue from session to session
     testsupport::TemporaryFolder m_folder;
     Line m_line;
     velmora::CarOptions m_options;
@@ -134,6 +137,47 @@ TEST_F(SessionParts, SaysWhatItIsAt)
     EXPECT_EQ(Session{SessionOptions(m_options)}.port(), "the application's port");
     m_options.port = "mine";
     EXPECT_EQ(Session{SessionOptions(m_options)}.port(), "mine");
+}
+
+TEST_F(SessionParts, HasTheUnitsOfItsOptionsOrOfTheSettings)
+{
+    using velmora::Units;
+    struct Case
+    {
+        char const* settings;
+        std::optional<Units> option;
+        Units units;
+        Units imperial;
+    };
+    for (Case const& each :
+         {Case{"", {}, Units::Metric, Units::Imperial},
+          {"", Units::Imperial, Units::Imperial, Units::Imperial},
+          {"", Units::ImperialUk, Units::ImperialUk, Units::ImperialUk},
+          {"unitsystem = 1", {}, Units::Imperial, Units::Imperial},
+          {"unitsystem = 1", Units::Metric, Units::Metric, Units::Imperial},
+          {"unitsystem = 1\n[velmora]\ngallon = 1", {}, Units::ImperialUk, Units::ImperialUk},
+          {"unitsystem = 0\n[velmora]\ngallon = 1", {}, Units::Metric, Units::ImperialUk},
+          {"unitsystem = 1\n[velmora]\ngallon = 1", Units::Imperial, Units::Imperial, Units::Imperial}}) {
+        std::ofstream(m_folder.file("settings.toml")) << "[common]\n" << each.settings << "\n";
+        m_options.units = each.option;
+        Session const session{SessionOptions(m_options)};
+        EXPECT_EQ(session.units(), each.units) << each.settings;
+        EXPECT_EQ(session.imperialUnits(), each.imperial) << each.settings;
+    }
+}
+
+TEST_F(SessionParts, TellsTheAdaptersHabitsThatItMet)
+{
+    m_options.openPort = m_line.opener("sim:petrol-can11?instant&fault=quirk:echo-stuck");
+    std::string details;
+    m_options.onDetail = [&details](std::string const& lines) { details += lines; };
+    {
+        Session session{SessionOptions(m_options)};
+        session.connect();
+        EXPECT_THAT(details, Not(HasSubstr("habits")));
+    }
+    EXPECT_THAT(details, HasSubstr("The adapter's habits: echo that stays on, "));
+    EXPECT_THAT(details, Not(HasSubstr(", 0x"))) << "what it did not meet is none";
 }
 
 TEST_F(SessionParts, CountsFramesButInARecording)

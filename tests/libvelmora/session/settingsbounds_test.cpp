@@ -203,8 +203,12 @@ TEST(SettingRanges, NumbersAreTakenToTheHundredth)
 {
     support::MemorySettings store;
     velmora::VehicleSetting const& displacement = findSetting("displacement");
-    for (auto const& [text, stored] :
-         {std::pair("1.6", 160), {"1.60000000001", 160}, {"0.29", 29}, {"2.", 200}, {"30.00", 3000}}) {
+    for (auto const& [text, stored] : {std::pair("1.6", 160),
+                                       {"1.60000000001", 160},
+                                       {"1.600000005", 160},
+                                       {"0.29", 29},
+                                       {"2.", 200},
+                                       {"30.00", 3000}}) {
         setSetting(displacement, text, store);
         int value = 0;
         store.getInt(displacement.key, value);

@@ -1,7 +1,10 @@
 // What the watch asks of a car behind a simulated adapter: while it sleeps, while it is awake, and by whom it is heard.
+#include "libvelmora/session/libraryuse.h"
 #include "libvelmora/watch/sessioncar.h"
 #include "tests/support/temporaryfolder.h"
 
+#include <obd/iecumanager.h>
+#include <obd/iobdvelmora.h>
 #include <velmora/error.h>
 
 #include <gmock/gmock.h>
@@ -47,6 +50,7 @@ protected:
         return std::nullopt;
     }
 
+    velmora::LibraryUse const m_library{""}; // keeps the catalogue from car to car
     testsupport::TemporaryFolder m_folder;
     SessionCarOptions m_options;
 };
@@ -131,6 +135,60 @@ id = "7E8"
     EXPECT_FALSE(looks[0].lists.at("pending")) << "a list that was refused is not an empty one";
     ASSERT_TRUE(looks[0].lists.at("permanent"));
     EXPECT_TRUE(looks[0].lists.at("permanent")->empty());
+}
+
+TEST_F(AskedCar, LooksAtAllModulesAndGoesOnWithTheFirst)
+{
+    make("[[module]]\nid = \"7E8\"\n[module.raw]\n\"0100\" = \"41 00 00 10 00 00\"\n"
+         "[[module]]\nid = \"7E9\"\n[module.raw]\n\"0100\" = \"41 00 00 10 00 00\"\n\"03\" = \"43 00\"\n");
+    m_options.session.sleep = true;
+    std::vector<std::string> sent;
+    m_options.onTraffic = [&sent](bool out, std::string_view text) {
+        if (out) {
+            sent.emplace_back(text);
+        }
+    };
+    SessionCar car(m_options);
+    car.connect();
+    std::vector<velmora::CodeLook> const looks = car.lookAtCodes();
+    ASSERT_EQ(looks.size(), 2U);
+    EXPECT_EQ(looks[1].module, 0x7E9U);
+    EXPECT_FALSE(looks[0].lists.at("confirmed"));
+    EXPECT_FALSE(looks[0].lamp);
+    EXPECT_FALSE(looks[0].notReady) << "not told";
+    EXPECT_TRUE(looks[1].lists.at("confirmed"));
+    EXPECT_EQ(car.session()->obd().getEcuManager()->getCurrentEcu()->id(), 0x7E8U);
+    EXPECT_FALSE(sent.empty());
+    car.disconnect();
+    EXPECT_THAT(sent, testing::Not(testing::Contains(testing::HasSubstr("ATLP")))) << "closing is not told";
+}
+
+TEST_F(AskedCar, ReadsSignalsOfOnesOwn)
+{
+    std::ofstream(m_folder.file("own.toml")) << "[[signal]]\nid = \"GEARBOX_TEMP\"\nname = \"Gearbox oil\"\n"
+                                                "header = \"7E1\"\nrequest = \"221E1C\"\n"
+                                                "formula = \"(A*256+B)/16\"\nunit = \"°C\"\n";
+    m_options.session.port = "sim:petrol-can11-modules?instant";
+    m_options.session.signalFiles = {m_folder.file("own.toml")};
+    for (char const* const wish : {"GEARBOX_TEMP@20hz", "gearbox oil@20hz"}) {
+        m_options.sensors = {wish};
+        SessionCar car(m_options);
+        car.connect();
+        std::vector<velmora::SensorEntry> const sensors = car.sensors().sensors;
+        ASSERT_EQ(sensors.size(), 3U) << "with what trips need";
+        EXPECT_EQ(sensors[2].sensor + sensors[2].pid + sensors[2].name + sensors[2].unit,
+                  "GEARBOX_TEMP221E1CGearbox oil°C");
+        EXPECT_EQ(sensors[2].hertz, 20.0);
+        car.startAsking();
+        bool come = false;
+        for (int i = 0; i < 2000 && !come; ++i) {
+            car.wait(5ms);
+            for (velmora::Reading const& each : car.readings()) {
+                come = come || each.sensor == "GEARBOX_TEMP";
+            }
+        }
+        EXPECT_TRUE(come) << wish;
+    }
 }
 
 TEST_F(AskedCar, IsHeardReadingByReadingAndByteByByte)
