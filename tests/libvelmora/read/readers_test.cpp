@@ -298,6 +298,28 @@ TEST_F(ReadersOfTopics, LeaveTheModuleThatWasCurrent)
     EXPECT_TRUE(asksForTheVin());
 }
 
+// An adapter that is gone is not a module that says nothing.
+TEST_F(ReadersOfTopics, AskTheAdapterItselfWhereNothingCame)
+{
+    Read const last[] = {
+        [](auto& s, auto&) { clearCodes(s); },
+        [](auto& s, auto& e) {
+            runRoutine(s, e, {1, "", ""});
+        },
+        [](auto& s, auto&) {
+            readModules(s, [](Session& each, obd::IEcu const& /*ecu*/) {
+                obd::ResponseMap ignored;
+                return each.proxy()->execute(std::vector<unsigned char>{0x01, 0x0C}, ignored, 500);
+            });
+        },
+    };
+    for (Read const& read : last) {
+        connect("bench-can11");
+        m_car->control("fault silent@1");
+        EXPECT_EQ(problem([&] { read(*m_session, module()); }), "The adapter on a car no longer answers");
+    }
+}
+
 TEST_F(ReadersOfTopics, TellWhichRoutinesCanBeRun)
 {
     connect("petrol-can11");
