@@ -173,6 +173,33 @@ TEST(CutWait, ComesBehindWholeLinesOnly)
     }
 }
 
+// Full waits that were asked for, and counted replies, tell nothing of how the adapter keeps to the shorter one.
+TEST(CutWait, IsLearntFromPlainRepliesAlone)
+{
+    ChannelRig obeying;
+    hasten(obeying);
+    for (char const* request : {"010D", "0105"}) {
+        std::string const line = "7E80341" + std::string(request + 2) + "20";
+        obeying.wire->on(request, saidSlowly(line, 102)).on(request, saidSlowly(line, 400));
+        obeying.ask(request);
+    }
+    obeying.wire->on("010F", saidSlowly("7E803410F20\r7E903410F20", 150));
+    obeying.ask("010F");
+    EXPECT_THAT(obeying.wire->takeCommands(), Not(Contains(" ")));
+
+    ChannelRig deaf;
+    bringUpDeaf(deaf);
+    deaf.channel.onConnected();
+    deaf.wire->on("010C", saidSlowly("7E804410C1AF8\r7E904410C1AF9", 400))
+        .on("03", saidSlowly("7E8024300\r7E9024300", 400));
+    deaf.wire->on("010C2", "7E804410C1AF8\r7E904410C1AF9");
+    for (int i = 0; i < 3; ++i) {
+        deaf.ask("010C");
+    }
+    deaf.ask("03");
+    EXPECT_THAT(deaf.wire->takeCommands(), ElementsAre("010C", " ", "010C", " ", "010C2", "03", " "));
+}
+
 TEST(CutWait, IsNeverOfAnAddressNorOfARequestThatChangesSomething)
 {
     ChannelRig rig;

@@ -1,6 +1,5 @@
 // What is known of a reply beside its lines, by which the channel decides what to do about it.
 
-#include "libvelmora/channel/bringupmemory.h"
 #include "libvelmora/channel/replyhealer.h"
 
 #include <gtest/gtest.h>
@@ -134,6 +133,8 @@ TEST(HealedReplies, AnswerTheirRequestByServiceAndItem)
         EXPECT_EQ(healedOnce(std::string(row.reply) + "\r", {row.request}).answered, row.answers)
             << row.request << " " << row.reply;
     }
+    EXPECT_EQ(factsOf("7E8027F78\r", {"78"}), "data irregular") << "which asks for nothing";
+    EXPECT_EQ(factsOf("7E804410C1AF8\r7E8037F0178\r"), "data pending answered") << "patience behind an answer";
     EXPECT_EQ(factsOf("7E8027F78\r7E804410C1AF8\r"), "data answered irregular") << "no refusal of this request";
     EXPECT_EQ(factsOf("7E8027F01\r7E904410C1AF8\r"), "data answered irregular");
     EXPECT_EQ(factsOf("7E8047F010C78\r7E904410C1AF8\r"), "data pending answered") << "another module's patience";
@@ -189,34 +190,6 @@ TEST(HealedReplies, DropNothingButWhatStandsBehindDataOrAnAnswer)
           Row{"SEARCHING...\rUNABLE TO CONNECT\r", "SEARCHING...\rUNABLE TO CONNECT\r"}}) {
         EXPECT_EQ(healedOnce(row.raw, {"010C"}).text(), row.text);
     }
-}
-
-TEST(BringUpMemory, KeepsMasksInWhichAllHaveSpoken)
-{
-    BringUpMemory memory;
-    EXPECT_FALSE(memory.isOn());
-    memory.start();
-    EXPECT_TRUE(memory.isOn());
-    auto const remember = [&memory](char const* request, char const* raw) {
-        memory.remember(ElmCommand(request), healedOnce(raw, {request}));
-        return memory.recall(ElmCommand(request)).has_value();
-    };
-    EXPECT_FALSE(remember("0101", "7EA06410100000000\r")) << "no mask";
-    EXPECT_FALSE(remember("0100", "NO DATA\r"));
-    EXPECT_TRUE(remember("0100", "7E8064100BE3EA813\r7E906410080000001\r"));
-    EXPECT_EQ(memory.modules(), (std::set<unsigned int>{0x7E8, 0x7E9})) << "those of the first mask";
-    EXPECT_FALSE(remember("0120", "7E8064120A007F011\r"));
-    EXPECT_FALSE(remember("0140", "7E8064140A007F011\r7E906414080000001\rCAN ERROR\r"));
-    EXPECT_TRUE(remember("0900", "7E806490014400000\r7E906490014400000\r"));
-    memory.start();
-    EXPECT_TRUE(memory.modules().empty());
-    EXPECT_FALSE(remember("0100", "7E8064100BE3EA813\r7E9064100\r")) << "a line was lost";
-    EXPECT_FALSE(memory.isOn()) << "who spoke nobody knows";
-    memory.start();
-    EXPECT_TRUE(remember("0100", "7E8064100BE3EA813\r"));
-    memory.stop();
-    EXPECT_FALSE(memory.isOn());
-    EXPECT_EQ(memory.recall(ElmCommand("0100")), std::nullopt);
 }
 
 } // namespace

@@ -169,6 +169,16 @@ TEST(Waking, IsTriedAgainSoonBehindAnInterruption)
     EXPECT_EQ(timeOf({{"STOPPED\r\r>", WireTime(600)}}), 600 + 700 + 5 + 5) << "but no later than else";
 }
 
+TEST(Waking, IsTriedTwice)
+{
+    ChannelRig rig;
+    rig.connect();
+    rig.wire->setSilent(true);
+    rig.ask("ATRV", 500);
+    rig.ask("ATRV", 100);
+    EXPECT_THAT(rig.wire->takeCommands(), ElementsAre("ATRV", "ATI", "ATI", "ATRV"));
+}
+
 TEST(Waking, ShowsTheLoggersWhatItHeard)
 {
     struct HeardTap : obd::IConnectionLogger

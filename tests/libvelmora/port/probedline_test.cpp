@@ -13,6 +13,8 @@
 #include <gtest/gtest.h>
 
 #include <filesystem>
+#include <fstream>
+#include <sys/file.h>
 #include <sys/ioctl.h>
 #include <sys/stat.h>
 #include <unistd.h>
@@ -90,6 +92,24 @@ TEST(ProbedLine, IsHeldOpenRawAndLeftAsItWas)
     SerialProbe const stopped = velmora::probeSerialPort(device.path(), {38400, 19200}, {}, [] { return true; });
     EXPECT_EQ(stopped.outcome, Found::Silent);
     EXPECT_EQ(device.received(), "ATI\r") << "not asked a second time";
+}
+
+TEST(ProbedLine, HasNoRateWhereNobodyWasAsked)
+{
+    testsupport::TemporaryFolder const folder;
+    ScriptedDevice const device("ELM327 v1.5\r\r>", B38400);
+    std::ofstream(folder.file("plain")) << "x";
+    std::ofstream(folder.file("LCK.." + std::filesystem::path(device.path()).filename().string())) << "1\n";
+    velmora::HolderPlaces const places{{folder.path()}, "/proc"};
+    for (std::string const& path : {folder.file("none"), folder.file("plain"), device.path()}) {
+        SerialProbe const probe = velmora::probeSerialPort(path, {38400}, {}, {}, places);
+        EXPECT_NE(probe.outcome, Found::Adapter) << path;
+        EXPECT_EQ(probe.baud, 0U) << path;
+    }
+    int const other = ::open(device.path().c_str(), O_RDWR | O_NOCTTY | O_CLOEXEC);
+    ASSERT_EQ(::flock(other, LOCK_EX | LOCK_NB), 0);
+    EXPECT_EQ(velmora::probeSerialPort(device.path(), {38400}).baud, 0U);
+    ::close(other);
 }
 
 TEST(SerialLine, IsSetToEightBitsAtItsRateWithoutFlowControl)
