@@ -15,7 +15,7 @@ using testsupport::reading;
 using testsupport::records;
 using velmora::ClockLook;
 
-struct Held
+struct HeldBack
 {
     ClockLook look{march, 1000, false, "boot"};
     std::vector<std::string> calls;
@@ -23,7 +23,7 @@ struct Held
     std::vector<std::int64_t> times;
     velmora::HoldingOutput output;
 
-    Held() : output(std::make_unique<Inner>(*this), velmora::parseOutputAddress("csv:a"), context()) {}
+    HeldBack() : output(std::make_unique<Inner>(*this), velmora::parseOutputAddress("csv:a"), context()) {}
 
     velmora::OutputContext context()
     {
@@ -46,7 +46,7 @@ struct Held
 private:
     struct Inner : velmora::IOutput
     {
-        explicit Inner(Held& theHeld) : held(theHeld) {}
+        explicit Inner(HeldBack& theHeld) : held(theHeld) {}
         void open() override { held.calls.emplace_back("open"); }
         void write(velmora::Records records) override
         {
@@ -58,15 +58,16 @@ private:
         void close() override { held.calls.emplace_back("close"); }
         velmora::OutputState state() override { return {true, 3}; }
 
-        Held& held;
+        HeldBack& held;
     };
 };
 
 TEST(HoldingOutput, KeepsTheOutputGoingWhileItHoldsLinesBack)
 {
-    Held held;
+    HeldBack held;
     held.output.open();
     EXPECT_THAT(held.calls, ElementsAre("open"));
+    EXPECT_EQ(velmora::HoldingOutput::most, 20000U);
     EXPECT_EQ(held.output.state().waiting, 3U) << "its own";
     EXPECT_THAT(held.write(2), ElementsAre("write 0")) << "what it does by time goes on";
     EXPECT_EQ(held.output.state().waiting, 2U);
@@ -86,7 +87,7 @@ TEST(HoldingOutput, KeepsTheOutputGoingWhileItHoldsLinesBack)
 
 TEST(HoldingOutput, RepairsNothingOnceTheClockIsRight)
 {
-    Held held;
+    HeldBack held;
     held.output.open();
     held.write(1);
     held.look.synced = true;
@@ -99,7 +100,7 @@ TEST(HoldingOutput, RepairsNothingOnceTheClockIsRight)
 
 TEST(HoldingOutput, TellsOnceThatNobodySetsTheClock)
 {
-    Held held;
+    HeldBack held;
     held.look = {1000, 1000, false, "boot"};
     held.output.open();
     held.look = {300000, 300000, false, "boot"};

@@ -107,6 +107,30 @@ TEST(HomeState, TheStateIsPublishedOnceASecondAtMostAndOnlyIfItChanged)
     EXPECT_TRUE(home.retained.empty());
 }
 
+TEST(HomeState, HasItsBoundsInTime)
+{
+    Home home(Discovery::Device);
+    home.state.publishState(home.now);
+    EXPECT_TRUE(home.retained.empty()) << "nothing is known yet";
+    home.state.take(carSensors(), home.now);
+    home.state.take(reading("SPEED", 50.0), home.now);
+    home.state.take(reading("RPM", {}), home.now);
+    EXPECT_EQ(home.published()["7e8_rpm"], "None") << "told, and without a value";
+    auto const changes = [&home](std::chrono::milliseconds time) {
+        home.retained.clear();
+        home.now += time;
+        home.state.take(reading("FUEL_LEVEL", 1.0), home.now);
+        home.state.publishState(home.now);
+        return home.retained.contains("cars/van/state");
+    };
+    EXPECT_FALSE(changes(899ms));
+    EXPECT_TRUE(changes(1ms)) << "a little less than a second";
+    EXPECT_TRUE(changes(57100ms)); // a minute after the speed
+    EXPECT_EQ(Json::parse(home.retained["cars/van/state"])["7e8_speed"], 50);
+    EXPECT_TRUE(changes(900ms));
+    EXPECT_EQ(Json::parse(home.retained["cars/van/state"])["7e8_speed"], "None");
+}
+
 TEST(HomeState, TheLampIsOneOfAllModulesAndTellsAlsoThatItIsOff)
 {
     Home home(Discovery::Device);
@@ -151,6 +175,7 @@ TEST(HomeState, MessagesOfEitherFormAreAsTheSchemaWants)
     device.state.take(carSensors(), device.now);
     Json whole = Json::parse(device.retained["homeassistant/device/velmora_van/config"]);
     EXPECT_EQ(discoveryComplaint(folder, whole.dump()), 0);
+    EXPECT_EQ(whole["qos"], 1);
     Home entity(Discovery::Entity);
     entity.state.take(carSensors(), entity.now);
     ASSERT_EQ(entity.retained.size(), carSensors().sensors.size() + 2);

@@ -113,6 +113,7 @@ TEST(LineFiles, MayBeStandardOutputWhichStaysOpen)
     {
         LineFile file(parseOutputAddress("ndjson:-?rotate=1"));
         file.setHeader("head\n");
+        EXPECT_EQ(file.file(), "-");
         trouble += lineTrouble(file, "1\n");
         trouble += lineTrouble(file, "2\n");
         file.close();
@@ -185,6 +186,7 @@ TEST(LineFiles, HoldNoHalfLineOfAFullDisk)
         EXPECT_EQ(lineTrouble(file, "two\nthree\n"), "Could not write to " + folder.file("a") + ": File too large");
     }
     EXPECT_EQ(folder.read("a"), "one\n");
+    EXPECT_TRUE(testsupport::isHeldOpen(folder.file("a"))) << "it goes on with the same";
     EXPECT_EQ(lineTrouble(file, "two\n"), "");
     EXPECT_EQ(folder.read("a"), "one\ntwo\n");
 }

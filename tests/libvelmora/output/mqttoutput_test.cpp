@@ -211,6 +211,13 @@ TEST(MqttOutput, TellsALossInTheStreamAndWhatRefusesOnce)
     EXPECT_EQ(gaps()[0]["from"], 1) << "from the first that was not told yet";
     EXPECT_EQ(gaps()[0]["to"], spool.number("SELECT min(seq) FROM row") - 1);
     EXPECT_NEAR(gaps()[0]["time"].get<double>(), static_cast<double>(velmora::lookAtClocks().wall), 60000.0);
+    spool.execute("CREATE TRIGGER no BEFORE INSERT ON row BEGIN SELECT RAISE(FAIL, 'no'); END");
+    EXPECT_THROW(output.write(many), velmora::Error);
+    std::int64_t const lost = spool.number("SELECT min(seq) FROM row") - 1;
+    spool.execute("DROP TRIGGER no; DELETE FROM row");
+    output.write(records(reading("RPM", 1.0)));
+    ASSERT_EQ(gaps().size(), 1U) << "told though there is room again";
+    EXPECT_EQ(gaps()[0]["to"], lost);
     for (int i = 0; i < 9; ++i) {
         output.write({});
     }

@@ -98,6 +98,10 @@ TEST(OutputFiles, AreNoHostsAndNoStandardOutput)
         EXPECT_NO_THROW(velmora::requirePlainTarget(parseOutputAddress(text))) << text;
     }
     EXPECT_THROW(velmora::requirePlainTarget(parseOutputAddress("csv:udp:")), velmora::Error);
+    for (char const* const kind : {"", "dash", "mqtt", "prometheus", "tape"}) {
+        EXPECT_THROW(velmora::fileOutput(kind, "a"), velmora::Error) << kind;
+    }
+    EXPECT_EQ(velmora::fileOutput("csv-long", "a").target, std::filesystem::current_path() / "a");
     std::filesystem::current_path(before);
 }
 

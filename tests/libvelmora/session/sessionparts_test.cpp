@@ -31,7 +31,7 @@ using velmora::Session;
 using velmora::SessionOptions;
 
 // A simulated adapter with its sent lines noted, which a test may silence or cut.
-struct Line
+struct WatchedLine
 {
     std::mutex mutex;
     std::vector<std::string> sent; // protected by mutex
@@ -51,7 +51,7 @@ struct Line
 private:
     struct Port : velmora::IPort
     {
-        Port(Line& theLine, std::string const& car)
+        Port(WatchedLine& theLine, std::string const& car)
             : line(theLine), inner(velmora::openPort(velmora::parsePortAddress(car)))
         {}
         void start(Receiver onBytes, LossHandler onLost) override
@@ -75,7 +75,7 @@ private:
         }
         void close() override { inner->close(); }
 
-        Line& line;
+        WatchedLine& line;
         std::unique_ptr<velmora::IPort> inner;
     };
 };
@@ -98,7 +98,7 @@ protected:
 
     velmora::LibraryUse const m_library{""}; // keeps the catalogue from session to session
     testsupport::TemporaryFolder m_folder;
-    Line m_line;
+    WatchedLine m_line;
     velmora::CarOptions m_options;
 };
 

@@ -55,6 +55,21 @@ TEST(WatchEngineBounds, ASilentCarHasTenSecondsAndThenAMinute)
     EXPECT_EQ(watch.car.stops, 1);
 }
 
+TEST(WatchEngineBounds, TellsThatTheEngineRunsInTheStepThatReadsIt)
+{
+    Watch watch;
+    std::vector<velmora::SteadyTime> looks;
+    watch.car.onCodes = [&] { looks.push_back(watch.time.steady()); };
+    watch.car.rpm = 800;
+    watch.step();
+    EXPECT_THAT(watch.events, ElementsAre("ignition_on", "engine_start"));
+    EXPECT_EQ(watch.engine.state(), "running");
+    watch.run(21min);
+    ASSERT_GE(looks.size(), 4U);
+    EXPECT_EQ(looks[2] - looks[1], 10min);
+    EXPECT_EQ(looks[3] - looks[2], 10min);
+}
+
 TEST(WatchEngineBounds, IsConnectingDuringEachAttempt)
 {
     Watch watch;
@@ -185,6 +200,8 @@ TEST(WatchEngineBounds, ANapThatTheLinkBrokeIsTakenAgain)
     watch.run(10min);
     EXPECT_EQ(watch.car.naps, 2);
     EXPECT_EQ(watch.engine.state(), "parked");
+    EXPECT_THAT(watch.events, Contains("link_back"));
+    EXPECT_EQ(watch.engine.trouble(), "");
 }
 
 } // namespace
