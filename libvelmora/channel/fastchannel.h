@@ -4,6 +4,7 @@
 #include "libvelmora/channel/bringupmemory.h"
 #include "libvelmora/channel/countlearner.h"
 #include "libvelmora/channel/ichannelcontrol.h"
+#include "libvelmora/channel/lateanswers.h"
 #include "libvelmora/channel/learntstore.h"
 #include "libvelmora/channel/replyhealer.h"
 #include "libvelmora/channel/returnnote.h"
@@ -46,9 +47,9 @@ struct ChannelOptions
 //
 // All work is done on the threads that send and receive. The members stand in several files: fastchannel.cpp (the
 // interface), fastchannel_exchange.cpp (one exchange), fastchannel_reply.cpp (what becomes of a reply),
-// fastchannel_recovery.cpp (prompts lost, adapters reset), fastchannel_haste.cpp (counts, waits, memory),
-// fastchannel_cut.cpp (waits that adapters do not shorten), fastchannel_address.cpp (requests to one module),
-// fastchannel_stay.cpp (several of them, and what a broken link leaves behind).
+// fastchannel_recovery.cpp (prompts lost, adapters reset), fastchannel_late.cpp (late replies), fastchannel_haste.cpp
+// (counts, waits, memory), fastchannel_cut.cpp (waits that adapters do not shorten), fastchannel_address.cpp (requests
+// to one module), fastchannel_stay.cpp (several of them, and what a broken link leaves behind).
 class FastChannel : public obd::IDataConnection, public IChannelControl
 {
 public:
@@ -85,8 +86,9 @@ private:
     struct Pending
     {
         ElmCommand command;
-        std::string sent; // the last text for it that was written
-        std::string key;  // of what is learnt: the request, and the address that it goes to
+        std::string sent;    // the last text for it that was written
+        std::string key;     // of what is learnt: the request, and the address that it goes to
+        WireTime begunAt{0}; // its first text
         WireTime sentAt{0};
         WireTime heardAt{0};                // the last byte
         WireTime dataAt{0};                 // the last digit of a reply
@@ -134,9 +136,13 @@ private:
     bool confirms(std::string const& text, WireTime limit);
 
     // Prompts lost, adapters reset.
+    WireTime latency() const;
+    void noteLateness();
     WireTime remedyTime() const;
     void remedy();
+    std::optional<std::string> awaitLate(WireTime limit);
     void settle();
+    bool isOwed(std::string const& reply);
     bool wake(std::string& before);
     bool tryToWake(std::string& before);
     bool isSilent() const;
@@ -217,6 +223,7 @@ private:
     SilenceWatch m_silence;
     bool m_silent = false;    // it did not answer when it was woken
     WireTime m_silentFrom{0}; // where it is silent: the last it said, or was asked
+    LateAnswers m_late;
     std::string m_trouble;
     bool m_busSpoke = false; // a request has brought data
     bool m_begun = false;    // something was sent

@@ -39,7 +39,8 @@ void FastChannel::begin(std::string const& text)
     }
     pending.key = pending.command.text();
     pending.asker = std::this_thread::get_id();
-    pending.latency = m_options.latency;
+    pending.latency = latency();
+    pending.begunAt = m_wire->now();
     m_starting = pending.command.resets();
     bool const reachesBus = pending.command.isRequest() || pending.command.monitors();
     if (!reachesBus && !pending.command.onlyAsks()) {
@@ -102,7 +103,9 @@ void FastChannel::drain()
 {
     m_buffer += listen(m_wire->now());
     while (std::optional<std::string> const stale = cutReply()) {
-        note(isBlank(*stale) ? Habit::EmptyReply : Habit::StaleReply);
+        if (!isOwed(*stale)) {
+            note(isBlank(*stale) ? Habit::EmptyReply : Habit::StaleReply);
+        }
     }
     if (!isBlank(m_buffer)) {
         note(Habit::StaleReply);
@@ -153,7 +156,12 @@ void FastChannel::takeReplies()
         if (!reply) {
             return;
         }
+        bool const mayBeOwn = m_pending && (m_pending->command.text() == "ATI" || m_pending->command.resets());
+        if (!mayBeOwn && isOwed(*reply)) {
+            continue;
+        }
         if (m_pending) {
+            noteLateness();
             finish(*reply);
         } else {
             m_ready.push_back(*reply);
@@ -170,7 +178,12 @@ ReplyContext FastChannel::context() const
 std::optional<std::string> FastChannel::ask(std::string const& text, WireTime limit)
 {
     write(text);
-    return awaitReply(m_wire->now() + limit + m_options.latency);
+    WireTime const until = m_wire->now() + limit + latency();
+    std::optional<std::string> reply = awaitReply(until);
+    while (reply && isOwed(*reply)) {
+        reply = awaitReply(until);
+    }
+    return reply;
 }
 
 std::optional<std::string> FastChannel::awaitReply(WireTime until)

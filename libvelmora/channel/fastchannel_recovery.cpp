@@ -19,7 +19,6 @@ constexpr WireTime commandQuiet{400};
 constexpr WireTime longestWait{1044};
 constexpr WireTime requestQuiet{300};
 constexpr WireTime pendingQuiet{5300};
-constexpr WireTime latePromptLimit{5000};
 constexpr WireTime wakeLimit{700};
 constexpr WireTime stoppedLimit{200};
 constexpr WireTime settingLimit{1000};
@@ -50,10 +49,10 @@ WireTime FastChannel::remedyTime() const
         return never;
     }
     if (m_silent) {
-        return std::max(m_silence.end(), pending.sentAt + commandSilence + m_options.latency);
+        return std::max(m_silence.end(), pending.sentAt + commandSilence + latency());
     }
     if (!pending.command.isRequest()) {
-        return m_options.latency + (pending.heard ? pending.heardAt + commandQuiet : pending.sentAt + commandSilence);
+        return latency() + (pending.heard ? pending.heardAt + commandQuiet : pending.sentAt + commandSilence);
     }
     std::string const text = compactText(m_buffer);
     std::size_t const digits = text.find_last_of('.');
@@ -66,7 +65,7 @@ WireTime FastChannel::remedyTime() const
         return never;
     }
     bool const patience = text.find("7F") != std::string::npos && text.find("78") != std::string::npos;
-    return pending.heardAt + m_options.latency +
+    return pending.heardAt + latency() +
            (patience ? pendingQuiet : std::min(waitOf(m_state.setting("ATST")), longestWait) + requestQuiet);
 }
 
@@ -78,11 +77,13 @@ void FastChannel::remedy()
     note(Habit::LostPrompt);
     ElmCommand const command = m_pending->command;
     if (command.text() == "ATI") {
+        m_late.askedIdentity(m_wire->now()); // the first one
         writePending("ATI");
         return;
     }
     std::string before;
     if (!tryToWake(before)) {
+        m_buffer.insert(0, before); // the rest may come yet
         return;
     }
     std::size_t const end = before.find_last_of("\r\n");
@@ -94,37 +95,6 @@ void FastChannel::remedy()
     }
 }
 
-// The host has given up on a reply. Its prompt is waited for; one that doesn't come within the time, or behind whose
-// data nothing more can come, is taken for lost, and the adapter is woken. Nothing of that reply is handed on.
-void FastChannel::settle()
-{
-    WireTime const limit = m_wire->now() + (m_silent || m_pending->command.monitors() ? WireTime(0) : latePromptLimit);
-    std::optional<std::string> late;
-    while (!late && isValid() && m_wire->now() < std::min(limit, remedyTime())) {
-        std::string const bytes = listen(std::min(limit, remedyTime()));
-        m_buffer += bytes;
-        if (!bytes.empty()) {
-            m_pending->heard = true;
-            m_pending->heardAt = m_wire->now();
-        }
-        late = cutReply();
-        if (late && compactText(*late).empty()) {
-            late.reset();
-        }
-    }
-    if (late) {
-        note(Habit::LatePrompt);
-    } else if (isValid()) {
-        note(Habit::LostPrompt);
-        std::string before;
-        tryToWake(before);
-        if (m_pending->addressed && m_pending->command.monitors()) {
-            tellHeard(before);
-        }
-    }
-    endExchange();
-}
-
 // ATI, since a CR alone would repeat the last command, whatever that was. Its first character may only have stopped
 // what the adapter was at, so there is a second try.
 bool FastChannel::wake(std::string& before)
@@ -134,9 +104,11 @@ bool FastChannel::wake(std::string& before)
         before += m_buffer;
         m_buffer.clear();
         writeLine("ATI");
-        WireTime until = m_wire->now() + wakeLimit + m_options.latency;
+        m_late.askedIdentity(m_wire->now());
+        WireTime until = m_wire->now() + wakeLimit + latency();
         while (std::optional<std::string> const reply = awaitReply(until)) {
             if (isIdentity(*reply)) {
+                m_late.settledIdentity();
                 tellReceived(before);
                 return true;
             }
@@ -147,7 +119,7 @@ bool FastChannel::wake(std::string& before)
             }
             if (compactText(*reply).ends_with("STOPPED")) {
                 until = std::min(until,
-                                 m_wire->now() + stoppedLimit + m_options.latency); // it may have swallowed all of it
+                                 m_wire->now() + stoppedLimit + latency()); // it may have swallowed all of it
             }
         }
     }
@@ -173,7 +145,7 @@ bool FastChannel::tryToWake(std::string& before)
 // Not yet for one that pauses: slow clones do, for a second or two.
 bool FastChannel::isSilent() const
 {
-    return m_silent && m_wire->now() - m_silentFrom >= latePromptLimit;
+    return m_silent && m_wire->now() - m_silentFrom >= LateAnswers::limit;
 }
 
 bool FastChannel::isIdentity(std::string const& reply) const

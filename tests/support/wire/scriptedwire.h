@@ -2,6 +2,7 @@
 
 #include "tests/support/wire/timedwire.h"
 
+#include <algorithm>
 #include <deque>
 #include <map>
 #include <string>
@@ -39,6 +40,10 @@ public:
     // While it is silent nothing is answered, whatever was told.
     void setSilent(bool silent) { m_silent = silent; }
 
+    // What it says comes so much later than told, and never before some time: on a link that stands still.
+    void setLag(velmora::WireTime lag) { m_lag = lag; }
+    void holdUntil(velmora::WireTime time) { m_heldUntil = time; }
+
     // What a blank brings that interrupts; without it a blank is passed over.
     void onInterrupt(Reply reply) { m_onInterrupt = std::move(reply); }
 
@@ -71,9 +76,9 @@ private:
     }
     void sayAll(Reply const& reply)
     {
-        velmora::WireTime delay{0};
+        velmora::WireTime delay = m_lag;
         for (Piece const& piece : reply) {
-            delay += piece.delay;
+            delay = std::max(delay + piece.delay, m_heldUntil - now());
             say(piece.bytes, delay);
         }
     }
@@ -81,6 +86,8 @@ private:
     std::map<std::string, std::deque<Reply>> m_replies;
     std::vector<std::string> m_commands;
     Reply m_onInterrupt;
+    velmora::WireTime m_lag{0};
+    velmora::WireTime m_heldUntil{0};
     bool m_silent = false;
 };
 
