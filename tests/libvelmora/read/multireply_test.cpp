@@ -70,6 +70,9 @@ TEST(MultiLimit, GrowsAsFarAsTheModuleProvesIt)
     limit.proved(3);
     EXPECT_EQ(limit.now(), 6U);
     EXPECT_EQ(MultiLimit(1).now(), 1U);
+    MultiLimit wide(9);
+    wide.proved(3);
+    EXPECT_EQ(wide.now(), 6U) << "more the standard does not allow";
     EXPECT_EQ(MultiLimit(2).now(), 2U);
 }
 
