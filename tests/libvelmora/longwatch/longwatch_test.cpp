@@ -1,6 +1,7 @@
 #include "libvelmora/http/httpserver.h"
 #include "libvelmora/output/database/database.h"
 #include "tests/libvelmora/watch/servicemanager.h"
+#include "tests/support/openfiles.h"
 #include "tests/support/temporaryfolder.h"
 
 #include <velmora/error.h>
@@ -191,11 +192,17 @@ TEST_F(LongWatchTest, LeavesAnOutputThatHangsBehind)
     std::thread runner([&watch] { watch.run(); });
     EXPECT_TRUE(m_told.hold("The settings were read again"));
     EXPECT_TRUE(m_told.hold("running"));
-    velmora::Database other(file);
-    auto const hold = std::make_unique<velmora::Transaction>(other);
-    watch.end();
-    runner.join();
-    EXPECT_TRUE(m_told.hold("sqlite:" + file + ": hangs, and is not waited for"));
+    {
+        velmora::Database other(file);
+        velmora::Transaction const hold(other);
+        watch.end();
+        runner.join();
+        EXPECT_TRUE(m_told.hold("sqlite:" + file + ": hangs, and is not waited for"));
+    }
+    for (int i = 0; i < 10000 && testsupport::isHeldOpen(file); ++i) { // its thread tells this test of its end
+        std::this_thread::sleep_for(std::chrono::milliseconds(1));
+    }
+    EXPECT_FALSE(testsupport::isHeldOpen(file));
 }
 
 TEST_F(LongWatchTest, APageThatTheWatchIsForHasToBeServed)

@@ -127,7 +127,7 @@ TEST(InfluxUdp, TellsWhatIsWrongWithItsPlace)
         EXPECT_EQ(udpTrouble(place, 0), "\"influx:udp://" + std::string(place) + "\" needs a host and a port");
     }
     EXPECT_TRUE(udpTrouble("127.0.0.1:nowhere", 0).starts_with("Could not find 127.0.0.1:nowhere: "));
-    EXPECT_EQ(udpTrouble("255.255.255.255:1", 0), "Could not reach 255.255.255.255:1: Permission denied");
+    EXPECT_TRUE(udpTrouble("255.255.255.255:1", 0).starts_with("Could not reach 255.255.255.255:1: "));
     std::string const gone = UdpEnd().place();
     EXPECT_EQ(udpTrouble(gone, 2), "Could not send to " + gone + ": Connection refused");
 }

@@ -119,8 +119,10 @@ TEST(AdapterNap, OneThatKnowsNoSleepIsToldApart)
     auto const begin = std::chrono::steady_clock::now();
     NapAdapter silent;
     silent.answers.clear();
-    EXPECT_FALSE(AdapterNap(silent.opener(), 1ms).sleeps());
-    EXPECT_LT(std::chrono::steady_clock::now() - begin, 290ms) << "no longer than the limit";
+    for (int i = 0; i < 4; ++i) {
+        EXPECT_FALSE(AdapterNap(silent.opener(), 1ms).sleeps());
+    }
+    EXPECT_LT(std::chrono::steady_clock::now() - begin, 1150ms) << "no longer than the limit each";
     adapter.reachable = false;
     EXPECT_THROW(AdapterNap(adapter.opener(), 1ms), velmora::Error);
 }

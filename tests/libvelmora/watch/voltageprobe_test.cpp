@@ -87,8 +87,10 @@ TEST(VoltageProbe, AsksTheAdapterAndNobodyElse)
     EXPECT_EQ(probed({{"\r", ">"}, {"ATRV\r", ">ATRV\r12.5V\r\r>"}}, written), 12.5) << "a prompt that came late";
     EXPECT_EQ(probed({{"\r", ">"}, {"ATRV\r", "?\r\r>"}}, written), std::nullopt);
     auto const begin = std::chrono::steady_clock::now();
-    EXPECT_EQ(probed({{"\r", ""}, {"ATRV\r", ""}}, written), std::nullopt); // silent
-    EXPECT_LT(std::chrono::steady_clock::now() - begin, std::chrono::milliseconds(450)) << "no longer than the limit";
+    for (int i = 0; i < 3; ++i) {
+        EXPECT_EQ(probed({{"\r", ""}, {"ATRV\r", ""}}, written), std::nullopt); // silent
+    }
+    EXPECT_LT(std::chrono::steady_clock::now() - begin, std::chrono::milliseconds(1450)) << "not half a second each";
     EXPECT_THROW(probed({{"\r", ">"}}, written), velmora::Error);
 }
 
