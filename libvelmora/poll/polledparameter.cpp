@@ -39,8 +39,7 @@ PolledParameter::PolledParameter(PollWire& wire, std::shared_ptr<obd::IEcu> ecu,
     : m_wire(wire), m_ecu(std::move(ecu)), m_parameter(std::move(parameter)), m_units(units),
       m_lent(std::make_shared<LentProxy>(wire, m_ecu)), m_proxy(*m_lent), m_derived(hasNoRequest(*m_parameter))
 {
-    // What a value keeps may be of another drive.
-    m_parameter->clear();
+    m_parameter->clear(); // what a value keeps may be of another drive
 }
 
 void PolledParameter::lend(unsigned char pid, std::vector<unsigned char> const& payload)

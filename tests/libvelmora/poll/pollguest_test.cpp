@@ -219,6 +219,25 @@ TEST_F(PollGuestTest, InputsThatAModuleLeavesOutAreAskedForAlone)
     EXPECT_EQ(m_proxy->count("01 0C"), m_proxy->count("01 0D")) << "each once a turn";
 }
 
+TEST_F(PollGuestTest, AReplyThatIsCutIsNoValue)
+{
+    want(0x0C);
+    want(0x34);
+    m_proxy->answer("01 0C", "41 0C 1A F8");
+    m_proxy->answer("01 34", "41 34 80 00 80 00");
+    run(careful, 100);
+    std::size_t const told = count(0x7E8, 0x0C);
+    for (char const* const cut : {"41 0C 1A", "41 0C", "41 0D 50 50"}) {
+        m_proxy->answer("01 0C", cut);
+        run(careful, 100);
+        EXPECT_EQ(count(0x7E8, 0x0C), told) << cut;
+    }
+    std::size_t const currents = count(0x7E8, 0x34);
+    m_proxy->answer("01 34", "41 34 80 00");
+    run(careful, 100);
+    EXPECT_EQ(count(0x7E8, 0x34), currents) << "half of two values";
+}
+
 // What a value keeps is of its own drive.
 TEST_F(PollGuestTest, ValuesBeginAnewWithEachPoller)
 {
