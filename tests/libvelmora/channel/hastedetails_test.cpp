@@ -153,6 +153,9 @@ TEST(CutWait, ComesBehindWholeLinesOnly)
     };
     Row const rows[] = {
         {"two lines", {{"7E8024300\r7E9024300\r", WireTime(20)}, {"\r>", WireTime(400)}}, true},
+        {"a line end first",
+         {{"\r", WireTime(5)}, {"7E8024300\r7E9024300\r", WireTime(15)}, {"\r>", WireTime(400)}},
+         true},
         {"line feeds", {{"7E8024300\r\n7E9024300\r\n", WireTime(20)}, {"\r\n>", WireTime(400)}}, true},
         {"no end of the last line", {{"7E8024300\r7E9024300", WireTime(20)}, {"\r\r>", WireTime(400)}}, false},
         {"a module is missing", {{"7E8024300\r", WireTime(20)}, {"\r>", WireTime(400)}}, false},
@@ -176,16 +179,19 @@ TEST(CutWait, ComesBehindWholeLinesOnly)
 // Full waits that were asked for, and counted replies, tell nothing of how the adapter keeps to the shorter one.
 TEST(CutWait, IsLearntFromPlainRepliesAlone)
 {
-    ChannelRig obeying;
-    hasten(obeying);
-    for (char const* request : {"010D", "0105"}) {
-        std::string const line = "7E80341" + std::string(request + 2) + "20";
-        obeying.wire->on(request, saidSlowly(line, 102)).on(request, saidSlowly(line, 400));
-        obeying.ask(request);
+    for (char const* givenBack : {"OK", "?"}) {
+        ChannelRig obeying;
+        hasten(obeying);
+        obeying.wire->on("ATST64", givenBack);
+        for (char const* request : {"010D", "0105"}) {
+            std::string const line = "7E80341" + std::string(request + 2) + "20";
+            obeying.wire->on(request, saidSlowly(line, 102)).on(request, saidSlowly(line, 400));
+            obeying.ask(request);
+        }
+        obeying.wire->on("010F", saidSlowly("7E803410F20\r7E903410F20", 150));
+        obeying.ask("010F");
+        EXPECT_THAT(obeying.wire->takeCommands(), Not(Contains(" "))) << givenBack;
     }
-    obeying.wire->on("010F", saidSlowly("7E803410F20\r7E903410F20", 150));
-    obeying.ask("010F");
-    EXPECT_THAT(obeying.wire->takeCommands(), Not(Contains(" ")));
 
     ChannelRig deaf;
     bringUpDeaf(deaf);

@@ -111,6 +111,26 @@ TEST_F(SecondVisit, FallsBackWhereTheBusOfTheLastIsNotTheVehicles)
     EXPECT_THAT(rig.wire->takeCommands(), ElementsAre("ATI", "ATTP6", "ATTP0")) << "it is tried once";
 }
 
+// What is behind the bus of the last visit begins as if that had never been tried.
+TEST_F(SecondVisit, SearchesAsAFirstOneDoes)
+{
+    m_store->setProtocol(m_adapter, 6);
+    ChannelRig silent(m_store, m_options);
+    silent.wire->on("ATI", "ELM327 v1.5").on("0100", "CAN ERROR").on("0100", "NO DATA");
+    for (char const* command : {"ATI", "ATTP0", "0100"}) {
+        silent.ask(command);
+    }
+    EXPECT_THAT(silent.wire->takeCommands(), ElementsAre("ATI", "ATTP6", "0100", "ATTP0", "0100", "0100"))
+        << "the vehicle may have to be woken";
+    ChannelRig weak(m_store, m_options);
+    weak.wire->on("ATI", "ELM327 v1.5").on("0100", "CAN ERROR").on("0100", "ERR94").on("0100", "4100BE3EA813");
+    for (char const* command : {"ATI", "ATTP0", "ATDPN", "0100"}) {
+        weak.ask(command, 5000);
+    }
+    EXPECT_THAT(weak.wire->takeCommands(),
+                ElementsAre("ATI", "ATTP6", "ATDPN", "0100", "ATTP0", "0100", "ATFE", "ATTP0", "0100"));
+}
+
 // The adapter that does not let itself be told to search is asked no second time in vain.
 TEST_F(SecondVisit, WithoutASearchTakesTheSilenceOfTheFirstBus)
 {

@@ -237,6 +237,23 @@ TEST(LateReply, IsWaitedForAsLongAsItMayCome)
     EXPECT_EQ(std::string(bytes.begin(), bytes.end()), "AUTO\r") << "and nothing of the late one";
 }
 
+TEST(Silence, EndsWithAReplyThoughTheNameIsNotTold)
+{
+    ChannelRig rig;
+    rig.connect();
+    rig.wire->on("ATI", Spoken{}).on("ATRV", "12.6V");
+    rig.ask("ATI"); // as before
+    rig.wire->setSilent(true);
+    WireTime const start = rig.wire->now();
+    while (rig.wire->now() - start < WireTime(5500)) {
+        rig.ask("ATRV", 300);
+    }
+    EXPECT_TRUE(rig.channel.statistics().adapterSilent);
+    rig.wire->setSilent(false);
+    EXPECT_THAT(rig.ask("ATRV", 500), Optional(std::string("12.6V")));
+    EXPECT_FALSE(rig.channel.statistics().adapterSilent);
+}
+
 TEST(Silence, BeginsWithTheLastByteWhateverTheClock)
 {
     ChannelRig rig;

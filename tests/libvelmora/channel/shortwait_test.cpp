@@ -139,6 +139,13 @@ TEST(StubbornWait, OfAnAdapterThatIsNotInterruptedIsWaitedOut)
     breaking.ask("03");
     EXPECT_THAT(breaking.wire->takeCommands(), ElementsAre("03", " ", "03", "03")) << "asked again, and left in peace";
 
+    ChannelRig stopping; // by itself, behind the reply that is left to end by itself
+    stopping.wire->onInterrupt({{"7EA1009490\rSTOPPED\r\r>", WireTime(4)}});
+    bringUpStubborn(stopping);
+    stopping.wire->on("03", "7E8024300\r7E9024300\rSTOPPED");
+    EXPECT_THAT(stopping.ask("03"), Optional(std::string("7E80243007E9024300")));
+    EXPECT_EQ(stopping.met(Habit::TrailingError), 1U);
+
     ChannelRig late; // the word for it is not the end
     late.wire->onInterrupt({{"STOPPED\r7E8024300\r\r>", WireTime(4)}});
     bringUpStubborn(late);

@@ -179,6 +179,37 @@ TEST(ResetInBetween, TakesAllBackThatTheAdapterForgot)
     EXPECT_EQ(rig.met(Habit::EmptyReply), 0U);
 }
 
+TEST(ResetInBetween, OfACountedRequestIsAskedPlainlyOnce)
+{
+    ChannelRig rig;
+    rig.connect();
+    rig.wire->on("010C", saidPlainly(speedLine)).on("010C1", "ELM327 v1.5").on("010C1", saidCounted(speedLine));
+    AddressedModule const engine(rig.channel, 0x7E8);
+    rig.ask("010C");
+    rig.ask("010C");
+    rig.wire->takeCommands();
+    EXPECT_THAT(rig.ask("010C", 5000), Optional(speedLine));
+    EXPECT_THAT(rig.wire->takeCommands(), ElementsAre("ATSH7E0", "010C1", "ATE0", "ATL0", "ATS0", "ATST64", "ATTP6",
+                                                      "ATH1", "ATSH7E0", "010C", "ATSH7DF"));
+    EXPECT_EQ(rig.met(Habit::UnfinishedCount), 0U);
+    rig.ask("010C");
+    rig.wire->takeCommands();
+    rig.ask("010C");
+    EXPECT_THAT(rig.wire->takeCommands(), ElementsAre("ATSH7E0", "010C1", "ATSH7DF")) << "learnt anew from then on";
+}
+
+TEST(ResetInBetween, WaitsForTheBannerBehindLowVoltage)
+{
+    ChannelRig rig;
+    rig.connect();
+    rig.wire->on("010C", Bits{{"LV RESET\r\r>"}, {"\r\rELM327 v1.5\r\r>", WireTime(500)}}).on("010C", speedLine);
+    WireTime const start = rig.wire->now();
+    EXPECT_THAT(rig.ask("010C", 5000), Optional(speedLine));
+    EXPECT_GE(rig.wire->now() - start, WireTime(500));
+    rig.ask("ATRV");
+    EXPECT_EQ(rig.met(Habit::StaleReply), 0U);
+}
+
 TEST(ResetInBetween, UnlearnsWaitsAndCounts)
 {
     ChannelRig rig;
