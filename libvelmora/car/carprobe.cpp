@@ -30,7 +30,6 @@ ProbeState beginProbe(ProbeStore const& store, ProbeTask const& task, std::strin
     ProbeState state;
     state.task = task;
     state.vin = vin;
-    state.next = task.from;
     std::optional<ProbeState> const kept = fresh ? std::nullopt : store.load();
     if (!kept || kept->task != task) {
         return state;

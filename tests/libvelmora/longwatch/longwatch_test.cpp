@@ -42,6 +42,11 @@ public:
             return std::ranges::count_if(m_lines, [&](auto const& each) { return each.starts_with(text); }) >= times;
         });
     }
+    bool has(std::string const& text)
+    {
+        std::lock_guard const lock(m_mutex);
+        return std::ranges::find(m_lines, text) != m_lines.end();
+    }
 
 private:
     std::mutex m_mutex;
@@ -175,6 +180,7 @@ TEST_F(LongWatchTest, GivesAnotherVehicleANameOfItsOwn)
     EXPECT_TRUE(m_told.hold("running"));
     watch.end();
     runner.join();
+    EXPECT_FALSE(m_told.has("The settings were read again")) << "nobody asked for that";
     std::string const name = m_folder.read("vehicle-name");
     EXPECT_TRUE(name.starts_with("car-")) << name;
     std::string const written = m_folder.read("watch.ndjson");

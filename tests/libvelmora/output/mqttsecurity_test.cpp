@@ -90,6 +90,31 @@ TEST(MqttSecurity, SpeaksToABrokerThatTheAuthorityVouchesForAndToNoOther)
     EXPECT_THROW(senseless.open(), velmora::Error);
 }
 
+TEST(MqttSecurity, SendsAgainWhatTheBrokersRightsForbade)
+{
+    TemporaryFolder const folder;
+    unsigned short const port = testsupport::freePort();
+    std::ofstream(folder.file("rights")) << "topic read #\n";
+    ServerProcess const broker(
+        mosquittoCommand(folder, port, "allow_anonymous true\nacl_file " + folder.file("rights") + "\n"), port);
+    Told told;
+    velmora::OutputContext context = brokerContext(folder);
+    context.tell = told.tell();
+    MqttOutput output(velmora::parseOutputAddress(testsupport::brokerText(port) + "?discovery=off"), context);
+    output.open();
+    output.write(records(reading("RPM", 1.0)));
+    EXPECT_TRUE(testsupport::comesTrue([&] { return told.holds("the broker refuses what is sent: Not authorized"); }));
+    EXPECT_EQ(rowsLeft(folder), 1);
+    std::ofstream(folder.file("rights")) << "topic readwrite #\n";
+    broker.reload();
+    for (double value = 2.0; rowsLeft(folder) > 0 && value < 200.0; ++value) {
+        output.write(records(reading("RPM", value)));
+        ::usleep(100000);
+    }
+    EXPECT_EQ(rowsLeft(folder), 0) << "with the next readings";
+    output.close();
+}
+
 TEST(MqttSecurity, TakesThePasswordFromAFileOrTheEnvironmentAndTellsItToNobody)
 {
     TemporaryFolder const folder;

@@ -296,6 +296,19 @@ TEST(TripMeterBounds, AFuelRateCountsForFiveSecondsAndACounterThatFellFromNothin
     EXPECT_EQ(trip.maxRpm, 800.0);
 }
 
+TEST(TripMeterBounds, IsATripFromTwoHundredMetresAndHalfAMinuteOn)
+{
+    for (auto const& [kmh, seconds, isRun] : {std::tuple(24.1, 30, false), {23.9, 30, true}, {60.0, 29, true}}) {
+        Metered car;
+        car.begin();
+        car.meter.onVehicleSpeed(kmh, car.time.now);
+        for (int i = 0; i < seconds; ++i) {
+            car.speed(kmh);
+        }
+        EXPECT_EQ(car.meter.finish()->engineRun, isRun) << kmh;
+    }
+}
+
 TEST(TripMeterBounds, IsATripFromItsShortestOn)
 {
     velmora::TripSettings settings;

@@ -295,6 +295,15 @@ TEST_F(AskedCar, ANapIsTakenByAnAdapterThatKnowsIt)
     EXPECT_TRUE(car.napIsOver());
 }
 
+TEST_F(AskedCar, ANapIsNoneWithAnAdapterThatKnowsNoSleep)
+{
+    m_options.session.port += "&adapter=elm327-v1.2";
+    SessionCar car(m_options);
+    EXPECT_TRUE(car.napIsOver());
+    EXPECT_FALSE(car.startNap());
+    EXPECT_TRUE(car.napIsOver());
+}
+
 TEST_F(AskedCar, AnInterruptionEndsWaitingAndConnecting)
 {
     SessionCar car(m_options);
@@ -317,6 +326,13 @@ TEST_F(AskedCar, AnInterruptionEndsWaitingAndConnecting)
     other.interrupt();
     other.wait(1h);
     EXPECT_EQ(kindOf([&] { other.connect(); }), ErrorKind::Interrupted);
+    SessionCar parked(m_options);
+    std::thread waker([&parked] {
+        std::this_thread::sleep_for(20ms);
+        parked.interrupt();
+    });
+    parked.wait(1h);
+    waker.join();
 }
 
 } // namespace

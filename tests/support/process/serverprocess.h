@@ -56,6 +56,9 @@ public:
     ServerProcess(ServerProcess const&) = delete;
     ServerProcess& operator=(ServerProcess const&) = delete;
 
+    // Lets it read its settings again, as services do.
+    void reload() const { ::kill(m_pid, SIGHUP); }
+
 private:
     static bool listens(unsigned short port)
     {
