@@ -141,6 +141,7 @@ TEST_F(ReadersOfTopics, TellAVehicleWithTheMeaningsOfAMaker)
     EXPECT_EQ(engine.codes.maker.by, MakerChoice::By::Option);
     EXPECT_NE(m_progress.find("Reading 7E8 ECM ...\nReading 7E9 "), std::string::npos) << m_progress;
     ASSERT_TRUE(engine.freeze.frame);
+    EXPECT_EQ(engine.freeze.frame->code.maker, "Ford");
     EXPECT_EQ(engine.freeze.frame->code.code, "P0133");
     EXPECT_EQ(engine.freeze.frame->readings.size(), 16U);
     EXPECT_EQ(report.protocol.number, 6);
@@ -363,9 +364,11 @@ TEST_F(ReadersOfTopics, ForgetFreezeFramesThatWereErased)
     auto const cleared = clearCodes(*m_session);
     ASSERT_EQ(cleared.size(), 2U);
     EXPECT_EQ(cleared[0].name, "ECM");
+    m_asked.clear();
     FreezeReport const erased = readFreeze(*m_session, module(), 0);
     EXPECT_FALSE(erased.frame);
     EXPECT_EQ(erased.answer, TopicAnswer::Read) << "there is none, and the module says so";
+    EXPECT_TRUE(m_asked.at(0).starts_with("020000")) << "what the frame holds is asked for anew, not " << m_asked[0];
     m_car->control("ignition off");
     auto const silent = clearCodes(*m_session);
     ASSERT_EQ(silent.size(), 2U) << "modules that are known and say nothing are told of, too";
