@@ -6,6 +6,7 @@
 
 #include <obd/idataconnection.h>
 #include <velmora/console.h>
+#include <velmora/error.h>
 
 #include <chrono>
 
@@ -16,6 +17,7 @@ namespace {
 constexpr std::chrono::seconds adapterLimit{5};
 constexpr std::chrono::seconds vehicleLimit{30}; // a search for the bus takes that long
 constexpr int stepMs = 100;
+constexpr int mostUnasked = 1000; // messages; a flood of them has no end
 
 AdapterConsole::Answer answerOf(std::vector<unsigned char> const& message, std::string const& command)
 {
@@ -35,6 +37,19 @@ public:
         : session(SessionOptions(options)), end(session, options), connection(session.connectToPort())
     {
         connection->setDelimiter('>');
+    }
+
+    // What came unasked belongs to nothing.
+    void dropUnasked()
+    {
+        std::vector<unsigned char> unasked;
+        for (int i = 0; connection->receive(unasked, 0); ++i) {
+            session.check();
+            if (i == mostUnasked) {
+                throw Error(ErrorKind::LinkLost, "What " + session.port() + " says has no end",
+                            {"is it the right port, and the right --baud?", "pull the adapter and plug it in again"});
+            }
+        }
     }
 
     bool await(std::vector<unsigned char>& message, std::chrono::steady_clock::duration limit)
@@ -61,10 +76,8 @@ AdapterConsole::~AdapterConsole() = default;
 
 AdapterConsole::Answer AdapterConsole::ask(std::string const& command)
 {
+    m_parts->dropUnasked();
     std::vector<unsigned char> message;
-    while (m_parts->connection->receive(message, 0)) {
-        // what came unasked belongs to nothing
-    }
     std::string const sent = command + "\r";
     m_parts->connection->send({sent.begin(), sent.end()});
     bool const ofAdapter = toUpper(command).starts_with("AT") || toUpper(command).starts_with("ST");

@@ -2,6 +2,7 @@
 
 #include "common/text/text.h"
 
+#include <algorithm>
 #include <utility>
 
 namespace velmora {
@@ -9,10 +10,12 @@ namespace velmora {
 namespace {
 
 constexpr std::size_t longestTalk = 65536;
+constexpr std::chrono::milliseconds checkPeriod{100};
 
 } // namespace
 
-AdapterTalk::AdapterTalk(std::unique_ptr<IPort> port) : m_port(std::move(port))
+AdapterTalk::AdapterTalk(std::unique_ptr<IPort> port, std::function<void()> check)
+    : m_check(std::move(check)), m_port(std::move(port))
 {
     m_port->start([this](std::string_view bytes) { onBytes(bytes); },
                   [this] {
@@ -50,8 +53,19 @@ std::optional<std::string> AdapterTalk::ask(std::string const& command, std::chr
     }
     m_echoed = false;
     m_port->write(command + "\r");
+    auto const until = std::chrono::steady_clock::now() + limit;
     std::unique_lock lock(m_mutex);
-    m_changed.wait_for(lock, limit, [this] { return m_lost || m_received.find('>') != std::string::npos; });
+    auto const told = [this] { return m_lost || m_received.find('>') != std::string::npos; };
+    for (auto now = until - limit; now < until; now = std::chrono::steady_clock::now()) {
+        if (m_changed.wait_until(lock, std::min(until, now + checkPeriod), told)) {
+            break;
+        }
+        lock.unlock();
+        if (m_check) {
+            m_check();
+        }
+        lock.lock();
+    }
     std::size_t const prompt = m_received.find('>');
     if (prompt == std::string::npos) {
         return std::nullopt;

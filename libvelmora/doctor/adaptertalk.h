@@ -4,6 +4,7 @@
 
 #include <chrono>
 #include <condition_variable>
+#include <functional>
 #include <memory>
 #include <mutex>
 #include <optional>
@@ -15,7 +16,8 @@ namespace velmora {
 class AdapterTalk
 {
 public:
-    explicit AdapterTalk(std::unique_ptr<IPort> port);
+    // check is called about ten times a second while a reply is waited for, and throws to end that.
+    explicit AdapterTalk(std::unique_ptr<IPort> port, std::function<void()> check = {});
     ~AdapterTalk();
     AdapterTalk(AdapterTalk const&) = delete;
     AdapterTalk& operator=(AdapterTalk const&) = delete;
@@ -36,6 +38,7 @@ private:
     std::string m_received; // protected by m_mutex
     bool m_lost = false;    // protected by m_mutex
     bool m_echoed = false;
+    std::function<void()> m_check;
     std::unique_ptr<IPort> m_port;
 };
 

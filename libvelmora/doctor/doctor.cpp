@@ -22,16 +22,21 @@ namespace {
 
 using Verdict = DoctorCheck::Verdict;
 
-std::unique_ptr<AdapterTalk> openTalk(PortAddress const& address, DialogueRecorder& recorder)
+std::unique_ptr<AdapterTalk> openTalk(Session const& session, PortAddress const& address, DialogueRecorder& recorder)
 {
-    return std::make_unique<AdapterTalk>(std::make_unique<RecordedPort>(openPort(address), recorder));
+    return std::make_unique<AdapterTalk>(std::make_unique<RecordedPort>(openPort(address), recorder),
+                                         [&session] { session.check(); });
 }
 
-bool examineAdapter(PortAddress const& address, DialogueRecorder& recorder, DoctorReport& report)
+bool examineAdapter(Session const& session, PortAddress const& address, DialogueRecorder& recorder,
+                    DoctorReport& report)
 {
     try {
-        return checkAdapter(*openTalk(address, recorder), report);
+        return checkAdapter(*openTalk(session, address, recorder), report);
     } catch (Error const& error) {
+        if (error.kind() == ErrorKind::Interrupted) {
+            throw;
+        }
         report.checks.push_back(
             {"port", Verdict::Bad, error.what(), error.hints().empty() ? std::string() : error.hints().front()});
         return false;
@@ -91,7 +96,7 @@ DoctorReport examine(Session& session, DialogueRecorder& recorder)
     DoctorReport report;
     PortAddress const address = session.findPort();
     report.checks = checkPort(address);
-    if (!report.isHealthy() || !examineAdapter(address, recorder, report)) {
+    if (!report.isHealthy() || !examineAdapter(session, address, recorder, report)) {
         return report;
     }
     session.check();
@@ -103,7 +108,7 @@ DoctorReport examine(Session& session, DialogueRecorder& recorder)
         noteHabits(session, report);
         session.disconnect();
         if (error.kind() == ErrorKind::VehicleSilent) {
-            checkBuses(*openTalk(address, recorder), report);
+            checkBuses(*openTalk(session, address, recorder), report);
         }
         return report;
     }

@@ -5,12 +5,18 @@
 
 #include <gtest/gtest.h>
 
+#include <arpa/inet.h>
 #include <chrono>
 #include <cstdio>
 #include <filesystem>
 #include <fstream>
 #include <memory>
+#include <netinet/in.h>
+#include <string>
+#include <sys/socket.h>
 #include <sys/stat.h>
+#include <thread>
+#include <unistd.h>
 #include <utility>
 
 namespace {
@@ -101,6 +107,74 @@ TEST(Trouble, AnAdapterThatResetsItselfIsSetUpAgainAndNamed)
     EXPECT_EQ(outcome.exitCode, 8) << outcome.err;
     EXPECT_TRUE(contains(outcome.err, "resets itself again and again")) << outcome.err;
     EXPECT_FALSE(contains(outcome.err, "ignition")) << outcome.err;
+}
+
+// An adapter that says who it is, and then the same without end.
+class FloodingServer
+{
+public:
+    explicit FloodingServer(std::string const& piece) : m_listening(::socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0))
+    {
+        for (int i = 0; i < 4096; ++i) {
+            m_flood += piece;
+        }
+        sockaddr_in address = {};
+        address.sin_family = AF_INET;
+        address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
+        socklen_t size = sizeof address;
+        auto* const plain = reinterpret_cast<sockaddr*>(&address);
+        EXPECT_EQ(::bind(m_listening, plain, size), 0);
+        EXPECT_EQ(::listen(m_listening, 4), 0);
+        EXPECT_EQ(::getsockname(m_listening, plain, &size), 0);
+        m_port = "tcp://127.0.0.1:" + std::to_string(ntohs(address.sin_port));
+        m_thread = std::thread([this] { serve(); });
+    }
+    ~FloodingServer()
+    {
+        ::shutdown(m_listening, SHUT_RDWR);
+        m_thread.join();
+        ::close(m_listening);
+    }
+    std::string const& port() const { return m_port; }
+
+private:
+    // One client after the other, each until it leaves.
+    void serve()
+    {
+        for (int client = ::accept(m_listening, nullptr, nullptr); client >= 0;
+             client = ::accept(m_listening, nullptr, nullptr)) {
+            char heard[64];
+            std::string said = ::recv(client, heard, sizeof heard, 0) > 0 ? "ELM327 v1.5\r\r>" : "";
+            while (!said.empty() && ::send(client, said.data(), said.size(), MSG_NOSIGNAL) > 0) {
+                said = m_flood;
+            }
+            ::close(client);
+        }
+    }
+
+    int const m_listening;
+    std::string m_flood;
+    std::string m_port;
+    std::thread m_thread;
+};
+
+TEST(Trouble, AFloodEndsCommandsOrIsInterruptedAtOnce)
+{
+    using std::chrono::steady_clock;
+    FloodingServer const prompts(">");
+    auto start = steady_clock::now();
+    Outcome const console = runVelmora({"-q", "-p", prompts.port(), "console"}, "ATI\nATRV\n");
+    EXPECT_EQ(console.exitCode, 8) << console.err;
+    EXPECT_TRUE(contains(console.err, "has no end")) << console.err;
+    EXPECT_LT(steady_clock::now() - start, std::chrono::seconds(5));
+
+    FloodingServer const data("7E8064100BE3FB813");
+    ChildProcess doctor({"-q", "-p", data.port(), "doctor"});
+    std::this_thread::sleep_for(std::chrono::milliseconds(700));
+    doctor.interrupt();
+    start = steady_clock::now();
+    EXPECT_EQ(doctor.wait(), 130);
+    EXPECT_LT(steady_clock::now() - start, std::chrono::seconds(2));
 }
 
 TEST(Trouble, TheAdaptersWordIsTold)

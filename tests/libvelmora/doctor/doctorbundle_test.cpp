@@ -5,6 +5,7 @@
 #include "libvelmora/record/dialoguerecorder.h"
 #include "tests/support/temporaryfolder.h"
 
+#include <velmora/error.h>
 #include <velmora/version.h>
 
 #include <gmock/gmock.h>
@@ -122,6 +123,20 @@ TEST(LateAdapterTalk, EndsWithThePromptOrTheLink)
 {
     EXPECT_EQ(saidLate({"ELM327 ", "v1.5\r\r>"}), "ELM327 v1.5");
     EXPECT_EQ(saidLate({}), std::nullopt);
+}
+
+TEST(LateAdapterTalk, EndsWhenWhoAsksIsInterrupted)
+{
+    int checks = 0;
+    AdapterTalk talk(std::make_unique<LateAdapter>(std::vector<std::string>{"no prompt"}), [&checks] {
+        if (++checks == 2) {
+            throw Error(ErrorKind::Interrupted, "interrupted", {});
+        }
+    });
+    auto const start = std::chrono::steady_clock::now();
+    EXPECT_THROW(talk.ask("ATI", 8000ms), Error);
+    EXPECT_LT(std::chrono::steady_clock::now() - start, 2s);
+    EXPECT_EQ(checks, 2);
 }
 
 TEST(LateAdapterTalk, HearsNoMoreThanAnybodyHasToSay)
