@@ -44,6 +44,10 @@ TEST(BusLines, AreReadByTheRulesOfTheirBus)
         {BusKind::Can11, "7E8074100BE3FA81355", "S 7E8 7E8 4100BE3FA81355/074100BE3FA81355"},
         {BusKind::Can11, "7E80841000102030405060", "-"},
         {BusKind::Can11, "7E81014490201314434", "F 7E8 7E8 490201314434/1014490201314434"},
+        {BusKind::Can11, "7E81007490201314434", "F 7E8 7E8 490201314434/1007490201314434"},
+        {BusKind::Can11, "7E81006490201314434", "-"}, // it would fit in one frame
+        {BusKind::Can11, "7E81100490201314434", "F 7E8 7E8 490201314434/1100490201314434"},
+        {BusKind::Can11, "7E810144902013144", "-"},
         {BusKind::Can11, "7E821445239", "C 7E8 7E8 445239/21445239"},
         {BusKind::Can11, "7E8300000", "-"},
         {BusKind::Can29, "18DAF110064100BE3FA813", "S 18DAF110 18DAF110 4100BE3FA813/064100BE3FA813"},
@@ -67,6 +71,11 @@ TEST(BusLines, AreReadByTheRulesOfTheirBus)
     EXPECT_EQ(readAs(BusKind::Can11, "607F1024100", true), "S 607 607 4100/024100");
     EXPECT_EQ(readAs(BusKind::Can11, "607F1054100010203", true), "S 607 607 4100010203/054100010203");
     EXPECT_EQ(readAs(BusKind::Can11, "607F102", true), "-");
+    EXPECT_EQ(readAs(BusKind::Can11, "607F10241", true), "-");
+    EXPECT_EQ(readAs(BusKind::Can11, "607F10141", true), "S 607 607 41/0141");
+    EXPECT_EQ(readAs(BusKind::Can11, "607F110064100010203", true), "F 607 607 4100010203/10064100010203");
+    EXPECT_EQ(readAs(BusKind::Can11, "607F110054100010203", true), "-");
+    EXPECT_EQ(readAs(BusKind::Can11, "607F110064100010G03", true), "-");
     EXPECT_EQ(readAs(BusKind::Can11, "607F10741000102030405", true), "-") << "a byte of a frame is the address";
 }
 

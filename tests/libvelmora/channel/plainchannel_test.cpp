@@ -28,7 +28,9 @@ TEST_F(PlainChannelTest, HandsOnWhatCameByteForByte)
     std::string const vin = "0902\rSEARCHING...\r014 \r0: 49 02 01 56 45 4C \r1: 4D 52 41 53 31 4D 4D \r\r";
     m_wire->on("0902", support::ScriptedWire::Reply{{vin.substr(0, 9)}, {vin.substr(9) + ">?\r\r", WireTime(400)}});
     send("0902\r");
+    WireTime const sent = m_wire->now();
     EXPECT_EQ(receive(), vin);
+    EXPECT_EQ(m_wire->now() - sent, WireTime(405)) << "no longer than it took";
     EXPECT_EQ(receive(10), "nothing") << "the next reply has no prompt yet";
     m_wire->say(">", WireTime(5));
     EXPECT_EQ(receive(), "?\r\r");

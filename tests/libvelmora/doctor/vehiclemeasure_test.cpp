@@ -239,6 +239,24 @@ TEST_F(VehicleMeasure, ACountThatBringsLessOrNothingDoesNotWork)
     }
 }
 
+TEST_F(VehicleMeasure, ARateIsOfRequestsThatAreAnswered)
+{
+    auto const takesTwo = countingAdapter({"7E8"}, 2, 0);
+    auto const rateOf = [&](auto const& fails) {
+        auto const figures = measure("18000000", [&](std::string const& command, int times) { // 04 and 05
+            bool const rate = command.starts_with("010405");
+            bool const one = rate && fails(command == "010405" ? times : 3);
+            return one ? std::optional(VehicleSaid{"NO DATA"}) : takesTwo(command, times);
+        });
+        EXPECT_EQ(figures->pidsPerRequest, 2U);
+        return figures->valuesPerSecond;
+    };
+    EXPECT_GT(rateOf([](int) { return false; }), 0.0);
+    EXPECT_EQ(rateOf([](int times) { return times > 2; }), 0.0) << "the first of them alone";
+    EXPECT_EQ(rateOf([](int times) { return times == 2; }), 0.0)
+        << "all but the first, of which nobody knows what came";
+}
+
 TEST_F(VehicleMeasure, EndsWhereTheLinkBreaks)
 {
     for (std::string const place : {"0104#5", "0902#1", "0104#21", "0104#22", "01041#1", "010405#1", "rate"}) {
