@@ -286,7 +286,9 @@ TEST_F(ReadersOfTopics, LeaveTheModuleThatWasCurrent)
     EXPECT_TRUE(offers[1].meant) << "the current one";
     EXPECT_GT(offers[0].sensors.size(), offers[1].sensors.size());
     EXPECT_EQ(manager.getCurrentEcu()->id(), 0x7E9U);
+    manager.setCurrentEcu(0x7E8);
     offers = moduleOffers(m_session->obd(), {0x7E8});
+    EXPECT_EQ(manager.getCurrentEcu()->id(), 0x7E8U);
     EXPECT_TRUE(offers[0].meant);
     EXPECT_FALSE(offers[1].meant);
     auto const asksForTheVin = [this] {

@@ -56,6 +56,14 @@ request = "22F40C"
 formula = "A"
 
 [[signal]]
+id = "OF_ALL"
+name = "By the header that all listen to"
+header = "7DF"
+reply = "7E8"
+request = "22F40D"
+formula = "A"
+
+[[signal]]
 id = "SPEED"
 name = "A speed of one's own"
 header = "7E1"
@@ -167,7 +175,8 @@ TEST_F(SignalChoiceTest, ShowsWhatIsChosenAndReadsWhatThatIsWorkedOutOf)
     for (char const* const word : {"RPM", "nothing of the kind", "EVAP_PRESSURE"}) {
         EXPECT_FALSE(choose(word)) << word << " is a standard sensor's, if anyone's";
     }
-    for (char const* const word : {"SUM", "GEARBOX@5hz", "GEARBOX@5hz", "PART", "STATE", "7E9:ANYBODY", "7E8:SPEED"}) {
+    for (char const* const word :
+         {"SUM", "GEARBOX@5hz", "GEARBOX@5hz", "PART", "STATE", "7E9:ANYBODY", "OF_ALL", "7E8:SPEED"}) {
         EXPECT_TRUE(choose(word)) << word;
     }
     EXPECT_FALSE(m_choice->empty());
@@ -176,16 +185,17 @@ TEST_F(SignalChoiceTest, ShowsWhatIsChosenAndReadsWhatThatIsWorkedOutOf)
                       "763 STATE 222801  words -1\n"
                       "763 PART 22F187  words -1\n"
                       "7E9 ANYBODY 22F40C  number -1\n"
+                      "0 OF_ALL 22F40D  number -1\n"
                       "7E9 SPEED 221E1D  number -1\n")
         << "one's own speed goes before the standard one; only of all modules one can be chosen";
     EXPECT_EQ(sources(false), "5: 7E9/GEARBOX\n"
                               "1: 763/STATE 763/PART\n"
-                              "-1: 7E9/ANYBODY\n"
+                              "-1: 7E9/ANYBODY 0/OF_ALL\n"
                               "1: 7E9/SPEED 0/SUM\n")
         << "modules of one's own are asked once a second unless a rate is named";
     EXPECT_EQ(sources(true), "5: 7E9/GEARBOX\n"
                              "-1: 763/STATE 763/PART\n"
-                             "-1: 7E9/ANYBODY\n"
+                             "-1: 7E9/ANYBODY 0/OF_ALL\n"
                              "-1: 7E9/SPEED 0/SUM\n")
         << "as fast as it goes where nobody waits for them";
     EXPECT_NE(m_choice->board(), nullptr);
