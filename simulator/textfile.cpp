@@ -80,10 +80,10 @@ std::FILE* openForWriting(std::string const& path)
     return ::fdopen(handle, "w");
 }
 
-bool canWrite(std::string const& path)
+std::FILE* keepForWriting(std::string const& path)
 {
     int const handle = openWithoutWaiting(path, O_APPEND);
-    return handle >= 0 && ::close(handle) == 0;
+    return handle < 0 ? nullptr : ::fdopen(handle, "a");
 }
 
 } // namespace obdsim

@@ -23,7 +23,9 @@ std::string whyNoText(std::string const& path, std::uintmax_t largest = largestD
 /// set, if it can't be opened.
 std::FILE* openForWriting(std::string const& path);
 
-/// Whether openForWriting will do, without changing what stands there; a file that is missing is made. Sets errno.
-bool canWrite(std::string const& path);
+/// Opens a file for what is written later by openForWriting, so that what forbids it is known at once: nothing that
+/// stands there changes, a file that is missing is made, and who reads a pipe sees no end of it meanwhile. Null, with
+/// errno set, if it can't be opened.
+std::FILE* keepForWriting(std::string const& path);
 
 } // namespace obdsim

@@ -10,6 +10,7 @@
 #include <charconv>
 #include <cstdio>
 #include <cstring>
+#include <memory>
 
 namespace obdsim {
 
@@ -60,8 +61,11 @@ public:
     explicit Impl(SessionOptions const& options) : m_written(options.written)
     {
         m_server = listenAt(options.listen, peers(options));
-        if (!m_written.empty() && !canWrite(m_written)) {
-            refuseScenario(); // now rather than at the end
+        if (!m_written.empty() && !m_cars.empty()) {
+            m_kept.reset(keepForWriting(m_written));
+            if (m_kept == nullptr) {
+                refuseScenario(); // now rather than at the end
+            }
         }
         auto const handler = [this](std::string const& line) { return follow(line); };
         asio::io_context& context = static_cast<ServerLoop&>(*m_server).context();
@@ -80,7 +84,7 @@ public:
     /// What was typed, as a scenario. Throws SimulatorError if it cannot be written.
     void writeScenario() const
     {
-        if (m_written.empty() || m_cars.empty()) {
+        if (m_kept == nullptr) {
             return;
         }
         std::FILE* const file = openForWriting(m_written);
@@ -139,8 +143,14 @@ private:
         return answer;
     }
 
+    struct FileCloser
+    {
+        void operator()(std::FILE* file) const { std::fclose(file); }
+    };
+
     std::string m_written;
-    std::shared_ptr<TraceFile> m_trace; ///< null without one
+    std::unique_ptr<std::FILE, FileCloser> m_kept; ///< for the scenario; null without one
+    std::shared_ptr<TraceFile> m_trace;            ///< null without one
     std::vector<std::shared_ptr<SimulatedCar>> m_cars;
     std::unique_ptr<IServer> m_server;
     std::unique_ptr<ControlSocket> m_socket;

@@ -158,8 +158,23 @@ def serves_the_rest(folder):
     check(told == "error: line 1, word 1: a recorded dialogue cannot be changed\n", f"control of a recording: {told}")
     check(replay.end(signal.SIGINT) == (0, "") and not (folder / "no").exists(), "Ctrl-C")
 
-    lost = Served(1, "--listen", "tcp://127.0.0.1:0", "--trace", "/dev/full", "--write-scenario", str(folder / "none" / "x"))
+    code, told, why = run("--listen", "tcp://127.0.0.1:0", "--write-scenario", str(folder / "none" / "x"))
+    check(code == 2 and not told and "the scenario cannot be written" in why, f"no such folder: {code}, {told}, {why}")
+    pipe = folder / "pipe"
+    os.mkfifo(pipe)
+    reader = os.open(pipe, os.O_RDONLY | os.O_NONBLOCK)
+    piped = Served(1, "--listen", "tcp://127.0.0.1:0", "--write-scenario", str(pipe))
+    try:
+        check(os.read(reader, 64), "who reads the pipe is told its end before anything was written")
+    except BlockingIOError:
+        pass
+    check(piped.type("voltage 12.2") == "ok" and piped.end() == (0, ""), "a scenario that goes to a pipe")
+    check(os.read(reader, 64).endswith(b" voltage 12.2\n"), "it went to the pipe")
+    os.close(reader)
+
+    lost = Served(1, "--listen", "tcp://127.0.0.1:0", "--trace", "/dev/full", "--write-scenario", "/dev/full")
     Line(lost.lines[0]).ask("ATI\r", b">")
+    lost.type("voltage 12.2")
     code, told = lost.end()
     check(code == 2 and "the scenario cannot be written" in told and "the trace cannot be written" in told, f"{code}: {told}")
     full = Served(1, "--listen", "pty", "--trace", "/dev/full")

@@ -58,10 +58,12 @@ TEST_F(TextFile, carsRecordingsAndScenariosAreTextFiles)
 
 TEST_F(TextFile, isOpenedForWritingWithoutWaitingAndLookedAtWithoutAChange)
 {
-    EXPECT_FALSE(obdsim::canWrite(m_pipe));
+    EXPECT_EQ(obdsim::keepForWriting(m_pipe), nullptr);
     EXPECT_EQ(obdsim::openForWriting(m_pipe), nullptr);
-    EXPECT_FALSE(obdsim::canWrite("/no/such/folder/file"));
-    EXPECT_TRUE(obdsim::canWrite(m_file));
+    EXPECT_EQ(obdsim::keepForWriting("/no/such/folder/file"), nullptr);
+    std::FILE* const kept = obdsim::keepForWriting(m_file);
+    ASSERT_NE(kept, nullptr);
+    std::fclose(kept);
     EXPECT_EQ(obdsim::readTextFile(m_file), "12345");
     std::FILE* const file = obdsim::openForWriting(m_file);
     ASSERT_NE(file, nullptr);
