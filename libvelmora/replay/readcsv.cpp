@@ -66,7 +66,8 @@ SensorEntry sensorOfTitle(std::string const& title)
 class CsvReader
 {
 public:
-    explicit CsvReader(std::vector<std::string> const& header, bool isLong) : m_long(isLong)
+    CsvReader(std::vector<std::string> const& header, bool isLong, std::size_t mostValues)
+        : m_long(isLong), m_maker(mostValues)
     {
         for (std::size_t i = 1; !isLong && i < header.size(); ++i) {
             m_columns.push_back(m_maker.sensor(sensorOfTitle(header[i])));
@@ -101,7 +102,7 @@ private:
 
 } // namespace
 
-Recording readCsv(std::istream& in)
+Recording readCsv(std::istream& in, std::size_t mostValues)
 {
     std::string line;
     std::getline(in, line);
@@ -109,7 +110,7 @@ Recording readCsv(std::istream& in)
     if (!header || header->size() < 2 || header->front() != "time") {
         failCsv(1, "it is no header that begins with time");
     }
-    CsvReader reader(*header, line == longCsvHeader);
+    CsvReader reader(*header, line == longCsvHeader, mostValues);
     for (std::size_t number = 2; std::getline(in, line); ++number) {
         bool const torn = in.eof();
         std::optional<std::vector<std::string>> const fields = fieldsOf(line);

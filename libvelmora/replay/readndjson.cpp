@@ -31,9 +31,9 @@ bool isReading(Json const& line)
 
 } // namespace
 
-Recording readNdjson(std::istream& in)
+Recording readNdjson(std::istream& in, std::size_t mostValues)
 {
-    RecordingMaker maker;
+    RecordingMaker maker(mostValues);
     std::string text;
     for (std::size_t number = 1; std::getline(in, text); ++number) {
         Json const line = Json::parse(text, nullptr, false);

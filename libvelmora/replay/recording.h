@@ -15,10 +15,10 @@ class RecordingMaker
 {
 public:
     static constexpr std::size_t mostSensors = 2000;
+    static constexpr std::size_t mostValues = 2000000; // of all sensors together
     static constexpr std::size_t noRoom = std::string::npos;
 
-    // mostValues: what it takes, of all sensors together.
-    explicit RecordingMaker(std::size_t mostValues = 2000000) : m_mostValues(mostValues) {}
+    explicit RecordingMaker(std::size_t most = mostValues) : m_mostValues(most) {}
 
     // The sensor's number, new or known; noRoom if there are too many already.
     std::size_t sensor(SensorEntry const& about);

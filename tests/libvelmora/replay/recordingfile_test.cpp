@@ -190,4 +190,24 @@ TEST(RecordingPlayer, GoesOnAtItsSpeedAndJumps)
     EXPECT_EQ(player.speed(), RecordingPlayer::fastest);
 }
 
+TEST(Recordings, AreReadNoFurtherThanTheyFit)
+{
+    std::string const row = "2024-03-07T09:05:00.000Z,1,2\n";
+    std::istringstream csv("time,A,B\n" + row + row + "no time\n");
+    std::istringstream whole("time,A,B\n" + row + "no time\n");
+    Recording const columns = readCsv(csv, 3);
+    EXPECT_TRUE(columns.cut);
+    EXPECT_EQ(columns.sensors.at(0).values.size() + columns.sensors.at(1).values.size(), 3U);
+    EXPECT_THROW(readCsv(whole, 3), Error) << "where there is room for more";
+
+    std::string const line = R"({"time":"2024-03-07T09:05:00.000Z","name":"A","value":1})"
+                             "\n";
+    std::istringstream ndjson(line + line + "no JSON\n\n");
+    std::istringstream fitting(line + "no JSON\n\n");
+    Recording const lines = readNdjson(ndjson, 1);
+    EXPECT_TRUE(lines.cut);
+    EXPECT_EQ(lines.sensors.at(0).values.size(), 1U);
+    EXPECT_THROW(readNdjson(fitting, 1), Error);
+}
+
 } // namespace
