@@ -142,6 +142,7 @@ TEST(CsvTable, CutsAnyText)
     EXPECT_EQ(records[1].line, 4U);
     EXPECT_EQ(readCsv("a,\"open").at(0).cells.at(1), "open");
     EXPECT_EQ(readCsv(R"("a ""b""",c)").at(0).cells, (std::vector<std::string>{"a \"b\"", "c"}));
+    EXPECT_EQ(readCsv(R"("a",""")").at(0).cells, (std::vector<std::string>{"a", "\""})) << "a quote, and no end";
     EXPECT_EQ(readCsv(std::string_view(R"("a""b")", 3)).at(0).cells.at(0), "a")
         << "what stands behind the end counts not";
     EXPECT_TRUE(isUtf8("°"));
