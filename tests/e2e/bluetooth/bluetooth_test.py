@@ -79,7 +79,6 @@ class Bluetooth(Rig):
             self.control.GiveSockets(ble, sockets)
             self.control.LoseInReply(ble, 30)
             self.expect(['-p', f'ble://{BLE}', 'scan'], 8, f'The link to the adapter on ble://{BLE} broke', 'in reach?')
-        self.assertEqual(self.control.LateCalls(), 0, 'the signal of the loss was enough')
         self.control.LoseInReply(classic, 30)
         self.expect(['-p', f'bt://{CLASSIC}', 'scan'], 8, f'bt://{CLASSIC}', 'in reach?')
 

@@ -90,6 +90,12 @@ def RefuseWrite(self, path, number):
 
 
 @dbus.service.method(MOCK, in_signature='oi', out_signature='')
+def DelayConnection(self, path, millis):
+    """A classic link is handed over so long behind the answer to who asked for it."""
+    mockobject.objects[path].delay = int(millis)
+
+
+@dbus.service.method(MOCK, in_signature='oi', out_signature='')
 def WantPasskey(self, path, passkey):
     mockobject.objects[path].wanted_passkey = int(passkey)
 

@@ -257,7 +257,7 @@ def _prepare(device, port):
     device.bridge = device.write_socket = device.notify_socket = device.classic_socket = None
     device.gives_sockets = True
     device.socket_error = 'org.bluez.Error.NotPermitted'
-    device.refuses_writes = 0
+    device.refuses_writes = device.delay = 0
     device.times = []
     device.wanted_passkey = -1
     device.loses_after = device.loses_in_reply = device.dropped = 0
@@ -330,10 +330,18 @@ def ConnectProfileSerial(device, uuid):
         else:
             device.bridge.sendall(data)
     _forward(device, ours, sent)
-    profile = _caller(*state['profiles'][str(uuid)], 'org.bluez.Profile1')
-    profile.NewConnection(dbus.ObjectPath(device.path), dbus.types.UnixFd(theirs.fileno()), dbus.Dictionary({}, signature='sv'),
-                          reply_handler=lambda: None, error_handler=lambda error: None)
-    theirs.close()
+
+    def hand_over():
+        profile = _caller(*state['profiles'][str(uuid)], 'org.bluez.Profile1')
+        profile.NewConnection(dbus.ObjectPath(device.path), dbus.types.UnixFd(theirs.fileno()),
+                              dbus.Dictionary({}, signature='sv'), reply_handler=lambda: None,
+                              error_handler=lambda error: None)
+        theirs.close()
+        return False
+    if device.delay:
+        GLib.timeout_add(device.delay, hand_over)
+    else:
+        hand_over()
 
 
 @dbus.service.method(MOCK, in_signature='sssi', out_signature='s')
