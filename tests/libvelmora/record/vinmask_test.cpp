@@ -116,6 +116,8 @@ TEST(VinMask, blanksFramesOfTheNumbersOwnMessageAlone)
     EXPECT_EQ(masked(6, "0904", first + "7E8211449024142434\r7E82243313233343536\r>"),
               first + "7E8211449024142434\r7E82243303030303030\r>")
         << "characters that read like the beginning of another";
+    EXPECT_EQ(masked(6, "0904", first + "7E8224331323334353\r>"), first + "7E8224330303030303\r>")
+        << "the last digit is half a byte";
     EXPECT_EQ(masked(6, "0904", "7E8104902\r7E810144902\r>"), "7E8104902\r7E810144902\r>") << "too short for any";
 }
 
