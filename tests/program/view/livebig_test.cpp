@@ -57,6 +57,20 @@ TEST(LiveBig, ShowsSixSensorsAtMostAndLeavesTheTableRoom)
     }
 }
 
+TEST(LiveBig, ABarHasFiveSignsOrNone)
+{
+    std::vector<LiveRow> rows = bigRows(1);
+    FrameStyle style;
+    style.columns = 26;
+    style.ascii = true;
+    rows[0].minimum = "-12345678";
+    rows[0].maximum = "123456789";
+    rows[0].value = "123456789";
+    EXPECT_THAT(drawBig(rows, style), HasSubstr("\n-12345678  123456789")) << "four would be left";
+    rows[0].minimum = "-1234567";
+    EXPECT_THAT(drawBig(rows, style), HasSubstr("\n-1234567 ===== 123456789"));
+}
+
 TEST(LiveBig, TheBarStandsBetweenLowestAndHighest)
 {
     FrameStyle style;

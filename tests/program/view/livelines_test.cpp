@@ -1,3 +1,4 @@
+#include "program/view/json.h"
 #include "program/view/live/livecsv.h"
 #include "program/view/live/livelines.h"
 #include "program/view/timetext.h"
@@ -37,6 +38,12 @@ TEST(LiveLines, TellNameValueAndUnit)
     EXPECT_EQ(toLine(numberRow("Engine RPM", "", "rpm")), "Engine RPM: -\n");
 }
 
+TEST(LiveLines, DocumentsAreReadByPeopleToo)
+{
+    EXPECT_EQ(printed(Json{{"unit", "\u00B0C"}, {"bad", "\xFF"}, {"none", textOrNull("")}}),
+              "{\n  \"unit\": \"\u00B0C\",\n  \"bad\": \"\uFFFD\",\n  \"none\": null\n}\n");
+}
+
 TEST(LiveLines, JsonHasNumbersAndNull)
 {
     std::string const text = toJsonLine(numberRow("Engine RPM", "1726", "rpm"), "2024-03-07T09:05:02.123Z");
@@ -44,6 +51,7 @@ TEST(LiveLines, JsonHasNumbersAndNull)
         text,
         "{\"time\":\"2024-03-07T09:05:02.123Z\",\"module\":\"0\",\"pid\":\"0C\",\"uid\":120,"
         "\"name\":\"Engine RPM\",\"value\":1726,\"unit\":\"rpm\",\"minimum\":1726,\"mean\":1726,\"maximum\":1726}\n");
+    EXPECT_THAT(toJsonLine(numberRow("x", "1", "\u00B0C"), "t"), HasSubstr("\"unit\":\"\u00B0C\"")) << "as it is";
     for (char const* missing : {"", "nan", "inf", "-"}) {
         auto const json = nlohmann::json::parse(toJsonLine(numberRow("x", missing, ""), "t"));
         EXPECT_TRUE(json["value"].is_null()) << missing;
@@ -143,6 +151,52 @@ TEST_F(LiveCsvFile, HasARowASecondOnASlowBus)
     now += seconds(5);
     csv.update(table, now);
     EXPECT_EQ(content().size(), 2U) << "nothing new";
+}
+
+TEST_F(LiveCsvFile, ASecondCountsFromTheLastRow)
+{
+    table.select({liveParameter(0x0C, "A"), liveParameter(0x0D, "B"), liveParameter(0x0E, "C")});
+    LiveCsv csv(file.string());
+    csv.begin(table, now, start);
+    now += seconds(1);
+    reading(0x0C, "1");
+    csv.update(table, now);
+    EXPECT_THAT(content(), ElementsAre("A (%),B (%),C (%)", "1,-,-"));
+    now += milliseconds(999);
+    reading(0x0D, "2");
+    csv.update(table, now);
+    EXPECT_EQ(content().size(), 2U);
+    now += milliseconds(1);
+    csv.update(table, now);
+    EXPECT_THAT(content(), ElementsAre("A (%),B (%),C (%)", "1,-,-", "1,2,-"));
+}
+
+TEST_F(LiveCsvFile, WaitsForASlowReader)
+{
+    std::string const pipe = (own.path() / "pipe").string();
+    ASSERT_EQ(::mkfifo(pipe.c_str(), 0600), 0);
+    int const reader = ::open(pipe.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC);
+    struct stat wanted
+    {};
+    ASSERT_EQ(::stat(pipe.c_str(), &wanted), 0);
+    {
+        LiveCsv const csv(pipe);
+        int writers = 0;
+        for (int each = 3; each < 256; ++each) {
+            struct stat info
+            {};
+            int const flags = ::fcntl(each, F_GETFL);
+            if (::fstat(each, &info) == 0 && info.st_ino == wanted.st_ino && info.st_dev == wanted.st_dev &&
+                (flags & O_ACCMODE) == O_WRONLY) {
+                ++writers;
+                EXPECT_EQ(flags & O_NONBLOCK, 0) << "or rows would be lost";
+            }
+        }
+        EXPECT_EQ(writers, 1);
+    }
+    char byte = 0;
+    EXPECT_EQ(::read(reader, &byte, 1), 0) << "closed";
+    ::close(reader);
 }
 
 TEST_F(LiveCsvFile, FinishWritesWhatIsLeft)

@@ -105,6 +105,15 @@ TEST(LiveScreen, AValueThatIsGoneIsDimAndTellsItsAge)
     style.columns = 40;
     EXPECT_THAT(drawTable({row}, 0, "t", "s", style), HasSubstr("Engine RPM               - rpm"))
         << "no room for the age";
+    LiveRow const never = numberRow("Speed", "", "km/h");
+    style.columns = 80;
+    EXPECT_THAT(drawTable({never}, 0, "t", "s", style), HasSubstr("\nSpeed                    - km/h"))
+        << "not dim: nothing is old";
+    style.columns = 13;
+    style.bold = false;
+    EXPECT_THAT(drawTable({numberRow("Engine RPM", "1726", "rpm")}, 0, "t", "s", style),
+                HasSubstr("\nEngine RPM  \u2026\n"))
+        << "a name where there is room for nothing else";
     EXPECT_EQ(ageText(seconds(119)), "119 s ago");
     EXPECT_EQ(ageText(seconds(120)), "2 min ago");
 }

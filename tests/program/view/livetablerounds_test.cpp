@@ -53,6 +53,22 @@ TEST(LiveTableRows, AreNamedByTheirModuleWhereThereAreSeveral)
     EXPECT_EQ(table.rows()[0].name, "RPM");
 }
 
+TEST(LiveTableRows, ARoundBeginsAnewWithEachChoice)
+{
+    LiveTable table;
+    LiveTable::Parameters const two = {{sensorOf(0x7E8, 12, "RPM")}, {sensorOf(0x7E8, 13, "Speed")}};
+    LiveTime const now = LiveTime() + seconds(100);
+    table.select(two);
+    table.update(12, number(12, "1"), now, 0x7E8);
+    EXPECT_TRUE(table.beginsRound(12, 0x7E8));
+    table.select(two);
+    EXPECT_FALSE(table.beginsRound(12, 0x7E8));
+    table.update(12, number(12, "1"), now, 0x7E8);
+    EXPECT_EQ(table.rounds(), 0U) << "it has had no turn in this choice";
+    table.update(13, number(13, "1"), now, 0x7E8);
+    EXPECT_EQ(table.rounds(), 1U);
+}
+
 TEST(LiveTableRows, OfTwoModulesKeepApart)
 {
     LiveTable table;

@@ -74,6 +74,13 @@ TEST_F(TripsText, ConsumptionIsOfTheTripsThatToldTheirFuel)
         HasSubstr("2026-03-31T21:30:00.000Z,2026-03-31T22:00:00.000Z,van,trip,10.000,-,1800,0,0,1.000,-,-,-,-\n"));
 }
 
+TEST_F(TripsText, AnEngineThatRanHasNoConsumption)
+{
+    EXPECT_THAT(velmora::cli::tripsText({tripAt(1774992600000, 20.0, 2.0, true)}),
+                HasSubstr("     2.00        -  engine run\n"));
+    EXPECT_THAT(velmora::cli::tripsText({tripAt(1774992600000, 20.0, 2.0)}), HasSubstr("     2.00     10.0\n"));
+}
+
 TEST_F(TripsText, EachColumnHasItsUnitAndDigits)
 {
     Trip trip = tripAt(1774992600000, 123.456, 10.055);
