@@ -66,4 +66,13 @@ TEST_F(QuestionRun, AreNotAnsweredByWhatWasTypedBefore)
     EXPECT_EQ(runVelmora(arguments({"history"})).out.find("VELMRAS1MM0000001"), std::string::npos) << "forgotten";
 }
 
+TEST_F(QuestionRun, AWishToKeepThatFailsIsToldBehindTheScan)
+{
+    ::setenv("VELMORA_HISTORY", "/proc/nonexistent/history.db", 1);
+    Outcome const wished = runVelmora(arguments({"scan", "--history"}));
+    EXPECT_EQ(wished.exitCode, 1);
+    EXPECT_EQ(wished.err.rfind("velmora: The scan is not kept: ", 0), 0U) << wished.err;
+    EXPECT_EQ(wished.out.rfind("Adapter\n", 0), 0U) << "but told";
+}
+
 } // namespace

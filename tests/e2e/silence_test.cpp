@@ -53,7 +53,7 @@ TEST_F(Silence, IsToldAndEndsWhatCannotBeDone)
 {
     std::string const still = "No values come from the vehicle; still asking. Is the ignition on?\n";
     auto waking = begin(half({"live", "RPM", "--duration", "16"}, "scenario=" + m_folder.file("waking")));
-    auto quiet = begin(half({"-q", "live", "RPM", "--duration", "8"}, "scenario=" + m_folder.file("falling")));
+    auto quiet = begin(half({"-q", "live", "RPM", "--duration", "20"}, "scenario=" + m_folder.file("falling")));
     auto falling = begin(half({"live", "RPM", "-n", "100000"}, "scenario=" + m_folder.file("falling")));
     auto never = begin(half({"live", "SPEED", "-n", "1"}));
     auto console = begin(half({"-q", "console"}, "instant&adapter=silent"), "ATI\n");

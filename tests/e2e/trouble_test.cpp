@@ -191,7 +191,7 @@ TEST(Trouble, TheAdaptersWordIsTold)
 
 TEST(Trouble, ReadersThatGoEarlyEndAllCommandsAlike)
 {
-    for (char const* command : {"scan", "sensors", "live", "--json live", "log RPM"}) {
+    for (char const* command : {"scan", "sensors", "live", "--json live", "live --csv -", "log RPM"}) {
         std::string const shell = std::string("bash -c '" VELMORA_PROGRAM " -q -p sim:petrol-can11?instant ") +
                                   command + " | head -n 1 > /dev/null; exit ${PIPESTATUS[0]}'";
         int const status = std::system(shell.c_str());

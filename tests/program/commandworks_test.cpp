@@ -160,6 +160,46 @@ TEST_F(CommandRun, ARecordingThatHasOtherColumnsStays)
     EXPECT_THAT(m_folder.read("a.csv"), StartsWith("time,Vehicle Speed Sensor (km/h)\n"));
 }
 
+TEST_F(CommandRun, ADialogueThatBreaksOffIsRecordedUpToThere)
+{
+    Ended const lost = run("-p sim:@F/bare.toml?instant&fault=loss@300 record @F/lost.dialogue");
+    EXPECT_EQ(static_cast<int>(lost.code), 8) << lost.err;
+    EXPECT_THAT(lost.err, HasSubstr(" requests and commands to " + m_folder.file("lost.dialogue") + "\nvelmora: "));
+    EXPECT_THAT(m_folder.read("lost.dialogue"), HasSubstr("\n-> ATI\n"));
+}
+
+TEST_F(CommandRun, RoundsOfWhatIsSilentCountAsWell)
+{
+    std::ofstream(m_folder.file("half.toml"))
+        << "name = \"Half\"\nprotocol = 6\n[[module]]\nid = \"7E8\"\nlive = \"0C\"\n"
+           "raw = { \"0100\" = \"41 00 00 18 00 00\" }\n";
+    std::string const out = run("-q -p sim:@F/half.toml?instant live -n 3 RPM SPEED").out;
+    EXPECT_EQ(std::count(out.begin(), out.end(), '\n'), 3) << out;
+}
+
+TEST_F(CommandRun, TheConsoleHasNoPromptInAPipe)
+{
+    std::ofstream(m_folder.file("lines")) << "ATI\nquit\nATRV\n";
+    int const lines = ::open(m_folder.file("lines").c_str(), O_RDONLY | O_CLOEXEC);
+    testing::internal::CaptureStdout();
+    testing::internal::CaptureStderr();
+    {
+        Replaced const input(STDIN_FILENO, lines);
+        EXPECT_EQ(runMainAsItIs(meant("-p sim:@F/bare.toml?instant console")), ExitCode::Done);
+    }
+    ::close(lines);
+    EXPECT_EQ(testing::internal::GetCapturedStdout(), "ELM327 v1.5\n");
+    EXPECT_THAT(testing::internal::GetCapturedStderr(), testing::Not(HasSubstr("> ")));
+}
+
+TEST_F(CommandRun, ASetThatIsRefusedIsNotKnownInFull)
+{
+    std::ofstream(m_folder.file("half.toml")) << "name = \"Half\"\nprotocol = 6\n[[module]]\nid = \"7E8\"\nlive = \"0C "
+                                                 "2F\"\nrefusals = { \"0120\" = \"12\" }\n";
+    EXPECT_THAT(run("-q -p sim:@F/half.toml?instant sensors").out,
+                HasSubstr("\n  01 current data          0C F4 F5 F6 (not known in full: refused)\n"));
+}
+
 TEST_F(CommandRun, OneReadingIsMoreThanNone)
 {
     Ended const one = run("@B live --duration 0.2 SPEED --rate 0.1");
@@ -248,6 +288,8 @@ TEST_F(CommandRun, TheProgramDescribesItself)
     EXPECT_GE(lines, 16);
     EXPECT_EQ(different.size(), static_cast<std::size_t>(lines)) << "each code once";
     EXPECT_EQ(run("__complete dtc P0").out, "") << "too many";
+    EXPECT_THAT(run("__complete dtc P04").out, StartsWith("P04"));
+    EXPECT_NE(run("__complete trips x").out, run("__complete vin x").out) << "files, and nothing";
     std::filesystem::create_directory(m_folder.path() / "pages");
     EXPECT_EQ(run("__manual @F/pages").code, ExitCode::Done);
     EXPECT_THAT(m_folder.read("pages/velmora-scan.1"), HasSubstr(".TH"));

@@ -206,6 +206,17 @@ TEST_F(TerminalRun, ALayoutThatTheVehicleNoLongerOffersIsNone)
     EXPECT_THAT(second.text, HasSubstr("Vehicle Speed Sensor"));
 }
 
+TEST_F(TerminalRun, AllThatWasReadStaysHoweverMuchItIs)
+{
+    std::ofstream(m_folder.file("much.toml"))
+        << "name = \"Much\"\nprotocol = 6\n[[module]]\nid = \"7E8\"\n"
+           "live = \"04 05 06 07 0B 0C 0D 0E 0F 10 11 1F 21 2F 30 31 33 42 43 44 45 46 47 49 4A 4C 5C\"\n";
+    Shown const ended = at("-q -p sim:@F/much.toml?instant live all -n 1", {});
+    std::string const left = ended.text.substr(ended.text.rfind("\033[?1049l"));
+    EXPECT_GE(std::count(left.begin(), left.end(), '\n'), 2 + 27);
+    EXPECT_THAT(left, HasSubstr("\nEngine Oil Temperature"));
+}
+
 TEST_F(TerminalRun, AnInterruptEndsLiveValuesAtOnce)
 {
     auto const start = std::chrono::steady_clock::now();
