@@ -104,6 +104,11 @@ TEST(CanMessages, MayHaveAShortLastFrameAlone)
 {
     EXPECT_EQ(puttingTogether({"7E8100F010203040506", "7E82101020304050607", "7E8220809"}),
               "+++ 7E8:010203040506010203040506070809/15s, 1 last frames without filling");
+    EXPECT_EQ(puttingTogether({"7E8100F010203040506", "7E82101020304050607", "7E822080900000000"}),
+              "+++ 7E8:010203040506010203040506070809/15s, 1 last frames without filling")
+        << "a byte of it";
+    EXPECT_EQ(puttingTogether({"7E8100F010203040506", "7E82101020304050607", "7E82208090000000000"}),
+              "+++ 7E8:010203040506010203040506070809/15s");
     EXPECT_EQ(puttingTogether({"7E8100F010203040506", "7E821010203040506", "7E8220809"}),
               "+-- 7E8:010203040506/15s~ lacks 2, 2 broken lines dropped")
         << "the first of them must be full";

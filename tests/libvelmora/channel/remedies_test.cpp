@@ -237,6 +237,25 @@ TEST(LateReply, IsWaitedForAsLongAsItMayCome)
     EXPECT_EQ(std::string(bytes.begin(), bytes.end()), "AUTO\r") << "and nothing of the late one";
 }
 
+// A command has its time, and the way to the adapter, though the silence is already long.
+TEST(Silence, OfAFarAdapterEndsWithTheLastCommandsTime)
+{
+    ChannelRig rig(nullptr, {.port = {}, .latency = WireTime(200)});
+    rig.connect();
+    rig.wire->setSilent(true);
+    WireTime const start = rig.wire->now();
+    rig.ask("ATRV", 3000);
+    rig.wire->read(start + WireTime(6100));
+    sendTo(rig, "ATDP");
+    EXPECT_EQ(rig.wire->now() - start, WireTime(7900)) << "asked twice who it is before";
+    std::vector<unsigned char> bytes;
+    while (rig.channel.isValid() && rig.wire->now() - start < WireTime(20000)) {
+        rig.channel.receive(bytes, 100);
+    }
+    EXPECT_EQ(rig.wire->now() - start, WireTime(7900 + 800 + 1800));
+    EXPECT_TRUE(rig.channel.adapterGone());
+}
+
 TEST(Silence, EndsWithAReplyThoughTheNameIsNotTold)
 {
     ChannelRig rig;
