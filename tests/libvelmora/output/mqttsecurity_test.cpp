@@ -7,6 +7,7 @@
 #include <gtest/gtest.h>
 
 #include <cstdlib>
+#include <regex>
 
 namespace {
 
@@ -95,8 +96,10 @@ TEST(MqttSecurity, SendsAgainWhatTheBrokersRightsForbade)
     TemporaryFolder const folder;
     unsigned short const port = testsupport::freePort();
     std::ofstream(folder.file("rights")) << "topic read #\n";
-    ServerProcess const broker(
-        mosquittoCommand(folder, port, "allow_anonymous true\nacl_file " + folder.file("rights") + "\n"), port);
+    ServerProcess const broker(mosquittoCommand(folder, port,
+                                                "allow_anonymous true\nacl_file " + folder.file("rights") +
+                                                    "\nlog_dest file " + folder.file("log") + "\n"),
+                               port);
     Told told;
     velmora::OutputContext context = brokerContext(folder);
     context.tell = told.tell();
@@ -112,6 +115,9 @@ TEST(MqttSecurity, SendsAgainWhatTheBrokersRightsForbade)
         ::usleep(100000);
     }
     EXPECT_EQ(rowsLeft(folder), 0) << "with the next readings";
+    EXPECT_TRUE(testsupport::comesTrue([&] {
+        return std::regex_search(folder.read("log"), std::regex(" as velmora-van-[0-9a-f]{8} \\("));
+    })) << "who it is, for the broker's log";
     output.close();
 }
 
