@@ -19,10 +19,10 @@ public:
     DebugLogger(DebugLogger const&) = delete;
     DebugLogger& operator=(DebugLogger const&) = delete;
 
-    // Opens path for writing, truncating an old log (but not what standard error is redirected to), and makes this
-    // logger the process's LogSink. A file that cannot be opened leaves logging off, silently. An empty path changes
-    // neither the file nor whether logging is on. A file opened earlier is left open: another thread may be writing to
-    // it.
+    // Opens path for writing, truncating an old log (but not what standard output or standard error are redirected to),
+    // and makes this logger the process's LogSink. A file that cannot be opened leaves logging off, silently. An empty
+    // path changes neither the file nor whether logging is on. A file opened earlier is left open: another thread may
+    // be writing to it.
     void open(std::string const& path);
 
     // Whether a line could not be written since open.

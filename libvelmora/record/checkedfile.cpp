@@ -7,7 +7,6 @@
 #include <cerrno>
 #include <cstring>
 #include <fcntl.h>
-#include <sys/stat.h>
 #include <unistd.h>
 
 namespace velmora {
@@ -25,21 +24,6 @@ void requireWritable(std::filesystem::path const& file, std::string const& what)
     }
     throw Error(ErrorKind::Failed, "Could not write the " + what + " " + file.string() + ": " + std::strerror(errno),
                 {"does its folder exist, and may you write there?"});
-}
-
-std::FILE* openForWriting(std::filesystem::path const& file)
-{
-    struct stat named = {};
-    if (::stat(file.c_str(), &named) == 0 && S_ISREG(named.st_mode)) {
-        for (int const stream : {STDOUT_FILENO, STDERR_FILENO}) {
-            struct stat open = {};
-            if (::fstat(stream, &open) == 0 && open.st_dev == named.st_dev && open.st_ino == named.st_ino) {
-                int const copy = ::dup(stream);
-                return copy < 0 ? nullptr : ::fdopen(copy, "w");
-            }
-        }
-    }
-    return std::fopen(file.c_str(), "w");
 }
 
 void requirePlainFile(std::filesystem::path const& file)

@@ -2,6 +2,8 @@
 
 #include "libvelmora/record/checkedfile.h"
 
+#include <common/outputfile.h>
+
 #include <fmt/chrono.h>
 
 #include <chrono>
@@ -33,10 +35,10 @@ std::string escaped(std::vector<unsigned char> const& data)
 
 } // namespace
 
-TrafficTrace::TrafficTrace(std::filesystem::path const& file) : m_out(nullptr, &std::fclose)
+TrafficTrace::TrafficTrace(std::filesystem::path const& file) : m_out(nullptr, &tervex::closeWritten)
 {
     requireWritable(file, "trace file");
-    m_out.reset(openForWriting(file));
+    m_out.reset(tervex::openForWriting(file));
     m_failed = m_out == nullptr;
 }
 

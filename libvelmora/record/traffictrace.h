@@ -29,7 +29,7 @@ private:
 
     std::atomic<bool> m_failed{false};
     std::mutex m_mutex;
-    std::unique_ptr<std::FILE, int (*)(std::FILE*)> m_out; // protected by m_mutex
+    std::unique_ptr<std::FILE, void (*)(std::FILE*)> m_out; // protected by m_mutex
 };
 
 } // namespace velmora

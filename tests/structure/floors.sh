@@ -100,7 +100,7 @@ includes common libobd libvelmora program simulator $([[ -d bindings ]] && echo 
         checkUser()
         if (file ~ /^libvelmora\/include\// && target ~ /^(libvelmora|common|simulator)\//) {
             wrong("is private to the companion")
-        } else if (isCoresOwn() && target !~ /^common\/clock[.]h$/) {
+        } else if (isCoresOwn() && target !~ /^common\/(clock|outputfile)[.]h$/) {
             wrong("is private to the library")
         }
     }
