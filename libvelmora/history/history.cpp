@@ -42,12 +42,15 @@ KeptScan scanAt(Statement const& row)
 
 constexpr char const* scanColumns = "SELECT number, vehicle, time, program, hash, document FROM scan ";
 
-void makeFolder(std::filesystem::path const& folder)
+void makeFolderOf(std::filesystem::path const& file)
 {
     std::error_code error;
-    std::filesystem::create_directories(folder, error);
+    std::filesystem::path const whole = std::filesystem::absolute(file, error);
+    if (!error) {
+        std::filesystem::create_directories(whole.parent_path(), error);
+    }
     if (error) {
-        throw Error(ErrorKind::Failed, "Could not make the folder " + folder.string() + ": " + error.message(),
+        throw Error(ErrorKind::Failed, "Could not make the folder of \"" + file.string() + "\": " + error.message(),
                     {"VELMORA_HISTORY=FILE names another place"});
     }
 }
@@ -82,7 +85,7 @@ History::Parts::Parts(std::filesystem::path path, Access access) : file(std::mov
         return;
     }
     if (access == Access::Keep) {
-        makeFolder(std::filesystem::absolute(file).parent_path());
+        makeFolderOf(file);
     }
     database = std::make_unique<Database>(file.string(), access == Access::Keep ? Database::Access::Write
                                                                                 : Database::Access::ReadOnly);

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <algorithm>
 #include <cstddef>
 #include <set>
 
@@ -13,8 +14,8 @@ class MultiLimit
 public:
     static constexpr std::size_t most = 6; // ISO 15765-4
 
-    // 1 for a bus that allows no more, or a user who wants no more.
-    explicit MultiLimit(std::size_t highest) : m_highest(highest) {}
+    // 1 for a bus that allows no more, or a user who wants no more. A request holds one at least.
+    explicit MultiLimit(std::size_t highest) : m_highest(std::max<std::size_t>(highest, 1)) {}
 
     // How many may be asked for at once now.
     std::size_t now() const;

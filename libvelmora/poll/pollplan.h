@@ -35,7 +35,7 @@ using MultiLimits = std::map<unsigned int, MultiLimit>; // by module
 std::vector<PollTask> planPolling(std::vector<PollWish> const& wishes, MultiLimits const& limits,
                                   PidLength const& length);
 
-// Divides PIDs into even groups of at most so many.
+// Divides PIDs into even groups of at most so many, one or more.
 std::vector<std::vector<unsigned char>> evenGroups(std::vector<unsigned char> const& pids, std::size_t most);
 
 } // namespace velmora

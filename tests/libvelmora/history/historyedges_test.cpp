@@ -11,6 +11,7 @@
 
 #include <cstdlib>
 #include <filesystem>
+#include <optional>
 #include <sstream>
 
 namespace {
@@ -45,6 +46,24 @@ TEST(HistoryEdges, LinesAreOfSixteenMegabytesAtMost)
     EXPECT_EQ(importOf(history, line), "Line 1: This is no line of an exported history: it is no JSON" + nothing);
     EXPECT_EQ(importOf(history, "\n" + line + "x"), "Line 2: too long" + nothing);
     EXPECT_EQ(importOf(history, "\n\n"), "");
+}
+
+// A name alone is a file of the current folder; without one there is nowhere to keep anything.
+TEST(HistoryEdges, KeepsBesideTheProgramUnderANameAlone)
+{
+    TemporaryFolder const folder;
+    std::filesystem::path const before = std::filesystem::current_path();
+    std::filesystem::path const gone = folder.path() / "gone";
+    std::filesystem::create_directory(gone);
+    std::filesystem::current_path(folder.path());
+    std::optional<std::int64_t> const number = History("bare.db", History::Access::Keep).add(edgeScan("golf"));
+    std::filesystem::current_path(gone);
+    std::filesystem::remove(gone);
+    EXPECT_THROW(History("bare.db", History::Access::Keep), Error) << "the folder is gone";
+    std::filesystem::current_path(before);
+    EXPECT_EQ(number, 1);
+    EXPECT_TRUE(std::filesystem::exists(folder.path() / "bare.db"));
+    EXPECT_THROW(History("", History::Access::Keep), Error);
 }
 
 TEST(HistoryEdges, TakesItsOwnDatabaseAlone)

@@ -69,6 +69,7 @@ TEST(MultiLimit, GrowsAsFarAsTheModuleProvesIt)
     EXPECT_EQ(limit.now(), 3U);
     limit.proved(3);
     EXPECT_EQ(limit.now(), 6U);
+    EXPECT_EQ(MultiLimit(0).now(), 1U);
     EXPECT_EQ(MultiLimit(1).now(), 1U);
     MultiLimit wide(9);
     wide.proved(3);
