@@ -57,7 +57,7 @@ std::chrono::milliseconds PollCycle::wait()
     PollTime const now = m_wire.now();
     std::optional<DeadlineScheduler::Turn> const turn = m_scheduler.next(now);
     PollTime const start = turn ? std::max(turn->start, m_notBefore) : now + silencePause;
-    return std::max(std::chrono::ceil<std::chrono::milliseconds>(start - now), std::chrono::milliseconds::zero());
+    return std::max(std::chrono::ceil<std::chrono::milliseconds>(start - now), std::chrono::milliseconds(0));
 }
 
 void PollCycle::step()

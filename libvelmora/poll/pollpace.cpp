@@ -19,7 +19,7 @@ PollPace choosePace(PollWill const& will, obd::ObdProtocol protocol, int modelYe
         return pace;
     }
     if (will.fast && (obd::isCan(protocol) || protocol == obd::ObdProtocolJ1850)) {
-        pace.floor = std::chrono::milliseconds::zero();
+        pace.floor = std::chrono::milliseconds(0);
     }
     if (will.fast && obd::isCan(protocol)) {
         pace.pidsPerRequest = will.pidsPerRequest;

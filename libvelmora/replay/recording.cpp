@@ -33,7 +33,7 @@ std::optional<double> finiteIn(std::string_view text)
     return whole && std::isfinite(number) ? std::optional(number) : std::nullopt;
 }
 
-int numberOf(std::string_view digits)
+int valueOfDigits(std::string_view digits)
 {
     int number = 0;
     for (char const digit : digits) {
@@ -54,7 +54,7 @@ std::optional<std::int64_t> timeIn(std::string_view text)
         return std::nullopt;
     }
     using namespace std::chrono;
-    auto const part = [text](std::size_t at, std::size_t count) { return numberOf(text.substr(at, count)); };
+    auto const part = [text](std::size_t at, std::size_t count) { return valueOfDigits(text.substr(at, count)); };
     year_month_day const date{year(part(0, 4)), month(static_cast<unsigned int>(part(5, 2))),
                               std::chrono::day(static_cast<unsigned int>(part(8, 2)))};
     if (!date.ok() || part(11, 2) > 23 || part(14, 2) > 59 || part(17, 2) > 60) {

@@ -128,7 +128,9 @@ std::vector<FoundModule> ModuleScan::find()
         guard.countTrouble(answer.kind == ModuleAnswer::Kind::BusTrouble, "while it asked who is there");
         if (isThere(answer)) {
             used.insert(answer.module);
-            found.push_back({identifierText(ids[i]), identifierText(answer.module), {}, {}, {}, {}});
+            FoundModule& module = found.emplace_back();
+            module.request = identifierText(ids[i]);
+            module.reply = identifierText(answer.module);
         }
     }
     return found;
