@@ -155,6 +155,11 @@ TEST(SignalLimits, FilesOfTheFolderAreReadByTheirNames)
     }
     EXPECT_EQ(found, wanted);
     EXPECT_EQ(set.search("nothing of the kind").size(), 0U);
+    EXPECT_EQ(set.search("x").size(), 16U);
+    SignalSet const builtIns;
+    EXPECT_EQ(builtIns.find("81").front(), 0U) << "the very first definition is found by its PID, too";
+    EXPECT_EQ(builtIns.find("81").size(), 10U);
+    EXPECT_TRUE(builtIns.search("time").empty()) << "which is for signals of one's own";
 }
 
 TEST(SignalLimits, BuiltInStatesAreTexts)
