@@ -5,6 +5,7 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <atomic>
 #include <condition_variable>
 #include <future>
 #include <mutex>
@@ -142,6 +143,8 @@ public:
         }
         return ScriptedWire::read(until);
     }
+    bool isUp() const override { return m_isUp; }
+    void giveUp() override { m_isUp = false; }
     std::future<void> nextWait()
     {
         std::lock_guard const lock(m_mutex);
@@ -155,6 +158,7 @@ public:
     }
 
 private:
+    std::atomic<bool> m_isUp{true}; // asked by all threads
     std::mutex m_mutex;
     std::condition_variable m_free;
     std::promise<void> m_waits; // protected by m_mutex, as what follows

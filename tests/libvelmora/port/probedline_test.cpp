@@ -17,6 +17,7 @@
 #include <sys/file.h>
 #include <sys/ioctl.h>
 #include <sys/stat.h>
+#include <thread>
 #include <unistd.h>
 
 namespace {
@@ -92,6 +93,24 @@ TEST(ProbedLine, IsHeldOpenRawAndLeftAsItWas)
     SerialProbe const stopped = velmora::probeSerialPort(device.path(), {38400, 19200}, {}, [] { return true; });
     EXPECT_EQ(stopped.outcome, Found::Silent);
     EXPECT_EQ(device.received(), "ATI\r") << "not asked a second time";
+}
+
+// The other end of a line goes in the midst of an answer.
+TEST(ProbedLine, ThatIsPulledOutIsNoAdapter)
+{
+    int const master = ::posix_openpt(O_RDWR | O_NOCTTY | O_CLOEXEC);
+    ASSERT_TRUE(::grantpt(master) == 0 && ::unlockpt(master) == 0);
+    std::string const path = ::ptsname(master);
+    std::thread device([master] {
+        char question[16];
+        EXPECT_EQ(::read(master, question, sizeof(question)), 4);
+        EXPECT_EQ(::write(master, "ELM", 3), 3);
+        ::close(master);
+    });
+    SerialProbe const probe = velmora::probeSerialPort(path, {38400});
+    device.join();
+    EXPECT_TRUE(probe.outcome == Found::OtherThing || probe.outcome == Found::Silent);
+    EXPECT_EQ(probe.baud, 0U);
 }
 
 TEST(ProbedLine, HasNoRateWhereNobodyWasAsked)
