@@ -77,6 +77,49 @@ TEST_F(CommandRun, AProbeWritesWhatItFinds)
                 HasSubstr("  - " + m_folder.file("bad.toml") + ":2: signal 1, id: "));
 }
 
+TEST_F(CommandRun, SignalsAreListedAndTakenFromOtherFiles)
+{
+    std::ofstream(m_folder.file("app.csv")) << "Name,ShortName,ModeAndPID,Equation,Min Value,Max Value,Units,Header\n"
+                                               "G\u00e4nge,GEAR,220102,A,0,8,,7E1\n"
+                                               "Lock,LOCK,2E0102,A,0,8,,7E1\n";
+    Ended const taken = run("signals import @F/app.csv");
+    EXPECT_EQ(taken.code, ExitCode::Done);
+    EXPECT_THAT(taken.out, HasSubstr("[[signal]]\n"));
+    EXPECT_THAT(taken.err, HasSubstr(m_folder.file("app.csv") + ":3: "));
+    EXPECT_THAT(taken.err, testing::EndsWith("1 signal taken, 1 left out\n"));
+    EXPECT_THAT(run("--json signals import @F/app.csv").out, StartsWith("{"));
+    std::ofstream(m_folder.file("app.toml")) << taken.out;
+    EXPECT_THAT(run("signals list @F/app.toml").out, HasSubstr("app.toml\n  G_NGE  G\u00e4nge  7E1  220102\n"));
+    EXPECT_THAT(run("--json signals list @F/app.toml").out, HasSubstr("\"G\u00e4nge\"")) << "as it is written";
+    std::ofstream(m_folder.file("nothing.csv"))
+        << "Name,ShortName,ModeAndPID,Equation,Min Value,Max Value,Units,Header\n"
+           "Lock,LOCK,2E0102,A,0,8,,7E1\n";
+    EXPECT_EQ(run("signals import @F/nothing.csv").code, ExitCode::Failed);
+}
+
+TEST_F(CommandRun, KeysThatNothingReadsAreNamed)
+{
+    std::ofstream(m_folder.file("settings.toml")) << "colour = \"red\"\n";
+    EXPECT_THAT(run("settings").err, HasSubstr("Nothing reads colour in " + m_folder.file("settings.toml") + "\n"));
+    EXPECT_EQ(run("-q settings").err, "");
+    std::ofstream(m_folder.file("settings.toml")) << "";
+    EXPECT_EQ(run("settings").err, "");
+}
+
+TEST_F(CommandRun, ABundleIsWrittenOnceAndWithoutTheVin)
+{
+    std::string const line = "-q -p sim:petrol-can11?instant doctor --bundle @F/bundle.txt";
+    EXPECT_EQ(run(line).code, ExitCode::Done);
+    EXPECT_THAT(m_folder.read("bundle.txt"), testing::Not(HasSubstr("VELMRAS1MM0000001")));
+    EXPECT_EQ(run(line).code, ExitCode::WrongUse) << "it stands already";
+    EXPECT_EQ(run(line + " --force --keep-vin").code, ExitCode::Done);
+}
+
+TEST_F(CommandRun, WhatFollowsAnOutputIsASensor)
+{
+    EXPECT_EQ(run("watch --check-config -o csv:@F/w.csv SPEED").code, ExitCode::Done);
+}
+
 TEST_F(CommandRun, SensorsThatStaySilentAreNamed)
 {
     std::ofstream(m_folder.file("half.toml"))

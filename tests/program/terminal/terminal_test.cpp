@@ -94,6 +94,7 @@ TEST(Spans, PartsOfALineHaveTheirLook)
               (std::vector<Span>{{"a", {}}, {"b", bold}, {"c", red}, {"d", {}}}));
     EXPECT_EQ(spansOf("\033[1;31mc\033[m"), (std::vector<Span>{{"c", red}}));
     EXPECT_EQ(spansOf("x\033[2Jy\033["), (std::vector<Span>{{"x", {}}, {"y", {}}})) << "nothing else gets through";
+    EXPECT_EQ(spansOf("\033[1ma;2b"), (std::vector<Span>{{"a;2b", bold}})) << "numbers in the text are text";
     EXPECT_TRUE(spansOf("").empty());
 }
 

@@ -89,6 +89,8 @@ TEST(LiveScreen, MarksWhatIsBeyondItsLimit)
     EXPECT_THAT(drawTable({row}, 0, "t", "s", style), HasSubstr("\n\033[1;31mEngine RPM"));
     row.value = "6000";
     EXPECT_THAT(drawTable({row}, 0, "t", "s", style), HasSubstr("\nEngine RPM            6000 rpm"));
+    row.last = "5990";
+    EXPECT_THAT(drawTable({row}, 0, "t", "s", style), HasSubstr("\nEngine RPM            6000 rpm")) << "not dim";
 }
 
 TEST(LiveScreen, AValueThatIsGoneIsDimAndTellsItsAge)
