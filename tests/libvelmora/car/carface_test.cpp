@@ -170,9 +170,9 @@ TEST(CarFace, IsRecordedWithoutItsVinAndWithoutItsEnd)
         vin = car.info()[0].report.vin;
         car.askSensors();
     }
-    EXPECT_GT(recorder->save(std::string("te\0st\ncar", 9)), 20U);
+    EXPECT_GT(recorder->save(std::string("te\0st\ncar \xC3\xBC", 12)), 20U);
     std::string const text = wholeFile(file);
-    EXPECT_NE(text.find("te st car"), std::string::npos) << "on one line";
+    EXPECT_NE(text.find("te st car \xC3\xBC"), std::string::npos) << "on one line";
     EXPECT_NE(text.find("ELM327"), std::string::npos) << "the adapter names itself";
     EXPECT_EQ(text.find("ATLP"), std::string::npos) << "closing is no part of it";
 
@@ -196,15 +196,22 @@ TEST(CarFace, IsRecordedAcrossAReconnection)
 {
     testsupport::TemporaryFolder const folder;
     auto const recorder = std::make_shared<velmora::Recorder>(folder.file("car.dialogue"));
+    std::string vin;
     {
         CarOptions options = instantCar("petrol-can11");
         options.recorder = recorder;
         Car car(options);
+        vin = car.info()[0].report.vin;
         car.reconnect();
         EXPECT_EQ(car.read({"FUEL_LEVEL"}).size(), 1U);
     }
-    EXPECT_GT(recorder->save("car"), 20U);
-    EXPECT_NE(wholeFile(folder.file("car.dialogue")).find("012F"), std::string::npos) << "what came behind it, too";
+    EXPECT_GT(recorder->save("", true), 20U);
+    std::string text = wholeFile(folder.file("car.dialogue"));
+    EXPECT_NE(text.find("012F"), std::string::npos) << "what came behind it, too";
+    EXPECT_NE(text.find("unknown"), std::string::npos) << "a vehicle without a name";
+    std::erase(text, ' ');
+    EXPECT_TRUE(vin.ends_with("000001")) << vin;
+    EXPECT_NE(text.find("303030303031"), std::string::npos) << "kept, as was wished";
 }
 
 TEST(CarFace, TellsItsTrafficUpToTheClosing)
