@@ -140,7 +140,6 @@ void HttpConnection::reply(HttpResponse const& response, bool keepAlive, bool he
         send(keepAlive, headOnly);
         return;
     }
-    m_stream.expires_never();
     m_delay.expires_after(response.delay);
     m_delay.async_wait([self = shared_from_this(), keepAlive, headOnly](HttpErrorCode const& error) {
         if (!error) {

@@ -51,6 +51,7 @@ TEST(SprintEdges, SpeedsAreMetBetweenTwoReadings)
     expectTimed(speedGoal(80, 120), {{0, 0}, {1, 90}, {2, 70}, {3, 90}, {4, 120}}, 1.5, 120);
     EXPECT_FALSE(timed(speedGoal(0, 100), {{0, 0}, {1, 99}}));
     EXPECT_FALSE(timed(speedGoal(0, 100), {{0, 100}, {1, 110}})) << "nobody saw it reach them";
+    expectTimed(speedGoal(80, 100), {{0, 100}, {2, 70}, {4, 110}}, 1, 100);
     EXPECT_FALSE(timed(speedGoal(80, 120), {{0, 90}, {1, 130}}));
     EXPECT_FALSE(timed(speedGoal(0, 100), {{0, 0}}));
 }
@@ -135,6 +136,19 @@ TEST(PerformanceMeterEdges, TheStartLiesWhereTheFirstSpeedsPointTo)
         << "two seconds before the first speed, as it slows down";
     EXPECT_NEAR(start(10.0, {11.0, 5}, {11.0, 8}), 10.0, sprintError) << "two speeds at one time point nowhere";
     EXPECT_NEAR(start(10.0, {11.0, 5}, {11.5, 3}), 10.0, sprintError);
+}
+
+TEST(PerformanceMeterEdges, StandingIsToldFromHavingStopped)
+{
+    PerformanceMeter meter;
+    for (auto const& [kmh, state] : std::vector<std::pair<double, RunState>>{{0.0, RunState::Standing},
+                                                                             {0.0, RunState::Standing},
+                                                                             {5.0, RunState::Running},
+                                                                             {0.0, RunState::Stopped},
+                                                                             {0.0, RunState::Stopped}}) {
+        meter.addSpeed(1.0, kmh);
+        EXPECT_EQ(meter.state(), state);
+    }
 }
 
 TEST(PerformanceMeterEdges, ReadingsComeSoManySecondsApart)

@@ -71,6 +71,7 @@ TEST(RecordingTitles, NameAModuleOnlyWhereOneIsMeant)
     EXPECT_EQ(aboutOfTitle("18DAF110 O2_B1S1 (V)"), "18DAF110  O2_B1S1 \"18DAF110 O2_B1S1\" V");
     EXPECT_EQ(aboutOfTitle("DEF Level (%)"), "0  DEF Level \"DEF Level\" %") << "a fluid, no module DEF";
     EXPECT_EQ(aboutOfTitle("XYZ RPM (rpm)"), "0  XYZ RPM \"XYZ RPM\" rpm");
+    EXPECT_EQ(aboutOfTitle("7E8 rPM (rpm)"), "0  7E8 rPM \"7E8 rPM\" rpm") << "no short name";
     EXPECT_EQ(aboutOfTitle("20000000 RPM"), "0  20000000 RPM \"20000000 RPM\" ") << "beyond any identifier";
     EXPECT_EQ(aboutOfTitle("RPM"), "0  RPM \"RPM\" ");
     EXPECT_EQ(aboutOfTitle("A)"), "0  A) \"A)\" ");
