@@ -31,6 +31,19 @@ void printNames(char const* title, std::vector<std::string> const& names)
     }
 }
 
+// While it lives a signal ends the session. Who is about to end it is waited for, so that the session may go behind it.
+class SessionEnd
+{
+public:
+    explicit SessionEnd(obdsim::Session& session)
+    {
+        Interrupt::instance().setHandler([&session] { session.stop(); });
+    }
+    ~SessionEnd() { Interrupt::instance().setHandler(nullptr); }
+    SessionEnd(SessionEnd const&) = delete;
+    SessionEnd& operator=(SessionEnd const&) = delete;
+};
+
 // False if the trace could not be written.
 bool serve(obdsim::SessionOptions const& options)
 {
@@ -42,9 +55,8 @@ bool serve(obdsim::SessionOptions const& options)
         fmt::print("control {}\n", session.controlAddress());
     }
     std::fflush(stdout);
-    Interrupt::instance().setHandler([&session] { session.stop(); });
+    SessionEnd const end(session);
     session.run();
-    Interrupt::instance().setHandler(nullptr);
     return !session.traceFailed();
 }
 

@@ -4,6 +4,7 @@
 #include "program/view/timetext.h"
 #include "tests/program/view/liveparameter.h"
 #include "tests/program/view/liverows.h"
+#include "tests/support/closedinput.h"
 #include "tests/support/temporaryfolder.h"
 
 #include <velmora/error.h>
@@ -122,6 +123,14 @@ TEST_F(LiveCsvFile, TimesCountOnFromItsStart)
     std::getline(in, header);
     std::getline(in, row);
     EXPECT_EQ(row, "2024-03-07T09:06:03.250Z,1,-");
+}
+
+TEST_F(LiveCsvFile, StandsWhereStandardInputIsClosed)
+{
+    testsupport::ClosedInput const closed;
+    LiveCsv(file.string()).begin(table, now, start);
+    EXPECT_THAT(content(), ElementsAre("A (%),B (%)"));
+    EXPECT_TRUE(testsupport::ClosedInput::isFree());
 }
 
 TEST_F(LiveCsvFile, HasARowForEachRoundAtOnce)
