@@ -211,20 +211,24 @@ TEST_F(LentProxyTest, OnlyWholeAnswersAreNoted)
         wire.execute({1, 0x0C}, responses, 100);
         EXPECT_EQ(wire.notes().last(0x7E8, 0x0C).has_value(), noted) << reply;
     }
+    auto const ask = [](PollWire& wire, std::vector<unsigned char> const& request) {
+        obd::ResponseMap responses;
+        wire.execute(request, responses, 100);
+        EXPECT_FALSE(responses.empty());
+    };
     m_proxy->answer("02 0C", "42 0C 00 01");
-    obd::ResponseMap responses;
-    m_wire.execute({2, 0x0C}, responses, 100);
+    ask(m_wire, {2, 0x0C});
     EXPECT_FALSE(m_wire.notes().last(0x7E8, 0x0C)) << "of a freeze frame";
     m_proxy->answer("02 0C", "41 0C 00 01");
-    m_wire.execute({2, 0x0C}, responses, 100);
+    ask(m_wire, {2, 0x0C});
     EXPECT_FALSE(m_wire.notes().last(0x7E8, 0x0C)) << "of a request before";
     m_proxy->answer("01 0C 0D", "41 0C 00 01 0D");
-    m_wire.execute({1, 0x0C, 0x0D}, responses, 100);
+    ask(m_wire, {1, 0x0C, 0x0D});
     EXPECT_FALSE(m_wire.notes().last(0x7E8, 0x0C)) << "who takes the reply apart notes what came whole";
     PollWire gapped(m_proxy, milliseconds(100));
     unsigned int const start = m_clock.millis();
     for (int i = 0; i < 3; ++i) {
-        gapped.execute({1, 0x0C}, responses, 100);
+        ask(gapped, {1, 0x0C});
     }
     EXPECT_EQ(m_clock.millis() - start, 200U) << "from the start of one to that of the next";
     EXPECT_EQ(gapped.now() - m_wire.now(), milliseconds(0));
