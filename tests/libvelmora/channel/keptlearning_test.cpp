@@ -146,8 +146,7 @@ TEST_F(SecondVisit, WithoutASearchTakesTheSilenceOfTheFirstBus)
 // A wait that is recalled is cut once the vehicle has said something whole.
 TEST_F(SecondVisit, CutsTheFirstWaitBehindAWholeLine)
 {
-    using Said = support::ScriptedWire::Reply;
-    std::pair<Said, bool> const rows[] = {
+    std::pair<support::ScriptedWire::Reply, bool> const rows[] = {
         {{{"4100BE3EA813\r", WireTime(20)}, {"\r>", WireTime(400)}}, true},
         {{{"SEARCHING...\r", WireTime(20)}, {"4100BE3EA813\r\r>", WireTime(400)}}, false},
         {{{"4100BE3EA813", WireTime(20)}, {"\r\r>", WireTime(400)}}, false},

@@ -57,16 +57,16 @@ TEST(Counts, AreThoseOfTheirAddress)
         return *std::find_if(sent.begin(), sent.end(), [](auto const& each) { return each.starts_with("010C"); });
     };
     RequestAddress const engine{.header = "7E0"};
-    RequestAddress const body{.header = "6F1", .extended = "07"};
+    RequestAddress const trunk{.header = "6F1", .extended = "07"};
     RequestAddress const door{.header = "6F1", .extended = "08"};
     EXPECT_EQ(sentTo(engine), "010C");
     EXPECT_EQ(sentTo(engine), "010C");
     EXPECT_EQ(sentTo(engine), "010C1");
     rig.wire->on("010C", "607F104410C1AF8").on("010C", "607F104410C1AF8");
     for (int i = 0; i < 2; ++i) {
-        sentTo(body);
+        sentTo(trunk);
     }
-    EXPECT_EQ(sentTo(body), "010C1");
+    EXPECT_EQ(sentTo(trunk), "010C1");
     EXPECT_EQ(sentTo(door), "010C");
 }
 
