@@ -98,10 +98,10 @@ TEST(PollPace, FollowsTheBus)
     EXPECT_EQ(can.floor.count(), 0);
     EXPECT_EQ(can.pidsPerRequest, 6U);
     EXPECT_TRUE(can.addresses);
-    velmora::PollPace const careful = velmora::choosePace({}, obd::ObdProtocolCan11, 0);
-    EXPECT_EQ(careful.floor.count(), 30);
-    EXPECT_EQ(careful.pidsPerRequest, 1U);
-    EXPECT_FALSE(careful.addresses);
+    velmora::PollPace const unhurried = velmora::choosePace({}, obd::ObdProtocolCan11, 0);
+    EXPECT_EQ(unhurried.floor.count(), 30);
+    EXPECT_EQ(unhurried.pidsPerRequest, 1U);
+    EXPECT_FALSE(unhurried.addresses);
     for (obd::ObdProtocol const line : {obd::ObdProtocolIso9141, obd::ObdProtocolIso14230}) {
         EXPECT_EQ(velmora::choosePace(fast, line, 2010).floor.count(), 30);
         EXPECT_EQ(velmora::choosePace(fast, line, 2010).pidsPerRequest, 1U);
