@@ -101,6 +101,12 @@ def keeps_tells_and_forgets_scans():
     check(code == 2 and err.startswith("velmora: Nothing is kept of VELMRAS1MM0000001\n"), f"nothing is left: {code} {err}")
 
 
+def writes_files_without_standard_input():
+    done = subprocess.run(["sh", "-c", 'exec "$0" history export none.ndjson <&-', program], capture_output=True, text=True,
+                          timeout=60, cwd=folder, env=environment | {"VELMORA_HISTORY": str(folder / "no.db")})
+    check(done.stdout == "Exported 0 scans to none.ndjson\n", f"what is opened first is 0 there: {done.stderr}")
+
+
 def gives_lists_to_programs():
     files = json.loads(printed("--json", "signals", "list", "mine.toml"))
     check([each["id"] for each in files[0]["signals"]] == ["GEARBOX_TEMP", "OFF"], f"the signals: {files}")
@@ -141,6 +147,7 @@ with tempfile.TemporaryDirectory() as name:
     refuses()
     breaks_lines_for_narrow_terminals()
     keeps_tells_and_forgets_scans()
+    writes_files_without_standard_input()
     gives_lists_to_programs()
     records_a_dialogue_that_can_be_replayed()
 print(f"the commands print what they should; {time.monotonic() - start:.1f} s")

@@ -4,6 +4,7 @@
 #include "simulator/serve/tracepeer.h"
 #include "simulator/simulation.h"
 #include "simulator/textfile.h"
+#include "tests/support/closedinput.h"
 #include "tests/support/temporaryfolder.h"
 
 #include <gtest/gtest.h>
@@ -70,6 +71,18 @@ TEST_F(TextFile, isOpenedForWritingWithoutWaitingAndLookedAtWithoutAChange)
     std::fputs("6", file);
     std::fclose(file);
     EXPECT_EQ(obdsim::readTextFile(m_file), "6");
+}
+
+TEST_F(TextFile, isOpenedWhereStandardInputIsClosed)
+{
+    testsupport::ClosedInput const closed;
+    for (auto* const open : {obdsim::keepForWriting, obdsim::openForWriting}) {
+        std::FILE* const file = open(m_file);
+        ASSERT_NE(file, nullptr);
+        EXPECT_EQ(::fileno(file), STDIN_FILENO);
+        std::fclose(file);
+    }
+    EXPECT_TRUE(testsupport::ClosedInput::isFree());
 }
 
 TEST_F(TextFile, traceToAPipeThatNobodyReadsIsRefusedAndAFullDiskIsNoted)

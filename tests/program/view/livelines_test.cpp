@@ -127,10 +127,16 @@ TEST_F(LiveCsvFile, TimesCountOnFromItsStart)
 
 TEST_F(LiveCsvFile, StandsWhereStandardInputIsClosed)
 {
+    std::string const pipe = own.file("pipe");
+    ASSERT_EQ(::mkfifo(pipe.c_str(), 0600), 0);
+    int const reader = ::open(pipe.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC);
     testsupport::ClosedInput const closed;
     LiveCsv(file.string()).begin(table, now, start);
     EXPECT_THAT(content(), ElementsAre("A (%),B (%)"));
     EXPECT_TRUE(testsupport::ClosedInput::isFree());
+    LiveCsv const piped(pipe);
+    EXPECT_EQ(::fcntl(STDIN_FILENO, F_GETFL) & (O_ACCMODE | O_NONBLOCK), O_WRONLY) << "a slow reader is waited for";
+    ::close(reader);
 }
 
 TEST_F(LiveCsvFile, HasARowForEachRoundAtOnce)
