@@ -21,7 +21,7 @@ namespace {
 using std::chrono::milliseconds;
 using LentStatus = obd::IDevice::Status;
 
-PollTime at(int ms)
+PollTime pollAt(int ms)
 {
     return PollTime(std::chrono::hours(1)) + milliseconds(ms);
 }
@@ -29,58 +29,58 @@ PollTime at(int ms)
 TEST(PollOrder, EqualsGoInTheOrderInWhichTheyWereAdded)
 {
     DeadlineScheduler rest;
-    EXPECT_EQ(rest.add({}, at(0)), 0U);
-    EXPECT_EQ(rest.add({}, at(0)), 1U);
-    EXPECT_EQ(rest.next(at(0))->task, 0U);
-    rest.postpone(0, at(50));
-    rest.postpone(1, at(50));
-    EXPECT_EQ(rest.next(at(0))->task, 0U) << "nothing is due";
-    EXPECT_EQ(rest.next(at(0))->start, at(50));
+    EXPECT_EQ(rest.add({}, pollAt(0)), 0U);
+    EXPECT_EQ(rest.add({}, pollAt(0)), 1U);
+    EXPECT_EQ(rest.next(pollAt(0))->task, 0U);
+    rest.postpone(0, pollAt(50));
+    rest.postpone(1, pollAt(50));
+    EXPECT_EQ(rest.next(pollAt(0))->task, 0U) << "nothing is due";
+    EXPECT_EQ(rest.next(pollAt(0))->start, pollAt(50));
     DeadlineScheduler rates;
-    rates.add(10.0, at(0));
-    rates.add(10.0, at(0));
-    EXPECT_EQ(rates.next(at(0))->task, 0U);
-    EXPECT_EQ(rates.next(at(500))->task, 0U) << "both are late";
-    EXPECT_EQ(rates.next(at(500))->start, at(500));
+    rates.add(10.0, pollAt(0));
+    rates.add(10.0, pollAt(0));
+    EXPECT_EQ(rates.next(pollAt(0))->task, 0U);
+    EXPECT_EQ(rates.next(pollAt(500))->task, 0U) << "both are late";
+    EXPECT_EQ(rates.next(pollAt(500))->start, pollAt(500));
 }
 
 TEST(PollOrder, WhoWaitedLongerGoesFirstAmongEqualDeadlines)
 {
     DeadlineScheduler scheduler;
-    scheduler.add(10.0, at(0));
-    scheduler.add(10.0, at(0));
-    scheduler.started(0, at(5));
-    scheduler.started(1, at(4));
-    EXPECT_EQ(scheduler.next(at(150))->task, 1U);
-    scheduler.started(1, at(150));
-    EXPECT_EQ(scheduler.next(at(150))->task, 0U) << "the earlier deadline, whoever waited";
+    scheduler.add(10.0, pollAt(0));
+    scheduler.add(10.0, pollAt(0));
+    scheduler.started(0, pollAt(5));
+    scheduler.started(1, pollAt(4));
+    EXPECT_EQ(scheduler.next(pollAt(150))->task, 1U);
+    scheduler.started(1, pollAt(150));
+    EXPECT_EQ(scheduler.next(pollAt(150))->task, 0U) << "the earlier deadline, whoever waited";
     DeadlineScheduler mixed;
-    mixed.add(1.0, at(0));
-    mixed.add(10.0, at(0));
-    mixed.started(1, at(0));
-    EXPECT_EQ(mixed.next(at(150))->task, 1U) << "its deadline is at 200 ms, though the other has never been asked";
+    mixed.add(1.0, pollAt(0));
+    mixed.add(10.0, pollAt(0));
+    mixed.started(1, pollAt(0));
+    EXPECT_EQ(mixed.next(pollAt(150))->task, 1U) << "its deadline is at 200 ms, though the other has never been asked";
 }
 
 TEST(PollOrder, ADeadlineOfThisMomentIsNotMissed)
 {
     DeadlineScheduler scheduler;
-    scheduler.add(1.0, at(0));
-    scheduler.add(10.0, at(0));
-    scheduler.started(0, at(0)); // released at 1000, to be done by 2000
-    scheduler.started(1, at(1800));
-    EXPECT_EQ(scheduler.next(at(2000))->task, 1U) << "it alone is late";
-    EXPECT_EQ(scheduler.next(at(2001))->task, 0U) << "now it has waited longer";
+    scheduler.add(1.0, pollAt(0));
+    scheduler.add(10.0, pollAt(0));
+    scheduler.started(0, pollAt(0)); // released at 1000, to be done by 2000
+    scheduler.started(1, pollAt(1800));
+    EXPECT_EQ(scheduler.next(pollAt(2000))->task, 1U) << "it alone is late";
+    EXPECT_EQ(scheduler.next(pollAt(2001))->task, 0U) << "now it has waited longer";
 }
 
 TEST(PollOrder, RatesGoFirstAndEachFourthTurnBelongsToTheRest)
 {
     DeadlineScheduler scheduler;
-    scheduler.add({}, at(0));
-    scheduler.add(1000.0, at(0));
+    scheduler.add({}, pollAt(0));
+    scheduler.add(1000.0, pollAt(0));
     std::string order;
     for (int i = 0; i < 9; ++i) {
-        std::size_t const task = scheduler.next(at(i * 10))->task;
-        scheduler.started(task, at(i * 10));
+        std::size_t const task = scheduler.next(pollAt(i * 10))->task;
+        scheduler.started(task, pollAt(i * 10));
         order += std::to_string(task);
     }
     EXPECT_EQ(order, "111011101");
@@ -90,50 +90,50 @@ TEST(PollOrder, WhatIsReleasedAtThisMomentMayGo)
 {
     DeadlineScheduler scheduler;
     for (int i = 0; i < 4; ++i) {
-        scheduler.add(1000.0, at(0));
+        scheduler.add(1000.0, pollAt(0));
     }
-    scheduler.add({}, at(100));
+    scheduler.add({}, pollAt(100));
     for (std::size_t i = 0; i < 3; ++i) {
-        scheduler.started(i, at(100));
+        scheduler.started(i, pollAt(100));
     }
-    EXPECT_EQ(scheduler.next(at(100))->task, 4U);
+    EXPECT_EQ(scheduler.next(pollAt(100))->task, 4U);
 }
 
 TEST(PollOrder, ANewRateBeginsAtOnce)
 {
     RateMeter two;
-    two.count(at(0));
-    EXPECT_EQ(two.hertz(at(100)), 0.0) << "one event has no rate";
-    two.count(at(4000));
-    EXPECT_EQ(two.hertz(at(4000)), 0.25);
-    EXPECT_EQ(two.hertz(at(9000)), 0.25) << "the next one may be on its way";
-    EXPECT_EQ(two.hertz(at(12000)), 0.25);
-    EXPECT_EQ(two.hertz(at(14000)), 1.0 / 14) << "beyond two intervals silence counts";
+    two.count(pollAt(0));
+    EXPECT_EQ(two.hertz(pollAt(100)), 0.0) << "one event has no rate";
+    two.count(pollAt(4000));
+    EXPECT_EQ(two.hertz(pollAt(4000)), 0.25);
+    EXPECT_EQ(two.hertz(pollAt(9000)), 0.25) << "the next one may be on its way";
+    EXPECT_EQ(two.hertz(pollAt(12000)), 0.25);
+    EXPECT_EQ(two.hertz(pollAt(14000)), 1.0 / 14) << "beyond two intervals silence counts";
     RateMeter same;
-    same.count(at(0));
-    same.count(at(0));
-    EXPECT_EQ(same.hertz(at(0)), 0.0);
+    same.count(pollAt(0));
+    same.count(pollAt(0));
+    EXPECT_EQ(same.hertz(pollAt(0)), 0.0);
     RateMeter many;
-    many.count(at(0));
+    many.count(pollAt(0));
     for (int i = 0; i < 31; ++i) {
-        many.count(at(10000 + i * 1000));
+        many.count(pollAt(10000 + i * 1000));
     }
-    EXPECT_EQ(many.hertz(at(40000)), 31 / 40.0) << "32 events are kept";
-    many.count(at(41000));
-    EXPECT_EQ(many.hertz(at(41000)), 1.0) << "and no more";
+    EXPECT_EQ(many.hertz(pollAt(40000)), 31 / 40.0) << "32 events are kept";
+    many.count(pollAt(41000));
+    EXPECT_EQ(many.hertz(pollAt(41000)), 1.0) << "and no more";
 }
 
 TEST(AnswerNotes, AreFreshUpToTheirAge)
 {
     AnswerNotes notes;
-    notes.note(0x7E8, 0x0C, at(0));
-    notes.note(0x7E8, 0x0D, at(100));
-    EXPECT_TRUE(notes.areFresh(0x7E8, {0x0C, 0x0D}, at(5000), milliseconds(5000)));
-    EXPECT_FALSE(notes.areFresh(0x7E8, {0x0C, 0x0D}, at(5001), milliseconds(5000)));
-    EXPECT_TRUE(notes.areFresh(0x7E8, {0x0D}, at(5001), milliseconds(5000)));
-    EXPECT_FALSE(notes.areFresh(0x7E8, {0x05}, at(0), milliseconds(5000)));
-    EXPECT_FALSE(notes.areFresh(0x7E9, {0x0C}, at(0), milliseconds(5000))) << "of another module";
-    EXPECT_TRUE(notes.areFresh(0x7E9, {}, at(0), milliseconds(0)));
+    notes.note(0x7E8, 0x0C, pollAt(0));
+    notes.note(0x7E8, 0x0D, pollAt(100));
+    EXPECT_TRUE(notes.areFresh(0x7E8, {0x0C, 0x0D}, pollAt(5000), milliseconds(5000)));
+    EXPECT_FALSE(notes.areFresh(0x7E8, {0x0C, 0x0D}, pollAt(5001), milliseconds(5000)));
+    EXPECT_TRUE(notes.areFresh(0x7E8, {0x0D}, pollAt(5001), milliseconds(5000)));
+    EXPECT_FALSE(notes.areFresh(0x7E8, {0x05}, pollAt(0), milliseconds(5000)));
+    EXPECT_FALSE(notes.areFresh(0x7E9, {0x0C}, pollAt(0), milliseconds(5000))) << "of another module";
+    EXPECT_TRUE(notes.areFresh(0x7E9, {}, pollAt(0), milliseconds(0)));
 }
 
 TEST(AddressTrial, ATenthExactlyIsNotWorthIt)

@@ -19,7 +19,7 @@ std::optional<double> worth(std::string const& text)
 }
 
 // Its text in our grammar, or what is wrong.
-std::string written(std::string const& text, FormulaDialect dialect = FormulaDialect::Own)
+std::string formulaWritten(std::string const& text, FormulaDialect dialect = FormulaDialect::Own)
 {
     try {
         return toText(parseFormula(text, dialect));
@@ -70,15 +70,15 @@ TEST(FormulaLimits, OperatorsBindInTheOrderOfTheGuide)
                     std::string const right = "A" + first + "(B" + second + "C)";
                     std::string const plain = "A" + first + "B" + second + "C";
                     EXPECT_EQ(parseFormula(plain), parseFormula(other > one ? right : left)) << plain;
-                    EXPECT_EQ(written(left), other > one ? left : plain);
-                    EXPECT_EQ(written(right), other > one ? plain : right);
+                    EXPECT_EQ(formulaWritten(left), other > one ? left : plain);
+                    EXPECT_EQ(formulaWritten(right), other > one ? plain : right);
                 }
             }
         }
     }
-    EXPECT_EQ(written("A*B**C"), "A*B**C");
-    EXPECT_EQ(written("(A*B)**C"), "(A*B)**C");
-    EXPECT_EQ(written("0**2"), "0**2");
+    EXPECT_EQ(formulaWritten("A*B**C"), "A*B**C");
+    EXPECT_EQ(formulaWritten("(A*B)**C"), "(A*B)**C");
+    EXPECT_EQ(formulaWritten("0**2"), "0**2");
     FormulaNode const minusTwo = leafNumber(-2);
     EXPECT_EQ(toText(combine(FormulaStep::Power, minusTwo, leafNumber(2))), "(-2)**2");
     EXPECT_EQ(toText(combine(FormulaStep::Power, leafNumber(2), minusTwo)), "2**-2");
@@ -101,18 +101,19 @@ TEST(FormulaLimits, FunctionsTakeAsManyOperandsAsTheGuideSays)
     for (Row const& row : rows) {
         for (int count = 1; count < 10; ++count) {
             std::string const text = std::string(row.name) + "(A" + repeated(", A", count - 1) + ")";
-            EXPECT_EQ(written(text) == text, count >= row.fewest && count <= row.most) << text << " " << written(text);
+            EXPECT_EQ(formulaWritten(text) == text, count >= row.fewest && count <= row.most)
+                << text << " " << formulaWritten(text);
         }
     }
     EXPECT_EQ(std::size(formulaFunctions()), std::size(rows));
-    EXPECT_EQ(written("{a}", FormulaDialect::Phone), "2 operands are wanted before this");
-    EXPECT_EQ(written("(a)+2<8", FormulaDialect::Phone),
+    EXPECT_EQ(formulaWritten("{a}", FormulaDialect::Phone), "2 operands are wanted before this");
+    EXPECT_EQ(formulaWritten("(a)+2<8", FormulaDialect::Phone),
               "\"<\" is read as a shift only of a byte or a bracket, by 8, 16 or 24")
         << "a bracket further ahead is not the one that is shifted";
-    EXPECT_EQ(written("A 0x1F"), "\"0x1F\" is left over");
+    EXPECT_EQ(formulaWritten("A 0x1F"), "\"0x1F\" is left over");
     for (char const* const bits : {"I", "Q", "Y", "AG", "8+0"}) {
         std::string const text = std::string("signed(A, ") + bits + ")";
-        EXPECT_EQ(written(text), text) << "as many bits as that byte says, which is the ninth, and so on";
+        EXPECT_EQ(formulaWritten(text), text) << "as many bits as that byte says, which is the ninth, and so on";
     }
 }
 
@@ -121,12 +122,12 @@ TEST(FormulaLimits, NestsSixtyFourLevelsInEachWay)
     std::string const deeper = "the formula is nested deeper than 64 levels";
     for (auto const& [front, back] : {std::pair("-", ""), std::pair("~", ""), std::pair("!", ""), std::pair("+", ""),
                                       std::pair("(", ")"), std::pair("A**", ""), std::pair("abs(", ")")}) {
-        EXPECT_NE(written(repeated(front, 64) + "A" + repeated(back, 64)), deeper) << front;
-        EXPECT_EQ(written(repeated(front, 65) + "A" + repeated(back, 65)), deeper) << front;
+        EXPECT_NE(formulaWritten(repeated(front, 64) + "A" + repeated(back, 64)), deeper) << front;
+        EXPECT_EQ(formulaWritten(repeated(front, 65) + "A" + repeated(back, 65)), deeper) << front;
     }
-    EXPECT_NE(written(repeated("{", 64) + "A" + repeated(":1}", 64), FormulaDialect::Phone), deeper);
-    EXPECT_EQ(written(repeated("{", 65) + "A" + repeated(":1}", 65), FormulaDialect::Phone), deeper);
-    EXPECT_EQ(written("A" + repeated("+A", 255)), "A" + repeated("+A", 255)) << "a chain is no nest";
+    EXPECT_NE(formulaWritten(repeated("{", 64) + "A" + repeated(":1}", 64), FormulaDialect::Phone), deeper);
+    EXPECT_EQ(formulaWritten(repeated("{", 65) + "A" + repeated(":1}", 65), FormulaDialect::Phone), deeper);
+    EXPECT_EQ(formulaWritten("A" + repeated("+A", 255)), "A" + repeated("+A", 255)) << "a chain is no nest";
 }
 
 TEST(FormulaLimits, TruthIsOneOrZero)
