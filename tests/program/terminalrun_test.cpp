@@ -2,8 +2,10 @@
 #include "tests/program/commandrun.h"
 
 #include <atomic>
+#include <csignal>
 #include <functional>
 #include <thread>
+#include <unistd.h>
 
 namespace {
 
@@ -62,7 +64,8 @@ protected:
                 }
             }
             if (!ended) {
-                terminal.hangUp(); // which ends what waits for more
+                ::kill(::getpid(), SIGINT); // which ends what waits for more
+                terminal.hangUp();
             }
         });
         {
@@ -204,6 +207,27 @@ TEST_F(TerminalRun, ALayoutThatTheVehicleNoLongerOffersIsNone)
     Shown const second = at(car, {{"q quit", "q"}});
     EXPECT_EQ(second.code, 0) << second.text;
     EXPECT_THAT(second.text, HasSubstr("Vehicle Speed Sensor"));
+}
+
+TEST_F(TerminalRun, ARecordingKeepsItsUnitsAndColumns)
+{
+    Shown const fixed =
+        at("@B live SPEED --csv @F/r.csv", {{"q quit", "u"}, {"units are fixed", "p"}, {"columns are fixed", "sq"}});
+    EXPECT_EQ(fixed.code, 0);
+    Shown const free = at("@B live SPEED", {{"q quit", "ru"},
+                                            {"mph", "w"},
+                                            {"Recording to", "u"},
+                                            {"units are fixed", "w"},
+                                            {"Recorded to", "n"},
+                                            {"Noted in", "pspq"}});
+    EXPECT_EQ(free.code, 0);
+    std::string noted;
+    for (auto const& each : std::filesystem::recursive_directory_iterator(m_folder.path())) {
+        if (each.path().filename().string().starts_with("snapshot")) {
+            noted = m_folder.read(std::filesystem::relative(each.path(), m_folder.path()).string());
+        }
+    }
+    EXPECT_THAT(noted, HasSubstr("\nVehicle Speed Sensor "));
 }
 
 TEST_F(TerminalRun, AllThatWasReadStaysHoweverMuchItIs)
