@@ -32,16 +32,16 @@ void printNames(char const* title, std::vector<std::string> const& names)
 }
 
 // While it lives a signal ends the session. Who is about to end it is waited for, so that the session may go behind it.
-class SessionEnd
+class SimulationStop
 {
 public:
-    explicit SessionEnd(obdsim::Session& session)
+    explicit SimulationStop(obdsim::Session& session)
     {
         Interrupt::instance().setHandler([&session] { session.stop(); });
     }
-    ~SessionEnd() { Interrupt::instance().setHandler(nullptr); }
-    SessionEnd(SessionEnd const&) = delete;
-    SessionEnd& operator=(SessionEnd const&) = delete;
+    ~SimulationStop() { Interrupt::instance().setHandler(nullptr); }
+    SimulationStop(SimulationStop const&) = delete;
+    SimulationStop& operator=(SimulationStop const&) = delete;
 };
 
 // False if the trace could not be written.
@@ -55,7 +55,7 @@ bool serve(obdsim::SessionOptions const& options)
         fmt::print("control {}\n", session.controlAddress());
     }
     std::fflush(stdout);
-    SessionEnd const end(session);
+    SimulationStop const stop(session);
     session.run();
     return !session.traceFailed();
 }
