@@ -320,6 +320,31 @@ TEST(PowerModelReadings, GiveNoPowerWithoutAnEngineSpeed)
     }
 }
 
+TEST(PowerModelReadings, AreNotDelayedByASpeedBeforeTheFirstEngineSpeed)
+{
+    auto const firstOutput = [](bool early) {
+        support::FakeClock clock;
+        auto const ecu = std::make_shared<support::FakeEcu>(0x7E8);
+        ecu->setSupported(obd::ObdMode::CurrentData, {0x0C, 0x0D});
+        obd::VelmoraSettings const settings{std::make_shared<support::MemorySettings>()};
+        PowerModel model(ecu, settings);
+        if (early) {
+            EXPECT_FALSE(model.take(boardReading(0x7E8, {0x41, 0x0D, 36}, 999900)));
+        }
+        for (int millis = 0; millis < 4000; millis += 100) {
+            clock.advance(100);
+            auto const kmh = static_cast<unsigned char>(36 + millis / 100);
+            model.take(boardReading(0x7E8, {0x41, 0x0C, 0x2E, 0xE0}, 1000000 + millis));
+            if (model.take(boardReading(0x7E8, {0x41, 0x0D, kmh}, 1000000 + millis))) {
+                return millis;
+            }
+        }
+        return -1;
+    };
+    EXPECT_EQ(firstOutput(false), 0);
+    EXPECT_EQ(firstOutput(true), 0);
+}
+
 // The library keeps the last speeds of a module; those of a run before are none of the next.
 TEST(PowerModelReadings, BeginAnewWithEachModel)
 {
