@@ -37,6 +37,17 @@ TEST(OxygenReportView, PointsToTheMonitorsOnCan)
         "sensors": [{"bank": 2, "sensor": 3, "tests": null}]})"));
 }
 
+TEST(OxygenReportView, NamesThePlaceOfEachSensor)
+{
+    std::string places;
+    for (int location = 0; location <= static_cast<int>(OxygenSensorLocation::Bank4Sensor2); ++location) {
+        auto const [bank, sensor] = placeOf(static_cast<OxygenSensorLocation>(location));
+        places += std::to_string(bank) + "/" + std::to_string(sensor) + " ";
+    }
+    EXPECT_EQ(places, "1/1 1/2 1/3 1/4 2/1 2/2 2/3 2/4 3/1 3/2 4/1 4/2 ");
+    EXPECT_EQ(locationName(OxygenSensorLocation::Bank1Sensor2), "Bank 1 sensor 2");
+}
+
 TEST(OxygenReportView, TellsWhyThereIsNone)
 {
     EXPECT_EQ(toText(OxygenReport(), Style()), "  Oxygen monitor not supported\n");
