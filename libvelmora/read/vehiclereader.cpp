@@ -16,6 +16,16 @@ namespace velmora {
 
 namespace {
 
+// How asking for what it supports went: of current data, and of the monitors where it tells any.
+TopicAnswer answerOfSets(obd::IEcu const& ecu)
+{
+    TopicAnswer const sensors = toAnswer(ecu.detection(obd::ObdMode::CurrentData, 0));
+    if (sensors != TopicAnswer::Read || ecu.supportedIds(obd::ObdMode::MonitorTests, 0).empty()) {
+        return sensors;
+    }
+    return toAnswer(ecu.detection(obd::ObdMode::MonitorTests, 0));
+}
+
 std::vector<unsigned int> sensorsOf(obd::IEcu const& ecu)
 {
     std::vector<unsigned int> sensors;
@@ -47,7 +57,7 @@ ModuleReport readModule(Session& session, obd::IEcu const& ecu, CodeReader& read
                         readMonitors(session, ecu),
                         readOxygen(session, ecu),
                         readCounters(session, ecu),
-                        toAnswer(ecu.detection(obd::ObdMode::CurrentData, 0)),
+                        answerOfSets(ecu),
                         {}};
     readValuesAgain(session, ecu, bus, values);
     report.values = std::move(values);

@@ -98,6 +98,23 @@ TEST(Diagnostics, AModuleThatRefusesToTellWhatItHasIsToldSo)
     std::remove(file.c_str());
 }
 
+TEST(Diagnostics, MonitorsOfWhichSomeMayNotHaveBeenReadAreToldSo)
+{
+    std::string const file = testsupport::ownPath("lostmask.toml");
+    std::string const car = "name = 'lost'\nprotocol = 6\n[[module]]\nid = '7E8'\nlive = '0C'\n[module.raw]\n"
+                            "'0601' = '46 01 01 0B 01 C2 01 90 01 F4'\n";
+    for (auto const& [mask, answer] : {std::pair{"'0600' = '46 00 80 00 00 01'\n", "no answer"},
+                                       std::pair{"'0600' = '46 00 80 00 00 00'\n", "read"}}) {
+        std::ofstream(file) << car << mask;
+        Outcome const outcome = runVelmora({"-q", "--json", "-p", "sim:" + file + "?instant", "scan"});
+        auto const report = nlohmann::json::parse(outcome.out);
+        EXPECT_EQ(report["modules"][0]["monitors"]["answer"], "read") << outcome.out;
+        EXPECT_EQ(report["modules"][0]["supported"], answer);
+        EXPECT_EQ(holds(outcome.out, "all that it supports (no answer)"), std::string(answer) == "no answer");
+    }
+    std::remove(file.c_str());
+}
+
 TEST(Diagnostics, WhatNoModuleOffersIsExitCodeSix)
 {
     Outcome const outcome = runVelmora({"-q", "-p", "sim:petrol-iso9141?instant", "counters"});

@@ -83,9 +83,9 @@ std::set<std::string> wantedOf(json const& module)
         add(module["info"]["vin"]);
     }
     std::string const sensors = std::to_string(module["sensors"].size());
-    texts.insert(module["supported"] == "read"
-                     ? sensors
-                     : sensors + " (not known in full: " + module["supported"].get<std::string>() + ")");
+    texts.insert(module["supported"] == "read" ? sensors
+                                               : sensors + " (not all that the module supports is known: " +
+                                                     module["supported"].get<std::string>() + ")");
     return texts;
 }
 

@@ -50,7 +50,7 @@ struct ModuleReport
     MonitorsReport monitors;                ///< results of on-board tests
     OxygenReport oxygen;                    ///< oxygen sensors
     CountersReport counters;                ///< in-use counters
-    TopicAnswer offers = TopicAnswer::Read; ///< how asking for what it supports of service 01 went
+    TopicAnswer offers = TopicAnswer::Read; ///< how asking for what it supports of services 01 and 06 went
     std::vector<LiveValue> values = {};     ///< those of what it supports that findings need
 };
 
