@@ -106,7 +106,7 @@ TEST(VinsFace, TellsWhatANumberSays)
     EXPECT_EQ(facts.checkDigit, VinFacts::CheckDigit::Right);
     EXPECT_EQ(facts.years, std::vector<int>{2003});
     EXPECT_EQ(nlohmann::json::parse(toJson(facts)).at("vin"), facts.vin);
-    EXPECT_NE(toText(facts, {}).find("2003"), std::string::npos);
+    EXPECT_NE(toText(facts, TextStyle()).find("2003"), std::string::npos);
     EXPECT_THROW(explainVin("1HGCM82633A00435"), Error);
 }
 
