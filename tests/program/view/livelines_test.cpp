@@ -41,7 +41,7 @@ TEST(LiveLines, TellNameValueAndUnit)
 
 TEST(LiveLines, DocumentsAreReadByPeopleToo)
 {
-    EXPECT_EQ(printed(Json{{"unit", "\u00B0C"}, {"bad", "\xFF"}, {"none", textOrNull("")}}),
+    EXPECT_EQ(cli::printed(cli::Json{{"unit", "\u00B0C"}, {"bad", "\xFF"}, {"none", cli::textOrNull("")}}),
               "{\n  \"unit\": \"\u00B0C\",\n  \"bad\": \"\uFFFD\",\n  \"none\": null\n}\n");
 }
 
