@@ -292,7 +292,8 @@ TEST_F(CarBeyond, AWatchEndsWithTheObjectThatHoldsItAndSoDoesItsAsking)
     int const before = first;
     EXPECT_TRUE(waitFor(second, 2));
     EXPECT_EQ(first, before) << "the one that it held has ended";
-    watch = std::move(watch);
+    velmora::Watch& itself = watch;
+    watch = std::move(itself);
     int const now = second;
     EXPECT_TRUE(waitFor(second, now + 1)) << "itself it does not end";
     watch.end();
