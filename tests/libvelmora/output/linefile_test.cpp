@@ -11,6 +11,7 @@
 #include <gtest/gtest.h>
 
 #include <atomic>
+#include <cerrno>
 #include <csignal>
 #include <fcntl.h>
 #include <pthread.h>
@@ -202,10 +203,12 @@ void onInterruption(int /*signal*/)
     if (++interruptions < 2) {
         return;
     }
+    int const before = errno; // of what it interrupts
     for (ssize_t count = 1; count > 0;) {
         count = ::read(pipeEnd, drained + drainedSize, sizeof(drained) - drainedSize);
         drainedSize += count > 0 ? static_cast<std::size_t>(count) : 0;
     }
+    errno = before;
 }
 
 // A pipe is neither cut nor renamed, and a write that a signal interrupts goes on.
