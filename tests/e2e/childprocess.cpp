@@ -36,6 +36,15 @@ struct Pipe
     int write;
 };
 
+// Of all programs that are started; once, since other threads may be starting some.
+void setEnvironment()
+{
+    static int const set =
+        ::setenv("VELMORA_SETTINGS", "/proc/nonexistent/settings.toml", 1) | // not the user's, nor any
+        ::setenv("TERM", "xterm", 1);
+    EXPECT_EQ(set, 0);
+}
+
 pid_t spawn(std::vector<std::string> const& arguments, int in, int out, int err)
 {
     std::vector<std::string> all = {VELMORA_PROGRAM};
@@ -52,7 +61,7 @@ pid_t spawn(std::vector<std::string> const& arguments, int in, int out, int err)
             posix_spawn_file_actions_adddup2(&actions, from, to);
         }
     }
-    ::setenv("VELMORA_SETTINGS", "/proc/nonexistent/settings.toml", 1); // not the user's, nor any
+    setEnvironment();
     pid_t pid = -1;
     EXPECT_EQ(::posix_spawn(&pid, VELMORA_PROGRAM, &actions, nullptr, argv.data(), environ), 0);
     posix_spawn_file_actions_destroy(&actions);
@@ -119,10 +128,11 @@ Outcome runOnTerminal(std::vector<std::string> const& arguments, std::string con
     int const keyboard = ::posix_openpt(O_RDWR | O_NOCTTY | O_CLOEXEC);
     EXPECT_EQ(::grantpt(keyboard), 0);
     EXPECT_EQ(::unlockpt(keyboard), 0);
-    int const terminal = ::open(::ptsname(keyboard), O_RDWR | O_NOCTTY | O_CLOEXEC);
+    std::array<char, 64> name{};
+    EXPECT_EQ(::ptsname_r(keyboard, name.data(), name.size()), 0);
+    int const terminal = ::open(name.data(), O_RDWR | O_NOCTTY | O_CLOEXEC);
     winsize const size{24, 80, 0, 0};
     EXPECT_EQ(::ioctl(terminal, TIOCSWINSZ, &size), 0);
-    ::setenv("TERM", "xterm", 1);
     pid_t const pid = spawn(arguments, terminal, terminal, terminal);
     ::close(terminal);
     auto const type = [keyboard](std::string const& text) {
