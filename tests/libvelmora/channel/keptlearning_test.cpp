@@ -13,20 +13,13 @@ namespace velmora {
 namespace {
 
 using test::ChannelRig;
+using test::learnSpeed;
 using test::saidCounted;
 using test::saidPlainly;
 using test::speedLine;
 using testing::Contains;
 using testing::ElementsAre;
 using testing::Not;
-
-void learnSpeed(ChannelRig& rig)
-{
-    rig.wire->on("010C", saidPlainly(speedLine)).on("010C1", saidCounted(speedLine));
-    rig.ask("010C");
-    rig.ask("010C");
-    rig.wire->takeCommands();
-}
 
 class SecondVisit : public testing::Test
 {

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "tests/libvelmora/channel/channelrig.h"
 #include "tests/support/wire/scriptedwire.h"
 
 #include <string>
@@ -26,6 +27,15 @@ inline Pieces saidCounted(std::string const& lines)
 inline Pieces saidSlowly(std::string const& lines, int waitMs)
 {
     return {{lines + "\r", WireTime(20)}, {"\r>", WireTime(waitMs)}};
+}
+
+// Asks for the speed until it is known how many replies it has.
+inline void learnSpeed(ChannelRig& rig)
+{
+    rig.wire->on("010C", saidPlainly(speedLine)).on("010C1", saidCounted(speedLine));
+    rig.ask("010C");
+    rig.ask("010C");
+    rig.wire->takeCommands();
 }
 
 } // namespace velmora::test

@@ -11,20 +11,11 @@ namespace velmora {
 namespace {
 
 using test::ChannelRig;
-using test::saidCounted;
+using test::learnSpeed;
 using test::saidPlainly;
-using test::speedLine;
 using testing::Contains;
 using testing::ElementsAre;
 using testing::Not;
-
-void teachSpeed(ChannelRig& rig)
-{
-    rig.wire->on("010C", saidPlainly(speedLine)).on("010C1", saidCounted(speedLine));
-    rig.ask("010C");
-    rig.ask("010C");
-    rig.wire->takeCommands();
-}
 
 TEST(Counts, AreUnlearntByWhatChangesTheAdapterAlone)
 {
@@ -37,7 +28,7 @@ TEST(Counts, AreUnlearntByWhatChangesTheAdapterAlone)
          {Row{"ATRV", false}, Row{"ATI", false}, Row{"ATCRA7E8", true}, Row{"ATH1", true}, Row{"ATD0", true}}) {
         ChannelRig rig;
         rig.connect();
-        teachSpeed(rig);
+        learnSpeed(rig);
         rig.ask(command);
         rig.wire->takeCommands();
         rig.ask("010C");
@@ -49,7 +40,7 @@ TEST(Counts, AreThoseOfTheirAddress)
 {
     ChannelRig rig;
     rig.connect();
-    teachSpeed(rig);
+    learnSpeed(rig);
     auto const sentTo = [&rig](RequestAddress const& address) {
         AddressedModule const scope(rig.channel, address);
         rig.ask("010C");
@@ -74,7 +65,7 @@ TEST(Counts, OfASilentVehicleAreNone)
 {
     ChannelRig rig;
     rig.bringUp(); // not yet connected
-    teachSpeed(rig);
+    learnSpeed(rig);
     rig.ask("010C");
     EXPECT_THAT(rig.wire->takeCommands(), Not(Contains("010C1")));
     ChannelRig headersOff;
@@ -87,7 +78,7 @@ TEST(Counts, OfASilentVehicleAreNone)
     EXPECT_THAT(headersOff.wire->takeCommands(), ElementsAre("ATE0", "010C", "010C", "010C"));
     ChannelRig off(nullptr, {.port = {}, .counting = false});
     off.connect();
-    teachSpeed(off);
+    learnSpeed(off);
     off.ask("010C");
     EXPECT_THAT(off.wire->takeCommands(), ElementsAre("010C"));
 }

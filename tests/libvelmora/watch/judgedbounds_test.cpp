@@ -1,7 +1,6 @@
 // Judge and meter of the watch at the last value and the last moment on each side.
-#include "libvelmora/watch/sleepjudge.h"
 #include "libvelmora/watch/tripmeter.h"
-#include "tests/support/driventime.h"
+#include "tests/libvelmora/watch/drivenjudge.h"
 
 #include <gtest/gtest.h>
 
@@ -14,25 +13,12 @@ using velmora::Trip;
 using velmora::TripMeter;
 using State = SleepJudge::State;
 
-struct Bounded
+struct Bounded : velmora::test::DrivenJudge
 {
-    testsupport::DrivenTime time;
-    SleepJudge judge;
+    using DrivenJudge::DrivenJudge;
 
-    explicit Bounded(BatterySettings const& settings = {}) : judge(settings, time.steady()) {}
-
-    void pass(std::chrono::milliseconds duration)
-    {
-        time.pass(duration);
-        judge.onTime(time.steady());
-    }
     void rpm(double value) { judge.onEngineSpeed(value, time.steady()); }
     void kmh(double value) { judge.onVehicleSpeed(value, time.steady()); }
-    State volts(double value)
-    {
-        judge.onVolts(value, time.steady());
-        return judge.state();
-    }
     void park(double first)
     {
         judge.sleep(time.steady());

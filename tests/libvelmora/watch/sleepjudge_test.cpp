@@ -1,5 +1,4 @@
-#include "libvelmora/watch/sleepjudge.h"
-#include "tests/support/driventime.h"
+#include "tests/libvelmora/watch/drivenjudge.h"
 
 #include <gtest/gtest.h>
 
@@ -10,19 +9,10 @@ using velmora::BatterySettings;
 using velmora::SleepJudge;
 using State = SleepJudge::State;
 
-struct Judged
+struct Judged : velmora::test::DrivenJudge
 {
-    testsupport::DrivenTime time;
-    SleepJudge judge;
+    using DrivenJudge::DrivenJudge;
 
-    explicit Judged(BatterySettings const& settings = {}) : judge(settings, time.steady()) {}
-
-    void pass(std::chrono::milliseconds duration)
-    {
-        time.pass(duration);
-        judge.onTime(time.steady());
-    }
-    void volts(double value) { judge.onVolts(value, time.steady()); }
     // A look at the voltage each minute.
     void park(double first)
     {
